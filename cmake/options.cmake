@@ -1,0 +1,37 @@
+# What every target of the tree is built with.
+include(GNUInstallDirs)
+
+option(LAPDMON_TESTS "Build the tests" ON)
+option(LAPDMON_WERROR "Treat warnings as errors" OFF)
+set(LAPDMON_SANITIZE "" CACHE STRING "Comma-separated sanitizers, e.g. address,undefined or thread")
+
+# The transport library stands in a folder of its own, where the loader does not look unless told to.
+set(LAPDMON_TRANSPORT_DIR lib/lapdmon)
+
+add_library(lapdmon_options INTERFACE)
+add_library(lapdmon::options ALIAS lapdmon_options)
+target_include_directories(lapdmon_options INTERFACE ${PROJECT_SOURCE_DIR})
+target_compile_options(lapdmon_options INTERFACE
+    -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Woverloaded-virtual
+    -Wcast-align -Wformat=2 -Wnull-dereference -Wimplicit-fallthrough)
+if(LAPDMON_WERROR)
+    target_compile_options(lapdmon_options INTERFACE -Werror)
+endif()
+if(LAPDMON_SANITIZE)
+    target_compile_options(lapdmon_options INTERFACE
+        -fsanitize=${LAPDMON_SANITIZE} -fno-omit-frame-pointer -fno-sanitize-recover=all)
+    target_link_options(lapdmon_options INTERFACE -fsanitize=${LAPDMON_SANITIZE})
+    # -Wnull-dereference sees paths that only the instrumentation makes.
+    target_compile_options(lapdmon_options INTERFACE -Wno-null-dereference)
+endif()
+
+# A program that links the transport library. In the build tree RUNPATH (not RPATH, so that
+# LD_LIBRARY_PATH comes first) leads to the software board's; the installed program has none.
+function(lapdmon_program target)
+    target_link_options(${target} PRIVATE -Wl,--enable-new-dtags)
+    set_target_properties(${target} PROPERTIES
+        SKIP_BUILD_RPATH FALSE
+        BUILD_WITH_INSTALL_RPATH FALSE
+        INSTALL_RPATH ""
+        INSTALL_RPATH_USE_LINK_PATH FALSE)
+endfunction()
