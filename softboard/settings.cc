@@ -101,13 +101,13 @@ uint32_t parseProtocol(const std::string& text) {
     if (const auto number = parseNumber<uint32_t>(text); number) {
         return *number;
     }
-    throw BadInput("protocol \"" + text + "\" is none of 4ess, 5ess, dms100, ntt, net5, ni2 and no number");
+    throw BadInput("\"" + text + "\" is none of 4ess, 5ess, dms100, ntt, net5, ni2 and no number");
 }
 
 Rate framesPerSecond(double rate) {
     constexpr double fastest = 1e6;
     if (!(rate > 0 && rate <= fastest)) {
-        throw BadInput("the rate must be above 0 and at most 1000000 frames per second");
+        throw BadInput("frames per second must be above 0 and at most 1000000");
     }
     return {Rate::Kind::perSecond, rate};
 }
@@ -121,9 +121,18 @@ Rate parseRate(const std::string& text) {
     }
     const auto number = parseNumber<double>(text);
     if (!number) {
-        throw BadInput("rate \"" + text + "\" is neither recorded, max nor a number of frames per second");
+        throw BadInput("\"" + text + "\" is neither recorded, max nor a number of frames per second");
     }
     return framesPerSecond(*number);
+}
+
+uint32_t parseNumberIn(const std::string& text, uint32_t least, uint32_t most) {
+    const auto number = parseNumber<uint32_t>(text);
+    if (!number || *number < least || *number > most) {
+        throw BadInput("\"" + text + "\" is no number from " + std::to_string(least) + " to " +
+                       std::to_string(most));
+    }
+    return *number;
 }
 
 Scenario resolve(const Settings& commandLine, std::optional<uint32_t> dchannels, const ScenarioFile* file) {

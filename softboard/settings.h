@@ -52,6 +52,7 @@ uint32_t parseProtocol(const std::string& text);
 // "recorded", "max" or frames per second; throws BadInput.
 Rate parseRate(const std::string& text);
 Rate framesPerSecond(double rate);
+uint32_t parseNumberIn(const std::string& text, uint32_t least, uint32_t most);
 
 // The scenario that the command line and the file (null: none) ask for; reads the captures. Throws BadInput.
 Scenario resolve(const Settings& commandLine, std::optional<uint32_t> dchannels, const ScenarioFile* file);
