@@ -60,21 +60,27 @@ void addOptions(CLI::App& app, CommandLine& to) {
     addParsed(app, "--rate", to.settings.rate, parseRate,
               "As recorded, so many frames a second, or as fast as the program reads (default: recorded)",
               "recorded|FPS|max");
-    app.add_flag("--loop,!--no-loop", to.settings.loop,
-                 "Play the frames again and again (default: the built-in capture at recorded rate does)");
-    app.add_option("--board", to.settings.board, "Number of the board (default: 1)")
-        ->type_name("N")
-        ->check(CLI::Range(0U, largestBoard, "board number"));
-    app.add_option("--dchannels", to.dchannels, "How many D channels the board has (default: 1)")
-        ->type_name("N")
-        ->check(CLI::Range(1U, mostDChannels, "D channels"));
+    app.add_flag_callback(
+        "--loop", [&to] { to.settings.loop = true; },
+        "Play the frames again and again (default for the built-in capture at recorded rate)");
+    app.add_flag_callback(
+        "--no-loop", [&to] { to.settings.loop = false; }, "Play the frames once (default otherwise)");
+    addParsed(
+        app, "--board", to.settings.board,
+        [](const std::string& text) { return parseNumberIn(text, 0, largestBoard); },
+        "Number of the board (default: 1)", "N");
+    addParsed(
+        app, "--dchannels", to.dchannels,
+        [](const std::string& text) { return parseNumberIn(text, 1, mostDChannels); },
+        "How many D channels the board has, numbered from 1 (default: 1)", "N");
     app.add_option(
            "--scenario", to.scenario,
            "TOML file with these settings, and D channels with frames of their own; options come first")
         ->type_name("FILE");
     app.add_option("--journal", to.journal, "Write every message between program and board to FILE")
         ->type_name("FILE");
-    app.set_version_flag("--version", "softboard " SOFTBOARD_VERSION);
+    app.set_help_flag("--help,-h", "Print this and exit");
+    app.set_version_flag("--version", "softboard " SOFTBOARD_VERSION, "Print the version and exit");
 }
 
 std::string absolute(const std::string& path) { return std::filesystem::absolute(path).string(); }
