@@ -36,7 +36,7 @@ Capture open(const std::string& path) {
     char reason[PCAP_ERRBUF_SIZE] = "";
     Capture capture(pcap_fopen_offline(file, reason));
     if (!capture) {
-        std::fclose(file);
+        static_cast<void>(std::fclose(file));  // it was read only
         throw BadInput(path + ": " + reason);
     }
     const int type = pcap_datalink(capture.get());
