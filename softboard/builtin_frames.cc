@@ -1,3 +1,4 @@
+#include "softboard/hex.h"
 #include "softboard/scenario.h"
 
 namespace softboard {
@@ -16,15 +17,10 @@ constexpr Row rows[] = {
 };
 // clang-format on
 
-constexpr uint8_t digit(char c) { return static_cast<uint8_t>(c <= '9' ? c - '0' : c - 'a' + 10); }
-
 Frames load() {
     Frames frames;
     for (const Row& row : rows) {
-        Frame& frame = frames.emplace_back(Frame{row.transmitted, row.ticks, {}});
-        for (const char* at = row.octets; *at != '\0'; at += 2) {
-            frame.octets.push_back(static_cast<uint8_t>(digit(at[0]) << 4 | digit(at[1])));
-        }
+        frames.push_back({row.transmitted, row.ticks, fromHex(row.octets)});
     }
     return frames;
 }

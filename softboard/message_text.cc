@@ -5,6 +5,7 @@
 #include <span>
 
 #include "softboard/codes.h"
+#include "softboard/hex.h"
 #include "softboard/wire.h"
 
 namespace softboard {
@@ -100,16 +101,6 @@ std::string fieldText(BodyReader& body, Kind kind) {
 std::string messageName(uint32_t type) {
     const Row* row = rowOf(type);
     return row == nullptr ? "?" : row->name;
-}
-
-std::string hex(const Octets& octets) {
-    static const char digits[] = "0123456789abcdef";
-    std::string text;
-    text.reserve(octets.size() * 2);
-    for (const uint8_t octet : octets) {
-        text += {digits[octet >> 4], digits[octet & 15]};
-    }
-    return text;
 }
 
 std::string bodyText(const Message& message) {

@@ -16,8 +16,6 @@ std::string messageName(uint32_t type);
 // field that is missing ends the text with "...".
 std::string bodyText(const Message& message);
 
-std::string hex(const Octets& octets);
-
 }  // namespace softboard
 
 #endif

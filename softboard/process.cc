@@ -7,6 +7,8 @@
 #include <iostream>
 #include <sstream>
 
+#include "softboard/handover.h"
+
 namespace softboard {
 
 namespace {

@@ -10,9 +10,6 @@ namespace softboard {
 // wait in a queue until the very end.
 Network& network();
 
-// Name of the environment variable with the path of the launcher's scenario.
-constexpr const char* scenarioVariable = "SOFTBOARD_SCENARIO";
-
 }  // namespace softboard
 
 #endif

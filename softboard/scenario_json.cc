@@ -1,6 +1,7 @@
 #include <nlohmann/json.hpp>
 #include <stdexcept>
 
+#include "softboard/hex.h"
 #include "softboard/scenario.h"
 
 namespace softboard {
@@ -10,10 +11,12 @@ namespace {
 using nlohmann::json;
 
 json toJson(const Frame& frame) {
-    return {{"transmitted", frame.transmitted}, {"ticks", frame.ticks}, {"octets", frame.octets}};
+    return {{"transmitted", frame.transmitted}, {"ticks", frame.ticks}, {"octets", hex(frame.octets)}};
 }
 
-Frame frameFrom(const json& from) { return {from.at("transmitted"), from.at("ticks"), from.at("octets")}; }
+Frame frameFrom(const json& from) {
+    return {from.at("transmitted"), from.at("ticks"), fromHex(from.at("octets").get<std::string>())};
+}
 
 json toJson(const DChannel& channel) {
     return {{"board", channel.board},
