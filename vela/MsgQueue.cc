@@ -28,7 +28,8 @@ void reportUnregisteredSource(MsgQueue* queue, Msg* raw) {
 MsgQueue::MsgQueue(const CompDesc_t& hostDesc, unsigned int maxRetMsgSize, unsigned int depth)
     : unregisteredSource_(reportUnregisteredSource),
       queue_(std::make_unique<KSMsgQueue>(hostDesc.getNvCompDesc(), maxRetMsgSize, depth, nullptr)) {
-    queue_->registerAsyncCallback(this,
+    // The transport layer knows the receiver by this base alone.
+    queue_->registerAsyncCallback(static_cast<KSAsyncMsgReceiver*>(this),
                                   static_cast<int (KSAsyncMsgReceiver::*)(KSMsgRef&)>(&MsgQueue::MsgRouter));
 }
 

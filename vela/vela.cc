@@ -3,7 +3,7 @@
 #include <atomic>
 
 #include "hostsvc/KSHost.h"
-#include "hostsvc/ks_sleep.h"
+#include "hostsvc/KSSleep.h"
 
 namespace vela {
 
