@@ -31,7 +31,7 @@ endif()
 function(lapdmon_program target)
     target_link_libraries(${target} PRIVATE norv)
     target_link_options(${target} PRIVATE
-        -Wl,--enable-new-dtags "-Wl,-rpath,$ORIGIN/../${LAPDMON_TRANSPORT_DIR}")
+        -Wl,--enable-new-dtags -Wl,-rpath,${CMAKE_BINARY_DIR}/${LAPDMON_TRANSPORT_DIR})
     set_target_properties(${target} PROPERTIES SKIP_BUILD_RPATH TRUE)
     install(TARGETS ${target})
     install(CODE "file(RPATH_REMOVE FILE \"\$ENV{DESTDIR}\${CMAKE_INSTALL_PREFIX}/${CMAKE_INSTALL_BINDIR}/${target}\")")
