@@ -62,6 +62,8 @@ class KSMsgQueue : private KSRunnable {
     KSMutex slotFree_;          // held while it is not
 
   private:
+    friend struct KSMsgQueueProbe;  // for tests: moments of a request that cannot be timed
+
     struct Expected {
         unsigned transaction;
         unsigned replyType;
