@@ -34,11 +34,11 @@ void bitwise(int value, int high, int low) {
         return;
     }
     text("      ");
-    for (int position = 8; position > std::max(high, 0); --position)
+    for (int position = 8; position > std::clamp(high, 0, 8); --position)
         text('-');
     for (int position = std::min(high, 8); position >= std::max(low, 1); --position)
         text(((value >> (position - 1)) & 1) != 0 ? '1' : '0');
-    for (int position = std::min(low, 9) - 1; position >= 1; --position)
+    for (int position = std::clamp(low, 1, 9) - 1; position >= 1; --position)
         text('-');
 }
 

@@ -1,17 +1,16 @@
 #include "golden_cases.h"
 
 #include <algorithm>
-#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <sstream>
 #include <stdexcept>
 
+#include "capture.h"
 #include "decoder/elements.h"
 #include "decoder/frame.h"
 #include "decoder/layer3.h"
-#include "decoder/lines.h"
 #include "decoder/state.h"
 
 namespace golden {
@@ -200,23 +199,29 @@ void appendUnescaped(std::string& text, std::string_view line) {
     text += '\n';
 }
 
-void decodeOnce(const Case& kase, const Octets& octets, decoder::RingBuffer* rb) {
-    fill(rb, octets);
+// Returns how many octets are left.
+int decodeOnce(const Case& kase, const Octets& octets) {
+    if (octets.size() > decoder::maximumFrame)
+        throw std::runtime_error("the octets do not fit into a frame");
+    decoder::RingBuffer rb = decoder::testing::cursorOver(octets);
     unsigned char id = 0;
     switch (kase.kind) {
         case Kind::element:
-            return decoder::ie_id(rb);
+            decoder::ie_id(&rb);
+            break;
         case Kind::direct:
-            decoder::getblockchar(rb, &id);
-            return kase.directDecoder(id, rb);
+            decoder::getblockchar(&rb, &id);
+            kase.directDecoder(id, &rb);
+            break;
         case Kind::message:
-            return decoder::layer_3(rb);
+            decoder::layer_3(&rb);
+            break;
         case Kind::frame:
             decoder::msglen = static_cast<int>(octets.size());
-            decoder::parse_isdn_frame(*rb);
-            fill(rb, {});  // the frame was passed by value
-            return;
+            decoder::parse_isdn_frame(rb);
+            return 0;  // it was given a copy
     }
+    return rb.count;
 }
 
 }  // namespace
@@ -281,42 +286,12 @@ void replaceText(File& file, const Case& kase, std::string_view text) {
     file.lines.insert(file.lines.erase(begin, end), lines.begin(), lines.end());
 }
 
-Log::Log() : stream_(open_memstream(&memory_, &size_)) {
-    if (stream_ == nullptr)
-        throw std::runtime_error("no log in memory");
-    decoder::flushLines();  // whatever others left
-    decoder::ofp = stream_;
-    decoder::file_output = true;
-}
-
-Log::~Log() {
-    decoder::file_output = false;
-    decoder::ofp = nullptr;
-    std::fclose(stream_);
-    std::free(memory_);
-}
-
-std::string Log::text() {
-    decoder::flushLines();
-    std::fflush(stream_);
-    return {memory_, size_};
-}
-
-void fill(decoder::RingBuffer* rb, const Octets& octets) {
-    vela::staticList<unsigned char> list(static_cast<unsigned int>(octets.size()));
-    std::copy(octets.begin(), octets.end(), list.begin());
-    if (!decoder::getBlock(rb, list, static_cast<int>(octets.size())))
-        throw std::runtime_error("the octets do not fit into a frame");
-}
-
 Outcome run(const Case& kase, const Trunk& trunk) {
-    decoder::flag = kase.transmitted ? 0 : 1;
-    decoder::swit = trunk.variant;
-    Log log;
-    decoder::RingBuffer rb;
+    decoder::testing::Capture log(trunk.variant, kase.transmitted ? 0 : 1);
+    int left = 0;
     for (const Octets& octets : kase.octets)
-        decodeOnce(kase, octets, &rb);
-    return {log.text(), rb.count};
+        left = decodeOnce(kase, octets);
+    return {log.text(), left, decoder::flag, decoder::swit};
 }
 
 std::string difference(std::string_view expected, std::string_view actual) {

@@ -9,7 +9,7 @@
 #include <sstream>
 #include <tuple>
 
-#include "decoder/frame.h"
+#include "capture.h"
 #include "decoder/layer2.h"
 #include "decoder/layer3.h"
 #include "decoder/lines.h"
@@ -227,13 +227,7 @@ TEST_P(DamagedFrames, EndWithTheirDumpWhereverTheyAreCut) {
         for (std::size_t size = 0; size <= input.octets.size(); ++size) {
             const Octets cut(input.octets.begin(), input.octets.begin() + static_cast<std::ptrdiff_t>(size));
             for (const int flag : {0, 1}) {
-                decoder::flag = flag;
-                decoder::msglen = static_cast<int>(size);
-                golden::Log log;
-                RingBuffer rb;
-                golden::fill(&rb, cut);
-                decoder::parse_isdn_frame(rb);
-                const std::string text = log.text();
+                const std::string text = decoder::testing::decoded(cut, GetParam().variant, flag);
                 const std::size_t dump = text.rfind("Hex Dump: \n");
                 ASSERT_NE(dump, std::string::npos) << hexOf(cut.data(), size);
                 const std::size_t lines = size == 0 ? 2 : 1 + (size + 9) / 10;
