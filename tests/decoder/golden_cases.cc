@@ -17,6 +17,7 @@ namespace golden {
 
 namespace {
 
+constexpr char folder[] = LAPDMON_SOURCE_DIR "/tests/decoder/golden";
 constexpr std::string_view endOfText = "..";
 
 // The decoders that no identifier reaches.
@@ -226,18 +227,18 @@ int decodeOnce(const Case& kase, const Octets& octets) {
 
 }  // namespace
 
-std::vector<std::string> paths() {
+std::vector<std::string> names() {
     std::vector<std::string> found;
-    for (const auto& entry :
-         std::filesystem::directory_iterator(LAPDMON_SOURCE_DIR "/tests/decoder/golden")) {
+    for (const auto& entry : std::filesystem::directory_iterator(folder)) {
         if (entry.path().extension() == ".golden")
-            found.push_back(entry.path().string());
+            found.push_back(entry.path().stem().string());
     }
     std::sort(found.begin(), found.end());
     return found;
 }
 
-File read(const std::string& path) {
+File read(const std::string& name) {
+    const std::string path = std::string(folder) + "/" + name + ".golden";
     std::ifstream in(path, std::ios::binary);
     if (!in)
         throw std::runtime_error(path + ": cannot be read");
@@ -247,7 +248,6 @@ File read(const std::string& path) {
 File parse(const std::string& path, std::string_view contents) {
     File file;
     file.path = path;
-    file.name = std::filesystem::path(path).stem().string();
     file.lines = splitLines(contents);
     Reader(file).readAll();
     return file;

@@ -4,7 +4,7 @@
 #define TESTS_DECODER_GOLDEN_CASES_H
 
 #include <array>
-#include <cstdio>
+#include <ostream>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -20,6 +20,9 @@ struct Trunk {
     std::string_view name;
     int variant;  // what `swit` holds
 };
+
+// How a test that runs on each trunk names it.
+inline void PrintTo(const Trunk& trunk, std::ostream* out) { *out << trunk.name; }
 
 // `other` stands for every variant that no decoder knows.
 inline constexpr std::array<Trunk, 7> trunks{{
@@ -55,16 +58,15 @@ struct Case {
 
 struct File {
     std::string path;
-    std::string name;  // without folder and extension
     std::vector<std::string> lines;
     std::vector<Case> cases;
 };
 
-// Paths of all golden files, sorted.
-std::vector<std::string> paths();
+// Names of all golden files, sorted.
+std::vector<std::string> names();
 
 // Both throw std::runtime_error saying file, line and reason.
-File read(const std::string& path);
+File read(const std::string& name);
 File parse(const std::string& path, std::string_view contents);
 
 // The lines of a file that stand for a text, and the text that they stand for. unescape throws
@@ -75,32 +77,15 @@ std::string unescape(const std::vector<std::string>& lines);
 // Puts a text in place of the case's own in file.lines; cases after it are not moved.
 void replaceText(File& file, const Case& kase, std::string_view text);
 
-// A log in memory for as long as it lives.
-class Log {
-  public:
-    Log();
-    ~Log();
-    Log(const Log&) = delete;
-    Log& operator=(const Log&) = delete;
-
-    // What has been written so far.
-    std::string text();
-
-  private:
-    char* memory_ = nullptr;
-    std::size_t size_ = 0;
-    std::FILE* stream_ = nullptr;
-};
-
-// Fills the cursor, through getBlock.
-void fill(decoder::RingBuffer* rb, const Octets& octets);
-
+// What is there once the octets are decoded.
 struct Outcome {
     std::string text;
-    int left = 0;
+    int left = 0;  // octets in the cursor
+    int flag = 0;
+    int swit = 0;
 };
 
-// Decodes the case's octets on one trunk. Leaves `flag` and `swit` as the case and the trunk set them.
+// Decodes the case's octets on one trunk.
 Outcome run(const Case& kase, const Trunk& trunk);
 
 // A few lines that show where two texts differ, escaped as in the file.

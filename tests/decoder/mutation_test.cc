@@ -84,8 +84,8 @@ Input inputOf(const golden::Case& kase, const Octets& octets) {
 const std::set<Input>& inputs() {
     static const std::set<Input> all = [] {
         std::set<Input> distinct;
-        for (const std::string& path : golden::paths()) {
-            for (const golden::Case& kase : golden::read(path).cases) {
+        for (const std::string& name : golden::names()) {
+            for (const golden::Case& kase : golden::read(name).cases) {
                 for (const Octets& octets : kase.octets)
                     distinct.insert(inputOf(kase, octets));
             }
