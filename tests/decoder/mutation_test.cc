@@ -41,7 +41,7 @@ constexpr std::size_t maximumAttempts = decoder::maximumFrame + 520;
 constexpr std::size_t maximumLinesAnAttempt = 12;
 constexpr std::size_t maximumLine = 2 * 33 + 60;
 constexpr std::size_t maximumText = maximumAttempts * maximumLinesAnAttempt * maximumLine;
-constexpr std::size_t maximumDump = std::size_t{decoder::maximumFrame} * 4 + 28 * 34 + 64;
+constexpr std::size_t maximumDump = std::size_t{decoder::maximumFrame} * 4 + std::size_t{28} * 34 + 64;
 
 // Inputs longer than this are a short beginning and one long loop over alike octets. Of those, the beginning
 // and the last octets take every value; the octets between take the few at which something changes.
@@ -58,11 +58,10 @@ struct Input {
     Octets octets;
     std::size_t firstChanged = 0;  // frameStart is changed once, in the frames, and not for each element
 
-    auto operator<=>(const Input& other) const {
-        return std::tie(decode, octets, firstChanged) <=>
+    bool operator<(const Input& other) const {
+        return std::tie(decode, octets, firstChanged) <
                std::tie(other.decode, other.octets, other.firstChanged);
     }
-    bool operator==(const Input& other) const { return (*this <=> other) == 0; }
 };
 
 Input inputOf(const golden::Case& kase, const Octets& octets) {
