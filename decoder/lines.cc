@@ -22,8 +22,9 @@ void LineBuffer::grow(std::size_t n) {
 
 void flushLines() {
     const std::string_view composed = lineBuffer.composed();
+    // A write that fails leaves its mark on the stream, for whoever owns it.
     if (file_output && ofp != nullptr && !composed.empty())
-        std::fwrite(composed.data(), 1, composed.size(), ofp);
+        (void)std::fwrite(composed.data(), 1, composed.size(), ofp);
     lineBuffer.clear();
 }
 

@@ -9,6 +9,7 @@
 #ifndef DECODER_LINES_H
 #define DECODER_LINES_H
 
+#include <algorithm>
 #include <array>
 #include <bit>
 #include <charconv>
@@ -148,8 +149,7 @@ constexpr std::size_t sizeOf(Bits) { return 14; }
 
 template <std::size_t N>
 char* put(char* at, const char (&literal)[N]) {
-    std::memcpy(at, literal, N - 1);
-    return at + (N - 1);
+    return std::copy_n(literal, N - 1, at);
 }
 inline char* put(char* at, std::string_view words) {
     std::memcpy(at, words.data(), words.size());
@@ -186,9 +186,9 @@ inline char* put(char* at, Bits bits) {
         tables::fields[static_cast<unsigned>(bits.high)][static_cast<unsigned>(bits.low)];
     const std::uint64_t shown =
         (tables::digits[static_cast<unsigned char>(bits.value)] & field) | (tables::dashes & ~field);
-    std::memcpy(at, "      ", 6);
-    std::memcpy(at + 6, &shown, 8);
-    return at + 14;
+    at = put(at, "      ");
+    std::memcpy(at, &shown, sizeof shown);
+    return at + sizeof shown;
 }
 
 // ---- what decoders and the application write

@@ -2,9 +2,9 @@
 #ifndef TESTS_DECODER_CAPTURE_H
 #define TESTS_DECODER_CAPTURE_H
 
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
-#include <initializer_list>
 #include <string>
 #include <vector>
 
@@ -31,7 +31,7 @@ class Capture {
         ofp = nullptr;
         file_output = false;
         swit = flag = msglen = ielength = bit_field = 0;
-        std::fclose(log_);
+        (void)std::fclose(log_);
         std::free(data_);  // NOLINT(*-no-malloc): the C library's own
     }
     Capture(const Capture&) = delete;
@@ -40,7 +40,7 @@ class Capture {
     // What the log holds so far, lines not yet handed over included.
     std::string text() {
         flushLines();
-        std::fflush(log_);
+        (void)std::fflush(log_);
         return {data_, size_};
     }
 

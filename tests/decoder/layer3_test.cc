@@ -157,7 +157,8 @@ TEST(MessageHeader, NamesExactlyTheseTypes) {
     prtcol_discr = 0x08;
     for (int type = 0; type < 256; ++type) {
         char unknown[40];
-        std::snprintf(unknown, sizeof unknown, "Unknown Message Type: 0x%02x\n", static_cast<unsigned>(type));
+        (void)std::snprintf(unknown, sizeof unknown, "Unknown Message Type: 0x%02x\n",
+                            static_cast<unsigned>(type));
         std::string expected = unknown;
         for (const auto& row : named) {
             if (row.type == type)
@@ -295,7 +296,7 @@ TEST(Dispatch, HandsEveryIdentifierToItsDecoder) {
     };
     for (int id = 0; id < 256; ++id) {
         char unknown[24];
-        std::snprintf(unknown, sizeof unknown, "  *Unknown IE: 0x%02x", static_cast<unsigned>(id));
+        (void)std::snprintf(unknown, sizeof unknown, "  *Unknown IE: 0x%02x", static_cast<unsigned>(id));
         std::string expected = unknown;
         for (const auto& row : cases) {
             if (row.id == id)
