@@ -20,16 +20,17 @@ namespace {
 constexpr char folder[] = LAPDMON_SOURCE_DIR "/tests/decoder/golden";
 constexpr std::string_view endOfText = "..";
 
-// The decoders that no identifier reaches.
+// The decoders that no identifier reaches, and one that not every identifier of its kind does.
 struct Direct {
     std::string_view name;
     ElementDecoder decode;
 };
-constexpr std::array<Direct, 4> directDecoders{{
+constexpr std::array<Direct, 5> directDecoders{{
     {"call_appearance_ie", decoder::call_appearance_ie},
     {"service_profile_id", decoder::service_profile_id},
     {"end_pointID", decoder::end_pointID},
     {"service_indicator", decoder::service_indicator},
+    {"non_locking_shift", decoder::non_locking_shift},
 }};
 
 std::vector<std::string> splitLines(std::string_view contents) {
