@@ -10,10 +10,23 @@
 
 #include "decoder/cursor.h"
 #include "decoder/frame.h"
+#include "decoder/layer3.h"
 #include "decoder/lines.h"
 #include "decoder/state.h"
 
 namespace decoder::testing {
+
+// The values of `swit`.
+inline constexpr int noTrunk = 0;
+inline constexpr int on4ess = 1;
+inline constexpr int on5ess = 2;
+inline constexpr int onDms100 = 3;
+inline constexpr int onNtt = 4;
+inline constexpr int onNet5 = 7;
+inline constexpr int onNi2 = 10;
+
+// The indent of a transmitted frame's lines.
+inline const std::string blanks(33, ' ');
 
 // For its lifetime the decoder logs into memory; afterwards its words are as they were at the start of the
 // program.
@@ -82,6 +95,11 @@ std::string decodedBy(Part part, const std::vector<unsigned char>& octets, int t
     Capture log(trunk, indentation);
     part(&rb);
     return log.text();
+}
+
+// The element at the start of these octets, the indent of its first line included.
+inline std::string element(const std::vector<unsigned char>& octets, int trunk, int indentation = 1) {
+    return decodedBy(ie_id, octets, trunk, indentation);
 }
 
 }  // namespace decoder::testing

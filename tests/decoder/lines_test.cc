@@ -55,7 +55,6 @@ TEST(Bitwise, WritesNothingForPositionsOutsideTheOctet) {
 }
 
 TEST(Lines, AreIndentedByExactly33BlanksWhenTheFlagIs0) {
-    const std::string blanks(33, ' ');
     Capture log(0, 0);
     line("one");
     bitwise(0x80, 8, 8);
