@@ -228,6 +228,14 @@ int decodeOnce(const Case& kase, const Octets& octets) {
 
 }  // namespace
 
+std::string contentsOf(const std::string& path) {
+    std::ifstream in(path, std::ios::binary);
+    std::ostringstream contents;
+    if (!(contents << in.rdbuf()))
+        throw std::runtime_error(path + ": cannot be read");
+    return contents.str();
+}
+
 std::vector<std::string> names() {
     std::vector<std::string> found;
     for (const auto& entry : std::filesystem::directory_iterator(folder)) {
@@ -240,10 +248,7 @@ std::vector<std::string> names() {
 
 File read(const std::string& name) {
     const std::string path = std::string(folder) + "/" + name + ".golden";
-    std::ifstream in(path, std::ios::binary);
-    if (!in)
-        throw std::runtime_error(path + ": cannot be read");
-    return parse(path, std::string(std::istreambuf_iterator<char>(in), {}));
+    return parse(path, contentsOf(path));
 }
 
 File parse(const std::string& path, std::string_view contents) {

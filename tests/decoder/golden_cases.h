@@ -62,6 +62,9 @@ struct File {
     std::vector<Case> cases;
 };
 
+// All of a file; throws std::runtime_error when it cannot be read.
+std::string contentsOf(const std::string& path);
+
 // Names of all golden files, sorted.
 std::vector<std::string> names();
 

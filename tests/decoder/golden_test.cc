@@ -4,7 +4,6 @@
 
 #include <cstdlib>
 #include <fstream>
-#include <iterator>
 #include <map>
 #include <regex>
 #include <set>
@@ -66,8 +65,7 @@ INSTANTIATE_TEST_SUITE_P(Decoder, GoldenFile, testing::ValuesIn(golden::names())
                          [](const auto& file) { return file.param; });
 
 TEST(GoldenFiles, EveryElementDecoderHasOneOfItsName) {
-    std::ifstream header(LAPDMON_SOURCE_DIR "/decoder/elements.h");
-    const std::string text(std::istreambuf_iterator<char>(header), {});
+    const std::string text = golden::contentsOf(LAPDMON_SOURCE_DIR "/decoder/elements.h");
     const std::regex declaration(R"(void (\w+)\(unsigned char id)");
     std::set<std::string> missing;
     for (std::sregex_iterator it(text.begin(), text.end(), declaration), end; it != end; ++it)
