@@ -102,14 +102,14 @@ class FencedCursor {
     FencedCursor(const FencedCursor&) = delete;
     FencedCursor& operator=(const FencedCursor&) = delete;
 
-    RingBuffer* fill(const unsigned char* octets, std::size_t size) {
+    RingBuffer& fill(const unsigned char* octets, std::size_t size) {
         open();
         std::copy_n(octets, size, rb_->data);
         rb_->readPtr = rb_->data;
         rb_->writePtr = rb_->data + size;
         rb_->count = static_cast<int>(size);
         ASAN_POISON_MEMORY_REGION(rb_->data + size, room - size);
-        return rb_.get();
+        return *rb_;
     }
 
   private:
@@ -118,7 +118,7 @@ class FencedCursor {
 
     void open() { ASAN_UNPOISON_MEMORY_REGION(rb_->data, room); }
 
-    std::unique_ptr<RingBuffer> rb_ = std::make_unique<RingBuffer>();
+    const std::unique_ptr<RingBuffer> rb_ = std::make_unique<RingBuffer>();
 };
 
 std::string hexOf(const unsigned char* octets, std::size_t size) {
@@ -133,9 +133,9 @@ std::string hexOf(const unsigned char* octets, std::size_t size) {
 TEST(FencedCursorDeathTest, AnOctetBehindTheFrameCannotBeRead) {
     const Octets octets(5, 0xA1);
     FencedCursor cursor;
-    const RingBuffer* const rb = cursor.fill(octets.data(), octets.size());
-    EXPECT_EQ(rb->data[4], 0xA1);
-    EXPECT_DEATH(std::fputc(rb->data[5], stderr), "use-after-poison");
+    const RingBuffer& rb = cursor.fill(octets.data(), octets.size());
+    EXPECT_EQ(rb.data[4], 0xA1);
+    EXPECT_DEATH(std::fputc(rb.data[5], stderr), "use-after-poison");
 }
 #endif
 
@@ -152,24 +152,24 @@ class DamagedFrames : public testing::TestWithParam<golden::Trunk> {
     // times.
     void decode(golden::ElementDecoder direct, const unsigned char* octets, std::size_t size, int flag) {
         decoder::flag = flag;
-        RingBuffer* const rb = cursor_.fill(octets, size);
+        RingBuffer& rb = cursor_.fill(octets, size);
         if (direct != nullptr) {
             unsigned char id = 0;
-            decoder::getblockchar(rb, &id);
-            direct(id, rb);
+            decoder::getblockchar(&rb, &id);
+            direct(id, &rb);
         } else {
-            decoder::layer_2(rb);
-            if (rb->count > 0)
-                decoder::layer_3(rb);
+            decoder::layer_2(&rb);
+            if (rb.count > 0)
+                decoder::layer_3(&rb);
         }
         const std::size_t shown = decoder::lineBuffer.composed().size();
         longest_ = std::max(longest_, shown);
-        const bool whole = direct != nullptr || rb->count == 0;
-        const bool inside = rb->readPtr >= rb->data && rb->readPtr <= rb->writePtr &&
-                            rb->writePtr == rb->data + size && rb->count == rb->writePtr - rb->readPtr;
+        const bool whole = direct != nullptr || rb.count == 0;
+        const bool inside = rb.readPtr >= rb.data && rb.readPtr <= rb.writePtr &&
+                            rb.writePtr == rb.data + size && rb.count == rb.writePtr - rb.readPtr;
         const bool untouched = decoder::flag == flag && decoder::swit == GetParam().variant;
         if (shown > maximumText || !whole || !inside || !untouched)
-            ADD_FAILURE() << "shown " << shown << ", left " << rb->count << ", flag " << decoder::flag
+            ADD_FAILURE() << "shown " << shown << ", left " << rb.count << ", flag " << decoder::flag
                           << ", swit " << decoder::swit << ":" << hexOf(octets, size);
         decoder::lineBuffer.clear();
         ++decoded_;
@@ -252,9 +252,9 @@ TEST_P(DamagedFrames, LoseAtLeastOneOctetWithEveryIdentifier) {
                 for (const int flag : {0, 1}) {
                     for (const auto walk : {decoder::ie_id, decoder::ie_codeset6}) {
                         decoder::flag = flag;
-                        RingBuffer* const rb = cursor_.fill(octets.data(), size);
-                        walk(rb);
-                        const auto taken = static_cast<int>(size) - rb->count;
+                        RingBuffer& rb = cursor_.fill(octets.data(), size);
+                        walk(&rb);
+                        const auto taken = static_cast<int>(size) - rb.count;
                         EXPECT_GE(taken, 1) << hexOf(octets.data(), size);
                         EXPECT_EQ(decoder::flag, flag) << hexOf(octets.data(), size);
                         EXPECT_EQ(decoder::swit, GetParam().variant) << hexOf(octets.data(), size);
