@@ -1,0 +1,13 @@
+// Start-up and shut-down of the host services.
+#ifndef HOSTSVC_KSHOST_H
+#define HOSTSVC_KSHOST_H
+
+#include <cstdint>
+
+// Once, before any queue is made. Returns the transport library's status, 0 for success.
+std::uint32_t KSHostInit();
+
+// Once, at the end.
+void KSHostCleanup();
+
+#endif

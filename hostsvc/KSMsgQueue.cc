@@ -1,0 +1,176 @@
+#include "hostsvc/KSMsgQueue.h"
+
+#include <pthread.h>
+
+#include <utility>
+
+#include "hostsvc/KSSleep.h"
+#include "hostsvc/KSTransportChoice.h"
+#include "hostsvc/descComp.h"
+
+namespace {
+
+constexpr unsigned PollMs = 10;
+constexpr unsigned ReaderEndMs = 1000;
+
+}  // namespace
+
+void* KSMsgQueueThread_Cleanup(void* slot) {
+    NvMsg32Bit*& msg = *static_cast<NvMsg32Bit**>(slot);
+    if (msg != nullptr)
+        nvMsgFree(std::exchange(msg, nullptr));
+    return nullptr;
+}
+
+KSMsgQueue::KSMsgQueue(NvCompDesc desc, unsigned a, unsigned b, const char* hostName)
+    : reader_(static_cast<KSRunnable*>(this),
+              static_cast<void* (KSRunnable::*)(void*, void*)>(&KSMsgQueue::readerBody), 0),
+      transport_(openTransport(desc, a, b, hostName)),
+      hostDesc_(transport_->getHostDesc()) {
+    replyLock_.lock();
+    messageAvailable_.lock();
+    slotFree_.unlock();
+    reader_.start(nullptr);
+}
+
+// The reader is woken and seen off before the transport's queue goes, so that it is never about to read a
+// queue that is gone. One that stays away (no memory to wake it, or busy in a callback) is waited for after
+// that: closing the queue wakes it too, and a cancelled reader reads no more.
+KSMsgQueue::~KSMsgQueue() {
+    reader_.cancel();
+    transport_->wakeReader();
+    reader_.tryJoin(ReaderEndMs, 1);
+    transport_.reset();
+    reader_.join();
+    KSMsgQueueThread_Cleanup(&reply_);
+    KSMsgQueueThread_Cleanup(&unclaimed_);
+}
+
+void KSMsgQueue::registerAsyncCallback(void* receiver, AsyncMember callback) {
+    const std::lock_guard lock(guard_);
+    receivers_ = {nullptr, static_cast<KSAsyncMsgReceiver*>(receiver), callback};
+}
+
+void KSMsgQueue::registerAsyncCallback(AsyncCallback callback) {
+    const std::lock_guard lock(guard_);
+    receivers_.plain = callback;
+}
+
+KSMsgRef KSMsgQueue::request(KSMsgRef& msg, unsigned timeoutMs, unsigned replyType, int anySource) {
+    msg.setSrcAddr(hostDesc_);
+    if (timeoutMs != 0)
+        expect({msg.getTrans(), replyType, msg.getTgtAddr(), anySource != 0});
+    transport_->msgWrite(std::exchange(msg, KSMsgRef()).getMsgRef());
+    if (timeoutMs == 0)
+        return KSMsgRef(0U);
+    return replyLock_.tryLock(timeoutMs, PollMs) ? takeReply() : giveUp();
+}
+
+void KSMsgQueue::expect(const Expected& reply) {
+    const std::lock_guard lock(guard_);
+    expected_ = reply;
+    replyLock_.tryLock();  // held now, whatever an earlier request left
+    waiting_ = true;
+}
+
+KSMsgRef KSMsgQueue::takeReply() {
+    const std::lock_guard lock(guard_);
+    return KSMsgRef(std::exchange(reply_, nullptr));
+}
+
+// A reply that came since the last look stays: the reader hands it on when it meets it.
+KSMsgRef KSMsgQueue::giveUp() {
+    const std::lock_guard lock(guard_);
+    waiting_ = false;
+    return {};
+}
+
+void* KSMsgQueue::readerBody(void* control, void* arg) {
+    readNroute(static_cast<KSThread::control*>(control), static_cast<char*>(arg));
+    return nullptr;
+}
+
+void KSMsgQueue::readNroute(KSThread::control* control, char* /*arg*/) {
+    pthread_setcanceltype(PTHREAD_CANCEL_DEFERRED, nullptr);
+    NvMsg32Bit* current = nullptr;
+    control->pushCleanup(KSMsgQueueThread_Cleanup, static_cast<void*>(&current));
+    for (bool failed = false;;) {
+        const bool wasFailing = failed;
+        failed = transport_->msgRead(&current) != 0;
+        control->testCancel();
+        if (!failed)
+            route(*control, current);
+        else if (wasFailing)
+            ks_sleep_ms(PollMs);  // a transport that is gone must not take the processor with it
+        control->testCancel();
+    }
+}
+
+void KSMsgQueue::route(KSThread::control& control, NvMsg32Bit*& msg) {
+    if (msg == nullptr)
+        return;
+    NvMsg32Bit* late = takeLateReply();
+    if (late != nullptr) {
+        control.pushCleanup(KSMsgQueueThread_Cleanup, static_cast<void*>(&late));
+        handOn(control, late);
+        control.popCleanup(0);
+    }
+    if (!acceptReply(msg))
+        handOn(control, msg);
+}
+
+// While a request waits, a reply in the slot is one that an earlier request gave up on.
+NvMsg32Bit* KSMsgQueue::takeLateReply() {
+    const std::lock_guard lock(guard_);
+    return waiting_ ? std::exchange(reply_, nullptr) : nullptr;
+}
+
+bool KSMsgQueue::acceptReply(NvMsg32Bit*& msg) {
+    const std::lock_guard lock(guard_);
+    if (!waiting_ || !expected_.matches(KSMsgRef(msg)))
+        return false;
+    reply_ = std::exchange(msg, nullptr);
+    waiting_ = false;
+    replyLock_.unlock();  // still guarded, or a request that begins just now would take it for its own
+    return true;
+}
+
+bool KSMsgQueue::Expected::matches(const KSMsgRef& msg) const {
+    const unsigned type = msg.getMsgType();
+    return msg.getTrans() == transaction && (type == 0 || type == GeneralReply || type == replyType) &&
+           (anySource || descComp(msg.getSrcAddr(), source));
+}
+
+// Takes over msg. Waits while there is no receiver and the slot is taken; a receiver that is registered
+// meanwhile gets the message.
+void KSMsgQueue::handOn(KSThread::control& control, NvMsg32Bit*& msg) {
+    Receivers to = receivers();
+    while (to.none()) {
+        control.testCancel();
+        if (slotFree_.tryLock(PollMs, PollMs))
+            return park(msg);
+        to = receivers();
+    }
+    to.deliver(std::exchange(msg, nullptr));
+}
+
+void KSMsgQueue::park(NvMsg32Bit*& msg) {
+    unclaimed_ = std::exchange(msg, nullptr);
+    messageAvailable_.unlock();
+}
+
+KSMsgQueue::Receivers KSMsgQueue::receivers() const {
+    const std::lock_guard lock(guard_);
+    return receivers_;
+}
+
+void KSMsgQueue::Receivers::deliver(NvMsg32Bit* msg) const {
+    if (plain != nullptr) {
+        KSMsgRef handle(msg);
+        plain(handle);
+    }
+    if (object != nullptr) {
+        KSMsgRef handle(msg);
+        (object->*member)(handle);
+    }
+}

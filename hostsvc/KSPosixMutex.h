@@ -1,0 +1,54 @@
+// The system's mutex calls as KSMutex makes them: from any thread, by design.
+#ifndef HOSTSVC_KSPOSIXMUTEX_H
+#define HOSTSVC_KSPOSIXMUTEX_H
+
+#include <pthread.h>
+
+#if defined(__SANITIZE_THREAD__)
+#include <dlfcn.h>
+#include <sanitizer/tsan_interface.h>
+
+// The thread sanitizer takes a mutex to belong to the thread that locked it: an unlock from elsewhere orders
+// nothing for it, and the mutex counts as held for ever. So the C library is called past it, and it is told
+// of the order that there is: what came before an unlock is seen after the next lock.
+namespace ks_posix {
+
+using MutexCall = int (*)(pthread_mutex_t*);
+
+inline MutexCall inTheLibrary(const char* name) {
+    return reinterpret_cast<MutexCall>(dlsym(dlopen("libc.so.6", RTLD_LAZY | RTLD_NOLOAD), name));
+}
+
+inline int lock(pthread_mutex_t* mutex) {
+    static const MutexCall call = inTheLibrary("pthread_mutex_lock");
+    const int result = call(mutex);
+    __tsan_acquire(mutex);
+    return result;
+}
+
+inline int tryLock(pthread_mutex_t* mutex) {
+    static const MutexCall call = inTheLibrary("pthread_mutex_trylock");
+    const int result = call(mutex);
+    if (result == 0)
+        __tsan_acquire(mutex);
+    return result;
+}
+
+inline int unlock(pthread_mutex_t* mutex) {
+    static const MutexCall call = inTheLibrary("pthread_mutex_unlock");
+    __tsan_release(mutex);
+    return call(mutex);
+}
+
+}  // namespace ks_posix
+#else
+namespace ks_posix {
+
+inline int lock(pthread_mutex_t* mutex) { return pthread_mutex_lock(mutex); }
+inline int tryLock(pthread_mutex_t* mutex) { return pthread_mutex_trylock(mutex); }
+inline int unlock(pthread_mutex_t* mutex) { return pthread_mutex_unlock(mutex); }
+
+}  // namespace ks_posix
+#endif
+
+#endif

@@ -1,0 +1,26 @@
+#include "hostsvc/KSSemaphore.h"
+
+#include "hostsvc/KSPoll.h"
+
+KSSemaphore::KSSemaphore(unsigned maxCount, unsigned initialCount) : semaphore_() {
+    if (initialCount > maxCount || sem_init(&semaphore_, 0, initialCount) != 0)
+        throw CreationError();
+}
+
+KSSemaphore::~KSSemaphore() { sem_destroy(&semaphore_); }
+
+void KSSemaphore::post() {
+    if (sem_post(&semaphore_) != 0)
+        throw PostError();
+}
+
+void KSSemaphore::wait() {
+    while (sem_wait(&semaphore_) != 0) {
+    }
+}
+
+bool KSSemaphore::tryWait() { return sem_trywait(&semaphore_) == 0; }
+
+bool KSSemaphore::tryWait(unsigned timeoutMs, unsigned intervalMs) {
+    return ks_poll(timeoutMs, intervalMs, [this] { return tryWait(); });
+}

@@ -1,0 +1,13 @@
+// Sleeping.
+#ifndef HOSTSVC_KSSLEEP_H
+#define HOSTSVC_KSSLEEP_H
+
+void ks_sleep(unsigned seconds);
+
+// Wraps at 4294968 ms and above: the time is reckoned in microseconds of 32 bits.
+void ks_sleep_ms(unsigned milliseconds);
+
+// A signal ends it early, and says so on the standard error stream.
+void ks_sleep_us(unsigned microseconds);
+
+#endif

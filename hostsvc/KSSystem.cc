@@ -1,0 +1,29 @@
+#include "hostsvc/KSSystem.h"
+
+#include <sys/select.h>
+#include <unistd.h>
+
+#include <atomic>
+
+namespace {
+
+std::atomic<KSSystem*> standIn{nullptr};
+
+}  // namespace
+
+unsigned KSSystem::sleep(unsigned seconds) { return ::sleep(seconds); }
+
+int KSSystem::waitFor(timeval timeout) { return ::select(0, nullptr, nullptr, nullptr, &timeout); }
+
+int KSSystem::createThread(const pthread_attr_t* attributes, void* (*entry)(void*), void* argument) {
+    pthread_t unused = 0;
+    return ::pthread_create(&unused, attributes, entry, argument);
+}
+
+KSSystem& ks_system() {
+    static KSSystem real;
+    KSSystem* const other = standIn.load();
+    return other != nullptr ? *other : real;
+}
+
+void ks_useSystem(KSSystem* other) { standIn.store(other); }

@@ -1,0 +1,33 @@
+// The system calls that the tests stand in for.
+#ifndef HOSTSVC_KSSYSTEM_H
+#define HOSTSVC_KSSYSTEM_H
+
+#include <pthread.h>
+#include <sys/time.h>
+
+// The base class makes the calls. Any thread may use it.
+class KSSystem {
+  public:
+    KSSystem() = default;
+    KSSystem(const KSSystem&) = delete;
+    KSSystem& operator=(const KSSystem&) = delete;
+    virtual ~KSSystem() = default;
+
+    // The C library's sleep: what is left, in seconds.
+    virtual unsigned sleep(unsigned seconds);
+
+    // select on no descriptors: 0 when the time has passed, -1 when a signal came first.
+    virtual int waitFor(timeval timeout);
+
+    // pthread_create: 0, or what was wrong.
+    virtual int createThread(const pthread_attr_t* attributes, void* (*entry)(void*), void* argument);
+};
+
+// The one in use.
+KSSystem& ks_system();
+
+// Puts another in its place, or the system itself back with null. The caller keeps it alive as long as any
+// thread may call it.
+void ks_useSystem(KSSystem* other);
+
+#endif

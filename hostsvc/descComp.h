@@ -1,0 +1,13 @@
+// Equality of transport addresses.
+#ifndef HOSTSVC_DESCCOMP_H
+#define HOSTSVC_DESCCOMP_H
+
+#include "norv/norv.h"
+
+// The two unused octets do not count.
+inline bool descComp(NvCompDesc a, NvCompDesc b) {
+    return a.instance == b.instance && a.board == b.board && a.processor == b.processor &&
+           a.component == b.component && a.node == b.node;
+}
+
+#endif

@@ -1,0 +1,498 @@
+#include "hostsvc/KSMsgQueue.h"
+
+#include <gmock/gmock.h>
+#include <sched.h>
+
+#include <atomic>
+#include <condition_variable>
+#include <cstdlib>
+#include <deque>
+#include <memory>
+#include <mutex>
+#include <optional>
+#include <thread>
+#include <vector>
+
+#include "hostsvc/descComp.h"
+#include "tests/support/fake_norv.h"
+#include "tests/support/test_system.h"
+
+// The two halves of a request by themselves: a requester that gives up at the last moment.
+struct KSMsgQueueProbe {
+    static void expect(KSMsgQueue& queue, unsigned transaction, unsigned replyType, NvCompDesc source) {
+        queue.expect({transaction, replyType, source, false});
+    }
+    static void giveUp(KSMsgQueue& queue) { queue.giveUp(); }
+    static bool waiting(KSMsgQueue& queue) {
+        const std::lock_guard lock(queue.guard_);
+        return queue.waiting_;
+    }
+};
+
+namespace {
+
+using fake_norv::Message;
+using fake_norv::Op;
+using testing::ElementsAre;
+
+constexpr NvCompDesc Board{2, 1, 0, 1, 0x15, 0, 0};
+constexpr NvCompDesc Elsewhere{3, 1, 0, 1, 0x15, 0, 0};
+constexpr unsigned Command = 8;
+constexpr unsigned Reply = 9;
+constexpr unsigned Soon = 10000;  // ms; what is waited for comes at once
+
+// Keeps the types of what it receives; frees the messages.
+class Receiver : public KSAsyncMsgReceiver {
+  public:
+    int receive(KSMsgRef& msg) {
+        const unsigned type = msg.getMsgType();
+        msg.free();
+        const std::lock_guard lock(lock_);
+        types_.push_back(type);
+        changed_.notify_all();
+        return 1;
+    }
+
+    std::vector<unsigned> types() const {
+        const std::lock_guard lock(lock_);
+        return types_;
+    }
+
+    bool waitFor(std::size_t count) {
+        std::unique_lock lock(lock_);
+        return changed_.wait_for(lock, std::chrono::seconds(30), [&] { return types_.size() >= count; });
+    }
+
+  private:
+    mutable std::mutex lock_;
+    std::condition_variable changed_;
+    std::vector<unsigned> types_;
+};
+
+constexpr auto ReceiverMember = static_cast<KSMsgQueue::AsyncMember>(&Receiver::receive);
+
+// Takes what is parked.
+class SynchronousQueue : public KSMsgQueue {
+  public:
+    using KSMsgQueue::KSMsgQueue;
+
+    unsigned read() {
+        messageAvailable_.lock();
+        KSMsgRef msg(std::exchange(unclaimed_, nullptr));
+        slotFree_.unlock();
+        const unsigned type = msg.getMsgType();
+        msg.free();
+        return type;
+    }
+};
+
+class KSMsgQueueTest : public testing::Test {
+  protected:
+    KSMsgQueueTest() {
+        fake_norv::reset();
+        unsetenv("HOST");
+        unsetenv("REMOTE_NORV");
+        queue_.emplace(NvCompDesc{}, 512, 5, nullptr);
+    }
+    ~KSMsgQueueTest() override {
+        queue_.reset();
+        EXPECT_EQ(fake_norv::openQueues(), 0U);
+        EXPECT_EQ(fake_norv::outstanding(), 0U);
+        EXPECT_THAT(fake_norv::misuses(), ElementsAre());
+        fake_norv::reset();
+    }
+
+    void receive() {
+        queue_->registerAsyncCallback(static_cast<KSAsyncMsgReceiver*>(&receiver_), ReceiverMember);
+    }
+
+    static KSMsgRef command(unsigned transaction = 10000) {
+        KSMsgRef msg(0U);
+        msg.setMsgType(Command);
+        msg.setTrans(transaction);
+        msg.setTgtAddr(Board);
+        return msg;
+    }
+
+    // What came back: its type, or nothing. The message is freed.
+    std::optional<unsigned> ask(unsigned timeoutMs, int anySource = 0, unsigned transaction = 10000) {
+        KSMsgRef msg = command(transaction);
+        KSMsgRef back = queue_->request(msg, timeoutMs, Reply, anySource);
+        EXPECT_EQ(msg.getMsgRef(), nullptr);
+        if (back.getMsgRef() == nullptr)
+            return std::nullopt;
+        const unsigned type = back.getMsgType();
+        back.free();
+        return type;
+    }
+
+    void event(unsigned type) const {
+        EXPECT_TRUE(fake_norv::deliver({0, type, Board, queue_->getHostDesc(), {}}));
+    }
+
+    // Each command is answered with these messages, all of its transaction unless they have one.
+    static void answers(std::vector<Message> with) {
+        fake_norv::onWrite([with](const Message& heard) {
+            if (heard.type != Command)
+                return;
+            for (Message message : with) {
+                message.transaction = message.transaction != 0 ? message.transaction : heard.transaction;
+                message.target = heard.source;
+                fake_norv::deliver(message);
+            }
+        });
+    }
+
+    Receiver receiver_;
+    std::optional<SynchronousQueue> queue_;
+};
+
+TEST_F(KSMsgQueueTest, ARequestIsSentUnderTheQueuesAddressAndReturnsItsReply) {
+    answers({{0, Reply, Board, {}, {}}});
+    EXPECT_EQ(ask(Soon), Reply);
+    const Message sent = fake_norv::written().at(0);
+    EXPECT_TRUE(descComp(sent.source, queue_->getHostDesc()));
+    EXPECT_TRUE(descComp(sent.target, Board));
+    EXPECT_EQ(sent.transaction, 10000U);
+    EXPECT_EQ(sent.type, Command);
+}
+
+TEST_F(KSMsgQueueTest, RepliesOfTheGeneralTypeAndOfTypeZeroAnswerAnyRequest) {
+    answers({{0, 8388609, Board, {}, {}}});
+    EXPECT_EQ(ask(Soon), 0x800001U);
+    answers({{0, 0, Board, {}, {}}});
+    EXPECT_EQ(ask(Soon), 0U);
+}
+
+TEST_F(KSMsgQueueTest, AMessageOfAnotherTypeOrTransactionIsNoReply) {
+    receive();
+    answers({{0, Reply + 1, Board, {}, {}}, {10001, Reply, Board, {}, {}}, {0, Reply, Board, {}, {}}});
+    EXPECT_EQ(ask(Soon), Reply);
+    EXPECT_THAT(receiver_.types(), ElementsAre(Reply + 1, Reply));
+}
+
+TEST_F(KSMsgQueueTest, AReplyFromAnotherSourceCountsOnlyWhenAnySourceMayAnswer) {
+    receive();
+    answers({{0, Reply, Elsewhere, {}, {}}});
+    EXPECT_EQ(ask(Soon, 1), Reply);
+    EXPECT_THAT(receiver_.types(), ElementsAre());
+    {
+        SleeplessSystem system;
+        EXPECT_EQ(ask(50), std::nullopt);
+    }
+    ASSERT_TRUE(receiver_.waitFor(1));
+    EXPECT_THAT(receiver_.types(), ElementsAre(Reply));
+}
+
+TEST_F(KSMsgQueueTest, ARequestWithoutTimeoutReturnsAFreshEmptyMessage) {
+    receive();
+    answers({{0, Reply, Board, {}, {1, 2, 3}}});
+    KSMsgRef msg = command();
+    KSMsgRef back = queue_->request(msg, 0, Reply, 0);
+    EXPECT_EQ(back.getSize(), 0U);
+    EXPECT_NE(back.getMsgType(), Reply);
+    back.free();
+    ASSERT_TRUE(receiver_.waitFor(1));
+    EXPECT_THAT(receiver_.types(), ElementsAre(Reply));
+}
+
+TEST_F(KSMsgQueueTest, ARequestWithoutTimeoutAndWithoutMemoryThrowsOnceItIsSent) {
+    KSMsgRef msg = command();
+    fake_norv::fail(Op::Allocate);
+    EXPECT_THROW(queue_->request(msg, 0, Reply, 0), KSMsgRef::AllocationError);
+    EXPECT_EQ(fake_norv::written().size(), 1U);
+}
+
+TEST_F(KSMsgQueueTest, ARequestThatNobodyAnswersPollsEveryTenMillisecondsAndReturnsNothing) {
+    SleeplessSystem system;
+    EXPECT_EQ(ask(50), std::nullopt);
+    EXPECT_THAT(system.naps(), ElementsAre(10000, 10000, 10000, 10000, 10000));
+}
+
+TEST_F(KSMsgQueueTest, ARequestThatTheTransportLosesTimesOut) {
+    SleeplessSystem system;
+    fake_norv::fail(Op::Write);
+    EXPECT_EQ(ask(20), std::nullopt);
+}
+
+TEST_F(KSMsgQueueTest, AReplyThatComesLateGoesToTheReceiver) {
+    receive();
+    {
+        SleeplessSystem system;
+        EXPECT_EQ(ask(10), std::nullopt);
+    }
+    fake_norv::deliver(fake_norv::replyTo(fake_norv::written().at(0), Reply));
+    ASSERT_TRUE(receiver_.waitFor(1));
+    EXPECT_THAT(receiver_.types(), ElementsAre(Reply));
+    answers({{0, Reply, Board, {}, {}}});
+    EXPECT_EQ(ask(Soon, 0, 10001), Reply);
+}
+
+// The reply of transaction 10000 has reached the slot just when its requester gave up.
+void leaveReplyBehind(KSMsgQueue& queue) {
+    KSMsgQueueProbe::expect(queue, 10000, Reply, Board);
+    fake_norv::deliver({10000, Reply, Board, queue.getHostDesc(), {}});
+    while (KSMsgQueueProbe::waiting(queue))
+        std::this_thread::yield();
+    KSMsgQueueProbe::giveUp(queue);
+}
+
+TEST_F(KSMsgQueueTest, AReplyGivenUpAtTheLastMomentGoesToTheReceiverDuringTheNextRequest) {
+    receive();
+    leaveReplyBehind(*queue_);
+    answers({{0, 0x800001, Board, {}, {}}});
+    EXPECT_EQ(ask(Soon, 0, 10001), 0x800001U);
+    EXPECT_THAT(receiver_.types(), ElementsAre(Reply));
+}
+
+TEST_F(KSMsgQueueTest, AReplyGivenUpAtTheLastMomentIsParkedWhereThereIsNoReceiver) {
+    leaveReplyBehind(*queue_);
+    answers({{0, 0x800001, Board, {}, {}}});
+    EXPECT_EQ(ask(Soon, 0, 10001), 0x800001U);
+    EXPECT_EQ(queue_->read(), Reply);
+}
+
+TEST_F(KSMsgQueueTest, AReplyThatNobodyTookIsFreedWithTheQueue) {
+    leaveReplyBehind(*queue_);
+    EXPECT_EQ(fake_norv::outstanding(), 1U);
+    queue_.reset();
+    EXPECT_EQ(fake_norv::outstanding(), 0U);
+}
+
+TEST_F(KSMsgQueueTest, ARequestWithoutTimeoutDoesNotDisturbOneThatWaits) {
+    bool nested = false;
+    fake_norv::onWrite([&](const Message& heard) {
+        if (heard.transaction == 10000) {
+            KSMsgRef other = command(20000);
+            KSMsgRef back = queue_->request(other, 0, 0, 0);
+            nested = true;
+            back.free();
+            fake_norv::deliver(fake_norv::replyTo(heard, Reply));
+        }
+    });
+    EXPECT_EQ(ask(Soon), Reply);
+    EXPECT_TRUE(nested);
+}
+
+TEST_F(KSMsgQueueTest, TheReceiverGetsWhatNobodyWaitsFor) {
+    receive();
+    event(1001);
+    event(1002);
+    ASSERT_TRUE(receiver_.waitFor(2));
+    EXPECT_THAT(receiver_.types(), ElementsAre(1001, 1002));
+}
+
+std::atomic<unsigned> plainCalls{0};
+
+int notePlain(KSMsgRef& msg) {
+    plainCalls += msg.getMsgType();
+    return 0;
+}
+
+int takePlain(KSMsgRef& msg) {
+    plainCalls += msg.getMsgType();
+    msg.free();
+    return 0;
+}
+
+TEST_F(KSMsgQueueTest, APlainCallbackIsCalledBesideTheReceiver) {
+    plainCalls = 0;
+    receive();
+    queue_->registerAsyncCallback(notePlain);
+    event(1001);
+    ASSERT_TRUE(receiver_.waitFor(1));
+    EXPECT_EQ(plainCalls, 1001U);
+}
+
+TEST_F(KSMsgQueueTest, APlainCallbackAloneOwnsTheMessage) {
+    plainCalls = 0;
+    queue_->registerAsyncCallback(takePlain);
+    event(1001);
+    while (plainCalls == 0)
+        std::this_thread::yield();
+    EXPECT_EQ(plainCalls, 1001U);
+}
+
+TEST_F(KSMsgQueueTest, AReceiverReplacesThePlainCallbackAndTheReceiverBefore) {
+    plainCalls = 0;
+    Receiver other;
+    queue_->registerAsyncCallback(static_cast<KSAsyncMsgReceiver*>(&other), ReceiverMember);
+    queue_->registerAsyncCallback(notePlain);
+    receive();
+    event(1001);
+    ASSERT_TRUE(receiver_.waitFor(1));
+    EXPECT_EQ(plainCalls, 0U);
+    EXPECT_THAT(other.types(), ElementsAre());
+}
+
+TEST_F(KSMsgQueueTest, WithoutReceiverMessagesAreParkedOneAtATime) {
+    event(1001);
+    event(1002);
+    event(1003);
+    EXPECT_EQ(queue_->read(), 1001U);
+    EXPECT_EQ(queue_->read(), 1002U);
+    EXPECT_EQ(queue_->read(), 1003U);
+}
+
+TEST_F(KSMsgQueueTest, AReceiverThatComesLaterGetsTheMessageThatWaitsForTheSlot) {
+    event(1001);
+    event(1002);
+    ASSERT_TRUE(fake_norv::waitForCalls(Op::Read, 2));  // the first is parked, the second waits
+    receive();
+    ASSERT_TRUE(receiver_.waitFor(1));
+    EXPECT_THAT(receiver_.types(), ElementsAre(1002));
+    EXPECT_EQ(queue_->read(), 1001U);
+}
+
+TEST_F(KSMsgQueueTest, DestructionFreesTheParkedMessageAndTheOneThatWaitsForItsPlace) {
+    event(1001);
+    event(1002);
+    event(1003);
+    ASSERT_TRUE(fake_norv::waitForCalls(Op::Read, 2));
+    queue_.reset();
+    EXPECT_EQ(fake_norv::outstanding(), 0U);
+}
+
+TEST_F(KSMsgQueueTest, DestructionWakesTheReaderAndClosesTheTransportsQueue) {
+    ASSERT_TRUE(fake_norv::waitForIdleReader());
+    queue_.reset();
+    EXPECT_THAT(fake_norv::texts(), ElementsAre("nvQueueOpen()", "nvQueueBind(100)", "nvMsgAllocate(0)",
+                                                "nvMsgWrite(100, type 0x0)", "nvMsgFree()",
+                                                "nvQueueUnbind(100, 0x1001)", "nvQueueClose(100)"));
+}
+
+TEST_F(KSMsgQueueTest, DestructionWithoutMemoryForTheWakeUpEndsTheReaderAllTheSame) {
+    SleeplessSystem system;
+    ASSERT_TRUE(fake_norv::waitForIdleReader());
+    fake_norv::fail(Op::Allocate, 2);
+    queue_.reset();
+    EXPECT_EQ(fake_norv::openQueues(), 0U);
+    EXPECT_EQ(fake_norv::written().size(), 0U);
+}
+
+TEST_F(KSMsgQueueTest, DestructionWhileMessagesArriveLeavesNoneBehind) {
+    receive();
+    for (int round = 0; round < 50; ++round) {
+        std::atomic<bool> stop{false};
+        const NvCompDesc host = queue_->getHostDesc();
+        std::thread board([&] {
+            while (!stop)
+                fake_norv::deliver({0, 1001, Board, host, {1, 2, 3}});
+        });
+        ASSERT_TRUE(receiver_.waitFor(receiver_.types().size() + 1));
+        queue_.reset();
+        stop = true;
+        board.join();
+        EXPECT_EQ(fake_norv::outstanding(), 0U);
+        queue_.emplace(NvCompDesc{}, 512, 5, nullptr);
+        receive();
+    }
+}
+
+TEST_F(KSMsgQueueTest, QueuesComeAndGo) {
+    for (int round = 0; round < 100; ++round) {
+        queue_.reset();
+        queue_.emplace(NvCompDesc{}, 512, 5, nullptr);
+    }
+}
+
+TEST_F(KSMsgQueueTest, AReadThatFailsIsAWakeUpAndNoMore) {
+    receive();
+    ASSERT_TRUE(fake_norv::waitForIdleReader());
+    fake_norv::fail(Op::Read, 3);
+    event(1001);  // ends the read that is under way
+    ASSERT_TRUE(receiver_.waitFor(1));
+    event(1002);
+    ASSERT_TRUE(receiver_.waitFor(2));
+    EXPECT_THAT(receiver_.types(), ElementsAre(1001, 1002));
+}
+
+TEST_F(KSMsgQueueTest, ReadsThatKeepFailingArePaced) {
+    SleeplessSystem system;
+    ASSERT_TRUE(fake_norv::waitForIdleReader());
+    fake_norv::fail(Op::Read, 5);
+    receive();
+    event(1001);
+    event(1002);
+    ASSERT_TRUE(receiver_.waitFor(2));
+    EXPECT_THAT(system.naps(), ElementsAre(10000, 10000, 10000, 10000));
+    queue_.reset();  // before the system
+}
+
+// A reply that comes about when its requester gives up reaches one of the two, and never a later request.
+TEST_F(KSMsgQueueTest, NoReplyIsLostOrMistakenAroundTheTimeout) {
+    receive();
+    SleeplessSystem system;
+    system.insteadOfNapping = [] { sched_yield(); };
+    std::mutex lock;
+    std::condition_variable changed;
+    std::deque<Message> heard;
+    bool stop = false;
+    std::thread board([&] {
+        for (;;) {
+            std::unique_lock held(lock);
+            changed.wait(held, [&] { return stop || !heard.empty(); });
+            if (heard.empty())
+                return;
+            const Message answer = fake_norv::replyTo(heard.front(), Reply);
+            heard.pop_front();
+            held.unlock();
+            fake_norv::deliver(answer);
+        }
+    });
+    fake_norv::onWrite([&](const Message& message) {
+        const std::lock_guard held(lock);
+        if (message.type == Command)
+            heard.push_back(message);
+        changed.notify_all();
+    });
+    constexpr unsigned rounds = 500;
+    std::size_t got = 0;
+    for (unsigned i = 0; i < rounds; ++i) {
+        KSMsgRef msg = command(10000 + i);
+        KSMsgRef back = queue_->request(msg, 10, Reply, 0);
+        if (back.getMsgRef() == nullptr)
+            continue;
+        EXPECT_EQ(back.getTrans(), 10000 + i);
+        back.free();
+        ++got;
+    }
+    {
+        const std::lock_guard held(lock);
+        stop = true;
+        changed.notify_all();
+    }
+    board.join();
+    ASSERT_TRUE(fake_norv::waitForIdleReader());
+    const std::size_t left = fake_norv::outstanding();  // in the slot: the last one, perhaps
+    EXPECT_LE(left, 1U);
+    EXPECT_EQ(got + receiver_.types().size() + left, rounds);
+    queue_.reset();  // before the system
+}
+
+TEST(KSMsgQueueCreation, ATransportThatCannotBeOpenedThrows) {
+    fake_norv::reset();
+    fake_norv::fail(Op::Open, 2);
+    EXPECT_THROW(KSMsgQueue({}, 0, 0, nullptr), KSResource_CreationError);
+    EXPECT_THROW(KSMsgQueue({}, 0, 0, "another-machine"), KSResource_CreationError);
+    EXPECT_EQ(fake_norv::openQueues(), 0U);
+}
+
+TEST(KSMsgQueueCreation, AReaderThatTheSystemRefusesThrowsAndLeavesNothingOpen) {
+    fake_norv::reset();
+    ThreadlessSystem system;
+    EXPECT_THROW(KSMsgQueue({}, 0, 0, nullptr), KSResource_CreationError);
+    EXPECT_EQ(fake_norv::openQueues(), 0U);
+    EXPECT_EQ(fake_norv::outstanding(), 0U);
+}
+
+TEST(KSMsgQueueThreadCleanup, ItFreesTheMessageAndForgetsIt) {
+    fake_norv::reset();
+    NvMsg32Bit* msg = KSMsgRef(4U).getMsgRef();
+    EXPECT_EQ(KSMsgQueueThread_Cleanup(&msg), nullptr);
+    EXPECT_EQ(msg, nullptr);
+    KSMsgQueueThread_Cleanup(&msg);
+    EXPECT_EQ(fake_norv::count(Op::Free), 1U);
+}
+
+}  // namespace

@@ -1,0 +1,103 @@
+#include "hostsvc/KSSemaphore.h"
+
+#include <gmock/gmock.h>
+#include <pthread.h>
+#include <semaphore.h>
+
+#include <atomic>
+#include <climits>
+#include <csignal>
+#include <thread>
+
+#include "tests/support/test_system.h"
+
+namespace {
+
+using testing::Each;
+using testing::IsEmpty;
+using testing::SizeIs;
+
+TEST(KSSemaphore, AnInitialCountAboveTheMaximumIsRefused) {
+    EXPECT_THROW(KSSemaphore(2, 3), KSSemaphore::CreationError);
+    EXPECT_THROW(KSSemaphore(1, 2), KSException);
+    EXPECT_NO_THROW(KSSemaphore(2, 2));
+    EXPECT_NO_THROW(KSSemaphore(0, 0));
+}
+
+TEST(KSSemaphore, AnInitialCountThatTheSystemCannotHoldIsRefused) {
+    EXPECT_THROW(KSSemaphore(UINT_MAX, UINT_MAX), KSSemaphore::CreationError);
+}
+
+TEST(KSSemaphore, ItCountsPostsAndWaits) {
+    KSSemaphore semaphore(2, 1);
+    EXPECT_TRUE(semaphore.tryWait());
+    EXPECT_FALSE(semaphore.tryWait());
+    semaphore.post();
+    semaphore.wait();
+    EXPECT_FALSE(semaphore.tryWait());
+}
+
+TEST(KSSemaphore, TheMaximumDoesNotBoundPosts) {
+    KSSemaphore semaphore(1, 1);
+    semaphore.post();
+    EXPECT_TRUE(semaphore.tryWait());
+    EXPECT_TRUE(semaphore.tryWait());
+}
+
+TEST(KSSemaphore, APostThatTheSystemRefusesThrows) {
+    KSSemaphore semaphore(UINT_MAX, INT_MAX);
+    EXPECT_THROW(semaphore.post(), KSSemaphore::PostError);
+}
+
+TEST(KSSemaphore, APolledTryWaitPollsLikeTheMutex) {
+    SleeplessSystem system;
+    KSSemaphore semaphore(1, 0);
+    EXPECT_FALSE(semaphore.tryWait(100, 10));
+    EXPECT_THAT(system.naps(), SizeIs(10));
+    EXPECT_THAT(system.naps(), Each(10000));
+}
+
+TEST(KSSemaphore, ATimeoutBelowTheIntervalMakesOneAttempt) {
+    SleeplessSystem system;
+    KSSemaphore semaphore(1, 1);
+    EXPECT_TRUE(semaphore.tryWait(5, 10));
+    EXPECT_FALSE(semaphore.tryWait(5, 10));
+    EXPECT_THAT(system.naps(), IsEmpty());
+}
+
+TEST(KSSemaphore, ThePostIsSeenAtTheLastAttempt) {
+    SleeplessSystem system;
+    KSSemaphore semaphore(1, 0);
+    system.insteadOfNapping = [&] {
+        if (system.naps().size() == 10)
+            semaphore.post();
+    };
+    EXPECT_TRUE(semaphore.tryWait(100, 10));
+}
+
+std::atomic<int> signalsHandled{0};
+
+TEST(KSSemaphore, SignalsDoNotEndAWait) {
+    struct sigaction handler {};
+    handler.sa_handler = [](int) { ++signalsHandled; };  // no SA_RESTART: the system's wait is interrupted
+    struct sigaction before {};
+    sigaction(SIGUSR1, &handler, &before);
+    KSSemaphore semaphore(1, 0);
+    std::atomic<bool> ended{false};
+    std::thread waiter([&] {
+        semaphore.wait();
+        ended = true;
+    });
+    for (int sent = 1; sent <= 3; ++sent) {
+        pthread_kill(waiter.native_handle(), SIGUSR1);
+        while (signalsHandled < sent)
+            std::this_thread::yield();
+    }
+    EXPECT_FALSE(ended);
+    semaphore.post();
+    waiter.join();
+    EXPECT_TRUE(ended);
+    sigaction(SIGUSR1, &before, nullptr);
+}
+
+}  // namespace
