@@ -5,6 +5,7 @@
 #include <iostream>
 #include <memory>
 
+#include "app/Arrivals.h"
 #include "app/arguments.h"
 #include "app/banner.h"
 #include "app/display.h"
@@ -53,7 +54,7 @@ vela::TSCComponent findTsc(vela::Board& board) {
 }
 
 void openCcs(const vela::Instance& instance) {
-    ccs = std::make_unique<vela::CCS>(instance.getTgtDesc(), nullptr);
+    ccs = std::make_unique<TracedCcs>(instance.getTgtDesc(), nullptr);
     std::cout << "CCS instance Number" << ccs->getTgtDesc() << std::endl;
 }
 
@@ -120,7 +121,10 @@ void quit() {
         Process.cancel();
         Process.join();
     });
-    attempt([] { ccs.reset(); });
+    attempt([] {
+        arrivals.close();  // the object's callbacks have to end before it can
+        ccs.reset();
+    });
     attempt(discardQueued);
     attempt(closeLog);
 }
