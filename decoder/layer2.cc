@@ -9,7 +9,8 @@ namespace {
 
 // The management entity's fields (Q.921, 5.3.1). The second octet of the reference number has no leading
 // zero.
-void managementLines(RingBuffer* rb, unsigned char octet) {
+void managementLines(RingBuffer* rb) {
+    unsigned char octet = 0;
     getblockchar(rb, &octet);
     line("    0x", hex(octet), "  Layer ME ID");
     output(flag);
@@ -52,21 +53,23 @@ void layer_2(RingBuffer* rb) {
     text("0x", hex(octet), "  Information\n");
 }
 
+// Its first octet of its own is the one after the control octet: 0 when the frame ends there.
 void con_fld_com_rep(RingBuffer* rb, unsigned char control) {
     const FrameName& frame = frameName(control);
+    unsigned char octet = 0;
     switch (frame.kind) {
         case FrameKind::none:
             break;
         case FrameKind::supervisory:
             text("0x", hex(control), " ");
-            getblockchar(rb, &control);
-            text("0x", hex(control), "  ", frame.name, "\n");
+            getblockchar(rb, &octet);
+            text("0x", hex(octet), "  ", frame.name, "\n");
             break;
         case FrameKind::unnumbered:
         case FrameKind::unnumberedInformation:
             text("    0x", hex(control), "  ", frame.name, "\n");
             if (frame.kind == FrameKind::unnumberedInformation && tei == 127 && sapi == 63)
-                managementLines(rb, control);
+                managementLines(rb);
             break;
     }
 }

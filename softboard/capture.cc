@@ -36,7 +36,7 @@ Capture open(const std::string& path) {
     char reason[PCAP_ERRBUF_SIZE] = "";
     Capture capture(pcap_fopen_offline(file, reason));
     if (!capture) {
-        std::fclose(file);
+        static_cast<void>(std::fclose(file));  // it was read only
         throw BadInput(path + ": " + reason);
     }
     const int type = pcap_datalink(capture.get());
@@ -128,13 +128,14 @@ class Reader {
 Frames readCapture(const std::string& path) { return Reader(path).readAll(); }
 
 bool Directions::isTransmitted(const std::vector<uint8_t>& octets) {
-    const bool commandResponse = !octets.empty() && (octets[0] & 0x02) != 0;
-    const uint8_t control = octets.size() > 2 ? octets[2] : 0;
-    const bool pollFinal = octets.size() > 3 && (octets[3] & 0x01) != 0;
-    return isCommand(control, commandResponse, pollFinal) != commandResponse;
+    const auto octet = [&](size_t at) -> uint8_t { return at < octets.size() ? octets[at] : 0; };
+    const bool commandResponse = (octet(0) & 0x02) != 0;
+    const bool pollFinal = (octet(3) & 0x01) != 0;
+    const uint32_t address = octet(0) << 8U | octet(1);
+    return isCommand(octet(2), pollFinal, address) != commandResponse;
 }
 
-bool Directions::isCommand(uint8_t control, bool commandResponse, bool pollFinal) {
+bool Directions::isCommand(uint8_t control, bool pollFinal, uint32_t address) {
     constexpr uint8_t pollFinalBit = 0x10;  // of an unnumbered frame
     if ((control & 0x01) == 0) {
         return true;  // I
@@ -143,12 +144,11 @@ bool Directions::isCommand(uint8_t control, bool commandResponse, bool pollFinal
         const int frame = control & ~pollFinalBit;
         return frame != 0x0f && frame != 0x63 && frame != 0x87;  // DM, UA, FRMR
     }
-    if (!pollFinal) {
+    if (!pollFinal || polled_.erase(address) > 0) {
         return false;
     }
-    bool& polled = polled_[commandResponse ? 1 : 0];
-    polled = !polled;
-    return polled;
+    polled_.insert(address);
+    return true;
 }
 
 }  // namespace softboard

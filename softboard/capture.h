@@ -2,6 +2,7 @@
 #ifndef SOFTBOARD_CAPTURE_H
 #define SOFTBOARD_CAPTURE_H
 
+#include <set>
 #include <string>
 
 #include "softboard/scenario.h"
@@ -22,9 +23,9 @@ class Directions {
     bool isTransmitted(const std::vector<uint8_t>& octets);
 
   private:
-    bool isCommand(uint8_t control, bool commandResponse, bool pollFinal);
+    bool isCommand(uint8_t control, bool pollFinal, uint32_t address);
 
-    bool polled_[2] = {false, false};  // by C/R bit: a poll waits for its answer
+    std::set<uint32_t> polled_;  // addresses, C/R bit included, with which a poll waits for its answer
 };
 
 }  // namespace softboard

@@ -80,6 +80,7 @@ fs::path findProgram(const fs::path& self, const std::string& name) {
 int becomeProgram(const fs::path& self, const std::vector<std::string>& program) {
     std::vector<std::string> words = program;
     std::vector<char*> argv;
+    argv.reserve(words.size() + 1);
     for (std::string& word : words) {
         argv.push_back(word.data());
     }

@@ -36,6 +36,21 @@ void checkStorage(const char* function, const void* storage) {
     }
 }
 
+// The pairs of descriptor and storage, each moved by `move`, which tells whether the field was there.
+template <class Move>
+uint32_t moveFields(const char* function, uint32_t count, va_list fields, Move move) {
+    uint32_t status = NVSTATUS_OK;
+    for (; count > 0; --count) {
+        const uint32_t descriptor = va_arg(fields, uint32_t);
+        void* storage = va_arg(fields, void*);
+        checkStorage(function, storage);
+        if (!move(descriptor, storage)) {
+            status = NVSTATUS_ERROR;
+        }
+    }
+    return status;
+}
+
 }  // namespace
 
 uint32_t nvDrvSetInterface(uint32_t /*unused*/, uint32_t /*unused*/) {
@@ -93,17 +108,11 @@ uint32_t nvMsgFieldPut(NvMsg32Bit* msg, uint32_t index, void* value) {
 uint32_t nvMsgVarFieldGet(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...) {
     const auto body = bodyOf("nvMsgVarFieldGet", msg);
     checkOffset("nvMsgVarFieldGet", offset, wildOffset);
-    uint32_t status = NVSTATUS_OK;
     va_list fields;
     va_start(fields, offset);
-    for (; count > 0; --count) {
-        const uint32_t descriptor = va_arg(fields, uint32_t);
-        void* storage = va_arg(fields, void*);
-        checkStorage("nvMsgVarFieldGet", storage);
-        if (!softboard::getField(body, *offset, descriptor, storage)) {
-            status = NVSTATUS_ERROR;
-        }
-    }
+    const uint32_t status = moveFields("nvMsgVarFieldGet", count, fields, [&](uint32_t descriptor, void* to) {
+        return softboard::getField(body, *offset, descriptor, to);
+    });
     va_end(fields);
     return status;
 }
@@ -111,17 +120,12 @@ uint32_t nvMsgVarFieldGet(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...
 uint32_t nvMsgVarFieldPut(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...) {
     const auto body = bodyOf("nvMsgVarFieldPut", msg);
     checkOffset("nvMsgVarFieldPut", offset, body.size());
-    uint32_t status = NVSTATUS_OK;
     va_list fields;
     va_start(fields, offset);
-    for (; count > 0; --count) {
-        const uint32_t descriptor = va_arg(fields, uint32_t);
-        const void* storage = va_arg(fields, void*);
-        checkStorage("nvMsgVarFieldPut", storage);
-        if (!softboard::putField(body, *offset, descriptor, storage)) {
-            status = NVSTATUS_ERROR;
-        }
-    }
+    const uint32_t status =
+        moveFields("nvMsgVarFieldPut", count, fields, [&](uint32_t descriptor, void* from) {
+            return softboard::putField(body, *offset, descriptor, from);
+        });
     va_end(fields);
     return status;
 }

@@ -27,7 +27,7 @@ Address BodyReader::address() {
 }
 
 Octets BodyReader::rest() {
-    const Octets taken(rest_.begin(), rest_.end());
+    Octets taken(rest_.begin(), rest_.end());
     rest_ = {};
     return taken;
 }

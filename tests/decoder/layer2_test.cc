@@ -134,7 +134,7 @@ TEST_F(Layer2, OtherUnnumberedFramesOfTheManagementAddressHaveNoManagementFields
     EXPECT_EQ(tei, 127);
 }
 
-TEST_F(Layer2, AFrameThatEndsEarlyIsClassifiedByItsLastOctet) {
+TEST_F(Layer2, AFrameThatEndsEarlyIsClassifiedByItsLastOctetAndWhatIsMissingIs0) {
     const struct {
         const char* says;
         std::vector<unsigned char> octets;
@@ -142,16 +142,16 @@ TEST_F(Layer2, AFrameThatEndsEarlyIsClassifiedByItsLastOctet) {
     } cases[] = {
         {"no octet", {}, ""},
         {"one octet, information", {0x02}, "Command=1   SAPI=0x00\n0x02 0x02  Information\n"},
-        {"one octet, supervisory", {0x01}, "Response=0    SAPI=0x00\n0x01 0x01  Receive Ready\n"},
+        {"one octet, supervisory", {0x01}, "Response=0    SAPI=0x00\n0x01 0x00  Receive Ready\n"},
         {"one octet, unnumbered", {0x43}, "Command=1   SAPI=0x10\n    0x43  Disconnect\n"},
-        {"two octets", {0x02, 0x01}, "Command=1   SAPI=0x00\nTEI=0x00\n0x01 0x01  Receive Ready\n"},
+        {"two octets", {0x02, 0x01}, "Command=1   SAPI=0x00\nTEI=0x00\n0x01 0x00  Receive Ready\n"},
         {"no second control octet",
          {0x02, 0x01, 0x04},
          "Command=1   SAPI=0x00\nTEI=0x00\n0x04 0x04  Information\n"},
         {"management without fields",
          {0xFC, 0xFF, 0x03},
          "Response=0    SAPI=0x3f\nTEI=0x7f\n    0x03  Unnumbered Information\n"
-         "    0x03  Layer ME ID\n    0x033 Reference Number\n    0x03 Message ID\n    0x03 Action ID\n"},
+         "    0x00  Layer ME ID\n    0x000 Reference Number\n    0x00 Message ID\n    0x00 Action ID\n"},
     };
     for (const auto& c : cases)
         EXPECT_EQ(decodedBy(layer_2, c.octets), c.expected) << c.says;
