@@ -1,0 +1,67 @@
+// Stand-ins for the system calls of the host services.
+#ifndef TESTS_SUPPORT_TEST_SYSTEM_H
+#define TESTS_SUPPORT_TEST_SYSTEM_H
+
+#include <algorithm>
+#include <functional>
+#include <mutex>
+#include <utility>
+#include <vector>
+
+#include "hostsvc/KSSystem.h"
+
+// While it lives, sleeps take no time: they are noted, and the test may act instead.
+class SleeplessSystem : public KSSystem {
+  public:
+    SleeplessSystem() { ks_useSystem(this); }
+    ~SleeplessSystem() override { ks_useSystem(nullptr); }
+
+    // Microseconds of every short sleep so far.
+    std::vector<long> naps() const {
+        const std::lock_guard lock(lock_);
+        return naps_;
+    }
+    // Seconds of every long one.
+    std::vector<unsigned> sleeps() const {
+        const std::lock_guard lock(lock_);
+        return sleeps_;
+    }
+
+    std::function<void()> insteadOfNapping;  // set before any thread sleeps
+    int napResult = 0;                       // -1: a signal came first
+
+    unsigned sleep(unsigned seconds) override {
+        const std::lock_guard lock(lock_);
+        sleeps_.push_back(seconds);
+        return 0;
+    }
+
+    int waitFor(timeval timeout) override {
+        {
+            const std::lock_guard lock(lock_);
+            naps_.push_back(timeout.tv_sec * 1000000L + timeout.tv_usec);
+        }
+        if (insteadOfNapping)
+            insteadOfNapping();
+        return napResult;
+    }
+
+  private:
+    mutable std::mutex lock_;
+    std::vector<long> naps_;
+    std::vector<unsigned> sleeps_;
+};
+
+// While it lives, the system refuses every new thread.
+class ThreadlessSystem : public KSSystem {
+  public:
+    ThreadlessSystem() { ks_useSystem(this); }
+    ~ThreadlessSystem() override { ks_useSystem(nullptr); }
+
+    int createThread(const pthread_attr_t* /*attributes*/, void* (* /*entry*/)(void*),
+                     void* /*argument*/) override {
+        return 11;
+    }
+};
+
+#endif
