@@ -9,7 +9,8 @@
 //         .bits(4, 1, " Location");
 //
 // A line that only some trunks show names them first: .bits(ntt | net5, 6, 6, " Negotiation").
-// Past the end of the frame the octet taken last is taken again; before an element's first octet that is 0.
+// Past the end of the frame the octet taken last is taken again, the length octet for one; a missing length
+// octet is 0.
 #ifndef DECODER_ELEMENT_H
 #define DECODER_ELEMENT_H
 
@@ -41,10 +42,9 @@ class Element {
 
     // Takes the length octet into `ielength` and shows it.
     void length() {
-        unsigned char octets = 0;
-        getblockchar(rb_, &octets);
-        ielength = octets;
-        line("  2:           IE Length(0x", hex(octets), ")");
+        getblockchar(rb_, &octet_);
+        ielength = octet_;
+        line("  2:           IE Length(0x", hex(octet_), ")");
     }
 
     // ---- octets

@@ -26,11 +26,11 @@ void layer_3(RingBuffer* rb) {
 // The one-octet form has no blank before CR. Any other length, the dummy call reference among them, writes
 // nothing: the message type then goes on in the same line.
 void call_reference(RingBuffer* rb) {
-    unsigned char length = 0;
-    getblockchar(rb, &length);
+    unsigned char value = 0;
+    getblockchar(rb, &value);
+    const unsigned char length = value;
     if (length != 1 && length != 2)
         return;
-    unsigned char value = 0;
     getblockchar(rb, &value);
     if ((value & 0x80) != 0)
         text("Orig=1");
@@ -64,10 +64,10 @@ void unknownElement(unsigned char id, RingBuffer* rb) {
     text("  *Unknown IE: 0x", hex(id), "\n");
     if (id >= 0x80)
         return;
-    unsigned char length = 0;
-    getblockchar(rb, &length);
-    line("  *Unknown IE Length(0x", hex(length), ")");
     unsigned char octet = 0;
+    getblockchar(rb, &octet);
+    const unsigned char length = octet;
+    line("  *Unknown IE Length(0x", hex(length), ")");
     for (int i = 0; i < length; ++i) {
         getblockchar(rb, &octet);
         line("  *Unknown IE Content(0x", hex(octet), ")");

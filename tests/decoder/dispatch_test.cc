@@ -57,7 +57,7 @@ TEST(Dispatch, ShowsNothingOfThreeIdentifiersAndTakesTheirOctetsAsIdentifiers) {
                   "  3:  1------- Extension Bit\n"
                   "      -0------ Preference\n"
                   "      --000--- Spare\n"
-                  "      -----000 New Status\n");
+                  "      -----101 New Status\n");
         EXPECT_EQ(decodedBy(layer_3, {0x08, 0x00, 0x05, id, 0x01, 0x05}, onNi2),
                   "PD=0x08 SETUP(0x05)\n"
                   "  *Unknown IE: 0x05\n"

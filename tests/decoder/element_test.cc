@@ -8,7 +8,7 @@
 namespace decoder::testing {
 namespace {
 
-TEST(ShortElement, BeforeItsFirstOctetTheOctetIs0) {
+TEST(ShortElement, AMissingLengthIs0AndTheLengthIsRepeatedWhenNothingFollows) {
     EXPECT_EQ(element({0x79}, on4ess),
               "  1:           RESTART INDICATOR(0x79)\n"
               "  2:           IE Length(0x00)\n"
@@ -18,7 +18,7 @@ TEST(ShortElement, BeforeItsFirstOctetTheOctetIs0) {
     EXPECT_EQ(element({0x34, 0xFF}, on4ess),
               "  1:           SIGNAL(0x34)\n"
               "  2:           IE Length(0xff)\n"
-              "  3:     0x00  Signal Value\n");
+              "  3:     0xff  Signal Value\n");
 }
 
 TEST(ShortElement, OctetsThatTheFrameLacksRepeatTheLastOne) {

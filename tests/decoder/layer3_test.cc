@@ -30,7 +30,7 @@ TEST(MessageHeader, ShowsDiscriminatorCallReferenceAndType) {
          {0x08, 0x02, 0x00, 0x01, 0x99},
          "PD=0x08 Dest=0 CR=0x0001\nUnknown Message Type: 0x99\n"},
         {"nothing but the discriminator", {0x08}, "PD=0x08 Unknown Message Type: 0x00\n"},
-        {"no call reference value", {0x08, 0x02}, "PD=0x08 Dest=0 CR=0x0000\nUnknown Message Type: 0x00\n"},
+        {"no call reference value", {0x08, 0x02}, "PD=0x08 Dest=0 CR=0x0202\nUnknown Message Type: 0x00\n"},
         {"half a call reference",
          {0x08, 0x02, 0x85},
          "PD=0x08 Orig=1 CR=0x8585\nUnknown Message Type: 0x00\n"},
