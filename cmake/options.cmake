@@ -13,7 +13,8 @@ add_library(lapdmon::options ALIAS lapdmon_options)
 target_include_directories(lapdmon_options INTERFACE ${PROJECT_SOURCE_DIR})
 target_compile_options(lapdmon_options INTERFACE
     -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Woverloaded-virtual
-    -Wcast-align -Wformat=2 -Wnull-dereference -Wimplicit-fallthrough)
+    -Wcast-align -Wformat=2 -Wnull-dereference -Wimplicit-fallthrough
+    -Wno-restrict)  # g++ 12 sees overlaps in std::string's own code
 if(LAPDMON_WERROR)
     target_compile_options(lapdmon_options INTERFACE -Werror)
 endif()
@@ -25,13 +26,14 @@ if(LAPDMON_SANITIZE)
     target_compile_options(lapdmon_options INTERFACE -Wno-null-dereference)
 endif()
 
-# A program that links the transport library. In the build tree RUNPATH (not RPATH, so that
-# LD_LIBRARY_PATH comes first) leads to the software board's; the installed program has none.
+# A program that links the transport library. In the build tree RUNPATH (not RPATH, so that LD_LIBRARY_PATH
+# comes first) leads to the software board's; the installed program has none. CMake's own handling would leave
+# an empty entry in the list, which stands for the current directory.
 function(lapdmon_program target)
-    target_link_options(${target} PRIVATE -Wl,--enable-new-dtags)
-    set_target_properties(${target} PROPERTIES
-        SKIP_BUILD_RPATH FALSE
-        BUILD_WITH_INSTALL_RPATH FALSE
-        INSTALL_RPATH ""
-        INSTALL_RPATH_USE_LINK_PATH FALSE)
+    target_link_libraries(${target} PRIVATE norv)
+    target_link_options(${target} PRIVATE
+        -Wl,--enable-new-dtags -Wl,-rpath,${CMAKE_BINARY_DIR}/${LAPDMON_TRANSPORT_DIR})
+    set_target_properties(${target} PROPERTIES SKIP_BUILD_RPATH TRUE)
+    install(TARGETS ${target})
+    install(CODE "file(RPATH_REMOVE FILE \"\$ENV{DESTDIR}\${CMAKE_INSTALL_PREFIX}/${CMAKE_INSTALL_BINDIR}/${target}\")")
 endfunction()

@@ -1,0 +1,138 @@
+#include "app/display.h"
+
+#include <algorithm>
+#include <array>
+#include <ctime>
+#include <iostream>
+#include <memory>
+#include <mutex>
+#include <string_view>
+
+#include "app/Arrivals.h"
+#include "app/guarded.h"
+#include "decoder/cursor.h"
+#include "decoder/frame.h"
+#include "decoder/lines.h"
+
+namespace app {
+
+vela::Queue event_queue(QueueCapacity);
+vela::Mutex queueGuard;
+vela::Semaphore sema(QueueCapacity, 0);
+vela::Thread Process(&Process_L2_Trace, 0);
+
+namespace {
+
+using Record = vela::CCS::EvtL2Trace_t;
+
+constexpr unsigned int FrameLabel = 2;
+constexpr unsigned int Transmitted = 1;
+constexpr unsigned int TicksPerSecond = 250;
+constexpr unsigned int MillisecondsPerTick = 4;
+
+// The C library's 24-character form and a line end.
+std::array<char, 26> localTime() {
+    const std::time_t now = std::time(nullptr);
+    std::array<char, 26> text{};
+    if (ctime_r(&now, text.data()) == nullptr)
+        text = {"\n"};
+    return text;
+}
+
+void writeHeader(unsigned int direction, unsigned int timestamp) {
+    const std::array<char, 26> time = localTime();
+    const std::string_view timeLine(time.data());
+    const auto seconds = decoder::dec(timestamp / TicksPerSecond);
+    const auto milliseconds = decoder::dec(timestamp % TicksPerSecond * MillisecondsPerTick);
+    if (direction == Transmitted) {
+        decoder::flag = 0;
+        decoder::text("\n");
+        decoder::output(decoder::flag);
+        decoder::text(timeLine);
+        decoder::output(decoder::flag);
+        decoder::text("TX Frame: Time = ", seconds, ".", milliseconds, "\n");
+    } else {
+        decoder::flag = 1;
+        decoder::output(decoder::flag);
+        decoder::text("\n", timeLine);
+        decoder::text("RX Frame: Time = ", seconds, ".", milliseconds, "\n");
+    }
+}
+
+// The announced length; no more than the list holds unless it is too much anyway.
+int frameLength(unsigned int announced, unsigned int held) {
+    const int length = std::max(static_cast<int>(announced), 0);
+    return length > decoder::maximumFrame ? length : std::min(length, static_cast<int>(held));
+}
+
+std::unique_ptr<Record> takeRecord() {
+    if (event_queue.isempty())
+        return nullptr;
+    Record* taken = nullptr;
+    if (!event_queue.dequeue(&taken)) {
+        decoder::text("Get iemsg failed \n");
+        decoder::flushLines();
+    }
+    return std::unique_ptr<Record>(taken);
+}
+
+void displayForEver(vela::Thread::control& ctl) {
+    vela::staticList<unsigned char> octets;  // reused for every record
+    while (true) {
+        while (!sema.tryWait(10, 10))
+            ctl.testCancel();
+        const std::lock_guard guard(queueGuard);
+        ctl.testCancel();
+        if (const std::unique_ptr<Record> rec = takeRecord(); rec != nullptr)
+            showRecord(*rec, octets);
+    }
+}
+
+}  // namespace
+
+void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
+    if (rec.Label != FrameLabel) {
+        std::cout << "ERROR - received unexpected rtc event" << std::endl;
+        return;
+    }
+    writeHeader(rec.Direction, rec.Timestamp);
+    octets = rec.List.value();
+    decoder::msglen = frameLength(rec.Length, octets.length());
+    decoder::RingBuffer frame;
+    if (decoder::getBlock(&frame, octets, decoder::msglen)) {
+        decoder::parse_isdn_frame(frame);
+        return;
+    }
+    decoder::output(decoder::flag);
+    std::cout << "Frame Error" << std::endl;
+    decoder::text("Frame Error \n");
+    decoder::flushLines();
+}
+
+void HANDLE_L2Trace_events(vela::CCS*, unsigned int, Record* rec) {
+    std::unique_ptr<Record> held(rec);
+    guarded(100, [&] {
+        const Turn turn(held.get());
+        const std::lock_guard guard(queueGuard);
+        if (event_queue.enqueue(held.get())) {
+            static_cast<void>(held.release());  // the queue's entry's now
+            sema.post();
+        } else {
+            decoder::text("Enqueue Failed \n");
+            decoder::flushLines();
+        }
+    });
+}
+
+void* Process_L2_Trace(vela::Thread::control* ctl, void*) {
+    guarded(215, [&] { displayForEver(*ctl); });
+    return nullptr;
+}
+
+void discardQueued() {
+    Record* rec = nullptr;
+    while (event_queue.dequeue(&rec))
+        const std::unique_ptr<Record> gone(rec);
+}
+
+}  // namespace app

@@ -1,0 +1,141 @@
+#include "app/lapdmon.h"
+
+#include <cstdio>
+#include <cstdlib>
+#include <iostream>
+#include <memory>
+
+#include "app/Arrivals.h"
+#include "app/arguments.h"
+#include "app/banner.h"
+#include "app/display.h"
+#include "app/guarded.h"
+#include "app/operator.h"
+#include "app/protocol.h"
+#include "decoder/lines.h"
+#include "vela/Board.h"
+#include "vela/TSCComponent.h"
+#include "vela/vela.h"
+
+namespace app {
+
+std::unique_ptr<vela::CCS> ccs;
+
+namespace {
+
+// The board's codes.
+constexpr unsigned char TscType = 0x12;
+constexpr unsigned char TscProcessor = 1;
+constexpr unsigned char CcsType = 0x15;
+constexpr unsigned char AnyProcessor = 0xFF;
+constexpr unsigned int ProtocolTypeParm = 7;
+constexpr unsigned int L2TraceParm = 10;
+
+constexpr unsigned int QueueDepth = 50;
+constexpr int MainPlace = 749;  // what main's report of a foreign exception carries
+
+void openLog() {
+    if (!decoder::file_output)
+        return;
+    decoder::ofp = std::fopen(log_file_name.data(), "w");
+    if (decoder::ofp == nullptr)
+        std::exit(EXIT_FAILURE);
+}
+
+void closeLog() {
+    if (decoder::ofp != nullptr)
+        std::fclose(std::exchange(decoder::ofp, nullptr));
+}
+
+vela::TSCComponent findTsc(vela::Board& board) {
+    vela::TSCComponent tsc(board.findComp(TscType, TscProcessor));
+    std::cout << "TSC Component Information" << tsc.getTgtDesc() << std::endl;
+    return tsc;
+}
+
+void openCcs(const vela::Instance& instance) {
+    ccs = std::make_unique<TracedCcs>(instance.getTgtDesc(), nullptr);
+    std::cout << "CCS instance Number" << ccs->getTgtDesc() << std::endl;
+}
+
+// Sets the decoder's variant, or ends the program: nothing has been switched on yet.
+void setProtocol(unsigned int type) {
+    std::cout << "CCS protocol type is " << type << std::endl;
+    const Protocol* const protocol = protocolOf(type);
+    if (protocol == nullptr) {
+        std::cerr << "Unknow Protocol -- I don't know how to interprete. "
+                  << "Program is terminating!" << std::endl;
+        std::exit(EXIT_FAILURE);
+    }
+    decoder::swit = protocol->variant;
+    std::cout << protocol->screenLine << std::endl;
+    decoder::text(protocol->logLine);
+    decoder::flushLines();
+}
+
+void startTrace() {
+    ccs->SetParm(L2TraceParm, 1, nullptr);
+    ccs->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0);
+    ccs->DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
+    std::atexit(quit);
+    watchSignals();
+    Process.start(nullptr);
+}
+
+void trace(int argc, char** argv) {
+    vela::MsgQueue::DefaultDepth = QueueDepth;
+    parseArgs(argc, argv);
+    openLog();
+    telvar_header();
+    vela::velaInit();
+
+    vela::Board board(static_cast<unsigned int>(boardnumber), nullptr);
+    const vela::TSCComponent tsc = findTsc(board);
+    const vela::Instance instance =
+        board.findInst(CcsType, AnyProcessor, static_cast<unsigned short>(INST_NUM));
+    openCcs(instance);
+    vela::StdResource::MsgGetParmCmplt_t reply;
+    ccs->GetParm(ProtocolTypeParm, &reply);
+    setProtocol(reply.Val);
+    startTrace();
+    awaitQuit();
+}
+
+// One step of the shutdown, which goes on whatever happens.
+template <typename Step>
+void attempt(Step step) {
+    try {
+        guarded(MainPlace, step);
+    } catch (...) {  // reported
+    }
+}
+
+}  // namespace
+
+void quit() {
+    std::cout << "One moment. Program Exiting" << std::endl;
+    // The board first, so that no callback waits for the queue when the display thread goes; the log last.
+    attempt([] { ccs->CancelEvt(vela::CCS::L2TraceGroup, nullptr); });
+    attempt([] { ccs->SetParm(L2TraceParm, 0, nullptr); });
+    attempt([] {
+        Process.cancel();
+        Process.join();
+    });
+    attempt([] {
+        arrivals.close();  // the object's callbacks have to end before it can
+        ccs.reset();
+    });
+    attempt(discardQueued);
+    attempt(closeLog);
+}
+
+int runTrace(int argc, char** argv) {
+    try {
+        guarded(MainPlace, [&] { trace(argc, argv); });
+        return EXIT_SUCCESS;
+    } catch (...) {  // reported
+        return EXIT_FAILURE;
+    }
+}
+
+}  // namespace app

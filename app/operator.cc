@@ -1,0 +1,66 @@
+#include "app/operator.h"
+
+#include <fcntl.h>
+#include <poll.h>
+#include <unistd.h>
+
+#include <array>
+#include <cerrno>
+#include <csignal>
+
+namespace app {
+
+namespace {
+
+constexpr std::array Signals{SIGINT, SIGTERM, SIGHUP};
+constexpr int PauseMs = 10000;
+constexpr int ForEver = -1;
+
+// The handler's end and the waiter's end.
+std::array<int, 2> signalled{-1, -1};
+
+// True when a signal came; otherwise the time is over or, if it is watched, the input can be read.
+bool awaitSignal(int timeoutMs, int input) {
+    std::array<pollfd, 2> waited{pollfd{signalled[0], POLLIN, 0}, pollfd{input, POLLIN, 0}};
+    while (poll(waited.data(), waited.size(), timeoutMs) < 0 && errno == EINTR) {
+    }
+    return waited[0].revents != 0;
+}
+
+}  // namespace
+
+void exit_handle(int) {
+    const int saved = errno;
+    for (const int each : Signals)
+        std::signal(each, SIG_DFL);
+    const char mark = 's';
+    static_cast<void>(!write(signalled[1], &mark, 1));
+    errno = saved;
+}
+
+void watchSignals() {
+    if (pipe2(signalled.data(), O_CLOEXEC | O_NONBLOCK) != 0)
+        return;  // without it the signals keep their default: they end the process
+    struct sigaction action = {};
+    action.sa_handler = exit_handle;
+    action.sa_flags = SA_RESTART;
+    for (const int each : Signals)
+        sigaction(each, &action, nullptr);
+}
+
+void awaitQuit() {
+    constexpr int NoInput = -1;
+    int input = STDIN_FILENO;
+    while (!awaitSignal(ForEver, input)) {
+        char typed = 0;
+        const ssize_t got = read(STDIN_FILENO, &typed, 1);
+        if (got == 1 && typed == 'q')
+            return;
+        if (got == 0 || (got < 0 && errno != EINTR && errno != EAGAIN))
+            input = NoInput;
+        if (awaitSignal(PauseMs, NoInput))
+            return;
+    }
+}
+
+}  // namespace app

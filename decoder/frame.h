@@ -1,0 +1,15 @@
+// The decoder's entry: a frame in, text out.
+#ifndef DECODER_FRAME_H
+#define DECODER_FRAME_H
+
+#include "decoder/cursor.h"
+
+namespace decoder {
+
+// Writes the layer-2 lines (Q.921), the layer-3 lines (Q.931) when there is a message, and the hexadecimal
+// dump of the first `msglen` octets, ten to a line; then hands all text composed so far to the log.
+void parse_isdn_frame(RingBuffer rb);
+
+}  // namespace decoder
+
+#endif

@@ -1,0 +1,46 @@
+#include "decoder/lines.h"
+
+#include <algorithm>
+
+namespace decoder {
+
+namespace {
+
+// A frame of calls makes about 2 kB of text, the longest possible one some hundred.
+constexpr std::size_t firstCapacity = 65536;
+
+}  // namespace
+
+void LineBuffer::grow(std::size_t n) {
+    const std::string_view kept = composed();
+    const std::size_t capacity = std::max(firstCapacity, 2 * (kept.size() + n));
+    auto grown = std::make_unique_for_overwrite<char[]>(capacity);
+    at_ = std::copy(kept.begin(), kept.end(), grown.get());
+    end_ = grown.get() + capacity;
+    begin_ = std::move(grown);
+}
+
+void flushLines() {
+    const std::string_view composed = lineBuffer.composed();
+    // A write that fails leaves its mark on the stream, for whoever owns it.
+    if (file_output && ofp != nullptr && !composed.empty())
+        (void)std::fwrite(composed.data(), 1, composed.size(), ofp);
+    lineBuffer.clear();
+}
+
+void bitwise(int value, int high, int low) {
+    output(flag);
+    if (1 <= low && low <= high && high <= 8) {
+        text(Bits{value, high, low});
+        return;
+    }
+    text("      ");
+    for (int position = 8; position > std::clamp(high, 0, 8); --position)
+        text('-');
+    for (int position = std::min(high, 8); position >= std::max(low, 1); --position)
+        text(((value >> (position - 1)) & 1) != 0 ? '1' : '0');
+    for (int position = std::clamp(low, 1, 9) - 1; position >= 1; --position)
+        text('-');
+}
+
+}  // namespace decoder

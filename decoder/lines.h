@@ -1,0 +1,231 @@
+// Where decoded text is composed. It goes to the log alone and never to the screen: pieces are put together
+// in memory, and flushLines hands them to the log in one write.
+//
+// Text is made of literals, octets and numbers; nothing is parsed while the program runs:
+//
+//     text("TEI=0x", hex(tei), "\n");        line("  3:     0x", hex(octet), "  Signal Value");
+//
+// As with state.h, only one thread composes at a time.
+#ifndef DECODER_LINES_H
+#define DECODER_LINES_H
+
+#include <algorithm>
+#include <array>
+#include <bit>
+#include <charconv>
+#include <concepts>
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+#include <memory>
+#include <string_view>
+
+#include "decoder/state.h"
+
+namespace decoder {
+
+// The text composed and not yet in the log. It grows as needed and keeps what it grew to.
+class LineBuffer {
+  public:
+    // A place where n characters can be written; commit says where writing ended.
+    char* room(std::size_t n) {
+        if (static_cast<std::size_t>(end_ - at_) < n)
+            grow(n);
+        return at_;
+    }
+    void commit(char* at) { at_ = at; }
+
+    std::string_view composed() const { return {begin_.get(), static_cast<std::size_t>(at_ - begin_.get())}; }
+    void clear() { at_ = begin_.get(); }
+
+  private:
+    [[gnu::cold, gnu::noinline]] void grow(std::size_t n);
+
+    std::unique_ptr<char[]> begin_;
+    char* at_ = nullptr;
+    char* end_ = nullptr;
+};
+
+inline constinit LineBuffer lineBuffer;
+
+// Hands the text composed so far to the log; drops it when there is none (file_output, ofp).
+void flushLines();
+
+// ---- pieces of text
+
+namespace tables {
+
+using Pair = std::array<char, 2>;
+
+constexpr std::array<Pair, 256> makeHexPairs() {
+    constexpr std::string_view digits = "0123456789abcdef";
+    std::array<Pair, 256> pairs{};
+    for (std::size_t i = 0; i < pairs.size(); ++i)
+        pairs[i] = {digits[i >> 4], digits[i & 15]};
+    return pairs;
+}
+
+// The eight characters of an octet's bit pattern, most significant bit first.
+constexpr std::uint64_t patternOf(unsigned octet, char set, char clear) {
+    std::array<char, 8> shown{};
+    for (unsigned bit = 0; bit < 8; ++bit)
+        shown[7 - bit] = ((octet >> bit) & 1U) != 0 ? set : clear;
+    return std::bit_cast<std::uint64_t>(shown);
+}
+
+constexpr std::array<std::uint64_t, 256> makeDigits() {
+    std::array<std::uint64_t, 256> patterns{};
+    for (unsigned i = 0; i < patterns.size(); ++i)
+        patterns[i] = patternOf(i, '1', '0');
+    return patterns;
+}
+
+// By highest and lowest bit: all ones where the field's digits show, zero where a "-" does.
+constexpr std::array<std::array<std::uint64_t, 9>, 9> makeFields() {
+    std::array<std::array<std::uint64_t, 9>, 9> fields{};
+    for (unsigned high = 1; high <= 8; ++high) {
+        for (unsigned low = 1; low <= high; ++low)
+            fields[high][low] = patternOf((1U << high) - (1U << (low - 1)), '\xff', '\0');
+    }
+    return fields;
+}
+
+inline constexpr auto hexPairs = makeHexPairs();
+inline constexpr auto digits = makeDigits();
+inline constexpr auto fields = makeFields();
+inline constexpr std::uint64_t dashes = patternOf(0xFF, '-', '-');
+
+}  // namespace tables
+
+// "%02x", "%x" and "%2x" of an octet, "%d" of a number, and "%c".
+struct Hex {
+    unsigned char value;
+};
+struct HexUnpadded {
+    unsigned char value;
+};
+struct HexBlankPadded {
+    unsigned char value;
+};
+template <std::integral Number>
+struct Decimal {
+    Number value;
+};
+constexpr Hex hex(int octet) { return {static_cast<unsigned char>(octet)}; }
+constexpr HexUnpadded hexUnpadded(int octet) { return {static_cast<unsigned char>(octet)}; }
+constexpr HexBlankPadded hexBlankPadded(int octet) { return {static_cast<unsigned char>(octet)}; }
+template <std::integral Number>
+constexpr Decimal<Number> dec(Number value) {
+    return {value};
+}
+
+// Six blanks and a bit pattern, "-" outside the field; 1 <= low <= high <= 8.
+struct Bits {
+    int value;
+    int high;
+    int low;
+};
+
+// How many characters a piece takes at most, and how it is put down; put returns one past its last one.
+template <std::size_t N>
+constexpr std::size_t sizeOf(const char (&)[N]) {
+    return N - 1;
+}
+template <std::size_t N>
+std::size_t sizeOf(char (&)[N]) = delete;  // a buffer is no literal: pass it as a string_view
+constexpr std::size_t sizeOf(std::string_view words) { return words.size(); }
+constexpr std::size_t sizeOf(Hex) { return 2; }
+constexpr std::size_t sizeOf(HexUnpadded) { return 2; }
+constexpr std::size_t sizeOf(HexBlankPadded) { return 2; }
+template <std::integral Number>
+constexpr std::size_t sizeOf(Decimal<Number>) {
+    return 3 * sizeof(Number);
+}
+template <std::same_as<char> Character>  // not whatever converts to one
+constexpr std::size_t sizeOf(Character) {
+    return 1;
+}
+constexpr std::size_t sizeOf(Bits) { return 14; }
+
+template <std::size_t N>
+char* put(char* at, const char (&literal)[N]) {
+    return std::copy_n(literal, N - 1, at);
+}
+inline char* put(char* at, std::string_view words) {
+    std::memcpy(at, words.data(), words.size());
+    return at + words.size();
+}
+inline char* put(char* at, Hex octet) {
+    std::memcpy(at, &tables::hexPairs[octet.value], 2);
+    return at + 2;
+}
+inline char* put(char* at, HexUnpadded octet) {
+    const tables::Pair& pair = tables::hexPairs[octet.value];
+    if (pair[0] != '0')
+        *at++ = pair[0];
+    *at++ = pair[1];
+    return at;
+}
+inline char* put(char* at, HexBlankPadded octet) {
+    const tables::Pair& pair = tables::hexPairs[octet.value];
+    *at++ = pair[0] == '0' ? ' ' : pair[0];
+    *at++ = pair[1];
+    return at;
+}
+template <std::integral Number>
+char* put(char* at, Decimal<Number> number) {
+    return std::to_chars(at, at + sizeOf(number), number.value).ptr;
+}
+template <std::same_as<char> Character>
+char* put(char* at, Character character) {
+    *at = character;
+    return at + 1;
+}
+inline char* put(char* at, Bits bits) {
+    const std::uint64_t field =
+        tables::fields[static_cast<unsigned>(bits.high)][static_cast<unsigned>(bits.low)];
+    const std::uint64_t shown =
+        (tables::digits[static_cast<unsigned char>(bits.value)] & field) | (tables::dashes & ~field);
+    at = put(at, "      ");
+    std::memcpy(at, &shown, sizeof shown);
+    return at + sizeof shown;
+}
+
+// ---- what decoders and the application write
+
+inline constexpr char indent[] = "                                 ";  // 33 blanks
+inline constexpr std::size_t indentSize = sizeof indent - 1;
+
+// Writes the pieces one after another as they stand: no indent, no line end.
+template <typename... Pieces>
+void text(Pieces&&... pieces) {
+    char* at = lineBuffer.room((sizeOf(pieces) + ... + 0));
+    ((at = put(at, pieces)), ...);
+    lineBuffer.commit(at);
+}
+
+// Writes the frame's indent, the pieces and a line end.
+template <typename... Pieces>
+void line(Pieces&&... pieces) {
+    char* at = lineBuffer.room(indentSize + (sizeOf(pieces) + ... + 1));
+    std::memcpy(at, indent, indentSize);
+    at += flag == 0 ? indentSize : 0;
+    ((at = put(at, pieces)), ...);
+    *at++ = '\n';
+    lineBuffer.commit(at);
+}
+
+// The indent of one line: 33 blanks when f is 0.
+inline void output(int f) {
+    if (f == 0)
+        text(indent);
+}
+
+// The frame's indent, six blanks and the bits `high` to `low` of the value at their own places, "-"
+// elsewhere; no line end. Bits are numbered 8 (most significant) to 1; a position outside 8..1 writes
+// nothing.
+void bitwise(int value, int high, int low);
+
+}  // namespace decoder
+
+#endif

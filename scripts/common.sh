@@ -1,0 +1,49 @@
+# What the scripts share; sourced, not run. Leaves the shell in the tree's root.
+set -euo pipefail
+cd "$(dirname "${BASH_SOURCE[0]}")/.."
+
+fail() {
+    printf '%s: %s\n' "$(basename "$0")" "$*" >&2
+    exit 1
+}
+
+# Installs those of the named Debian packages that are not there yet, quietly.
+install_packages() {
+    local missing=() package
+    for package in "$@"; do
+        dpkg-query -W -f='${Status}' "$package" 2>/dev/null | grep -q 'ok installed' || missing+=("$package")
+    done
+    [ ${#missing[@]} -eq 0 ] && return
+    command -v apt-get >/dev/null || fail "these Debian packages are needed: ${missing[*]}"
+    local as_root=()
+    if [ "$(id -u)" -ne 0 ]; then
+        sudo -n true 2>/dev/null || fail "install these packages first: apt-get install ${missing[*]}"
+        as_root=(sudo -n)
+    fi
+    printf 'Installing %s ...\n' "${missing[*]}"
+    local log
+    log=$(mktemp)
+    if ! { "${as_root[@]}" apt-get update -qq &&
+           "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive \
+               apt-get install -y -qq --no-install-recommends "${missing[@]}"; } >"$log" 2>&1; then
+        tail -n 20 "$log" >&2
+        fail "could not install: ${missing[*]}"
+    fi
+    rm -f "$log"
+}
+
+BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libpcap-dev libtomlplusplus-dev nlohmann-json3-dev)
+TEST_PACKAGES=(libgtest-dev libgmock-dev libbenchmark-dev python3)
+
+# Configures and builds one preset; says what it does and shows the compiler's words only when it fails.
+build_preset() {
+    local preset=$1 log
+    shift
+    log=$(mktemp)
+    printf 'Building %s ...\n' "$preset"
+    if ! { cmake --preset "$preset" "$@" && cmake --build --preset "$preset"; } >"$log" 2>&1; then
+        tail -n 60 "$log" >&2
+        fail "the $preset build failed"
+    fi
+    rm -f "$log"
+}

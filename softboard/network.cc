@@ -1,0 +1,243 @@
+#include "softboard/network.h"
+
+#include <algorithm>
+#include <new>
+
+#include "softboard/codes.h"
+#include "softboard/misuse.h"
+#include "softboard/wire.h"
+
+namespace softboard {
+
+namespace {
+
+// A frame waits while so many messages wait in the queue that it is for.
+constexpr size_t mostWaiting = 64;
+
+}  // namespace
+
+Network::Network(const Scenario& scenario) { setUp(scenario); }
+
+Network::~Network() { shutDown(); }
+
+void Network::setUp(const Scenario& scenario) {
+    std::vector<std::shared_ptr<const Frames>> captures;
+    for (const Frames& frames : scenario.captures) {
+        captures.push_back(std::make_shared<const Frames>(frames));
+    }
+    for (const DChannel& channel : scenario.channels) {
+        Board& board = boards_.try_emplace(channel.board, channel.board).first->second;
+        board.add(ccsComponent(channel, captures.at(channel.capture)));
+    }
+}
+
+void Network::reset(const Scenario& scenario) {
+    const std::lock_guard guard(lock_);
+    boards_.clear();
+    setUp(scenario);
+    journal_.clear();
+    changed_.notify_all();
+}
+
+uint32_t Network::openQueue() {
+    const std::lock_guard guard(lock_);
+    return queues_.open();
+}
+
+NvCompDesc Network::bindQueue(uint32_t handle) {
+    const std::lock_guard guard(lock_);
+    const auto queue = queues_.get("nvQueueBind", handle);
+    if (queue->bound) {
+        misuse("nvQueueBind", "queue " + std::to_string(handle) + " is bound already");
+    }
+    return compDescOf(queues_.bind(*queue));
+}
+
+void Network::unbindQueue(uint32_t handle, const NvCompDesc& host) {
+    const std::lock_guard guard(lock_);
+    const auto queue = queues_.get("nvQueueUnbind", handle);
+    if (!queue->bound || queue->host != addressOf(host)) {
+        misuse("nvQueueUnbind",
+               "queue " + std::to_string(handle) + " is not bound to " + toString(addressOf(host)));
+    }
+    queue->bound = false;
+    for (auto& [number, board] : boards_) {
+        for (Component& component : board.components()) {
+            component.forget(queue->host);
+        }
+    }
+    updatePlayers();
+}
+
+void Network::closeQueue(uint32_t handle) {
+    const std::lock_guard guard(lock_);
+    const auto queue = queues_.get("nvQueueClose", handle);
+    queues_.close(handle);
+    for (const NvMsg32Bit* msg : queue->waiting) {
+        buffers_.release(msg);
+    }
+    queue->waiting.clear();
+}
+
+NvMsg32Bit* Network::read(uint32_t handle) {
+    std::unique_lock guard(lock_);
+    const auto queue = queues_.find("nvMsgRead", handle);
+    if (!queue) {
+        return nullptr;
+    }
+    if (!queue->everBound) {
+        misuse("nvMsgRead", "queue " + std::to_string(handle) + " was never bound: nothing can arrive");
+    }
+    queue->arrived.wait(guard, [&] { return !queue->open || !queue->waiting.empty(); });
+    if (!queue->open) {
+        return nullptr;
+    }
+    NvMsg32Bit* msg = queue->waiting.front();
+    queue->waiting.pop_front();
+    if (queue->waiting.size() + 1 == mostWaiting) {
+        changed_.notify_all();
+    }
+    buffers_.handOut(msg);
+    return msg;
+}
+
+void Network::write(uint32_t handle, NvMsg32Bit* msg) {
+    const std::lock_guard guard(lock_);
+    if (!queues_.get("nvMsgWrite", handle)->bound) {
+        misuse("nvMsgWrite", "queue " + std::to_string(handle) + " is not bound");
+    }
+    buffers_.takeOver("nvMsgWrite", msg);
+    const Message message = messageOf(*msg);
+    if (Queue* queue = queues_.at(message.target); queue != nullptr) {
+        journal_.add(Journal::Way::hostToHost, message);
+        queue->waiting.push_back(msg);
+        queue->arrived.notify_one();
+        return;
+    }
+    buffers_.release(msg);
+    toBoard(message);
+}
+
+// A board that is not there does not answer.
+void Network::toBoard(const Message& command) {
+    const auto board = boards_.find(command.target.board);
+    if (board == boards_.end() || command.target.node != board->second.address().node) {
+        journal_.add(Journal::Way::hostToNobody, command);
+        return;
+    }
+    journal_.add(Journal::Way::hostToBoard, command);
+    if (const auto reply = board->second.answer(command); reply) {
+        toHost(*reply);
+    }
+    updatePlayers();
+}
+
+bool Network::toHost(const Message& message) {
+    Queue* queue = queues_.at(message.target);
+    NvMsg32Bit* msg =
+        queue == nullptr ? nullptr : buffers_.allocate(static_cast<uint32_t>(message.body.size()));
+    if (msg == nullptr) {
+        journal_.add(Journal::Way::boardToNobody, message);
+        return false;
+    }
+    store(message, *msg);
+    buffers_.takeOver("nvMsgWrite", msg);
+    journal_.add(Journal::Way::boardToHost, message);
+    queue->waiting.push_back(msg);
+    queue->arrived.notify_one();
+    return true;
+}
+
+bool Network::inject(const Message& message) {
+    const std::lock_guard guard(lock_);
+    return toHost(message);
+}
+
+size_t Network::openQueues() const {
+    const std::lock_guard guard(lock_);
+    return queues_.openCount();
+}
+
+std::string Network::balance() const {
+    return "buffers outstanding " + std::to_string(buffers_.outstanding()) + ", queues open " +
+           std::to_string(openQueues());
+}
+
+void Network::updatePlayers() {
+    const auto now = std::chrono::steady_clock::now();
+    bool playing = false;
+    for (auto& [number, board] : boards_) {
+        for (Component& component : board.components()) {
+            component.updatePlayer(now);
+            playing = playing || (component.player && component.player->playing());
+        }
+    }
+    if (playing && !player_.joinable() && !ending_) {
+        player_ = std::thread(&Network::play, this);
+    }
+    changed_.notify_all();
+}
+
+bool Network::congested(const Component& component) const {
+    const auto targets = component.traceTargets();
+    return std::any_of(targets.begin(), targets.end(), [this](const Address& target) {
+        const Queue* queue = queues_.at(target);
+        return queue != nullptr && queue->waiting.size() >= mostWaiting;
+    });
+}
+
+// The component whose frame is due first, of those whose subscribers keep up.
+Component* Network::nextPlaying() {
+    Component* next = nullptr;
+    for (auto& [number, board] : boards_) {
+        for (Component& component : board.components()) {
+            const bool ready = component.player && component.player->playing() && !congested(component);
+            if (ready && (next == nullptr || component.player->due() < next->player->due())) {
+                next = &component;
+            }
+        }
+    }
+    return next;
+}
+
+void Network::playNext(Component& component, Player::Time now) {
+    const Player::Shown shown = component.player->next(now);
+    const Frame& frame = *shown.frame;
+    BodyWriter body;
+    body.u32(component.label).u32(frame.transmitted ? 1 : 0).u32(shown.ticks);
+    body.u32(static_cast<uint32_t>(frame.octets.size())).octets(frame.octets);
+    for (const Address& target : component.traceTargets()) {
+        toHost({0, msgEvtDetected, component.address, target, body.body()});
+    }
+}
+
+void Network::play() {
+    std::unique_lock guard(lock_);
+    while (!ending_) {
+        Component* component = nextPlaying();
+        if (component == nullptr) {
+            changed_.wait(guard);
+            continue;
+        }
+        const auto now = std::chrono::steady_clock::now();
+        const auto due = component->player->due();
+        if (due > now) {
+            changed_.wait_until(guard, due);
+            continue;
+        }
+        playNext(*component, now);
+    }
+}
+
+void Network::shutDown() {
+    {
+        const std::lock_guard guard(lock_);
+        ending_ = true;
+        changed_.notify_all();
+    }
+    if (player_.joinable()) {
+        player_.join();
+    }
+}
+
+}  // namespace softboard

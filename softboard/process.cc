@@ -1,0 +1,61 @@
+#include "softboard/process.h"
+
+#include <cerrno>
+#include <cstdlib>
+#include <cstring>
+#include <fstream>
+#include <iostream>
+#include <sstream>
+
+#include "softboard/handover.h"
+
+namespace softboard {
+
+namespace {
+
+Network* made = nullptr;
+
+Scenario loadScenario() {
+    const char* path = std::getenv(scenarioVariable);
+    if (path == nullptr) {
+        return builtinScenario();
+    }
+    try {
+        const std::ifstream file(path);
+        if (!file) {
+            throw std::runtime_error(std::strerror(errno));
+        }
+        std::ostringstream text;
+        text << file.rdbuf();
+        return fromJson(text.str());
+    } catch (const std::exception& error) {
+        std::cerr << "softboard: " << scenarioVariable << "=" << path << ": " << error.what() << std::endl;
+        std::abort();
+    }
+}
+
+Network* make() {
+    const Scenario scenario = loadScenario();
+    made = new Network(scenario);  // for as long as the process lives
+    if (!scenario.journal.empty() && !made->journal().writeTo(scenario.journal)) {
+        std::cerr << "softboard: " << scenario.journal << ": " << std::strerror(errno) << std::endl;
+    }
+    return made;
+}
+
+// After the program's own exit handlers and destructors.
+__attribute__((destructor)) void tearDown() {
+    if (made != nullptr) {
+        made->shutDown();
+        made->journal().note(made->balance());
+    }
+}
+
+}  // namespace
+
+Network& network() {
+    static Network& theNetwork = *make();
+    return theNetwork;
+}
+
+}  // namespace softboard

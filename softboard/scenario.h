@@ -1,0 +1,68 @@
+// What the software board simulates: boards, their D channels and the frames on them.
+#ifndef SOFTBOARD_SCENARIO_H
+#define SOFTBOARD_SCENARIO_H
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace softboard {
+
+// One D-channel frame: address, control and information octets, no check sequence.
+struct Frame {
+    bool transmitted = false;  // by the board
+    uint32_t ticks = 0;        // since the first frame, in units of 4 ms; never less than the frame before
+    std::vector<uint8_t> octets;
+
+    bool operator==(const Frame&) const = default;
+};
+
+using Frames = std::vector<Frame>;
+
+struct Rate {
+    enum class Kind { recorded, perSecond, max };
+
+    Kind kind = Kind::recorded;
+    double perSecond = 0;
+
+    bool operator==(const Rate&) const = default;
+};
+
+enum Protocol : uint32_t { att4ess = 1, att5ess = 2, dms100 = 3, ntt = 4, net5 = 7, ni2 = 12 };
+
+struct DChannel {
+    uint8_t board = 1;
+    uint16_t number = 1;       // of the CCS instance
+    uint32_t protocol = net5;  // value of the protocol parameter
+    Rate rate;
+    bool loop = false;
+    uint32_t label = 2;  // first field of each trace event
+    size_t capture = 0;  // which of the scenario's captures plays on it
+
+    bool operator==(const DChannel&) const = default;
+};
+
+// A board is there when it has a D channel.
+struct Scenario {
+    std::vector<DChannel> channels;
+    std::vector<Frames> captures;
+    std::string journal;  // file that the journal is also written to; empty: none
+
+    bool operator==(const Scenario&) const = default;
+};
+
+// One D channel of board 1 with one capture; what tests start from.
+Scenario oneChannel(Frames frames, Rate rate = {Rate::Kind::max, 0});
+
+// Board 1, D channel 1, the built-in capture again and again at recorded rate.
+Scenario builtinScenario();
+// A trunk of protocol net5: the link comes up, calls, keep-alives.
+const Frames& builtinFrames();
+
+// The text form in which the launcher hands a scenario to the library; fromJson throws std::runtime_error.
+std::string toJson(const Scenario& scenario);
+Scenario fromJson(const std::string& text);
+
+}  // namespace softboard
+
+#endif

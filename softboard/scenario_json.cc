@@ -1,0 +1,79 @@
+#include <nlohmann/json.hpp>
+#include <stdexcept>
+
+#include "softboard/hex.h"
+#include "softboard/scenario.h"
+
+namespace softboard {
+
+namespace {
+
+using nlohmann::json;
+
+json toJson(const Frame& frame) {
+    return {{"transmitted", frame.transmitted}, {"ticks", frame.ticks}, {"octets", hex(frame.octets)}};
+}
+
+Frame frameFrom(const json& from) {
+    return {from.at("transmitted"), from.at("ticks"), fromHex(from.at("octets").get<std::string>())};
+}
+
+json toJson(const DChannel& channel) {
+    return {{"board", channel.board},
+            {"number", channel.number},
+            {"protocol", channel.protocol},
+            {"rate", static_cast<int>(channel.rate.kind)},
+            {"perSecond", channel.rate.perSecond},
+            {"loop", channel.loop},
+            {"label", channel.label},
+            {"capture", channel.capture}};
+}
+
+DChannel channelFrom(const json& from) {
+    DChannel channel;
+    channel.board = from.at("board");
+    channel.number = from.at("number");
+    channel.protocol = from.at("protocol");
+    channel.rate = {static_cast<Rate::Kind>(from.at("rate").get<int>()), from.at("perSecond")};
+    channel.loop = from.at("loop");
+    channel.label = from.at("label");
+    channel.capture = from.at("capture");
+    return channel;
+}
+
+}  // namespace
+
+std::string toJson(const Scenario& scenario) {
+    json to{{"journal", scenario.journal}, {"channels", json::array()}, {"captures", json::array()}};
+    for (const DChannel& channel : scenario.channels) {
+        to["channels"].push_back(toJson(channel));
+    }
+    for (const Frames& frames : scenario.captures) {
+        json& capture = to["captures"].emplace_back(json::array());
+        for (const Frame& frame : frames) {
+            capture.push_back(toJson(frame));
+        }
+    }
+    return to.dump();
+}
+
+Scenario fromJson(const std::string& text) {
+    const json from = json::parse(text);
+    Scenario scenario;
+    scenario.journal = from.at("journal");
+    for (const json& capture : from.at("captures")) {
+        Frames& frames = scenario.captures.emplace_back();
+        for (const json& frame : capture) {
+            frames.push_back(frameFrom(frame));
+        }
+    }
+    for (const json& channel : from.at("channels")) {
+        scenario.channels.push_back(channelFrom(channel));
+        if (scenario.channels.back().capture >= scenario.captures.size()) {
+            throw std::runtime_error("a D channel plays a capture that is not there");
+        }
+    }
+    return scenario;
+}
+
+}  // namespace softboard

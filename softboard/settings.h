@@ -1,0 +1,65 @@
+// What the command line and the scenario file may say, as far as they say it.
+#ifndef SOFTBOARD_SETTINGS_H
+#define SOFTBOARD_SETTINGS_H
+
+#include <optional>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "softboard/scenario.h"
+
+namespace softboard {
+
+// A bad option, file or capture; what() names the place and the reason.
+class BadInput : public std::runtime_error {
+  public:
+    using std::runtime_error::runtime_error;
+};
+
+struct Settings {
+    std::optional<std::string> frames;  // a capture's path
+    std::optional<uint32_t> protocol;
+    std::optional<Rate> rate;
+    std::optional<bool> loop;
+    std::optional<uint32_t> board;
+    std::optional<uint32_t> label;
+
+    // What is not said here is taken from `base`.
+    Settings over(const Settings& base) const;
+};
+
+// A D channel of a scenario file; `place` ("day.toml:7") is for reports.
+struct ChannelSettings {
+    std::optional<uint32_t> number;
+    Settings settings;
+    std::string place;
+};
+
+struct ScenarioFile {
+    Settings settings;  // of every D channel that does not say otherwise
+    std::optional<uint32_t> dchannels;
+    std::optional<std::string> journal;
+    std::vector<ChannelSettings> channels;
+    std::string path;
+};
+
+constexpr uint32_t mostDChannels = 255;
+constexpr uint32_t largestBoard = 255;
+
+// "4ess", "ni2", ... or a number; throws BadInput.
+uint32_t parseProtocol(const std::string& text);
+// "recorded", "max" or frames per second; throws BadInput.
+Rate parseRate(const std::string& text);
+Rate framesPerSecond(double rate);
+uint32_t parseNumberIn(const std::string& text, uint32_t least, uint32_t most);
+
+// The scenario that the command line and the file (null: none) ask for; reads the captures. Throws BadInput.
+Scenario resolve(const Settings& commandLine, std::optional<uint32_t> dchannels, const ScenarioFile* file);
+
+// Throws BadInput.
+ScenarioFile readScenarioFile(const std::string& path);
+
+}  // namespace softboard
+
+#endif

@@ -1,0 +1,178 @@
+// The base of every board-side object that the host talks to.
+#ifndef VELA_ADDRESSABLE_H
+#define VELA_ADDRESSABLE_H
+
+#include <memory>
+#include <mutex>
+
+#include "vela/CompDesc.h"
+#include "vela/EvtCallback.h"
+#include "vela/EvtWait.h"
+#include "vela/Exception.h"
+#include "vela/Handler.h"
+#include "vela/MsgQueue.h"
+
+namespace vela {
+
+class Addressable : public virtualObject {
+  public:
+    static constexpr unsigned int DefaultResponseTimeout = 5000;  // ms
+    static constexpr unsigned int DefaultErrorWaitTime = 1000;    // ms
+
+    // The print form of an object at the time something was thrown: the object may be gone when it prints.
+    struct Identity {
+        explicit Identity(const Addressable& object);
+        CompDesc_t target;
+        CompDesc_t host;
+    };
+
+    // No reply within the response time-out.
+    class Timeout : public Exception {
+      public:
+        Timeout(const Addressable& object, unsigned int cmdMsgType, unsigned int retMsgType,
+                unsigned int trans, unsigned int timeoutMs);
+        unsigned int cmdMsgType() const { return cmdMsgType_; }
+        unsigned int retMsgType() const { return retMsgType_; }
+        unsigned int trans() const { return trans_; }
+        unsigned int timeoutMs() const { return timeoutMs_; }
+        void toStream(std::ostream* out) const override;
+
+      private:
+        Identity object_;
+        unsigned int cmdMsgType_, retMsgType_, trans_, timeoutMs_;
+    };
+
+    // Another reply than the expected one, an error body for one. Its copies share the message.
+    class UnexpectedMsg : public Exception {
+      public:
+        UnexpectedMsg(const Addressable& object, unsigned int cmdMsgType, std::shared_ptr<Msg> msg);
+        unsigned int cmdMsgType() const { return cmdMsgType_; }
+        const std::shared_ptr<Msg>& msg() const { return msg_; }
+        void toStream(std::ostream* out) const override;
+
+      private:
+        Identity object_;
+        unsigned int cmdMsgType_;
+        std::shared_ptr<Msg> msg_;
+    };
+
+    // No body class for a message type, or for an event group.
+    class UndefinedMsgBody : public Exception {
+      public:
+        explicit UndefinedMsgBody(unsigned int type)
+            : Exception("vela::Addressable::UndefinedMsgBody"), type_(type) {}
+        unsigned int type() const { return type_; }
+
+      private:
+        unsigned int type_;
+    };
+    class UndefinedEvtBody : public Exception {
+      public:
+        explicit UndefinedEvtBody(unsigned int type)
+            : Exception("vela::Addressable::UndefinedEvtBody"), type_(type) {}
+        unsigned int type() const { return type_; }
+
+      private:
+        unsigned int type_;
+    };
+
+    // A null queue gives the object a private one.
+    Addressable(const CompDesc_t& target, MsgQueue* queue);
+    Addressable(const Addressable& other);  // same address, same queue; no callbacks
+    explicit Addressable(const Addressable* other) : Addressable(*other) {}
+    Addressable& operator=(const Addressable&) = delete;
+    ~Addressable() override;
+
+    // Leaves the queue held so far for this one, or for a private one. Registrations move along.
+    virtual void MsgQueueAttach(MsgQueue* queue);
+    // A new empty body, which the caller owns. Throw UndefinedMsgBody, UndefinedEvtBody.
+    virtual MsgBody* MsgBodyLookup(unsigned int msgType);
+    virtual MsgBody* EvtBodyLookup(unsigned int evtType);
+
+    MsgQueue* getMsgQueue() const { return queue_; }
+    CompDesc_t getTgtDesc() const { return target_; }
+    unsigned int getObjId() const { return objId_; }
+    void setResponseTimeout(unsigned int ms) { responseTimeout_ = ms; }
+    void setErrorWaitTime(unsigned int ms) { errorWaitTime_ = ms; }
+
+    // Sends cmd and reads the reply into ret unless that is null; trans 0 takes a number of its own. Throws
+    // Timeout, UnexpectedMsg.
+    void request(unsigned int msgType, MsgBody* cmd, unsigned int retMsgType, MsgBody* ret,
+                 unsigned int trans = 0, int flags = 0);
+    // Sends cmd and lingers for the error wait time: silence is success, any reply is UnexpectedMsg.
+    void request(unsigned int msgType, MsgBody* cmd, unsigned int trans = 0, int flags = 0);
+
+    // Registrations, by message type and by event group; see EvtCallback.
+    void asyncRegisterMsgType(unsigned int type, const Handler& callback, unsigned int threadParam);
+    void asyncRegisterEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam);
+    void asyncCancelMsgType(unsigned int type, const Handler& callback, unsigned int threadParam);
+    void asyncCancelMsgType(unsigned int type);
+    void asyncCancelEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam);
+    void asyncCancelEvtGroup(unsigned int group);
+    void asyncUnregisteredMsgType(const Handler& handler, unsigned int threadParam);
+    void asyncUnregisteredEvtGroup(const Handler& handler, unsigned int threadParam);
+
+    // The same with an object and a member function of it, of either form.
+    template <typename T, typename Member>
+    void asyncRegisterMsgType(unsigned int type, T* object, Member member, unsigned int threadParam) {
+        asyncRegisterMsgType(type, Handler(object, member), threadParam);
+    }
+    template <typename T, typename Member>
+    void asyncRegisterEvtGroup(unsigned int group, T* object, Member member, unsigned int threadParam) {
+        asyncRegisterEvtGroup(group, Handler(object, member), threadParam);
+    }
+    template <typename T, typename Member>
+    void asyncCancelMsgType(unsigned int type, T* object, Member member, unsigned int threadParam) {
+        asyncCancelMsgType(type, Handler(object, member), threadParam);
+    }
+    template <typename T, typename Member>
+    void asyncCancelEvtGroup(unsigned int group, T* object, Member member, unsigned int threadParam) {
+        asyncCancelEvtGroup(group, Handler(object, member), threadParam);
+    }
+    template <typename T, typename Member>
+    void asyncUnregisteredMsgType(T* object, Member member, unsigned int threadParam) {
+        asyncUnregisteredMsgType(Handler(object, member), threadParam);
+    }
+    template <typename T, typename Member>
+    void asyncUnregisteredEvtGroup(T* object, Member member, unsigned int threadParam) {
+        asyncUnregisteredEvtGroup(Handler(object, member), threadParam);
+    }
+
+    // Wait for one message or event, with timeoutMs 0 for ever: read into body unless it is null, or
+    // returned to the caller, who owns it. Throw the waiter's Timeout.
+    void asyncWaitMsg(unsigned int msgType, MsgBody* body, unsigned int timeoutMs);
+    Msg* asyncWaitMsgMsg(unsigned int msgType, unsigned int timeoutMs);
+    void asyncWaitEvtGroup(unsigned int group, MsgBody* body, unsigned int timeoutMs);
+    Msg* asyncWaitEvtGroupMsg(unsigned int group, unsigned int timeoutMs);
+    // A waiter, already enabled; it must not outlive the object.
+    std::unique_ptr<EvtCallback::MsgWait> getNewMsgWait(unsigned int msgType);
+    std::unique_ptr<EvtCallback::EvtWait> getNewEvtWait(unsigned int group);
+
+    // "{TgtDesc: " address " HostDesc: " address: the closing brace is left to who prints more.
+    void toStream(std::ostream* out) const override;
+
+  protected:
+    MsgBody* superMsgBodyLookup(unsigned int msgType) { return Addressable::MsgBodyLookup(msgType); }
+    MsgBody* superEvtBodyLookup(unsigned int evtType) { return Addressable::EvtBodyLookup(evtType); }
+
+    // Ends the dispatcher and waits for its callbacks. Every class that overrides a look-up calls it in its
+    // destructor: the dispatcher looks up on other threads.
+    void endCallbacks() { callback_.reset(); }
+
+  private:
+    EvtCallback& dispatcher();  // made on first use
+    Msg* exchange(unsigned int msgType, MsgBody* cmd, unsigned int retMsgType, unsigned int timeoutMs,
+                  unsigned int trans, int flags);
+
+    MsgQueue* queue_ = nullptr;  // shared, attached while held
+    CompDesc_t target_;
+    unsigned int objId_;
+    std::unique_ptr<EvtCallback> callback_;
+    std::mutex callbackMade_;
+    unsigned int responseTimeout_ = DefaultResponseTimeout;
+    unsigned int errorWaitTime_ = DefaultErrorWaitTime;
+};
+
+}  // namespace vela
+
+#endif

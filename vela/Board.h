@@ -1,0 +1,38 @@
+// The entry point for one board.
+#ifndef VELA_BOARD_H
+#define VELA_BOARD_H
+
+#include <memory>
+
+#include "vela/Addressable.h"
+#include "vela/ClusterMgr.h"
+#include "vela/Component.h"
+#include "vela/ResourceMgr.h"
+
+namespace vela {
+
+class Board : public Addressable {
+  public:
+    // A null queue gives the board a private one, which what is found through it shares.
+    Board(unsigned int board, MsgQueue* queue);
+    ~Board() override { endCallbacks(); }
+
+    void MsgQueueAttach(MsgQueue* queue) override;
+    MsgBody* MsgBodyLookup(unsigned int msgType) override;
+    MsgBody* EvtBodyLookup(unsigned int evtType) override;
+
+    // The first component of the type (0: any) on the processor, or the instance of that number. Throw
+    // Timeout when the board is silent, UnexpectedMsg when it refuses.
+    Component findComp(unsigned char compType, unsigned char processor);
+    Instance findInst(unsigned char compType, unsigned char processor, unsigned short instance);
+
+  private:
+    void makeManagers();
+
+    std::unique_ptr<ResourceMgr> resourceMgr_;
+    std::unique_ptr<ClusterMgr> clusterMgr_;
+};
+
+}  // namespace vela
+
+#endif

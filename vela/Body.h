@@ -1,0 +1,171 @@
+// A message body, made of its code and a row of fields:
+//
+//     struct SetParm { U32<"Parm"> Parm; U32<"Val"> Val; };
+//     using MsgSetParm_t = Body<8, SetParm>;
+//
+//     MsgSetParm_t own;                 // its own storage; own.Parm = 10;
+//     MsgSetParm_t bound{parm, val};    // reads into and writes from the caller's two variables
+//
+// A family lists its bodies in a BodyTable, which makes them by code and refuses two of one code.
+#ifndef VELA_BODY_H
+#define VELA_BODY_H
+
+#include <array>
+#include <ostream>
+#include <tuple>
+#include <utility>
+
+#include "vela/Msg.h"
+#include "vela/MsgBody.h"
+#include "vela/field.h"
+#include "vela/fieldsOf.h"
+
+namespace vela {
+
+// The code of a body that is no message of its own but stands inside one.
+inline constexpr unsigned int NoCode = 0xFFFFFFFFU;
+
+struct NoFields {};
+
+template <unsigned int messageCode, typename Row>
+class Body : public MsgBody, public Row {
+  public:
+    static constexpr unsigned int code = messageCode;
+
+    Body() = default;
+
+    // One variable for each field, in order, each of the field's own type.
+    template <typename... Variables>
+    requires(sizeof...(Variables) > 0 && sizeof...(Variables) == FieldCount<Row> &&
+             (!std::is_base_of_v<Row, Variables> && ...)) explicit Body(Variables&... variables) {
+        std::apply([&](auto&... fields) { (fields.bind(variables), ...); }, fieldsOf(row()));
+    }
+
+    unsigned int writeMsg(Msg* msg, unsigned int offset) override {
+        setCounts(std::make_index_sequence<n>{});
+        return move<Move::Put>(msg, offset);
+    }
+    unsigned int readMsg(Msg* msg, unsigned int offset) override { return move<Move::Get>(msg, offset); }
+
+    unsigned int GetByteSize() const override {
+        return std::apply([](const auto&... fields) { return (0U + ... + fields.byteSize()); },
+                          fieldsOf(row()));
+    }
+
+    // "{", each field's label and value, "}".
+    void toStream(std::ostream* out) const override {
+        *out << "{";
+        const char* separator = "";
+        const auto print = [&](const auto& field) {
+            *out << std::exchange(separator, " ") << field.label() << " ";
+            field.print(out);
+        };
+        std::apply([&](const auto&... fields) { (print(fields), ...); }, fieldsOf(row()));
+        *out << "}";
+    }
+
+  private:
+    static constexpr std::size_t n = FieldCount<Row>;
+    using Fields = decltype(fieldsOf(std::declval<Row&>()));
+    template <std::size_t i>
+    using FieldAt = std::remove_cvref_t<std::tuple_element_t<i, Fields>>;
+
+    Row& row() { return *this; }
+    const Row& row() const { return *this; }
+
+    // How many scalars in a row from field i on go into one transport call: the body's first field goes
+    // alone.
+    template <std::size_t i>
+    static constexpr std::size_t runLength() {
+        if constexpr (i >= n)
+            return 0;
+        else if constexpr (!ScalarField<FieldAt<i>>)
+            return 0;
+        else
+            return i == 0 ? 1 : 1 + runLength<i + 1>();
+    }
+
+    template <Move direction>
+    unsigned int move(Msg* msg, unsigned int offset) {
+        FieldMover<direction> mover(msg->getNvMsgRef(), offset);
+        unsigned int announced = 0;
+        moveFrom<0>(mover, msg, announced);
+        return mover.offset();
+    }
+
+    template <std::size_t i, typename Mover>
+    void moveFrom(Mover& mover, Msg* msg, unsigned int& announced) {
+        if constexpr (constexpr std::size_t run = runLength<i>(); run > 0) {
+            moveRun<i>(mover, announced, std::make_index_sequence<run>{});
+            moveFrom<i + run>(mover, msg, announced);
+        } else if constexpr (i < n) {
+            std::get<i>(fieldsOf(row())).transfer(mover, msg, announced);
+            moveFrom<i + 1>(mover, msg, announced);
+        }
+    }
+
+    template <std::size_t start, typename Mover, std::size_t... i>
+    void moveRun(Mover& mover, unsigned int& announced, std::index_sequence<i...>) {
+        const auto fields = fieldsOf(row());
+        mover.scalars(std::get<start + i>(fields)...);
+        const auto take = [&](auto& field) {
+            if constexpr (CountField<std::remove_reference_t<decltype(field)>>)
+                announced = field.value();
+        };
+        (take(std::get<start + i>(fields)), ...);
+    }
+
+    template <std::size_t... i>
+    void setCounts(std::index_sequence<i...>) {
+        (setCount<i>(), ...);
+    }
+    template <std::size_t i>
+    void setCount() {
+        if constexpr (CountField<FieldAt<i>>) {
+            constexpr std::size_t counted = nextArray<i + 1>();
+            static_assert(counted < n, "a count needs a list after it");
+            using Number = typename FieldAt<i>::Value;
+            std::get<i>(fieldsOf(row())) = static_cast<Number>(std::get<counted>(fieldsOf(row())).length());
+        }
+    }
+    template <std::size_t i>
+    static constexpr std::size_t nextArray() {
+        if constexpr (i >= n)
+            return n;
+        else if constexpr (requires { FieldAt<i>::isArray; })
+            return i;
+        else
+            return nextArray<i + 1>();
+    }
+};
+
+// A body of a family by its code.
+template <typename... Bodies>
+class BodyTable {
+  public:
+    // A new empty body, which the caller owns; null when the code is none of the family's.
+    static MsgBody* make(unsigned int code) {
+        MsgBody* made = nullptr;
+        static_cast<void>(((code == Bodies::code && (made = std::make_unique<Bodies>().release())) || ...));
+        return made;
+    }
+
+    static constexpr std::size_t size = sizeof...(Bodies);
+    static constexpr std::array<unsigned int, size> codes{Bodies::code...};
+
+  private:
+    static constexpr bool distinct() {
+        for (std::size_t i = 0; i < size; ++i) {
+            for (std::size_t j = 0; j < i; ++j) {
+                if (codes[i] == codes[j])
+                    return false;
+            }
+        }
+        return true;
+    }
+    static_assert(distinct(), "two bodies of one code in one family");
+};
+
+}  // namespace vela
+
+#endif

@@ -1,0 +1,88 @@
+// The dispatcher of one Addressable: hands what the object sends unasked to whoever registered for it.
+#ifndef VELA_EVTCALLBACK_H
+#define VELA_EVTCALLBACK_H
+
+#include <memory>
+
+#include "vela/AsyncMsgReceiver.h"
+#include "vela/Deliveries.h"
+#include "vela/Handler.h"
+#include "vela/Mutex.h"
+#include "vela/Thread.h"
+#include "vela/linkedList.h"
+
+namespace vela {
+
+class EvtCallback : public AsyncMsgReceiver {
+  public:
+    using Callback = CallbackBase;
+    class MsgWait;
+    class EvtWait;
+
+    // A thread parameter: run on the dispatching thread, which holds the dispatcher's lock meanwhile. Any
+    // other value is the stack size, 0 for the default, of a thread of the delivery's own.
+    static constexpr unsigned int OnDispatchingThread = 0xFFFFFFFFU;
+
+    explicit EvtCallback(Addressable* owner);
+    // Returns when no callback runs any more, but for one on the destroying thread itself.
+    ~EvtCallback() override;
+
+    // From any thread. The same callback may be registered twice and then runs twice.
+    void registerMsgType(unsigned int type, const Handler& callback, unsigned int threadParam);
+    void registerEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam);
+
+    // Remove one registration, or the key with all of them. Throw OutOfBoundsError when there is none.
+    void cancelMsgType(unsigned int type, const Handler& callback, unsigned int threadParam);
+    void cancelMsgType(unsigned int type);
+    void cancelEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam);
+    void cancelEvtGroup(unsigned int group);
+
+    // What becomes of messages and events that nobody registered for; by default they are reported on the
+    // standard error stream and deleted. Message form only.
+    void unregisteredMsgType(const Handler& handler, unsigned int threadParam);
+    void unregisteredEvtGroup(const Handler& handler, unsigned int threadParam);
+
+    void receive(Msg* msg) override;
+
+    // Gives a message to the handler for what nobody registered for.
+    void receiveUnregistered(Msg* msg);
+    // Returns when no callback of the object runs any more, but for one on this thread.
+    void awaitCallbacksOf(const Callback* object) { deliveries_->awaitFor(object); }
+
+  private:
+    struct callbackInfo : virtualObject {
+        callbackInfo(const Handler& callback, unsigned int parameter)
+            : handler(callback), threadParam(parameter) {}
+        bool operator==(const callbackInfo& other) const {
+            return handler == other.handler && threadParam == other.threadParam;
+        }
+
+        Handler handler;
+        unsigned int threadParam;
+    };
+    using Table = keyedList<unsigned int, linkedList<callbackInfo>>;
+    struct Delivery;
+
+    void add(Table& table, unsigned int key, const callbackInfo& callback);
+    void remove(Table& table, unsigned int key, const callbackInfo& callback);
+    void remove(Table& table, unsigned int key);
+
+    void dispatch(std::unique_ptr<Msg> msg);
+    void dispatchTo(linkedList<callbackInfo>& callbacks, unsigned int key, bool isEvent,
+                    std::unique_ptr<Msg> msg);
+    void dispatchUnregistered(std::unique_ptr<Msg> msg);
+    std::unique_ptr<MsgBody> bodyOf(Msg& msg, unsigned int key, bool isEvent);
+    void run(std::unique_ptr<Delivery> delivery, unsigned int threadParam);
+    static void* start(Thread::control* control, void* delivery);
+
+    Table msgTypes_;
+    Table evtGroups_;
+    Mutex mutex_;  // guards the tables and the defaults
+    callbackInfo defaultMsg_;
+    callbackInfo defaultEvt_;
+    std::shared_ptr<Deliveries> deliveries_ = std::make_shared<Deliveries>();
+};
+
+}  // namespace vela
+
+#endif

@@ -1,0 +1,37 @@
+// The body of a message that nobody knows better: its octets.
+#ifndef VELA_MSGDEFAULT_H
+#define VELA_MSGDEFAULT_H
+
+#include "vela/MsgBody.h"
+#include "vela/list.h"
+
+namespace vela {
+
+class MsgDefault_t : public MsgBody {
+  public:
+    MsgDefault_t() = default;
+    // Reads into and writes from the caller's list.
+    explicit MsgDefault_t(staticList<unsigned char>& bytes) : used_(&bytes) {}
+    MsgDefault_t(const MsgDefault_t& other) : MsgBody(other), own_(*other.used_) {}
+    MsgDefault_t& operator=(const MsgDefault_t& other) {
+        *used_ = *other.used_;
+        return *this;
+    }
+    ~MsgDefault_t() override = default;
+
+    staticList<unsigned char>& bytes() { return *used_; }
+
+    unsigned int writeMsg(Msg* msg, unsigned int offset) override;
+    unsigned int readMsg(Msg* msg, unsigned int offset) override;
+    unsigned int GetByteSize() const override { return used_->length(); }
+    // "{ByteData {", each octet as a number in the stream's base and a blank, "}}".
+    void toStream(std::ostream* out) const override;
+
+  private:
+    staticList<unsigned char> own_;
+    staticList<unsigned char>* used_ = &own_;
+};
+
+}  // namespace vela
+
+#endif

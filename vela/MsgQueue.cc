@@ -1,0 +1,139 @@
+#include "vela/MsgQueue.h"
+
+#include <utility>
+
+#include "vela/AsyncMsgReceiver.h"
+#include "vela/StreamFlags.h"
+#include "vela/report.h"
+
+namespace vela {
+
+namespace {
+
+void reportUnregisteredSource(MsgQueue* queue, Msg* raw) {
+    const std::unique_ptr<Msg> msg(raw);
+    report(BannerBegin, joined("Unregisterd Source sent to MsgQueue ", *queue),
+           joined("MsgType ", msg->getMsgType()), *msg,
+           "You may specify your own handler for messages from unregistered sources using\n"
+           "MsgQueue::unregisteredSource",
+           BannerEnd);
+}
+
+}  // namespace
+
+MsgQueue::MsgQueue(const CompDesc_t& hostDesc, unsigned int maxRetMsgSize, unsigned int depth)
+    : unregisteredSource_(reportUnregisteredSource),
+      queue_(std::make_unique<KSMsgQueue>(hostDesc.getNvCompDesc(), maxRetMsgSize, depth, nullptr)) {
+    // The transport layer knows the receiver by this base alone.
+    queue_->registerAsyncCallback(static_cast<KSAsyncMsgReceiver*>(this),
+                                  static_cast<int (KSAsyncMsgReceiver::*)(KSMsgRef&)>(&MsgQueue::MsgRouter));
+}
+
+MsgQueue::~MsgQueue() = default;
+
+CompDesc_t MsgQueue::getHostDesc() const { return CompDesc_t(queue_->getHostDesc()); }
+
+Msg* MsgQueue::request(Msg* cmd, unsigned int timeoutMs, unsigned int retMsgType, int flags) {
+    const std::unique_ptr<Msg> consumed(cmd);
+    KSMsgRef sent(*consumed->getMsgRef());
+    KSMsgRef reply;
+    {
+        std::unique_lock<Mutex> oneAtATime(requestMutex_, std::defer_lock);
+        if (timeoutMs != 0)
+            oneAtATime.lock();
+        *consumed->getMsgRef() = KSMsgRef();  // the transport's now
+        reply = queue_->request(sent, timeoutMs, retMsgType, flags);
+    }
+    std::unique_ptr<Msg> answer;
+    if (reply.getMsgRef() != nullptr)
+        answer = std::make_unique<Msg>(&reply);
+    // Without a wait the transport layer returns an empty message of its own making, never a reply.
+    if (answer == nullptr || timeoutMs == 0) {
+        if (retMsgType != 0)
+            throw Timeout(this, retMsgType, timeoutMs);
+        return nullptr;
+    }
+    if (answer->getMsgType() == 0 || answer->getMsgType() != retMsgType)
+        throw ErrorMsg(this, std::move(answer));
+    return answer.release();
+}
+
+void MsgQueue::RegisterAsyncMsgReceiver(const CompDesc_t& source, AsyncMsgReceiver* receiver) {
+    const std::lock_guard guard(receiversMutex_);
+    if (receivers_.find(source) != nullptr)
+        throw Exception(
+            "Only One AsyncMsgReceiver can be registered for each source address on a particular MsgQueue");
+    receivers_.set(source, receiver);
+}
+
+void MsgQueue::DeregisterAsyncMsgReceiver(const CompDesc_t& source) {
+    std::unique_lock guard(receiversMutex_);
+    const AsyncMsgReceiver* const leaving = receivers_.element(source);
+    receivers_.unset(source);
+    if (routingThread_ != std::this_thread::get_id())
+        receiverIdle_.wait(guard, [&] { return receiving_ != leaving; });
+}
+
+int MsgQueue::MsgRouter(KSMsgRef& ref) {
+    try {
+        route(std::make_unique<Msg>(&ref));
+    } catch (...) {
+        // Whoever received the message has reported it; the reading thread goes on.
+    }
+    return 1;
+}
+
+void MsgQueue::route(std::unique_ptr<Msg> msg) {
+    AsyncMsgReceiver* const receiver = beginReceive(msg->getSrcAddr());
+    if (receiver == nullptr) {
+        routeUnregistered(std::move(msg));
+        return;
+    }
+    struct Finally {
+        MsgQueue& queue;
+        ~Finally() { queue.endReceive(); }
+    } const finally{*this};
+    receiver->receive(msg.release());
+}
+
+void MsgQueue::routeUnregistered(std::unique_ptr<Msg> msg) {
+    try {
+        unregisteredSource_.load()(this, msg.release());
+    } catch (const Exception& exception) {
+        report("exception from the handler for unregistered sources", exception);
+    } catch (...) {
+        report("exception from the handler for unregistered sources");
+    }
+}
+
+AsyncMsgReceiver* MsgQueue::beginReceive(const CompDesc_t& source) {
+    const std::lock_guard guard(receiversMutex_);
+    AsyncMsgReceiver** const found = receivers_.find(source);
+    receiving_ = found == nullptr ? nullptr : *found;
+    routingThread_ = std::this_thread::get_id();
+    return receiving_;
+}
+
+void MsgQueue::endReceive() {
+    {
+        const std::lock_guard guard(receiversMutex_);
+        receiving_ = nullptr;
+    }
+    receiverIdle_.notify_all();
+}
+
+void MsgQueue::toStream(std::ostream* out) const { *out << "{HostDesc: " << getHostDesc() << "}"; }
+
+void MsgQueue::Timeout::toStream(std::ostream* out) const {
+    const StreamFlags saved(*out);
+    *out << "MsgQueue::Timeout" << std::hex << std::showbase << " MsgType: " << retMsgType_ << std::dec
+         << " Timeout: " << timeoutMs_ << "ms)";
+}
+
+void MsgQueue::ErrorMsg::toStream(std::ostream* out) const {
+    const StreamFlags saved(*out);
+    *out << "MsgQueue::ErrorMsg "
+         << "MsgBody: " << *msg_;
+}
+
+}  // namespace vela

@@ -1,0 +1,185 @@
+// The fields that message bodies are declared of.
+//
+// A field holds its value and a pointer to the value in use: its own, or a variable of the caller's that it
+// was bound to. Everything goes through the pointer. A copy always has storage of its own.
+//
+// Each kind says how it is moved, how many octets it takes and how it prints; a body only strings them
+// together. Labels are part of the type, so that a declaration reads `U32<"Parm"> Parm;`.
+#ifndef VELA_FIELD_H
+#define VELA_FIELD_H
+
+#include <algorithm>
+#include <concepts>
+#include <cstddef>
+#include <ostream>
+#include <type_traits>
+
+#include "vela/list.h"
+#include "vela/wire.h"
+
+namespace vela {
+
+class Msg;
+
+template <std::size_t n>
+struct Label {
+    char text[n];
+    constexpr Label(const char (&literal)[n]) { std::copy_n(literal, n, text); }  // implicit: U32<"Parm">
+};
+
+template <typename T, Label name>
+class Field {
+  public:
+    using Value = T;
+
+    Field() = default;
+    Field(const Field& other) : own_(*other.used_) {}
+    Field& operator=(const Field& other) {
+        *used_ = *other.used_;
+        return *this;
+    }
+    Field& operator=(const T& value) {
+        *used_ = value;
+        return *this;
+    }
+    ~Field() = default;
+
+    // From now on reads into and writes from the caller's variable, which must outlive the field.
+    void bind(T& variable) { used_ = &variable; }
+
+    T& value() { return *used_; }
+    const T& value() const { return *used_; }
+    operator T&() { return *used_; }
+    operator const T&() const { return *used_; }
+    T* operator->() { return used_; }
+    const T* operator->() const { return used_; }
+
+    static constexpr const char* label() { return name.text; }
+
+  private:
+    T own_{};
+    T* used_ = &own_;
+};
+
+// A number. Consecutive ones share a transport call.
+template <typename T, WireType type, Label name>
+class Scalar : public Field<T, name> {
+  public:
+    using Field<T, name>::operator=;
+    static constexpr WireType wire = type;
+
+    unsigned int byteSize() const { return elementSize(type); }
+    void print(std::ostream* out) const { *out << +this->value(); }
+};
+
+template <Label name>
+using U8 = Scalar<unsigned char, WireType::Unsigned8, name>;
+template <Label name>
+using U16 = Scalar<unsigned short, WireType::Unsigned16, name>;
+template <Label name>
+using U32 = Scalar<unsigned int, WireType::Unsigned32, name>;
+template <Label name>
+using S32 = Scalar<int, WireType::Signed32, name>;
+template <Label name>
+using Value32 = Scalar<unsigned int, WireType::Value32, name>;
+
+// The number of elements of the next list in the body: written from the list's length.
+template <typename Number>
+struct CountOf : Number {
+    using Number::operator=;
+};
+template <Label name>
+using Count32 = CountOf<U32<name>>;
+template <Label name>
+using Count16 = CountOf<U16<name>>;
+template <Label name>
+using Count8 = CountOf<U8<name>>;
+
+template <typename T>
+concept ScalarField = requires {
+    T::wire;
+}
+&&!requires { T::isArray; };
+template <typename T>
+concept CountField = ScalarField<T> && requires(T& field) {
+    []<typename N>(CountOf<N>&) {}(field);
+};
+
+// A body within the body, an address for one.
+template <typename NestedBody, Label name>
+class Nested : public Field<NestedBody, name> {
+  public:
+    using Field<NestedBody, name>::operator=;
+
+    unsigned int byteSize() const { return this->value().GetByteSize(); }
+    void print(std::ostream* out) const { *out << this->value(); }
+
+    template <Move move>
+    void transfer(FieldMover<move>& mover, Msg* msg, unsigned int) {
+        mover.nested(msg, this->value());
+    }
+};
+
+// Numbers, as many as the count before them says.
+template <typename T, WireType type, Label name>
+class Array : public Field<staticList<T>, name> {
+  public:
+    using Field<staticList<T>, name>::operator=;
+    static constexpr bool isArray = true;
+
+    unsigned int length() const { return this->value().length(); }
+    unsigned int byteSize() const { return length() * elementSize(type); }
+    void print(std::ostream* out) const { *out << this->value(); }
+
+    template <Move move>
+    void transfer(FieldMover<move>& mover, Msg*, unsigned int announced) {
+        staticList<T>& elements = this->value();
+        if constexpr (move == Move::Get)
+            elements.realloc(std::min(announced, mover.rest() / elementSize(type)));
+        mover.array(elements.begin(), elements.length(), type);
+    }
+};
+
+// Numbers without a count of their own: all that is left of the payload.
+template <typename T, WireType type, Label name>
+class Rest : public Array<T, type, name> {
+  public:
+    using Array<T, type, name>::operator=;
+
+    template <Move move>
+    void transfer(FieldMover<move>& mover, Msg* msg, unsigned int) {
+        Array<T, type, name>::transfer(mover, msg, mover.rest());
+    }
+};
+
+template <Label name>
+using RestBytes = Rest<unsigned char, WireType::Unsigned8, name>;
+
+// Bodies one after another, as many as the count before them says.
+template <typename Element, Label name>
+class ListOf : public Field<staticList<Element>, name> {
+  public:
+    using Field<staticList<Element>, name>::operator=;
+    static constexpr bool isArray = true;
+
+    unsigned int length() const { return this->value().length(); }
+    unsigned int byteSize() const {
+        unsigned int size = 0;
+        for (const Element& element : this->value())
+            size += element.GetByteSize();
+        return size;
+    }
+    void print(std::ostream* out) const { *out << this->value(); }
+
+    template <Move move>
+    void transfer(FieldMover<move>& mover, Msg* msg, unsigned int announced) {
+        if constexpr (move == Move::Get)
+            this->value().realloc(std::min(announced, mover.rest() / Element().GetByteSize()));
+        for (Element& element : this->value())
+            mover.nested(msg, element);
+    }
+};
+
+}  // namespace vela
+
+#endif

@@ -1,0 +1,130 @@
+// How fields lie in a message's payload, and the one place that moves them.
+//
+// A field is moved by the transport library, told by a descriptor word: bits 11 to 18 hold the element count
+// less one, bits 19 to 23 the element type, all other bits are 0.
+#ifndef VELA_WIRE_H
+#define VELA_WIRE_H
+
+#include <algorithm>
+#include <cstdint>
+#include <tuple>
+
+#include "norv/norv.h"
+
+namespace vela {
+
+enum class WireType : std::uint32_t {
+    Signed8 = 0,
+    Signed16 = 1,
+    Word32 = 2,
+    Signed32 = 3,
+    Unsigned8 = 4,
+    Unsigned16 = 5,
+    Value32 = 6,
+    Unsigned32 = 7,
+    Text8 = 10,
+    Field32 = 17,
+};
+
+inline constexpr unsigned int MaxChunk = 255;  // elements that one descriptor can announce
+
+constexpr std::uint32_t descriptor(WireType type, unsigned int count = 1) {
+    return ((count - 1) << 11) | (static_cast<std::uint32_t>(type) << 19);
+}
+constexpr unsigned int descriptorCount(std::uint32_t word) { return ((word & 0x7F800) >> 11) + 1; }
+constexpr WireType descriptorType(std::uint32_t word) {
+    return static_cast<WireType>((word & 0xF80000) >> 19);
+}
+
+constexpr unsigned int elementSize(WireType type) {
+    switch (type) {
+        case WireType::Signed8:
+        case WireType::Unsigned8:
+        case WireType::Text8:
+            return 1;
+        case WireType::Signed16:
+        case WireType::Unsigned16:
+            return 2;
+        default:
+            return 4;
+    }
+}
+
+enum class Move { Put, Get };
+
+// The running offset of one body on its way into or out of a payload. Reading never looks outside the
+// payload: what is not there becomes 0, and the offset goes on as if it were.
+template <Move move>
+class FieldMover {
+  public:
+    FieldMover(NvMsg32Bit* raw, unsigned int offset) : raw_(raw), offset_(offset) {}
+
+    unsigned int offset() const { return offset_; }
+    // Octets of payload from here on.
+    unsigned int rest() const { return raw_->size > offset_ ? raw_->size - offset_ : 0; }
+
+    // Several scalar fields in one transport call.
+    template <typename... Fields>
+    void scalars(Fields&... fields) {
+        constexpr unsigned int size = (elementSize(Fields::wire) + ...);
+        if (move == Move::Put || rest() >= size)
+            call(size, sizeof...(Fields), std::tuple_cat(pair(descriptor(Fields::wire), &fields.value())...));
+        else
+            (scalarIfThere(fields), ...);
+    }
+
+    // An array in chunks of at most 255 elements, the odd one first. Reading takes no more than is there.
+    template <typename T>
+    void array(T* elements, unsigned int count, WireType type) {
+        if (move == Move::Get)
+            count = std::min(count, rest() / elementSize(type));
+        for (unsigned int at = 0; at < count;) {
+            const unsigned int odd = at == 0 ? count % MaxChunk : 0;
+            const unsigned int chunk = odd != 0 ? odd : MaxChunk;
+            call(chunk * elementSize(type), 1, pair(descriptor(type, chunk), elements + at));
+            at += chunk;
+        }
+    }
+
+    // A body within this one moves itself.
+    template <typename Message, typename NestedBody>
+    void nested(Message* msg, NestedBody& body) {
+        offset_ = move == Move::Put ? body.writeMsg(msg, offset_) : body.readMsg(msg, offset_);
+        first_ = false;
+    }
+
+  private:
+    template <typename T>
+    static std::tuple<std::uint32_t, void*> pair(std::uint32_t word, T* storage) {
+        return {word, storage};
+    }
+
+    template <typename Field>
+    void scalarIfThere(Field& field) {
+        if (rest() >= elementSize(Field::wire)) {
+            call(elementSize(Field::wire), 1, pair(descriptor(Field::wire), &field.value()));
+        } else {
+            field.value() = {};
+            offset_ += elementSize(Field::wire);
+        }
+    }
+
+    template <typename Pairs>
+    void call(unsigned int size, std::uint32_t count, Pairs pairs) {
+        std::apply([&](auto... words) { transfer(raw_, count, &offset_, words...); }, pairs);
+        // Some releases of the library leave the offset at 0 after a body's first field.
+        if (first_ && offset_ == 0)
+            offset_ = size;
+        first_ = false;
+    }
+
+    static constexpr auto transfer = move == Move::Put ? nvMsgVarFieldPut : nvMsgVarFieldGet;
+
+    NvMsg32Bit* raw_;
+    unsigned int offset_;
+    bool first_ = true;
+};
+
+}  // namespace vela
+
+#endif
