@@ -6,6 +6,7 @@
 #include <memory>
 #include <utility>
 
+#include "app/Arrivals.h"
 #include "app/arguments.h"
 #include "app/banner.h"
 #include "app/display.h"
@@ -54,7 +55,7 @@ vela::TSCComponent findTsc(vela::Board& board) {
 }
 
 std::unique_ptr<vela::CCS> openCcs(const vela::Instance& instance) {
-    auto opened = std::make_unique<vela::CCS>(instance.getTgtDesc(), nullptr);
+    auto opened = std::make_unique<TracedCcs>(instance.getTgtDesc(), nullptr);
     std::cout << "CCS instance Number" << opened->getTgtDesc() << std::endl;
     return opened;
 }
@@ -128,7 +129,10 @@ void quit() {
         Process.cancel();
         Process.join();
     });
-    attempt([] { ccs.reset(); });
+    attempt([] {
+        arrivals.close();  // the object's callbacks have to end before it can
+        ccs.reset();
+    });
     attempt(discardQueued);
     attempt(closeLog);
 }

@@ -8,5 +8,5 @@ const char* __tsan_default_options();
 const char* __asan_default_options() { return "allocator_may_return_null=1"; }
 
 // Mutexes that one thread takes and another releases are signals by design.
-const char* __tsan_default_options() { return "report_mutex_bugs=0"; }
+const char* __tsan_default_options() { return "report_mutex_bugs=0 allocator_may_return_null=1"; }
 }
