@@ -61,7 +61,7 @@ void KSLocalMsgQueue::wakeReader() {
         KSMsgRef toItself(0U);
         toItself.setSrcAddr(hostDesc);
         toItself.setTgtAddr(hostDesc);
-        msgWrite(toItself.getMsgRef());
+        nvMsgWrite(handle_, toItself.getMsgRef(), 0);
         woken_ = true;
     } catch (const KSMsgRef::AllocationError&) {
     }

@@ -36,9 +36,8 @@ class Body : public MsgBody, public Row {
 
     // One variable for each field, in order, each of the field's own type.
     template <typename... Variables>
-        requires(sizeof...(Variables) > 0 && sizeof...(Variables) == FieldCount<Row> &&
-                 (!std::is_base_of_v<Row, Variables> && ...))
-    explicit Body(Variables&... variables) {
+    requires(sizeof...(Variables) > 0 && sizeof...(Variables) == FieldCount<Row> &&
+             (!std::is_base_of_v<Row, Variables> && ...)) explicit Body(Variables&... variables) {
         std::apply([&](auto&... fields) { (fields.bind(variables), ...); }, fieldsOf(row()));
     }
 
@@ -49,7 +48,8 @@ class Body : public MsgBody, public Row {
     unsigned int readMsg(Msg* msg, unsigned int offset) override { return move<Move::Get>(msg, offset); }
 
     unsigned int GetByteSize() const override {
-        return std::apply([](const auto&... fields) { return (0U + ... + fields.byteSize()); }, fieldsOf(row()));
+        return std::apply([](const auto&... fields) { return (0U + ... + fields.byteSize()); },
+                          fieldsOf(row()));
     }
 
     // "{", each field's label and value, "}".
@@ -73,7 +73,8 @@ class Body : public MsgBody, public Row {
     Row& row() { return *this; }
     const Row& row() const { return *this; }
 
-    // How many scalars in a row from field i on go into one transport call: the body's first field goes alone.
+    // How many scalars in a row from field i on go into one transport call: the body's first field goes
+    // alone.
     template <std::size_t i>
     static constexpr std::size_t runLength() {
         if constexpr (i >= n)

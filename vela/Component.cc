@@ -1,6 +1,6 @@
 #include "vela/Component.h"
 
-#include <iostream>
+#include "vela/report.h"
 
 namespace vela {
 
@@ -24,7 +24,9 @@ Instance::~Instance() {
     try {
         unuse();
     } catch (const Exception& exception) {
-        std::cerr << exception << std::endl;  // nobody is left to tell
+        report(exception);  // nobody is left to tell
+    } catch (const KSException&) {
+        report("an instance could not be given back");
     }
 }
 

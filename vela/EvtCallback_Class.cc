@@ -1,4 +1,3 @@
-#include <iostream>
 #include <mutex>
 #include <utility>
 
@@ -6,14 +5,14 @@
 #include "vela/EvtCallback.h"
 #include "vela/EvtGroupOf.h"
 #include "vela/MsgDefault.h"
+#include "vela/report.h"
 
 namespace vela {
 
 namespace {
 
-constexpr const char* Source = "EvtCallback_Class";
-
-std::ostream& diagnostic(int line) { return std::cerr << "(" << Source << line << ") "; }
+// The line numbers are part of the text.
+std::string diagnostic(int line, const char* what) { return joined("(EvtCallback_Class", line, ") ", what); }
 
 // The body that the owner knows for the message, else its octets.
 template <typename LookUp>
@@ -25,32 +24,27 @@ void giveBody(Msg& msg, LookUp lookUp) {
     }
 }
 
-void report(const Addressable& owner, const Msg& msg, const char* what, unsigned int key, const char* advice) {
-    std::cerr << "\n********************************************" << std::endl
-              << what << key << std::endl
-              << "For " << owner << std::endl
-              << msg << std::endl
-              << advice << std::endl
-              << "********************************************\n"
-              << std::endl;
+void reportUnregistered(const Addressable& owner, const Msg& msg, const char* what, unsigned int key,
+                        const char* advice) {
+    report(BannerBegin, joined(what, key), joined("For ", owner), msg, advice, BannerEnd);
 }
 
 void reportUnregisteredMsgType(Addressable* owner, Msg* raw) {
     const std::unique_ptr<Msg> msg(raw);
     const unsigned int type = msg->getMsgType();
     giveBody(*msg, [&] { return owner->MsgBodyLookup(type); });
-    report(*owner, *msg, "Unregisterd MsgType ", type,
-           "You may specify your own handler for unregisted messages using\n"
-           "Addressable::asyncUnregisteredMsgType");
+    reportUnregistered(*owner, *msg, "Unregisterd MsgType ", type,
+                       "You may specify your own handler for unregisted messages using\n"
+                       "Addressable::asyncUnregisteredMsgType");
 }
 
 void reportUnregisteredEvtGroup(Addressable* owner, Msg* raw) {
     const std::unique_ptr<Msg> msg(raw);
     const unsigned int group = evtGroupOf(*msg);
     giveBody(*msg, [&] { return owner->EvtBodyLookup(group); });
-    report(*owner, *msg, "Unregisterd EventGroup ", group,
-           "You may specify your own handler for unregisted events using\n"
-           "Addressable::asyncUnregisteredEvtGroup");
+    reportUnregistered(*owner, *msg, "Unregisterd EventGroup ", group,
+                       "You may specify your own handler for unregisted events using\n"
+                       "Addressable::asyncUnregisteredEvtGroup");
 }
 
 }  // namespace
@@ -59,7 +53,11 @@ void reportUnregisteredEvtGroup(Addressable* owner, Msg* raw) {
 struct EvtCallback::Delivery {
     Delivery(const Handler& callback, Addressable* object, unsigned int msgType,
              const std::shared_ptr<Deliveries>& all)
-        : handler(callback), owner(object), type(msgType), deliveries(all), ticket(all->begin(handler.object())) {}
+        : handler(callback),
+          owner(object),
+          type(msgType),
+          deliveries(all),
+          ticket(all->begin(handler.object())) {}
     ~Delivery() { deliveries->end(ticket); }
     Delivery(const Delivery&) = delete;
     Delivery& operator=(const Delivery&) = delete;
@@ -149,10 +147,10 @@ void EvtCallback::receive(Msg* msg) {
     try {
         dispatch(std::unique_ptr<Msg>(msg));
     } catch (const Exception& exception) {
-        diagnostic(214) << "vela internal error" << std::endl << exception << std::endl;
+        report(diagnostic(214, "vela internal error"), exception);
         throw;
     } catch (...) {
-        diagnostic(219) << "vela internal error" << std::endl;
+        report(diagnostic(219, "vela internal error"));
         throw;
     }
 }
@@ -219,10 +217,9 @@ void* EvtCallback::start(Thread::control*, void* arg) {
     try {
         delivery->call();
     } catch (const Exception& exception) {
-        diagnostic(283) << "VELA Exception caught from callback handler thread" << std::endl
-                        << exception << std::endl;
+        report(diagnostic(283, "VELA Exception caught from callback handler thread"), exception);
     } catch (...) {
-        diagnostic(287) << "genreal Exception caught from callback handler thread" << std::endl;
+        report(diagnostic(287, "genreal Exception caught from callback handler thread"));
     }
     return nullptr;
 }

@@ -1,10 +1,10 @@
 #include "vela/MsgQueue.h"
 
-#include <iostream>
 #include <utility>
 
 #include "vela/AsyncMsgReceiver.h"
 #include "vela/StreamFlags.h"
+#include "vela/report.h"
 
 namespace vela {
 
@@ -12,15 +12,11 @@ namespace {
 
 void reportUnregisteredSource(MsgQueue* queue, Msg* raw) {
     const std::unique_ptr<Msg> msg(raw);
-    std::cerr << "\n********************************************" << std::endl
-              << "Unregisterd Source sent to MsgQueue " << *queue << std::endl
-              << "MsgType " << msg->getMsgType() << std::endl
-              << *msg << std::endl
-              << "You may specify your own handler for messages from unregistered sources using\n"
-                 "MsgQueue::unregisteredSource"
-              << std::endl
-              << "********************************************\n"
-              << std::endl;
+    report(BannerBegin, joined("Unregisterd Source sent to MsgQueue ", *queue),
+           joined("MsgType ", msg->getMsgType()), *msg,
+           "You may specify your own handler for messages from unregistered sources using\n"
+           "MsgQueue::unregisteredSource",
+           BannerEnd);
 }
 
 }  // namespace
@@ -79,14 +75,18 @@ void MsgQueue::DeregisterAsyncMsgReceiver(const CompDesc_t& source) {
 }
 
 int MsgQueue::MsgRouter(KSMsgRef& ref) {
-    route(std::make_unique<Msg>(&ref));
+    try {
+        route(std::make_unique<Msg>(&ref));
+    } catch (...) {
+        // Whoever received the message has reported it; the reading thread goes on.
+    }
     return 1;
 }
 
 void MsgQueue::route(std::unique_ptr<Msg> msg) {
     AsyncMsgReceiver* const receiver = beginReceive(msg->getSrcAddr());
     if (receiver == nullptr) {
-        unregisteredSource_.load()(this, msg.release());
+        routeUnregistered(std::move(msg));
         return;
     }
     struct Finally {
@@ -94,6 +94,16 @@ void MsgQueue::route(std::unique_ptr<Msg> msg) {
         ~Finally() { queue.endReceive(); }
     } const finally{*this};
     receiver->receive(msg.release());
+}
+
+void MsgQueue::routeUnregistered(std::unique_ptr<Msg> msg) {
+    try {
+        unregisteredSource_.load()(this, msg.release());
+    } catch (const Exception& exception) {
+        report("exception from the handler for unregistered sources", exception);
+    } catch (...) {
+        report("exception from the handler for unregistered sources");
+    }
 }
 
 AsyncMsgReceiver* MsgQueue::beginReceive(const CompDesc_t& source) {
@@ -122,7 +132,8 @@ void MsgQueue::Timeout::toStream(std::ostream* out) const {
 
 void MsgQueue::ErrorMsg::toStream(std::ostream* out) const {
     const StreamFlags saved(*out);
-    *out << "MsgQueue::ErrorMsg " << "MsgBody: " << *msg_;
+    *out << "MsgQueue::ErrorMsg "
+         << "MsgBody: " << *msg_;
 }
 
 }  // namespace vela

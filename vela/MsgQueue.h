@@ -12,8 +12,8 @@
 #include "hostsvc/KSMsgQueue.h"
 #include "vela/CompDesc.h"
 #include "vela/Exception.h"
-#include "vela/Mutex.h"
 #include "vela/Msg.h"
+#include "vela/Mutex.h"
 #include "vela/Shared.h"
 #include "vela/linkedList.h"
 
@@ -86,6 +86,7 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
     // On the transport's reading thread, for every message that is no reply.
     int MsgRouter(KSMsgRef& ref);
     void route(std::unique_ptr<Msg> msg);
+    void routeUnregistered(std::unique_ptr<Msg> msg);
     AsyncMsgReceiver* beginReceive(const CompDesc_t& source);
     void endReceive();
 

@@ -23,10 +23,9 @@ class ResourceMgr : public Addressable {
     using CompFindAll_t = Body<8388706, rows::CompFindAll>;
     using CompMultipleResult_t = Body<8388707, rows::CompMultipleResult>;
 
-    using Bodies =
-        BodyTable<ResultComplete_t, CompAttrInfoResult_t, ComponentResult_t, CompAttrInfo_t, CompFind_t,
-                  CompInstAllocate_t, CompInstFree_t, CompUse_t, CompUnuse_t, CompFindAll_t,
-                  CompMultipleResult_t>;
+    using Bodies = BodyTable<ResultComplete_t, CompAttrInfoResult_t, ComponentResult_t, CompAttrInfo_t,
+                             CompFind_t, CompInstAllocate_t, CompInstFree_t, CompUse_t, CompUnuse_t,
+                             CompFindAll_t, CompMultipleResult_t>;
 
     // The manager of the board that the object stands on, on the object's queue.
     explicit ResourceMgr(const Addressable* object);

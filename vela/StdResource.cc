@@ -19,9 +19,7 @@ void StdResource::SetParm(unsigned int parm, unsigned int value, MsgSetParmCmplt
     command(MsgSetParm_t(parm, value), reply);
 }
 
-void StdResource::GetParm(unsigned int parm, MsgGetParmCmplt_t* reply) {
-    command(MsgGetParm_t(parm), reply);
-}
+void StdResource::GetParm(unsigned int parm, MsgGetParmCmplt_t* reply) { command(MsgGetParm_t(parm), reply); }
 
 void StdResource::DetectEvt(unsigned int evtType, unsigned int evtGroup, Addressable* returnTo) {
     MsgDetectEvt_t cmd;
@@ -45,7 +43,8 @@ constexpr bool isParameterCommand(unsigned int code) {
 
 }  // namespace
 
-StdResource::MsgError_t::MsgError_t(unsigned int& errorMsg, unsigned int& errorCode, Data_ErrorMsg_0x8_t& data)
+StdResource::MsgError_t::MsgError_t(unsigned int& errorMsg, unsigned int& errorCode,
+                                    Data_ErrorMsg_0x8_t& data)
     : Body(errorMsg, errorCode) {
     Data.bind(data);
 }

@@ -96,9 +96,14 @@ template <Label name>
 using Count8 = CountOf<U8<name>>;
 
 template <typename T>
-concept ScalarField = requires { T::wire; } && !requires { T::isArray; };
+concept ScalarField = requires {
+    T::wire;
+}
+&&!requires { T::isArray; };
 template <typename T>
-concept CountField = ScalarField<T> && requires(T& field) { []<typename N>(CountOf<N>&) {}(field); };
+concept CountField = ScalarField<T> && requires(T& field) {
+    []<typename N>(CountOf<N>&) {}(field);
+};
 
 // A body within the body, an address for one.
 template <typename NestedBody, Label name>

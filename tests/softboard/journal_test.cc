@@ -90,8 +90,10 @@ TEST(MessageTextTest, BodiesAreShownFieldByField) {
     for (const auto& c : cases) {
         EXPECT_EQ(bodyText({0, c.type, {}, {}, c.body}), c.text) << c.says;
     }
-    EXPECT_EQ(messageName(8388697), "CompUse");
-    EXPECT_EQ(messageName(4616), "?");
+    EXPECT_EQ(messageName({0, 8388697, {}, {}, {}}), "CompUse");
+    EXPECT_EQ(messageName({0, 4616, {}, {}, {}}), "?");
+    EXPECT_EQ(messageName({0, 0, {}, {}, {}}), "Wake");
+    EXPECT_EQ(messageName({0, 0, {}, {}, {8, 0, 0, 0}}), "Error");
 }
 
 }  // namespace
