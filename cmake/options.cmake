@@ -23,7 +23,6 @@ if(LAPDMON_SANITIZE)
     target_compile_options(lapdmon_options INTERFACE
         -fsanitize=${LAPDMON_SANITIZE} -fno-omit-frame-pointer -fno-sanitize-recover=all)
     target_link_options(lapdmon_options INTERFACE -fsanitize=${LAPDMON_SANITIZE})
-    # sees paths that only the instrumentation makes.
 endif()
 
 # A program that links the transport library. In the build tree RUNPATH (not RPATH, so that LD_LIBRARY_PATH
