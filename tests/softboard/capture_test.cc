@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <filesystem>
 #include <fstream>
 
@@ -50,8 +51,12 @@ class PcapFile {
 
 // The pseudo-header of link type 177: packet type, hardware type, length and 8 octets of address, protocol.
 Octets lapd(uint8_t packetType, const Octets& frame) {
-    Octets octets{0, packetType, 0x20, 0, 0, 1, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0x30};
-    octets.insert(octets.end(), frame.begin(), frame.end());
+    Octets octets(16 + frame.size());
+    octets[1] = packetType;
+    octets[2] = 0x20;
+    octets[5] = 1;
+    octets[15] = 0x30;
+    std::copy(frame.begin(), frame.end(), octets.begin() + 16);
     return octets;
 }
 
