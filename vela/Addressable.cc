@@ -53,7 +53,12 @@ MsgBody* Addressable::EvtBodyLookup(unsigned int evtType) { throw UndefinedEvtBo
 
 void Addressable::request(unsigned int msgType, MsgBody* cmd, unsigned int retMsgType, MsgBody* ret,
                           unsigned int trans, int flags) {
-    const std::unique_ptr<Msg> reply(exchange(msgType, cmd, retMsgType, responseTimeout_, trans, flags));
+    requestWithin(responseTimeout_, msgType, cmd, retMsgType, ret, trans, flags);
+}
+
+void Addressable::requestWithin(unsigned int timeoutMs, unsigned int msgType, MsgBody* cmd,
+                                unsigned int retMsgType, MsgBody* ret, unsigned int trans, int flags) {
+    const std::unique_ptr<Msg> reply(exchange(msgType, cmd, retMsgType, timeoutMs, trans, flags));
     if (ret != nullptr && reply != nullptr)
         reply->read(ret, 0);
 }

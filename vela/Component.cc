@@ -4,18 +4,11 @@
 
 namespace vela {
 
-Instance::Instance(const CompDesc_t& target, MsgQueue* queue, int use) : StdResource(target, queue) {
-    reserve(use);
-}
+Instance::Instance(const CompDesc_t& target, MsgQueue* queue, int inUse)
+    : StdResource(target, queue, inUse), reserved_(inUse != 0) {}
 
-Instance::Instance(const TmpInstance& other, int use) : StdResource(other) { reserve(use); }
-
-void Instance::reserve(int use) {
-    if (use == 0)
-        return;
-    StdResource::use(0);
-    reserved_ = true;
-}
+Instance::Instance(const TmpInstance& other, int inUse)
+    : Instance(other.getTgtDesc(), other.getMsgQueue(), inUse) {}
 
 Instance::~Instance() {
     endCallbacks();
