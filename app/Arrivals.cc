@@ -54,6 +54,11 @@ void Arrivals::close() {
         turn.notify_all();
 }
 
+TracedCcs::~TracedCcs() {
+    arrivals.close();
+    endCallbacks();
+}
+
 vela::MsgBody* TracedCcs::EvtBodyLookup(unsigned int evtType) {
     if (evtType == EvtL2Trace_t::code)
         return std::make_unique<ArrivedRecord>().release();

@@ -2,8 +2,8 @@
 // order they are queued.
 //
 // Each event is delivered on a thread of its own, and threads overtake one another. A record therefore takes
-// a place when it is made, on the dispatching thread, in the order of arrival; its delivery waits for its turn.
-// There are as many places as the queue has room, so that no record is refused: when all are taken the
+// a place when it is made, on the dispatching thread, in the order of arrival; its delivery waits for its
+// turn. There are as many places as the queue has room, so that no record is refused: when all are taken the
 // dispatching thread waits, and with it whatever else arrives stays with the transport.
 #ifndef APP_ARRIVALS_H
 #define APP_ARRIVALS_H
@@ -55,10 +55,10 @@ class Arrivals {
     std::condition_variable room_;
     bool closed_ = false;
     unsigned int present_ = 0;
-    unsigned int next_ = 0;  // the number of the next to arrive; wraps
-    unsigned int turn_ = 0;  // the number whose turn it is
-    std::array<bool, Slots> ended_{};                    // turns that ended before they came, by number
-    std::array<std::condition_variable, Slots> turns_;   // one each, or every turn would wake everybody
+    unsigned int next_ = 0;                             // the number of the next to arrive; wraps
+    unsigned int turn_ = 0;                             // the number whose turn it is
+    std::array<bool, Slots> ended_{};                   // turns that ended before they came, by number
+    std::array<std::condition_variable, Slots> turns_;  // one each, or every turn would wake everybody
 };
 
 extern Arrivals arrivals;
@@ -69,11 +69,12 @@ class ArrivedRecord : public vela::CCS::EvtL2Trace_t {
     Arrivals::Place place{arrivals};
 };
 
-// The traced D channel: its trace records are made as arrivals.
+// The traced D channel: its trace records are made as arrivals. Its callbacks have to end before it can, so
+// that its end is the end of the arrivals as well.
 class TracedCcs : public vela::CCS {
   public:
     using CCS::CCS;
-    ~TracedCcs() override { endCallbacks(); }
+    ~TracedCcs() override;
 
     vela::MsgBody* EvtBodyLookup(unsigned int evtType) override;
 };

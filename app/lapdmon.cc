@@ -129,10 +129,7 @@ void quit() {
         Process.cancel();
         Process.join();
     });
-    attempt([] {
-        arrivals.close();  // the object's callbacks have to end before it can
-        ccs.reset();
-    });
+    attempt([] { ccs.reset(); });
     attempt(discardQueued);
     attempt(closeLog);
 }

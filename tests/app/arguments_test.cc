@@ -26,12 +26,12 @@ constexpr char usage[] =
     "\n";
 
 void parse(Words words) {
-    words.insert(words.begin(), "lapdmon");
-    std::vector<char*> argv;
+    std::string program = "lapdmon";
+    std::vector<char*> argv{program.data()};
     for (std::string& word : words)
         argv.push_back(word.data());
     argv.push_back(nullptr);
-    parseArgs(static_cast<int>(words.size()), argv.data());
+    parseArgs(static_cast<int>(argv.size()) - 1, argv.data());
 }
 
 // In the process of a death test, where the screen cannot be looked at afterwards.

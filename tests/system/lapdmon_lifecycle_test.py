@@ -73,6 +73,11 @@ class Lifecycle(SystemTest):
                 self.assertRegex(program.screen.text(), refusal(command) + r"\Z")
                 self.assertNotIn("One moment", program.screen.text())
 
+    def test_a_start_that_fails_while_events_come_ends_the_program(self):
+        program = self.on_other_library("flood error=22")
+        program.ends(status=1, errors=re.compile(r"\A(\n\*{44}\nUnregisterd |\Z)"))
+        self.assertRegex(program.screen.text(), r"\nvela Exception caught\nAddressable::.*\n\Z")
+
     def test_a_refusal_during_the_shutdown_does_not_keep_the_next_step_from_being_taken(self):
         program = self.on_other_library("error=26")
         program.screen.wait("Frame Error")

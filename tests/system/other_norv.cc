@@ -6,6 +6,7 @@
 //     no-memory    there are no message buffers       silent=26    message type 26 is not answered
 //     no-queue     there are no queues                error=26     message type 26 is answered with an error
 //     short        before the frame come events that end within their fields
+//     flood        300 events come before the answer to a subscription
 #include <fcntl.h>
 #include <unistd.h>
 
@@ -120,6 +121,10 @@ void answer(NvMsg32Bit& command) {
     talk("heard " + std::to_string(command.type));
     if (told("silent=" + std::to_string(command.type)))
         return;
+    if (command.type == DetectEvt && told("flood")) {
+        for (int i = 0; i < 300; ++i)
+            reply(command, EvtDetected, numbers({2, 0, 500, 0}));
+    }
     if (told("error=" + std::to_string(command.type))) {
         reply(command, Error, numbers({command.type, 1001}));
         return;
