@@ -80,7 +80,7 @@ TEST(Arrivals, TheNextRecordWaitsWhileAllPlacesAreTaken) {
         in = true;
     });
     about.get_future().wait();
-    for (int i = 0; i < 1000; ++i)
+    for (int i = 0; i < 50; ++i)
         std::this_thread::yield();
     EXPECT_FALSE(in) << "it came in while there was no place";
     places.erase(places.begin() + 50);
@@ -95,7 +95,7 @@ TEST(Arrivals, RecordsThatGoUnseenBehindOneThatIsSlowLoseNobodysTurn) {
         for (int i = 0; i < 200; ++i)
             const Place gone(arrivals);
     });
-    for (int i = 0; i < 1000; ++i)
+    for (int i = 0; i < 50; ++i)
         std::this_thread::yield();
     slow.reset();
     dropped.get();
