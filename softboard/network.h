@@ -49,9 +49,10 @@ class Network {
     void setUp(const Scenario& scenario);
     void toBoard(const Message& command);
     bool toHost(const Message& message);
+    void forget(const Address& host);
     void updatePlayers();
     Component* nextPlaying();
-    bool congested(const Component& component) const;
+    bool heard(const Component& component) const;
     void playNext(Component& component, Player::Time now);
     void play();
 

@@ -330,6 +330,33 @@ TEST_F(EndlessTest, AQueueThatGoesAwayEndsItsSubscriptions) {
     expectSilence();
 }
 
+TEST_F(EndlessTest, AQueueClosedWhileItIsBoundEndsItsSubscriptions) {
+    const uint32_t queue = nvQueueOpen();
+    NvCompDesc address{};
+    nvQueueBind(queue, &address);
+    const Octets body = BodyWriter().address(addressOf(address)).u32(2).u32(0).take();
+    EXPECT_EQ(host_.ask(22, ccs, body).type, 23U);
+    EXPECT_EQ(host_.ask(8, ccs, traceOn).type, 9U);
+    EXPECT_TRUE(waitForMessages(32, 1));
+    nvQueueClose(queue);
+    clearJournal();
+    expectSilence();
+    EXPECT_EQ(journal().find("EvtDetected"), std::string::npos);
+    EXPECT_EQ(host_.ask(22, ccs, detectBody(host_)).type, 23U);
+    // From the first frame on.
+    EXPECT_EQ(host_.read().body, (Octets{2, 0, 0, 0, 1, 0, 0, 0, 0, 0, 0, 0, 3, 0, 0, 0, 0x00, 0x01, 0x7f}));
+}
+
+TEST_F(EndlessTest, FramesThatNobodyHearsAreNotPlayed) {
+    const Octets nobody = BodyWriter().address({9, 9, 9, 9, 9}).u32(2).u32(0).take();
+    EXPECT_EQ(host_.ask(22, ccs, nobody).type, 23U);
+    EXPECT_EQ(host_.ask(8, ccs, traceOn).type, 9U);
+    for (int i = 0; i < 50; ++i) {
+        expectSilence();
+    }
+    EXPECT_FALSE(waitForMessages(32, 1, std::chrono::milliseconds(0)));
+}
+
 TEST_F(EndlessTest, FramesWaitForAReaderThatFallsBehind) {
     Host other;
     startTrace(ccs);
