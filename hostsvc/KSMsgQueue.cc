@@ -109,25 +109,26 @@ void KSMsgQueue::readNroute(KSThread::control* control, char* /*arg*/) {
 void KSMsgQueue::route(KSThread::control& control, NvMsg32Bit*& msg) {
     if (msg == nullptr)
         return;
-    NvMsg32Bit* late = takeLateReply();
+    NvMsg32Bit* late = nullptr;
+    bool accepted = acceptReply(msg, late);
     if (late != nullptr) {
         control.pushCleanup(KSMsgQueueThread_Cleanup, static_cast<void*>(&late));
         handOn(control, late);
         control.popCleanup(0);
+        accepted = acceptReply(msg, late);  // the slot is empty now: nobody else fills it
     }
-    if (!acceptReply(msg))
+    if (!accepted)
         handOn(control, msg);
 }
 
-// While a request waits, a reply in the slot is one that an earlier request gave up on.
-NvMsg32Bit* KSMsgQueue::takeLateReply() {
+// While a request waits, a reply in the slot is one that an earlier request gave up on: it is taken out into
+// `late` and goes first, and msg is not looked at yet.
+bool KSMsgQueue::acceptReply(NvMsg32Bit*& msg, NvMsg32Bit*& late) {
     const std::lock_guard lock(guard_);
-    return waiting_ ? std::exchange(reply_, nullptr) : nullptr;
-}
-
-bool KSMsgQueue::acceptReply(NvMsg32Bit*& msg) {
-    const std::lock_guard lock(guard_);
-    if (!waiting_ || !expected_.matches(KSMsgRef(msg)))
+    if (!waiting_)
+        return false;
+    late = std::exchange(reply_, nullptr);
+    if (late != nullptr || !expected_.matches(KSMsgRef(msg)))
         return false;
     reply_ = std::exchange(msg, nullptr);
     waiting_ = false;

@@ -90,8 +90,7 @@ class KSMsgQueue : private KSRunnable {
     // The reader's half, on its thread alone.
     void* readerBody(void* control, void* arg);
     void route(KSThread::control& control, NvMsg32Bit*& msg);
-    NvMsg32Bit* takeLateReply();
-    bool acceptReply(NvMsg32Bit*& msg);
+    bool acceptReply(NvMsg32Bit*& msg, NvMsg32Bit*& late);
     void handOn(KSThread::control& control, NvMsg32Bit*& msg);
     void park(NvMsg32Bit*& msg);
 
