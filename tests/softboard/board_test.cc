@@ -319,6 +319,23 @@ TEST_F(EndlessTest, CancellingAllEventsStopsThem) {
     expectSilence();
 }
 
+TEST_F(EndlessTest, ACancellationLeavesTheSubscriptionsOfOtherQueues) {
+    const Octets list{1, 0, 0, 0, 2, 0, 0, 0};
+    startTrace(ccs);
+    for (const uint32_t cancel : {26U, 28U, 30U}) {
+        Host other;
+        other.send(22, ccs, detectBody(other));
+        readUntil(other, 23);
+        other.send(cancel, ccs, cancel == 28 ? list : group2);
+        other.send(2, tsc);
+        readUntil(other, 3);
+        EXPECT_EQ(other.ask(2, tsc).type, 3U) << cancel;  // no event to it
+        for (int i = 0; i < 100; ++i) {
+            EXPECT_EQ(host_.read().type, 32U) << cancel;
+        }
+    }
+}
+
 TEST_F(EndlessTest, AQueueThatGoesAwayEndsItsSubscriptions) {
     {
         Host other;
