@@ -1,6 +1,7 @@
 #include "softboard/network.h"
 
-#include <new>
+#include <iostream>
+#include <system_error>
 
 #include "softboard/codes.h"
 #include "softboard/misuse.h"
@@ -182,10 +183,23 @@ void Network::updatePlayers() {
             playing = playing || (component.player && component.player->playing());
         }
     }
-    if (playing && !player_.joinable() && !ending_) {
-        player_ = std::thread(&Network::play, this);
+    if (playing) {
+        startPlaying();
     }
     changed_.notify_all();
+}
+
+// Tried once: called for a C program, which has no use for an exception and none for the same line again.
+void Network::startPlaying() {
+    if (player_.joinable() || ending_ || threadless_) {
+        return;
+    }
+    try {
+        player_ = std::thread(&Network::play, this);
+    } catch (const std::system_error& error) {
+        threadless_ = true;
+        std::cerr << std::string("softboard: no thread to play frames: ") + error.what() + '\n' << std::flush;
+    }
 }
 
 // Whether somebody receives the component's frames and nobody who does is behind. Without a queue to fill,

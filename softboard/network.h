@@ -51,6 +51,7 @@ class Network {
     bool toHost(const Message& message);
     void forget(const Address& host);
     void updatePlayers();
+    void startPlaying();
     Component* nextPlaying();
     bool heard(const Component& component) const;
     void playNext(Component& component, Player::Time now);
@@ -63,6 +64,7 @@ class Network {
     Queues queues_;
     std::map<uint8_t, Board> boards_;
     bool ending_ = false;
+    bool threadless_ = false;  // the system refused one
     std::thread player_;
 };
 
