@@ -47,13 +47,31 @@ KSMsgQueue::~KSMsgQueue() {
 }
 
 void KSMsgQueue::registerAsyncCallback(void* receiver, AsyncMember callback) {
-    const std::lock_guard lock(guard_);
-    receivers_ = {nullptr, static_cast<KSAsyncMsgReceiver*>(receiver), callback};
+    Receivers next;
+    next.object = static_cast<KSAsyncMsgReceiver*>(receiver);
+    next.member = callback;
+    while (NvMsg32Bit* const parked = install(next))
+        next.deliver(parked);
 }
 
 void KSMsgQueue::registerAsyncCallback(AsyncCallback callback) {
+    Receivers next = receivers();
+    next.plain = callback;
+    while (NvMsg32Bit* const parked = install(next))
+        next.deliver(parked);
+}
+
+// Lets the reader know the receivers, unless a message is parked: that one is returned for them, and the
+// reader does not know them yet, so that it cannot call them at the same time or with a later message first.
+NvMsg32Bit* KSMsgQueue::install(const Receivers& next) {
     const std::lock_guard lock(guard_);
-    receivers_.plain = callback;
+    if (next.none() || !messageAvailable_.tryLock()) {
+        receivers_ = next;
+        return nullptr;
+    }
+    NvMsg32Bit* const parked = std::exchange(unclaimed_, nullptr);
+    slotFree_.unlock();
+    return parked;
 }
 
 KSMsgRef KSMsgQueue::request(KSMsgRef& msg, unsigned timeoutMs, unsigned replyType, int anySource) {
@@ -109,25 +127,26 @@ void KSMsgQueue::readNroute(KSThread::control* control, char* /*arg*/) {
 void KSMsgQueue::route(KSThread::control& control, NvMsg32Bit*& msg) {
     if (msg == nullptr)
         return;
-    NvMsg32Bit* late = takeLateReply();
+    NvMsg32Bit* late = nullptr;
+    bool accepted = acceptReply(msg, late);
     if (late != nullptr) {
         control.pushCleanup(KSMsgQueueThread_Cleanup, static_cast<void*>(&late));
         handOn(control, late);
         control.popCleanup(0);
+        accepted = acceptReply(msg, late);  // the slot is empty now: nobody else fills it
     }
-    if (!acceptReply(msg))
+    if (!accepted)
         handOn(control, msg);
 }
 
-// While a request waits, a reply in the slot is one that an earlier request gave up on.
-NvMsg32Bit* KSMsgQueue::takeLateReply() {
+// While a request waits, a reply in the slot is one that an earlier request gave up on: it is taken out into
+// `late` and goes first, and msg is not looked at yet.
+bool KSMsgQueue::acceptReply(NvMsg32Bit*& msg, NvMsg32Bit*& late) {
     const std::lock_guard lock(guard_);
-    return waiting_ ? std::exchange(reply_, nullptr) : nullptr;
-}
-
-bool KSMsgQueue::acceptReply(NvMsg32Bit*& msg) {
-    const std::lock_guard lock(guard_);
-    if (!waiting_ || !expected_.matches(KSMsgRef(msg)))
+    if (!waiting_)
+        return false;
+    late = std::exchange(reply_, nullptr);
+    if (late != nullptr || !expected_.matches(KSMsgRef(msg)))
         return false;
     reply_ = std::exchange(msg, nullptr);
     waiting_ = false;
@@ -147,16 +166,23 @@ void KSMsgQueue::handOn(KSThread::control& control, NvMsg32Bit*& msg) {
     Receivers to = receivers();
     while (to.none()) {
         control.testCancel();
-        if (slotFree_.tryLock(PollMs, PollMs))
-            return park(msg);
+        if (slotFree_.tryLock(PollMs, PollMs) && park(msg))
+            return;
         to = receivers();
     }
     to.deliver(std::exchange(msg, nullptr));
 }
 
-void KSMsgQueue::park(NvMsg32Bit*& msg) {
+// Fills the slot, which is the caller's; with a receiver there, gives it back and leaves msg alone.
+bool KSMsgQueue::park(NvMsg32Bit*& msg) {
+    const std::lock_guard lock(guard_);
+    if (!receivers_.none()) {
+        slotFree_.unlock();
+        return false;
+    }
     unclaimed_ = std::exchange(msg, nullptr);
     messageAvailable_.unlock();
+    return true;
 }
 
 KSMsgQueue::Receivers KSMsgQueue::receivers() const {

@@ -40,7 +40,9 @@ class KSMsgQueue : private KSRunnable {
     NvCompDesc getHostDesc() const { return hostDesc_; }
 
     // Whoever gets a message on the reader thread from now on. The receiver owns the message; the result is
-    // ignored. The member replaces the plain callback and any receiver before it.
+    // ignored. The member replaces the plain callback and any receiver before it. A message that was parked
+    // goes to the receiver first, before this returns and on the thread that calls. One thread registers at a
+    // time.
     void registerAsyncCallback(void* receiver, AsyncMember callback);
     // Beside a receiver, a plain callback is called first and must leave the message alone.
     void registerAsyncCallback(AsyncCallback callback);
@@ -90,11 +92,11 @@ class KSMsgQueue : private KSRunnable {
     // The reader's half, on its thread alone.
     void* readerBody(void* control, void* arg);
     void route(KSThread::control& control, NvMsg32Bit*& msg);
-    NvMsg32Bit* takeLateReply();
-    bool acceptReply(NvMsg32Bit*& msg);
+    bool acceptReply(NvMsg32Bit*& msg, NvMsg32Bit*& late);
     void handOn(KSThread::control& control, NvMsg32Bit*& msg);
-    void park(NvMsg32Bit*& msg);
+    bool park(NvMsg32Bit*& msg);
 
+    NvMsg32Bit* install(const Receivers& next);
     Receivers receivers() const;
 
     KSThread reader_;

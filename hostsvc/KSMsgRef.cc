@@ -29,10 +29,14 @@ std::uint32_t KSMsgRef::free() {
 }
 
 void KSMsgRef::realloc(unsigned size) {
-    if (msg_ == nullptr)
+    if (msg_ == nullptr) {
         *this = KSMsgRef(size);
-    else if (nvMsgReallocate(size, &msg_) != 0)
+        return;
+    }
+    NvMsg32Bit* resized = msg_;  // whatever a call that fails leaves in it, the buffer stays
+    if (nvMsgReallocate(size, &resized) != 0)
         throw AllocationError(size);
+    msg_ = resized;
 }
 
 unsigned KSMsgRef::getMsgType() const { return valid()->type; }

@@ -15,6 +15,7 @@ namespace softboard {
 struct Request {
     Board& board;
     Component* component;  // null when the managers are addressed
+    Address from;          // the command's source
     BodyReader body;       // the command's
     BodyWriter reply;      // the reply's body
 

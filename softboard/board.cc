@@ -50,7 +50,7 @@ std::optional<Message> Board::answer(const Message& command) {
     if (row == nullptr) {
         return errorReply(command, ErrorCode::unknownCommand);
     }
-    Request request{*this, component, BodyReader(command.body), {}};
+    Request request{*this, component, command.source, BodyReader(command.body), {}};
     row->action(request);
     if (request.error) {
         return errorReply(command, *request.error, request.errorData);

@@ -5,13 +5,13 @@
 namespace softboard {
 
 void Component::subscribe(uint32_t event, const Address& returnTo) {
-    std::erase_if(subscriptions,
-                  [&](const Subscription& s) { return s.event == event && s.returnTo == returnTo; });
+    cancel(event, returnTo);
     subscriptions.push_back({event, returnTo});
 }
 
-void Component::cancel(uint32_t event) {
-    std::erase_if(subscriptions, [event](const Subscription& s) { return s.event == event; });
+void Component::cancel(uint32_t event, const Address& returnTo) {
+    std::erase_if(subscriptions,
+                  [&](const Subscription& s) { return s.event == event && s.returnTo == returnTo; });
 }
 
 void Component::forget(const Address& returnTo) {

@@ -33,9 +33,8 @@ struct Component {
     bool played = false;           // since the trace was switched on: it plays once
 
     void subscribe(uint32_t event, const Address& returnTo);
-    void cancel(uint32_t event);
-    void cancelAll() { subscriptions.clear(); }
-    // Ends what would go to the address.
+    void cancel(uint32_t event, const Address& returnTo);
+    // Ends all that would go to the address.
     void forget(const Address& returnTo);
 
     // Where trace events go.

@@ -1,7 +1,7 @@
 #include "softboard/network.h"
 
-#include <algorithm>
-#include <new>
+#include <iostream>
+#include <system_error>
 
 #include "softboard/codes.h"
 #include "softboard/misuse.h"
@@ -50,7 +50,9 @@ NvCompDesc Network::bindQueue(uint32_t handle) {
     if (queue->bound) {
         misuse("nvQueueBind", "queue " + std::to_string(handle) + " is bound already");
     }
-    return compDescOf(queues_.bind(*queue));
+    const Address host = queues_.bind(*queue);
+    changed_.notify_all();  // frames may have waited for this address
+    return compDescOf(host);
 }
 
 void Network::unbindQueue(uint32_t handle, const NvCompDesc& host) {
@@ -61,22 +63,31 @@ void Network::unbindQueue(uint32_t handle, const NvCompDesc& host) {
                "queue " + std::to_string(handle) + " is not bound to " + toString(addressOf(host)));
     }
     queue->bound = false;
-    for (auto& [number, board] : boards_) {
-        for (Component& component : board.components()) {
-            component.forget(queue->host);
-        }
-    }
-    updatePlayers();
+    forget(queue->host);
 }
 
 void Network::closeQueue(uint32_t handle) {
     const std::lock_guard guard(lock_);
     const auto queue = queues_.get("nvQueueClose", handle);
+    const bool bound = queue->bound;
     queues_.close(handle);
+    if (bound) {
+        forget(queue->host);
+    }
     for (const NvMsg32Bit* msg : queue->waiting) {
         buffers_.release(msg);
     }
     queue->waiting.clear();
+}
+
+// Ends what boards would send to the address.
+void Network::forget(const Address& host) {
+    for (auto& [number, board] : boards_) {
+        for (Component& component : board.components()) {
+            component.forget(host);
+        }
+    }
+    updatePlayers();
 }
 
 NvMsg32Bit* Network::read(uint32_t handle) {
@@ -172,26 +183,45 @@ void Network::updatePlayers() {
             playing = playing || (component.player && component.player->playing());
         }
     }
-    if (playing && !player_.joinable() && !ending_) {
-        player_ = std::thread(&Network::play, this);
+    if (playing) {
+        startPlaying();
     }
     changed_.notify_all();
 }
 
-bool Network::congested(const Component& component) const {
-    const auto targets = component.traceTargets();
-    return std::any_of(targets.begin(), targets.end(), [this](const Address& target) {
-        const Queue* queue = queues_.at(target);
-        return queue != nullptr && queue->waiting.size() >= mostWaiting;
-    });
+// Tried once: called for a C program, which has no use for an exception and none for the same line again.
+void Network::startPlaying() {
+    if (player_.joinable() || ending_ || threadless_) {
+        return;
+    }
+    try {
+        player_ = std::thread(&Network::play, this);
+    } catch (const std::system_error& error) {
+        threadless_ = true;
+        std::cerr << std::string("softboard: no thread to play frames: ") + error.what() + '\n' << std::flush;
+    }
 }
 
-// The component whose frame is due first, of those whose subscribers keep up.
+// Whether somebody receives the component's frames and nobody who does is behind. Without a queue to fill,
+// nothing would ever slow them down.
+bool Network::heard(const Component& component) const {
+    bool any = false;
+    for (const Address& target : component.traceTargets()) {
+        const Queue* queue = queues_.at(target);
+        if (queue != nullptr && queue->waiting.size() >= mostWaiting) {
+            return false;
+        }
+        any = any || queue != nullptr;
+    }
+    return any;
+}
+
+// The component whose frame is due first, of those that are heard.
 Component* Network::nextPlaying() {
     Component* next = nullptr;
     for (auto& [number, board] : boards_) {
         for (Component& component : board.components()) {
-            const bool ready = component.player && component.player->playing() && !congested(component);
+            const bool ready = component.player && component.player->playing() && heard(component);
             if (ready && (next == nullptr || component.player->due() < next->player->due())) {
                 next = &component;
             }
@@ -226,6 +256,9 @@ void Network::play() {
             continue;
         }
         playNext(*component, now);
+        guard.unlock();  // a moment for those who write, read and close meanwhile
+        std::this_thread::yield();
+        guard.lock();
     }
 }
 

@@ -49,9 +49,11 @@ class Network {
     void setUp(const Scenario& scenario);
     void toBoard(const Message& command);
     bool toHost(const Message& message);
+    void forget(const Address& host);
     void updatePlayers();
+    void startPlaying();
     Component* nextPlaying();
-    bool congested(const Component& component) const;
+    bool heard(const Component& component) const;
     void playNext(Component& component, Player::Time now);
     void play();
 
@@ -62,6 +64,7 @@ class Network {
     Queues queues_;
     std::map<uint8_t, Board> boards_;
     bool ending_ = false;
+    bool threadless_ = false;  // the system refused one
     std::thread player_;
 };
 

@@ -72,20 +72,21 @@ void detectxEvts(Request& request) {
     }
 }
 
+// A cancellation names no return address: it ends what goes to the queue that sends it.
 void cancelEvt(Request& request) {
     const uint32_t event = request.body.u32();
     if (!request.body.ok()) {
         request.refuse(ErrorCode::bodyTooShort);
         return;
     }
-    request.component->cancel(event);
+    request.component->cancel(event, request.from);
 }
 
 void cancelxEvts(Request& request) {
     for (uint32_t left = request.body.u32(); left > 0 && request.body.ok(); --left) {
         const uint32_t event = request.body.u32();
         if (request.body.ok()) {
-            request.component->cancel(event);
+            request.component->cancel(event, request.from);
         }
     }
     if (!request.body.ok()) {
@@ -93,7 +94,7 @@ void cancelxEvts(Request& request) {
     }
 }
 
-void cancelAllEvts(Request& request) { request.component->cancelAll(); }
+void cancelAllEvts(Request& request) { request.component->forget(request.from); }
 
 constexpr Answer answers[] = {
     {msgError, {}, At::both, acknowledge},

@@ -43,8 +43,8 @@ constexpr std::size_t maximumLine = 2 * 33 + 60;
 constexpr std::size_t maximumText = maximumAttempts * maximumLinesAnAttempt * maximumLine;
 constexpr std::size_t maximumDump = std::size_t{decoder::maximumFrame} * 4 + std::size_t{28} * 34 + 64;
 
-// Inputs longer than this are a short beginning and one long loop over alike octets. Of those, the beginning
-// and the last octets take every value; the octets between take the few at which something changes.
+// A single element longer than this is a short beginning and one long loop over alike octets. Of those, the
+// beginning and the last octets take every value; the octets between take the few at which something changes.
 constexpr std::size_t longInput = 64;
 constexpr std::size_t wholeBeginning = 16;
 constexpr std::size_t wholeEnd = 2;
@@ -77,6 +77,15 @@ Input inputOf(const golden::Case& kase, const Octets& octets) {
     input.octets.resize(std::min<std::size_t>(input.octets.size(), decoder::maximumFrame));
     input.firstChanged = ahead;
     return input;
+}
+
+// An element whose decoder is called itself, or a whole one in a frame, which reaches the end of the input.
+bool isOneLongElement(const Input& input) {
+    const std::size_t size = input.octets.size();
+    if (size <= longInput || input.decode != nullptr)
+        return size > longInput;
+    const std::size_t id = input.firstChanged;
+    return id == frameStart.size() && input.octets[id] < 0x80 && id + 2 + input.octets[id + 1] >= size;
 }
 
 // Each input once, whatever number of cases show it.
@@ -188,7 +197,7 @@ class DamagedFrames : public testing::TestWithParam<golden::Trunk> {
 
     void changeOctet(const Input& input, Octets& changed, std::size_t at) {
         const std::size_t size = input.octets.size();
-        const bool every = size <= longInput || at < wholeBeginning || at + wholeEnd >= size;
+        const bool every = !isOneLongElement(input) || at < wholeBeginning || at + wholeEnd >= size;
         if (every) {
             for (int value = 0; value < 256; ++value) {
                 changed[at] = static_cast<unsigned char>(value);

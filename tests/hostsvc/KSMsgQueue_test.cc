@@ -334,14 +334,31 @@ TEST_F(KSMsgQueueTest, WithoutReceiverMessagesAreParkedOneAtATime) {
     EXPECT_EQ(queue_->read(), 1003U);
 }
 
-TEST_F(KSMsgQueueTest, AReceiverThatComesLaterGetsTheMessageThatWaitsForTheSlot) {
+TEST_F(KSMsgQueueTest, AReceiverThatComesLaterGetsTheParkedMessageAndTheOneThatWaitsForItsPlace) {
     event(1001);
     event(1002);
     ASSERT_TRUE(fake_norv::waitForCalls(Op::Read, 2));  // the first is parked, the second waits
     receive();
-    ASSERT_TRUE(receiver_.waitFor(1));
-    EXPECT_THAT(receiver_.types(), ElementsAre(1002));
-    EXPECT_EQ(queue_->read(), 1001U);
+    ASSERT_TRUE(receiver_.waitFor(2));
+    EXPECT_THAT(receiver_.types(), ElementsAre(1001, 1002));
+}
+
+TEST_F(KSMsgQueueTest, AParkedMessageReachesTheReceiverBeforeTheRegistrationReturns) {
+    event(1001);
+    ASSERT_TRUE(fake_norv::waitForIdleReader());
+    receive();
+    EXPECT_THAT(receiver_.types(), ElementsAre(1001));
+    event(1002);
+    ASSERT_TRUE(receiver_.waitFor(2));
+    EXPECT_THAT(receiver_.types(), ElementsAre(1001, 1002));
+}
+
+TEST_F(KSMsgQueueTest, AParkedMessageReachesAPlainCallbackToo) {
+    plainCalls = 0;
+    event(1001);
+    ASSERT_TRUE(fake_norv::waitForIdleReader());
+    queue_->registerAsyncCallback(takePlain);
+    EXPECT_EQ(plainCalls, 1001U);
 }
 
 TEST_F(KSMsgQueueTest, DestructionFreesTheParkedMessageAndTheOneThatWaitsForItsPlace) {

@@ -373,6 +373,23 @@ TEST_F(EndlessTest, CancellingAllEventsStopsThem) {
     expectSilence();
 }
 
+TEST_F(EndlessTest, ACancellationLeavesTheSubscriptionsOfOtherQueues) {
+    const Octets list{1, 0, 0, 0, 2, 0, 0, 0};
+    startTrace(ccs);
+    for (const uint32_t cancel : {26U, 28U, 30U}) {
+        Host other;
+        other.send(22, ccs, detectBody(other));
+        readUntil(other, 23);
+        other.send(cancel, ccs, cancel == 28 ? list : group2);
+        other.send(2, tsc);
+        readUntil(other, 3);
+        EXPECT_EQ(other.ask(2, tsc).type, 3U) << cancel;  // no event to it
+        for (int i = 0; i < 100; ++i) {
+            EXPECT_EQ(host_.read().type, 32U) << cancel;
+        }
+    }
+}
+
 TEST_F(EndlessTest, AQueueThatGoesAwayEndsItsSubscriptions) {
     {
         Host other;
@@ -382,6 +399,33 @@ TEST_F(EndlessTest, AQueueThatGoesAwayEndsItsSubscriptions) {
     }
     EXPECT_TRUE(waitForOutstanding(0));
     expectSilence();
+}
+
+TEST_F(EndlessTest, AQueueClosedWhileItIsBoundEndsItsSubscriptions) {
+    const uint32_t queue = nvQueueOpen();
+    NvCompDesc address{};
+    nvQueueBind(queue, &address);
+    const Octets body = BodyWriter().address(addressOf(address)).u32(2).u32(0).take();
+    EXPECT_EQ(host_.ask(22, ccs, body).type, 23U);
+    EXPECT_EQ(host_.ask(8, ccs, traceOn).type, 9U);
+    EXPECT_TRUE(waitForMessages(32, 1));
+    nvQueueClose(queue);
+    clearJournal();
+    expectSilence();
+    EXPECT_EQ(journal().find("EvtDetected"), std::string::npos);
+    EXPECT_EQ(host_.ask(22, ccs, detectBody(host_)).type, 23U);
+    // From the first frame on.
+    EXPECT_EQ(host_.read().body, (Octets{2, 0, 0, 0, 1, 0, 0, 0, 0, 0, 0, 0, 3, 0, 0, 0, 0x00, 0x01, 0x7f}));
+}
+
+TEST_F(EndlessTest, FramesThatNobodyHearsAreNotPlayed) {
+    const Octets nobody = BodyWriter().address({9, 9, 9, 9, 9}).u32(2).u32(0).take();
+    EXPECT_EQ(host_.ask(22, ccs, nobody).type, 23U);
+    EXPECT_EQ(host_.ask(8, ccs, traceOn).type, 9U);
+    for (int i = 0; i < 50; ++i) {
+        expectSilence();
+    }
+    EXPECT_FALSE(waitForMessages(32, 1, std::chrono::milliseconds(0)));
 }
 
 TEST_F(EndlessTest, FramesWaitForAReaderThatFallsBehind) {

@@ -415,7 +415,11 @@ uint32_t nvMsgReallocate(uint32_t size, NvMsg32Bit** msg) {
     State& s = state();
     const Lock lock(s.lock);
     uint32_t status = Failed;
-    if (callersBuffer(s, *msg, "nvMsgReallocate") != nullptr && !fails(s, Op::Reallocate)) {
+    if (callersBuffer(s, *msg, "nvMsgReallocate") == nullptr) {
+        // noted
+    } else if (fails(s, Op::Reallocate)) {
+        *msg = nullptr;
+    } else {
         NvMsg32Bit* const grown = newBuffer(s, size);
         std::memcpy(octets(grown), octets(*msg), NVMSG_HEADER_SIZE + std::min(size, (*msg)->size));
         grown->size = size;

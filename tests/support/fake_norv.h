@@ -76,8 +76,8 @@ std::vector<std::string> texts();  // of calls(), without the VarField calls and
 std::vector<Message> written();
 
 // ---- Faults.
-// After `after` more calls of op that work, `times` calls fail. Allocate leaves the pointer null; Write takes
-// the buffer over and loses it.
+// After `after` more calls of op that work, `times` calls fail. Allocate leaves the pointer null, as does
+// Reallocate, whose buffer stays the caller's; Write takes the buffer over and loses it.
 void fail(Op op, unsigned times = 1, unsigned after = 0);
 // The first VarField call on a body leaves the offset at 0, while the data moves.
 void leaveFirstOffsetAtZero(bool on = true);
