@@ -86,7 +86,7 @@ EvtCallback::EvtCallback(Addressable* owner)
     enrol();
 }
 
-EvtCallback::~EvtCallback() {
+void EvtCallback::end() {
     leave();
     deliveries_->awaitAll();
 }
