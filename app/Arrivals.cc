@@ -8,7 +8,7 @@ Arrivals arrivals;
 
 unsigned int Arrivals::arrive() {
     std::unique_lock guard(mutex_);
-    room_.wait(guard, [this] { return closed_ || present_ < Most; });
+    room_.wait(guard, [this] { return closed_ || hasRoom(); });
     ++present_;
     return next_++;
 }
@@ -33,6 +33,7 @@ void Arrivals::endTurnLocked(unsigned int number) {
     while (ended_[turn_ % Slots])
         ended_[turn_++ % Slots] = false;
     turns_[turn_ % Slots].notify_one();
+    room_.notify_one();
 }
 
 void Arrivals::leave(unsigned int number) {

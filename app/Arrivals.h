@@ -48,6 +48,7 @@ class Arrivals {
     static_assert(Slots >= Most && (Slots & (Slots - 1)) == 0);
 
     unsigned int arrive();
+    bool hasRoom() const { return present_ < Most && next_ - turn_ < Slots; }
     void leave(unsigned int number);
     void endTurnLocked(unsigned int number);
 

@@ -125,6 +125,10 @@ void HANDLE_L2Trace_events(vela::CCS*, unsigned int, Record* rec) {
 }
 
 void* Process_L2_Trace(vela::Thread::control* ctl, void*) {
+    // Once nobody takes records any more, none must wait for a place.
+    struct NoMoreRoom {
+        ~NoMoreRoom() { arrivals.close(); }
+    } const whenItEnds;
     guarded(215, [&] { displayForEver(*ctl); });
     return nullptr;
 }

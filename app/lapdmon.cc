@@ -1,7 +1,9 @@
 #include "app/lapdmon.h"
 
+#include <cerrno>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <iostream>
 #include <memory>
 #include <utility>
@@ -43,9 +45,16 @@ void openLog() {
         std::exit(EXIT_FAILURE);
 }
 
+// A log that could not be written whole is not closed without a word.
 void closeLog() {
-    if (decoder::ofp != nullptr)
-        std::fclose(std::exchange(decoder::ofp, nullptr));
+    if (decoder::ofp == nullptr)
+        return;
+    std::FILE* const log = std::exchange(decoder::ofp, nullptr);
+    const bool incomplete = std::ferror(log) != 0;
+    if (std::fclose(log) != 0)
+        std::cerr << log_file_name.data() << ": " << std::strerror(errno) << std::endl;
+    else if (incomplete)
+        std::cerr << log_file_name.data() << ": frames were lost, the log could not be written" << std::endl;
 }
 
 vela::TSCComponent findTsc(vela::Board& board) {
@@ -82,13 +91,14 @@ void startTrace(std::unique_ptr<vela::CCS> opened) {
     opened->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0);
     opened->DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
     ccs = std::move(opened);
-    std::atexit(quit);
+    static_cast<void>(std::atexit(quit));
     watchSignals();
     Process.start(nullptr);
 }
 
 // The exit status.
 int trace(int argc, char** argv) {
+    outliveScreen();
     vela::MsgQueue::DefaultDepth = QueueDepth;
     parseArgs(argc, argv);
     openLog();

@@ -174,12 +174,9 @@ class Addressable : public virtualObject {
     MsgBody* superMsgBodyLookup(unsigned int msgType) { return Addressable::MsgBodyLookup(msgType); }
     MsgBody* superEvtBodyLookup(unsigned int evtType) { return Addressable::EvtBodyLookup(evtType); }
 
-    // Ends the dispatcher and waits for its callbacks. Every class that overrides a look-up calls it in its
-    // destructor: the dispatcher looks up on other threads.
-    void endCallbacks() {
-        if (callback_ != nullptr)
-            callback_->end();
-    }
+    // Ends the dispatcher and waits for its callbacks; the object makes no other from then on. Every class
+    // that overrides a look-up calls it in its destructor: the dispatcher looks up on other threads.
+    void endCallbacks();
 
   private:
     EvtCallback& dispatcher();  // made on first use
@@ -193,6 +190,7 @@ class Addressable : public virtualObject {
     unsigned int objId_;
     std::unique_ptr<EvtCallback> callback_;
     std::mutex callbackMade_;
+    bool callbacksEnded_ = false;
     unsigned int responseTimeout_ = DefaultResponseTimeout;
     unsigned int errorWaitTime_ = DefaultErrorWaitTime;
 };

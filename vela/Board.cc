@@ -15,7 +15,12 @@ void Board::makeManagers() {
 void Board::MsgQueueAttach(MsgQueue* queue) {
     clusterMgr_.reset();
     resourceMgr_.reset();
-    Addressable::MsgQueueAttach(queue);
+    try {
+        Addressable::MsgQueueAttach(queue);
+    } catch (...) {  // the board stays where it was
+        makeManagers();
+        throw;
+    }
     makeManagers();
 }
 

@@ -10,6 +10,21 @@ Instance::Instance(const CompDesc_t& target, MsgQueue* queue, int inUse)
 Instance::Instance(const TmpInstance& other, int inUse)
     : Instance(other.getTgtDesc(), other.getMsgQueue(), inUse) {}
 
+void Instance::use(unsigned int payload) {
+    StdResource::use(payload);
+    reserved_ = true;
+}
+
+void Instance::unuse() {
+    StdResource::unuse();
+    reserved_ = false;
+}
+
+void Instance::free() {
+    StdResource::free();
+    reserved_ = false;
+}
+
 Instance::~Instance() {
     endCallbacks();
     if (!ownsUse_ || !reserved_)
@@ -18,7 +33,7 @@ Instance::~Instance() {
         unuse();
     } catch (const Exception& exception) {
         report(exception);  // nobody is left to tell
-    } catch (const KSException&) {
+    } catch (...) {
         report("an instance could not be given back");
     }
 }

@@ -30,6 +30,11 @@ class Instance : public StdResource {
     Instance(const TmpInstance& other, int inUse);
     ~Instance() override;
 
+    // As StdResource's, and remembered.
+    void use(unsigned int payload);
+    void unuse();
+    void free();
+
   protected:
     void giveUpOwnership() { ownsUse_ = reserved_ = false; }
 
@@ -44,7 +49,10 @@ class TmpInstance : public Instance {
     TmpInstance(const CompDesc_t& target, MsgQueue* queue) : Instance(target, queue, 0) {}
     explicit TmpInstance(const StdResource& found) : Instance(found) {}
     TmpInstance(const TmpInstance& other) = default;
-    ~TmpInstance() override { giveUpOwnership(); }
+    ~TmpInstance() override {
+        endCallbacks();
+        giveUpOwnership();
+    }
 };
 
 }  // namespace vela

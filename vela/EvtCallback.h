@@ -25,9 +25,10 @@ class EvtCallback : public AsyncMsgReceiver {
     static constexpr unsigned int OnDispatchingThread = 0xFFFFFFFFU;
 
     explicit EvtCallback(Addressable* owner);
+    // As end(). Not from a callback on the dispatching thread, which goes on in the dispatcher afterwards.
     ~EvtCallback() override { end(); }
 
-    // Receives nothing any more. Returns when no callback runs, but for one on this thread itself; those that
+    // Receives no more; returns when no callback runs any more, but for one on this thread itself. Those that
     // it waits for may still register and cancel.
     void end();
 
@@ -42,7 +43,8 @@ class EvtCallback : public AsyncMsgReceiver {
     void cancelEvtGroup(unsigned int group);
 
     // What becomes of messages and events that nobody registered for; by default they are reported on the
-    // standard error stream and deleted. Message form only.
+    // standard error stream and deleted; an empty handler brings that back. Message form only: throw
+    // Exception for a handler that takes a body.
     void unregisteredMsgType(const Handler& handler, unsigned int threadParam);
     void unregisteredEvtGroup(const Handler& handler, unsigned int threadParam);
 

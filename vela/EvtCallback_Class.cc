@@ -1,3 +1,5 @@
+#include <cxxabi.h>
+
 #include <mutex>
 #include <utility>
 
@@ -45,6 +47,13 @@ void reportUnregisteredEvtGroup(Addressable* owner, Msg* raw) {
     reportUnregistered(*owner, *msg, "Unregisterd EventGroup ", group,
                        "You may specify your own handler for unregisted events using\n"
                        "Addressable::asyncUnregisteredEvtGroup");
+}
+
+// A handler for what nobody registered for: the default in place of an empty one.
+Handler checked(const Handler& handler, Handler::MsgFunction otherwise) {
+    if (handler.takesBody() && !handler.isEmpty())
+        throw Exception("what nobody registered for has no body: the handler must take the message");
+    return handler.isEmpty() ? Handler(otherwise) : handler;
 }
 
 }  // namespace
@@ -112,13 +121,15 @@ void EvtCallback::cancelEvtGroup(unsigned int group, const Handler& callback, un
 void EvtCallback::cancelEvtGroup(unsigned int group) { remove(evtGroups_, group); }
 
 void EvtCallback::unregisteredMsgType(const Handler& handler, unsigned int threadParam) {
+    const callbackInfo chosen{checked(handler, &reportUnregisteredMsgType), threadParam};
     const std::lock_guard guard(mutex_);
-    defaultMsg_ = {handler, threadParam};
+    defaultMsg_ = chosen;
 }
 
 void EvtCallback::unregisteredEvtGroup(const Handler& handler, unsigned int threadParam) {
+    const callbackInfo chosen{checked(handler, &reportUnregisteredEvtGroup), threadParam};
     const std::lock_guard guard(mutex_);
-    defaultEvt_ = {handler, threadParam};
+    defaultEvt_ = chosen;
 }
 
 void EvtCallback::add(Table& table, unsigned int key, const callbackInfo& callback) {
@@ -143,8 +154,8 @@ void EvtCallback::remove(Table& table, unsigned int key) {
 }
 
 void EvtCallback::receive(Msg* msg) {
-    const std::lock_guard guard(mutex_);
     try {
+        const std::lock_guard guard(mutex_);
         dispatch(std::unique_ptr<Msg>(msg));
     } catch (const Exception& exception) {
         report(diagnostic(214, "vela internal error"), exception);
@@ -216,6 +227,8 @@ void* EvtCallback::start(Thread::control*, void* arg) {
     const std::unique_ptr<Delivery> delivery(static_cast<Delivery*>(arg));
     try {
         delivery->call();
+    } catch (const abi::__forced_unwind&) {  // the callback ends its thread: no error
+        throw;
     } catch (const Exception& exception) {
         report(diagnostic(283, "VELA Exception caught from callback handler thread"), exception);
     } catch (...) {

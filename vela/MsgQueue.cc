@@ -19,6 +19,17 @@ void reportUnregisteredSource(MsgQueue* queue, Msg* raw) {
            BannerEnd);
 }
 
+// The message of a handle, which is left empty; freed when there is no memory to hold it in.
+std::unique_ptr<Msg> adopt(KSMsgRef& ref) {
+    try {
+        return std::make_unique<Msg>(&ref);
+    } catch (...) {
+        if (ref.getMsgRef() != nullptr)
+            ref.free();
+        throw;
+    }
+}
+
 }  // namespace
 
 MsgQueue::MsgQueue(const CompDesc_t& hostDesc, unsigned int maxRetMsgSize, unsigned int depth)
@@ -46,7 +57,7 @@ Msg* MsgQueue::request(Msg* cmd, unsigned int timeoutMs, unsigned int retMsgType
     }
     std::unique_ptr<Msg> answer;
     if (reply.getMsgRef() != nullptr)
-        answer = std::make_unique<Msg>(&reply);
+        answer = adopt(reply);
     // Without a wait the transport layer returns an empty message of its own making, never a reply.
     if (answer == nullptr || timeoutMs == 0) {
         if (retMsgType != 0)
@@ -70,13 +81,26 @@ void MsgQueue::DeregisterAsyncMsgReceiver(const CompDesc_t& source) {
     std::unique_lock guard(receiversMutex_);
     const AsyncMsgReceiver* const leaving = receivers_.element(source);
     receivers_.unset(source);
+    awaitIdle(guard, leaving);
+}
+
+void MsgQueue::withdraw(const CompDesc_t& source, const AsyncMsgReceiver* receiver) {
+    std::unique_lock guard(receiversMutex_);
+    AsyncMsgReceiver** const registered = receivers_.find(source);
+    if (registered != nullptr && *registered == receiver)
+        receivers_.unset(source);
+    awaitIdle(guard, receiver);
+}
+
+// The routing thread does not wait for itself.
+void MsgQueue::awaitIdle(std::unique_lock<std::mutex>& guard, const AsyncMsgReceiver* receiver) {
     if (routingThread_ != std::this_thread::get_id())
-        receiverIdle_.wait(guard, [&] { return receiving_ != leaving; });
+        receiverIdle_.wait(guard, [&] { return receiving_ != receiver; });
 }
 
 int MsgQueue::MsgRouter(KSMsgRef& ref) {
     try {
-        route(std::make_unique<Msg>(&ref));
+        route(adopt(ref));
     } catch (...) {
         // Whoever received the message has reported it; the reading thread goes on.
     }

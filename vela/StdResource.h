@@ -49,7 +49,7 @@ class StdResource : public Addressable, public StdResourceMessages {
         command(MsgSetParm_t(parm, value), reply, wait);
     }
     void GetParm(MsgGetParm_t& cmd, MsgGetParmCmplt_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
-    void GetParm(unsigned int parm, MsgGetParmCmplt_t* reply, Wait wait = {}) {
+    virtual void GetParm(unsigned int parm, MsgGetParmCmplt_t* reply, Wait wait = {}) {
         command(MsgGetParm_t(parm), reply, wait);
     }
     void SetxParms(MsgSetxParms_t& cmd, MsgSetxParmsCmplt_t* reply, Wait wait = {}) {
@@ -104,7 +104,7 @@ class StdResource : public Addressable, public StdResourceMessages {
     void DetectEvt(MsgDetectEvt_t& cmd, MsgDetectEvtCmplt_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
-    void DetectEvt(unsigned int evtType, unsigned int evtGroup, Addressable* returnTo, Wait wait = {});
+    virtual void DetectEvt(unsigned int evtType, unsigned int evtGroup, Addressable* returnTo, Wait wait = {});
     void DetectxEvts(MsgDetectxEvts_t& cmd, MsgDetectxEvtsCmplt_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
@@ -112,7 +112,7 @@ class StdResource : public Addressable, public StdResourceMessages {
     void CancelEvt(MsgCancelEvt_t& cmd, MsgCancelEvtCmplt_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
-    void CancelEvt(unsigned int evtType, Addressable* /*returnTo*/, Wait wait = {}) {
+    virtual void CancelEvt(unsigned int evtType, Addressable* /*returnTo*/, Wait wait = {}) {
         command(MsgCancelEvt_t(evtType), nullptr, wait);
     }
     void CancelxEvts(MsgCancelxEvts_t& cmd, MsgCancelxEvtsCmplt_t* reply, Wait wait = {}) {

@@ -1,5 +1,7 @@
 #include "vela/TSCComponent.h"
 
+#include <algorithm>
+
 #include <ostream>
 
 namespace vela {
@@ -50,8 +52,10 @@ ParmFieldDefVal_t::ParmFieldDefVal_t(unsigned int& parm, unsigned int& fieldDef,
 
 unsigned int ParmFieldDefVal_t::writeMsg(Msg* msg, unsigned int offset) {
     const unsigned int count = descriptorCount(FieldDef);
-    if (Val->length() < count)
+    if (const unsigned int held = Val->length(); held < count) {
         Val->realloc(count);
+        std::fill(Val->begin() + held, Val->end(), 0U);  // not what the list held before it shrank
+    }
     return moveValue<Move::Put>(Val, FieldDef, msg, Body::writeMsg(msg, offset));
 }
 

@@ -72,14 +72,35 @@ TEST(Arrivals, TheNextRecordWaitsWhileAllPlacesAreTaken) {
     std::vector<std::unique_ptr<Place>> places;
     for (unsigned int i = 0; i < Arrivals::Most; ++i)
         places.push_back(std::make_unique<Place>(arrivals));
-    std::atomic<bool> leaving{false};
+    std::promise<void> about;
+    std::atomic<bool> in{false};
     auto late = std::async(std::launch::async, [&] {
+        about.set_value();
         const Place place(arrivals);
-        return leaving.load();
+        in = true;
     });
-    leaving = true;
+    about.get_future().wait();
+    for (int i = 0; i < 50; ++i)
+        std::this_thread::yield();
+    EXPECT_FALSE(in) << "it came in while there was no place";
     places.erase(places.begin() + 50);
-    EXPECT_TRUE(late.get()) << "it came in while there was no place";
+    late.get();
+    EXPECT_TRUE(in);
+}
+
+TEST(Arrivals, RecordsThatGoUnseenBehindOneThatIsSlowLoseNobodysTurn) {
+    Arrivals arrivals;
+    auto slow = std::make_unique<Place>(arrivals);
+    auto dropped = std::async(std::launch::async, [&] {
+        for (int i = 0; i < 200; ++i)
+            const Place gone(arrivals);
+    });
+    for (int i = 0; i < 50; ++i)
+        std::this_thread::yield();
+    slow.reset();
+    dropped.get();
+    const Place next(arrivals);
+    arrivals.awaitTurn(next.number());  // would wait for ever if a turn were lost
 }
 
 TEST(Arrivals, ManyMoreThanThereArePlacesPassThrough) {
