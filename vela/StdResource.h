@@ -104,7 +104,8 @@ class StdResource : public Addressable, public StdResourceMessages {
     void DetectEvt(MsgDetectEvt_t& cmd, MsgDetectEvtCmplt_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
-    virtual void DetectEvt(unsigned int evtType, unsigned int evtGroup, Addressable* returnTo, Wait wait = {});
+    virtual void DetectEvt(unsigned int evtType, unsigned int evtGroup, Addressable* returnTo,
+                           Wait wait = {});
     void DetectxEvts(MsgDetectxEvts_t& cmd, MsgDetectxEvtsCmplt_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }

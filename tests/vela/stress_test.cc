@@ -45,19 +45,24 @@ class StressTest : public EventTest {
         });
     }
 
-    // Until the queue has gone.
-    void pump() {
-        const NvCompDesc from = ccs_->getTgtDesc().getNvCompDesc(), to = host().getNvCompDesc();
+    // Messages from three sources, `n` of each kind.
+    void send(unsigned int n) {
         Octets trace = fake_norv::words({2, 1, 1003, 1});
         trace.push_back('x');
-        for (unsigned int i = 0;; ++i) {
-            NvCompDesc source = from;
+        NvCompDesc source = ccs_->getTgtDesc().getNvCompDesc();
+        const NvCompDesc to = host().getNvCompDesc();
+        for (unsigned int i = 0; i < n; ++i) {
             source.instance = static_cast<std::uint16_t>(1 + i % 3);
             fake_norv::deliver({0, 32, source, to, trace});
             fake_norv::deliver({0, 21, source, to, fake_norv::words({1, 7, i})});
-            if (!fake_norv::deliver({0, 1001 + i % 5, source, to, {}}))
-                return;
-            std::this_thread::yield();
+            fake_norv::deliver({0, 1001 + i % 5, source, to, {}});
+        }
+    }
+    // Until all of the others have ended; no more than the reader can take.
+    void pump() {
+        while (!done_) {
+            send(3);
+            EXPECT_TRUE(fake_norv::waitForIdleReader());
         }
     }
 
@@ -112,6 +117,8 @@ class StressTest : public EventTest {
             std::this_thread::yield();
         }
     }
+
+    std::atomic<bool> done_{false};
 };
 
 TEST_F(StressTest, RequestsEventsRegistrationsWaitersAndDestructionAtOnce) {
@@ -127,9 +134,11 @@ TEST_F(StressTest, RequestsEventsRegistrationsWaitersAndDestructionAtOnce) {
     threads.emplace_back([this] { comeAndGo(); });
     for (std::thread& thread : threads)
         thread.join();
-    ccs_->asyncRegisterEvtGroup(2, &takesBody, 0);
-    ccs_.reset();  // while messages still come
+    done_ = true;
     pumping.join();
+    ccs_->asyncRegisterEvtGroup(2, &takesBody, 0);
+    send(30);
+    ccs_.reset();  // while messages still come
     EXPECT_EQ(fake_norv::outstanding(), 0U);
 }
 
