@@ -86,6 +86,7 @@ class Addressable : public virtualObject {
     Addressable(const Addressable& other);  // same address, same queue; no callbacks
     explicit Addressable(const Addressable* other) : Addressable(*other) {}
     Addressable& operator=(const Addressable&) = delete;
+    // Waits for callbacks that run. Not from a callback on the dispatching thread.
     ~Addressable() override;
 
     // Leaves the queue held so far for this one, or for a private one. Registrations move along.
@@ -103,7 +104,7 @@ class Addressable : public virtualObject {
     void setErrorWaitTime(unsigned int ms) { errorWaitTime_ = ms; }
 
     // Sends cmd and reads the reply into ret unless that is null; trans 0 takes a number of its own. Throws
-    // Timeout, UnexpectedMsg.
+    // Timeout, UnexpectedMsg, and the transport's KSMsgRef::AllocationError.
     void request(unsigned int msgType, MsgBody* cmd, unsigned int retMsgType, MsgBody* ret,
                  unsigned int trans = 0, int flags = 0);
     // Sends cmd and lingers for the error wait time: silence is success, any reply is UnexpectedMsg.
@@ -173,8 +174,8 @@ class Addressable : public virtualObject {
     MsgBody* superMsgBodyLookup(unsigned int msgType) { return Addressable::MsgBodyLookup(msgType); }
     MsgBody* superEvtBodyLookup(unsigned int evtType) { return Addressable::EvtBodyLookup(evtType); }
 
-    // Ends the dispatcher and waits for its callbacks; from then on the object makes no other. Every class that overrides a look-up calls it in its
-    // destructor: the dispatcher looks up on other threads.
+    // Ends the dispatcher and waits for its callbacks; the object makes no other from then on. Every class
+    // that overrides a look-up calls it in its destructor: the dispatcher looks up on other threads.
     void endCallbacks();
 
   private:

@@ -19,15 +19,17 @@ class EvtCallback : public AsyncMsgReceiver {
     class MsgWait;
     class EvtWait;
 
-    // A thread parameter: run on the dispatching thread, which holds the dispatcher's lock meanwhile. Any
-    // other value is the stack size, 0 for the default, of a thread of the delivery's own.
+    // A thread parameter: run on the dispatching thread, which holds the dispatcher's lock meanwhile and
+    // reads no further message: such a callback must not register, cancel, wait for a reply or destroy the
+    // object. Any other value is the stack size, 0 for the default, of a thread of the delivery's own.
     static constexpr unsigned int OnDispatchingThread = 0xFFFFFFFFU;
 
     explicit EvtCallback(Addressable* owner);
     // As end(). Not from a callback on the dispatching thread, which goes on in the dispatcher afterwards.
     ~EvtCallback() override { end(); }
 
-    // Receives no more; returns when no callback runs any more, but for one on this thread itself.
+    // Receives no more; returns when no callback runs any more, but for one on this thread itself. Those that
+    // it waits for may still register and cancel.
     void end();
 
     // From any thread. The same callback may be registered twice and then runs twice.

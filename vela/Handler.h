@@ -23,9 +23,13 @@ class Handler {
     using BodyMember = void (CallbackBase::*)(Addressable*, unsigned int type, MsgBody*);
     using MsgMember = void (CallbackBase::*)(Addressable*, Msg*);
 
-    // Implicit, so that a plain function can be registered as it is.
+    // Implicit, so that a plain function, or a lambda without captures, can be registered as it is.
     Handler(BodyFunction function) : target_(function) {}
     Handler(MsgFunction function) : target_(function) {}
+    template <std::convertible_to<BodyFunction> Lambda>
+    Handler(Lambda lambda) : target_(static_cast<BodyFunction>(lambda)) {}
+    template <std::convertible_to<MsgFunction> Lambda>
+    Handler(Lambda lambda) : target_(static_cast<MsgFunction>(lambda)) {}
     template <typename T, std::derived_from<CallbackBase> Class>
     Handler(T* object, void (Class::*member)(Addressable*, unsigned int, MsgBody*))
         : target_(Bound<BodyMember>{object, static_cast<BodyMember>(member)}) {}

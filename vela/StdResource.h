@@ -100,11 +100,12 @@ class StdResource : public Addressable, public StdResourceMessages {
     }
 
     // Events of the type go to returnTo's address, or with null to this object's own queue. Cancelling names
-    // the type alone: the component keeps one subscription for each.
+    // the type alone, wherever its events went.
     void DetectEvt(MsgDetectEvt_t& cmd, MsgDetectEvtCmplt_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
-    virtual void DetectEvt(unsigned int evtType, unsigned int evtGroup, Addressable* returnTo, Wait wait = {});
+    virtual void DetectEvt(unsigned int evtType, unsigned int evtGroup, Addressable* returnTo,
+                           Wait wait = {});
     void DetectxEvts(MsgDetectxEvts_t& cmd, MsgDetectxEvtsCmplt_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }

@@ -449,6 +449,21 @@ TEST_F(EvtCallbackTest, DestroyingTheObjectWaitsForItsCallbacks) {
     destroyer.join();
 }
 
+TEST_F(EvtCallbackTest, ACallbackMayCancelAndRegisterWhileTheObjectIsBeingDestroyed) {
+    Busy busy;
+    busy.act = [&](Addressable* owner) {
+        owner->asyncCancelMsgType(Reply);
+        owner->asyncRegisterEvtGroup(2, &recorder_, &Recorder::onBody, 0);
+    };
+    ccs_->asyncRegisterMsgType(Reply, &busy, &Busy::onMsg, 0);
+    ASSERT_TRUE(sendReply());
+    ASSERT_TRUE(busy.begun.wait());
+    std::thread destroyer([&] { end(); });
+    busy.mayEnd.raise();
+    destroyer.join();
+    EXPECT_TRUE(busy.done);
+}
+
 TEST_F(EvtCallbackTest, ACallbackOnItsOwnThreadMayDestroyTheObject) {
     Busy busy;
     busy.act = [&](Addressable*) { end(); };
