@@ -2,8 +2,10 @@
 
 #include <pthread.h>
 
+#include <iostream>
 #include <utility>
 
+#include "hostsvc/KSRemoteService_ComFailure.h"
 #include "hostsvc/KSSleep.h"
 #include "hostsvc/KSTransportChoice.h"
 #include "hostsvc/descComp.h"
@@ -60,7 +62,9 @@ KSMsgRef KSMsgQueue::request(KSMsgRef& msg, unsigned timeoutMs, unsigned replyTy
     msg.setSrcAddr(hostDesc_);
     if (timeoutMs != 0)
         expect({msg.getTrans(), replyType, msg.getTgtAddr(), anySource != 0});
-    transport_->msgWrite(std::exchange(msg, KSMsgRef()).getMsgRef());
+    NvMsg32Bit* const sent = std::exchange(msg, KSMsgRef()).getMsgRef();
+    if (transport_->msgWrite(sent) != 0)
+        transport_->freeUnsent(sent);
     if (timeoutMs == 0)
         return KSMsgRef(0U);
     return replyLock_.tryLock(timeoutMs, PollMs) ? takeReply() : giveUp();
@@ -85,8 +89,15 @@ KSMsgRef KSMsgQueue::giveUp() {
     return {};
 }
 
+// A connection that is lost ends the reader, not the program: what was received stays good. Every failure has
+// been reported.
 void* KSMsgQueue::readerBody(void* control, void* arg) {
-    readNroute(static_cast<KSThread::control*>(control), static_cast<char*>(arg));
+    try {
+        readNroute(static_cast<KSThread::control*>(control), static_cast<char*>(arg));
+    } catch (const KSRemoteService_ComFailure& lost) {
+        std::cerr << "The connection to the remote message queue on " << lost.hostName() << " is lost"
+                  << std::endl;
+    }
     return nullptr;
 }
 
