@@ -107,13 +107,22 @@ void KSMsgQueue::readNroute(KSThread::control* control, char* /*arg*/) {
     control->pushCleanup(KSMsgQueueThread_Cleanup, static_cast<void*>(&current));
     for (bool failed = false;;) {
         const bool wasFailing = failed;
-        failed = transport_->msgRead(&current) != 0;
+        failed = read(*control, current) != 0;
         control->testCancel();
         if (!failed)
             route(*control, current);
         else if (wasFailing)
             ks_sleep_ms(PollMs);  // a transport that is gone must not take the processor with it
         control->testCancel();
+    }
+}
+
+std::uint32_t KSMsgQueue::read(KSThread::control& control, NvMsg32Bit*& current) {
+    try {
+        return transport_->msgRead(&current);
+    } catch (const KSRemoteService_ComFailure&) {
+        control.popCleanup(1);  // while there still is what it cleans up
+        throw;
     }
 }
 
