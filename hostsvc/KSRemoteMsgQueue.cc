@@ -178,26 +178,27 @@ void KSRemoteMsgQueue::failed(bool withinFrame, NvMsg32Bit** out) {
         throw KSRemoteService_ComFailure(hostName_.c_str(), Port);
 }
 
-// The reader may have seen its cancellation and read no more: then the relay's word is looked for here.
+// The reader may have seen its cancellation and read no more: then the relay's word is looked for here. It
+// cannot come any more once the connection has ended.
+void KSRemoteMsgQueue::lookForClosed() {
+    const std::lock_guard lock(reading_);
+    while (!closed_) {
+        const ReceivedFrame frame(connection_);
+        if (frame.is(ClosedFrame) || connection_.failed())
+            closed();
+    }
+}
+
 void KSRemoteMsgQueue::awaitClosed() {
-    std::thread reader;
+    std::thread other;
     try {
-        reader = std::thread([this] {
-            const std::lock_guard lock(reading_);
-            while (!closed_) {
-                const ReceivedFrame frame(connection_);
-                if (frame.is(ClosedFrame))
-                    closed();
-                else if (connection_.failed())
-                    return;
-            }
-        });
+        other = std::thread([this] { lookForClosed(); });
     } catch (const std::system_error&) {  // the reader alone, then
     }
     handshake_.tryLock(AnswerMs, PollMs);
     connection_.shutdown(SHUT_RDWR);
-    if (reader.joinable())
-        reader.join();
+    if (other.joinable())
+        other.join();
 }
 
 // A relay that cannot even be asked is not waited for.

@@ -32,8 +32,8 @@ class KSRemoteMsgQueue : public KSAbstractMsgQueue {
     // A message that could not be sent stays the caller's.
     std::uint32_t msgWrite(NvMsg32Bit* msg) override;
     void freeUnsent(NvMsg32Bit* msg) override;
-    // Asks the relay to close, waits up to five seconds for its word that it has, and ends the connection,
-    // once. Messages that come meanwhile are dropped.
+    // Asks the relay to close, waits up to five seconds for its word that it has (or for the end of the
+    // connection), and ends the connection, once. Messages that come meanwhile may be dropped.
     void wakeReader() override;
 
   private:
@@ -46,6 +46,7 @@ class KSRemoteMsgQueue : public KSAbstractMsgQueue {
     std::uint32_t takeMessage(const msg_t& frame, NvMsg32Bit** out);
     void failed(bool withinFrame, NvMsg32Bit** out);
     void awaitClosed();
+    void lookForClosed();
 
     std::string hostName_;
     sock connection_;

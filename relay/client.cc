@@ -65,35 +65,34 @@ void Client::serve() {
     host_.write(encodeFrame(frame_type::opened, request.header.transaction, encodeAddress(queue.address())));
     log_(name_ + ": opened " + text(queue.address()));
     Forwarder forwarder(queue, host_);
+    const Octets lastWord = converse(queue, forwarder);
+    forwarder.finish();
+    host_.write(lastWord);
+}
+
+// What to say to the host when everything else has been said: that the relay has closed, or closes.
+Octets Client::converse(TransportQueue& queue, Forwarder& forwarder) {
     try {
-        converse(queue, forwarder);
+        return encodeFrame(frame_type::closed, takeMessages(queue, forwarder));
     } catch (const Ended&) {
         forwarder.check();  // what ended the one end shows at the other as a mere close
         if (!draining_)
             throw;
-        takeLeave(forwarder);
+        return encodeFrame(frame_type::close, 0);
     }
 }
 
-// Until the host has closed.
-void Client::converse(TransportQueue& queue, Forwarder& forwarder) {
-    for (unsigned ahead = 0;; ++ahead) {
+// Until the host closes; the transaction of its request.
+std::uint32_t Client::takeMessages(TransportQueue& queue, Forwarder& forwarder) {
+    for (unsigned ahead = 1;; ++ahead) {
         const Frame frame = host_.readFrame();
-        if (frame.header.type == frame_type::close) {
-            forwarder.finish();
-            host_.write(encodeFrame(frame_type::closed, frame.header.transaction));
-            return;
-        }
+        if (frame.header.type == frame_type::close)
+            return frame.header.transaction;
         checkType(frame, frame_type::message);
         queue.write(decodeMessage(frame));
-        if (ahead % mostAhead == mostAhead - 1)
+        if (ahead % mostAhead == 0)
             forwarder.catchUp();
     }
-}
-
-void Client::takeLeave(Forwarder& forwarder) {
-    forwarder.finish();
-    host_.write(encodeFrame(frame_type::close, 0));
 }
 
 }  // namespace relay

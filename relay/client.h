@@ -32,8 +32,8 @@ class Client {
   private:
     void run(const std::function<void()>& ended);
     void serve();
-    void converse(TransportQueue& queue, Forwarder& forwarder);
-    void takeLeave(Forwarder& forwarder);
+    Octets converse(TransportQueue& queue, Forwarder& forwarder);
+    std::uint32_t takeMessages(TransportQueue& queue, Forwarder& forwarder);
 
     Stream host_;
     std::string name_;

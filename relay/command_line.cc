@@ -32,7 +32,6 @@ void addOptions(CLI::App& app, Given& given, Options& options) {
     app.add_option("--allow", given.allow,
                    "Who may connect, this machine included; may be given again (default: 127.0.0.0/8)")
         ->type_name("CIDR")
-        ->expected(1)
         ->allow_extra_args(false);
     app.add_option("--max-clients", options.maxClients, "Most connections at a time (default: 128)")
         ->type_name("N")

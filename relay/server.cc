@@ -16,7 +16,6 @@ namespace relay {
 
 namespace {
 
-constexpr int backlog = 128;
 constexpr int forEver = -1;
 constexpr int retryMs = 1000;  // when there was no descriptor for a connection
 
@@ -42,7 +41,7 @@ Descriptor listenAt(const Endpoint& endpoint) {
     setsockopt(socket.get(), SOL_SOCKET, SO_REUSEADDR, &on, sizeof on);
     const sockaddr_in address = addressOf(endpoint);
     if (bind(socket.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0 ||
-        listen(socket.get(), backlog) != 0)
+        listen(socket.get(), SOMAXCONN) != 0)
         fail("listening on " + endpoint.text());
     return socket;
 }
