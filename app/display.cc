@@ -8,6 +8,7 @@
 #include <mutex>
 #include <string_view>
 
+#include "app/Arrivals.h"
 #include "app/guarded.h"
 #include "decoder/cursor.h"
 #include "decoder/frame.h"
@@ -111,6 +112,7 @@ void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
 void HANDLE_L2Trace_events(vela::CCS*, unsigned int, Record* rec) {
     std::unique_ptr<Record> held(rec);
     guarded(100, [&] {
+        const Turn turn(held.get());
         const std::lock_guard guard(queueGuard);
         if (event_queue.enqueue(held.get())) {
             static_cast<void>(held.release());  // the queue's entry's now
@@ -123,6 +125,10 @@ void HANDLE_L2Trace_events(vela::CCS*, unsigned int, Record* rec) {
 }
 
 void* Process_L2_Trace(vela::Thread::control* ctl, void*) {
+    // Once nobody takes records any more, none must wait for a place.
+    struct NoMoreRoom {
+        ~NoMoreRoom() { arrivals.close(); }
+    } const whenItEnds;
     guarded(215, [&] { displayForEver(*ctl); });
     return nullptr;
 }

@@ -1,10 +1,14 @@
 #include "app/lapdmon.h"
 
+#include <cerrno>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <iostream>
 #include <memory>
+#include <utility>
 
+#include "app/Arrivals.h"
 #include "app/arguments.h"
 #include "app/banner.h"
 #include "app/display.h"
@@ -41,9 +45,16 @@ void openLog() {
         std::exit(EXIT_FAILURE);
 }
 
+// A log that could not be written whole is not closed without a word.
 void closeLog() {
-    if (decoder::ofp != nullptr)
-        std::fclose(std::exchange(decoder::ofp, nullptr));
+    if (decoder::ofp == nullptr)
+        return;
+    std::FILE* const log = std::exchange(decoder::ofp, nullptr);
+    const bool incomplete = std::ferror(log) != 0;
+    if (std::fclose(log) != 0)
+        std::cerr << log_file_name.data() << ": " << std::strerror(errno) << std::endl;
+    else if (incomplete)
+        std::cerr << log_file_name.data() << ": frames were lost, the log could not be written" << std::endl;
 }
 
 vela::TSCComponent findTsc(vela::Board& board) {
@@ -52,36 +63,42 @@ vela::TSCComponent findTsc(vela::Board& board) {
     return tsc;
 }
 
-void openCcs(const vela::Instance& instance) {
-    ccs = std::make_unique<vela::CCS>(instance.getTgtDesc(), nullptr);
-    std::cout << "CCS instance Number" << ccs->getTgtDesc() << std::endl;
+std::unique_ptr<vela::CCS> openCcs(const vela::Instance& instance) {
+    auto opened = std::make_unique<TracedCcs>(instance.getTgtDesc(), nullptr);
+    std::cout << "CCS instance Number" << opened->getTgtDesc() << std::endl;
+    return opened;
 }
 
-// Sets the decoder's variant, or ends the program: nothing has been switched on yet.
-void setProtocol(unsigned int type) {
+// Sets the decoder's variant; false for a type that nobody knows how to decode.
+bool setProtocol(unsigned int type) {
     std::cout << "CCS protocol type is " << type << std::endl;
     const Protocol* const protocol = protocolOf(type);
     if (protocol == nullptr) {
         std::cerr << "Unknow Protocol -- I don't know how to interprete. "
                   << "Program is terminating!" << std::endl;
-        std::exit(EXIT_FAILURE);
+        return false;
     }
     decoder::swit = protocol->variant;
     std::cout << protocol->screenLine << std::endl;
     decoder::text(protocol->logLine);
     decoder::flushLines();
+    return true;
 }
 
-void startTrace() {
-    ccs->SetParm(L2TraceParm, 1, nullptr);
-    ccs->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0);
-    ccs->DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
+// Once the board reports events, the instance is quit's to switch off and to destroy.
+void startTrace(std::unique_ptr<vela::CCS> opened) {
+    opened->SetParm(L2TraceParm, 1, nullptr);
+    opened->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0);
+    opened->DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
+    ccs = std::move(opened);
     std::atexit(quit);
     watchSignals();
     Process.start(nullptr);
 }
 
-void trace(int argc, char** argv) {
+// The exit status.
+int trace(int argc, char** argv) {
+    outliveScreen();
     vela::MsgQueue::DefaultDepth = QueueDepth;
     parseArgs(argc, argv);
     openLog();
@@ -92,12 +109,14 @@ void trace(int argc, char** argv) {
     const vela::TSCComponent tsc = findTsc(board);
     const vela::Instance instance =
         board.findInst(CcsType, AnyProcessor, static_cast<unsigned short>(INST_NUM));
-    openCcs(instance);
+    std::unique_ptr<vela::CCS> opened = openCcs(instance);
     vela::StdResource::MsgGetParmCmplt_t reply;
-    ccs->GetParm(ProtocolTypeParm, &reply);
-    setProtocol(reply.Val);
-    startTrace();
+    opened->GetParm(ProtocolTypeParm, &reply);
+    if (!setProtocol(reply.Val))
+        return EXIT_FAILURE;  // nothing has been switched on yet
+    startTrace(std::move(opened));
     awaitQuit();
+    return EXIT_SUCCESS;
 }
 
 // One step of the shutdown, which goes on whatever happens.
@@ -126,12 +145,15 @@ void quit() {
 }
 
 int runTrace(int argc, char** argv) {
+    int status = EXIT_SUCCESS;
     try {
-        guarded(MainPlace, [&] { trace(argc, argv); });
-        return EXIT_SUCCESS;
+        guarded(MainPlace, [&] { status = trace(argc, argv); });
     } catch (...) {  // reported
-        return EXIT_FAILURE;
+        status = EXIT_FAILURE;
     }
+    if (ccs == nullptr)
+        discardQueued();  // quit will not run, and no callback any more
+    return status;
 }
 
 }  // namespace app

@@ -8,7 +8,7 @@
 
 namespace app {
 
-// The CCS instance of the traced D channel, from start-up to quit.
+// The CCS instance of the traced D channel, from when the board reports its frames until quit.
 extern std::unique_ptr<vela::CCS> ccs;
 
 // Runs a trace until the operator ends it; returns the process's exit status.

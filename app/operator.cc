@@ -44,9 +44,15 @@ void watchSignals() {
     struct sigaction action = {};
     action.sa_handler = exit_handle;
     action.sa_flags = SA_RESTART;
-    for (const int each : Signals)
-        sigaction(each, &action, nullptr);
+    for (const int each : Signals) {
+        struct sigaction before = {};
+        sigaction(each, nullptr, &before);
+        if (each != SIGHUP || before.sa_handler != SIG_IGN)
+            sigaction(each, &action, nullptr);
+    }
 }
+
+void outliveScreen() { std::signal(SIGPIPE, SIG_IGN); }
 
 void awaitQuit() {
     constexpr int NoInput = -1;

@@ -18,7 +18,7 @@ class KSAbstractMsgQueue {
     // Sends msg to its target address and takes it over; one that was not sent goes to freeUnsent.
     virtual std::uint32_t msgWrite(NvMsg32Bit* msg) = 0;
 
-    // Wakes the reader if wakeReader() has not, and closes the queue. No thread may be about to read.
+    // Closes the queue if close() has not. No thread may use it any more.
     virtual ~KSAbstractMsgQueue() = default;
 
     // Makes the reader's msgRead return, so that it can be seen off before the queue goes.
@@ -26,6 +26,10 @@ class KSAbstractMsgQueue {
 
     // Frees what msgWrite has left to its caller: here, nothing.
     virtual void freeUnsent(NvMsg32Bit* /*msg*/) {}
+
+    // Wakes the reader if wakeReader() has not, and closes the queue: from now on msgRead fails. A thread
+    // that reads returns.
+    virtual void close() = 0;
 
     // The address under which the queue receives: the source of every message sent through it.
     NvCompDesc getHostDesc() const { return hostDesc; }

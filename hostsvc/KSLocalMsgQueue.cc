@@ -2,6 +2,8 @@
 
 #include <sys/resource.h>
 
+#include <utility>
+
 #include "hostsvc/KSAssert.h"
 #include "hostsvc/KSException.h"
 #include "hostsvc/KSMsgRef.h"
@@ -41,7 +43,11 @@ KSLocalMsgQueue::KSLocalMsgQueue(NvCompDesc /*desc*/, unsigned /*a*/, unsigned /
     }
 }
 
-KSLocalMsgQueue::~KSLocalMsgQueue() {
+KSLocalMsgQueue::~KSLocalMsgQueue() { KSLocalMsgQueue::close(); }
+
+void KSLocalMsgQueue::close() {
+    if (std::exchange(closed_, true))
+        return;
     constexpr const char* function = "virtual KSLocalMsgQueue::~KSLocalMsgQueue()";
     KSLocalMsgQueue::wakeReader();
     if (nvQueueUnbind(handle_, hostDesc) == NVSTATUS_ERROR)
@@ -61,7 +67,7 @@ void KSLocalMsgQueue::wakeReader() {
         KSMsgRef toItself(0U);
         toItself.setSrcAddr(hostDesc);
         toItself.setTgtAddr(hostDesc);
-        msgWrite(toItself.getMsgRef());
+        nvMsgWrite(handle_, toItself.getMsgRef(), 0);
         woken_ = true;
     } catch (const KSMsgRef::AllocationError&) {
     }

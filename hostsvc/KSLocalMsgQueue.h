@@ -10,17 +10,19 @@ class KSLocalMsgQueue : public KSAbstractMsgQueue {
     // tried once more with 60 more open files allowed. Throws KSResource_CreationError, and leaves nothing
     // open.
     KSLocalMsgQueue(NvCompDesc desc, unsigned a, unsigned b);
-    // Fails an assertion when the library does not give the queue back.
     ~KSLocalMsgQueue() override;
 
     std::uint32_t msgRead(NvMsg32Bit** out) override;
     std::uint32_t msgWrite(NvMsg32Bit* msg) override;
     // With an empty message to the queue itself, once. Without memory for one the closing itself has to do.
     void wakeReader() override;
+    // Fails an assertion when the library does not give the queue back.
+    void close() override;
 
   private:
     std::uint32_t handle_;
     bool woken_ = false;
+    bool closed_ = false;
 };
 
 #endif

@@ -42,7 +42,7 @@ KSMsgQueue::~KSMsgQueue() {
     reader_.cancel();
     transport_->wakeReader();
     reader_.tryJoin(ReaderEndMs, 1);
-    transport_.reset();
+    transport_->close();
     reader_.join();
     KSMsgQueueThread_Cleanup(&reply_);
     KSMsgQueueThread_Cleanup(&unclaimed_);

@@ -84,7 +84,7 @@ KSRemoteMsgQueue::KSRemoteMsgQueue(NvCompDesc desc, unsigned a, unsigned b, cons
 }
 
 KSRemoteMsgQueue::~KSRemoteMsgQueue() {
-    KSRemoteMsgQueue::wakeReader();
+    KSRemoteMsgQueue::close();
     const std::lock_guard readerHasLeft(reading_);
 }
 
@@ -212,3 +212,5 @@ void KSRemoteMsgQueue::wakeReader() {
     else
         connection_.shutdown(SHUT_RDWR);
 }
+
+void KSRemoteMsgQueue::close() { wakeReader(); }

@@ -35,6 +35,7 @@ class KSRemoteMsgQueue : public KSAbstractMsgQueue {
     // Asks the relay to close, waits up to five seconds for its word that it has (or for the end of the
     // connection), and ends the connection, once. Messages that come meanwhile may be dropped.
     void wakeReader() override;
+    void close() override;
 
   private:
     class ReceivedFrame;

@@ -4,6 +4,7 @@
 #include <unistd.h>
 
 #include <atomic>
+#include <memory>
 
 namespace {
 
@@ -21,9 +22,10 @@ int KSSystem::createThread(const pthread_attr_t* attributes, void* (*entry)(void
 }
 
 KSSystem& ks_system() {
-    static KSSystem real;
+    // Never destroyed: while the process exits there are threads that still sleep.
+    static KSSystem* const real = std::make_unique<KSSystem>().release();
     KSSystem* const other = standIn.load();
-    return other != nullptr ? *other : real;
+    return other != nullptr ? *other : *real;
 }
 
 void ks_useSystem(KSSystem* other) { standIn.store(other); }

@@ -65,8 +65,8 @@ void Journal::add(Way way, const Message& message) {
     const std::string body = bodyText(message);
     const std::string type = std::to_string(message.type);
     Line line;
-    line.text = std::string(wayText(way)) + " " + type + " " + messageName(message.type) + " " + body +
-                " from " + toString(message.source) + " to " + toString(message.target) + " trans " +
+    line.text = std::string(wayText(way)) + " " + type + " " + messageName(message) + " " + body + " from " +
+                toString(message.source) + " to " + toString(message.target) + " trans " +
                 std::to_string(message.transaction >> 8);
     if (way == Way::hostToBoard || way == Way::hostToNobody) {
         line.heard = type + " " + body + "\n";

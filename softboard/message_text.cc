@@ -98,8 +98,11 @@ std::string fieldText(BodyReader& body, Kind kind) {
 
 }  // namespace
 
-std::string messageName(uint32_t type) {
-    const Row* row = rowOf(type);
+std::string messageName(const Message& message) {
+    if (message.type == msgError && message.body.empty()) {
+        return "Wake";
+    }
+    const Row* row = rowOf(message.type);
     return row == nullptr ? "?" : row->name;
 }
 
@@ -107,7 +110,7 @@ std::string bodyText(const Message& message) {
     BodyReader body(message.body);
     std::string text;
     const auto add = [&text](const std::string& part) { text += (text.empty() ? "" : " ") + part; };
-    if (const Row* row = rowOf(message.type); row != nullptr) {
+    if (const Row* row = rowOf(message.type); row != nullptr && body.left() > 0) {
         for (const Field& field : row->fields) {
             if (field.label == nullptr || (field.kind == Kind::octets && body.left() == 0)) {
                 break;

@@ -1,5 +1,6 @@
 #include "softboard/process.h"
 
+#include <atomic>
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
@@ -13,7 +14,7 @@ namespace softboard {
 
 namespace {
 
-Network* made = nullptr;
+std::atomic<Network*> made = nullptr;
 
 Scenario loadScenario() {
     const char* path = std::getenv(scenarioVariable);
@@ -36,18 +37,19 @@ Scenario loadScenario() {
 
 Network* make() {
     const Scenario scenario = loadScenario();
-    made = new Network(scenario);  // for as long as the process lives
-    if (!scenario.journal.empty() && !made->journal().writeTo(scenario.journal)) {
+    auto* network = new Network(scenario);  // for as long as the process lives
+    if (!scenario.journal.empty() && !network->journal().writeTo(scenario.journal)) {
         std::cerr << "softboard: " << scenario.journal << ": " << std::strerror(errno) << std::endl;
     }
-    return made;
+    made = network;
+    return network;
 }
 
 // After the program's own exit handlers and destructors.
 __attribute__((destructor)) void tearDown() {
-    if (made != nullptr) {
-        made->shutDown();
-        made->journal().note(made->balance());
+    if (Network* network = made; network != nullptr) {
+        network->shutDown();
+        network->journal().note(network->balance());
     }
 }
 

@@ -31,7 +31,20 @@ Addressable::Addressable(const Addressable& other)
 
 Addressable::~Addressable() {
     endCallbacks();
+    callback_.reset();
     queue_->detach();
+}
+
+// A callback that still runs may use the object's dispatcher, which therefore stays until it has ended.
+void Addressable::endCallbacks() {
+    EvtCallback* ending = nullptr;
+    {
+        const std::lock_guard guard(callbackMade_);
+        callbacksEnded_ = true;
+        ending = callback_.get();
+    }
+    if (ending != nullptr)
+        ending->end();
 }
 
 void Addressable::MsgQueueAttach(MsgQueue* queue) {
@@ -39,13 +52,16 @@ void Addressable::MsgQueueAttach(MsgQueue* queue) {
         queue = std::make_unique<MsgQueue>(target_, MsgQueue::DefaultMaxRetMsgSize, MsgQueue::DefaultDepth)
                     .release();
     queue->attach();
-    if (callback_ != nullptr)
-        callback_->leave();
+    try {
+        if (callback_ != nullptr)
+            callback_->moveTo(queue);
+    } catch (...) {  // the object stays where it was
+        queue->detach();
+        throw;
+    }
     if (queue_ != nullptr)
         queue_->detach();
     queue_ = queue;
-    if (callback_ != nullptr)
-        callback_->enrol();
 }
 
 MsgBody* Addressable::MsgBodyLookup(unsigned int msgType) { throw UndefinedMsgBody(msgType); }
@@ -53,7 +69,12 @@ MsgBody* Addressable::EvtBodyLookup(unsigned int evtType) { throw UndefinedEvtBo
 
 void Addressable::request(unsigned int msgType, MsgBody* cmd, unsigned int retMsgType, MsgBody* ret,
                           unsigned int trans, int flags) {
-    const std::unique_ptr<Msg> reply(exchange(msgType, cmd, retMsgType, responseTimeout_, trans, flags));
+    requestWithin(responseTimeout_, msgType, cmd, retMsgType, ret, trans, flags);
+}
+
+void Addressable::requestWithin(unsigned int timeoutMs, unsigned int msgType, MsgBody* cmd,
+                                unsigned int retMsgType, MsgBody* ret, unsigned int trans, int flags) {
+    const std::unique_ptr<Msg> reply(exchange(msgType, cmd, retMsgType, timeoutMs, trans, flags));
     if (ret != nullptr && reply != nullptr)
         reply->read(ret, 0);
 }
@@ -82,6 +103,8 @@ Msg* Addressable::exchange(unsigned int msgType, MsgBody* cmd, unsigned int retM
 
 EvtCallback& Addressable::dispatcher() {
     const std::lock_guard guard(callbackMade_);
+    if (callback_ == nullptr && callbacksEnded_)
+        throw Exception("the object is being destroyed");
     if (callback_ == nullptr)
         callback_ = std::make_unique<EvtCallback>(this);
     return *callback_;

@@ -4,6 +4,8 @@
 
 #include <memory>
 #include <mutex>
+#include <optional>
+#include <type_traits>
 
 #include "vela/CompDesc.h"
 #include "vela/EvtCallback.h"
@@ -18,6 +20,9 @@ class Addressable : public virtualObject {
   public:
     static constexpr unsigned int DefaultResponseTimeout = 5000;  // ms
     static constexpr unsigned int DefaultErrorWaitTime = 1000;    // ms
+
+    // How long a command waits, in ms; without a value as long as the object's own time-outs say.
+    using Wait = std::optional<unsigned int>;
 
     // The print form of an object at the time something was thrown: the object may be gone when it prints.
     struct Identity {
@@ -92,6 +97,8 @@ class Addressable : public virtualObject {
     MsgQueue* getMsgQueue() const { return queue_; }
     CompDesc_t getTgtDesc() const { return target_; }
     unsigned int getObjId() const { return objId_; }
+    unsigned int getResponseTimeout() const { return responseTimeout_; }
+    unsigned int getErrorWaitTime() const { return errorWaitTime_; }
     void setResponseTimeout(unsigned int ms) { responseTimeout_ = ms; }
     void setErrorWaitTime(unsigned int ms) { errorWaitTime_ = ms; }
 
@@ -152,15 +159,28 @@ class Addressable : public virtualObject {
     void toStream(std::ostream* out) const override;
 
   protected:
+    // A command and the reply that its type names, or without reply. Throw Timeout, UnexpectedMsg.
+    template <typename Cmd>
+    void command(Cmd&& cmd, typename std::remove_reference_t<Cmd>::Reply* reply, Wait wait) {
+        using Type = std::remove_reference_t<Cmd>;
+        requestWithin(wait.value_or(responseTimeout_), Type::code, &cmd, Type::Reply::code, reply);
+    }
+    template <typename Cmd>
+    void command(Cmd&& cmd, Wait wait) {
+        exchange(std::remove_reference_t<Cmd>::code, &cmd, 0, wait.value_or(errorWaitTime_), 0, 0);
+    }
+
     MsgBody* superMsgBodyLookup(unsigned int msgType) { return Addressable::MsgBodyLookup(msgType); }
     MsgBody* superEvtBodyLookup(unsigned int evtType) { return Addressable::EvtBodyLookup(evtType); }
 
-    // Ends the dispatcher and waits for its callbacks. Every class that overrides a look-up calls it in its
+    // Ends the dispatcher and waits for its callbacks; from then on the object makes no other. Every class that overrides a look-up calls it in its
     // destructor: the dispatcher looks up on other threads.
-    void endCallbacks() { callback_.reset(); }
+    void endCallbacks();
 
   private:
     EvtCallback& dispatcher();  // made on first use
+    void requestWithin(unsigned int timeoutMs, unsigned int msgType, MsgBody* cmd, unsigned int retMsgType,
+                       MsgBody* ret, unsigned int trans = 0, int flags = 0);
     Msg* exchange(unsigned int msgType, MsgBody* cmd, unsigned int retMsgType, unsigned int timeoutMs,
                   unsigned int trans, int flags);
 
@@ -169,6 +189,7 @@ class Addressable : public virtualObject {
     unsigned int objId_;
     std::unique_ptr<EvtCallback> callback_;
     std::mutex callbackMade_;
+    bool callbacksEnded_ = false;
     unsigned int responseTimeout_ = DefaultResponseTimeout;
     unsigned int errorWaitTime_ = DefaultErrorWaitTime;
 };

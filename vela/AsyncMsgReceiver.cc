@@ -12,15 +12,21 @@ AsyncMsgReceiver::~AsyncMsgReceiver() { leave(); }
 void AsyncMsgReceiver::enrol() {
     if (queue_ != nullptr)
         return;
-    MsgQueue* const queue = owner_->getMsgQueue();
     source_ = owner_->getTgtDesc();
-    queue->RegisterAsyncMsgReceiver(source_, this);
-    queue_ = queue;
+    moveTo(owner_->getMsgQueue());
 }
 
 void AsyncMsgReceiver::leave() {
     if (MsgQueue* const queue = std::exchange(queue_, nullptr); queue != nullptr)
-        queue->DeregisterAsyncMsgReceiver(source_);
+        queue->withdraw(source_, this);
+}
+
+void AsyncMsgReceiver::moveTo(MsgQueue* queue) {
+    if (queue == queue_)
+        return;
+    queue->RegisterAsyncMsgReceiver(source_, this);
+    leave();
+    queue_ = queue;
 }
 
 }  // namespace vela

@@ -28,6 +28,8 @@ class AsyncMsgReceiver : public virtualObject {
     // Both do nothing when that is how things stand. enrol throws Exception when the address is taken.
     void enrol();
     void leave();
+    // Leaves the queue it is registered with for another; stays there when that throws, as enrol does.
+    void moveTo(MsgQueue* queue);
 
   private:
     Addressable* owner_;

@@ -15,25 +15,25 @@ void Board::makeManagers() {
 void Board::MsgQueueAttach(MsgQueue* queue) {
     clusterMgr_.reset();
     resourceMgr_.reset();
-    Addressable::MsgQueueAttach(queue);
+    try {
+        Addressable::MsgQueueAttach(queue);
+    } catch (...) {  // the board stays where it was
+        makeManagers();
+        throw;
+    }
     makeManagers();
 }
 
+// By the families' tables, not through the managers: it runs on other threads, while those may be made again.
 MsgBody* Board::MsgBodyLookup(unsigned int msgType) {
-    try {
-        return clusterMgr_->MsgBodyLookup(msgType);
-    } catch (const UndefinedMsgBody&) {
-        return resourceMgr_->MsgBodyLookup(msgType);
-    }
+    if (MsgBody* const body = ClusterMgr::Bodies::make(msgType); body != nullptr)
+        return body;
+    if (MsgBody* const body = ResourceMgr::Bodies::make(msgType); body != nullptr)
+        return body;
+    return superMsgBodyLookup(msgType);
 }
 
-MsgBody* Board::EvtBodyLookup(unsigned int evtType) {
-    try {
-        return clusterMgr_->EvtBodyLookup(evtType);
-    } catch (const UndefinedEvtBody&) {
-        return resourceMgr_->EvtBodyLookup(evtType);
-    }
-}
+MsgBody* Board::EvtBodyLookup(unsigned int evtType) { return superEvtBodyLookup(evtType); }
 
 Component Board::findComp(unsigned char compType, unsigned char processor) {
     return Component(resourceMgr_->find(compType, processor, 0, {}));

@@ -17,7 +17,9 @@ class Board : public Addressable {
     Board(unsigned int board, MsgQueue* queue);
     ~Board() override { endCallbacks(); }
 
+    // Makes the managers again on the new queue.
     void MsgQueueAttach(MsgQueue* queue) override;
+    // The cluster manager's bodies, then the resource manager's.
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
     MsgBody* EvtBodyLookup(unsigned int evtType) override;
 
@@ -25,6 +27,10 @@ class Board : public Addressable {
     // Timeout when the board is silent, UnexpectedMsg when it refuses.
     Component findComp(unsigned char compType, unsigned char processor);
     Instance findInst(unsigned char compType, unsigned char processor, unsigned short instance);
+
+    // The board's own, with time-outs of their own.
+    ResourceMgr& resourceMgr() { return *resourceMgr_; }
+    ClusterMgr& clusterMgr() { return *clusterMgr_; }
 
   private:
     void makeManagers();

@@ -1,7 +1,8 @@
-// A message body, made of its code and a row of fields:
+// A message body, made of its code and a row of fields; a command also names the body that answers it:
 //
-//     struct SetParm { U32<"Parm"> Parm; U32<"Val"> Val; };
-//     using MsgSetParm_t = Body<8, SetParm>;
+//     struct ParmVal { U32<"Parm"> Parm; U32<"Val"> Val; };
+//     struct MsgSetParmCmplt_t : Body<9> {};
+//     struct MsgSetParm_t : Command<8, MsgSetParmCmplt_t, ParmVal> { using Command::Command; };
 //
 //     MsgSetParm_t own;                 // its own storage; own.Parm = 10;
 //     MsgSetParm_t bound{parm, val};    // reads into and writes from the caller's two variables
@@ -13,6 +14,7 @@
 #include <array>
 #include <ostream>
 #include <tuple>
+#include <type_traits>
 #include <utility>
 
 #include "vela/Msg.h"
@@ -27,21 +29,28 @@ inline constexpr unsigned int NoCode = 0xFFFFFFFFU;
 
 struct NoFields {};
 
-template <unsigned int messageCode, typename Row>
+template <unsigned int messageCode, typename Row = NoFields>
 class Body : public MsgBody, public Row {
   public:
     static constexpr unsigned int code = messageCode;
 
     Body() = default;
 
-    // One variable for each field, in order, each of the field's own type.
+    // One variable for each field, in order, each of the field's own type. Counts, which follow from their
+    // lists, may be left out together.
     template <typename... Variables>
-        requires(sizeof...(Variables) > 0 && sizeof...(Variables) == FieldCount<Row> &&
-                 (!std::is_base_of_v<Row, Variables> && ...))
-    explicit Body(Variables&... variables) {
-        std::apply([&](auto&... fields) { (fields.bind(variables), ...); }, fieldsOf(row()));
+    explicit Body(Variables&... variables) requires BindsTo<Row, Variables...> {
+        if constexpr (sizeof...(Variables) == n)
+            std::apply([&](auto&... field) { (field.bind(variables), ...); }, fields());
+        else
+            bindValues(std::tie(variables...), std::make_index_sequence<n>{});
     }
 
+    // The fields, in order: a tuple of references.
+    auto fields() { return fieldsOf(static_cast<Row&>(*this)); }
+    auto fields() const { return fieldsOf(static_cast<const Row&>(*this)); }
+
+    // Throws Exception when a list is longer than its count can say.
     unsigned int writeMsg(Msg* msg, unsigned int offset) override {
         setCounts(std::make_index_sequence<n>{});
         return move<Move::Put>(msg, offset);
@@ -49,7 +58,7 @@ class Body : public MsgBody, public Row {
     unsigned int readMsg(Msg* msg, unsigned int offset) override { return move<Move::Get>(msg, offset); }
 
     unsigned int GetByteSize() const override {
-        return std::apply([](const auto&... fields) { return (0U + ... + fields.byteSize()); }, fieldsOf(row()));
+        return std::apply([](const auto&... field) { return (0U + ... + field.byteSize()); }, fields());
     }
 
     // "{", each field's label and value, "}".
@@ -60,20 +69,27 @@ class Body : public MsgBody, public Row {
             *out << std::exchange(separator, " ") << field.label() << " ";
             field.print(out);
         };
-        std::apply([&](const auto&... fields) { (print(fields), ...); }, fieldsOf(row()));
+        std::apply([&](const auto&... field) { (print(field), ...); }, fields());
         *out << "}";
     }
 
   private:
     static constexpr std::size_t n = FieldCount<Row>;
-    using Fields = decltype(fieldsOf(std::declval<Row&>()));
     template <std::size_t i>
-    using FieldAt = std::remove_cvref_t<std::tuple_element_t<i, Fields>>;
+    using FieldAt = vela::FieldAt<Row, i>;
 
-    Row& row() { return *this; }
-    const Row& row() const { return *this; }
+    template <typename Variables, std::size_t... i>
+    void bindValues(const Variables& variables, std::index_sequence<i...>) {
+        (bindValue<i>(variables), ...);
+    }
+    template <std::size_t i, typename Variables>
+    void bindValue(const Variables& variables) {
+        if constexpr (!CountField<FieldAt<i>>)
+            std::get<i>(fields()).bind(std::get<valuesBefore<Row, i>()>(variables));
+    }
 
-    // How many scalars in a row from field i on go into one transport call: the body's first field goes alone.
+    // How many scalars in a row from field i on go into one transport call: the body's first field goes
+    // alone.
     template <std::size_t i>
     static constexpr std::size_t runLength() {
         if constexpr (i >= n)
@@ -98,20 +114,19 @@ class Body : public MsgBody, public Row {
             moveRun<i>(mover, announced, std::make_index_sequence<run>{});
             moveFrom<i + run>(mover, msg, announced);
         } else if constexpr (i < n) {
-            std::get<i>(fieldsOf(row())).transfer(mover, msg, announced);
+            std::get<i>(fields()).transfer(mover, msg, announced);
             moveFrom<i + 1>(mover, msg, announced);
         }
     }
 
     template <std::size_t start, typename Mover, std::size_t... i>
     void moveRun(Mover& mover, unsigned int& announced, std::index_sequence<i...>) {
-        const auto fields = fieldsOf(row());
-        mover.scalars(std::get<start + i>(fields)...);
+        mover.scalars(std::get<start + i>(fields())...);
         const auto take = [&](auto& field) {
             if constexpr (CountField<std::remove_reference_t<decltype(field)>>)
                 announced = field.value();
         };
-        (take(std::get<start + i>(fields)), ...);
+        (take(std::get<start + i>(fields())), ...);
     }
 
     template <std::size_t... i>
@@ -123,8 +138,7 @@ class Body : public MsgBody, public Row {
         if constexpr (CountField<FieldAt<i>>) {
             constexpr std::size_t counted = nextArray<i + 1>();
             static_assert(counted < n, "a count needs a list after it");
-            using Number = typename FieldAt<i>::Value;
-            std::get<i>(fieldsOf(row())) = static_cast<Number>(std::get<counted>(fieldsOf(row())).length());
+            std::get<i>(fields()).count(std::get<counted>(fields()).length());
         }
     }
     template <std::size_t i>
@@ -138,6 +152,14 @@ class Body : public MsgBody, public Row {
     }
 };
 
+// A body that is answered by another one.
+template <unsigned int messageCode, typename ReplyBody, typename Row = NoFields>
+class Command : public Body<messageCode, Row> {
+  public:
+    using Body<messageCode, Row>::Body;
+    using Reply = ReplyBody;
+};
+
 // A body of a family by its code.
 template <typename... Bodies>
 class BodyTable {
@@ -147,6 +169,12 @@ class BodyTable {
         MsgBody* made = nullptr;
         static_cast<void>(((code == Bodies::code && (made = std::make_unique<Bodies>().release())) || ...));
         return made;
+    }
+
+    // Calls visit.template operator()<Body>() for each of them, in the table's order.
+    template <typename Visit>
+    static void forEach(Visit visit) {
+        (visit.template operator()<Bodies>(), ...);
     }
 
     static constexpr std::size_t size = sizeof...(Bodies);

@@ -12,21 +12,69 @@ struct EvtL2Trace {
     U32<"Label"> Label; U32<"Direction"> Direction; U32<"Timestamp"> Timestamp; U32<"Length"> Length;
     RestBytes<"List"> List;
 };
+struct IEPubData {
+    U8<"IEId"> IEId; Count8<"Length"> Length; Array<unsigned char, WireType::Unsigned8, "Value"> Value;
+};
+// clang-format on
+
+// One information element: an identifier, and unless that is a single-octet element, a length and a value.
+struct IEPubData_t : Body<NoCode, IEPubData> {
+    using Body::Body;
+
+    bool isSingleOctet() const;
+    unsigned int writeMsg(Msg* msg, unsigned int offset) override;
+    unsigned int readMsg(Msg* msg, unsigned int offset) override;
+    unsigned int GetByteSize() const override;
+
+  private:
+    template <Move direction>
+    unsigned int move(Msg* msg, unsigned int offset);
+};
+
+// clang-format off
+struct ieMessage {
+    using IEPubData_t = rows::IEPubData_t;
+    U16<"CallId"> CallId; U16<"CallRef"> CallRef; Count16<"IEPrivBufLen"> IEPrivBufLen;
+    U8<"MessageId"> MessageId; Array<unsigned char, WireType::Unsigned8, "IEPrivData"> IEPrivData;
+    RestOf<IEPubData_t, "IEPubData"> IEPubData;
+};
 // clang-format on
 }  // namespace rows
 
-class CCS : public Component {
-  public:
-    static constexpr unsigned int L2TraceGroup = 2;
-
+struct CCSMessages {
     // One layer-2 trace record. Label 2 is a frame; Direction 1 was transmitted by the board, anything else
     // received; Timestamp in ticks of 4 ms; Length in octets, of which List may hold fewer.
-    using EvtL2Trace_t = Body<L2TraceGroup, rows::EvtL2Trace>;
+    // clang-format off
+    struct EvtL2Trace_t : Body<2, rows::EvtL2Trace> { using Body::Body; };
+    // A call-control message: a call, and information elements that are private or public. A list of public
+    // ones that was read is as long as the octets it was read from.
+    struct ieMessage_t : Body<5376, rows::ieMessage> { using Body::Body; };
+    // clang-format on
+
+    using Bodies = BodyTable<ieMessage_t>;
+    using Events = BodyTable<EvtL2Trace_t>;  // by event group
+};
+
+class CCS : public Component, public CCSMessages {
+  public:
+    using Bodies = CCSMessages::Bodies;
+    static constexpr unsigned int L2TraceGroup = EvtL2Trace_t::code;
 
     CCS(const CompDesc_t& target, MsgQueue* queue) : Component(target, queue) {}
     ~CCS() override { endCallbacks(); }
 
+    MsgBody* MsgBodyLookup(unsigned int msgType) override;
     MsgBody* EvtBodyLookup(unsigned int evtType) override;
+
+    // Sends a call-control message, which has no reply: waits for an error only. Throw UnexpectedMsg.
+    void SendIE(ieMessage_t& message) { command(message, Wait()); }
+    void SendIE(unsigned short callRef, unsigned short callId, unsigned char messageId);
+    void SendIE(unsigned short callRef, unsigned short callId, unsigned char messageId,
+                staticList<unsigned char>& privateData);
+    void SendIE(unsigned short callRef, unsigned short callId, unsigned char messageId,
+                staticList<ieMessage_t::IEPubData_t>& elements);
+    void SendIE(unsigned short callRef, unsigned short callId, unsigned char messageId,
+                staticList<unsigned char>& privateData, staticList<ieMessage_t::IEPubData_t>& elements);
 
     void* userData = nullptr;  // the owner's own
 };

@@ -1,27 +1,74 @@
-// A board's cluster manager.
+// A board's cluster manager. A cluster groups component instances that share a time-division bus.
 #ifndef VELA_CLUSTERMGR_H
 #define VELA_CLUSTERMGR_H
 
-#include "vela/Addressable.h"
+#include "vela/Cluster.h"
 #include "vela/ManagerMessages.h"
+#include "vela/StdResource.h"
 
 namespace vela {
 
-class ClusterMgr : public Addressable {
+struct ClusterMgrMessages : ManagerMessages {
+    // clang-format off
+    struct ClusterByComp_t : Command<8388637, ClusterResult_t, rows::DescOnly> { using Command::Command; };
+    struct ClusterCompByAttr_t : Command<8388638, ComponentResult_t, rows::ClusterCompByAttr> { using Command::Command; };
+    struct ClusterCreate_t : Command<8388640, ClusterResult_t, rows::CompStartAttr> { using Command::Command; };
+    struct ClusterDestroy_t : Command<8388644, ResultComplete_t, rows::ClustDescOnly> { using Command::Command; };
+    struct ClusterAllocate_t : Command<8388689, ClusterResult_t, rows::CompStartAttr> { using Command::Command; };
+    struct ClusterFree_t : Command<8388690, ResultComplete_t, rows::ClustDescOnly> { using Command::Command; };
+    struct ClusterFind_t : Command<8388691, ClusterResult_t, rows::CompStartAttr> { using Command::Command; };
+    // clang-format on
+
+    // ResultComplete_t stands below the first code of this family.
+    using Bodies =
+        BodyTable<ComponentResult_t, ClusterByComp_t, ClusterCompByAttr_t, ClusterCreate_t, ClusterDestroy_t,
+                  ClusterResult_t, ClusterAllocate_t, ClusterFree_t, ClusterFind_t>;
+};
+
+class ClusterMgr : public Addressable, public ClusterMgrMessages {
   public:
-    using ComponentResult_t = Body<8388615, rows::DescOnly>;
-    using ClusterResult_t = Body<8388652, rows::DescOnly>;
-    using ClusterAllocate_t = Body<8388689, rows::CompStartAttr>;
-    using ClusterFind_t = Body<8388691, rows::CompStartAttr>;
-
-    using Bodies = BodyTable<ComponentResult_t, ClusterResult_t, ClusterAllocate_t, ClusterFind_t>;
-
-    // The manager of the board that the object stands on, on the object's queue.
-    explicit ClusterMgr(const Addressable* object)
-        : Addressable(CompDesc_t(0, object->getTgtDesc().Board, 0, 0, 0), object->getMsgQueue()) {}
+    // The manager of the board that the object stands on, on the object's queue and with its time-outs.
+    explicit ClusterMgr(const Addressable* object);
+    explicit ClusterMgr(const Addressable& object) : ClusterMgr(&object) {}
     ~ClusterMgr() override { endCallbacks(); }
 
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
+
+    // Commands; all throw Timeout, UnexpectedMsg (nothing found among them). See StdResource for their forms.
+
+    // A cluster that has the attributes: one that is there, one for the caller, or a new one.
+    void find(ClusterFind_t& cmd, ClusterResult_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    Cluster find(CompDesc_t start, staticList<CompAttr_t>& attributes, Wait wait = {});
+    void allocate(ClusterAllocate_t& cmd, ClusterResult_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    Cluster allocate(CompDesc_t start, staticList<CompAttr_t>& attributes, Wait wait = {});
+    void create(ClusterCreate_t& cmd, ClusterResult_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    Cluster create(CompDesc_t start, staticList<CompAttr_t>& attributes, Wait wait = {});
+
+    // The end of what allocate and create gave.
+    void free(ClusterFree_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    void free(CompDesc_t cluster, Wait wait = {}) { command(ClusterFree_t(cluster), nullptr, wait); }
+    void destroy(ClusterDestroy_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void destroy(CompDesc_t cluster, Wait wait = {}) { command(ClusterDestroy_t(cluster), nullptr, wait); }
+
+    // The cluster that a component instance is a member of.
+    void byComponent(ClusterByComp_t& cmd, ClusterResult_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    Cluster byComponent(CompDesc_t instance, Wait wait = {});
+    // The first member of a cluster that has the type and the attributes.
+    void componentByAttr(ClusterCompByAttr_t& cmd, ComponentResult_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    StdResource componentByAttr(CompDesc_t cluster, unsigned int compType, staticList<CompAttr_t>& attributes,
+                                Wait wait = {});
+
+  private:
+    template <typename Cmd>
+    Cluster clusterFrom(Cmd&& cmd, Wait wait);
 };
 
 }  // namespace vela

@@ -1,20 +1,28 @@
 #include "vela/Component.h"
 
-#include <iostream>
+#include "vela/report.h"
 
 namespace vela {
 
-Instance::Instance(const CompDesc_t& target, MsgQueue* queue, int use) : StdResource(target, queue) {
-    reserve(use);
+Instance::Instance(const CompDesc_t& target, MsgQueue* queue, int inUse)
+    : StdResource(target, queue, inUse), reserved_(inUse != 0) {}
+
+Instance::Instance(const TmpInstance& other, int inUse)
+    : Instance(other.getTgtDesc(), other.getMsgQueue(), inUse) {}
+
+void Instance::use(unsigned int payload) {
+    StdResource::use(payload);
+    reserved_ = true;
 }
 
-Instance::Instance(const TmpInstance& other, int use) : StdResource(other) { reserve(use); }
+void Instance::unuse() {
+    StdResource::unuse();
+    reserved_ = false;
+}
 
-void Instance::reserve(int use) {
-    if (use == 0)
-        return;
-    StdResource::use(0);
-    reserved_ = true;
+void Instance::free() {
+    StdResource::free();
+    reserved_ = false;
 }
 
 Instance::~Instance() {
@@ -24,7 +32,9 @@ Instance::~Instance() {
     try {
         unuse();
     } catch (const Exception& exception) {
-        std::cerr << exception << std::endl;  // nobody is left to tell
+        report(exception);  // nobody is left to tell
+    } catch (...) {
+        report("an instance could not be given back");
     }
 }
 

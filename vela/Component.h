@@ -22,20 +22,23 @@ class TmpInstance;
 // On destruction gives back what it reserved itself, and nothing else.
 class Instance : public StdResource {
   public:
-    // With use not 0 reserves the instance at once. Throws Timeout, UnexpectedMsg.
-    Instance(const CompDesc_t& target, MsgQueue* queue, int use);
+    // With inUse not 0 reserves the instance at once. Throws Timeout, UnexpectedMsg.
+    Instance(const CompDesc_t& target, MsgQueue* queue, int inUse);
     Instance(const CompDesc_t& target, MsgQueue* queue) : Instance(target, queue, 0) {}
     explicit Instance(const StdResource& found) : StdResource(found) {}
     Instance(const Instance& other) : StdResource(other) {}  // reserves nothing of its own
-    Instance(const TmpInstance& other, int use);
+    Instance(const TmpInstance& other, int inUse);
     ~Instance() override;
+
+    // As StdResource's, and remembered.
+    void use(unsigned int payload);
+    void unuse();
+    void free();
 
   protected:
     void giveUpOwnership() { ownsUse_ = reserved_ = false; }
 
   private:
-    void reserve(int use);
-
     bool ownsUse_ = true;    // what was reserved is this handle's to give back
     bool reserved_ = false;  // and something was
 };
@@ -46,7 +49,10 @@ class TmpInstance : public Instance {
     TmpInstance(const CompDesc_t& target, MsgQueue* queue) : Instance(target, queue, 0) {}
     explicit TmpInstance(const StdResource& found) : Instance(found) {}
     TmpInstance(const TmpInstance& other) = default;
-    ~TmpInstance() override { giveUpOwnership(); }
+    ~TmpInstance() override {
+        endCallbacks();
+        giveUpOwnership();
+    }
 };
 
 }  // namespace vela

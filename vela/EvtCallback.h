@@ -24,8 +24,11 @@ class EvtCallback : public AsyncMsgReceiver {
     static constexpr unsigned int OnDispatchingThread = 0xFFFFFFFFU;
 
     explicit EvtCallback(Addressable* owner);
-    // Returns when no callback runs any more, but for one on the destroying thread itself.
-    ~EvtCallback() override;
+    // As end(). Not from a callback on the dispatching thread, which goes on in the dispatcher afterwards.
+    ~EvtCallback() override { end(); }
+
+    // Receives no more; returns when no callback runs any more, but for one on this thread itself.
+    void end();
 
     // From any thread. The same callback may be registered twice and then runs twice.
     void registerMsgType(unsigned int type, const Handler& callback, unsigned int threadParam);
@@ -38,7 +41,8 @@ class EvtCallback : public AsyncMsgReceiver {
     void cancelEvtGroup(unsigned int group);
 
     // What becomes of messages and events that nobody registered for; by default they are reported on the
-    // standard error stream and deleted. Message form only.
+    // standard error stream and deleted; an empty handler brings that back. Message form only: throw
+    // Exception for a handler that takes a body.
     void unregisteredMsgType(const Handler& handler, unsigned int threadParam);
     void unregisteredEvtGroup(const Handler& handler, unsigned int threadParam);
 

@@ -1,4 +1,5 @@
-#include <iostream>
+#include <cxxabi.h>
+
 #include <mutex>
 #include <utility>
 
@@ -6,14 +7,14 @@
 #include "vela/EvtCallback.h"
 #include "vela/EvtGroupOf.h"
 #include "vela/MsgDefault.h"
+#include "vela/report.h"
 
 namespace vela {
 
 namespace {
 
-constexpr const char* Source = "EvtCallback_Class";
-
-std::ostream& diagnostic(int line) { return std::cerr << "(" << Source << line << ") "; }
+// The line numbers are part of the text.
+std::string diagnostic(int line, const char* what) { return joined("(EvtCallback_Class", line, ") ", what); }
 
 // The body that the owner knows for the message, else its octets.
 template <typename LookUp>
@@ -25,32 +26,34 @@ void giveBody(Msg& msg, LookUp lookUp) {
     }
 }
 
-void report(const Addressable& owner, const Msg& msg, const char* what, unsigned int key, const char* advice) {
-    std::cerr << "\n********************************************" << std::endl
-              << what << key << std::endl
-              << "For " << owner << std::endl
-              << msg << std::endl
-              << advice << std::endl
-              << "********************************************\n"
-              << std::endl;
+void reportUnregistered(const Addressable& owner, const Msg& msg, const char* what, unsigned int key,
+                        const char* advice) {
+    report(BannerBegin, joined(what, key), joined("For ", owner), msg, advice, BannerEnd);
 }
 
 void reportUnregisteredMsgType(Addressable* owner, Msg* raw) {
     const std::unique_ptr<Msg> msg(raw);
     const unsigned int type = msg->getMsgType();
     giveBody(*msg, [&] { return owner->MsgBodyLookup(type); });
-    report(*owner, *msg, "Unregisterd MsgType ", type,
-           "You may specify your own handler for unregisted messages using\n"
-           "Addressable::asyncUnregisteredMsgType");
+    reportUnregistered(*owner, *msg, "Unregisterd MsgType ", type,
+                       "You may specify your own handler for unregisted messages using\n"
+                       "Addressable::asyncUnregisteredMsgType");
 }
 
 void reportUnregisteredEvtGroup(Addressable* owner, Msg* raw) {
     const std::unique_ptr<Msg> msg(raw);
     const unsigned int group = evtGroupOf(*msg);
     giveBody(*msg, [&] { return owner->EvtBodyLookup(group); });
-    report(*owner, *msg, "Unregisterd EventGroup ", group,
-           "You may specify your own handler for unregisted events using\n"
-           "Addressable::asyncUnregisteredEvtGroup");
+    reportUnregistered(*owner, *msg, "Unregisterd EventGroup ", group,
+                       "You may specify your own handler for unregisted events using\n"
+                       "Addressable::asyncUnregisteredEvtGroup");
+}
+
+// A handler for what nobody registered for: the default in place of an empty one.
+Handler checked(const Handler& handler, Handler::MsgFunction otherwise) {
+    if (handler.takesBody() && !handler.isEmpty())
+        throw Exception("what nobody registered for has no body: the handler must take the message");
+    return handler.isEmpty() ? Handler(otherwise) : handler;
 }
 
 }  // namespace
@@ -59,7 +62,11 @@ void reportUnregisteredEvtGroup(Addressable* owner, Msg* raw) {
 struct EvtCallback::Delivery {
     Delivery(const Handler& callback, Addressable* object, unsigned int msgType,
              const std::shared_ptr<Deliveries>& all)
-        : handler(callback), owner(object), type(msgType), deliveries(all), ticket(all->begin(handler.object())) {}
+        : handler(callback),
+          owner(object),
+          type(msgType),
+          deliveries(all),
+          ticket(all->begin(handler.object())) {}
     ~Delivery() { deliveries->end(ticket); }
     Delivery(const Delivery&) = delete;
     Delivery& operator=(const Delivery&) = delete;
@@ -88,7 +95,7 @@ EvtCallback::EvtCallback(Addressable* owner)
     enrol();
 }
 
-EvtCallback::~EvtCallback() {
+void EvtCallback::end() {
     leave();
     deliveries_->awaitAll();
 }
@@ -114,13 +121,15 @@ void EvtCallback::cancelEvtGroup(unsigned int group, const Handler& callback, un
 void EvtCallback::cancelEvtGroup(unsigned int group) { remove(evtGroups_, group); }
 
 void EvtCallback::unregisteredMsgType(const Handler& handler, unsigned int threadParam) {
+    const callbackInfo chosen{checked(handler, &reportUnregisteredMsgType), threadParam};
     const std::lock_guard guard(mutex_);
-    defaultMsg_ = {handler, threadParam};
+    defaultMsg_ = chosen;
 }
 
 void EvtCallback::unregisteredEvtGroup(const Handler& handler, unsigned int threadParam) {
+    const callbackInfo chosen{checked(handler, &reportUnregisteredEvtGroup), threadParam};
     const std::lock_guard guard(mutex_);
-    defaultEvt_ = {handler, threadParam};
+    defaultEvt_ = chosen;
 }
 
 void EvtCallback::add(Table& table, unsigned int key, const callbackInfo& callback) {
@@ -145,14 +154,14 @@ void EvtCallback::remove(Table& table, unsigned int key) {
 }
 
 void EvtCallback::receive(Msg* msg) {
-    const std::lock_guard guard(mutex_);
     try {
+        const std::lock_guard guard(mutex_);
         dispatch(std::unique_ptr<Msg>(msg));
     } catch (const Exception& exception) {
-        diagnostic(214) << "vela internal error" << std::endl << exception << std::endl;
+        report(diagnostic(214, "vela internal error"), exception);
         throw;
     } catch (...) {
-        diagnostic(219) << "vela internal error" << std::endl;
+        report(diagnostic(219, "vela internal error"));
         throw;
     }
 }
@@ -218,11 +227,12 @@ void* EvtCallback::start(Thread::control*, void* arg) {
     const std::unique_ptr<Delivery> delivery(static_cast<Delivery*>(arg));
     try {
         delivery->call();
+    } catch (const abi::__forced_unwind&) {  // the callback ends its thread: no error
+        throw;
     } catch (const Exception& exception) {
-        diagnostic(283) << "VELA Exception caught from callback handler thread" << std::endl
-                        << exception << std::endl;
+        report(diagnostic(283, "VELA Exception caught from callback handler thread"), exception);
     } catch (...) {
-        diagnostic(287) << "genreal Exception caught from callback handler thread" << std::endl;
+        report(diagnostic(287, "genreal Exception caught from callback handler thread"));
     }
     return nullptr;
 }

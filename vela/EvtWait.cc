@@ -21,7 +21,7 @@ void Waiter::enable(unsigned int type) {
 
 void Waiter::disable() {
     if (State enabled = Enabled; state_.compare_exchange_strong(enabled, Idle)) {
-        remove(type_);
+        withdraw();
         unlock();
     }
     dispatcher_->awaitCallbacksOf(this);
@@ -34,9 +34,17 @@ void Waiter::trigger(Addressable*, Msg* msg) {
         dispatcher_->receiveUnregistered(msg);
         return;
     }
-    remove(type_);
+    withdraw();
     msg_ = msg;
     unlock();
+}
+
+// Somebody may have cancelled everything for the type, this waiter with it.
+void Waiter::withdraw() {
+    try {
+        remove(type_);
+    } catch (const Exception&) {
+    }
 }
 
 Msg* Waiter::waitMsg(unsigned int timeoutMs) {

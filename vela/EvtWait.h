@@ -50,6 +50,8 @@ class Waiter : public Mutex, public EvtCallback::Callback {
     void trigger(Addressable* owner, Msg* msg);
 
   private:
+    void withdraw();
+
     virtual void add(unsigned int type) = 0;
     virtual void remove(unsigned int type) = 0;
     [[noreturn]] virtual void throwTimeout(unsigned int type, unsigned int timeoutMs) const = 0;

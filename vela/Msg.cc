@@ -13,8 +13,7 @@ Msg::Msg(unsigned int size) : ref_(std::make_unique<KSMsgRef>(size)) {}
 
 Msg::Msg(KSMsgRef* ref) : ref_(std::make_unique<KSMsgRef>(*ref)) { *ref = KSMsgRef(); }
 
-Msg::Msg(const Msg& other)
-    : virtualObject(other), ref_(std::make_unique<KSMsgRef>(other.ref_->clone())) {}
+Msg::Msg(const Msg& other) : virtualObject(other), ref_(std::make_unique<KSMsgRef>(other.ref_->clone())) {}
 
 Msg::~Msg() {
     if (ref_->getMsgRef() != nullptr)

@@ -1,10 +1,10 @@
 #include "vela/MsgQueue.h"
 
-#include <iostream>
 #include <utility>
 
 #include "vela/AsyncMsgReceiver.h"
 #include "vela/StreamFlags.h"
+#include "vela/report.h"
 
 namespace vela {
 
@@ -12,15 +12,22 @@ namespace {
 
 void reportUnregisteredSource(MsgQueue* queue, Msg* raw) {
     const std::unique_ptr<Msg> msg(raw);
-    std::cerr << "\n********************************************" << std::endl
-              << "Unregisterd Source sent to MsgQueue " << *queue << std::endl
-              << "MsgType " << msg->getMsgType() << std::endl
-              << *msg << std::endl
-              << "You may specify your own handler for messages from unregistered sources using\n"
-                 "MsgQueue::unregisteredSource"
-              << std::endl
-              << "********************************************\n"
-              << std::endl;
+    report(BannerBegin, joined("Unregisterd Source sent to MsgQueue ", *queue),
+           joined("MsgType ", msg->getMsgType()), *msg,
+           "You may specify your own handler for messages from unregistered sources using\n"
+           "MsgQueue::unregisteredSource",
+           BannerEnd);
+}
+
+// The message of a handle, which is left empty; freed when there is no memory to hold it in.
+std::unique_ptr<Msg> adopt(KSMsgRef& ref) {
+    try {
+        return std::make_unique<Msg>(&ref);
+    } catch (...) {
+        if (ref.getMsgRef() != nullptr)
+            ref.free();
+        throw;
+    }
 }
 
 }  // namespace
@@ -50,7 +57,7 @@ Msg* MsgQueue::request(Msg* cmd, unsigned int timeoutMs, unsigned int retMsgType
     }
     std::unique_ptr<Msg> answer;
     if (reply.getMsgRef() != nullptr)
-        answer = std::make_unique<Msg>(&reply);
+        answer = adopt(reply);
     // Without a wait the transport layer returns an empty message of its own making, never a reply.
     if (answer == nullptr || timeoutMs == 0) {
         if (retMsgType != 0)
@@ -74,19 +81,36 @@ void MsgQueue::DeregisterAsyncMsgReceiver(const CompDesc_t& source) {
     std::unique_lock guard(receiversMutex_);
     const AsyncMsgReceiver* const leaving = receivers_.element(source);
     receivers_.unset(source);
+    awaitIdle(guard, leaving);
+}
+
+void MsgQueue::withdraw(const CompDesc_t& source, const AsyncMsgReceiver* receiver) {
+    std::unique_lock guard(receiversMutex_);
+    AsyncMsgReceiver** const registered = receivers_.find(source);
+    if (registered != nullptr && *registered == receiver)
+        receivers_.unset(source);
+    awaitIdle(guard, receiver);
+}
+
+// The routing thread does not wait for itself.
+void MsgQueue::awaitIdle(std::unique_lock<std::mutex>& guard, const AsyncMsgReceiver* receiver) {
     if (routingThread_ != std::this_thread::get_id())
-        receiverIdle_.wait(guard, [&] { return receiving_ != leaving; });
+        receiverIdle_.wait(guard, [&] { return receiving_ != receiver; });
 }
 
 int MsgQueue::MsgRouter(KSMsgRef& ref) {
-    route(std::make_unique<Msg>(&ref));
+    try {
+        route(adopt(ref));
+    } catch (...) {
+        // Whoever received the message has reported it; the reading thread goes on.
+    }
     return 1;
 }
 
 void MsgQueue::route(std::unique_ptr<Msg> msg) {
     AsyncMsgReceiver* const receiver = beginReceive(msg->getSrcAddr());
     if (receiver == nullptr) {
-        unregisteredSource_.load()(this, msg.release());
+        routeUnregistered(std::move(msg));
         return;
     }
     struct Finally {
@@ -94,6 +118,16 @@ void MsgQueue::route(std::unique_ptr<Msg> msg) {
         ~Finally() { queue.endReceive(); }
     } const finally{*this};
     receiver->receive(msg.release());
+}
+
+void MsgQueue::routeUnregistered(std::unique_ptr<Msg> msg) {
+    try {
+        unregisteredSource_.load()(this, msg.release());
+    } catch (const Exception& exception) {
+        report("exception from the handler for unregistered sources", exception);
+    } catch (...) {
+        report("exception from the handler for unregistered sources");
+    }
 }
 
 AsyncMsgReceiver* MsgQueue::beginReceive(const CompDesc_t& source) {
@@ -122,7 +156,8 @@ void MsgQueue::Timeout::toStream(std::ostream* out) const {
 
 void MsgQueue::ErrorMsg::toStream(std::ostream* out) const {
     const StreamFlags saved(*out);
-    *out << "MsgQueue::ErrorMsg " << "MsgBody: " << *msg_;
+    *out << "MsgQueue::ErrorMsg "
+         << "MsgBody: " << *msg_;
 }
 
 }  // namespace vela

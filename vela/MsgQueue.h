@@ -12,8 +12,8 @@
 #include "hostsvc/KSMsgQueue.h"
 #include "vela/CompDesc.h"
 #include "vela/Exception.h"
-#include "vela/Mutex.h"
 #include "vela/Msg.h"
+#include "vela/Mutex.h"
 #include "vela/Shared.h"
 #include "vela/linkedList.h"
 
@@ -75,6 +75,8 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
     // Returns once the receiver is no longer in use, except on the routing thread itself. Throws
     // OutOfBoundsError when there is none.
     void DeregisterAsyncMsgReceiver(const CompDesc_t& source);
+    // The same for a receiver that may have been deregistered, or replaced, already.
+    void withdraw(const CompDesc_t& source, const AsyncMsgReceiver* receiver);
 
     // What becomes of messages from sources that nobody registered for; by default they are reported on the
     // standard error stream and deleted.
@@ -86,6 +88,8 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
     // On the transport's reading thread, for every message that is no reply.
     int MsgRouter(KSMsgRef& ref);
     void route(std::unique_ptr<Msg> msg);
+    void routeUnregistered(std::unique_ptr<Msg> msg);
+    void awaitIdle(std::unique_lock<std::mutex>& guard, const AsyncMsgReceiver* receiver);
     AsyncMsgReceiver* beginReceive(const CompDesc_t& source);
     void endReceive();
 

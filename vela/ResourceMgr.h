@@ -1,47 +1,84 @@
-// A board's resource manager: finds components and says who uses them.
+// A board's resource manager: finds components and instances, hands them out and says who uses them.
 #ifndef VELA_RESOURCEMGR_H
 #define VELA_RESOURCEMGR_H
 
-#include "vela/Body.h"
-#include "vela/CompAttr.h"
 #include "vela/ManagerMessages.h"
 #include "vela/StdResource.h"
 
 namespace vela {
 
-class ResourceMgr : public Addressable {
+struct ResourceMgrMessages : ManagerMessages {
+    // clang-format off
+    struct CompAttrInfoResult_t : Body<8388614, rows::CompAttrInfoResult> { using Body::Body; };
+    struct CompAttrInfo_t : Command<8388666, CompAttrInfoResult_t, rows::CompAttrInfo> { using Command::Command; };
+    struct CompFind_t : Command<8388669, ComponentResult_t, rows::CompStartAttr> { using Command::Command; };
+    struct CompInstAllocate_t : Command<8388670, ComponentResult_t, rows::CompInstAllocate> { using Command::Command; };
+    struct CompInstFree_t : Command<8388673, ResultComplete_t, rows::DescOnly> { using Command::Command; };
+    struct CompUse_t : Command<8388697, ResultComplete_t, rows::CompUse> { using Command::Command; };
+    struct CompUnuse_t : Command<8388698, ResultComplete_t, rows::CompUnuse> { using Command::Command; };
+    struct CompMultipleResult_t : Body<8388707, rows::CompMultipleResult> { using Body::Body; };
+    struct CompFindAll_t : Command<8388706, CompMultipleResult_t, rows::CompFindAll> { using Command::Command; };
+    // clang-format on
+
+    using Bodies = BodyTable<ResultComplete_t, CompAttrInfoResult_t, ComponentResult_t, CompAttrInfo_t,
+                             CompFind_t, CompInstAllocate_t, CompInstFree_t, CompUse_t, CompUnuse_t,
+                             CompFindAll_t, CompMultipleResult_t>;
+};
+
+class ResourceMgr : public Addressable, public ResourceMgrMessages {
   public:
-    using ResultComplete_t = Body<8388608, NoFields>;
-    using CompAttrInfoResult_t = Body<8388614, rows::CompAttrInfoResult>;
-    using ComponentResult_t = Body<8388615, rows::DescOnly>;
-    using CompAttrInfo_t = Body<8388666, rows::CompAttrInfo>;
-    using CompFind_t = Body<8388669, rows::CompStartAttr>;
-    using CompInstAllocate_t = Body<8388670, rows::CompInstAllocate>;
-    using CompInstFree_t = Body<8388673, rows::DescOnly>;
-    using CompUse_t = Body<8388697, rows::CompUse>;
-    using CompUnuse_t = Body<8388698, rows::CompUnuse>;
-    using CompFindAll_t = Body<8388706, rows::CompFindAll>;
-    using CompMultipleResult_t = Body<8388707, rows::CompMultipleResult>;
+    using Found = staticList<CompMultipleResult_t::comps_t>;
 
-    using Bodies =
-        BodyTable<ResultComplete_t, CompAttrInfoResult_t, ComponentResult_t, CompAttrInfo_t, CompFind_t,
-                  CompInstAllocate_t, CompInstFree_t, CompUse_t, CompUnuse_t, CompFindAll_t,
-                  CompMultipleResult_t>;
-
-    // The manager of the board that the object stands on, on the object's queue.
+    // The manager of the board that the object stands on, on the object's queue and with its time-outs.
     explicit ResourceMgr(const Addressable* object);
     explicit ResourceMgr(const Addressable& object) : ResourceMgr(&object) {}
     ~ResourceMgr() override { endCallbacks(); }
 
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
 
-    // The first component that has the type (0: any) and the attributes. Throws Timeout, UnexpectedMsg.
-    StdResource find(unsigned char compType, unsigned char processor, unsigned short instance,
-                     const staticList<CompAttr_t>& attributes);
+    // Commands; all throw Timeout, UnexpectedMsg (nothing found among them). See StdResource for their forms.
 
-    void use(const CompDesc_t& component, unsigned int payload);
-    void unuse(const CompDesc_t& component);
-    void free(const CompDesc_t& instance);
+    // The first component that has the type (0: any) and the attributes.
+    void find(CompFind_t& cmd, ComponentResult_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    StdResource find(unsigned char compType, unsigned char processor, unsigned short instance,
+                     staticList<CompAttr_t> attributes, Wait wait = {});
+
+    // All components between two addresses that have the attributes, as many replies as that takes.
+    void findAll(CompFindAll_t& cmd, CompMultipleResult_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    Found findAll(CompDesc_t start, CompDesc_t end, staticList<CompAttr_t> attributes, Wait wait = {});
+    // All of the board's that have the type (0: any).
+    Found findAll(unsigned char compType = 0, Wait wait = {});
+
+    // `count` attributes of a component, from the one at `offset` on.
+    void attributes(CompAttrInfo_t& cmd, CompAttrInfoResult_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    staticList<CompAttr_t> attributes(CompDesc_t component, unsigned int count, unsigned int offset,
+                                      Wait wait = {});
+
+    // An instance of the caller's own, in a cluster.
+    void allocate(CompInstAllocate_t& cmd, ComponentResult_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    StdResource allocate(unsigned char compType, unsigned char processor, CompDesc_t cluster,
+                         staticList<CompAttr_t> attributes, Wait wait = {});
+    void free(CompInstFree_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    void free(CompDesc_t instance, Wait wait = {}) { command(CompInstFree_t(instance), nullptr, wait); }
+
+    // Says that components are in use, each with a word of the user's own, or no longer.
+    void use(CompUse_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    void use(staticList<CompUse_t::List_t>& uses, Wait wait = {}) { command(CompUse_t(uses), nullptr, wait); }
+    void use(const CompDesc_t& component, unsigned int payload, Wait wait = {});
+    void unuse(CompUnuse_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    void unuse(staticList<CompUnuse_t::List_t>& uses, Wait wait = {}) {
+        command(CompUnuse_t(uses), nullptr, wait);
+    }
+    void unuse(const CompDesc_t& component, Wait wait = {});
+
+  private:
+    CompDesc_t searchStart(unsigned char processor, unsigned short instance) const;
 };
 
 }  // namespace vela

@@ -1,10 +1,13 @@
 #include "vela/StdResource.h"
 
-#include <ostream>
-
 #include "vela/ResourceMgr.h"
 
 namespace vela {
+
+StdResource::StdResource(const CompDesc_t& target, MsgQueue* queue, int inUse) : StdResource(target, queue) {
+    if (inUse != 0)
+        use(0);
+}
 
 MsgBody* StdResource::MsgBodyLookup(unsigned int msgType) {
     MsgBody* const body = Bodies::make(msgType);
@@ -15,64 +18,19 @@ void StdResource::use(unsigned int payload) { ResourceMgr(*this).use(getTgtDesc(
 void StdResource::unuse() { ResourceMgr(*this).unuse(getTgtDesc()); }
 void StdResource::free() { ResourceMgr(*this).free(getTgtDesc()); }
 
-void StdResource::SetParm(unsigned int parm, unsigned int value, MsgSetParmCmplt_t* reply) {
-    command(MsgSetParm_t(parm, value), reply);
+void StdResource::DetectEvt(unsigned int evtType, unsigned int evtGroup, Addressable* returnTo, Wait wait) {
+    CompDesc_t to = returnAddress(returnTo);
+    command(MsgDetectEvt_t(to, evtType, evtGroup), nullptr, wait);
 }
 
-void StdResource::GetParm(unsigned int parm, MsgGetParmCmplt_t* reply) {
-    command(MsgGetParm_t(parm), reply);
+void StdResource::DetectxEvts(staticList<MsgDetectxEvts_t::List_t>& events, Addressable* returnTo,
+                              Wait wait) {
+    CompDesc_t to = returnAddress(returnTo);
+    command(MsgDetectxEvts_t(to, events), nullptr, wait);
 }
 
-void StdResource::DetectEvt(unsigned int evtType, unsigned int evtGroup, Addressable* returnTo) {
-    MsgDetectEvt_t cmd;
-    cmd.RetAddr = returnTo != nullptr ? returnTo->getTgtDesc() : getMsgQueue()->getHostDesc();
-    cmd.EvtType = evtType;
-    cmd.EvtGroup = evtGroup;
-    command<MsgDetectEvtCmplt_t>(cmd, nullptr);
-}
-
-void StdResource::CancelEvt(unsigned int evtType, Addressable*) {
-    command<MsgCancelEvtCmplt_t>(MsgCancelEvt_t(evtType), nullptr);
-}
-
-namespace {
-
-constexpr bool isParameterCommand(unsigned int code) {
-    return code == StdResource::MsgSetParm_t::code || code == StdResource::MsgSetxParms_t::code ||
-           code == StdResource::MsgGetParm_t::code || code == StdResource::MsgGetxParms_t::code ||
-           code == StdResource::MsgGetVParm_t::code || code == StdResource::MsgSetVParm_t::code;
-}
-
-}  // namespace
-
-StdResource::MsgError_t::MsgError_t(unsigned int& errorMsg, unsigned int& errorCode, Data_ErrorMsg_0x8_t& data)
-    : Body(errorMsg, errorCode) {
-    Data.bind(data);
-}
-
-bool StdResource::MsgError_t::hasData() const { return isParameterCommand(ErrorMsg); }
-
-unsigned int StdResource::MsgError_t::writeMsg(Msg* msg, unsigned int offset) {
-    offset = Body::writeMsg(msg, offset);
-    return hasData() ? Data->writeMsg(msg, offset) : offset;
-}
-
-unsigned int StdResource::MsgError_t::readMsg(Msg* msg, unsigned int offset) {
-    offset = Body::readMsg(msg, offset);
-    return hasData() ? Data->readMsg(msg, offset) : offset;
-}
-
-unsigned int StdResource::MsgError_t::GetByteSize() const {
-    return Body::GetByteSize() + (hasData() ? Data->GetByteSize() : 0);
-}
-
-void StdResource::MsgError_t::toStream(std::ostream* out) const {
-    *out << "{ErrorMsg " << ErrorMsg << " ErrorCode " << ErrorCode << " Data ";
-    if (hasData())
-        *out << Data.value();
-    else
-        *out << "NULL";
-    *out << "}";
+CompDesc_t StdResource::returnAddress(const Addressable* returnTo) const {
+    return returnTo != nullptr ? returnTo->getTgtDesc() : getMsgQueue()->getHostDesc();
 }
 
 }  // namespace vela

@@ -2,120 +2,166 @@
 #ifndef VELA_STDRESOURCE_H
 #define VELA_STDRESOURCE_H
 
+#include <algorithm>
+
 #include "vela/Addressable.h"
 #include "vela/StdResourceMessages.h"
 
 namespace vela {
 
-class StdResource : public Addressable {
+class StdResource : public Addressable, public StdResourceMessages {
   public:
-    // What the refused parameter of an error was; the same for every parameter command.
-    using Data_ErrorMsg_0x8_t = Body<NoCode, rows::NumVal>;
-    using Data_ErrorMsg_0xa_t = Data_ErrorMsg_0x8_t;
-    using Data_ErrorMsg_0x12_t = Data_ErrorMsg_0x8_t;
-    using Data_ErrorMsg_0x14_t = Data_ErrorMsg_0x8_t;
-    using Data_ErrorMsg_0x2d_t = Data_ErrorMsg_0x8_t;
-    using Data_ErrorMsg_0x2f_t = Data_ErrorMsg_0x8_t;
-
-    // The reply to a failed command. Data is there for the parameter commands alone.
-    class MsgError_t : public Body<0, rows::ErrorHead> {
-      public:
-        Nested<Data_ErrorMsg_0x8_t, "Data"> Data;
-
-        MsgError_t() = default;
-        MsgError_t(unsigned int& errorMsg, unsigned int& errorCode, Data_ErrorMsg_0x8_t& data);
-
-        bool hasData() const;
-        unsigned int writeMsg(Msg* msg, unsigned int offset) override;
-        unsigned int readMsg(Msg* msg, unsigned int offset) override;
-        unsigned int GetByteSize() const override;
-        void toStream(std::ostream* out) const override;  // "NULL" in place of data that is not there
-    };
-
-    using MsgAck_t = Body<1, NoFields>;
-    using MsgComtest_t = Body<2, NoFields>;
-    using MsgComtestCmplt_t = Body<3, NoFields>;
-    using MsgInit_t = Body<4, NoFields>;
-    using MsgInitCmplt_t = Body<5, NoFields>;
-    using MsgExit_t = Body<6, NoFields>;
-    using MsgExitCmplt_t = Body<7, NoFields>;
-    using MsgSetParm_t = Body<8, rows::ParmVal>;
-    using MsgSetParmCmplt_t = Body<9, NoFields>;
-    using MsgSetxParms_t = Body<10, rows::ParmValList>;
-    using MsgSetxParmsCmplt_t = Body<11, NoFields>;
-    using MsgSetParmDef_t = Body<12, rows::ParmOnly>;
-    using MsgSetParmDefCmplt_t = Body<13, NoFields>;
-    using MsgSetxParmsDef_t = Body<14, rows::ParmList>;
-    using MsgSetxParmsDefCmplt_t = Body<15, NoFields>;
-    using MsgSetAllParmsDef_t = Body<16, NoFields>;
-    using MsgSetAllParmsDefCmplt_t = Body<17, NoFields>;
-    using MsgGetParm_t = Body<18, rows::NumOnly>;
-    using MsgGetParmCmplt_t = Body<19, rows::GetParmCmplt>;
-    using MsgGetxParms_t = Body<20, rows::ParmValList>;
-    using MsgGetxParmsCmplt_t = Body<21, rows::ParmValList>;
-    using MsgDetectEvt_t = Body<22, rows::DetectEvt>;
-    using MsgDetectEvtCmplt_t = Body<23, NoFields>;
-    using MsgDetectxEvts_t = Body<24, rows::DetectxEvts>;
-    using MsgDetectxEvtsCmplt_t = Body<25, NoFields>;
-    using MsgCancelEvt_t = Body<26, rows::TypeOnly>;
-    using MsgCancelEvtCmplt_t = Body<27, NoFields>;
-    using MsgCancelxEvts_t = Body<28, rows::CancelxEvts>;
-    using MsgCancelxEvtsCmplt_t = Body<29, NoFields>;
-    using MsgCancelAllEvts_t = Body<30, NoFields>;
-    using MsgEvtDetected_t = Body<32, rows::EvtDetected>;
-    using MsgArmRTC_t = Body<33, rows::GroupAction>;
-    using MsgArmRTCCmplt_t = Body<34, NoFields>;
-    using MsgArmxRTCs_t = Body<35, rows::ArmxRTCs>;
-    using MsgArmxRTCsCmplt_t = Body<36, NoFields>;
-    using MsgDisarmRTC_t = Body<37, rows::GroupOnly>;
-    using MsgDisarmRTCCmplt_t = Body<38, NoFields>;
-    using MsgDisarmxRTCs_t = Body<39, rows::DisarmxRTCs>;
-    using MsgDisarmxRTCsCmplt_t = Body<40, NoFields>;
-    using MsgDisarmAllRTCs_t = Body<41, NoFields>;
-    using MsgDisarmAllRTCsCmplt_t = Body<42, NoFields>;
-    using MsgGetVParm_t = Body<45, rows::ParmList>;
-    using MsgGetVParmCmplt_t = Body<46, rows::ParmVarValList>;
-    using MsgSetVParm_t = Body<47, rows::ParmValList>;
-    using MsgSetVParmCmplt_t = Body<48, NoFields>;
-
-    using Bodies =
-        BodyTable<MsgError_t, MsgAck_t, MsgComtest_t, MsgComtestCmplt_t, MsgInit_t, MsgInitCmplt_t, MsgExit_t,
-                  MsgExitCmplt_t, MsgSetParm_t, MsgSetParmCmplt_t, MsgSetxParms_t, MsgSetxParmsCmplt_t,
-                  MsgSetParmDef_t, MsgSetParmDefCmplt_t, MsgSetxParmsDef_t, MsgSetxParmsDefCmplt_t,
-                  MsgSetAllParmsDef_t, MsgSetAllParmsDefCmplt_t, MsgGetParm_t, MsgGetParmCmplt_t,
-                  MsgGetxParms_t, MsgGetxParmsCmplt_t, MsgDetectEvt_t, MsgDetectEvtCmplt_t, MsgDetectxEvts_t,
-                  MsgDetectxEvtsCmplt_t, MsgCancelEvt_t, MsgCancelEvtCmplt_t, MsgCancelxEvts_t,
-                  MsgCancelxEvtsCmplt_t, MsgCancelAllEvts_t, MsgEvtDetected_t, MsgArmRTC_t, MsgArmRTCCmplt_t,
-                  MsgArmxRTCs_t, MsgArmxRTCsCmplt_t, MsgDisarmRTC_t, MsgDisarmRTCCmplt_t, MsgDisarmxRTCs_t,
-                  MsgDisarmxRTCsCmplt_t, MsgDisarmAllRTCs_t, MsgDisarmAllRTCsCmplt_t, MsgGetVParm_t,
-                  MsgGetVParmCmplt_t, MsgSetVParm_t, MsgSetVParmCmplt_t>;
-
     StdResource(const CompDesc_t& target, MsgQueue* queue) : Addressable(target, queue) {}
+    // With inUse not 0 reserves the component at once. Throws Timeout, UnexpectedMsg.
+    StdResource(const CompDesc_t& target, MsgQueue* queue, int inUse);
     explicit StdResource(const Addressable& other) : Addressable(other) {}
     StdResource(const StdResource& other) = default;
     ~StdResource() override { endCallbacks(); }
 
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
 
+    void msgQueueAttach(MsgQueue* queue) { MsgQueueAttach(queue); }
     // Marks the component as in use, with a word of the user's own, or as no longer in use, or gives an
     // allocated instance back: requests to the board's resource manager. Throw Timeout, UnexpectedMsg.
     void use(unsigned int payload);
     void unuse();
     void free();
 
-    // Commands: each waits for its completion and reads it into reply unless that is null. Throw Timeout,
-    // UnexpectedMsg (the board's refusal among them).
-    void SetParm(unsigned int parm, unsigned int value, MsgSetParmCmplt_t* reply);
-    virtual void GetParm(unsigned int parm, MsgGetParmCmplt_t* reply);
-    // Events of the type go to returnTo's address, or with null to this object's own queue.
-    virtual void DetectEvt(unsigned int evtType, unsigned int evtGroup, Addressable* returnTo);
-    virtual void CancelEvt(unsigned int evtType, Addressable* returnTo);
+    // Commands. Each takes a prepared body, or its fields, and waits for the completion, which it reads into
+    // reply unless that is null; without a wait of its own as long as the object's response time-out says.
+    // Throw Timeout, UnexpectedMsg (the component's refusal among them). Commands that have no reply wait for
+    // an error only.
+    void Init(MsgInit_t& cmd, MsgInitCmplt_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    void Init(MsgInitCmplt_t* reply, Wait wait = {}) { command(MsgInit_t(), reply, wait); }
+    void Exit(MsgExit_t& cmd, MsgExitCmplt_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    void Exit(MsgExitCmplt_t* reply, Wait wait = {}) { command(MsgExit_t(), reply, wait); }
+    void ComTest(MsgComtest_t& cmd, MsgComtestCmplt_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    void ComTest(MsgComtestCmplt_t* reply, Wait wait = {}) { command(MsgComtest_t(), reply, wait); }
+    void Ack(MsgAck_t& cmd, Wait wait = {}) { command(cmd, wait); }
+    void Ack(Wait wait = {}) { command(MsgAck_t(), wait); }
+    void Error(MsgError_t& cmd, Wait wait = {}) { command(cmd, wait); }
+    void Error(unsigned int errorMsg, unsigned int errorCode, Data_ErrorMsg_0x8_t data = {}, Wait wait = {}) {
+        command(MsgError_t(errorMsg, errorCode, data), wait);
+    }
 
-  protected:
-    // A command and the reply that its type names.
-    template <typename Reply, typename Command>
-    void command(Command&& cmd, Reply* reply) {
-        request(std::remove_reference_t<Command>::code, &cmd, Reply::code, reply);
+    void SetParm(MsgSetParm_t& cmd, MsgSetParmCmplt_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    void SetParm(unsigned int parm, unsigned int value, MsgSetParmCmplt_t* reply, Wait wait = {}) {
+        command(MsgSetParm_t(parm, value), reply, wait);
+    }
+    void GetParm(MsgGetParm_t& cmd, MsgGetParmCmplt_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    virtual void GetParm(unsigned int parm, MsgGetParmCmplt_t* reply, Wait wait = {}) {
+        command(MsgGetParm_t(parm), reply, wait);
+    }
+    void SetxParms(MsgSetxParms_t& cmd, MsgSetxParmsCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void SetxParms(staticList<MsgSetxParms_t::Parms_t>& parms, MsgSetxParmsCmplt_t* reply, Wait wait = {}) {
+        command(MsgSetxParms_t(parms), reply, wait);
+    }
+    void GetxParms(MsgGetxParms_t& cmd, MsgGetxParmsCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void GetxParms(staticList<MsgGetxParms_t::Parms_t>& parms, MsgGetxParmsCmplt_t* reply, Wait wait = {}) {
+        command(MsgGetxParms_t(parms), reply, wait);
+    }
+    // The field forms send the first `count` of the parameters, or all when there are fewer.
+    void SetVParm(MsgSetVParm_t& cmd, MsgSetVParmCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void SetVParm(unsigned short count, staticList<MsgSetVParm_t::Parms_t> parms, MsgSetVParmCmplt_t* reply,
+                  Wait wait = {}) {
+        command(MsgSetVParm_t(firstOf(count, parms)), reply, wait);
+    }
+    void GetVParm(MsgGetVParm_t& cmd, MsgGetVParmCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void GetVParm(unsigned short count, staticList<MsgGetVParm_t::Parms_t> parms, MsgGetVParmCmplt_t* reply,
+                  Wait wait = {}) {
+        command(MsgGetVParm_t(firstOf(count, parms)), reply, wait);
+    }
+    void SetParmDef(MsgSetParmDef_t& cmd, MsgSetParmDefCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void SetParmDef(unsigned int parm, MsgSetParmDefCmplt_t* reply, Wait wait = {}) {
+        command(MsgSetParmDef_t(parm), reply, wait);
+    }
+    void SetxParmsDef(MsgSetxParmsDef_t& cmd, MsgSetxParmsDefCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void SetxParmsDef(staticList<MsgSetxParmsDef_t::Parms_t>& parms, MsgSetxParmsDefCmplt_t* reply,
+                      Wait wait = {}) {
+        command(MsgSetxParmsDef_t(parms), reply, wait);
+    }
+    void SetAllParmsDef(MsgSetAllParmsDef_t& cmd, MsgSetAllParmsDefCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void SetAllParmsDef(MsgSetAllParmsDefCmplt_t* reply, Wait wait = {}) {
+        command(MsgSetAllParmsDef_t(), reply, wait);
+    }
+
+    // Events of the type go to returnTo's address, or with null to this object's own queue. Cancelling names
+    // the type alone: the component keeps one subscription for each.
+    void DetectEvt(MsgDetectEvt_t& cmd, MsgDetectEvtCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    virtual void DetectEvt(unsigned int evtType, unsigned int evtGroup, Addressable* returnTo, Wait wait = {});
+    void DetectxEvts(MsgDetectxEvts_t& cmd, MsgDetectxEvtsCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void DetectxEvts(staticList<MsgDetectxEvts_t::List_t>& events, Addressable* returnTo, Wait wait = {});
+    void CancelEvt(MsgCancelEvt_t& cmd, MsgCancelEvtCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    virtual void CancelEvt(unsigned int evtType, Addressable* /*returnTo*/, Wait wait = {}) {
+        command(MsgCancelEvt_t(evtType), nullptr, wait);
+    }
+    void CancelxEvts(MsgCancelxEvts_t& cmd, MsgCancelxEvtsCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void CancelxEvts(staticList<unsigned int>& evtTypes, Addressable* /*returnTo*/, Wait wait = {}) {
+        command(MsgCancelxEvts_t(evtTypes), nullptr, wait);
+    }
+    void CancelAllEvts(MsgCancelAllEvts_t& cmd, Wait wait = {}) { command(cmd, wait); }
+    void CancelAllEvts(Addressable* /*returnTo*/, Wait wait = {}) { command(MsgCancelAllEvts_t(), wait); }
+
+    // Run-time controls.
+    void ArmRTC(MsgArmRTC_t& cmd, MsgArmRTCCmplt_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
+    void ArmRTC(unsigned int evtGroup, unsigned int action, MsgArmRTCCmplt_t* reply, Wait wait = {}) {
+        command(MsgArmRTC_t(evtGroup, action), reply, wait);
+    }
+    void ArmxRTCs(MsgArmxRTCs_t& cmd, MsgArmxRTCsCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void ArmxRTCs(staticList<MsgArmxRTCs_t::EventGroupList_t>& groups, MsgArmxRTCsCmplt_t* reply,
+                  Wait wait = {}) {
+        command(MsgArmxRTCs_t(groups), reply, wait);
+    }
+    void DisArmRTC(MsgDisarmRTC_t& cmd, MsgDisarmRTCCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void DisArmRTC(unsigned int evtGroup, MsgDisarmRTCCmplt_t* reply, Wait wait = {}) {
+        command(MsgDisarmRTC_t(evtGroup), reply, wait);
+    }
+    void DisarmxRTCs(MsgDisarmxRTCs_t& cmd, MsgDisarmxRTCsCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void DisarmxRTCs(staticList<unsigned int>& groups, MsgDisarmxRTCsCmplt_t* reply, Wait wait = {}) {
+        command(MsgDisarmxRTCs_t(groups), reply, wait);
+    }
+    void DisarmAllRTCs(MsgDisarmAllRTCs_t& cmd, MsgDisarmAllRTCsCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void DisarmAllRTCs(MsgDisarmAllRTCsCmplt_t* reply, Wait wait = {}) {
+        command(MsgDisarmAllRTCs_t(), reply, wait);
+    }
+
+  private:
+    CompDesc_t returnAddress(const Addressable* returnTo) const;
+
+    template <typename T>
+    static staticList<T>& firstOf(unsigned int count, staticList<T>& elements) {
+        elements.realloc(std::min(count, elements.length()));
+        return elements;
     }
 };
 

@@ -1,12 +1,14 @@
-// The messages that every component instance understands, as rows of fields; their codes and names are in
-// StdResource.h. Widths: 32-bit unsigned unless the field says otherwise; addresses are CompDesc_t.
+// The messages that every component instance understands: rows of fields, and the bodies made of them.
+// Widths: 32-bit unsigned unless the field says otherwise; addresses are CompDesc_t.
 #ifndef VELA_STDRESOURCEMESSAGES_H
 #define VELA_STDRESOURCEMESSAGES_H
 
 #include "vela/Body.h"
 #include "vela/CompDesc.h"
 
-namespace vela::rows {
+namespace vela {
+
+namespace rows {
 
 // clang-format off
 struct ParmVal    { U32<"Parm"> Parm; U32<"Val"> Val; };
@@ -56,6 +58,94 @@ struct DisarmxRTCs {
 };
 // clang-format on
 
-}  // namespace vela::rows
+}  // namespace rows
+
+// Their codes and names, as StdResource's own.
+struct StdResourceMessages {
+    // What the refused parameter of an error was; the same for every parameter command.
+    using Data_ErrorMsg_0x8_t = Body<NoCode, rows::NumVal>;
+    using Data_ErrorMsg_0xa_t = Data_ErrorMsg_0x8_t;
+    using Data_ErrorMsg_0x12_t = Data_ErrorMsg_0x8_t;
+    using Data_ErrorMsg_0x14_t = Data_ErrorMsg_0x8_t;
+    using Data_ErrorMsg_0x2d_t = Data_ErrorMsg_0x8_t;
+    using Data_ErrorMsg_0x2f_t = Data_ErrorMsg_0x8_t;
+
+    // The reply to a failed command. Data is there for the parameter commands alone.
+    struct MsgError_t : Body<0, rows::ErrorHead> {
+        Nested<Data_ErrorMsg_0x8_t, "Data"> Data;
+
+        MsgError_t() = default;
+        MsgError_t(unsigned int& errorMsg, unsigned int& errorCode, Data_ErrorMsg_0x8_t& data);
+
+        auto fields() { return std::tuple_cat(Body::fields(), std::tie(Data)); }
+        bool hasData() const;
+        unsigned int writeMsg(Msg* msg, unsigned int offset) override;
+        unsigned int readMsg(Msg* msg, unsigned int offset) override;
+        unsigned int GetByteSize() const override;
+        void toStream(std::ostream* out) const override;  // "NULL" in place of data that is not there
+    };
+
+    // clang-format off
+    struct MsgAck_t : Body<1> {};
+    struct MsgComtestCmplt_t : Body<3> {};
+    struct MsgComtest_t : Command<2, MsgComtestCmplt_t> {};
+    struct MsgInitCmplt_t : Body<5> {};
+    struct MsgInit_t : Command<4, MsgInitCmplt_t> {};
+    struct MsgExitCmplt_t : Body<7> {};
+    struct MsgExit_t : Command<6, MsgExitCmplt_t> {};
+    struct MsgSetParmCmplt_t : Body<9> {};
+    struct MsgSetParm_t : Command<8, MsgSetParmCmplt_t, rows::ParmVal> { using Command::Command; };
+    struct MsgSetxParmsCmplt_t : Body<11> {};
+    struct MsgSetxParms_t : Command<10, MsgSetxParmsCmplt_t, rows::ParmValList> { using Command::Command; };
+    struct MsgSetParmDefCmplt_t : Body<13> {};
+    struct MsgSetParmDef_t : Command<12, MsgSetParmDefCmplt_t, rows::ParmOnly> { using Command::Command; };
+    struct MsgSetxParmsDefCmplt_t : Body<15> {};
+    struct MsgSetxParmsDef_t : Command<14, MsgSetxParmsDefCmplt_t, rows::ParmList> { using Command::Command; };
+    struct MsgSetAllParmsDefCmplt_t : Body<17> {};
+    struct MsgSetAllParmsDef_t : Command<16, MsgSetAllParmsDefCmplt_t> {};
+    struct MsgGetParmCmplt_t : Body<19, rows::GetParmCmplt> { using Body::Body; };
+    struct MsgGetParm_t : Command<18, MsgGetParmCmplt_t, rows::NumOnly> { using Command::Command; };
+    struct MsgGetxParmsCmplt_t : Body<21, rows::ParmValList> { using Body::Body; };
+    struct MsgGetxParms_t : Command<20, MsgGetxParmsCmplt_t, rows::ParmValList> { using Command::Command; };
+    struct MsgDetectEvtCmplt_t : Body<23> {};
+    struct MsgDetectEvt_t : Command<22, MsgDetectEvtCmplt_t, rows::DetectEvt> { using Command::Command; };
+    struct MsgDetectxEvtsCmplt_t : Body<25> {};
+    struct MsgDetectxEvts_t : Command<24, MsgDetectxEvtsCmplt_t, rows::DetectxEvts> { using Command::Command; };
+    struct MsgCancelEvtCmplt_t : Body<27> {};
+    struct MsgCancelEvt_t : Command<26, MsgCancelEvtCmplt_t, rows::TypeOnly> { using Command::Command; };
+    struct MsgCancelxEvtsCmplt_t : Body<29> {};
+    struct MsgCancelxEvts_t : Command<28, MsgCancelxEvtsCmplt_t, rows::CancelxEvts> { using Command::Command; };
+    struct MsgCancelAllEvts_t : Body<30> {};
+    struct MsgEvtDetected_t : Body<32, rows::EvtDetected> { using Body::Body; };
+    struct MsgArmRTCCmplt_t : Body<34> {};
+    struct MsgArmRTC_t : Command<33, MsgArmRTCCmplt_t, rows::GroupAction> { using Command::Command; };
+    struct MsgArmxRTCsCmplt_t : Body<36> {};
+    struct MsgArmxRTCs_t : Command<35, MsgArmxRTCsCmplt_t, rows::ArmxRTCs> { using Command::Command; };
+    struct MsgDisarmRTCCmplt_t : Body<38> {};
+    struct MsgDisarmRTC_t : Command<37, MsgDisarmRTCCmplt_t, rows::GroupOnly> { using Command::Command; };
+    struct MsgDisarmxRTCsCmplt_t : Body<40> {};
+    struct MsgDisarmxRTCs_t : Command<39, MsgDisarmxRTCsCmplt_t, rows::DisarmxRTCs> { using Command::Command; };
+    struct MsgDisarmAllRTCsCmplt_t : Body<42> {};
+    struct MsgDisarmAllRTCs_t : Command<41, MsgDisarmAllRTCsCmplt_t> {};
+    struct MsgGetVParmCmplt_t : Body<46, rows::ParmVarValList> { using Body::Body; };
+    struct MsgGetVParm_t : Command<45, MsgGetVParmCmplt_t, rows::ParmList> { using Command::Command; };
+    struct MsgSetVParmCmplt_t : Body<48> {};
+    struct MsgSetVParm_t : Command<47, MsgSetVParmCmplt_t, rows::ParmValList> { using Command::Command; };
+    // clang-format on
+
+    using Bodies =
+        BodyTable<MsgError_t, MsgAck_t, MsgComtest_t, MsgComtestCmplt_t, MsgInit_t, MsgInitCmplt_t, MsgExit_t,
+                  MsgExitCmplt_t, MsgSetParm_t, MsgSetParmCmplt_t, MsgSetxParms_t, MsgSetxParmsCmplt_t,
+                  MsgSetParmDef_t, MsgSetParmDefCmplt_t, MsgSetxParmsDef_t, MsgSetxParmsDefCmplt_t,
+                  MsgSetAllParmsDef_t, MsgSetAllParmsDefCmplt_t, MsgGetParm_t, MsgGetParmCmplt_t,
+                  MsgGetxParms_t, MsgGetxParmsCmplt_t, MsgDetectEvt_t, MsgDetectEvtCmplt_t, MsgDetectxEvts_t,
+                  MsgDetectxEvtsCmplt_t, MsgCancelEvt_t, MsgCancelEvtCmplt_t, MsgCancelxEvts_t,
+                  MsgCancelxEvtsCmplt_t, MsgCancelAllEvts_t, MsgEvtDetected_t, MsgArmRTC_t, MsgArmRTCCmplt_t,
+                  MsgArmxRTCs_t, MsgArmxRTCsCmplt_t, MsgDisarmRTC_t, MsgDisarmRTCCmplt_t, MsgDisarmxRTCs_t,
+                  MsgDisarmxRTCsCmplt_t, MsgDisarmAllRTCs_t, MsgDisarmAllRTCsCmplt_t, MsgGetVParm_t,
+                  MsgGetVParmCmplt_t, MsgSetVParm_t, MsgSetVParmCmplt_t>;
+};
+
+}  // namespace vela
 
 #endif

@@ -6,10 +6,129 @@
 
 namespace vela {
 
-class TSCComponent : public Component {
+namespace rows {
+// clang-format off
+struct ParmFieldDef { U32<"Parm"> Parm; U32<"FieldDef"> FieldDef; };
+// clang-format on
+
+// A parameter whose value is as many elements, of the type, as its FieldDef says, which is a descriptor word.
+// Elements narrower than 32 bits are numbers of 32 bits here.
+struct ParmFieldDefVal_t : Body<NoCode, ParmFieldDef> {
+    Field<staticList<unsigned int>, "Val"> Val;
+
+    ParmFieldDefVal_t() = default;
+    ParmFieldDefVal_t(unsigned int& parm, unsigned int& fieldDef, staticList<unsigned int>& val);
+
+    auto fields() { return std::tuple_cat(Body::fields(), std::tie(Val)); }
+    // A list that is too short for FieldDef grows, with zeros; one that is too long is not sent whole.
+    unsigned int writeMsg(Msg* msg, unsigned int offset) override;
+    unsigned int readMsg(Msg* msg, unsigned int offset) override;
+    unsigned int GetByteSize() const override;
+    void toStream(std::ostream* out) const override;
+};
+
+// clang-format off
+struct Std_ParmValList {
+    using Parms_t = Body<NoCode, ParmVal>;
+    Count32<"Count"> Count; ListOf<Parms_t, "Parms"> Parms;
+};
+struct Std_ParmFieldDefValList {
+    using Parms_t = ParmFieldDefVal_t;
+    Count32<"Count"> Count; ListOf<Parms_t, "Parms"> Parms;
+};
+struct BChannel { U8<"BChanId"> BChanId; U8<"SlotId"> SlotId; U8<"Direction"> Direction; U8<"Count"> Count; };
+struct DefineBSet {
+    using List_t = Body<NoCode, BChannel>;
+    U8<"SetId"> SetId; U8<"LineId"> LineId; U8<"StartChannelId"> StartChannelId; U8<"NumChannels"> NumChannels;
+    U32<"BaseProtocol"> BaseProtocol; U8<"InboundVariantId"> InboundVariantId;
+    U8<"OutboundVariantId"> OutboundVariantId; Nested<CompDesc_t, "DChannelDesc"> DChannelDesc;
+    U32<"AdminGroup"> AdminGroup; Count8<"Width"> Width; ListOf<List_t, "List"> List;
+};
+struct LineMask { U8<"Linenum"> Linenum; U32<"Alarm_mask"> Alarm_mask; };
+struct LineOnly { U8<"Linenum"> Linenum; };
+struct PortOnly { U8<"port"> port; };
+struct PortSignalBits { U8<"port"> port; FixedOctets<32, "signalbits"> signalbits; };
+// clang-format on
+}  // namespace rows
+
+struct TSCMessages {
+    // clang-format off
+    struct Std_MsgSetxParmsCmplt_t : Body<11> {};
+    struct Std_MsgSetxParms_t : Command<10, Std_MsgSetxParmsCmplt_t, rows::Std_ParmFieldDefValList> { using Command::Command; };
+    struct Std_MsgGetxParmsCmplt_t : Body<21, rows::Std_ParmFieldDefValList> { using Body::Body; };
+    struct Std_MsgGetxParms_t : Command<20, Std_MsgGetxParmsCmplt_t, rows::Std_ParmValList> { using Command::Command; };
+    struct MsgDefineBSetCmplt_t : Body<4617> {};
+    struct MsgDefineBSet_t : Command<4616, MsgDefineBSetCmplt_t, rows::DefineBSet> { using Command::Command; };
+    struct MsgSetAlarmMaskCmplt_t : Body<4675> {};
+    struct MsgSetAlarmMask_t : Command<4674, MsgSetAlarmMaskCmplt_t, rows::LineMask> { using Command::Command; };
+    struct MsgGetAlarmMaskCmplt_t : Body<4677, rows::LineMask> { using Body::Body; };
+    struct MsgGetAlarmMask_t : Command<4676, MsgGetAlarmMaskCmplt_t, rows::LineOnly> { using Command::Command; };
+    struct MsgTxRxSignalingGetAllCmplt_t : Body<4689, rows::PortSignalBits> { using Body::Body; };
+    struct MsgTxRxSignalingGetAll_t : Command<4688, MsgTxRxSignalingGetAllCmplt_t, rows::PortOnly> { using Command::Command; };
+    // clang-format on
+
+    using Bodies = BodyTable<Std_MsgSetxParms_t, Std_MsgSetxParmsCmplt_t, Std_MsgGetxParms_t,
+                             Std_MsgGetxParmsCmplt_t, MsgDefineBSet_t, MsgDefineBSetCmplt_t,
+                             MsgSetAlarmMask_t, MsgSetAlarmMaskCmplt_t, MsgGetAlarmMask_t,
+                             MsgGetAlarmMaskCmplt_t, MsgTxRxSignalingGetAll_t, MsgTxRxSignalingGetAllCmplt_t>;
+};
+
+// Its own parameter lists take the place of the standard ones.
+class TSCComponent : public Component, public TSCMessages {
   public:
+    using Bodies = TSCMessages::Bodies;
+
     explicit TSCComponent(const Component& found) : Component(found) {}
     ~TSCComponent() override { endCallbacks(); }
+
+    MsgBody* MsgBodyLookup(unsigned int msgType) override;
+
+    // Commands; all throw Timeout, UnexpectedMsg. See StdResource for their forms.
+    void SetxParms(Std_MsgSetxParms_t& cmd, Std_MsgSetxParmsCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void SetxParms(staticList<Std_MsgSetxParms_t::Parms_t>& parms, Std_MsgSetxParmsCmplt_t* reply,
+                   Wait wait = {}) {
+        command(Std_MsgSetxParms_t(parms), reply, wait);
+    }
+    void GetxParms(Std_MsgGetxParms_t& cmd, Std_MsgGetxParmsCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void GetxParms(staticList<Std_MsgGetxParms_t::Parms_t>& parms, Std_MsgGetxParmsCmplt_t* reply,
+                   Wait wait = {}) {
+        command(Std_MsgGetxParms_t(parms), reply, wait);
+    }
+    void DefineBSet(MsgDefineBSet_t& cmd, MsgDefineBSetCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void DefineBSet(unsigned char setId, unsigned char lineId, unsigned char startChannelId,
+                    unsigned char numChannels, unsigned int baseProtocol, unsigned char inboundVariantId,
+                    unsigned char outboundVariantId, CompDesc_t dChannel, unsigned int adminGroup,
+                    staticList<MsgDefineBSet_t::List_t>& channels, MsgDefineBSetCmplt_t* reply,
+                    Wait wait = {}) {
+        command(MsgDefineBSet_t(setId, lineId, startChannelId, numChannels, baseProtocol, inboundVariantId,
+                                outboundVariantId, dChannel, adminGroup, channels),
+                reply, wait);
+    }
+    void SetAlarmMask(MsgSetAlarmMask_t& cmd, MsgSetAlarmMaskCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void SetAlarmMask(unsigned char line, unsigned int mask, MsgSetAlarmMaskCmplt_t* reply, Wait wait = {}) {
+        command(MsgSetAlarmMask_t(line, mask), reply, wait);
+    }
+    void GetAlarmMask(MsgGetAlarmMask_t& cmd, MsgGetAlarmMaskCmplt_t* reply, Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void GetAlarmMask(unsigned char line, MsgGetAlarmMaskCmplt_t* reply, Wait wait = {}) {
+        command(MsgGetAlarmMask_t(line), reply, wait);
+    }
+    void GetSignalBitsAll(MsgTxRxSignalingGetAll_t& cmd, MsgTxRxSignalingGetAllCmplt_t* reply,
+                          Wait wait = {}) {
+        command(cmd, reply, wait);
+    }
+    void GetSignalBitsAll(unsigned char port, MsgTxRxSignalingGetAllCmplt_t* reply, Wait wait = {}) {
+        command(MsgTxRxSignalingGetAll_t(port), reply, wait);
+    }
 };
 
 }  // namespace vela

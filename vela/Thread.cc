@@ -8,89 +8,100 @@ namespace vela {
 
 namespace {
 
-// What an abandoned thread runs, on its way to that thread.
-struct Errand {
-    Thread::Function function;
-    void* object;
-    Thread::Member member;
-    void* arg;
-};
-
-void* runErrand(void*, void* block) {
-    const Errand errand = *std::unique_ptr<Errand>(static_cast<Errand*>(block));
-    if (errand.function != nullptr)
-        return errand.function(nullptr, errand.arg);
-    return (static_cast<Thread::Runnable*>(errand.object)->*errand.member)(nullptr, errand.arg);
+// The body of every thread: gives the layer's control to what it is to run, in place of the primitive's. An
+// abandoned thread has none.
+void* runErrand(void* primitiveControl, void* block) {
+    const Thread::Errand errand = *std::unique_ptr<Thread::Errand>(static_cast<Thread::Errand*>(block));
+    Thread::control own(static_cast<KSThread::control*>(primitiveControl));
+    return errand.run(primitiveControl == nullptr ? nullptr : &own);
 }
 
-void abandon(std::unique_ptr<Errand> errand, unsigned int stackSize) {
+template <typename Create>
+auto translated(Create create) {
     try {
-        KSAbandonedThread_create(runErrand, errand.get(), stackSize);
-        static_cast<void>(errand.release());  // the thread's now
+        return create();
+    } catch (const KSThread::AlreadyActive&) {
+        throw Thread::AlreadyActive();
     } catch (const KSThread::CreationError&) {
         throw Thread::CreationError();
     }
 }
 
-template <typename... Args>
-std::unique_ptr<KSThread> makeThread(Args... args) {
-    try {
-        return std::make_unique<KSThread>(args...);
-    } catch (const KSThread::CreationError&) {
-        throw Thread::CreationError();
-    }
+// Hands the errand to the new thread, which frees it.
+template <typename Start>
+void startWith(const Thread::Errand& errand, Start start) {
+    auto block = std::make_unique<Thread::Errand>(errand);
+    translated([&] { start(block.get()); });
+    static_cast<void>(block.release());
 }
 
 }  // namespace
+
+void* Thread::Errand::run(control* ctl) const {
+    return function != nullptr ? function(ctl, arg) : (static_cast<Runnable*>(object)->*member)(ctl, arg);
+}
 
 void Thread::control::pushCleanup(void* object, void* (Runnable::*routine)(void*), void* arg) {
     primitive_->pushCleanup(object, reinterpret_cast<void* (KSRunnable::*)(void*)>(routine), arg);
 }
 
 Thread::Thread(Function body, unsigned int stackSize)
-    : function_(body), thread_(makeThread(&Thread::run, stackSize)) {}
+    : Thread(Errand{body, nullptr, nullptr, nullptr}, stackSize) {}
 
 Thread::Thread(void* object, Member body, unsigned int stackSize)
-    : object_(object), member_(body), thread_(makeThread(&Thread::run, stackSize)) {}
+    : Thread(Errand{nullptr, object, body, nullptr}, stackSize) {}
+
+Thread::Thread(const Errand& errand, unsigned int stackSize)
+    : errand_(errand),
+      thread_(translated([&] { return std::make_unique<KSThread>(&runErrand, stackSize); })) {}
 
 Thread::~Thread() = default;
 
-// Runs on the new thread: gives the body the layer's control in place of the primitive's.
-void* Thread::run(void* primitiveControl, void* self) {
-    const Thread& thread = *static_cast<Thread*>(self);
-    control own(static_cast<KSThread::control*>(primitiveControl));
-    if (thread.function_ != nullptr)
-        return thread.function_(&own, thread.arg_);
-    return (static_cast<Runnable*>(thread.object_)->*thread.member_)(&own, thread.arg_);
-}
-
 void Thread::start(void* arg) {
-    try {
-        void* const earlier = std::exchange(arg_, arg);
-        try {
-            thread_->start(this);
-        } catch (...) {
-            arg_ = earlier;
-            throw;
-        }
-    } catch (const KSThread::AlreadyActive&) {
+    if (thread_ == nullptr)
         throw AlreadyActive();
-    } catch (const KSThread::CreationError&) {
-        throw CreationError();
-    }
+    Errand errand = errand_;
+    errand.arg = arg;
+    startWith(errand, [&](Errand* block) { thread_->start(block); });
+    started_ = true;
+    if (abandoned_)
+        letGo();
 }
 
-void Thread::cancel() { thread_->cancel(); }
-void Thread::join() { thread_->join(); }
-void* Thread::getResult() { return thread_->getResult(); }
-void Thread::abandon() { thread_->abandon(); }
+void Thread::cancel() {
+    if (thread_ != nullptr)
+        thread_->cancel();
+}
+
+void Thread::join() {
+    if (thread_ == nullptr)
+        return;
+    thread_->join();
+    started_ = false;
+}
+
+void* Thread::getResult() { return thread_ == nullptr ? nullptr : thread_->getResult(); }
+
+void Thread::abandon() {
+    abandoned_ = true;
+    if (started_)
+        letGo();
+}
+
+// The primitive deletes itself when its body ends.
+void Thread::letGo() {
+    if (thread_ != nullptr)
+        thread_.release()->abandon();
+}
 
 void AbandonedThread_create(Thread::Function body, void* arg, unsigned int stackSize) {
-    abandon(std::make_unique<Errand>(Errand{body, nullptr, nullptr, arg}), stackSize);
+    startWith({body, nullptr, nullptr, arg},
+              [&](Thread::Errand* errand) { KSAbandonedThread_create(&runErrand, errand, stackSize); });
 }
 
 void AbandonedThread_create(void* object, Thread::Member body, void* arg, unsigned int stackSize) {
-    abandon(std::make_unique<Errand>(Errand{nullptr, object, body, arg}), stackSize);
+    startWith({nullptr, object, body, arg},
+              [&](Thread::Errand* errand) { KSAbandonedThread_create(&runErrand, errand, stackSize); });
 }
 
 }  // namespace vela

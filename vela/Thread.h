@@ -4,6 +4,7 @@
 #ifndef VELA_THREAD_H
 #define VELA_THREAD_H
 
+#include <atomic>
 #include <memory>
 
 #include "hostsvc/KSThread.h"
@@ -45,6 +46,16 @@ class Thread : public virtualObject {
     using Function = void* (*)(control*, void*);
     using Member = void* (Runnable::*)(control*, void*);
 
+    // What a thread runs, on its way to that thread.
+    struct Errand {
+        Function function;
+        void* object;
+        Member member;
+        void* arg;
+
+        void* run(control* ctl) const;
+    };
+
     // stackSize in octets, 0 for the system's default. The thread is not started. Throws CreationError.
     Thread(Function body, unsigned int stackSize);
     Thread(void* object, Member body, unsigned int stackSize);
@@ -57,17 +68,18 @@ class Thread : public virtualObject {
     void cancel();
     void join();
     void* getResult();
-    // The thread is left to run and clean up by itself.
+    // The thread that runs, or the next one started, is left to run and clean up by itself; this object may
+    // go before it and has nothing to say to it any more.
     void abandon();
 
   private:
-    static void* run(void* primitiveControl, void* self);
+    Thread(const Errand& errand, unsigned int stackSize);
+    void letGo();
 
-    Function function_ = nullptr;
-    void* object_ = nullptr;
-    Member member_ = nullptr;
-    void* arg_ = nullptr;
-    std::unique_ptr<KSThread> thread_;
+    Errand errand_;
+    std::unique_ptr<KSThread> thread_;  // null once it is abandoned and runs
+    std::atomic<bool> started_{false};  // and not joined since
+    std::atomic<bool> abandoned_{false};
 };
 
 // Start a thread that nobody joins; its control is null. Throw Thread::CreationError.

@@ -9,8 +9,10 @@
 #define VELA_FIELD_H
 
 #include <algorithm>
+#include <array>
 #include <concepts>
 #include <cstddef>
+#include <limits>
 #include <ostream>
 #include <type_traits>
 
@@ -87,6 +89,13 @@ using Value32 = Scalar<unsigned int, WireType::Value32, name>;
 template <typename Number>
 struct CountOf : Number {
     using Number::operator=;
+
+    // Throws Exception when there are more than the field can say.
+    void count(unsigned int elements) {
+        if (elements > std::numeric_limits<typename Number::Value>::max())
+            throw Exception("a list is longer than its count can say");
+        *this = static_cast<typename Number::Value>(elements);
+    }
 };
 template <Label name>
 using Count32 = CountOf<U32<name>>;
@@ -96,9 +105,14 @@ template <Label name>
 using Count8 = CountOf<U8<name>>;
 
 template <typename T>
-concept ScalarField = requires { T::wire; } && !requires { T::isArray; };
+concept ScalarField = requires {
+    T::wire;
+}
+&&!requires { T::isArray; };
 template <typename T>
-concept CountField = ScalarField<T> && requires(T& field) { []<typename N>(CountOf<N>&) {}(field); };
+concept CountField = ScalarField<T> && requires(T& field) {
+    []<typename N>(CountOf<N>&) {}(field);
+};
 
 // A body within the body, an address for one.
 template <typename NestedBody, Label name>
@@ -150,6 +164,23 @@ class Rest : public Array<T, type, name> {
 template <Label name>
 using RestBytes = Rest<unsigned char, WireType::Unsigned8, name>;
 
+// Octets, always as many.
+template <unsigned int n, Label name>
+class FixedOctets : public Field<std::array<unsigned char, n>, name> {
+  public:
+    using Field<std::array<unsigned char, n>, name>::operator=;
+
+    unsigned int byteSize() const { return n; }
+    void print(std::ostream* out) const { printList(out, this->value().begin(), this->value().end()); }
+
+    template <Move move>
+    void transfer(FieldMover<move>& mover, Msg*, unsigned int) {
+        if constexpr (move == Move::Get)
+            this->value().fill(0);
+        mover.array(this->value().data(), n, WireType::Unsigned8);
+    }
+};
+
 // Bodies one after another, as many as the count before them says.
 template <typename Element, Label name>
 class ListOf : public Field<staticList<Element>, name> {
@@ -169,9 +200,54 @@ class ListOf : public Field<staticList<Element>, name> {
     template <Move move>
     void transfer(FieldMover<move>& mover, Msg* msg, unsigned int announced) {
         if constexpr (move == Move::Get)
-            this->value().realloc(std::min(announced, mover.rest() / Element().GetByteSize()));
+            get(mover, msg, announced);
+        else
+            put(mover, msg);
+    }
+
+  protected:
+    void put(FieldMover<Move::Put>& mover, Msg* msg) {
         for (Element& element : this->value())
             mover.nested(msg, element);
+    }
+
+  private:
+    // No entry is smaller than an empty one: what is left after the last whole entry is not read.
+    void get(FieldMover<Move::Get>& mover, Msg* msg, unsigned int announced) {
+        staticList<Element>& elements = this->value();
+        const unsigned int least = Element().GetByteSize();
+        elements.realloc(std::min(announced, mover.rest() / least));
+        unsigned int n = 0;
+        for (; n < elements.length() && mover.rest() >= least; ++n)
+            mover.nested(msg, elements[n]);
+        elements.realloc(n);
+    }
+};
+
+// Bodies one after another to the end of the payload. The list read is as long as the octets it was read
+// from; the entries behind the last one are empty.
+template <typename Element, Label name>
+class RestOf : public ListOf<Element, name> {
+  public:
+    using ListOf<Element, name>::operator=;
+
+    template <Move move>
+    void transfer(FieldMover<move>& mover, Msg* msg, unsigned int) {
+        if constexpr (move == Move::Get)
+            get(mover, msg);
+        else
+            this->put(mover, msg);
+    }
+
+  private:
+    void get(FieldMover<Move::Get>& mover, Msg* msg) {
+        this->value().realloc(mover.rest());
+        for (Element& element : this->value()) {
+            if (mover.rest() > 0)
+                mover.nested(msg, element);
+            else
+                element = Element();
+        }
     }
 };
 

@@ -4,7 +4,10 @@
 
 #include <cstddef>
 #include <tuple>
+#include <type_traits>
 #include <utility>
+
+#include "vela/field.h"
 
 namespace vela {
 
@@ -52,6 +55,26 @@ constexpr auto fieldsOf(Row& row) {
     else { auto& [a, b, c, d, e, f, g, h, i, j, k] = row; return std::tie(a, b, c, d, e, f, g, h, i, j, k); }
     // clang-format on
 }
+
+template <typename Row, std::size_t i>
+using FieldAt = std::remove_reference_t<std::tuple_element_t<i, decltype(fieldsOf(std::declval<Row&>()))>>;
+
+// How many of a row's first i fields are no counts; all of those.
+template <typename Row, std::size_t i>
+constexpr std::size_t valuesBefore() {
+    if constexpr (i == 0)
+        return 0;
+    else
+        return valuesBefore<Row, i - 1>() + (CountField<FieldAt<Row, i - 1>> ? 0 : 1);
+}
+template <typename Row>
+inline constexpr std::size_t ValueCount = valuesBefore<Row, FieldCount<Row>>();
+
+// Variables that a body can be bound to: one for each field, or for each that is no count.
+template <typename Row, typename... Variables>
+concept BindsTo = (sizeof...(Variables) > 0) &&
+                  (sizeof...(Variables) == FieldCount<Row> ||
+                   sizeof...(Variables) == ValueCount<Row>)&&(!std::is_base_of_v<Row, Variables> && ...);
 
 }  // namespace vela
 

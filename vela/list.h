@@ -27,6 +27,18 @@ void printElement(std::ostream* out, const T& element) {
         *out << element;
 }
 
+// "{", the elements separated by one blank, "}"; octets are inserted as characters.
+template <typename Iterator>
+void printList(std::ostream* out, Iterator begin, Iterator end) {
+    *out << "{";
+    for (Iterator at = begin; at != end; ++at) {
+        if (at != begin)
+            *out << " ";
+        printElement(out, *at);
+    }
+    *out << "}";
+}
+
 template <typename T>
 class list : public virtualObject {
   public:
@@ -119,16 +131,7 @@ class staticList : public list<T> {
         return std::equal(begin(), end(), other.begin(), other.end());
     }
 
-    // "{", the elements separated by one blank, "}"; octets are inserted as characters.
-    void toStream(std::ostream* out) const override {
-        *out << "{";
-        for (const T& element : *this) {
-            if (&element != begin())
-                *out << " ";
-            printElement(out, element);
-        }
-        *out << "}";
-    }
+    void toStream(std::ostream* out) const override { printList(out, begin(), end()); }
 
   private:
     using list<T>::length_;

@@ -32,7 +32,9 @@ constexpr std::uint32_t descriptor(WireType type, unsigned int count = 1) {
     return ((count - 1) << 11) | (static_cast<std::uint32_t>(type) << 19);
 }
 constexpr unsigned int descriptorCount(std::uint32_t word) { return ((word & 0x7F800) >> 11) + 1; }
-constexpr WireType descriptorType(std::uint32_t word) { return static_cast<WireType>((word & 0xF80000) >> 19); }
+constexpr WireType descriptorType(std::uint32_t word) {
+    return static_cast<WireType>((word & 0xF80000) >> 19);
+}
 
 constexpr unsigned int elementSize(WireType type) {
     switch (type) {

@@ -78,6 +78,7 @@ TEST(KSSemaphore, ThePostIsSeenAtTheLastAttempt) {
 std::atomic<int> signalsHandled{0};
 
 TEST(KSSemaphore, SignalsDoNotEndAWait) {
+    signalsHandled = 0;
     struct sigaction handler {};
     handler.sa_handler = [](int) { ++signalsHandled; };  // no SA_RESTART: the system's wait is interrupted
     struct sigaction before {};

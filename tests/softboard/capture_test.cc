@@ -2,10 +2,10 @@
 
 #include <gtest/gtest.h>
 
-#include <filesystem>
-#include <fstream>
+#include <algorithm>
 
 #include "softboard/settings.h"
+#include "tests/softboard/temp_file.h"
 
 namespace softboard {
 namespace {
@@ -38,10 +38,10 @@ class PcapFile {
         return *this;
     }
 
+    // Valid until the test program ends or the next file is written.
     std::string write() const {
-        const auto path = std::filesystem::path(testing::TempDir()) / "softboard-capture-test.pcap";
-        std::ofstream(path, std::ios::binary) << data_;
-        return path;
+        static const TempFile file(".pcap");
+        return file.write(data_);
     }
 
   private:
@@ -50,8 +50,14 @@ class PcapFile {
 
 // The pseudo-header of link type 177: packet type, hardware type, length and 8 octets of address, protocol.
 Octets lapd(uint8_t packetType, const Octets& frame) {
-    Octets octets{0, packetType, 0x20, 0, 0, 1, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0x30};
-    octets.insert(octets.end(), frame.begin(), frame.end());
+    Octets octets;
+    octets.reserve(16 + frame.size());
+    for (const int octet : {0, int{packetType}, 0x20, 0, 0, 1, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0x30}) {
+        octets.push_back(static_cast<uint8_t>(octet));
+    }
+    for (const uint8_t octet : frame) {
+        octets.push_back(octet);
+    }
     return octets;
 }
 

@@ -40,7 +40,7 @@ class Host {
         if (nvMsgRead(queue_, 0, &msg) != NVSTATUS_OK) {
             return {};
         }
-        const Message message = messageOf(*msg);
+        Message message = messageOf(*msg);
         nvMsgFree(msg);
         return message;
     }

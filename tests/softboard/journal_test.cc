@@ -3,11 +3,11 @@
 #include <gtest/gtest.h>
 
 #include <cerrno>
-#include <filesystem>
 #include <fstream>
 #include <sstream>
 
 #include "softboard/message_text.h"
+#include "tests/softboard/temp_file.h"
 
 namespace softboard {
 namespace {
@@ -37,15 +37,13 @@ TEST(JournalTest, AfterClearingItIsEmptyAndCountsAnew) {
 }
 
 TEST(JournalTest, EachLineIsInTheFileAsSoonAsItIsWritten) {
-    const auto path = std::filesystem::path(testing::TempDir()) / "softboard-journal-test";
-    std::filesystem::remove(path);
+    const TempFile file(".journal");
     Journal journal;
-    ASSERT_TRUE(journal.writeTo(path));
+    ASSERT_TRUE(journal.writeTo(file.path()));
     journal.add(Journal::Way::hostToHost, {0, 1, host, host, {}});
     std::ostringstream text;
-    text << std::ifstream(path).rdbuf();
+    text << std::ifstream(file.path()).rdbuf();
     EXPECT_EQ(text.str(), "host->host 1 Ack {} from 1/0/0/0/1 to 1/0/0/0/1 trans 0\n");
-    std::filesystem::remove(path);
 }
 
 TEST(JournalTest, AFileThatCannotBeWrittenIsRefused) {
@@ -90,8 +88,10 @@ TEST(MessageTextTest, BodiesAreShownFieldByField) {
     for (const auto& c : cases) {
         EXPECT_EQ(bodyText({0, c.type, {}, {}, c.body}), c.text) << c.says;
     }
-    EXPECT_EQ(messageName(8388697), "CompUse");
-    EXPECT_EQ(messageName(4616), "?");
+    EXPECT_EQ(messageName({0, 8388697, {}, {}, {}}), "CompUse");
+    EXPECT_EQ(messageName({0, 4616, {}, {}, {}}), "?");
+    EXPECT_EQ(messageName({0, 0, {}, {}, {}}), "Wake");
+    EXPECT_EQ(messageName({0, 0, {}, {}, {8, 0, 0, 0}}), "Error");
 }
 
 }  // namespace

@@ -11,8 +11,6 @@
 
 #include "softboard/command_line.h"
 
-extern char** environ;
-
 namespace softboard {
 namespace {
 
@@ -40,6 +38,7 @@ class LauncherTest : public testing::Test {
     Ran runAs(const std::string& launcher, std::vector<std::string> arguments) {
         arguments.insert(arguments.begin(), launcher);
         std::vector<char*> argv;
+        argv.reserve(arguments.size() + 1);
         for (std::string& argument : arguments) {
             argv.push_back(argument.data());
         }

@@ -4,10 +4,9 @@
 #include <gtest/gtest.h>
 
 #include <cstring>
-#include <filesystem>
-#include <fstream>
 
 #include "softboard/settings.h"
+#include "tests/softboard/temp_file.h"
 
 namespace softboard {
 namespace {
@@ -25,9 +24,8 @@ std::string complaint(Act act) {
 }
 
 std::string write(const std::string& text) {
-    const auto path = std::filesystem::path(testing::TempDir()) / "softboard-scenario-test.toml";
-    std::ofstream(path) << text;
-    return path;
+    static const TempFile file(".toml");
+    return file.write(text);
 }
 
 TEST(SettingsTest, AProtocolIsANameOrANumber) {

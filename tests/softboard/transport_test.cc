@@ -230,6 +230,7 @@ TEST_F(TransportTest, AReaderThatComesAfterTheCloseIsToldSo) {
 
 TEST_F(TransportTest, ManyThreadsMayUseManyQueues) {
     std::vector<std::thread> threads;
+    threads.reserve(4);
     for (int i = 0; i < 4; ++i) {
         threads.emplace_back([] {
             Host host;

@@ -211,6 +211,7 @@ struct Field {
 std::vector<Field> fieldsOf(std::uint32_t count, va_list list) {
     std::vector<Field> fields;
     for (std::uint32_t i = 0; i < count; ++i) {
+        // NOLINTNEXTLINE(clang-analyzer-valist.Uninitialized): the callers start it
         const std::uint32_t descriptor = va_arg(list, std::uint32_t);
         fields.push_back({descriptor, va_arg(list, void*)});
     }

@@ -44,9 +44,14 @@ TEST(StaticList, ResizesByTheRuleAtEachBoundary) {
         const char* says;
         unsigned int from, to, capacity;
     } const cases[] = {
-        {"the capacity itself", 100, 100, 100}, {"half", 100, 50, 100},        {"just below half", 100, 49, 49},
-        {"half of an odd one", 101, 50, 101},   {"one more", 100, 101, 101},   {"nothing yet", 0, 5, 5},
-        {"empty of one", 1, 0, 1},              {"empty of two", 2, 0, 0},
+        {"the capacity itself", 100, 100, 100},
+        {"half", 100, 50, 100},
+        {"just below half", 100, 49, 49},
+        {"half of an odd one", 101, 50, 101},
+        {"one more", 100, 101, 101},
+        {"nothing yet", 0, 5, 5},
+        {"empty of one", 1, 0, 1},
+        {"empty of two", 2, 0, 0},
     };
     for (const auto& c : cases) {
         staticList<int> list(c.from);
@@ -202,7 +207,8 @@ TEST(KeyedList, PrintsAPointerAsAnAddress) {
     char octet = 'x';
     std::ostringstream address;
     address << static_cast<const void*>(&octet);
-    EXPECT_EQ(printed(vela::keyLink<unsigned int, char*>{&octet, 3}), "{Key: 3 Value: " + address.str() + "}");
+    EXPECT_EQ(printed(vela::keyLink<unsigned int, char*>{&octet, 3}),
+              "{Key: 3 Value: " + address.str() + "}");
 }
 
 TEST(Exception, PrintsItsName) {
