@@ -31,7 +31,8 @@ void dntoip(char* dst, const char* name) {
         return;
     std::array<unsigned char, 4> octets{};
     std::memcpy(octets.data(), found->h_addr_list[0], octets.size());
-    std::snprintf(dst, textSize, "%u.%u.%u.%u", octets[0], octets[1], octets[2], octets[3]);
+    static_cast<void>(
+        std::snprintf(dst, textSize, "%u.%u.%u.%u", octets[0], octets[1], octets[2], octets[3]));
 }
 
 int stn(const char* text) {

@@ -299,7 +299,7 @@ TEST_F(KSRemoteMsgQueueTest, ARelayThatClosesAfterAnyOctetOfAFrameIsAFailureAndW
 TEST_F(KSRemoteMsgQueueTest, FramesBeyondTheLimitAreErrors) {
     auto [queue, relay] = open();
     SleeplessSystem system;
-    std::thread sender([&] {
+    std::thread sender([&relay = relay] {
         relay.write(words({1001, 0, 102401, 0, 0}) + Octets(102401));
         relay.write(words({1001, 0, 0x7FFFFFFF, 0, 0}));
     });
@@ -313,7 +313,7 @@ TEST_F(KSRemoteMsgQueueTest, FramesBeyondTheLimitAreErrors) {
 
 TEST_F(KSRemoteMsgQueueTest, OneOctetAtATimeIsAFrameToo) {
     auto [queue, relay] = open();
-    std::thread sender([&] {
+    std::thread sender([&relay = relay] {
         for (const std::uint8_t octet : MessageFrame)
             relay.write({octet});
     });

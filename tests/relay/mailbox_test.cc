@@ -116,7 +116,7 @@ class Mailbox : public testing::TestWithParam<Way> {
     }
 
     // Each command is answered with these, all of its transaction unless they have one.
-    static void answers(std::vector<Message> with) {
+    static void answers(const std::vector<Message>& with) {
         fake_norv::onWrite([with](const Message& heard) {
             for (Message message : heard.type == Command ? with : std::vector<Message>()) {
                 message.transaction = message.transaction != 0 ? message.transaction : heard.transaction;

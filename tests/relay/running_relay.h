@@ -9,6 +9,7 @@
 #include <mutex>
 #include <string>
 #include <thread>
+#include <utility>
 #include <vector>
 
 #include "relay/server.h"
@@ -16,7 +17,7 @@
 class RunningRelay {
   public:
     explicit RunningRelay(relay::Options options = {})
-        : server_(ephemeral(options), [this](const std::string& line) { note(line); }),
+        : server_(ephemeral(std::move(options)), [this](const std::string& line) { note(line); }),
           port_(server_.endpoint().port),
           thread_([this] { server_.run(stop_.get()); }) {}
     ~RunningRelay() { stop(); }

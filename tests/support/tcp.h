@@ -103,8 +103,8 @@ class Listener {
     Listener() : fd_(::socket(AF_INET, SOCK_STREAM, 0)) {
         sockaddr_in address = loopbackAddress(0);
         socklen_t size = sizeof address;
-        ::bind(fd_, reinterpret_cast<const sockaddr*>(&address), size);
-        ::listen(fd_, 16);
+        static_cast<void>(::bind(fd_, reinterpret_cast<const sockaddr*>(&address), size));
+        static_cast<void>(::listen(fd_, 16));
         getsockname(fd_, reinterpret_cast<sockaddr*>(&address), &size);
         port_ = ntohs(address.sin_port);
     }
