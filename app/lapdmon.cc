@@ -91,7 +91,7 @@ void startTrace(std::unique_ptr<vela::CCS> opened) {
     opened->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0);
     opened->DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
     ccs = std::move(opened);
-    std::atexit(quit);
+    static_cast<void>(std::atexit(quit));
     watchSignals();
     Process.start(nullptr);
 }

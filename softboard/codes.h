@@ -2,6 +2,7 @@
 #ifndef SOFTBOARD_CODES_H
 #define SOFTBOARD_CODES_H
 
+#include <cstddef>
 #include <cstdint>
 
 namespace softboard {
@@ -32,11 +33,15 @@ enum MessageType : uint32_t {
     ieMessage = 5376,
     resultComplete = 8388608,
     componentResult = 8388615,
+    compAttrInfoResult = 8388614,
+    compAttrInfo = 8388666,
     compFind = 8388669,
     compInstAllocate = 8388670,
     compInstFree = 8388673,
     compUse = 8388697,
     compUnuse = 8388698,
+    compFindAll = 8388706,
+    compMultipleResult = 8388707,
 };
 
 // ErrorCode of an error reply.
@@ -53,6 +58,7 @@ constexpr uint8_t tscType = 0x12;
 constexpr uint8_t ccsType = 0x15;
 constexpr uint8_t anyNumber = 255;         // in a search
 constexpr uint32_t componentTypeKey = 0;   // of a search's attributes
+constexpr size_t mostFound = 8;            // components in one reply to a search for all
 constexpr uint32_t protocolParameter = 7;  // the trunk's protocol type
 constexpr uint32_t traceParameter = 10;    // 1: layer-2 trace on
 constexpr uint32_t layer2TraceEvents = 2;  // event group

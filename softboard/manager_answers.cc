@@ -1,5 +1,7 @@
 // What a board's managers answer: finding components and reserving them.
 #include <algorithm>
+#include <tuple>
+#include <vector>
 
 #include "softboard/answers.h"
 
@@ -52,6 +54,57 @@ void find(Request& request) {
     answerFound(request, search);
 }
 
+// The order in which components are listed.
+auto place(const Address& a) { return std::tuple(a.node, a.board, a.processor, a.component, a.instance); }
+
+// Those from the first address to the last, in order; a reply that does not hold them all names the next one.
+void findAll(Request& request) {
+    const Address first = request.body.address();
+    const Address last = request.body.address();
+    Search search;
+    readAttributes(request.body, search);
+    if (!request.body.ok()) {
+        request.refuse(ErrorCode::bodyTooShort);
+        return;
+    }
+    std::vector<const Component*> found;
+    for (const Component& component : request.board.components()) {
+        const auto is = place(component.address);
+        if (place(first) <= is && is <= place(last) && (!search.type || *search.type == component.type)) {
+            found.push_back(&component);
+        }
+    }
+    std::sort(found.begin(), found.end(),
+              [](const Component* a, const Component* b) { return place(a->address) < place(b->address); });
+    const size_t told = std::min(found.size(), mostFound);
+    request.reply.u32(static_cast<uint32_t>(told));
+    request.reply.address(told < found.size() ? found[told]->address : Address());
+    for (size_t i = 0; i < told; ++i) {
+        request.reply.address(found[i]->address).u32(componentTypeKey).u32(found[i]->type);
+    }
+}
+
+// A component has one attribute, its type.
+void attributes(Request& request) {
+    const Address address = request.body.address();
+    const uint32_t count = request.body.u32();
+    const uint32_t offset = request.body.u32();
+    if (!request.body.ok()) {
+        request.refuse(ErrorCode::bodyTooShort);
+        return;
+    }
+    const Component* component = request.board.at(address);
+    if (component == nullptr) {
+        request.refuse(ErrorCode::noSuchComponent);
+        return;
+    }
+    const bool told = count > 0 && offset == 0;
+    request.reply.address(address).u32(told ? 1 : 0);
+    if (told) {
+        request.reply.u32(componentTypeKey).u32(component->type);
+    }
+}
+
 void allocate(Request& request) {
     Search search{request.body.address(), {}};
     request.body.address();  // the cluster
@@ -60,7 +113,9 @@ void allocate(Request& request) {
 }
 
 constexpr Answer answers[] = {
+    {compAttrInfo, compAttrInfoResult, At::managers, attributes},
     {compFind, componentResult, At::managers, find},
+    {compFindAll, compMultipleResult, At::managers, findAll},
     {compInstAllocate, componentResult, At::managers, allocate},
     {compInstFree, resultComplete, At::both, acknowledge},
     {compUse, resultComplete, At::both, acknowledge},

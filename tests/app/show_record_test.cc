@@ -102,7 +102,7 @@ TEST_F(ShowRecord, WritesTheLocalTimeOfTheMoment) {
     std::tm shown{};
     const std::string text = log_.text();
     ASSERT_EQ(*strptime(text.c_str() + 1, "%a %b %e %H:%M:%S %Y", &shown), '\n') << text;
-    const std::time_t then = timegm(&shown) - 5 * 3600;
+    const std::time_t then = timegm(&shown) - std::time_t{5} * 3600;
     EXPECT_LE(before, then);
     EXPECT_LE(then, after);
 }
@@ -128,8 +128,8 @@ TEST_F(ShowRecord, DecodesAFrameOf257Octets) {
     EXPECT_EQ(text.find("Oversized"), std::string::npos);
     const std::string dump = text.substr(text.find("Hex Dump: \n"));
     EXPECT_EQ(dump.substr(0, 42), "Hex Dump: \n00 00 6f 00 00 00 00 00 00 00 \n");
-    EXPECT_EQ(dump.size(),
-              std::string("Hex Dump: \n").size() + 257 * 3 + 26);  // 25 lines of ten, one of seven
+    EXPECT_EQ(dump.size(), std::string("Hex Dump: \n").size() + std::size_t{257} * 3 +
+                               26);  // 25 lines of ten, one of seven
 }
 
 TEST_F(ShowRecord, RefusesALongerReceivedFrame) {

@@ -97,6 +97,60 @@ TEST_F(BoardTest, ASearchThatEndsEarlyIsAnError) {
     EXPECT_EQ(host_.ask(8388669, managers, {0, 0, 1, 1, 255, 0, 255, 255, 255, 255}).type, 0U);
 }
 
+// From one address to another of board 1, with one attribute: key 0, the type.
+Octets findAllBody(const Octets& from, const Octets& to, uint8_t type) {
+    Octets body = from;
+    body.insert(body.end(), to.begin(), to.end());
+    for (const uint8_t octet : {1, 0, 0, 0, 0, 0, 0, 0, +type, 0, 0, 0}) {
+        body.push_back(octet);
+    }
+    return body;
+}
+
+TEST_F(BoardTest, AllComponentsBetweenTwoAddressesAreListedInOrder) {
+    const Octets everything{0, 0, 1, 0, 0, 0, 0xff, 0xff, 1, 0xff, 0xff, 0, 0, 0, 0, 0};
+    const Message all = host_.ask(8388706, managers, everything);
+    EXPECT_EQ(all.type, 8388707U);
+    // Three, none after them, each with its address and type.
+    EXPECT_EQ(all.body, (Octets{3, 0, 0, 0, 0,    0, 0, 0, 0, 0,                 //
+                                0, 0, 1, 1, 0x12, 0, 0, 0, 0, 0, 0x12, 0, 0, 0,  //
+                                1, 0, 1, 1, 0x15, 0, 0, 0, 0, 0, 0x15, 0, 0, 0,  //
+                                2, 0, 1, 1, 0x15, 0, 0, 0, 0, 0, 0x15, 0, 0, 0}));
+    const Octets from{2, 0, 1, 1, 0x15, 0}, to{0xff, 0xff, 1, 0xff, 0xff, 0};
+    EXPECT_EQ(host_.ask(8388706, managers, findAllBody(from, to, 0x15)).body,
+              (Octets{1, 0, 0, 0, 0, 0, 0, 0, 0, 0, 2, 0, 1, 1, 0x15, 0, 0, 0, 0, 0, 0x15, 0, 0, 0}));
+    EXPECT_EQ(host_.ask(8388706, managers, findAllBody(from, to, 0x12)).body, Octets(10, 0));
+    EXPECT_EQ(host_.ask(8388706, managers, {0, 0, 1}).type, 0U);
+}
+
+TEST_F(BoardTest, AListThatDoesNotHoldAllNamesTheNextComponent) {
+    Scenario scenario = oneChannel({});
+    for (uint16_t number = 2; number < 10; ++number) {
+        scenario.channels.push_back(scenario.channels.front());
+        scenario.channels.back().number = number;
+    }
+    reset(scenario);
+    const Message first =
+        host_.ask(8388706, managers, {0, 0, 1, 0, 0, 0, 0xff, 0xff, 1, 0xff, 0xff, 0, 0, 0, 0, 0});
+    EXPECT_EQ(first.body.size(), 4U + 6 + 8 * 14);
+    EXPECT_EQ(Octets(first.body.begin(), first.body.begin() + 10), (Octets{8, 0, 0, 0, 8, 0, 1, 1, 0x15, 0}));
+    const Message rest =
+        host_.ask(8388706, managers, {8, 0, 1, 1, 0x15, 0, 0xff, 0xff, 1, 0xff, 0xff, 0, 0, 0, 0, 0});
+    EXPECT_EQ(Octets(rest.body.begin(), rest.body.begin() + 12),
+              (Octets{2, 0, 0, 0, 0, 0, 0, 0, 0, 0, 8, 0}));
+}
+
+TEST_F(BoardTest, AComponentHasItsTypeForAnAttribute) {
+    const Message reply = host_.ask(8388666, managers, {1, 0, 1, 1, 0x15, 0, 5, 0, 0, 0, 0, 0, 0, 0});
+    EXPECT_EQ(reply.type, 8388614U);
+    EXPECT_EQ(reply.body, (Octets{1, 0, 1, 1, 0x15, 0, 1, 0, 0, 0, 0, 0, 0, 0, 0x15, 0, 0, 0}));
+    EXPECT_EQ(host_.ask(8388666, managers, {1, 0, 1, 1, 0x15, 0, 5, 0, 0, 0, 1, 0, 0, 0}).body,
+              (Octets{1, 0, 1, 1, 0x15, 0, 0, 0, 0, 0}))
+        << "from the second on";
+    EXPECT_EQ(host_.ask(8388666, managers, {9, 0, 1, 1, 0x15, 0, 5, 0, 0, 0, 0, 0, 0, 0}).type, 0U);
+    EXPECT_EQ(host_.ask(8388666, managers, {1, 0}).type, 0U);
+}
+
 TEST_F(BoardTest, EachBoardHasManagersOfItsOwn) {
     const Message reply = host_.ask(8388669, {0, 3, 0, 0, 0}, {7, 0, 3, 255, 255, 0, 0, 0, 0, 0});
     EXPECT_EQ(reply.body, (Octets{7, 0, 3, 1, 0x15, 0}));

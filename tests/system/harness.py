@@ -1,6 +1,8 @@
 """Words for tests that run the real programs on the software board.
 
 A test waits for what a program writes, never for time to pass. LIMIT only ends a test that would wait for ever.
+
+The programs are named by the environment: run the tests with ctest (ctest --preset dev -R system -V).
 """
 
 import fcntl
