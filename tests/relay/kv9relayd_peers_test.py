@@ -4,7 +4,7 @@ import random
 import struct
 import unittest
 
-from relay_harness import CLOSE, CLOSED, MESSAGE, OPEN, Relay, RelayTest, frame, message, open_request, words
+from relay_harness import CLOSE, MESSAGE, OPEN, Relay, RelayTest, frame, message, open_request, words
 
 QUICK = ("--frame-timeout", "0.1", "--write-timeout", "0.2")
 

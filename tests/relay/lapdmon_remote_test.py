@@ -52,6 +52,18 @@ class SameLog(RelayTest):
         relay.stops()
 
 
+class Lost(RelayTest):
+    def test_a_relay_that_dies_during_a_trace_leaves_what_was_recorded(self):
+        relay = Relay(self, ("--frames", self.capture("call.pcap", CALL + [MARK])))
+        lapdmon = Program(self, LAPDMON, "-b1", "-f", "lost.log", REMOTE_NORV=f"127.0.0.1:{relay.port}")
+        lapdmon.screen.wait("Frame Error")
+        relay.kill()
+        lapdmon.errors.wait("is lost")
+        lapdmon.quits()  # each of its two requests waits for its answer
+        self.assertEqual((self.folder / "lost.log").read_text("latin-1").count("Hex Dump"), 6)
+        self.assertEqual(lapdmon.screen.text().count("Addressable::Timeout"), 2)
+
+
 class OnThePeer(RelayTest):
     """The relay is this test."""
 
