@@ -15,7 +15,7 @@ class KSAbstractMsgQueue {
 
     // Waits for the next message; the caller owns it.
     virtual std::uint32_t msgRead(NvMsg32Bit** out) = 0;
-    // Sends msg to its target address and takes it over.
+    // Sends msg to its target address and takes it over; one that was not sent goes to freeUnsent.
     virtual std::uint32_t msgWrite(NvMsg32Bit* msg) = 0;
 
     // Closes the queue if close() has not. No thread may use it any more.
@@ -23,6 +23,9 @@ class KSAbstractMsgQueue {
 
     // Makes the reader's msgRead return, so that it can be seen off before the queue goes.
     virtual void wakeReader() = 0;
+
+    // Frees what msgWrite has left to its caller: here, nothing.
+    virtual void freeUnsent(NvMsg32Bit* /*msg*/) {}
 
     // Wakes the reader if wakeReader() has not, and closes the queue: from now on msgRead fails. A thread
     // that reads returns.

@@ -2,8 +2,10 @@
 
 #include <pthread.h>
 
+#include <iostream>
 #include <utility>
 
+#include "hostsvc/KSRemoteService_ComFailure.h"
 #include "hostsvc/KSSleep.h"
 #include "hostsvc/KSTransportChoice.h"
 #include "hostsvc/descComp.h"
@@ -78,7 +80,9 @@ KSMsgRef KSMsgQueue::request(KSMsgRef& msg, unsigned timeoutMs, unsigned replyTy
     msg.setSrcAddr(hostDesc_);
     if (timeoutMs != 0)
         expect({msg.getTrans(), replyType, msg.getTgtAddr(), anySource != 0});
-    transport_->msgWrite(std::exchange(msg, KSMsgRef()).getMsgRef());
+    NvMsg32Bit* const sent = std::exchange(msg, KSMsgRef()).getMsgRef();
+    if (transport_->msgWrite(sent) != 0)
+        transport_->freeUnsent(sent);
     if (timeoutMs == 0)
         return KSMsgRef(0U);
     return replyLock_.tryLock(timeoutMs, PollMs) ? takeReply() : giveUp();
@@ -103,8 +107,15 @@ KSMsgRef KSMsgQueue::giveUp() {
     return {};
 }
 
+// A connection that is lost ends the reader, not the program: what was received stays good. Every failure has
+// been reported.
 void* KSMsgQueue::readerBody(void* control, void* arg) {
-    readNroute(static_cast<KSThread::control*>(control), static_cast<char*>(arg));
+    try {
+        readNroute(static_cast<KSThread::control*>(control), static_cast<char*>(arg));
+    } catch (const KSRemoteService_ComFailure& lost) {
+        std::cerr << "The connection to the remote message queue on " << lost.hostName() << " is lost"
+                  << std::endl;
+    }
     return nullptr;
 }
 
@@ -114,13 +125,22 @@ void KSMsgQueue::readNroute(KSThread::control* control, char* /*arg*/) {
     control->pushCleanup(KSMsgQueueThread_Cleanup, static_cast<void*>(&current));
     for (bool failed = false;;) {
         const bool wasFailing = failed;
-        failed = transport_->msgRead(&current) != 0;
+        failed = read(*control, current) != 0;
         control->testCancel();
         if (!failed)
             route(*control, current);
         else if (wasFailing)
             ks_sleep_ms(PollMs);  // a transport that is gone must not take the processor with it
         control->testCancel();
+    }
+}
+
+std::uint32_t KSMsgQueue::read(KSThread::control& control, NvMsg32Bit*& current) {
+    try {
+        return transport_->msgRead(&current);
+    } catch (const KSRemoteService_ComFailure&) {
+        control.popCleanup(1);  // while there still is what it cleans up
+        throw;
     }
 }
 

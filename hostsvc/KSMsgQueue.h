@@ -54,7 +54,8 @@ class KSMsgQueue : private KSRunnable {
     // KSMsgRef::AllocationError.
     KSMsgRef request(KSMsgRef& msg, unsigned timeoutMs, unsigned replyType, int anySource);
 
-    // The reader thread's body. Does not return; ends the thread when it is cancelled.
+    // The reader thread's body. Does not return; ends the thread when it is cancelled. Throws
+    // KSRemoteService_ComFailure when the connection to another machine is lost.
     void readNroute(KSThread::control* control, char* arg);
 
   protected:
@@ -91,6 +92,7 @@ class KSMsgQueue : private KSRunnable {
 
     // The reader's half, on its thread alone.
     void* readerBody(void* control, void* arg);
+    std::uint32_t read(KSThread::control& control, NvMsg32Bit*& current);
     void route(KSThread::control& control, NvMsg32Bit*& msg);
     bool acceptReply(NvMsg32Bit*& msg, NvMsg32Bit*& late);
     void handOn(KSThread::control& control, NvMsg32Bit*& msg);

@@ -3,8 +3,8 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "hostsvc/KSException.h"
 #include "hostsvc/KSLocalMsgQueue.h"
+#include "hostsvc/KSRemoteMsgQueue.h"
 
 const char* chooseHost(const char* hostName, const char* remoteNorv, const char* host) {
     const char* const named = hostName != nullptr ? hostName : remoteNorv;
@@ -15,7 +15,8 @@ const char* chooseHost(const char* hostName, const char* remoteNorv, const char*
 
 std::unique_ptr<KSAbstractMsgQueue> openTransport(NvCompDesc desc, unsigned a, unsigned b,
                                                   const char* hostName) {
-    if (chooseHost(hostName, std::getenv("REMOTE_NORV"), std::getenv("HOST")) == nullptr)
+    const char* const chosen = chooseHost(hostName, std::getenv("REMOTE_NORV"), std::getenv("HOST"));
+    if (chosen == nullptr)
         return std::make_unique<KSLocalMsgQueue>(desc, a, b);
-    throw KSResource_CreationError();  // there is no way to another machine yet
+    return std::make_unique<KSRemoteMsgQueue>(desc, a, b, chosen);
 }

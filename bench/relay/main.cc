@@ -1,0 +1,170 @@
+// What the road through the relay costs: events a second and the time of an answer, over the queue of this
+// machine and over a relay on loopback, in one run. Run it on the software board:
+//
+//     softboard --rate max --loop -- bench-relay [SECONDS]
+//
+// Here the relay shares the process, and so the processors, with the board and the host.
+#include <sys/eventfd.h>
+
+#include <algorithm>
+#include <chrono>
+#include <cstdlib>
+#include <cstring>
+#include <iomanip>
+#include <iostream>
+#include <memory>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "hostsvc/KSLocalMsgQueue.h"
+#include "hostsvc/KSMsgRef.h"
+#include "hostsvc/KSRemoteMsgQueue.h"
+#include "relay/server.h"
+
+namespace {
+
+using Clock = std::chrono::steady_clock;
+using Microseconds = std::chrono::duration<double, std::micro>;
+
+constexpr NvCompDesc Ccs{1, 1, 0, 1, 0x15, 0, 0};
+constexpr unsigned SetParm = 8;
+constexpr unsigned GetParm = 18;
+constexpr unsigned DetectEvt = 22;
+constexpr unsigned EvtDetected = 32;
+constexpr std::uint8_t TraceParm = 10;
+constexpr std::uint8_t ProtocolParm = 7;
+
+class BackgroundRelay {
+  public:
+    BackgroundRelay()
+        : server_({{0x7F000001, 0}}, [](const std::string&) {}),
+          thread_([this] { server_.run(stop_.get()); }) {}
+    ~BackgroundRelay() {
+        eventfd_write(stop_.get(), 1);
+        thread_.join();
+    }
+    std::string host() const { return server_.endpoint().text(); }
+
+  private:
+    relay::Descriptor stop_{eventfd(0, EFD_CLOEXEC)};
+    relay::Server server_;
+    std::thread thread_;
+};
+
+class Host {
+  public:
+    explicit Host(std::unique_ptr<KSAbstractMsgQueue> queue) : queue_(std::move(queue)) {}
+
+    void tell(unsigned type, const std::vector<std::uint8_t>& body) {
+        KSMsgRef msg(static_cast<unsigned>(body.size()));
+        msg.setMsgType(type);
+        msg.setSrcAddr(queue_->getHostDesc());
+        msg.setTgtAddr(Ccs);
+        std::memcpy(msg.getMsgRef() + 1, body.data(), body.size());
+        queue_->msgWrite(msg.getMsgRef());
+    }
+
+    // The type of the next message.
+    unsigned hear() {
+        NvMsg32Bit* read = nullptr;
+        if (queue_->msgRead(&read) != 0)
+            std::exit(EXIT_FAILURE);
+        KSMsgRef msg(read);
+        const unsigned type = msg.getMsgType();
+        msg.free();
+        return type;
+    }
+
+    void hearUntil(unsigned type) {
+        while (hear() != type) {
+        }
+    }
+
+    std::vector<std::uint8_t> detectBody() const {
+        const NvCompDesc host = queue_->getHostDesc();
+        return {static_cast<std::uint8_t>(host.instance),
+                static_cast<std::uint8_t>(host.instance >> 8),
+                host.board,
+                host.processor,
+                host.component,
+                host.node,
+                2,
+                0,
+                0,
+                0,
+                0,
+                0,
+                0,
+                0};
+    }
+
+  private:
+    std::unique_ptr<KSAbstractMsgQueue> queue_;
+};
+
+struct Figures {
+    double eventsPerSecond;
+    double median;  // of an answer, in microseconds
+    double percentile99;
+};
+
+void measureAnswers(Host& host, std::chrono::duration<double> time, Figures& figures) {
+    std::vector<double> took;
+    const auto end = Clock::now() + time;
+    while (Clock::now() < end) {
+        const auto asked = Clock::now();
+        host.tell(GetParm, {ProtocolParm, 0, 0, 0});
+        host.hear();
+        took.push_back(Microseconds(Clock::now() - asked).count());
+    }
+    std::sort(took.begin(), took.end());
+    figures.median = took[took.size() / 2];
+    figures.percentile99 = took[took.size() * 99 / 100];
+}
+
+void measureEvents(Host& host, std::chrono::duration<double> time, Figures& figures) {
+    host.tell(DetectEvt, host.detectBody());
+    host.tell(SetParm, {TraceParm, 0, 0, 0, 1, 0, 0, 0});
+    host.hearUntil(EvtDetected);
+    const auto start = Clock::now();
+    unsigned long count = 0;
+    while (Clock::now() - start < time)
+        count += host.hear() == EvtDetected ? 1 : 0;
+    figures.eventsPerSecond =
+        static_cast<double>(count) / std::chrono::duration<double>(Clock::now() - start).count();
+    host.tell(SetParm, {TraceParm, 0, 0, 0, 0, 0, 0, 0});
+    host.hearUntil(SetParm + 1);
+}
+
+Figures measure(std::unique_ptr<KSAbstractMsgQueue> queue, double seconds) {
+    Host host(std::move(queue));
+    Figures figures{};
+    measureAnswers(host, std::chrono::duration<double>(seconds), figures);
+    measureEvents(host, std::chrono::duration<double>(seconds), figures);
+    return figures;
+}
+
+void print(const char* way, const Figures& figures) {
+    std::cout << std::left << std::setw(8) << way << std::right << std::fixed << std::setprecision(0)
+              << std::setw(12) << figures.eventsPerSecond << std::setprecision(1) << std::setw(16)
+              << figures.median << std::setw(16) << figures.percentile99 << '\n';
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    const double seconds = argc > 1 ? std::strtod(argv[1], nullptr) : 2;
+    nvDrvSetInterface(0, 0);
+    const Figures local = measure(std::make_unique<KSLocalMsgQueue>(NvCompDesc{}, 512, 50), seconds);
+    const BackgroundRelay relay;
+    const Figures remote =
+        measure(std::make_unique<KSRemoteMsgQueue>(NvCompDesc{}, 512, 50, relay.host().c_str()), seconds);
+    std::cout << "          events/s   median answer   99% of answers (microseconds)\n";
+    print("local", local);
+    print("relay", remote);
+    std::cout << std::setprecision(1) << "added by the relay: " << remote.median - local.median
+              << " microseconds an answer; " << 100 * remote.eventsPerSecond / local.eventsPerSecond
+              << " % of the events\n";
+    return EXIT_SUCCESS;
+}

@@ -1,0 +1,216 @@
+#include "hostsvc/KSRemoteMsgQueue.h"
+
+#include <netinet/tcp.h>
+#include <sys/socket.h>
+
+#include <array>
+#include <cstring>
+#include <iostream>
+#include <system_error>
+#include <thread>
+
+#include "hostsvc/KSByteOrder.h"
+#include "hostsvc/KSException.h"
+#include "hostsvc/KSHeaderBlock.h"
+#include "hostsvc/KSSleep.h"
+
+namespace {
+
+// The relay protocol's frames.
+constexpr std::uint32_t MessageFrame = 1001;
+constexpr std::uint32_t OpenedFrame = 1002;
+constexpr std::uint32_t OpenFrame = 1003;
+constexpr std::uint32_t CloseFrame = 2000;
+constexpr std::uint32_t ClosedFrame = 2001;
+
+constexpr unsigned AnswerMs = 5000;  // for the relay to open or close a queue
+constexpr unsigned PollMs = 10;
+constexpr unsigned PauseSeconds = 6;
+
+template <std::size_t N>
+msg_t frameOf(std::uint32_t type, std::array<std::uint32_t, N>& words) {
+    return {type, 0, sizeof words, 0, reinterpret_cast<char*>(words.data()), nullptr};
+}
+
+// Ends a connection whose relay does not answer in time, so that whoever reads it wakes.
+class Patience {
+  public:
+    explicit Patience(const sock& connection)
+        : watcher_([this, &connection] {
+              if (!answered_.tryLock(AnswerMs, PollMs))
+                  connection.shutdown(SHUT_RDWR);
+          }) {}
+    Patience(const Patience&) = delete;
+    Patience& operator=(const Patience&) = delete;
+    ~Patience() {
+        answered_.unlock();
+        watcher_.join();
+    }
+
+  private:
+    struct HeldMutex : KSMutex {
+        HeldMutex() { lock(); }
+    } answered_;
+    std::thread watcher_;
+};
+
+}  // namespace
+
+class KSRemoteMsgQueue::ReceivedFrame {
+  public:
+    explicit ReceivedFrame(sock& connection) : result_(connection.get_msg(frame_)) {}
+    ReceivedFrame(const ReceivedFrame&) = delete;
+    ReceivedFrame& operator=(const ReceivedFrame&) = delete;
+    ~ReceivedFrame() { free_msg(frame_); }
+
+    bool good() const { return result_ == 0 && frame_.type != CloseFrame; }
+    bool is(std::uint32_t type) const { return result_ == 0 && frame_.type == type; }
+    // Its header has come, and the rest has not.
+    bool brokenOff() const { return result_ != 0 && frame_.data != nullptr; }
+    const msg_t& operator*() const { return frame_; }
+
+  private:
+    msg_t frame_;
+    long result_;
+};
+
+KSRemoteMsgQueue::KSRemoteMsgQueue(NvCompDesc desc, unsigned a, unsigned b, const char* hostName)
+    : hostName_(hostName), connection_(hostName, Port) {
+    if (connection_.failed() || connection_.connect() < 0)
+        throw KSResource_CreationError();
+    keepAlive();
+    handshake_.lock();
+    open(desc, a, b);
+}
+
+KSRemoteMsgQueue::~KSRemoteMsgQueue() {
+    KSRemoteMsgQueue::close();
+    const std::lock_guard readerHasLeft(reading_);
+}
+
+// Frames are small and waited for; a relay's machine that has gone, or reads no more, is noticed.
+void KSRemoteMsgQueue::keepAlive() const {
+    const struct {
+        int level, option, value;
+    } options[] = {{IPPROTO_TCP, TCP_NODELAY, 1},   {SOL_SOCKET, SO_KEEPALIVE, 1},
+                   {IPPROTO_TCP, TCP_KEEPIDLE, 30}, {IPPROTO_TCP, TCP_KEEPINTVL, 10},
+                   {IPPROTO_TCP, TCP_KEEPCNT, 3},   {IPPROTO_TCP, TCP_USER_TIMEOUT, 60000}};
+    for (const auto& each : options)
+        setsockopt(connection_.descriptor(), each.level, each.option, &each.value, sizeof each.value);
+}
+
+void KSRemoteMsgQueue::open(NvCompDesc desc, unsigned a, unsigned b) try {
+    std::array<std::uint32_t, 7> request{desc.node, desc.board, desc.processor, desc.component, desc.instance,
+                                         a,         b};
+    KS_htonU32(request.data(), request.data(), sizeof request);
+    const Patience patience(connection_);
+    if (sendFrame(frameOf(OpenFrame, request)) != 0)
+        throw KSResource_CreationError();
+    const ReceivedFrame reply(connection_);
+    std::array<std::uint32_t, 5> address{};
+    if (!reply.is(OpenedFrame) || (*reply).size < static_cast<int>(sizeof address))
+        throw KSResource_CreationError();
+    KS_ntohU32(address.data(), (*reply).data, sizeof address);
+    const auto octet = [&](std::size_t word) { return static_cast<std::uint8_t>(address[word]); };
+    hostDesc = {static_cast<std::uint16_t>(address[4]), octet(1), 0, octet(2), octet(3), octet(0), 0};
+} catch (const std::system_error&) {  // no thread
+    throw KSResource_CreationError();
+}
+
+long KSRemoteMsgQueue::sendFrame(const msg_t& frame) {
+    const std::lock_guard lock(writing_);
+    return connection_.snd_msg(frame);
+}
+
+std::uint32_t KSRemoteMsgQueue::msgWrite(NvMsg32Bit* msg) {
+    KSHeaderBlock block = ks_headerBlock(*msg);
+    msg_t frame = frameOf(MessageFrame, block);
+    frame.ex_size = static_cast<std::int32_t>(msg->size);
+    frame.ex_data = reinterpret_cast<char*>(msg) + NVMSG_HEADER_SIZE;
+    if (sendFrame(frame) != 0)
+        return NVSTATUS_ERROR;
+    nvMsgFree(msg);
+    return NVSTATUS_OK;
+}
+
+void KSRemoteMsgQueue::freeUnsent(NvMsg32Bit* msg) { nvMsgFree(msg); }
+
+std::uint32_t KSRemoteMsgQueue::msgRead(NvMsg32Bit** out) {
+    const std::lock_guard lock(reading_);
+    const ReceivedFrame frame(connection_);
+    if (frame.is(ClosedFrame)) {
+        closed();
+        return NVSTATUS_ERROR;
+    }
+    if (frame.good()) {
+        retryBudget_ = RetryBudget;
+        return takeMessage(*frame, out);
+    }
+    failed(frame.brokenOff(), out);
+    return NVSTATUS_ERROR;
+}
+
+void KSRemoteMsgQueue::closed() {
+    closed_ = true;
+    handshake_.unlock();
+}
+
+std::uint32_t KSRemoteMsgQueue::takeMessage(const msg_t& frame, NvMsg32Bit** out) {
+    NvMsg32Bit* msg = nullptr;
+    nvMsgAllocate(static_cast<std::uint32_t>(frame.ex_size), &msg);
+    *out = msg;
+    if (msg == nullptr)
+        return NVSTATUS_ERROR;
+    ks_fillHeader(*msg, frame.data, frame.size);
+    std::memcpy(reinterpret_cast<char*>(msg) + NVMSG_HEADER_SIZE, frame.ex_data,
+                static_cast<std::size_t>(frame.ex_size));
+    return NVSTATUS_OK;
+}
+
+void KSRemoteMsgQueue::failed(bool withinFrame, NvMsg32Bit** out) {
+    std::cerr << "Error communicating with remote message queue on " << hostName_ << std::endl;
+    if (withinFrame) {
+        *out = nullptr;
+        if (!closing_)
+            ks_sleep(PauseSeconds);
+    }
+    if (--retryBudget_ <= 0)
+        throw KSRemoteService_ComFailure(hostName_.c_str(), Port);
+}
+
+// The reader may have seen its cancellation and read no more: then the relay's word is looked for here. It
+// cannot come any more once the connection has ended.
+void KSRemoteMsgQueue::lookForClosed() {
+    const std::lock_guard lock(reading_);
+    while (!closed_) {
+        const ReceivedFrame frame(connection_);
+        if (frame.is(ClosedFrame) || connection_.failed())
+            closed();
+    }
+}
+
+void KSRemoteMsgQueue::awaitClosed() {
+    std::thread other;
+    try {
+        other = std::thread([this] { lookForClosed(); });
+    } catch (const std::system_error&) {  // the reader alone, then
+    }
+    handshake_.tryLock(AnswerMs, PollMs);
+    connection_.shutdown(SHUT_RDWR);
+    if (other.joinable())
+        other.join();
+}
+
+// A relay that cannot even be asked is not waited for.
+void KSRemoteMsgQueue::wakeReader() {
+    if (closing_.exchange(true))
+        return;
+    msg_t request;
+    request.type = CloseFrame;
+    if (sendFrame(request) == 0)
+        awaitClosed();
+    else
+        connection_.shutdown(SHUT_RDWR);
+}
+
+void KSRemoteMsgQueue::close() { wakeReader(); }

@@ -1,0 +1,97 @@
+#include "relay/command_line.h"
+
+#include <CLI/CLI.hpp>
+#include <cmath>
+#include <vector>
+
+namespace relay {
+
+namespace {
+
+constexpr const char* footer =
+    "Hosts reach the boards of this machine with REMOTE_NORV=ADDR:PORT. Whoever may connect may drive the\n"
+    "boards, and what is said can be read on the way. Without options only this machine may: hosts "
+    "elsewhere\n"
+    "come through SSH,\n"
+    "  ssh -N -L 6554:127.0.0.1:6554 user@board-machine\n"
+    "or, in a network that is trusted, directly:\n"
+    "  kv9relayd --listen 0.0.0.0:6554 --allow 192.168.1.0/24\n";
+
+// Given as text, checked and stored by us, so that what is wrong is said in our words.
+struct Given {
+    std::string listen;
+    std::vector<std::string> allow;
+    double frameTimeout = 10;
+    double writeTimeout = 10;
+};
+
+void addOptions(CLI::App& app, Given& given, Options& options) {
+    app.add_option("--listen", given.listen,
+                   "Where to listen; port 0 has the system choose one (default: 127.0.0.1:6554)")
+        ->type_name("ADDR[:PORT]");
+    app.add_option("--allow", given.allow,
+                   "Who may connect, this machine included; may be given again (default: 127.0.0.0/8)")
+        ->type_name("CIDR")
+        ->allow_extra_args(false);
+    app.add_option("--max-clients", options.maxClients, "Most connections at a time (default: 128)")
+        ->type_name("N")
+        ->check(CLI::Range(1, 10000));
+    app.add_option("--frame-timeout", given.frameTimeout,
+                   "Time for a host to send the rest of a frame (default: 10)")
+        ->type_name("SECONDS")
+        ->check(CLI::Range(0.001, 3600.0));
+    app.add_option("--write-timeout", given.writeTimeout, "Time for a host to take a frame (default: 10)")
+        ->type_name("SECONDS")
+        ->check(CLI::Range(0.001, 3600.0));
+    app.set_help_flag("--help,-h", "Print this and exit");
+    app.set_version_flag("--version", "kv9relayd " RELAY_VERSION, "Print the version and exit");
+}
+
+std::chrono::milliseconds milliseconds(double seconds) {
+    return std::chrono::milliseconds(std::lround(seconds * 1000));
+}
+
+void use(const Given& given, Options& options) {
+    options.patience = {milliseconds(given.frameTimeout), milliseconds(given.writeTimeout)};
+    if (!given.listen.empty()) {
+        const auto endpoint = Endpoint::parse(given.listen, options.listen.port);
+        if (!endpoint)
+            throw BadCommandLine("--listen " + given.listen +
+                                 ": not an IPv4 address, or one with a colon and a port behind it");
+        options.listen = *endpoint;
+    }
+    for (const std::string& text : given.allow) {
+        const auto cidr = Cidr::parse(text);
+        if (!cidr)
+            throw BadCommandLine("--allow " + text + ": not an IPv4 network such as 192.168.1.0/24");
+        options.allow.push_back(*cidr);
+    }
+    if (!loopback.contains(options.listen.address) && options.allow.empty())
+        throw BadCommandLine(
+            "--listen " + options.listen.text() +
+            " would let everyone who reaches this machine drive its boards: say with --allow CIDR who may "
+            "(for example --allow 192.168.1.0/24), or listen on 127.0.0.1 and let hosts come through SSH");
+}
+
+}  // namespace
+
+CommandLine parseCommandLine(int argc, const char* const* argv) {
+    CommandLine commandLine;
+    Given given;
+    CLI::App app("Lets lapdmon on other machines trace the KV9 boards of this one.", "kv9relayd");
+    app.footer(footer);
+    addOptions(app, given, commandLine.options);
+    try {
+        app.parse(argc, argv);
+        use(given, commandLine.options);
+    } catch (const CLI::CallForHelp&) {
+        commandLine.told = app.help();
+    } catch (const CLI::CallForVersion& version) {
+        commandLine.told = std::string(version.what()) + "\n";
+    } catch (const CLI::ParseError& error) {
+        throw BadCommandLine(std::string(error.what()) + " (--help tells more)");
+    }
+    return commandLine;
+}
+
+}  // namespace relay

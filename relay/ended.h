@@ -1,0 +1,16 @@
+// Why a connection ends, in the words of the log.
+#ifndef RELAY_ENDED_H
+#define RELAY_ENDED_H
+
+#include <stdexcept>
+
+namespace relay {
+
+class Ended : public std::runtime_error {
+  public:
+    using std::runtime_error::runtime_error;
+};
+
+}  // namespace relay
+
+#endif

@@ -1,0 +1,71 @@
+#include <sys/resource.h>
+#include <sys/signalfd.h>
+
+#include <csignal>
+#include <cstdlib>
+#include <iostream>
+#include <sstream>
+
+#include "norv/norv.h"
+#include "relay/command_line.h"
+#include "relay/notify.h"
+#include "relay/server.h"
+
+namespace {
+
+constexpr int badCommandLine = 2;
+
+// One line in one piece, whichever thread it is from.
+void logLine(const std::string& line) {
+    const std::string whole = "kv9relayd: " + line + "\n";
+    static_cast<void>(!write(STDERR_FILENO, whole.data(), whole.size()));
+}
+
+// Both signals as a descriptor, for this thread and those to come.
+relay::Descriptor awaitedSignals() {
+    sigset_t signals;
+    sigemptyset(&signals);
+    sigaddset(&signals, SIGTERM);
+    sigaddset(&signals, SIGINT);
+    pthread_sigmask(SIG_BLOCK, &signals, nullptr);
+    return relay::Descriptor(signalfd(-1, &signals, SFD_CLOEXEC | SFD_NONBLOCK));
+}
+
+// Each connection takes a descriptor, and the transport library may keep one for its queue.
+void allowMoreOpenFiles() {
+    rlimit limit{};
+    if (getrlimit(RLIMIT_NOFILE, &limit) == 0) {
+        limit.rlim_cur = limit.rlim_max;
+        setrlimit(RLIMIT_NOFILE, &limit);
+    }
+}
+
+void serve(const relay::Options& options) {
+    const relay::Descriptor signals = awaitedSignals();
+    allowMoreOpenFiles();
+    if (nvDrvSetInterface(0, 0) != NVSTATUS_OK)
+        throw std::runtime_error("the transport library does not start");
+    relay::Server server(options, logLine);
+    std::cout << "kv9relayd: listening on " << server.endpoint().text() << std::endl;
+    relay::notify("READY=1");
+    server.run(signals.get(), [] { relay::notify("STOPPING=1"); });
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    try {
+        const relay::CommandLine commandLine = relay::parseCommandLine(argc, argv);
+        if (!commandLine.told.empty())
+            std::cout << commandLine.told;
+        else
+            serve(commandLine.options);
+        return EXIT_SUCCESS;
+    } catch (const relay::BadCommandLine& error) {
+        logLine(error.what());
+        return badCommandLine;
+    } catch (const std::exception& error) {
+        logLine(error.what());
+        return EXIT_FAILURE;
+    }
+}

@@ -1,0 +1,59 @@
+#include "relay/transport_queue.h"
+
+#include "relay/ended.h"
+
+namespace relay {
+
+namespace {
+
+// Nothing that a board sends; a host that sends one gets it back, or another just like it.
+constexpr std::uint32_t markTransaction = 0xFFFFFF;
+
+}  // namespace
+
+TransportQueue::TransportQueue() : handle_(nvQueueOpen()) {
+    if (handle_ == NVSTATUS_ERROR)
+        throw Ended("the transport library opens no more queues");
+    if (nvQueueBind(handle_, &address_) == NVSTATUS_ERROR) {
+        nvQueueClose(handle_);
+        throw Ended("the transport library binds no more queues");
+    }
+}
+
+TransportQueue::~TransportQueue() { close(); }
+
+void TransportQueue::close() {
+    if (!open_)
+        return;
+    open_ = false;
+    nvQueueUnbind(handle_, address_);
+    nvQueueClose(handle_);
+}
+
+Message TransportQueue::read() const {
+    NvMsg32Bit* msg = nullptr;
+    return Message(nvMsgRead(handle_, 0, &msg) == NVSTATUS_OK ? msg : nullptr);
+}
+
+void TransportQueue::write(Message msg) const {
+    setSource(*msg, address_);
+    nvMsgWrite(handle_, msg.release(), 0);
+}
+
+bool TransportQueue::mark() const {
+    Message msg = newMessage(0);
+    if (msg == nullptr)
+        return false;
+    msg->transaction = markTransaction << 8 | (msg->transaction & 0xFFU);
+    msg->type = 0;
+    setTarget(*msg, address_);
+    write(std::move(msg));
+    return true;
+}
+
+bool TransportQueue::isMark(const NvMsg32Bit& msg) const {
+    return msg.transaction >> 8 == markTransaction && msg.type == 0 && msg.size == 0 &&
+           same(sourceOf(msg), address_);
+}
+
+}  // namespace relay

@@ -1,0 +1,485 @@
+#include "hostsvc/KSRemoteMsgQueue.h"
+
+#include <gmock/gmock.h>
+
+#include <atomic>
+#include <condition_variable>
+#include <cstring>
+#include <future>
+#include <iostream>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <thread>
+
+#include "hostsvc/KSException.h"
+#include "hostsvc/KSMsgQueue.h"
+#include "hostsvc/descComp.h"
+#include "tests/support/fake_norv.h"
+#include "tests/support/tcp.h"
+#include "tests/support/test_system.h"
+
+namespace {
+
+using fake_norv::Op;
+using tcp::Connection;
+using tcp::Octets;
+using tcp::operator+;
+using tcp::words;
+using testing::ElementsAre;
+using testing::internal::CaptureStderr;
+using testing::internal::GetCapturedStderr;
+
+constexpr NvCompDesc Asked{1005, 2, 0, 3, 4, 1, 0};
+constexpr NvCompDesc Given{0x1234, 12, 0, 13, 14, 11, 0};
+constexpr std::size_t OpenRequestSize = 20 + 28;
+constexpr std::size_t HeaderSize = 20;
+
+const Octets Opened = words({1002, 0, 20, 0, 0}) + words({11, 12, 13, 14, 0x1234});
+const Octets Closed = words({2001, 0, 0, 0, 0});
+const Octets CloseRequest = words({2000, 0, 0, 0, 0});
+
+// A message of type 9, transaction 10000 and low octet 0x5A, from 0.1.1.21.2 to Given, with a body of three.
+const Octets Block = words({0x5A, 10000, 9, 0, 1, 1, 11, 12, 13, 2, 21, 0x1234, 14, 3});
+const Octets Body{1, 2, 3};
+const Octets MessageFrame = words({1001, 0, 56, 3, 0}) + Block + Body;
+
+Octets withoutSendersWord(Octets frame) {
+    std::fill(frame.begin() + 16, frame.begin() + 20, 0);
+    return frame;
+}
+
+Octets octetsOf(const KSMsgRef& msg) {
+    Octets octets(NVMSG_HEADER_SIZE + msg.getSize());
+    std::memcpy(octets.data(), msg.getMsgRef(), octets.size());
+    return octets;
+}
+
+// The relay is what the test writes and reads at the other end.
+class KSRemoteMsgQueueTest : public testing::Test {
+  protected:
+    KSRemoteMsgQueueTest() { fake_norv::reset(); }
+    ~KSRemoteMsgQueueTest() override {
+        EXPECT_EQ(fake_norv::outstanding(), 0U);
+        EXPECT_THAT(fake_norv::misuses(), ElementsAre());
+    }
+
+    std::unique_ptr<KSRemoteMsgQueue> make() const {
+        return std::make_unique<KSRemoteMsgQueue>(Asked, 512, 50, listener_.host().c_str());
+    }
+
+    // A queue, and its relay's end of the connection.
+    std::pair<std::unique_ptr<KSRemoteMsgQueue>, Connection> open() const {
+        auto queue = std::async(std::launch::async, [this] { return make(); });
+        Connection relay = listener_.accept();
+        relay.read(OpenRequestSize);
+        relay.write(Opened);
+        return {queue.get(), std::move(relay)};
+    }
+
+    // The queue goes, and the relay closes as it should.
+    static void close(std::unique_ptr<KSRemoteMsgQueue>& queue, const Connection& relay) {
+        std::thread other([&] {
+            relay.read(HeaderSize);
+            relay.write(Closed);
+        });
+        queue.reset();
+        other.join();
+    }
+
+    std::string errorLine() const {
+        return "Error communicating with remote message queue on " + listener_.host() + "\n";
+    }
+
+    std::string errorLines(int count) const {
+        std::string lines;
+        for (; count > 0; --count)
+            lines += errorLine();
+        return lines;
+    }
+
+    tcp::Listener listener_;
+};
+
+TEST_F(KSRemoteMsgQueueTest, OpeningSendsTheAddressAndTheArgumentsAndTakesTheHostAddressFromTheReply) {
+    auto making = std::async(std::launch::async, [this] { return make(); });
+    Connection relay = listener_.accept();
+    EXPECT_EQ(withoutSendersWord(relay.read(OpenRequestSize)),
+              words({1003, 0, 28, 0, 0}) + words({1, 2, 3, 4, 1005, 512, 50}));
+    relay.write(Opened);
+    auto queue = making.get();
+    EXPECT_TRUE(descComp(queue->getHostDesc(), Given));
+    close(queue, relay);
+}
+
+TEST_F(KSRemoteMsgQueueTest, ANameWithAPortLeadsToTheRelayToo) {
+    const std::string host = listener_.host("localhost");
+    auto making = std::async(std::launch::async,
+                             [&] { return std::make_unique<KSRemoteMsgQueue>(Asked, 0, 0, host.c_str()); });
+    Connection relay = listener_.accept();
+    relay.read(OpenRequestSize);
+    relay.write(Opened);
+    auto queue = making.get();
+    close(queue, relay);
+}
+
+TEST_F(KSRemoteMsgQueueTest, WithoutARelayOpeningThrows) {
+    EXPECT_THROW(KSRemoteMsgQueue(Asked, 0, 0, "127.0.0.1:1"), KSResource_CreationError);
+    EXPECT_THROW(KSRemoteMsgQueue(Asked, 0, 0, "no such name"), KSResource_CreationError);
+}
+
+TEST_F(KSRemoteMsgQueueTest, ARelayThatRefusesMakesOpeningThrow) {
+    for (const Octets& answer : {words({1001, 0, 20, 0, 0}) + words({11, 12, 13, 14, 15}), CloseRequest,
+                                 Closed, words({1002, 0, 16, 0, 0}) + words({11, 12, 13, 14}),
+                                 words({1002, 0, 102401, 0, 0}) + Octets(102401), words({0, 0, 0, 0, 0}),
+                                 words({1002, 0, 0xFFFFFFFF, 0, 0})}) {
+        auto making = std::async(std::launch::async, [this] { return make(); });
+        Connection relay = listener_.accept();
+        relay.read(OpenRequestSize);
+        relay.write(answer);
+        EXPECT_THROW(making.get(), KSResource_CreationError);
+        EXPECT_TRUE(relay.ends());
+    }
+}
+
+TEST_F(KSRemoteMsgQueueTest, ARelayThatClosesAfterAnyOctetOfItsAnswerMakesOpeningThrow) {
+    for (std::size_t n = 0; n < Opened.size(); ++n) {
+        auto making = std::async(std::launch::async, [this] { return make(); });
+        Connection relay = listener_.accept();
+        relay.read(OpenRequestSize);
+        relay.write({Opened.begin(), Opened.begin() + static_cast<long>(n)});
+        relay.close();
+        EXPECT_THROW(making.get(), KSResource_CreationError) << n;
+    }
+}
+
+TEST_F(KSRemoteMsgQueueTest, ARelayThatDoesNotAnswerIsGivenUpAfterFiveSeconds) {
+    SleeplessSystem system;
+    std::promise<void> read;
+    system.insteadOfNapping = [&, wait = read.get_future().share()] { wait.wait(); };
+    auto making = std::async(std::launch::async, [this] { return make(); });
+    Connection relay = listener_.accept();
+    relay.read(OpenRequestSize);
+    relay.write({Opened.begin(), Opened.end() - 1});
+    read.set_value();
+    EXPECT_THROW(making.get(), KSResource_CreationError);
+    EXPECT_EQ(system.naps(), std::vector<long>(500, 10000));
+}
+
+TEST_F(KSRemoteMsgQueueTest, AMessageIsWrittenAsItsHeaderBlockAndItsBody) {
+    auto [queue, relay] = open();
+    KSMsgRef msg(3U);
+    msg.setMsgType(9);
+    msg.setTrans(10000);
+    msg.setSrcAddr({2, 1, 0, 1, 21, 0, 0});
+    msg.setTgtAddr(Given);
+    std::memcpy(msg.getMsgRef() + 1, Body.data(), Body.size());
+    EXPECT_EQ(queue->msgWrite(msg.getMsgRef()), 0U);
+    EXPECT_EQ(withoutSendersWord(relay.read(MessageFrame.size())), MessageFrame);
+    EXPECT_EQ(fake_norv::outstanding(), 0U);
+    EXPECT_EQ(fake_norv::count(Op::Free), 1U);
+    close(queue, relay);
+}
+
+TEST_F(KSRemoteMsgQueueTest, AMessageThatCannotBeSentStaysTheCallers) {
+    auto [queue, relay] = open();
+    KSMsgRef tooLarge(102401U);
+    EXPECT_EQ(queue->msgWrite(tooLarge.getMsgRef()), NVSTATUS_ERROR);
+    EXPECT_EQ(fake_norv::outstanding(), 1U);
+    tooLarge.free();
+    KSMsgRef other(0U);
+    EXPECT_EQ(queue->msgWrite(other.getMsgRef()), 0U);  // the connection is as it was
+    EXPECT_EQ(relay.read(4), words({1001}));
+    relay.read(HeaderSize - 4 + 56);
+    close(queue, relay);
+}
+
+TEST_F(KSRemoteMsgQueueTest, AMessageIsReadIntoABufferOfItsOwn) {
+    auto [queue, relay] = open();
+    relay.write(MessageFrame);
+    NvMsg32Bit* read = nullptr;
+    ASSERT_EQ(queue->msgRead(&read), 0U);
+    KSMsgRef msg(read);
+    EXPECT_EQ(msg.getTrans(), 10000U);
+    EXPECT_EQ(read->transaction & 0xFFU, 0x5AU);
+    EXPECT_EQ(msg.getMsgType(), 9U);
+    EXPECT_TRUE(descComp(msg.getSrcAddr(), {2, 1, 0, 1, 21, 0, 0}));
+    EXPECT_TRUE(descComp(msg.getTgtAddr(), Given));
+    EXPECT_EQ(msg.getSize(), 3U);
+    EXPECT_EQ(std::memcmp(read + 1, Body.data(), 3), 0);
+    msg.free();
+    close(queue, relay);
+}
+
+TEST_F(KSRemoteMsgQueueTest, AnyOtherTypeIsAMessageAndItsSizeIsThatOfItsBody) {
+    auto [queue, relay] = open();
+    const Octets lying = words({0x5A, 10000, 9, 0, 1, 1, 11, 12, 13, 2, 21, 0x1234, 14, 0xFFFFFFFF});
+    relay.write(words({77, 0, 56, 2, 0}) + lying + Octets{8, 9});
+    relay.write(words({1001, 0, 8, 0, 0}) + words({0x5A, 10000}));  // no whole block: the rest is 0
+    relay.write(words({1001, 0, 0, 0, 0}));
+    for (const unsigned size : {2U, 0U, 0U}) {
+        NvMsg32Bit* read = nullptr;
+        ASSERT_EQ(queue->msgRead(&read), 0U);
+        KSMsgRef msg(read);
+        EXPECT_EQ(msg.getSize(), size);
+        EXPECT_EQ(octetsOf(msg).size(), NVMSG_HEADER_SIZE + size);
+        msg.free();
+    }
+    close(queue, relay);
+}
+
+TEST_F(KSRemoteMsgQueueTest, WithoutMemoryForAMessageItIsLostAndTheNextIsRead) {
+    auto [queue, relay] = open();
+    relay.write(MessageFrame + MessageFrame);
+    fake_norv::fail(Op::Allocate);
+    NvMsg32Bit* read = nullptr;
+    EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
+    EXPECT_EQ(read, nullptr);
+    ASSERT_EQ(queue->msgRead(&read), 0U);
+    KSMsgRef(read).free();
+    close(queue, relay);
+}
+
+TEST_F(KSRemoteMsgQueueTest, ACloseRequestFromTheRelayIsAnErrorAndAGoodFrameStartsTheCountAgain) {
+    auto [queue, relay] = open();
+    SleeplessSystem system;
+    NvMsg32Bit* read = nullptr;
+    CaptureStderr();
+    for (int round = 0; round < 3; ++round) {
+        for (int i = 0; i < 9; ++i) {
+            relay.write(CloseRequest);
+            EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
+        }
+        relay.write(MessageFrame);
+        ASSERT_EQ(queue->msgRead(&read), 0U);
+        KSMsgRef(read).free();
+    }
+    EXPECT_EQ(GetCapturedStderr(), errorLines(27));
+    EXPECT_THAT(system.sleeps(), ElementsAre());
+    relay.close();
+}
+
+TEST_F(KSRemoteMsgQueueTest, TenFailuresInARowAreReportedAndThrow) {
+    auto [queue, relay] = open();
+    relay.close();
+    NvMsg32Bit* read = nullptr;
+    CaptureStderr();
+    for (int i = 0; i < 9; ++i)
+        EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
+    try {
+        queue->msgRead(&read);
+        FAIL() << "it did not throw";
+    } catch (const KSRemoteService_ComFailure& failure) {
+        EXPECT_EQ(failure.hostName(), listener_.host());
+        EXPECT_EQ(failure.port(), 6554);
+    }
+    EXPECT_EQ(GetCapturedStderr(), errorLines(10));
+}
+
+TEST_F(KSRemoteMsgQueueTest, ARelayThatClosesAfterAnyOctetOfAFrameIsAFailureAndWithinItsPartsAPause) {
+    for (std::size_t n = 0; n < MessageFrame.size(); ++n) {
+        auto [queue, relay] = open();
+        relay.write({MessageFrame.begin(), MessageFrame.begin() + static_cast<long>(n)});
+        relay.close();
+        SleeplessSystem system;
+        NvMsg32Bit other{};
+        NvMsg32Bit* read = &other;
+        CaptureStderr();
+        EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR) << n;
+        EXPECT_EQ(GetCapturedStderr(), errorLine());
+        EXPECT_EQ(read, n < HeaderSize ? &other : nullptr) << n;
+        EXPECT_EQ(system.sleeps(), std::vector<unsigned>(n < HeaderSize ? 0 : 1, 6)) << n;
+        for (int i = 0; i < 8; ++i)
+            queue->msgRead(&read);
+        EXPECT_THROW(queue->msgRead(&read), KSRemoteService_ComFailure);
+        queue.reset();
+    }
+}
+
+TEST_F(KSRemoteMsgQueueTest, FramesBeyondTheLimitAreErrors) {
+    auto [queue, relay] = open();
+    SleeplessSystem system;
+    std::thread sender([&relay = relay] {
+        relay.write(words({1001, 0, 102401, 0, 0}) + Octets(102401));
+        relay.write(words({1001, 0, 0x7FFFFFFF, 0, 0}));
+    });
+    NvMsg32Bit* read = nullptr;
+    CaptureStderr();
+    EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
+    EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
+    EXPECT_EQ(GetCapturedStderr(), errorLine() + "Unable to allocate memory in get_msg\n" + errorLine());
+    sender.join();
+}
+
+TEST_F(KSRemoteMsgQueueTest, OneOctetAtATimeIsAFrameToo) {
+    auto [queue, relay] = open();
+    std::thread sender([&relay = relay] {
+        for (const std::uint8_t octet : MessageFrame)
+            relay.write({octet});
+    });
+    NvMsg32Bit* read = nullptr;
+    ASSERT_EQ(queue->msgRead(&read), 0U);
+    KSMsgRef(read).free();
+    sender.join();
+    close(queue, relay);
+}
+
+TEST_F(KSRemoteMsgQueueTest, DestructionAsksTheRelayToCloseAndWaitsForItsWord) {
+    auto [queue, relay] = open();
+    std::atomic<bool> gone{false};
+    std::thread destroyer([&, doomed = std::move(queue)]() mutable {
+        doomed.reset();
+        gone = true;
+    });
+    EXPECT_EQ(withoutSendersWord(relay.read(HeaderSize)), CloseRequest);
+    EXPECT_FALSE(gone);
+    relay.write(Closed);
+    destroyer.join();
+    EXPECT_TRUE(relay.ends());
+}
+
+TEST_F(KSRemoteMsgQueueTest, ARelayThatNeverAcknowledgesTheCloseDelaysItByFiveSeconds) {
+    auto [queue, relay] = open();
+    SleeplessSystem system;
+    queue.reset();
+    EXPECT_EQ(system.naps(), std::vector<long>(500, 10000));
+    EXPECT_EQ(withoutSendersWord(relay.read(HeaderSize)), CloseRequest);
+    EXPECT_TRUE(relay.ends());
+}
+
+TEST_F(KSRemoteMsgQueueTest, WhatComesBeforeTheAcknowledgementIsDropped) {
+    auto [queue, relay] = open();
+    relay.write(MessageFrame + CloseRequest + MessageFrame);
+    close(queue, relay);
+}
+
+TEST_F(KSRemoteMsgQueueTest, AnAcknowledgementThatNobodyAskedForIsAnError) {
+    auto [queue, relay] = open();
+    relay.write(Closed);
+    NvMsg32Bit* read = nullptr;
+    EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
+    relay.write(MessageFrame);
+    ASSERT_EQ(queue->msgRead(&read), 0U);
+    KSMsgRef(read).free();
+    close(queue, relay);
+}
+
+// The whole mailbox over the remote queue, with its reader.
+class KSMsgQueueOverTheNetwork : public KSRemoteMsgQueueTest {
+  protected:
+    std::pair<std::unique_ptr<KSMsgQueue>, Connection> openMailbox() const {
+        const std::string host = listener_.host();
+        auto queue = std::async(std::launch::async,
+                                [&] { return std::make_unique<KSMsgQueue>(Asked, 512, 50, host.c_str()); });
+        Connection relay = listener_.accept();
+        relay.read(OpenRequestSize);
+        relay.write(Opened);
+        return {queue.get(), std::move(relay)};
+    }
+};
+
+TEST_F(KSMsgQueueOverTheNetwork, ARequestGetsItsReply) {
+    auto [queue, relay] = openMailbox();
+    std::thread board([&relay = relay] {
+        relay.read(HeaderSize + 56);
+        relay.write(MessageFrame);
+        relay.read(HeaderSize);
+        relay.write(Closed);
+    });
+    KSMsgRef command(0U);
+    command.setMsgType(8);
+    command.setTrans(10000);
+    command.setTgtAddr({2, 1, 0, 1, 21, 0, 0});
+    KSMsgRef reply = queue->request(command, 30000, 9, 0);
+    ASSERT_NE(reply.getMsgRef(), nullptr);
+    EXPECT_EQ(reply.getSize(), 3U);
+    reply.free();
+    queue.reset();
+    board.join();
+}
+
+TEST_F(KSMsgQueueOverTheNetwork, ARequestThatCannotBeSentIsFreedAndTimesOut) {
+    auto [queue, relay] = openMailbox();
+    KSMsgRef tooLarge(102401U);
+    EXPECT_EQ(queue->request(tooLarge, 5, 9, 0).getMsgRef(), nullptr);
+    EXPECT_EQ(fake_norv::outstanding(), 0U);
+    std::thread board([&relay = relay] {
+        relay.read(HeaderSize);
+        relay.write(Closed);
+    });
+    queue.reset();
+    board.join();
+}
+
+// The standard error stream while it lives.
+class Errors : public std::streambuf {
+  public:
+    Errors() : before_(std::cerr.rdbuf(this)) {}
+    ~Errors() override { std::cerr.rdbuf(before_); }
+
+    // What was written once it ends with this.
+    std::string until(const std::string& end) {
+        std::unique_lock lock(lock_);
+        changed_.wait_for(lock, std::chrono::seconds(30), [&] { return text_.ends_with(end); });
+        return text_;
+    }
+
+  protected:
+    int overflow(int character) override {
+        const std::lock_guard lock(lock_);
+        text_.push_back(static_cast<char>(character));
+        changed_.notify_all();
+        return character;
+    }
+
+  private:
+    std::mutex lock_;
+    std::condition_variable changed_;
+    std::string text_;
+    std::streambuf* before_;
+};
+
+TEST_F(KSMsgQueueOverTheNetwork, AConnectionThatIsLostEndsTheReaderAndNotTheProgram) {
+    Errors errors;
+    auto [queue, relay] = openMailbox();
+    relay.close();
+    const std::string last =
+        "The connection to the remote message queue on " + listener_.host() + " is lost\n";
+    EXPECT_EQ(errors.until(last), errorLines(10) + last);
+    KSMsgRef command(0U);
+    EXPECT_EQ(queue->request(command, 5, 9, 0).getMsgRef(), nullptr);
+    queue.reset();
+}
+
+TEST_F(KSMsgQueueOverTheNetwork, DestructionWhileMessagesStreamInFindsTheAcknowledgementAmongThem) {
+    for (int round = 0; round < 20; ++round) {
+        auto [queue, relay] = openMailbox();
+        std::atomic<bool> asked{false};
+        std::thread sender([&, &relay = relay] {
+            while (!asked)
+                relay.write(MessageFrame);
+            relay.write(Closed);
+        });
+        std::thread listener([&, &relay = relay] {
+            relay.read(HeaderSize);
+            asked = true;
+        });
+        queue->registerAsyncCallback([](KSMsgRef& msg) {
+            msg.free();
+            return 1;
+        });
+        queue.reset();
+        sender.join();
+        listener.join();
+        EXPECT_EQ(fake_norv::outstanding(), 0U);
+    }
+}
+
+TEST(KSRemoteServiceComFailure, ItKeepsTheFirst99CharactersOfTheHost) {
+    const std::string longName(150, 'h');
+    const KSRemoteService_ComFailure failure(longName.c_str(), 6554);
+    EXPECT_EQ(failure.hostName(), std::string(99, 'h'));
+    EXPECT_EQ(failure.port(), 6554);
+}
+
+}  // namespace

@@ -1,0 +1,59 @@
+"""The daemon as a program."""
+
+import os
+import signal
+import socket
+import unittest
+
+from relay_harness import CLOSE, RELAY, Program, Relay, RelayTest
+
+
+class TheProgram(RelayTest):
+    def test_it_does_not_open_the_board_to_the_world_by_itself(self):
+        program = Program(self, RELAY, "--listen", "0.0.0.0:0")
+        self.assertEqual(program.ends(status=2),
+                         "kv9relayd: --listen 0.0.0.0:0 would let everyone who reaches this machine drive its boards: "
+                         "say with --allow CIDR who may (for example --allow 192.168.1.0/24), or listen on 127.0.0.1 "
+                         "and let hosts come through SSH\n")
+
+    def test_a_bad_command_line(self):
+        program = Program(self, RELAY, "--max-clients", "none")
+        self.assertIn("--max-clients", program.ends(status=2))
+
+    def test_help_and_version(self):
+        for option, said in (("--help", "--listen ADDR[:PORT]"), ("--version", "kv9relayd 1.0")):
+            program = Program(self, RELAY, option)
+            program.ends()
+            self.assertIn(said, program.screen.text())
+
+    def test_a_port_that_is_taken(self):
+        taken = socket.create_server(("127.0.0.1", 0))
+        self.addCleanup(taken.close)
+        port = taken.getsockname()[1]
+        program = Program(self, RELAY, "--listen", f"127.0.0.1:{port}")
+        self.assertEqual(program.ends(status=1),
+                         f"kv9relayd: listening on 127.0.0.1:{port}: Address already in use\n")
+
+    def test_signals_have_it_close_its_connections_and_end(self):
+        for number in (signal.SIGTERM, signal.SIGINT):
+            relay = Relay(self)
+            host = self.host(relay)
+            relay.process.send_signal(number)
+            self.assertEqual(host.read_frame()[0], CLOSE)
+            self.assertIsNone(host.read_frame())
+            relay.ends()
+
+    def test_the_service_manager_is_told(self):
+        for name in (str(self.folder / "notify"), "\0kv9relayd-test-" + str(os.getpid())):
+            manager = socket.socket(socket.AF_UNIX, socket.SOCK_DGRAM)
+            self.addCleanup(manager.close)
+            manager.settimeout(60)
+            manager.bind(name)
+            relay = Relay(self, NOTIFY_SOCKET=name.replace("\0", "@"))
+            self.assertEqual(manager.recv(100), b"READY=1")
+            relay.stops()
+            self.assertEqual(manager.recv(100), b"STOPPING=1")
+
+
+if __name__ == "__main__":
+    unittest.main()

@@ -1,0 +1,144 @@
+"""lapdmon with its board in another machine."""
+
+import re
+import socket
+import unittest
+
+from relay_harness import (CLOSE, CLOSED, LAPDMON, OPENED, RECEIVED, SOFTBOARD, TRANSMITTED, Peer, Program, Relay,
+                           RelayTest, frame, words)
+
+# Reported on the screen: whoever sees it knows that the frames before it are in the log.
+MARK = (RECEIVED, bytes(300))
+DATE = re.compile(r"(Mon|Tue|Wed|Thu|Fri|Sat|Sun) (Jan|Feb|Mar|Apr|May|Jun|Jul|Aug|Sep|Oct|Nov|Dec) "
+                  r"[ 123]\d \d\d:\d\d:\d\d \d{4}")
+
+CALL = [
+    (TRANSMITTED, bytes.fromhex("00 01 7f")),
+    (RECEIVED, bytes.fromhex("00 01 73")),
+    (TRANSMITTED, bytes.fromhex("02 01 00 00  08 02 00 01 05  04 03 80 90 a2  18 03 a1 83 81  70 05 80 31 32 33 34")),
+    (RECEIVED, bytes.fromhex("02 01 01 02")),
+    (RECEIVED, bytes.fromhex("00 01 00 02  08 02 80 01 02  18 03 a9 83 81")),
+    (RECEIVED, bytes.fromhex("00 01 02 02  08 02 80 01 45  08 02 80 90")),
+]
+
+
+class SameLog(RelayTest):
+    def traced(self, program, name):
+        program.screen.wait("Frame Error")
+        program.quits()
+        return DATE.sub("DATE", (self.folder / name).read_bytes().decode("latin-1"))
+
+    def both(self, board):
+        here = Program(self, SOFTBOARD, *board, "--", LAPDMON, "-b1", "-f", "here.log")
+        local = self.traced(here, "here.log")
+        relay = Relay(self, board)
+        there = Program(self, LAPDMON, "-b1", "-f", "there.log", REMOTE_NORV=f"127.0.0.1:{relay.port}")
+        remote = self.traced(there, "there.log")
+        self.assertEqual(there.screen.text().replace("there", "here"), here.screen.text())
+        relay.stops()
+        return local, remote
+
+    def test_the_log_is_that_of_the_board_here(self):
+        capture = self.capture("call.pcap", CALL * 20 + [MARK], 0.004)
+        for rate in ("recorded", "max"):
+            local, remote = self.both(("--frames", capture, "--rate", rate))
+            self.assertEqual(remote, local)
+            self.assertEqual(local.count("Hex Dump"), 120)
+
+    def test_a_host_name_will_do(self):
+        relay = Relay(self, ("--frames", self.capture("call.pcap", CALL + [MARK])))
+        lapdmon = Program(self, LAPDMON, "-b1", "-f", "name.log", REMOTE_NORV=f"localhost:{relay.port}")
+        self.assertEqual(self.traced(lapdmon, "name.log").count("Hex Dump"), 6)
+        relay.stops()
+
+
+class Lost(RelayTest):
+    def test_a_relay_that_dies_during_a_trace_leaves_what_was_recorded(self):
+        relay = Relay(self, ("--frames", self.capture("call.pcap", CALL + [MARK])))
+        lapdmon = Program(self, LAPDMON, "-b1", "-f", "lost.log", REMOTE_NORV=f"127.0.0.1:{relay.port}")
+        lapdmon.screen.wait("Frame Error")
+        relay.kill()
+        lapdmon.errors.wait("is lost")
+        lapdmon.quits()  # each of its two requests waits for its answer
+        self.assertEqual((self.folder / "lost.log").read_text("latin-1").count("Hex Dump"), 6)
+        self.assertEqual(lapdmon.screen.text().count("Addressable::Timeout"), 2)
+
+
+class OnThePeer(RelayTest):
+    """The relay is this test."""
+
+    def setUp(self):
+        super().setUp()
+        self.listener = socket.create_server(("127.0.0.1", 0))
+        self.listener.settimeout(60)
+        self.addCleanup(self.listener.close)
+        port = self.listener.getsockname()[1]
+        self.lapdmon = Program(self, LAPDMON, "-b1", REMOTE_NORV=f"127.0.0.1:{port}")
+        self.where = f"127.0.0.1:{port}"
+
+    def accept(self):
+        connection, _ = self.listener.accept()
+        peer = Peer(connection)
+        self.addCleanup(peer.close)
+        return peer
+
+    def expect_open_request(self, peer):
+        request = peer.read(48)
+        self.assertEqual(request[:16] + request[20:], words(1003, 0, 28, 0) + words(0, 1, 0, 0, 0, 512, 50))
+
+    def test_the_first_request_and_the_close_octet_by_octet(self):
+        peer = self.accept()
+        self.expect_open_request(peer)
+        peer.send(frame(OPENED, words(1, 2, 3, 4, 0x1234)))
+        # Find a component of type 18 on processor 1 of board 1.
+        kind, tran, block, body = peer.read_frame()
+        self.assertEqual((kind, tran), (1001, 0))
+        self.assertEqual(block[4:], words(10000, 8388669, 1, 2, 3, 0, 1, 0, 0x1234, 4, 0, 0, len(body)))
+        self.assertEqual(len(block), 56)
+        # Not found: the program ends, and closes its queue first.
+        error = b"\x3d\0\x80\0" + b"\x04\0\0\0"
+        peer.send(frame(1001, block[:4] + words(10000, 0, 0, 1, 0, 1, 2, 3, 0, 0, 0x1234, 4, len(error)), error))
+        request = peer.read(20)
+        self.assertEqual(request[:16], words(2000, 0, 0, 0))
+        peer.send(frame(CLOSED))
+        peer.ends()
+        self.assertEqual(self.lapdmon.ends(status=1), "")
+        self.assertIn("vela Exception caught", self.lapdmon.screen.text())
+
+    def expect_refusal(self, answer):
+        peer = self.accept()
+        self.expect_open_request(peer)
+        peer.send(answer)
+        peer.close()
+        self.lapdmon.ends(status=1)
+        self.assertIn("general Exception caught in lapdmon(749)", self.lapdmon.screen.text())
+
+    def test_a_relay_that_closes_at_once(self):
+        self.expect_refusal(b"")
+
+    def test_a_relay_that_closes_within_its_answer(self):
+        self.expect_refusal(frame(OPENED, words(1, 2, 3, 4, 5))[:-1])
+
+    def test_a_relay_that_answers_with_a_close_request(self):
+        self.expect_refusal(frame(CLOSE))
+
+    def test_a_relay_that_answers_garbage(self):
+        self.expect_refusal(b"HTTP/1.1 400 Bad Request\r\n\r\n")
+
+    def test_a_relay_that_answers_too_much(self):
+        self.expect_refusal(frame(OPENED, bytes(102401)))
+
+    def test_a_relay_that_goes_is_reported_ten_times(self):
+        peer = self.accept()
+        self.expect_open_request(peer)
+        peer.send(frame(OPENED, words(1, 2, 3, 4, 5)))
+        peer.read_frame()
+        peer.close()
+        errors = self.lapdmon.ends(status=1).splitlines()
+        self.assertEqual(errors[:10], [f"Error communicating with remote message queue on {self.where}"] * 10)
+        self.assertEqual(errors[10:], [f"The connection to the remote message queue on {self.where} is lost"])
+        self.assertIn("vela Exception caught", self.lapdmon.screen.text())
+
+
+if __name__ == "__main__":
+    unittest.main()

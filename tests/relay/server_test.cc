@@ -1,0 +1,397 @@
+// The relay as a peer sees it, on a scripted transport library.
+#include <gmock/gmock.h>
+
+#include <algorithm>
+#include <random>
+#include <thread>
+
+#include "tests/relay/running_relay.h"
+#include "tests/support/fake_norv.h"
+#include "tests/support/tcp.h"
+
+namespace {
+
+using fake_norv::Op;
+using tcp::Connection;
+using tcp::Octets;
+using tcp::operator+;
+using tcp::words;
+using testing::ElementsAre;
+
+constexpr std::size_t HeaderSize = 20;
+constexpr std::size_t BlockSize = 56;
+
+const Octets OpenRequest = words({1003, 0, 28, 0, 0}) + words({1, 2, 3, 4, 5, 512, 50});
+const Octets CloseRequest = words({2000, 0, 0, 0, 0});
+const Octets Closed = words({2001, 0, 0, 0, 0});
+const Octets Opened = words({1002, 0, 20, 0, 0}) + words({1, 2, 3, 4, 5});
+
+// A command of type 8 to 0.1.1.21.2, under a source that is not the sender's.
+Octets command(std::uint32_t transaction, const Octets& body = {}) {
+    const auto size = static_cast<std::uint32_t>(body.size());
+    return words({1001, 0, BlockSize, size, 0}) +
+           words({0, transaction, 8, 9, 9, 9, 0, 1, 1, 9, 9, 2, 21, size}) + body;
+}
+
+class RelayTest : public testing::Test {
+  protected:
+    RelayTest() {
+        fake_norv::reset();
+        fake_norv::nextHostAddress({5, 2, 0, 3, 4, 1, 0});
+    }
+    ~RelayTest() override {
+        relay_.reset();
+        EXPECT_EQ(fake_norv::openQueues(), 0U);
+        EXPECT_EQ(fake_norv::outstanding(), 0U);
+        EXPECT_THAT(fake_norv::misuses(), ElementsAre());
+        fake_norv::reset();
+    }
+
+    void start(relay::Options options = {}) { relay_ = std::make_unique<RunningRelay>(std::move(options)); }
+
+    Connection connect() const { return Connection::to(relay_->port()); }
+    Connection open() const {
+        Connection host = connect();
+        host.write(OpenRequest);
+        EXPECT_EQ(host.read(Opened.size()).size(), Opened.size());
+        return host;
+    }
+
+    // The relay does this to the connection, says why, gives its queue back, and serves the next one.
+    void expectEnd(const Connection& host, const std::string& why) {
+        EXPECT_TRUE(host.ends());
+        EXPECT_TRUE(relay_->logs(why)) << why;
+        expectService();
+    }
+    void expectService() {
+        fake_norv::onWrite(nullptr);
+        Connection other = open();
+        other.write(CloseRequest);
+        EXPECT_EQ(other.read(HeaderSize), Closed);
+        EXPECT_TRUE(other.ends());
+    }
+
+    std::unique_ptr<RunningRelay> relay_;
+};
+
+TEST_F(RelayTest, OpeningAQueueReturnsItsAddress) {
+    start();
+    const Connection host = connect();
+    host.write(words({1003, 42, 28, 0, 0xDEADBEEF}) + words({9, 9, 9, 9, 9, 512, 50}));
+    EXPECT_EQ(host.read(40), words({1002, 42, 20, 0, 0}) + words({1, 2, 3, 4, 5}));
+    EXPECT_EQ(fake_norv::openQueues(), 1U);
+}
+
+TEST_F(RelayTest, AMessageIsWrittenUnderTheQueuesAddressAndItsReplyComesBack) {
+    start();
+    fake_norv::onWrite([](const fake_norv::Message& heard) {
+        if (heard.type == 8)
+            fake_norv::deliver(fake_norv::replyTo(heard, 9, {7, 8}));
+    });
+    const Connection host = open();
+    host.write(command(10000, {1, 2, 3}));
+    EXPECT_EQ(host.read(HeaderSize + BlockSize + 2),
+              words({1001, 0, 56, 2, 0}) + words({0x5A, 10000, 9, 0, 1, 1, 1, 2, 3, 2, 21, 5, 4, 2}) +
+                  Octets({7, 8}));
+    const fake_norv::Message heard = fake_norv::written().at(0);
+    EXPECT_EQ(heard.transaction, 10000U);
+    EXPECT_EQ(heard.source.instance, 5);
+    EXPECT_EQ(heard.target.instance, 2);
+    EXPECT_EQ(heard.body, Octets({1, 2, 3}));
+}
+
+TEST_F(RelayTest, EventsComeInOrderAndTheLargestFits) {
+    start();
+    const Connection host = open();
+    const Octets large(102400, 0x77);
+    for (const Octets& body : {Octets{1}, large, Octets{}})
+        fake_norv::deliver({0, 32, {2, 1, 0, 1, 21, 0, 0}, {5, 2, 0, 3, 4, 1, 0}, body});
+    for (const Octets& body : {Octets{1}, large, Octets{}}) {
+        const Octets frame = host.read(HeaderSize + BlockSize + body.size());
+        ASSERT_EQ(frame.size(), HeaderSize + BlockSize + body.size());
+        EXPECT_TRUE(std::equal(body.begin(), body.end(), frame.begin() + HeaderSize + BlockSize));
+    }
+}
+
+TEST_F(RelayTest, AMessageTooLargeForAFrameEndsTheConnection) {
+    start();
+    const Connection host = open();
+    fake_norv::deliver({0, 32, {}, {5, 2, 0, 3, 4, 1, 0}, Octets(102401)});
+    expectEnd(host, "ended: a message of 102401 octets from the board");
+}
+
+TEST_F(RelayTest, ACloseIsAcknowledgedBehindEverythingThatWasOnItsWay) {
+    start();
+    fake_norv::onWrite([](const fake_norv::Message& heard) {
+        if (heard.type == 8)
+            fake_norv::deliver(fake_norv::replyTo(heard, 9));
+    });
+    const Connection host = open();
+    Octets all;
+    for (std::uint32_t i = 0; i < 200; ++i)
+        all = std::move(all) + command(10000 + i);
+    host.write(all + words({2000, 43, 0, 0, 0}));
+    for (std::uint32_t i = 0; i < 200; ++i) {
+        const Octets frame = host.read(HeaderSize + BlockSize);
+        ASSERT_EQ(Octets(frame.begin() + HeaderSize + 4, frame.begin() + HeaderSize + 8), words({10000 + i}));
+    }
+    EXPECT_EQ(host.read(HeaderSize), words({2001, 43, 0, 0, 0}));
+    EXPECT_TRUE(host.ends());
+    EXPECT_TRUE(relay_->logs(": closed"));
+}
+
+TEST_F(RelayTest, ClientsHaveQueuesOfTheirOwn) {
+    start();
+    fake_norv::onWrite([](const fake_norv::Message& heard) {
+        if (heard.type == 8)
+            fake_norv::deliver(fake_norv::replyTo(heard, 9, heard.body));
+    });
+    const Connection one = open();
+    const Connection two = open();
+    one.write(command(1, {1}));
+    two.write(command(2, {2}));
+    EXPECT_EQ(one.read(HeaderSize + BlockSize + 1).back(), 1);
+    EXPECT_EQ(two.read(HeaderSize + BlockSize + 1).back(), 2);
+}
+
+TEST_F(RelayTest, AMessageToTheQueueItselfComesBackWhateverItLooksLike) {
+    start();
+    const Connection host = open();
+    const Octets asMark =
+        words({1001, 0, 56, 0, 0}) + words({0x5A, 0xFFFFFF, 0, 1, 2, 3, 1, 2, 3, 5, 4, 5, 4, 0});
+    host.write(asMark + asMark);
+    EXPECT_EQ(host.read(2 * asMark.size()), asMark + asMark);
+    host.write(CloseRequest);
+    EXPECT_EQ(host.read(HeaderSize), Closed);
+}
+
+TEST_F(RelayTest, APeerThatClosesAfterAnyOctetGivesItsQueueBack) {
+    start();
+    const Octets all = OpenRequest + command(10000, {1, 2, 3}) + CloseRequest;
+    for (std::size_t n = 0; n < all.size(); ++n) {
+        Connection host = connect();
+        host.write({all.begin(), all.begin() + static_cast<long>(n)});
+        host.close();
+    }
+    EXPECT_TRUE(relay_->logs("127.0.0.1:", all.size()));
+    EXPECT_TRUE(relay_->logs("ended:", all.size()));
+    expectService();
+}
+
+TEST_F(RelayTest, WhatIsNoOpenRequestEndsTheConnection) {
+    const struct {
+        Octets octets;
+        const char* why;
+    } cases[] = {
+        {command(1), "ended: a frame of type 1001 instead of 1003"},
+        {CloseRequest, "ended: a frame of type 2000 instead of 1003"},
+        {words({1003, 0, 24, 0, 0}) + Octets(24), "ended: an open request of 24 octets"},
+        {words({1003, 0, 32, 0, 0}) + Octets(32), "ended: an open request of 32 octets"},
+        {words({1003, 0, 102401, 0, 0}), "ended: a frame with a part of 102401 octets; the most is 102400"},
+        {words({1003, 0, 28, 0xFFFFFFFF, 0}), "ended: a frame with a part of 4294967295 octets"},
+        {Octets(20, 'G'), "ended: a frame with a part of 1195853639 octets"},
+    };
+    start();
+    for (const auto& each : cases) {
+        const Connection host = connect();
+        host.write(each.octets);
+        expectEnd(host, each.why);
+    }
+}
+
+TEST_F(RelayTest, WhatIsNoMessageEndsTheConnection) {
+    const struct {
+        Octets octets;
+        const char* why;
+    } cases[] = {
+        {OpenRequest, "ended: a frame of type 1003 instead of 1001"},
+        {Closed, "ended: a frame of type 2001 instead of 1001"},
+        {words({1001, 0, 55, 0, 0}) + Octets(55), "ended: a header block of 55 octets"},
+        {words({1001, 0, 56, 4, 0}) + Octets(60), "ended: a body of 4 octets that should have 0"},
+        {words({1001, 0, 56, 0, 0}) + words({256}) + Octets(52), "ended: word 1 of a header block is 256"},
+        {words({1001, 0, 56, 102401, 0}), "ended: a frame with a part of 102401 octets"},
+    };
+    start();
+    for (const auto& each : cases) {
+        const Connection host = open();
+        host.write(each.octets);
+        expectEnd(host, each.why);
+    }
+}
+
+TEST_F(RelayTest, AHostThatStaysSilentOrStopsWithinAFrameIsEnded) {
+    relay::Options options;
+    options.patience.frame = std::chrono::milliseconds(20);
+    start(options);
+    const Connection silent = connect();
+    expectEnd(silent, "ended: no whole frame within 20 ms");
+    for (const std::size_t n : {std::size_t{1}, std::size_t{20}, command(1).size() - 1}) {
+        const Connection host = open();
+        const Octets frame = command(1);
+        host.write({frame.begin(), frame.begin() + static_cast<long>(n)});
+        expectEnd(host, "ended: no whole frame within 20 ms");
+    }
+}
+
+TEST_F(RelayTest, AHostThatSendsOctetByOctetIsEndedWhenItsTimeIsOver) {
+    relay::Options options;
+    options.patience.frame = std::chrono::milliseconds(100);
+    start(options);
+    const Connection host = connect();
+    while (host.write(words({1003})) && relay_->logged("ended:") == 0)
+        std::this_thread::yield();
+    EXPECT_TRUE(relay_->logs("ended: "));
+    expectService();
+}
+
+TEST_F(RelayTest, AHostThatWaitsForEventsMayBeSilent) {
+    relay::Options options;
+    options.patience.frame = std::chrono::milliseconds(20);
+    start(options);
+    const Connection host = open();
+    const Connection silent = connect();
+    EXPECT_TRUE(silent.ends());  // its time is over; the other's would be too
+    EXPECT_TRUE(silent.ends());
+    fake_norv::deliver({0, 32, {}, {5, 2, 0, 3, 4, 1, 0}, {1}});
+    EXPECT_EQ(host.read(HeaderSize + BlockSize + 1).size(), HeaderSize + BlockSize + 1);
+}
+
+TEST_F(RelayTest, AHostThatTakesNothingIsEnded) {
+    relay::Options options;
+    options.patience.write = std::chrono::milliseconds(50);
+    start(options);
+    const Connection host = open();
+    while (relay_->logged("ended: a frame was not taken within 50 ms") == 0 &&
+           fake_norv::deliver({0, 32, {}, {5, 2, 0, 3, 4, 1, 0}, Octets(102400)}))
+        std::this_thread::yield();
+    expectEnd(host, "ended: a frame was not taken within 50 ms");
+}
+
+TEST_F(RelayTest, AFloodFromAHostThatTakesNoAnswersStopsAtTheRelaysDoor) {
+    relay::Options options;
+    options.patience.write = std::chrono::milliseconds(50);
+    start(options);
+    fake_norv::onWrite([](const fake_norv::Message& heard) {
+        if (heard.type == 8)
+            fake_norv::deliver(fake_norv::replyTo(heard, 9, Octets(50000)));
+    });
+    const Connection host = open();
+    while (host.write(command(1)))
+        EXPECT_LT(fake_norv::outstanding(), 200U);
+    expectEnd(host, "ended: a frame was not taken within 50 ms");
+}
+
+TEST_F(RelayTest, MoreClientsThanAllowedAreRefusedUntilOneGoes) {
+    relay::Options options;
+    options.maxClients = 2;
+    start(options);
+    Connection one = open();
+    const Connection two = open();
+    EXPECT_TRUE(connect().ends());
+    EXPECT_TRUE(relay_->logs("refused: 2 clients already"));
+    one.write(CloseRequest);
+    EXPECT_TRUE(one.read(HeaderSize) == Closed && one.ends());
+    for (bool served = false; !served;) {  // once it has been noticed that one has gone
+        const Connection three = connect();
+        three.write(OpenRequest);
+        served = three.read(Opened.size()).size() == Opened.size();
+    }
+}
+
+TEST_F(RelayTest, HostsThatAreNotAllowedAreRefused) {
+    relay::Options options;
+    options.allow = {*relay::Cidr::parse("10.0.0.0/8")};
+    start(options);
+    EXPECT_TRUE(connect().ends());
+    EXPECT_TRUE(relay_->logs("refused: not among those allowed"));
+}
+
+TEST_F(RelayTest, ATransportThatRefusesAQueueEndsTheConnection) {
+    start();
+    for (const Op op : {Op::Open, Op::Bind}) {
+        fake_norv::fail(op);
+        const Connection host = connect();
+        host.write(OpenRequest);
+        expectEnd(host, op == Op::Open ? "opens no more queues" : "binds no more queues");
+    }
+}
+
+TEST_F(RelayTest, ATransportThatReadsNoMoreEndsTheConnection) {
+    start();
+    fake_norv::fail(Op::Read);
+    const Connection host = open();
+    expectEnd(host, "ended: the transport library reads no more");
+}
+
+TEST_F(RelayTest, WithoutMemoryForAMessageTheConnectionEnds) {
+    start();
+    const Connection host = open();
+    fake_norv::fail(Op::Allocate);
+    host.write(command(1));
+    expectEnd(host, "ended: the transport library has no memory for a message");
+}
+
+TEST_F(RelayTest, WithoutMemoryToWakeItsThreadTheQueueIsGivenBackAllTheSame) {
+    start();
+    Connection host = open();
+    ASSERT_TRUE(fake_norv::waitForIdleReader());
+    fake_norv::fail(Op::Allocate, 1);
+    host.close();
+    EXPECT_TRUE(relay_->logs("ended: the connection was closed"));
+    expectService();
+}
+
+TEST_F(RelayTest, StoppingSendsWhatIsOnItsWayAndSaysThatTheRelayCloses) {
+    start();
+    fake_norv::onWrite([](const fake_norv::Message& heard) {
+        if (heard.type == 8)
+            fake_norv::deliver(fake_norv::replyTo(heard, 9));
+    });
+    const Connection host = open();
+    const Connection unopened = connect();
+    host.write(command(1) + command(2));
+    EXPECT_EQ(host.read(HeaderSize + BlockSize).size(), HeaderSize + BlockSize);
+    relay_->stop();
+    EXPECT_EQ(host.read(HeaderSize + BlockSize).size(), HeaderSize + BlockSize);
+    EXPECT_EQ(host.read(HeaderSize), CloseRequest);
+    EXPECT_TRUE(host.ends());
+    EXPECT_TRUE(unopened.ends());
+    EXPECT_EQ(connect().get(), -1);
+}
+
+TEST_F(RelayTest, StoppingTwiceWaitsForNobody) {
+    start();
+    const Connection host = open();
+    for (int i = 0; i < 300; ++i)  // more than the connection holds
+        fake_norv::deliver({0, 32, {}, {5, 2, 0, 3, 4, 1, 0}, Octets(102400)});
+    relay_->sayStop();
+    while (connect().get() != -1)
+        std::this_thread::yield();
+    relay_->stop();
+    EXPECT_EQ(relay_->logged("a frame was not taken"), 0U);
+}
+
+// Frames with octets changed, cut and mixed up: nothing more happens than that connections end.
+TEST_F(RelayTest, DamagedFramesEndNoMoreThanTheirConnections) {
+    relay::Options options;
+    options.patience.frame = std::chrono::milliseconds(50);
+    options.maxClients = 1000;
+    start(options);
+    const Octets good = OpenRequest + command(1, {1, 2, 3}) + command(2) + CloseRequest;
+    std::mt19937 random(20240611);
+    for (int round = 0; round < 400; ++round) {
+        Octets octets = good;
+        for (unsigned changes = random() % 4; changes > 0; --changes)
+            octets[random() % octets.size()] = static_cast<std::uint8_t>(random());
+        if (random() % 3 == 0)
+            octets.resize(random() % octets.size());
+        Connection host = connect();
+        ASSERT_GE(host.get(), 0);
+        host.write(octets);
+        if (random() % 2 == 0)
+            host.close();
+    }
+    expectService();
+}
+
+}  // namespace
