@@ -40,9 +40,15 @@ void Arrivals::leave(unsigned int number) {
     {
         const std::lock_guard guard(mutex_);
         endTurnLocked(number);
-        --present_;
+        if (--present_ == 0)
+            none_.notify_all();
     }
     room_.notify_one();
+}
+
+bool Arrivals::awaitNone(std::chrono::milliseconds limit) {
+    std::unique_lock guard(mutex_);
+    return none_.wait_for(guard, limit, [this] { return present_ == 0; });
 }
 
 void Arrivals::close() {
