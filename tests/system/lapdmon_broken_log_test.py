@@ -90,6 +90,7 @@ class BrokenLog(SystemTest):
         reader = os.open(path, os.O_RDONLY | os.O_NONBLOCK)
         program = self.on_board("--rate", "500", "--loop", run=("lapdmon", "-b1", "-f", "pipe"),
                                 frames=capture(*NUMBERED, interval=0.004))
+        program.screen.wait("NET5 Switch")  # it has the pipe open
         os.set_blocking(reader, True)
         os.read(reader, 100)
         os.close(reader)
