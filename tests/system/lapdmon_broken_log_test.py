@@ -1,6 +1,7 @@
 """A log that cannot be written, or not now: what is said, what stays, and that the trace goes on."""
 
 import os
+import pathlib
 import re
 import time
 import unittest
@@ -135,7 +136,7 @@ class StalledLog(SystemTest):
     MANY = 1000
 
     def pid_status(self, program, field):
-        status = open(f"/proc/{program._process.pid}/status", encoding="ascii").read()
+        status = (pathlib.Path("/proc") / str(program.pid) / "status").read_text()
         return int(re.search(rf"^{field}:\s+(\d+)", status, re.M)[1])
 
     def test_events_wait_with_the_transport_threads_are_bounded_and_the_trace_catches_up(self):
