@@ -97,7 +97,7 @@ void startTrace(std::unique_ptr<vela::CCS> opened) {
 int awaitEnd() {
     if (awaitQuit() == Ending::Asked)
         return EXIT_SUCCESS;
-    std::cerr << "lapdmon: the board cannot be reached any more, the trace ends" << std::endl;
+    std::cerr << "lapdmon: the board cannot be reached any more, the trace ends\n" << std::flush;
     arrivals.awaitNone(ShowingLimit);
     return EXIT_FAILURE;
 }
