@@ -11,6 +11,7 @@ import argparse
 import os
 import pathlib
 import re
+import signal
 import struct
 import subprocess
 import sys
@@ -130,6 +131,7 @@ def main(arguments):
     parser.add_argument("--lapdmon", default=os.environ.get("LAPDMON"))
     parser.add_argument("--softboard", default=os.environ.get("SOFTBOARD"))
     options = parser.parse_args(arguments)
+    signal.signal(signal.SIGTERM, lambda *_: sys.exit(1))  # what was started is ended all the same
     with tempfile.TemporaryDirectory(prefix="order-") as folder:
         figures, status = measure(options, pathlib.Path(folder))
     print(figures)
