@@ -34,11 +34,13 @@ constexpr unsigned int MillisecondsPerTick = 4;
 // second share the text, whose making takes as long as the decoding of a frame.
 std::string_view localTime() {
     static std::time_t shown = -1;
+    static long shownZone = 0;
     static std::array<char, 26> text{};
-    if (const std::time_t now = std::time(nullptr); now != shown) {
-        shown = now;
+    if (const std::time_t now = std::time(nullptr); now != shown || timezone != shownZone) {
         if (ctime_r(&now, text.data()) == nullptr)
             text = {"\n"};
+        shown = now;
+        shownZone = timezone;  // as ctime_r has found it
     }
     return text.data();
 }
