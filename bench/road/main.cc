@@ -5,7 +5,8 @@
 //
 // First as fast as the board can, until FRAMES are in the log (200000); then for SECONDS (5) at the rate of a
 // D channel that is full in both directions. A time ends when the header line can be read from the log, which
-// the stream's buffer keeps back until it is full. CPU includes the software board's.
+// the stream's buffer keeps back until it is full. The processor's time includes the software board's; how
+// much of it is spent before lapdmon has done anything is shown by programs that read the events alone.
 #include <algorithm>
 #include <cstdlib>
 #include <exception>
@@ -13,6 +14,7 @@
 #include <iostream>
 #include <string>
 
+#include "bench/road/reading.h"
 #include "bench/road/run.h"
 #include "bench/road/traced.h"
 
@@ -45,13 +47,23 @@ bool show(const std::string& what, bench::Run run) {
     return run.status == 0 && run.checked.lost + run.checked.refused + run.checked.outOfOrder == 0;
 }
 
+// What the board, and a thread for each event, cost at line rate. False when they could not be run.
+bool showLeast(const std::string& what, double seconds, const char* threads) {
+    const double used = bench::runReading(std::to_string(lineRate), seconds, threads);
+    std::cout << what << ": " << std::setprecision(1) << used << " us of CPU a frame ("
+              << used * lineRate / 1e4 << " % of a core)" << std::endl;
+    return used > 0;
+}
+
 int measure(int argc, char** argv) {
     const std::uint64_t frames = argc > 1 ? std::strtoull(argv[1], nullptr, 10) : 200000;
     const double seconds = argc > 2 ? std::strtod(argv[2], nullptr) : 5;
     const bool fast = show("as fast as it goes", bench::runRoad("max", frames));
     const bool paced = show("at line rate", bench::runRoad(std::to_string(lineRate),
                                                            static_cast<std::uint64_t>(seconds * lineRate)));
-    return fast && paced ? EXIT_SUCCESS : EXIT_FAILURE;
+    const bool board = showLeast("  of which the board and the reading", seconds, "0");
+    const bool threads = showLeast("  the same and an idle thread an event", seconds, "1");
+    return fast && paced && board && threads ? EXIT_SUCCESS : EXIT_FAILURE;
 }
 
 }  // namespace
@@ -59,6 +71,10 @@ int measure(int argc, char** argv) {
 int main(int argc, char** argv) {
     if (argc == 4 && argv[1] == std::string("--traced"))
         return bench::runTraced(std::atoi(argv[2]), argv[3]);
+    if (argc == 4 && argv[1] == std::string("--reading")) {
+        std::cout << bench::readEvents(std::atof(argv[2]), argv[3] == std::string("1")) << std::endl;
+        return EXIT_SUCCESS;
+    }
     try {
         return measure(argc, argv);
     } catch (const std::exception& error) {

@@ -11,6 +11,7 @@
 #include <array>
 #include <cerrno>
 #include <csignal>
+#include <cstdio>
 #include <ctime>
 #include <filesystem>
 #include <fstream>
@@ -96,8 +97,16 @@ class SharedStamps {
     const Stamps* stamps_ = nullptr;
 };
 
-// softboard --loop --rate R -- bench-road --traced DESCRIPTOR LOG, with a pipe for its standard input and its
-// screen thrown away.
+// This program on the software board, as the shell runs it.
+std::string onTheBoard(const std::string& rate, const std::string& mode, const std::string& first,
+                       const std::string& second) {
+    const fs::path self = fs::read_symlink("/proc/self/exe");
+    const std::string board = self.parent_path() / "softboard";
+    return "exec '" + board + "' --loop --rate " + rate + " -- '" + self.string() + "' " + mode + " " +
+           first + " '" + second + "'";
+}
+
+// The program that is measured, with a pipe for its standard input and its screen thrown away.
 class Traced {
   public:
     Traced(const std::string& rate, int stamps, const std::string& log) {
@@ -252,5 +261,15 @@ class Measurement {
 }  // namespace
 
 Run runRoad(const std::string& rate, std::uint64_t frames) { return Measurement(rate, frames).measure(); }
+
+double runReading(const std::string& rate, double seconds, const std::string& threads) {
+    const std::string command = onTheBoard(rate, "--reading", std::to_string(seconds), threads);
+    double used = 0;
+    FILE* const output = popen(command.c_str(), "r");
+    if (output == nullptr)
+        return 0;
+    const bool read = std::fscanf(output, "%lf", &used) == 1;
+    return pclose(output) == 0 && read ? used : 0;
+}
 
 }  // namespace bench

@@ -26,6 +26,9 @@ struct Run {
 // board's. Throws std::system_error.
 Run runRoad(const std::string& rate, std::uint64_t frames);
 
+// readEvents of reading.h in a process of its own at the board's rate: microseconds, 0 when it failed.
+double runReading(const std::string& rate, double seconds, const std::string& threads);
+
 }  // namespace bench
 
 #endif
