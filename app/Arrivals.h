@@ -9,6 +9,7 @@
 #define APP_ARRIVALS_H
 
 #include <array>
+#include <chrono>
 #include <condition_variable>
 #include <mutex>
 #include <optional>
@@ -40,6 +41,9 @@ class Arrivals {
     // The next may go; nothing if the number has had its turn.
     void endTurn(unsigned int number);
 
+    // Until no record is there; false when `limit` has passed first.
+    bool awaitNone(std::chrono::milliseconds limit);
+
     // Nobody waits any more: places are unlimited and in no order. For the end of the trace.
     void close();
 
@@ -54,6 +58,7 @@ class Arrivals {
 
     std::mutex mutex_;
     std::condition_variable room_;
+    std::condition_variable none_;
     bool closed_ = false;
     unsigned int present_ = 0;
     unsigned int next_ = 0;                             // the number of the next to arrive; wraps

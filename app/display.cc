@@ -9,6 +9,7 @@
 #include <string_view>
 
 #include "app/Arrivals.h"
+#include "app/Log.h"
 #include "app/guarded.h"
 #include "decoder/cursor.h"
 #include "decoder/frame.h"
@@ -100,6 +101,7 @@ void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
         std::cout << "ERROR - received unexpected rtc event" << std::endl;
         return;
     }
+    traceLog.frameFollows();
     writeHeader(rec.Direction, rec.Timestamp);
     octets = rec.List.value();
     decoder::msglen = frameLength(rec.Length, octets.length());
