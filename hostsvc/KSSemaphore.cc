@@ -11,7 +11,7 @@ KSSemaphore::KSSemaphore(unsigned maxCount, unsigned initialCount) : semaphore_(
 KSSemaphore::~KSSemaphore() { sem_destroy(&semaphore_); }
 
 void KSSemaphore::post() {
-    if (sem_post(&semaphore_) != 0)
+    if (ks_system().post(&semaphore_) != 0)
         throw PostError();
 }
 

@@ -58,6 +58,8 @@ int KSSystem::createThread(const pthread_attr_t* attributes, void* (*entry)(void
     return ::pthread_create(&unused, attributes, entry, argument);
 }
 
+int KSSystem::post(sem_t* semaphore) { return ::sem_post(semaphore); }
+
 KSSystem& ks_system() {
     // Never destroyed: while the process exits there are threads that still sleep.
     static KSSystem* const real = std::make_unique<KSSystem>().release();

@@ -27,6 +27,9 @@ class KSSystem {
 
     // pthread_create: 0, or what was wrong.
     virtual int createThread(const pthread_attr_t* attributes, void* (*entry)(void*), void* argument);
+
+    // sem_post: 0, or -1 when it is refused.
+    virtual int post(sem_t* semaphore);
 };
 
 // The one in use.
