@@ -61,11 +61,16 @@ void Arrivals::close() {
         turn.notify_all();
 }
 
+void Arrivals::end() {
+    traceEnded_ = true;
+    close();
+}
+
 // What a board sends on after its trace was switched off is nobody's, and no news.
 TracedCcs::~TracedCcs() {
     getMsgQueue()->unregisteredSource(
         [](vela::MsgQueue*, vela::Msg* msg) { const std::unique_ptr<vela::Msg> dropped(msg); });
-    arrivals.close();
+    arrivals.end();
     endCallbacks();
 }
 

@@ -120,6 +120,8 @@ void HANDLE_L2Trace_events(vela::CCS*, unsigned int, Record* rec) {
     std::unique_ptr<Record> held(rec);
     guarded(100, [&] {
         const Turn turn(held.get());
+        if (turn.isLate())
+            return;
         const std::lock_guard guard(queueGuard);
         if (event_queue.enqueue(held.get())) {
             static_cast<void>(held.release());  // the queue's entry's now

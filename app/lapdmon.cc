@@ -143,6 +143,7 @@ void quit() {
     attempt([] { ccs->CancelEvt(vela::CCS::L2TraceGroup, nullptr); });
     attempt([] { ccs->SetParm(L2TraceParm, 0, nullptr); });
     attempt([] {
+        arrivals.end();
         Process.cancel();
         Process.join();
     });

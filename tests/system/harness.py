@@ -17,7 +17,7 @@ import threading
 import time
 import unittest
 
-LIMIT = 60  # seconds
+LIMIT = 120  # seconds
 
 LAPDMON = os.environ["LAPDMON"]
 SOFTBOARD = os.environ["SOFTBOARD"]
@@ -157,6 +157,10 @@ class Program:
             os.close(stdin)
         self.screen = Stream(self._process.stdout)
         self.errors = Stream(self._process.stderr)
+
+    @property
+    def pid(self):
+        return self._process.pid
 
     @property
     def journal(self):
