@@ -1,5 +1,5 @@
 // How fast frames become text in a log, by the program's own way from a trace record on: header lines,
-// getBlock, parse_isdn_frame, the log's stream. Beside it, the same text written with plain fwrite: what the
+// getBlock, parse_isdn_frame, the log. Beside it, the same text written with plain fwrite: what the
 // file can take.
 //
 //     bench-decode [--variant V] CAPTURE REPEAT LOG
@@ -8,6 +8,7 @@
 // Both ways are gone five times in turn, and the medians shown. The log stays.
 #include <algorithm>
 #include <array>
+#include <cerrno>
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
@@ -17,8 +18,10 @@
 #include <iomanip>
 #include <iostream>
 #include <string>
+#include <string_view>
 #include <vector>
 
+#include "app/Log.h"
 #include "app/display.h"
 #include "bench/inputs.h"
 #include "decoder/state.h"
@@ -69,37 +72,47 @@ std::vector<Record> recordsOf(const softboard::Frames& frames) {
     return records;
 }
 
-// Seconds that `write` takes to write the log, its closing included.
+// Seconds that `write` takes, the closing of the log included.
 template <typename Write>
-double timed(const std::string& path, Write write) {
-    std::FILE* const log = std::fopen(path.c_str(), "w");
-    if (log == nullptr)
-        fail(path + ": " + std::strerror(errno));
+double timed(Write write) {
     const auto start = std::chrono::steady_clock::now();
-    write(log);
-    const bool bad = std::ferror(log) != 0;
-    if (std::fclose(log) != 0 || bad)
-        fail(path + ": could not be written");
+    write();
     return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
 }
 
+[[noreturn]] void failAt(const std::string& path) { fail(path + ": " + std::strerror(errno)); }
+
 double decode(std::vector<Record>& records, const Arguments& arguments) {
-    return timed(arguments.log, [&](std::FILE* log) {
-        decoder::ofp = log;
+    app::Log& log = app::traceLog;
+    decoder::ofp = log.open(arguments.log.c_str());
+    if (decoder::ofp == nullptr)
+        failAt(arguments.log);
+    decoder::writeLog = [](std::string_view entry) { app::traceLog.write(entry); };
+    const double seconds = timed([&] {
         vela::staticList<unsigned char> octets;
         for (unsigned long i = 0; i < arguments.repeat; ++i) {
             for (Record& record : records)
                 app::showRecord(record, octets);
         }
         decoder::ofp = nullptr;
+        log.close();
     });
+    if (!log.complete())
+        std::exit(EXIT_FAILURE);  // the log has said why
+    return seconds;
 }
 
 // One round of the capture at a time, as the first round of the log has it.
 double copy(const std::string& round, const Arguments& arguments) {
-    return timed(arguments.log, [&](std::FILE* log) {
+    std::FILE* const log = std::fopen(arguments.log.c_str(), "w");
+    if (log == nullptr)
+        failAt(arguments.log);
+    return timed([&] {
         for (unsigned long i = 0; i < arguments.repeat; ++i)
             (void)std::fwrite(round.data(), 1, round.size(), log);
+        const bool bad = std::ferror(log) != 0;
+        if (std::fclose(log) != 0 || bad)
+            failAt(arguments.log);
     });
 }
 
