@@ -24,6 +24,7 @@
 #include "app/Log.h"
 #include "app/display.h"
 #include "bench/inputs.h"
+#include "decoder/lines.h"
 #include "decoder/state.h"
 
 namespace {
