@@ -9,7 +9,7 @@ import unittest
 
 from harness import (MARK, RECEIVED, TRANSMITTED, SystemTest, capture, time_of)
 
-AT_ONCE = 12  # programs; most of their time they wait for a reply that does not come
+AT_ONCE = 32  # programs; most of their time they wait for a reply that does not come
 FRAMES = 250
 
 ADDRESS = r"{Node \w+ Board \w+ Processor \w+ Component \w+ Instance \w+}"
