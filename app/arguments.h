@@ -8,8 +8,8 @@ namespace app {
 
 // Program-wide, filled by parseArgs before any thread starts.
 inline int boardnumber = 0;
-inline int INST_NUM = 1;                          // the D channel
-inline std::array<char, 100> log_file_name{};     // terminated
+inline int INST_NUM = 1;                       // the D channel
+inline std::array<char, 100> log_file_name{};  // terminated
 
 // Reads the arguments. When they ask for help or cannot be used, prints the usage and ends the process with
 // status 0.

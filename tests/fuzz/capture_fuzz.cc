@@ -23,7 +23,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     try {
         check(softboard::readCapture(file.path()));
     } catch (const softboard::BadInput& error) {
-        fuzz::require(std::string_view(error.what()).starts_with(file.path() + ": "), "a report names the file");
+        fuzz::require(std::string_view(error.what()).starts_with(file.path() + ": "),
+                      "a report names the file");
     }
     return 0;
 }

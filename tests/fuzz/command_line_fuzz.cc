@@ -1,5 +1,5 @@
-// The command lines of the three programs. The input's first octet chooses the program; its words follow, each
-// with a zero octet or a line end behind it.
+// The command lines of the three programs. The input's first octet chooses the program; its words follow,
+// each with a zero octet or a line end behind it.
 #include <algorithm>
 #include <cstring>
 

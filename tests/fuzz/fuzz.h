@@ -1,5 +1,5 @@
-// What the fuzz targets share. A target takes any octets and returns; whatever else it does (a crash, a hang, a
-// leak, a broken promise) is a find.
+// What the fuzz targets share. A target takes any octets and returns; whatever else it does (a crash, a hang,
+// a leak, a broken promise) is a find.
 #ifndef TESTS_FUZZ_FUZZ_H
 #define TESTS_FUZZ_FUZZ_H
 

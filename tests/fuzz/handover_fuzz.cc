@@ -1,5 +1,5 @@
-// What the launcher hands over, as the library reads it: a scenario, which then survives another hand-over, or an
-// exception.
+// What the launcher hands over, as the library reads it: a scenario, which then survives another hand-over,
+// or an exception.
 #include "softboard/scenario.h"
 #include "tests/fuzz/fuzz.h"
 

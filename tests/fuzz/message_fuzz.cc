@@ -1,5 +1,5 @@
-// A payload read as a body of any family: reading stays within it, and what was read is written and read again
-// as it was. The input's first two octets choose the body and the transport's manner.
+// A payload read as a body of any family: reading stays within it, and what is written of it comes back. The
+// input's first two octets choose the body and the transport's manner.
 #include <sstream>
 
 #include "tests/fuzz/payload.h"
@@ -37,8 +37,8 @@ void readAndWrite(const fuzz::Octets& payload) {
     BodyType again;
     written.read(&again, 0);
     readsStayInside();
-    if constexpr (comesBack<BodyType>)
-        fuzz::require(printed(again) == text, "a body comes back as it was written");
+    if constexpr (comesBack<BodyType>)  // its counts set to what its lists hold
+        fuzz::require(printed(again) == printed(copy), "a body comes back as it was written");
     msg->setBodyDef(Table::make(BodyType::code));
     static_cast<void>(printed(*msg));
 }

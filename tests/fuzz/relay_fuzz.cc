@@ -1,5 +1,5 @@
-// What a connection brings, read by the relay and by the host: the relay takes no frame that the host would read
-// otherwise, and a message that it takes goes out again as it came.
+// What a connection brings, read by the relay and by the host: the relay takes no frame that the host would
+// read otherwise, and a message that it takes goes out again as it came.
 #include <sys/socket.h>
 #include <unistd.h>
 
@@ -16,8 +16,9 @@ namespace {
 int arrived(const fuzz::Octets& octets) {
     int ends[2];
     fuzz::require(socketpair(AF_UNIX, SOCK_STREAM, 0, ends) == 0, "a pair of sockets");
-    fuzz::require(send(ends[0], octets.data(), octets.size(), MSG_DONTWAIT) == static_cast<ssize_t>(octets.size()),
-                  "an input that fits into a socket");
+    fuzz::require(
+        send(ends[0], octets.data(), octets.size(), MSG_DONTWAIT) == static_cast<ssize_t>(octets.size()),
+        "an input that fits into a socket");
     close(ends[0]);
     return ends[1];
 }
@@ -70,7 +71,8 @@ void readByHost(const fuzz::Octets& octets, const std::vector<relay::Frame>& tak
         msg_t m;
         if (connection.get_msg(m) == 0) {
             fuzz::require(m.data[m.size] == 0 && m.ex_data[m.ex_size] == 0, "a zero octet behind each part");
-            fuzz::require(frames >= taken.size() || same(m, taken[frames]), "the host reads what the relay reads");
+            fuzz::require(frames >= taken.size() || same(m, taken[frames]),
+                          "the host reads what the relay reads");
             fillHeader(m);
             ++frames;
         }

@@ -24,7 +24,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         fuzz::require(softboard::fromJson(softboard::toJson(scenario)) == scenario,
                       "a scenario is handed over as it is");
     } catch (const softboard::BadInput& error) {
-        fuzz::require(std::string_view(error.what()).starts_with(file.path() + ":"), "a report names the file");
+        fuzz::require(std::string_view(error.what()).starts_with(file.path() + ":"),
+                      "a report names the file");
     }
     return 0;
 }

@@ -148,7 +148,7 @@ def scenarios():
 def handovers():
     frame = {"transmitted": True, "ticks": 7, "octets": "00ff"}
     channel = {"board": 1, "number": 2, "protocol": 7, "rate": 1, "perSecond": 2.5, "loop": True, "label": 2, "capture": 0}
-    whole = {"journal": "/tmp/j", "captures": [[frame], []], "channels": [channel]}
+    whole = {"journal": b"/tmp/j".hex(), "captures": [[frame], []], "channels": [channel]}
     yield json.dumps(whole).encode()
     yield json.dumps({**whole, "captures": []}).encode()
     yield json.dumps({**whole, "channels": [{**channel, "board": 256, "number": -1, "rate": 9}]}).encode()
