@@ -40,9 +40,15 @@ void Arrivals::leave(unsigned int number) {
     {
         const std::lock_guard guard(mutex_);
         endTurnLocked(number);
-        --present_;
+        if (--present_ == 0)
+            none_.notify_all();
     }
     room_.notify_one();
+}
+
+bool Arrivals::awaitNone(std::chrono::milliseconds limit) {
+    std::unique_lock guard(mutex_);
+    return none_.wait_for(guard, limit, [this] { return present_ == 0; });
 }
 
 void Arrivals::close() {
@@ -55,8 +61,16 @@ void Arrivals::close() {
         turn.notify_all();
 }
 
+void Arrivals::end() {
+    traceEnded_ = true;
+    close();
+}
+
+// What a board sends on after its trace was switched off is nobody's, and no news.
 TracedCcs::~TracedCcs() {
-    arrivals.close();
+    getMsgQueue()->unregisteredSource(
+        [](vela::MsgQueue*, vela::Msg* msg) { const std::unique_ptr<vela::Msg> dropped(msg); });
+    arrivals.end();
     endCallbacks();
 }
 

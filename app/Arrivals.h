@@ -9,6 +9,8 @@
 #define APP_ARRIVALS_H
 
 #include <array>
+#include <atomic>
+#include <chrono>
 #include <condition_variable>
 #include <mutex>
 #include <optional>
@@ -40,8 +42,14 @@ class Arrivals {
     // The next may go; nothing if the number has had its turn.
     void endTurn(unsigned int number);
 
-    // Nobody waits any more: places are unlimited and in no order. For the end of the trace.
+    // Until no record is there; false when `limit` has passed first.
+    bool awaitNone(std::chrono::milliseconds limit);
+
+    // Nobody waits any more: places are unlimited and in no order. For the end of whoever shows records.
     void close();
+    // The end of the trace: what arrives from now on, comes too late to be shown. Nobody waits any more.
+    void end();
+    bool ended() const { return traceEnded_; }
 
   private:
     static constexpr unsigned int Slots = 128;  // a power of two not below Most
@@ -54,6 +62,8 @@ class Arrivals {
 
     std::mutex mutex_;
     std::condition_variable room_;
+    std::condition_variable none_;
+    std::atomic<bool> traceEnded_ = false;
     bool closed_ = false;
     unsigned int present_ = 0;
     unsigned int next_ = 0;                             // the number of the next to arrive; wraps
@@ -87,6 +97,9 @@ class Turn {
     ~Turn();
     Turn(const Turn&) = delete;
     Turn& operator=(const Turn&) = delete;
+
+    // The record arrived, and the trace has ended meanwhile.
+    bool isLate() const { return number_ && arrivals.ended(); }
 
   private:
     std::optional<unsigned int> number_;

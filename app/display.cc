@@ -9,6 +9,7 @@
 #include <string_view>
 
 #include "app/Arrivals.h"
+#include "app/Log.h"
 #include "app/guarded.h"
 #include "decoder/cursor.h"
 #include "decoder/frame.h"
@@ -95,6 +96,7 @@ void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
         std::cout << "ERROR - received unexpected rtc event" << std::endl;
         return;
     }
+    traceLog.frameFollows();
     writeHeader(rec.Direction, rec.Timestamp);
     octets = rec.List.value();
     decoder::msglen = frameLength(rec.Length, octets.length());
@@ -113,6 +115,8 @@ void HANDLE_L2Trace_events(vela::CCS*, unsigned int, Record* rec) {
     std::unique_ptr<Record> held(rec);
     guarded(100, [&] {
         const Turn turn(held.get());
+        if (turn.isLate())
+            return;
         const std::lock_guard guard(queueGuard);
         if (event_queue.enqueue(held.get())) {
             static_cast<void>(held.release());  // the queue's entry's now

@@ -10,11 +10,15 @@
 
 namespace app {
 
+// The place whose body this thread runs, or ran last; 0 for none.
+inline thread_local int guardedPlace = 0;
+
 // Runs the body. What escapes is reported and thrown on, the unwinding of a cancelled thread included; a
 // thrown message is reported and ends there. `place` is the number that the report of a foreign exception
 // carries; it tells the three edges of the program apart.
 template <typename Body>
 void guarded(int place, Body body) {
+    guardedPlace = place;
     try {
         body();
     } catch (const vela::Exception& exception) {

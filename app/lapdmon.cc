@@ -1,20 +1,20 @@
 #include "app/lapdmon.h"
 
-#include <cerrno>
-#include <cstdio>
+#include <chrono>
 #include <cstdlib>
-#include <cstring>
 #include <iostream>
 #include <memory>
 #include <utility>
 
 #include "app/Arrivals.h"
+#include "app/Log.h"
 #include "app/arguments.h"
 #include "app/banner.h"
 #include "app/display.h"
 #include "app/guarded.h"
 #include "app/operator.h"
 #include "app/protocol.h"
+#include "app/unhandled.h"
 #include "decoder/lines.h"
 #include "vela/Board.h"
 #include "vela/TSCComponent.h"
@@ -35,26 +35,22 @@ constexpr unsigned int ProtocolTypeParm = 7;
 constexpr unsigned int L2TraceParm = 10;
 
 constexpr unsigned int QueueDepth = 50;
+// For what has arrived to be shown when nothing more can.
+constexpr std::chrono::seconds ShowingLimit{5};
 constexpr int MainPlace = 749;  // what main's report of a foreign exception carries
 
 void openLog() {
     if (!decoder::file_output)
         return;
-    decoder::ofp = std::fopen(log_file_name.data(), "w");
+    decoder::ofp = traceLog.open(log_file_name.data());
     if (decoder::ofp == nullptr)
         std::exit(EXIT_FAILURE);
+    decoder::writeLog = [](std::string_view entry) { traceLog.write(entry); };
 }
 
-// A log that could not be written whole is not closed without a word.
 void closeLog() {
-    if (decoder::ofp == nullptr)
-        return;
-    std::FILE* const log = std::exchange(decoder::ofp, nullptr);
-    const bool incomplete = std::ferror(log) != 0;
-    if (std::fclose(log) != 0)
-        std::cerr << log_file_name.data() << ": " << std::strerror(errno) << std::endl;
-    else if (incomplete)
-        std::cerr << log_file_name.data() << ": frames were lost, the log could not be written" << std::endl;
+    decoder::ofp = nullptr;
+    traceLog.close();
 }
 
 vela::TSCComponent findTsc(vela::Board& board) {
@@ -94,11 +90,21 @@ void startTrace(std::unique_ptr<vela::CCS> opened) {
     static_cast<void>(std::atexit(quit));
     watchSignals();
     Process.start(nullptr);
+    ccs->getMsgQueue()->connectionLost([](vela::MsgQueue*) { boardLost(); });
+}
+
+// The exit status.
+int awaitEnd() {
+    if (awaitQuit() == Ending::Asked)
+        return EXIT_SUCCESS;
+    std::cerr << "lapdmon: the board cannot be reached any more, the trace ends" << std::endl;
+    arrivals.awaitNone(ShowingLimit);
+    return EXIT_FAILURE;
 }
 
 // The exit status.
 int trace(int argc, char** argv) {
-    outliveScreen();
+    outliveOutput();
     vela::MsgQueue::DefaultDepth = QueueDepth;
     parseArgs(argc, argv);
     openLog();
@@ -115,8 +121,7 @@ int trace(int argc, char** argv) {
     if (!setProtocol(reply.Val))
         return EXIT_FAILURE;  // nothing has been switched on yet
     startTrace(std::move(opened));
-    awaitQuit();
-    return EXIT_SUCCESS;
+    return awaitEnd();
 }
 
 // One step of the shutdown, which goes on whatever happens.
@@ -131,11 +136,14 @@ void attempt(Step step) {
 }  // namespace
 
 void quit() {
+    if (ccs == nullptr)
+        return;
     std::cout << "One moment. Program Exiting" << std::endl;
     // The board first, so that no callback waits for the queue when the display thread goes; the log last.
     attempt([] { ccs->CancelEvt(vela::CCS::L2TraceGroup, nullptr); });
     attempt([] { ccs->SetParm(L2TraceParm, 0, nullptr); });
     attempt([] {
+        arrivals.end();
         Process.cancel();
         Process.join();
     });
@@ -145,15 +153,17 @@ void quit() {
 }
 
 int runTrace(int argc, char** argv) {
+    closeLogWhenUnhandled();
     int status = EXIT_SUCCESS;
     try {
         guarded(MainPlace, [&] { status = trace(argc, argv); });
     } catch (...) {  // reported
         status = EXIT_FAILURE;
     }
-    if (ccs == nullptr)
-        discardQueued();  // quit will not run, and no callback any more
-    return status;
+    quit();           // now, while the status can still say what became of the log
+    discardQueued();  // of a start that failed
+    closeLog();
+    return traceLog.complete() ? status : EXIT_FAILURE;
 }
 
 }  // namespace app

@@ -14,8 +14,9 @@ extern std::unique_ptr<vela::CCS> ccs;
 // Runs a trace until the operator ends it; returns the process's exit status.
 int runTrace(int argc, char** argv);
 
-// The orderly shutdown, run at process exit. Never throws: what fails is reported, and the next step goes on,
-// so that the log is always closed.
+// The orderly shutdown of a trace that is on, else nothing. Run by runTrace, and at process exit for whoever
+// leaves another way. Never throws: what fails is reported, and the next step goes on, so that the log is
+// always closed.
 void quit();
 
 }  // namespace app

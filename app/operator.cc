@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <array>
+#include <atomic>
 #include <cerrno>
 #include <csignal>
 
@@ -18,6 +19,13 @@ constexpr int ForEver = -1;
 
 // The handler's end and the waiter's end.
 std::array<int, 2> signalled{-1, -1};
+
+std::atomic<bool> lost = false;
+
+void wakeWaiter() {
+    const char mark = 's';
+    static_cast<void>(!write(signalled[1], &mark, 1));
+}
 
 // True when a signal came; otherwise the time is over or, if it is watched, the input can be read.
 bool awaitSignal(int timeoutMs, int input) {
@@ -33,8 +41,7 @@ void exit_handle(int) {
     const int saved = errno;
     for (const int each : Signals)
         std::signal(each, SIG_DFL);
-    const char mark = 's';
-    static_cast<void>(!write(signalled[1], &mark, 1));
+    wakeWaiter();
     errno = saved;
 }
 
@@ -52,9 +59,20 @@ void watchSignals() {
     }
 }
 
-void outliveScreen() { std::signal(SIGPIPE, SIG_IGN); }
+void outliveOutput() {
+    std::signal(SIGPIPE, SIG_IGN);
+    std::signal(SIGXFSZ, SIG_IGN);
+}
 
-void awaitQuit() {
+void boardLost() {
+    lost = true;
+    wakeWaiter();
+}
+
+namespace {
+
+// Until an octet is a "q", or the pipe is written to.
+void awaitEnd() {
     constexpr int NoInput = -1;
     int input = STDIN_FILENO;
     while (!awaitSignal(ForEver, input)) {
@@ -67,6 +85,13 @@ void awaitQuit() {
         if (awaitSignal(PauseMs, NoInput))
             return;
     }
+}
+
+}  // namespace
+
+Ending awaitQuit() {
+    awaitEnd();
+    return lost ? Ending::BoardLost : Ending::Asked;
 }
 
 }  // namespace app

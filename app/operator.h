@@ -9,12 +9,18 @@ namespace app {
 // ignored from the start, under nohup, stays so.
 void watchSignals();
 
-// A screen that nobody reads any more must not end the process, least of all its shutdown.
-void outliveScreen();
+// A screen or a log that nobody reads any more, or that grows past the limit of its size, must not end the
+// process, least of all its shutdown.
+void outliveOutput();
 
-// Returns once "q" was read from standard input or a signal came. Any other character is followed by a pause
-// of 10 seconds before the next is read; at the end of input only a signal is left.
-void awaitQuit();
+enum class Ending { Asked, BoardLost };
+
+// Returns once "q" was read from standard input, a signal came, or boardLost was called. Any other character
+// is followed by a pause of 10 seconds before the next is read; at the end of input only the others are left.
+Ending awaitQuit();
+
+// The board cannot be reached any more. From any thread, once watchSignals has returned.
+void boardLost();
 
 // The signal handler.
 void exit_handle(int signal);

@@ -21,8 +21,8 @@ constexpr std::array Protocols{
 }  // namespace
 
 const Protocol* protocolOf(unsigned int type) {
-    const auto* const found =
-        std::find_if(Protocols.begin(), Protocols.end(), [type](const Protocol& p) { return p.type == type; });
+    const auto* const found = std::find_if(Protocols.begin(), Protocols.end(),
+                                           [type](const Protocol& p) { return p.type == type; });
     return found == Protocols.end() ? nullptr : found;
 }
 

@@ -22,11 +22,13 @@ void LineBuffer::grow(std::size_t n) {
 
 void flushLines() {
     const std::string_view composed = lineBuffer.composed();
-    // A write that fails leaves its mark on the stream, for whoever owns it.
     if (file_output && ofp != nullptr && !composed.empty())
-        (void)std::fwrite(composed.data(), 1, composed.size(), ofp);
+        writeLog(composed);
     lineBuffer.clear();
 }
+
+// A write that fails leaves its mark on the stream, for whoever owns it.
+void writeToStream(std::string_view composed) { (void)std::fwrite(composed.data(), 1, composed.size(), ofp); }
 
 void bitwise(int value, int high, int low) {
     output(flag);

@@ -51,6 +51,12 @@ inline constinit LineBuffer lineBuffer;
 // Hands the text composed so far to the log; drops it when there is none (file_output, ofp).
 void flushLines();
 
+// Takes the text of each flushLines. It is written to ofp as it is, unless whoever opened the log has put a
+// function of their own here.
+using LogWriter = void (*)(std::string_view composed);
+void writeToStream(std::string_view composed);
+inline constinit LogWriter writeLog = writeToStream;
+
 // ---- pieces of text
 
 namespace tables {

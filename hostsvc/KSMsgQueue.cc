@@ -3,6 +3,7 @@
 #include <pthread.h>
 
 #include <iostream>
+#include <string>
 #include <utility>
 
 #include "hostsvc/KSRemoteService_ComFailure.h"
@@ -93,10 +94,13 @@ void KSMsgQueue::expect(const Expected& reply) {
     expected_ = reply;
     replyLock_.tryLock();  // held now, whatever an earlier request left
     waiting_ = true;
+    if (lost_)
+        replyLock_.unlock();
 }
 
 KSMsgRef KSMsgQueue::takeReply() {
     const std::lock_guard lock(guard_);
+    waiting_ = false;
     return KSMsgRef(std::exchange(reply_, nullptr));
 }
 
@@ -113,10 +117,38 @@ void* KSMsgQueue::readerBody(void* control, void* arg) {
     try {
         readNroute(static_cast<KSThread::control*>(control), static_cast<char*>(arg));
     } catch (const KSRemoteService_ComFailure& lost) {
-        std::cerr << "The connection to the remote message queue on " << lost.hostName() << " is lost"
-                  << std::endl;
+        std::cerr << "The connection to the remote message queue on " + std::string(lost.hostName()) +
+                         " is lost\n"
+                  << std::flush;  // in one piece: other queues may say the same
+        lose();
     }
     return nullptr;
+}
+
+// Whoever waits for a reply, waits no longer.
+void KSMsgQueue::lose() {
+    void (*callback)(void*) = nullptr;
+    {
+        const std::lock_guard lock(guard_);
+        lost_ = true;
+        if (std::exchange(waiting_, false))
+            replyLock_.unlock();
+        callback = lostCallback_;
+    }
+    if (callback != nullptr)
+        callback(lostArgument_);
+}
+
+void KSMsgQueue::registerLost(void (*callback)(void*), void* argument) {
+    bool lost = false;
+    {
+        const std::lock_guard lock(guard_);
+        lostCallback_ = callback;
+        lostArgument_ = argument;
+        lost = lost_;
+    }
+    if (lost)
+        callback(argument);
 }
 
 void KSMsgQueue::readNroute(KSThread::control* control, char* /*arg*/) {

@@ -47,6 +47,11 @@ class KSMsgQueue : private KSRunnable {
     // Beside a receiver, a plain callback is called first and must leave the message alone.
     void registerAsyncCallback(AsyncCallback callback);
 
+    // Called once, on the reader thread, when the connection to another machine is lost: nothing will arrive
+    // any more, and requests are not waited for. At once and on the thread that calls when it is lost
+    // already.
+    void registerLost(void (*callback)(void*), void* argument);
+
     // Sends msg, which is taken over (the handle becomes empty), with this queue as its source. With a
     // time-out, waits for the reply of its transaction and of replyType (or 0, or GeneralReply), from msg's
     // target unless anySource is not 0: an empty handle when none came in time. Without one, returns a new
@@ -98,6 +103,8 @@ class KSMsgQueue : private KSRunnable {
     void handOn(KSThread::control& control, NvMsg32Bit*& msg);
     bool park(NvMsg32Bit*& msg);
 
+    void lose();
+
     NvMsg32Bit* install(const Receivers& next);
     Receivers receivers() const;
 
@@ -110,6 +117,9 @@ class KSMsgQueue : private KSRunnable {
     Expected expected_{};
     bool waiting_ = false;
     NvMsg32Bit* reply_ = nullptr;
+    bool lost_ = false;
+    void (*lostCallback_)(void*) = nullptr;
+    void* lostArgument_ = nullptr;
     KSMutex replyLock_;  // held while there is no reply; the reader unlocks it
 };
 

@@ -168,7 +168,7 @@ std::uint32_t KSRemoteMsgQueue::takeMessage(const msg_t& frame, NvMsg32Bit** out
 }
 
 void KSRemoteMsgQueue::failed(bool withinFrame, NvMsg32Bit** out) {
-    std::cerr << "Error communicating with remote message queue on " << hostName_ << std::endl;
+    std::cerr << "Error communicating with remote message queue on " + hostName_ + "\n" << std::flush;
     if (withinFrame) {
         *out = nullptr;
         if (!closing_)

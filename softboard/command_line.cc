@@ -79,8 +79,38 @@ void addOptions(CLI::App& app, CommandLine& to) {
         ->type_name("FILE");
     app.add_option("--journal", to.journal, "Write every message between program and board to FILE")
         ->type_name("FILE");
+    app.add_option_function<std::vector<std::string>>(
+           "--fault",
+           [&to](const std::vector<std::string>& texts) {
+               for (const std::string& text : texts) {
+                   try {
+                       to.faults.push_back(parseFaultSetting(text));
+                   } catch (const BadInput& error) {
+                       throw CLI::ValidationError("--fault", error.what());
+                   }
+               }
+           },
+           "Something that board or library do wrong, from the list below; may be given again and again")
+        ->expected(1)
+        ->take_all()
+        ->type_name("NAME[=N]");
     app.set_help_flag("--help,-h", "Print this and exit");
     app.set_version_flag("--version", "softboard " SOFTBOARD_VERSION, "Print the version and exit");
+}
+
+// One line for each fault; the number in brackets is the one that is meant when none is given.
+std::string faultList() {
+    std::string list = "Faults (N counts from 1; the number when there is none in brackets):\n";
+    for (const FaultName& row : faultNames()) {
+        std::string form = std::string("  ") + row.name;
+        if (row.takesNumber) {
+            form += "=N";
+        }
+        form.resize(std::max<size_t>(form.size() + 1, 30), ' ');
+        list += form + row.help;
+        list += row.takesNumber ? " [" + std::to_string(row.otherwise) + "]\n" : "\n";
+    }
+    return list;
 }
 
 std::string absolute(const std::string& path) { return std::filesystem::absolute(path).string(); }
@@ -91,7 +121,7 @@ CommandLine parseCommandLine(const std::vector<std::string>& arguments) {
     CommandLine commandLine;
     CLI::App app("Runs PROGRAM on simulated KV9 boards, which play recorded D-channel frames.", "softboard");
     app.formatter(std::make_shared<Help>());
-    app.footer(examples);
+    app.footer(faultList() + "\n" + examples);
     addOptions(app, commandLine);
     const auto separator = std::find(arguments.begin(), arguments.end(), "--");
     std::vector<std::string> options(arguments.begin(), separator);
@@ -120,6 +150,7 @@ Scenario scenarioOf(const CommandLine& commandLine) {
         file = readScenarioFile(*commandLine.scenario);
     }
     Scenario scenario = resolve(commandLine.settings, commandLine.dchannels, file ? &*file : nullptr);
+    scenario.faults.insert(scenario.faults.end(), commandLine.faults.begin(), commandLine.faults.end());
     if (commandLine.journal) {
         scenario.journal = *commandLine.journal;
     }

@@ -15,6 +15,7 @@ struct CommandLine {
     std::optional<uint32_t> dchannels;
     std::optional<std::string> scenario;
     std::optional<std::string> journal;
+    std::vector<Fault> faults;         // beside those of the scenario file
     std::vector<std::string> program;  // with its arguments
 };
 

@@ -5,6 +5,8 @@ namespace softboard {
 
 void reset(const Scenario& scenario) { network().reset(scenario); }
 
+void setFaults(const std::vector<Fault>& faults) { network().setFaults(faults); }
+
 std::string journal() { return network().journal().text(); }
 
 std::string heard() { return network().journal().heard(); }

@@ -29,6 +29,7 @@ void Network::setUp(const Scenario& scenario) {
         Board& board = boards_.try_emplace(channel.board, channel.board).first->second;
         board.add(ccsComponent(channel, captures.at(channel.capture)));
     }
+    setFaultsLocked(scenario.faults);
 }
 
 void Network::reset(const Scenario& scenario) {
@@ -39,20 +40,44 @@ void Network::reset(const Scenario& scenario) {
     changed_.notify_all();
 }
 
-uint32_t Network::openQueue() {
+void Network::setFaults(const std::vector<Fault>& faults) {
     const std::lock_guard guard(lock_);
-    return queues_.open();
+    setFaultsLocked(faults);
+    changed_.notify_all();
 }
 
-NvCompDesc Network::bindQueue(uint32_t handle) {
+void Network::setFaultsLocked(const std::vector<Fault>& faults) {
+    misbehaviour_ = Misbehaviour(faults);
+    leavesOffset_ = misbehaviour_.has(FaultKind::offsetStays0);
+}
+
+NvMsg32Bit* Network::allocate(uint32_t size) {
+    {
+        const std::lock_guard guard(lock_);
+        if (misbehaviour_.fails(FaultKind::allocateFails)) {
+            return nullptr;
+        }
+    }
+    return buffers_.allocate(size);
+}
+
+uint32_t Network::openQueue() {
+    const std::lock_guard guard(lock_);
+    return misbehaviour_.fails(FaultKind::openFails) ? uint32_t{NVSTATUS_ERROR} : queues_.open();
+}
+
+uint32_t Network::bindQueue(uint32_t handle, NvCompDesc& host) {
     const std::lock_guard guard(lock_);
     const auto queue = queues_.get("nvQueueBind", handle);
     if (queue->bound) {
         misuse("nvQueueBind", "queue " + std::to_string(handle) + " is bound already");
     }
-    const Address host = queues_.bind(*queue);
+    if (misbehaviour_.fails(FaultKind::bindFails)) {
+        return NVSTATUS_ERROR;
+    }
+    host = compDescOf(queues_.bind(*queue));
     changed_.notify_all();  // frames may have waited for this address
-    return compDescOf(host);
+    return NVSTATUS_OK;
 }
 
 void Network::unbindQueue(uint32_t handle, const NvCompDesc& host) {
@@ -137,10 +162,25 @@ void Network::toBoard(const Message& command) {
         return;
     }
     journal_.add(Journal::Way::hostToBoard, command);
-    if (const auto reply = board->second.answer(command); reply) {
-        toHost(*reply);
+    if (!misbehaviour_.silent()) {
+        answer(board->second, command);
+        updatePlayers();
     }
-    updatePlayers();
+}
+
+void Network::answer(Board& board, const Message& command) {
+    const Messages beside = misbehaviour_.beside(command);
+    for (const Message& event : beside) {
+        toHost(event);
+    }
+    if (const auto reply = board.answer(command); reply) {
+        for (const Message& sent : misbehaviour_.repliesFor(command, *reply)) {
+            toHost(sent);
+        }
+    }
+    for (const Message& event : beside) {
+        toHost(event);
+    }
 }
 
 bool Network::toHost(const Message& message) {
@@ -206,9 +246,10 @@ void Network::startPlaying() {
 // nothing would ever slow them down.
 bool Network::heard(const Component& component) const {
     bool any = false;
+    const bool waits = !misbehaviour_.bursting() && !misbehaviour_.has(FaultKind::neverWaits);
     for (const Address& target : component.traceTargets()) {
         const Queue* queue = queues_.at(target);
-        if (queue != nullptr && queue->waiting.size() >= mostWaiting) {
+        if (waits && queue != nullptr && queue->waiting.size() >= mostWaiting) {
             return false;
         }
         any = any || queue != nullptr;
@@ -237,25 +278,31 @@ void Network::playNext(Component& component, Player::Time now) {
     body.u32(component.label).u32(frame.transmitted ? 1 : 0).u32(shown.ticks);
     body.u32(static_cast<uint32_t>(frame.octets.size())).octets(frame.octets);
     for (const Address& target : component.traceTargets()) {
-        toHost({0, msgEvtDetected, component.address, target, body.body()});
+        const Message event{0, msgEvtDetected, component.address, target, body.body()};
+        for (const Message& wrong : misbehaviour_.aheadOf(event)) {
+            toHost(wrong);
+        }
+        toHost(event);
     }
 }
 
 void Network::play() {
     std::unique_lock guard(lock_);
     while (!ending_) {
-        Component* component = nextPlaying();
+        Component* component = misbehaviour_.silent() ? nullptr : nextPlaying();
         if (component == nullptr) {
             changed_.wait(guard);
             continue;
         }
         const auto now = std::chrono::steady_clock::now();
         const auto due = component->player->due();
-        if (due > now) {
+        if (due > now && !misbehaviour_.bursting()) {
             changed_.wait_until(guard, due);
             continue;
         }
-        playNext(*component, now);
+        do {
+            playNext(*component, now);
+        } while (misbehaviour_.bursting() && component->player->playing());
         guard.unlock();  // a moment for those who write, read and close meanwhile
         std::this_thread::yield();
         guard.lock();

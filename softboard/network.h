@@ -2,6 +2,7 @@
 #ifndef SOFTBOARD_NETWORK_H
 #define SOFTBOARD_NETWORK_H
 
+#include <atomic>
 #include <map>
 #include <mutex>
 #include <thread>
@@ -9,6 +10,7 @@
 #include "softboard/board.h"
 #include "softboard/buffers.h"
 #include "softboard/journal.h"
+#include "softboard/misbehaviour.h"
 #include "softboard/queues.h"
 #include "softboard/scenario.h"
 
@@ -25,8 +27,11 @@ class Network {
     // Other boards from now on, and an empty journal; queues and buffers stay.
     void reset(const Scenario& scenario);
 
+    // Null when there is no memory, or a fault has it so.
+    NvMsg32Bit* allocate(uint32_t size);
+    // NVSTATUS_ERROR when a fault has it so; likewise bindQueue.
     uint32_t openQueue();
-    NvCompDesc bindQueue(uint32_t handle);
+    uint32_t bindQueue(uint32_t handle, NvCompDesc& host);
     void unbindQueue(uint32_t handle, const NvCompDesc& host);
     void closeQueue(uint32_t handle);
     // Waits for a message; null when the queue is closed.
@@ -42,6 +47,11 @@ class Network {
     // "buffers outstanding N, queues open M".
     std::string balance() const;
 
+    // Whether a body's first field leaves the offset at 0.
+    bool leavesOffset() const { return leavesOffset_; }
+    // Other faults from now on; what they count begins at 1.
+    void setFaults(const std::vector<Fault>& faults);
+
     // Ends the playing thread; called before the process ends.
     void shutDown();
 
@@ -53,6 +63,8 @@ class Network {
     void updatePlayers();
     void startPlaying();
     Component* nextPlaying();
+    void setFaultsLocked(const std::vector<Fault>& faults);
+    void answer(Board& board, const Message& command);
     bool heard(const Component& component) const;
     void playNext(Component& component, Player::Time now);
     void play();
@@ -63,6 +75,8 @@ class Network {
     std::condition_variable changed_;  // something the playing thread looks at
     Queues queues_;
     std::map<uint8_t, Board> boards_;
+    Misbehaviour misbehaviour_;
+    std::atomic<bool> leavesOffset_ = false;
     bool ending_ = false;
     bool threadless_ = false;  // the system refused one
     std::thread player_;

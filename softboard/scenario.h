@@ -6,6 +6,8 @@
 #include <string>
 #include <vector>
 
+#include "softboard/faults.h"
+
 namespace softboard {
 
 // One D-channel frame: address, control and information octets, no check sequence.
@@ -46,6 +48,7 @@ struct DChannel {
 struct Scenario {
     std::vector<DChannel> channels;
     std::vector<Frames> captures;
+    std::vector<Fault> faults;
     std::string journal;  // file that the journal is also written to; empty: none
 
     bool operator==(const Scenario&) const = default;

@@ -81,6 +81,28 @@ class TableReader {
         });
     }
 
+    std::vector<Fault> faults(const char* key) {
+        const toml::node* node = take(key);
+        if (node == nullptr) {
+            return {};
+        }
+        if (!node->is_array()) {
+            fail(*node, key, "must be a list of texts in quotes");
+        }
+        std::vector<Fault> faults;
+        for (const toml::node& each : *node->as_array()) {
+            if (!each.is_string()) {
+                fail(each, key, "must be a list of texts in quotes");
+            }
+            try {
+                faults.push_back(parseFaultSetting(*each.value<std::string>()));
+            } catch (const BadInput& error) {
+                fail(each, key, error.what());
+            }
+        }
+        return faults;
+    }
+
     const toml::array* tables(const char* key) {
         const toml::node* node = take(key);
         if (node == nullptr) {
@@ -182,6 +204,7 @@ ScenarioFile readScenarioFile(const std::string& path) {
     file.settings = readSettings(table);
     file.dchannels = table.number("dchannels", 1, mostDChannels);
     file.journal = table.file("journal");
+    file.faults = table.faults("faults");
     if (const toml::array* channels = table.tables("dchannel"); channels != nullptr) {
         for (const toml::node& channel : *channels) {
             file.channels.push_back(readChannel(path, *channel.as_table()));

@@ -52,10 +52,15 @@ DChannel channelFrom(const json& from) {
 }  // namespace
 
 std::string toJson(const Scenario& scenario) {
-    json to{
-        {"journal", pathToHex(scenario.journal)}, {"channels", json::array()}, {"captures", json::array()}};
+    json to{{"journal", pathToHex(scenario.journal)},
+            {"channels", json::array()},
+            {"captures", json::array()},
+            {"faults", json::array()}};
     for (const DChannel& channel : scenario.channels) {
         to["channels"].push_back(toJson(channel));
+    }
+    for (const Fault& fault : scenario.faults) {
+        to["faults"].push_back(toText(fault));
     }
     for (const Frames& frames : scenario.captures) {
         json& capture = to["captures"].emplace_back(json::array());
@@ -70,6 +75,9 @@ Scenario fromJson(const std::string& text) {
     const json from = json::parse(text);
     Scenario scenario;
     scenario.journal = pathFromHex(from.at("journal").get<std::string>());
+    for (const json& fault : from.at("faults")) {
+        scenario.faults.push_back(parseFault(fault.get<std::string>()));
+    }
     for (const json& capture : from.at("captures")) {
         Frames& frames = scenario.captures.emplace_back();
         for (const json& frame : capture) {

@@ -126,6 +126,14 @@ Rate parseRate(const std::string& text) {
     return framesPerSecond(*number);
 }
 
+Fault parseFaultSetting(const std::string& text) {
+    try {
+        return parseFault(text);
+    } catch (const std::invalid_argument& error) {
+        throw BadInput(error.what());
+    }
+}
+
 uint32_t parseNumberIn(const std::string& text, uint32_t least, uint32_t most) {
     const auto number = parseNumber<uint32_t>(text);
     if (!number || *number < least || *number > most) {
@@ -150,6 +158,7 @@ Scenario resolve(const Settings& commandLine, std::optional<uint32_t> dchannels,
     }
     if (file != nullptr) {
         scenario.journal = file->journal.value_or("");
+        scenario.faults = file->faults;
     }
     return scenario;
 }

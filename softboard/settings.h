@@ -40,6 +40,7 @@ struct ScenarioFile {
     Settings settings;  // of every D channel that does not say otherwise
     std::optional<uint32_t> dchannels;
     std::optional<std::string> journal;
+    std::vector<Fault> faults;
     std::vector<ChannelSettings> channels;
     std::string path;
 };
@@ -52,6 +53,8 @@ uint32_t parseProtocol(const std::string& text);
 // "recorded", "max" or frames per second; throws BadInput.
 Rate parseRate(const std::string& text);
 Rate framesPerSecond(double rate);
+// "reply-lost=3"; throws BadInput.
+Fault parseFaultSetting(const std::string& text);
 uint32_t parseNumberIn(const std::string& text, uint32_t least, uint32_t most);
 
 // The scenario that the command line and the file (null: none) ask for; reads the captures. Throws BadInput.

@@ -20,6 +20,9 @@ constexpr std::chrono::milliseconds longEnough{20000};
 // Other boards, with nothing subscribed or switched on, and an empty journal. Queues and buffers stay.
 void reset(const Scenario& scenario);
 
+// Other faults from now on, on the boards as they are; what they count begins at 1.
+void setFaults(const std::vector<Fault>& faults);
+
 // Every message so far, a line each, and notes (docs/softboard.md gives the form).
 std::string journal();
 // What the host has sent to boards, "8 {Parm 10 Val 1}\n" each.

@@ -51,6 +51,12 @@ uint32_t moveFields(const char* function, uint32_t count, va_list fields, Move m
     return status;
 }
 
+void advance(uint32_t& offset, uint32_t to) {
+    if (offset != 0 || !network().leavesOffset()) {
+        offset = to;
+    }
+}
+
 }  // namespace
 
 uint32_t nvDrvSetInterface(uint32_t /*unused*/, uint32_t /*unused*/) {
@@ -60,7 +66,7 @@ uint32_t nvDrvSetInterface(uint32_t /*unused*/, uint32_t /*unused*/) {
 
 uint32_t nvMsgAllocate(uint32_t size, NvMsg32Bit** msg) {
     checkStorage("nvMsgAllocate", msg);
-    NvMsg32Bit* made = network().buffers().allocate(size);
+    NvMsg32Bit* made = network().allocate(size);
     if (made == nullptr) {
         return NVSTATUS_ERROR;
     }
@@ -108,25 +114,28 @@ uint32_t nvMsgFieldPut(NvMsg32Bit* msg, uint32_t index, void* value) {
 uint32_t nvMsgVarFieldGet(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...) {
     const auto body = bodyOf("nvMsgVarFieldGet", msg);
     checkOffset("nvMsgVarFieldGet", offset, wildOffset);
+    uint32_t at = *offset;
     va_list fields;
     va_start(fields, offset);
     const uint32_t status = moveFields("nvMsgVarFieldGet", count, fields, [&](uint32_t descriptor, void* to) {
-        return softboard::getField(body, *offset, descriptor, to);
+        return softboard::getField(body, at, descriptor, to);
     });
     va_end(fields);
+    advance(*offset, at);
     return status;
 }
 
 uint32_t nvMsgVarFieldPut(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...) {
     const auto body = bodyOf("nvMsgVarFieldPut", msg);
     checkOffset("nvMsgVarFieldPut", offset, body.size());
+    uint32_t at = *offset;
     va_list fields;
     va_start(fields, offset);
-    const uint32_t status =
-        moveFields("nvMsgVarFieldPut", count, fields, [&](uint32_t descriptor, void* from) {
-            return softboard::putField(body, *offset, descriptor, from);
-        });
+    const uint32_t status = moveFields(
+        "nvMsgVarFieldPut", count, fields,
+        [&](uint32_t descriptor, void* from) { return softboard::putField(body, at, descriptor, from); });
     va_end(fields);
+    advance(*offset, at);
     return status;
 }
 
@@ -134,8 +143,7 @@ uint32_t nvQueueOpen(void) { return network().openQueue(); }
 
 uint32_t nvQueueBind(uint32_t queue, NvCompDesc* host) {
     checkStorage("nvQueueBind", host);
-    *host = network().bindQueue(queue);
-    return NVSTATUS_OK;
+    return network().bindQueue(queue, *host);
 }
 
 uint32_t nvQueueUnbind(uint32_t queue, NvCompDesc host) {

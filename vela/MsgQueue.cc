@@ -98,6 +98,16 @@ void MsgQueue::awaitIdle(std::unique_lock<std::mutex>& guard, const AsyncMsgRece
         receiverIdle_.wait(guard, [&] { return receiving_ != receiver; });
 }
 
+void MsgQueue::connectionLost(ConnectionLost handler) {
+    connectionLost_ = handler;
+    queue_->registerLost(&MsgQueue::lost, this);
+}
+
+void MsgQueue::lost(void* queue) {
+    auto* const self = static_cast<MsgQueue*>(queue);
+    self->connectionLost_.load()(self);
+}
+
 int MsgQueue::MsgRouter(KSMsgRef& ref) {
     try {
         route(adopt(ref));

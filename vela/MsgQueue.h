@@ -82,6 +82,11 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
     // standard error stream and deleted.
     void unregisteredSource(UnregisteredSource handler) { unregisteredSource_ = handler; }
 
+    // What happens when the connection to a board in another machine is lost for good; nothing by default.
+    // Called once, on the routing thread, or at once when it is lost already.
+    using ConnectionLost = void (*)(MsgQueue*);
+    void connectionLost(ConnectionLost handler);
+
     void toStream(std::ostream* out) const override;  // "{HostDesc: " address "}"
 
   private:
@@ -93,7 +98,10 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
     AsyncMsgReceiver* beginReceive(const CompDesc_t& source);
     void endReceive();
 
+    static void lost(void* queue);
+
     std::atomic<UnregisteredSource> unregisteredSource_;
+    std::atomic<ConnectionLost> connectionLost_ = nullptr;
     Mutex requestMutex_;  // one request with a wait at a time
 
     std::mutex receiversMutex_;

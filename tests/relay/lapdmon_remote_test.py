@@ -2,10 +2,11 @@
 
 import re
 import socket
+import struct
 import unittest
 
-from relay_harness import (CLOSE, CLOSED, LAPDMON, OPENED, RECEIVED, SOFTBOARD, TRANSMITTED, Peer, Program, Relay,
-                           RelayTest, frame, words)
+from relay_harness import (CCS, CLOSE, CLOSED, LAPDMON, OPENED, RECEIVED, SOFTBOARD, TRANSMITTED, Peer, Program, Relay,
+                           RelayTest, frame, message, words)
 
 # Reported on the screen: whoever sees it knows that the frames before it are in the log.
 MARK = (RECEIVED, bytes(300))
@@ -53,15 +54,54 @@ class SameLog(RelayTest):
 
 
 class Lost(RelayTest):
-    def test_a_relay_that_dies_during_a_trace_leaves_what_was_recorded(self):
+    def test_a_relay_that_dies_during_a_trace_ends_it_and_leaves_what_was_recorded(self):
         relay = Relay(self, ("--frames", self.capture("call.pcap", CALL + [MARK])))
         lapdmon = Program(self, LAPDMON, "-b1", "-f", "lost.log", REMOTE_NORV=f"127.0.0.1:{relay.port}")
         lapdmon.screen.wait("Frame Error")
         relay.kill()
-        lapdmon.errors.wait("is lost")
-        lapdmon.quits()  # each of its two requests waits for its answer
-        self.assertEqual((self.folder / "lost.log").read_text("latin-1").count("Hex Dump"), 6)
+        said = lapdmon.ends(status=1).splitlines()
+        self.assertEqual([line for line in said if not line.startswith("Error communicating")],
+                         2 * [f"The connection to the remote message queue on 127.0.0.1:{relay.port} is lost"] +
+                         ["lapdmon: the board cannot be reached any more, the trace ends"])
+        log = (self.folder / "lost.log").read_text("latin-1")
+        self.assertEqual(log.count("Hex Dump"), 6)
+        self.assertTrue(log.endswith("Frame Error \n"))
         self.assertEqual(lapdmon.screen.text().count("Addressable::Timeout"), 2)
+
+    def test_what_arrived_before_the_relay_died_is_shown(self):
+        """The relay sends 90 frames and is gone at once."""
+        listener = socket.create_server(("127.0.0.1", 0))
+        self.addCleanup(listener.close)
+        lapdmon = Program(self, LAPDMON, "-b1", "-f", "gone.log",
+                          REMOTE_NORV=f"127.0.0.1:{listener.getsockname()[1]}")
+        peers = []
+        for instance in (1, 2):
+            peers.append(Peer(listener.accept()[0]))
+            self.addCleanup(peers[-1].close)
+            peers[-1].read(48)
+            peers[-1].send(frame(OPENED, words(1, 0, 0, 0, instance)))
+            if instance == 1:
+                for component in (0x12, 0x15):
+                    self.answer(peers[0], 8388615, struct.pack("<HBBBB", component == 0x15, 1, 1, component, 0))
+        self.answer(peers[1], 19, struct.pack("<III", 7, 7, 0))
+        self.answer(peers[1], 9)
+        self.answer(peers[1], 23)
+        event = b"".join(message(32, struct.pack("<IIII", 2, 0, 25 * i, 3) + b"\0\1\x73", source=CCS, transaction=0,
+                                 target=(1, 0, 0, 0, 2)) for i in range(90))
+        peers[1].send(event)
+        for peer in peers:
+            peer.close()
+        said = lapdmon.ends(status=1)
+        self.assertIn("lapdmon: the board cannot be reached any more, the trace ends\n", said)
+        log = (self.folder / "gone.log").read_text("latin-1")
+        self.assertEqual(re.findall("Time = (\\S+)", log), [f"{i // 10}.{i % 10 * 100}" for i in range(90)])
+
+    def answer(self, peer, kind, body=b""):
+        _, _, block, _ = peer.read_frame()
+        _, transaction, _, *rest = struct.unpack(">14I", block)
+        node, board, processor, to_node, to_board, to_processor, instance, component, to_instance, to_component, _ = rest
+        peer.send(message(kind, body, source=(to_node, to_board, to_processor, to_component, to_instance),
+                          target=(node, board, processor, component, instance), transaction=transaction))
 
 
 class OnThePeer(RelayTest):

@@ -77,7 +77,8 @@ TEST_F(LauncherTest, HelpShowsEveryOptionAndExamples) {
     for (const char* expected :
          {"softboard [options] -- PROGRAM ARGS...", "--frames", "--protocol",
           "4ess|5ess|dms100|ntt|net5|ni2|N", "--rate", "recorded|FPS|max", "--loop", "--no-loop", "--board",
-          "--dchannels", "--scenario", "--journal", "--version", "softboard -- lapdmon -b1"}) {
+          "--dchannels", "--scenario", "--journal", "--fault NAME[=N]", "reply-other-source=N", "--version",
+          "softboard -- lapdmon -b1"}) {
         EXPECT_NE(ran.out.find(expected), std::string::npos) << expected;
     }
 }
@@ -110,6 +111,7 @@ TEST_F(LauncherTest, WhatIsWrongIsSaidAndTheProgramIsNotStarted) {
         {{"--frames", toml, "--"}, toml + ": unknown file format"},
         {{"--scenario", toml, "--"},
          toml + ":2: rate: \"fast\" is neither recorded, max nor a number of frames per second"},
+        {{"--fault", "none", "--"}, "--fault: there is no fault \"none\" (softboard --help lists them)"},
         {{"--journal", "/gone/journal", "--"}, "/gone/journal: No such file or directory"},
     };
     const std::string mark = path("mark");

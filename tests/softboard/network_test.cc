@@ -48,7 +48,8 @@ uint32_t ask(Network& network, uint32_t queue, const Address& from, uint32_t typ
 TEST(NetworkTest, WithoutAThreadToPlayThemFramesStayAwayAndTheBoardAnswersAllTheSame) {
     Network network(oneChannel({{true, 0, {0x00, 0x01, 0x7f}}}));
     const uint32_t queue = network.openQueue();
-    const NvCompDesc host = network.bindQueue(queue);
+    NvCompDesc host{};
+    network.bindQueue(queue, host);
     const Address from = addressOf(host);
     const NoThreads noThreads;
     testing::internal::CaptureStderr();

@@ -5,6 +5,7 @@
 
 #include <cstring>
 
+#include "softboard/command_line.h"
 #include "softboard/settings.h"
 #include "tests/softboard/temp_file.h"
 
@@ -128,6 +129,18 @@ TEST(ScenarioTest, TheCommandLineComesBeforeTheFilesGeneralSettingsAndADChannels
     EXPECT_EQ(scenario.journal, testing::TempDir() + "j");
 }
 
+TEST(ScenarioTest, FaultsOfTheCommandLineComeBesideThoseOfTheFile) {
+    CommandLine commandLine = parseCommandLine({"--fault", "burst=7", "--fault", "silent", "--", "true"});
+    commandLine.scenario = write("faults = [\"reply-lost=2\", \"reply-lost=3\"]\n");
+    const std::vector<Fault> both{{FaultKind::replyLost, 2},
+                                  {FaultKind::replyLost, 3},
+                                  {FaultKind::burst, 7},
+                                  {FaultKind::silent, 100}};
+    EXPECT_EQ(scenarioOf(commandLine).faults, both);
+    commandLine.scenario = write("faults = []\n");
+    EXPECT_EQ(scenarioOf(commandLine).faults.size(), 2U);
+}
+
 TEST(ScenarioTest, ABadFileIsRefusedWithItsPlaceAndTheReason) {
     struct {
         const char* text;
@@ -148,6 +161,11 @@ TEST(ScenarioTest, ABadFileIsRefusedWithItsPlaceAndTheReason) {
          ":1: protocol: \"q\" is none of 4ess, 5ess, dms100, ntt, net5, ni2 and no number"},
         {"frames = 3\n", ":1: frames: must be a text in quotes"},
         {"speed = 3\n", ":1: speed: is not a setting"},
+        {"faults = \"burst\"\n", ":1: faults: must be a list of texts in quotes"},
+        {"faults = [1]\n", ":1: faults: must be a list of texts in quotes"},
+        {"faults = [\"burst\",\n\"late\"]\n",
+         ":2: faults: there is no fault \"late\" (softboard --help lists them)"},
+        {"[[dchannel]]\nfaults = []\n", ":2: faults: is not a setting"},
         {"dchannel = 3\n", ":1: dchannel: must be written as [[dchannel]]"},
         {"[[dchannel]]\nnumber = 0\n", ":2: number: must be a number from 1 to 65535"},
         {"[[dchannel]]\ndchannels = 2\n", ":2: dchannels: is not a setting"},
@@ -181,6 +199,7 @@ TEST(HandoverTest, AScenarioComesBackAsItWas) {
         oneChannel({{true, 7, {0x00, 0xff}}, {false, 4294967295U, {}}}, {Rate::Kind::perSecond, 2.5});
     scenario.captures.push_back(builtinFrames());
     scenario.channels.push_back({9, 65535, 12, {Rate::Kind::recorded, 0}, true, 3, 1});
+    scenario.faults = {{FaultKind::replyLost, 3}, {FaultKind::neverWaits, 0}};
     scenario.journal = "/tmp/a \"name\"";
     EXPECT_EQ(fromJson(toJson(scenario)), scenario);
 }

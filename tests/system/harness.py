@@ -17,7 +17,7 @@ import threading
 import time
 import unittest
 
-LIMIT = 60  # seconds
+LIMIT = 120  # seconds
 
 LAPDMON = os.environ["LAPDMON"]
 SOFTBOARD = os.environ["SOFTBOARD"]

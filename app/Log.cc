@@ -1,0 +1,147 @@
+#include "app/Log.h"
+
+#include <poll.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstring>
+#include <iostream>
+#include <utility>
+
+namespace app {
+
+Log traceLog;
+
+namespace {
+
+// Octets written; fewer than there are, with errno, when a write failed.
+std::size_t writeAll(int file, std::string_view text) {
+    std::size_t written = 0;
+    while (written < text.size()) {
+        const ssize_t some = ::write(file, text.data() + written, text.size() - written);
+        if (some > 0) {
+            written += static_cast<std::size_t>(some);
+        } else if (some < 0 && errno == EAGAIN) {
+            pollfd room{file, POLLOUT, 0};
+            poll(&room, 1, -1);
+        } else if (some == 0 || errno != EINTR) {
+            errno = some == 0 ? ENOSPC : errno;
+            break;
+        }
+    }
+    return written;
+}
+
+}  // namespace
+
+Log::~Log() { close(); }
+
+std::FILE* Log::open(const char* name) {
+    name_ = name;
+    stream_ = std::fopen(name, "w");
+    return stream_;
+}
+
+void Log::write(std::string_view entry) {
+    held_ += entry;
+    entries_.push_back({held_.size(), std::exchange(isFrame_, false)});
+    if (held_.size() >= BlockSize)
+        writeOut();
+}
+
+// What has to come before the text that is held.
+std::string Log::makeHead() const {
+    return gap_ == 0 ? rest_ : rest_ + "Frames Lost: " + std::to_string(gap_) + " \n";
+}
+
+void Log::writeOut() {
+    const std::string head = makeHead();
+    held_.insert(0, head);
+    for (Entry& entry : entries_)
+        entry.end += head.size();
+    const std::size_t written = writeAll(fileno(stream_), held_);
+    if (written < held_.size()) {
+        writeFailed(head.size(), written, errno);
+    } else {
+        rest_.clear();
+        gap_ = 0;
+    }
+    held_.clear();
+    entries_.clear();
+}
+
+void Log::writeFailed(std::size_t headSize, std::size_t written, int reason) {
+    complain(reason);
+    // What squeezes in behind a gap, before a disk is full again, is not worth a line that says how much.
+    const bool again = gap_ != 0 && takeBack(written);
+    const std::size_t kept = again ? 0 : settle(headSize, written);
+    if (kept >= headSize)
+        gap_ = 0;
+    countLost(kept);
+}
+
+// Leaves whole entries in the file: takes back what is there of an entry, or keeps what is missing of it for
+// later. Returns how much of what is held is in the file or will be.
+std::size_t Log::settle(std::size_t headSize, std::size_t written) {
+    std::size_t before = 0;
+    std::size_t after = rest_.size();
+    bool isFrame = restIsFrame_;
+    const auto pass = [&](std::size_t end, bool frame) {
+        if (after >= written)
+            return;
+        before = after;
+        after = end;
+        isFrame = frame;
+    };
+    pass(headSize, false);
+    for (const Entry& entry : entries_)
+        pass(entry.end, entry.isFrame);
+    const bool restLeft = written < rest_.size();
+    if (written == after || (!restLeft && takeBack(written - before))) {
+        rest_.clear();
+        return written == after ? after : before;
+    }
+    rest_ = held_.substr(written, after - written);
+    restIsFrame_ = isFrame;
+    return after;
+}
+
+// Shortens the file, if it is one that can be.
+bool Log::takeBack(std::size_t octets) const {
+    const int file = fileno(stream_);
+    struct stat status {};
+    if (fstat(file, &status) != 0 || !S_ISREG(status.st_mode))
+        return false;
+    const off_t end = lseek(file, 0, SEEK_CUR) - static_cast<off_t>(octets);
+    return end >= 0 && ftruncate(file, end) == 0 && lseek(file, end, SEEK_SET) == end;
+}
+
+void Log::countLost(std::size_t kept) {
+    for (const Entry& entry : entries_) {
+        if (entry.end > kept && entry.isFrame) {
+            ++lost_;
+            ++gap_;
+        }
+    }
+}
+
+void Log::complain(int reason) {
+    if (std::exchange(complete_, false))
+        std::cerr << name_ + ": " + std::strerror(reason) + "\n" << std::flush;
+}
+
+void Log::close() {
+    if (stream_ == nullptr)
+        return;
+    if (!held_.empty() || !rest_.empty())
+        writeOut();
+    if (!rest_.empty() && restIsFrame_)
+        ++lost_;
+    if (std::fclose(std::exchange(stream_, nullptr)) != 0)
+        complain(errno);
+    if (!complete_)
+        std::cerr << name_ + ": frames lost: " + std::to_string(lost_) + "\n" << std::flush;
+}
+
+}  // namespace app

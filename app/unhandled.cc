@@ -1,0 +1,72 @@
+#include "app/unhandled.h"
+
+#include <cxxabi.h>
+#include <unistd.h>
+
+#include <cstdlib>
+#include <exception>
+#include <iostream>
+#include <sstream>
+#include <string>
+
+#include "app/Log.h"
+#include "app/display.h"
+#include "app/guarded.h"
+
+namespace app {
+
+namespace {
+
+constexpr unsigned int PatienceMs = 1000;
+constexpr unsigned int PollMs = 10;
+
+std::string typeOfException() {
+    const std::type_info* const type = abi::__cxa_current_exception_type();
+    if (type == nullptr)
+        return "no exception";
+    char* const plain = abi::__cxa_demangle(type->name(), nullptr, nullptr, nullptr);
+    std::string name = plain == nullptr ? type->name() : plain;
+    std::free(plain);  // NOLINT(*-no-malloc): allocated by the library
+    return name;
+}
+
+std::string whatIsWrong() {
+    std::ostringstream text;
+    text << typeOfException();
+    try {
+        if (const std::exception_ptr thrown = std::current_exception(); thrown != nullptr)
+            std::rethrow_exception(thrown);
+    } catch (const vela::Exception& exception) {
+        text << ": " << exception;
+    } catch (const std::exception& exception) {
+        text << ": " << exception.what();
+    } catch (...) {  // the type says it
+    }
+    return text.str();
+}
+
+std::string place() {
+    return guardedPlace == 0 ? "in a thread of the layers below"
+                             : "in lapdmon(" + std::to_string(guardedPlace) + ")";
+}
+
+// A log that another thread is stuck in stays as it is.
+void closeInTime() {
+    if (!queueGuard.tryLock(PatienceMs, PollMs))
+        return;
+    traceLog.close();
+    queueGuard.unlock();
+}
+
+[[noreturn]] void endUnhandled() {
+    closeInTime();
+    std::cerr << "lapdmon: the trace ends, nobody handled " + whatIsWrong() + " " + place() + "\n"
+              << std::flush;
+    _exit(EXIT_FAILURE);
+}
+
+}  // namespace
+
+void closeLogWhenUnhandled() { std::set_terminate(endUnhandled); }
+
+}  // namespace app
