@@ -140,7 +140,7 @@ def scenarios():
     for text in ('protocol = "ntt"\nboard = 2\nlabel = 3\njournal = "j"\n[[dchannel]]\nnumber = 4\nprotocol = 99\n',
                  "board = 1\nboard = 2\n", 'loop = "yes"\n', "board = 256\n", "dchannels = 3\nrate = 2.5\n", "rate = 0\n",
                  'rate = "max"\n', 'frames = "gone.pcap"\n', "[[dchannel]]\n[[dchannel]]\nnumber = 1\n", "dchannel = 3\n",
-                 "a = [1, {b = 0x1F, c = 1979-05-27T07:32:00Z}]\n", "a.b.c = '''x\ny'''\n", "label = 1e3\nx = inf\n",
+                 "a = [1, {b = 0x1F, c = 1979-05-27T07:32:00Z}]\n", "a.b.c = '''x\ny'''\n", "label = 1e3\nx = inf\n", 'faults = ["reply-lost=3", "burst"]\n', "faults = [1]\n",
                  '"\\u00e9" = "\\t"\n'):
         yield text.encode()
 
@@ -148,11 +148,13 @@ def scenarios():
 def handovers():
     frame = {"transmitted": True, "ticks": 7, "octets": "00ff"}
     channel = {"board": 1, "number": 2, "protocol": 7, "rate": 1, "perSecond": 2.5, "loop": True, "label": 2, "capture": 0}
-    whole = {"journal": b"/tmp/j".hex(), "captures": [[frame], []], "channels": [channel]}
+    whole = {"journal": b"/tmp/j".hex(), "captures": [[frame], []], "channels": [channel],
+             "faults": ["reply-lost=3", "never-waits"]}
     yield json.dumps(whole).encode()
     yield json.dumps({**whole, "captures": []}).encode()
     yield json.dumps({**whole, "channels": [{**channel, "board": 256, "number": -1, "rate": 9}]}).encode()
     yield json.dumps({**whole, "captures": [[{**frame, "octets": "0g"}, {**frame, "ticks": 1e99}]]}).encode()
+    yield json.dumps({**whole, "faults": ["reply-lost=0", "no-such"]}).encode()
     yield b"{}"
     yield b"[[[[]]]]"
 
@@ -162,7 +164,8 @@ def command_lines():
                "-b -d +8", "")
     softboard = ("--frames day.pcap --protocol ni2 --rate 20 --loop -- lapdmon -b1", "--help", "--version", "-- lapdmon",
                  "--board 3 --dchannels 2 --rate max --no-loop -- lapdmon -b3 -d2", "--rate=0 -- x", "--board 300 -- x",
-                 "--scenario two.toml --journal talk.txt -- lapdmon", "--protocol 9 --rate recorded -- x", "stray -- x")
+                 "--scenario two.toml --journal talk.txt -- lapdmon", "--protocol 9 --rate recorded -- x", "stray -- x",
+                 "--fault reply-lost=3 --fault burst -- x", "--fault no-such -- x", "--fault silent=x -- x")
     relay = ("--listen 0.0.0.0:6554 --allow 192.168.1.0/24", "--help", "--version", "--listen 127.0.0.1:0",
              "--max-clients 3 --frame-timeout 0.5 --write-timeout 3600", "--allow 1.2.3.4 --allow 10.0.0.0/8",
              "--listen 256.1.1.1", "--allow 1.2.3.0/33", "--frame-timeout nan", "--frame-timeout 1e9")
