@@ -31,18 +31,23 @@ constexpr unsigned int Transmitted = 1;
 constexpr unsigned int TicksPerSecond = 250;
 constexpr unsigned int MillisecondsPerTick = 4;
 
-// The C library's 24-character form and a line end.
-std::array<char, 26> localTime() {
-    const std::time_t now = std::time(nullptr);
-    std::array<char, 26> text{};
-    if (ctime_r(&now, text.data()) == nullptr)
-        text = {"\n"};
-    return text;
+// The second it is, in the C library's 24-character form and a line end. Under queueGuard. Frames of one
+// second share the text, whose making takes as long as the decoding of a frame.
+std::string_view localTime() {
+    static std::time_t shown = -1;
+    static long shownZone = 0;
+    static std::array<char, 26> text{};
+    if (const std::time_t now = std::time(nullptr); now != shown || timezone != shownZone) {
+        if (ctime_r(&now, text.data()) == nullptr)
+            text = {"\n"};
+        shown = now;
+        shownZone = timezone;  // as ctime_r has found it
+    }
+    return text.data();
 }
 
 void writeHeader(unsigned int direction, unsigned int timestamp) {
-    const std::array<char, 26> time = localTime();
-    const std::string_view timeLine(time.data());
+    const std::string_view timeLine = localTime();
     const auto seconds = decoder::dec(timestamp / TicksPerSecond);
     const auto milliseconds = decoder::dec(timestamp % TicksPerSecond * MillisecondsPerTick);
     if (direction == Transmitted) {

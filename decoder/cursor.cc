@@ -9,7 +9,7 @@ namespace decoder {
 
 RingBuffer& RingBuffer::operator=(const RingBuffer& other) {
     if (this != &other) {
-        std::copy(std::begin(other.data), std::end(other.data), data);
+        std::copy_n(other.data, other.stored(), data);
         readPtr = data + (other.readPtr - other.data);
         writePtr = data + (other.writePtr - other.data);
         count = other.count;

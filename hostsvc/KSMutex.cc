@@ -2,6 +2,7 @@
 
 #include "hostsvc/KSPoll.h"
 #include "hostsvc/KSPosixMutex.h"
+#include "hostsvc/KSSystem.h"
 
 KSMutex::KSMutex() : mutex_() {
     if (pthread_mutex_init(&mutex_, nullptr) != 0)
@@ -20,5 +21,7 @@ void KSMutex::unlock() {
 bool KSMutex::tryLock() { return ks_posix::tryLock(&mutex_) == 0; }
 
 bool KSMutex::tryLock(unsigned timeoutMs, unsigned intervalMs) {
-    return ks_poll(timeoutMs, intervalMs, [this] { return tryLock(); });
+    return ks_poll(
+        timeoutMs, intervalMs, [this] { return tryLock(); },
+        [this](timeval pause) { return ks_system().waitForLock(mutex_, pause); });
 }

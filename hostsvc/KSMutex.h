@@ -21,7 +21,8 @@ class KSMutex {
     // From any thread, locked or not. Once it lets another thread in, it touches the mutex no more.
     void unlock();
     bool tryLock();
-    // timeoutMs / intervalMs tries with intervalMs of sleep after each, and a last one. intervalMs is not 0.
+    // timeoutMs / intervalMs tries with intervalMs of sleep after each, and a last one. An unlock ends the
+    // sleep early, and with it the wait. intervalMs is not 0.
     bool tryLock(unsigned timeoutMs, unsigned intervalMs);
 
   private:

@@ -3,6 +3,7 @@
 #define HOSTSVC_KSPOSIXMUTEX_H
 
 #include <pthread.h>
+#include <time.h>
 
 #if defined(__SANITIZE_THREAD__)
 #include <dlfcn.h>
@@ -15,8 +16,9 @@ namespace ks_posix {
 
 using MutexCall = int (*)(pthread_mutex_t*);
 
-inline MutexCall inTheLibrary(const char* name) {
-    return reinterpret_cast<MutexCall>(dlsym(dlopen("libc.so.6", RTLD_LAZY | RTLD_NOLOAD), name));
+template <typename Call = MutexCall>
+Call inTheLibrary(const char* name) {
+    return reinterpret_cast<Call>(dlsym(dlopen("libc.so.6", RTLD_LAZY | RTLD_NOLOAD), name));
 }
 
 inline int lock(pthread_mutex_t* mutex) {
@@ -34,6 +36,14 @@ inline int tryLock(pthread_mutex_t* mutex) {
     return result;
 }
 
+inline int clockLock(pthread_mutex_t* mutex, clockid_t clock, const timespec* end) {
+    static const auto call = inTheLibrary<decltype(&pthread_mutex_clocklock)>("pthread_mutex_clocklock");
+    const int result = call(mutex, clock, end);
+    if (result == 0)
+        __tsan_acquire(mutex);
+    return result;
+}
+
 inline int unlock(pthread_mutex_t* mutex) {
     static const MutexCall call = inTheLibrary("pthread_mutex_unlock");
     __tsan_release(mutex);
@@ -46,6 +56,9 @@ namespace ks_posix {
 
 inline int lock(pthread_mutex_t* mutex) { return pthread_mutex_lock(mutex); }
 inline int tryLock(pthread_mutex_t* mutex) { return pthread_mutex_trylock(mutex); }
+inline int clockLock(pthread_mutex_t* mutex, clockid_t clock, const timespec* end) {
+    return pthread_mutex_clocklock(mutex, clock, end);
+}
 inline int unlock(pthread_mutex_t* mutex) { return pthread_mutex_unlock(mutex); }
 
 }  // namespace ks_posix

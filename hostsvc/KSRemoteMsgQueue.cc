@@ -58,20 +58,22 @@ class Patience {
 
 class KSRemoteMsgQueue::ReceivedFrame {
   public:
-    explicit ReceivedFrame(sock& connection) : result_(connection.get_msg(frame_)) {}
+    explicit ReceivedFrame(sock& connection)
+        : result_(connection.get_msg(frame_)), ended_(connection.failed()) {}
     ReceivedFrame(const ReceivedFrame&) = delete;
     ReceivedFrame& operator=(const ReceivedFrame&) = delete;
     ~ReceivedFrame() { free_msg(frame_); }
 
     bool good() const { return result_ == 0 && frame_.type != CloseFrame; }
     bool is(std::uint32_t type) const { return result_ == 0 && frame_.type == type; }
-    // Its header has come, and the rest has not.
-    bool brokenOff() const { return result_ != 0 && frame_.data != nullptr; }
+    // Its header has come, and the rest has not. A frame that is merely too large has come whole.
+    bool brokenOff() const { return result_ != 0 && ended_ && frame_.data != nullptr; }
     const msg_t& operator*() const { return frame_; }
 
   private:
     msg_t frame_;
     long result_;
+    bool ended_;
 };
 
 KSRemoteMsgQueue::KSRemoteMsgQueue(NvCompDesc desc, unsigned a, unsigned b, const char* hostName)

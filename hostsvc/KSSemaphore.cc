@@ -1,6 +1,7 @@
 #include "hostsvc/KSSemaphore.h"
 
 #include "hostsvc/KSPoll.h"
+#include "hostsvc/KSSystem.h"
 
 KSSemaphore::KSSemaphore(unsigned maxCount, unsigned initialCount) : semaphore_() {
     if (initialCount > maxCount || sem_init(&semaphore_, 0, initialCount) != 0)
@@ -10,7 +11,7 @@ KSSemaphore::KSSemaphore(unsigned maxCount, unsigned initialCount) : semaphore_(
 KSSemaphore::~KSSemaphore() { sem_destroy(&semaphore_); }
 
 void KSSemaphore::post() {
-    if (sem_post(&semaphore_) != 0)
+    if (ks_system().post(&semaphore_) != 0)
         throw PostError();
 }
 
@@ -22,5 +23,7 @@ void KSSemaphore::wait() {
 bool KSSemaphore::tryWait() { return sem_trywait(&semaphore_) == 0; }
 
 bool KSSemaphore::tryWait(unsigned timeoutMs, unsigned intervalMs) {
-    return ks_poll(timeoutMs, intervalMs, [this] { return tryWait(); });
+    return ks_poll(
+        timeoutMs, intervalMs, [this] { return tryWait(); },
+        [this](timeval pause) { return ks_system().waitForCount(semaphore_, pause); });
 }

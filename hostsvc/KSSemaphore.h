@@ -20,7 +20,8 @@ class KSSemaphore {
     void post();  // throws PostError
     void wait();  // goes on waiting when a signal interrupts it
     bool tryWait();
-    // timeoutMs / intervalMs tries with intervalMs of sleep after each, and a last one. intervalMs is not 0.
+    // timeoutMs / intervalMs tries with intervalMs of sleep after each, and a last one. A post ends the sleep
+    // early, and with it the wait. intervalMs is not 0.
     bool tryWait(unsigned timeoutMs, unsigned intervalMs);
 
   private:

@@ -4,14 +4,26 @@
 
 #include "hostsvc/KSSystem.h"
 
+namespace {
+
+timeval timeoutOf(unsigned microseconds) {
+    constexpr unsigned second = 1000000;
+    return {static_cast<time_t>(microseconds / second), static_cast<suseconds_t>(microseconds % second)};
+}
+
+unsigned microsecondsOf(unsigned milliseconds) { return milliseconds * 1000U; }
+
+}  // namespace
+
 void ks_sleep(unsigned seconds) { ks_system().sleep(seconds); }
 
-void ks_sleep_ms(unsigned milliseconds) { ks_sleep_us(milliseconds * 1000U); }
+void ks_sleep_ms(unsigned milliseconds) { ks_sleep_us(microsecondsOf(milliseconds)); }
 
 void ks_sleep_us(unsigned microseconds) {
-    constexpr unsigned second = 1000000;
-    const timeval timeout{static_cast<time_t>(microseconds / second),
-                          static_cast<suseconds_t>(microseconds % second)};
-    if (ks_system().waitFor(timeout) == -1)
-        std::cerr << "*** sleep_us interupted by signal ***" << std::endl;
+    if (ks_system().waitFor(timeoutOf(microseconds)) == -1)
+        ks_reportInterruptedSleep();
 }
+
+timeval ks_timeout_ms(unsigned milliseconds) { return timeoutOf(microsecondsOf(milliseconds)); }
+
+void ks_reportInterruptedSleep() { std::cerr << "*** sleep_us interupted by signal ***" << std::endl; }

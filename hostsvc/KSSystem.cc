@@ -4,11 +4,33 @@
 #include <unistd.h>
 
 #include <atomic>
+#include <cerrno>
+#include <ctime>
 #include <memory>
+
+#include "hostsvc/KSPosixMutex.h"
+
+#if defined(__SANITIZE_THREAD__)
+#include <sanitizer/tsan_interface.h>
+#endif
 
 namespace {
 
 std::atomic<KSSystem*> standIn{nullptr};
+
+// On the clock that nobody sets.
+timespec after(timeval timeout) {
+    constexpr long perSecond = 1000000000;
+    timespec then{};
+    clock_gettime(CLOCK_MONOTONIC, &then);
+    then.tv_sec += timeout.tv_sec;
+    then.tv_nsec += timeout.tv_usec * 1000;
+    if (then.tv_nsec >= perSecond) {
+        ++then.tv_sec;
+        then.tv_nsec -= perSecond;
+    }
+    return then;
+}
 
 }  // namespace
 
@@ -16,10 +38,27 @@ unsigned KSSystem::sleep(unsigned seconds) { return ::sleep(seconds); }
 
 int KSSystem::waitFor(timeval timeout) { return ::select(0, nullptr, nullptr, nullptr, &timeout); }
 
+int KSSystem::waitForCount(sem_t& semaphore, timeval timeout) {
+    const timespec end = after(timeout);
+    if (::sem_clockwait(&semaphore, CLOCK_MONOTONIC, &end) != 0)
+        return errno;
+#if defined(__SANITIZE_THREAD__)
+    __tsan_acquire(&semaphore);  // it knows of sem_post, but not of this call
+#endif
+    return 0;
+}
+
+int KSSystem::waitForLock(pthread_mutex_t& mutex, timeval timeout) {
+    const timespec end = after(timeout);
+    return ks_posix::clockLock(&mutex, CLOCK_MONOTONIC, &end);
+}
+
 int KSSystem::createThread(const pthread_attr_t* attributes, void* (*entry)(void*), void* argument) {
     pthread_t unused = 0;
     return ::pthread_create(&unused, attributes, entry, argument);
 }
+
+int KSSystem::post(sem_t* semaphore) { return ::sem_post(semaphore); }
 
 KSSystem& ks_system() {
     // Never destroyed: while the process exits there are threads that still sleep.

@@ -3,6 +3,7 @@
 #define HOSTSVC_KSSYSTEM_H
 
 #include <pthread.h>
+#include <semaphore.h>
 #include <sys/time.h>
 
 // The base class makes the calls. Any thread may use it.
@@ -19,8 +20,16 @@ class KSSystem {
     // select on no descriptors: 0 when the time has passed, -1 when a signal came first.
     virtual int waitFor(timeval timeout);
 
+    // Waits for a count of the semaphore, or for the mutex, and takes it: 0; ETIMEDOUT when the time has
+    // passed, EINTR when a signal came first.
+    virtual int waitForCount(sem_t& semaphore, timeval timeout);
+    virtual int waitForLock(pthread_mutex_t& mutex, timeval timeout);
+
     // pthread_create: 0, or what was wrong.
     virtual int createThread(const pthread_attr_t* attributes, void* (*entry)(void*), void* argument);
+
+    // sem_post: 0, or -1 when it is refused.
+    virtual int post(sem_t* semaphore);
 };
 
 // The one in use.

@@ -20,7 +20,7 @@ void Forwarder::catchUp() {
         ++marks_;
     }
     if (!queue_.mark())
-        throw Ended("the transport library has no memory for a message");
+        throw Ended("the transport library takes no message");
     std::unique_lock guard(lock_);
     changed_.wait(guard, [this] { return marks_ == 0 || !failure_.empty(); });
     if (!failure_.empty())

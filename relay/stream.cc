@@ -40,15 +40,15 @@ std::string lasting(std::chrono::milliseconds time) { return std::to_string(time
 
 }  // namespace
 
-// Frames are small and waited for; a host that has gone without a word is noticed.
+// Frames are small and waited for. A host that has gone without a word is noticed: by keep-alive, or, while
+// something is on its way to it and keep-alive rests, by the user time-out.
 Stream::Stream(Descriptor socket, Patience patience) : socket_(std::move(socket)), patience_(patience) {
+    const auto userTimeout = static_cast<int>(std::max<std::int64_t>(60000, patience.write.count()));
     const struct {
         int level, option, value;
-    } options[] = {{IPPROTO_TCP, TCP_NODELAY, 1},
-                   {SOL_SOCKET, SO_KEEPALIVE, 1},
-                   {IPPROTO_TCP, TCP_KEEPIDLE, 30},
-                   {IPPROTO_TCP, TCP_KEEPINTVL, 10},
-                   {IPPROTO_TCP, TCP_KEEPCNT, 3}};
+    } options[] = {{IPPROTO_TCP, TCP_NODELAY, 1},   {SOL_SOCKET, SO_KEEPALIVE, 1},
+                   {IPPROTO_TCP, TCP_KEEPIDLE, 30}, {IPPROTO_TCP, TCP_KEEPINTVL, 10},
+                   {IPPROTO_TCP, TCP_KEEPCNT, 3},   {IPPROTO_TCP, TCP_USER_TIMEOUT, userTimeout}};
     for (const auto& each : options)
         setsockopt(socket_.get(), each.level, each.option, &each.value, sizeof each.value);
 }

@@ -35,9 +35,9 @@ Message TransportQueue::read() const {
     return Message(nvMsgRead(handle_, 0, &msg) == NVSTATUS_OK ? msg : nullptr);
 }
 
-void TransportQueue::write(Message msg) const {
+bool TransportQueue::write(Message msg) const {
     setSource(*msg, address_);
-    nvMsgWrite(handle_, msg.release(), 0);
+    return nvMsgWrite(handle_, msg.release(), 0) == NVSTATUS_OK;
 }
 
 bool TransportQueue::mark() const {
@@ -47,8 +47,7 @@ bool TransportQueue::mark() const {
     msg->transaction = markTransaction << 8 | (msg->transaction & 0xFFU);
     msg->type = 0;
     setTarget(*msg, address_);
-    write(std::move(msg));
-    return true;
+    return write(std::move(msg));
 }
 
 bool TransportQueue::isMark(const NvMsg32Bit& msg) const {

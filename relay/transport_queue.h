@@ -20,11 +20,12 @@ class TransportQueue {
 
     // Waits for the next message; null when the queue has failed or is closed.
     Message read() const;
-    // Sends msg under the queue's own address, whoever it says it is from.
-    void write(Message msg) const;
+    // Sends msg under the queue's own address, whoever it says it is from. False when the library refuses it;
+    // gone it is all the same.
+    bool write(Message msg) const;
 
-    // An empty message to the queue itself, which comes behind everything that is in the queue. False without
-    // memory for it.
+    // An empty message to the queue itself, which comes behind everything that is in the queue. False when
+    // the library has no memory for it, or refuses it: it will not come.
     bool mark() const;
     bool isMark(const NvMsg32Bit& msg) const;
 

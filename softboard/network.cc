@@ -13,6 +13,9 @@ namespace {
 
 // A frame waits while so many messages wait in the queue that it is for.
 constexpr size_t mostWaiting = 64;
+// So many frames in a row leave those who write, read and close no moment. Each such moment costs a time
+// slice where processors are taken.
+constexpr unsigned mostInARow = 16;
 
 }  // namespace
 
@@ -288,6 +291,7 @@ void Network::playNext(Component& component, Player::Time now) {
 
 void Network::play() {
     std::unique_lock guard(lock_);
+    unsigned inARow = 0;
     while (!ending_) {
         Component* component = misbehaviour_.silent() ? nullptr : nextPlaying();
         if (component == nullptr) {
@@ -303,9 +307,11 @@ void Network::play() {
         do {
             playNext(*component, now);
         } while (misbehaviour_.bursting() && component->player->playing());
-        guard.unlock();  // a moment for those who write, read and close meanwhile
-        std::this_thread::yield();
-        guard.lock();
+        if (++inARow % mostInARow == 0) {
+            guard.unlock();
+            std::this_thread::yield();
+            guard.lock();
+        }
     }
 }
 

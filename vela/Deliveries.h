@@ -8,7 +8,9 @@
 
 namespace vela {
 
-// From any thread. Shared by the dispatcher and its deliveries: a callback may destroy the dispatcher.
+// From any thread. Shared by the dispatcher and its deliveries: a callback on a thread of its own may destroy
+// the dispatcher, and its delivery ends after that. One on the dispatching thread may not: the dispatcher
+// goes on there when it returns.
 class Deliveries {
   public:
     struct Entry {

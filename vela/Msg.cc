@@ -34,7 +34,10 @@ unsigned int Msg::fieldGet(unsigned int index, void* value) { return ref_->field
 unsigned int Msg::fieldPut(unsigned int index, void* value) { return ref_->fieldPut(index, value); }
 NvMsg32Bit* Msg::getNvMsgRef() const { return ref_->getMsgRef(); }
 
-void Msg::setBodyDef(MsgBody* body) { body_.reset(body); }
+void Msg::setBodyDef(MsgBody* body) {
+    if (body != body_.get())
+        body_.reset(body);
+}
 
 void Msg::toStream(std::ostream* out) const {
     const StreamFlags saved(*out);

@@ -70,7 +70,7 @@ Msg* MsgQueue::request(Msg* cmd, unsigned int timeoutMs, unsigned int retMsgType
 }
 
 void MsgQueue::RegisterAsyncMsgReceiver(const CompDesc_t& source, AsyncMsgReceiver* receiver) {
-    const std::lock_guard guard(receiversMutex_);
+    const std::lock_guard guard(receivers_);
     if (receivers_.find(source) != nullptr)
         throw Exception(
             "Only One AsyncMsgReceiver can be registered for each source address on a particular MsgQueue");
@@ -78,14 +78,14 @@ void MsgQueue::RegisterAsyncMsgReceiver(const CompDesc_t& source, AsyncMsgReceiv
 }
 
 void MsgQueue::DeregisterAsyncMsgReceiver(const CompDesc_t& source) {
-    std::unique_lock guard(receiversMutex_);
+    std::unique_lock guard(receivers_);
     const AsyncMsgReceiver* const leaving = receivers_.element(source);
     receivers_.unset(source);
     awaitIdle(guard, leaving);
 }
 
 void MsgQueue::withdraw(const CompDesc_t& source, const AsyncMsgReceiver* receiver) {
-    std::unique_lock guard(receiversMutex_);
+    std::unique_lock guard(receivers_);
     AsyncMsgReceiver** const registered = receivers_.find(source);
     if (registered != nullptr && *registered == receiver)
         receivers_.unset(source);
@@ -93,9 +93,13 @@ void MsgQueue::withdraw(const CompDesc_t& source, const AsyncMsgReceiver* receiv
 }
 
 // The routing thread does not wait for itself.
-void MsgQueue::awaitIdle(std::unique_lock<std::mutex>& guard, const AsyncMsgReceiver* receiver) {
+void MsgQueue::awaitIdle(std::unique_lock<Receivers>& guard, const AsyncMsgReceiver* receiver) {
     if (routingThread_ != std::this_thread::get_id())
         receiverIdle_.wait(guard, [&] { return receiving_ != receiver; });
+}
+
+void MsgQueue::unregisteredSource(UnregisteredSource handler) {
+    unregisteredSource_ = handler == nullptr ? reportUnregisteredSource : handler;
 }
 
 void MsgQueue::connectionLost(ConnectionLost handler) {
@@ -141,7 +145,7 @@ void MsgQueue::routeUnregistered(std::unique_ptr<Msg> msg) {
 }
 
 AsyncMsgReceiver* MsgQueue::beginReceive(const CompDesc_t& source) {
-    const std::lock_guard guard(receiversMutex_);
+    const std::lock_guard guard(receivers_);
     AsyncMsgReceiver** const found = receivers_.find(source);
     receiving_ = found == nullptr ? nullptr : *found;
     routingThread_ = std::this_thread::get_id();
@@ -150,7 +154,7 @@ AsyncMsgReceiver* MsgQueue::beginReceive(const CompDesc_t& source) {
 
 void MsgQueue::endReceive() {
     {
-        const std::lock_guard guard(receiversMutex_);
+        const std::lock_guard guard(receivers_);
         receiving_ = nullptr;
     }
     receiverIdle_.notify_all();

@@ -15,7 +15,7 @@
 #include "vela/Msg.h"
 #include "vela/Mutex.h"
 #include "vela/Shared.h"
-#include "vela/linkedList.h"
+#include "vela/sharedKeyedList.h"
 
 namespace vela {
 
@@ -79,8 +79,8 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
     void withdraw(const CompDesc_t& source, const AsyncMsgReceiver* receiver);
 
     // What becomes of messages from sources that nobody registered for; by default they are reported on the
-    // standard error stream and deleted.
-    void unregisteredSource(UnregisteredSource handler) { unregisteredSource_ = handler; }
+    // standard error stream and deleted, which is what null asks for again.
+    void unregisteredSource(UnregisteredSource handler);
 
     // What happens when the connection to a board in another machine is lost for good; nothing by default.
     // Called once, on the routing thread, or at once when it is lost already.
@@ -90,11 +90,13 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
     void toStream(std::ostream* out) const override;  // "{HostDesc: " address "}"
 
   private:
+    using Receivers = sharedKeyedList<CompDesc_t, AsyncMsgReceiver*>;
+
     // On the transport's reading thread, for every message that is no reply.
     int MsgRouter(KSMsgRef& ref);
     void route(std::unique_ptr<Msg> msg);
     void routeUnregistered(std::unique_ptr<Msg> msg);
-    void awaitIdle(std::unique_lock<std::mutex>& guard, const AsyncMsgReceiver* receiver);
+    void awaitIdle(std::unique_lock<Receivers>& guard, const AsyncMsgReceiver* receiver);
     AsyncMsgReceiver* beginReceive(const CompDesc_t& source);
     void endReceive();
 
@@ -104,11 +106,10 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
     std::atomic<ConnectionLost> connectionLost_ = nullptr;
     Mutex requestMutex_;  // one request with a wait at a time
 
-    std::mutex receiversMutex_;
-    std::condition_variable receiverIdle_;
-    keyedList<CompDesc_t, AsyncMsgReceiver*> receivers_;
+    Receivers receivers_;                    // its lock guards the next two as well
     AsyncMsgReceiver* receiving_ = nullptr;  // in use by the routing thread
     std::thread::id routingThread_;
+    std::condition_variable_any receiverIdle_;
 
     // Last: its thread uses everything above, and is gone first.
     std::unique_ptr<KSMsgQueue> queue_;

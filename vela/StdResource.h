@@ -99,8 +99,10 @@ class StdResource : public Addressable, public StdResourceMessages {
         command(MsgSetAllParmsDef_t(), reply, wait);
     }
 
-    // Events of the type go to returnTo's address, or with null to this object's own queue. Cancelling names
-    // the type alone, wherever its events went.
+    // Has the component send its events of the type. With null they go to the host address of this object's
+    // queue, where its callbacks are registered for them; after it has moved to another queue they still go
+    // to the old one. With an object they go to that object's target address, which stands on the board: not
+    // to its callbacks. Cancelling names the type alone, wherever its events went.
     void DetectEvt(MsgDetectEvt_t& cmd, MsgDetectEvtCmplt_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }

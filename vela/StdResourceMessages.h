@@ -78,6 +78,7 @@ struct StdResourceMessages {
         MsgError_t(unsigned int& errorMsg, unsigned int& errorCode, Data_ErrorMsg_0x8_t& data);
 
         auto fields() { return std::tuple_cat(Body::fields(), std::tie(Data)); }
+        auto fields() const { return std::tuple_cat(Body::fields(), std::tie(Data)); }
         bool hasData() const;
         unsigned int writeMsg(Msg* msg, unsigned int offset) override;
         unsigned int readMsg(Msg* msg, unsigned int offset) override;

@@ -20,6 +20,7 @@ struct ParmFieldDefVal_t : Body<NoCode, ParmFieldDef> {
     ParmFieldDefVal_t(unsigned int& parm, unsigned int& fieldDef, staticList<unsigned int>& val);
 
     auto fields() { return std::tuple_cat(Body::fields(), std::tie(Val)); }
+    auto fields() const { return std::tuple_cat(Body::fields(), std::tie(Val)); }
     // A list that is too short for FieldDef grows, with zeros; one that is too long is not sent whole.
     unsigned int writeMsg(Msg* msg, unsigned int offset) override;
     unsigned int readMsg(Msg* msg, unsigned int offset) override;

@@ -90,7 +90,7 @@ void Thread::abandon() {
 
 // The primitive deletes itself when its body ends.
 void Thread::letGo() {
-    if (thread_ != nullptr)
+    if (!letGo_.exchange(true))
         thread_.release()->abandon();
 }
 

@@ -69,7 +69,8 @@ class Thread : public virtualObject {
     void join();
     void* getResult();
     // The thread that runs, or the next one started, is left to run and clean up by itself; this object may
-    // go before it and has nothing to say to it any more.
+    // go before it and has nothing to say to it any more. May come from the body, while start() has not
+    // returned on its own thread; all else that is called here comes from one thread at a time.
     void abandon();
 
   private:
@@ -80,6 +81,7 @@ class Thread : public virtualObject {
     std::unique_ptr<KSThread> thread_;  // null once it is abandoned and runs
     std::atomic<bool> started_{false};  // and not joined since
     std::atomic<bool> abandoned_{false};
+    std::atomic<bool> letGo_{false};  // by start() or by abandon(), whichever is first to know of the other
 };
 
 // Start a thread that nobody joins; its control is null. Throw Thread::CreationError.

@@ -9,7 +9,6 @@
 #include <algorithm>
 #include <chrono>
 #include <cstdlib>
-#include <cstring>
 #include <iomanip>
 #include <iostream>
 #include <memory>
@@ -17,23 +16,16 @@
 #include <thread>
 #include <vector>
 
+#include "bench/host.h"
 #include "hostsvc/KSLocalMsgQueue.h"
-#include "hostsvc/KSMsgRef.h"
 #include "hostsvc/KSRemoteMsgQueue.h"
 #include "relay/server.h"
 
 namespace {
 
+using bench::Host;
 using Clock = std::chrono::steady_clock;
 using Microseconds = std::chrono::duration<double, std::micro>;
-
-constexpr NvCompDesc Ccs{1, 1, 0, 1, 0x15, 0, 0};
-constexpr unsigned SetParm = 8;
-constexpr unsigned GetParm = 18;
-constexpr unsigned DetectEvt = 22;
-constexpr unsigned EvtDetected = 32;
-constexpr std::uint8_t TraceParm = 10;
-constexpr std::uint8_t ProtocolParm = 7;
 
 class BackgroundRelay {
   public:
@@ -52,57 +44,6 @@ class BackgroundRelay {
     std::thread thread_;
 };
 
-class Host {
-  public:
-    explicit Host(std::unique_ptr<KSAbstractMsgQueue> queue) : queue_(std::move(queue)) {}
-
-    void tell(unsigned type, const std::vector<std::uint8_t>& body) {
-        KSMsgRef msg(static_cast<unsigned>(body.size()));
-        msg.setMsgType(type);
-        msg.setSrcAddr(queue_->getHostDesc());
-        msg.setTgtAddr(Ccs);
-        std::memcpy(msg.getMsgRef() + 1, body.data(), body.size());
-        queue_->msgWrite(msg.getMsgRef());
-    }
-
-    // The type of the next message.
-    unsigned hear() {
-        NvMsg32Bit* read = nullptr;
-        if (queue_->msgRead(&read) != 0)
-            std::exit(EXIT_FAILURE);
-        KSMsgRef msg(read);
-        const unsigned type = msg.getMsgType();
-        msg.free();
-        return type;
-    }
-
-    void hearUntil(unsigned type) {
-        while (hear() != type) {
-        }
-    }
-
-    std::vector<std::uint8_t> detectBody() const {
-        const NvCompDesc host = queue_->getHostDesc();
-        return {static_cast<std::uint8_t>(host.instance),
-                static_cast<std::uint8_t>(host.instance >> 8),
-                host.board,
-                host.processor,
-                host.component,
-                host.node,
-                2,
-                0,
-                0,
-                0,
-                0,
-                0,
-                0,
-                0};
-    }
-
-  private:
-    std::unique_ptr<KSAbstractMsgQueue> queue_;
-};
-
 struct Figures {
     double eventsPerSecond;
     double median;  // of an answer, in microseconds
@@ -114,8 +55,7 @@ void measureAnswers(Host& host, std::chrono::duration<double> time, Figures& fig
     const auto end = Clock::now() + time;
     while (Clock::now() < end) {
         const auto asked = Clock::now();
-        host.tell(GetParm, {ProtocolParm, 0, 0, 0});
-        host.hear();
+        host.askProtocol();
         took.push_back(Microseconds(Clock::now() - asked).count());
     }
     std::sort(took.begin(), took.end());
@@ -124,17 +64,14 @@ void measureAnswers(Host& host, std::chrono::duration<double> time, Figures& fig
 }
 
 void measureEvents(Host& host, std::chrono::duration<double> time, Figures& figures) {
-    host.tell(DetectEvt, host.detectBody());
-    host.tell(SetParm, {TraceParm, 0, 0, 0, 1, 0, 0, 0});
-    host.hearUntil(EvtDetected);
+    host.startTrace();
     const auto start = Clock::now();
     unsigned long count = 0;
     while (Clock::now() - start < time)
-        count += host.hear() == EvtDetected ? 1 : 0;
+        count += host.hearEvent() ? 1 : 0;
     figures.eventsPerSecond =
         static_cast<double>(count) / std::chrono::duration<double>(Clock::now() - start).count();
-    host.tell(SetParm, {TraceParm, 0, 0, 0, 0, 0, 0, 0});
-    host.hearUntil(SetParm + 1);
+    host.endTrace();
 }
 
 Figures measure(std::unique_ptr<KSAbstractMsgQueue> queue, double seconds) {

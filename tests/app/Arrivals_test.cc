@@ -125,6 +125,16 @@ TEST(Arrivals, NobodyWaitsOnceTheyAreClosed) {
     noTurn.get();
 }
 
+TEST(Arrivals, AreWaitedForUntilNoneIsThere) {
+    Arrivals arrivals;
+    EXPECT_TRUE(arrivals.awaitNone(std::chrono::milliseconds(0)));
+    auto place = std::make_unique<Place>(arrivals);
+    EXPECT_FALSE(arrivals.awaitNone(std::chrono::milliseconds(0)));
+    auto awaited = std::async(std::launch::async, [&] { return arrivals.awaitNone(std::chrono::hours(1)); });
+    place.reset();
+    EXPECT_TRUE(awaited.get());
+}
+
 TEST(Turn, OfARecordThatDidNotArriveComesAtOnce) {
     const vela::CCS::EvtL2Trace_t plain;
     const Turn first(&plain);
@@ -139,6 +149,16 @@ TEST(Turn, MayOutliveItsRecord) {
         rec.reset();
     }
     arrivals.awaitTurn(next.place.number());
+}
+
+// Last: the program-wide arrivals do not come back.
+TEST(Turn, OfARecordThatCameAfterTheEndIsLate) {
+    const ArrivedRecord rec;
+    const vela::CCS::EvtL2Trace_t plain;
+    EXPECT_FALSE(Turn(&rec).isLate());
+    arrivals.end();
+    EXPECT_TRUE(Turn(&rec).isLate());
+    EXPECT_FALSE(Turn(&plain).isLate());
 }
 
 }  // namespace

@@ -2,6 +2,7 @@
 
 #include <gmock/gmock.h>
 
+#include <latch>
 #include <thread>
 
 #include "tests/support/test_system.h"
@@ -78,6 +79,45 @@ TEST(KSMutex, APolledTryLockStopsSleepingOnceItSucceeds) {
     };
     EXPECT_TRUE(mutex.tryLock(1000, 100));
     EXPECT_THAT(system.naps(), testing::ElementsAre(100000, 100000, 100000));
+    mutex.unlock();
+}
+
+// The system itself, but it says when somebody begins a pause.
+class WatchedPauses : public KSSystem {
+  public:
+    WatchedPauses() { ks_useSystem(this); }
+    ~WatchedPauses() override { ks_useSystem(nullptr); }
+
+    int waitForLock(pthread_mutex_t& mutex, timeval timeout) override {
+        begun.count_down();
+        return KSSystem::waitForLock(mutex, timeout);
+    }
+
+    std::latch begun{1};
+};
+
+TEST(KSMutex, AnUnlockEndsThePauseAndLetsTheWaiterIn) {
+    constexpr unsigned tooLongMs = 3600000;  // nobody waits for it: the test would be ended before
+    WatchedPauses system;
+    KSMutex mutex;
+    int carried = 0;
+    mutex.lock();
+    std::thread waiter([&] {
+        EXPECT_TRUE(mutex.tryLock(tooLongMs, tooLongMs));
+        EXPECT_EQ(carried, 7);
+    });
+    system.begun.wait();
+    carried = 7;
+    mutex.unlock();
+    waiter.join();
+    EXPECT_FALSE(mutex.tryLock());
+    mutex.unlock();
+}
+
+TEST(KSMutex, APauseThatNobodyEndsPasses) {
+    KSMutex mutex;
+    mutex.lock();
+    EXPECT_FALSE(mutex.tryLock(2, 1));
     mutex.unlock();
 }
 

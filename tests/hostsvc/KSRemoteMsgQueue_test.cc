@@ -303,10 +303,13 @@ TEST_F(KSRemoteMsgQueueTest, FramesBeyondTheLimitAreErrors) {
         relay.write(words({1001, 0, 102401, 0, 0}) + Octets(102401));
         relay.write(words({1001, 0, 0x7FFFFFFF, 0, 0}));
     });
-    NvMsg32Bit* read = nullptr;
+    NvMsg32Bit other{};
+    NvMsg32Bit* read = &other;
     CaptureStderr();
     EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
     EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
+    EXPECT_EQ(read, &other);
+    EXPECT_THAT(system.sleeps(), ElementsAre());  // the peer has closed neither within
     EXPECT_EQ(GetCapturedStderr(), errorLine() + "Unable to allocate memory in get_msg\n" + errorLine());
     sender.join();
 }

@@ -7,6 +7,8 @@
 #include <atomic>
 #include <climits>
 #include <csignal>
+#include <latch>
+#include <string>
 #include <thread>
 
 #include "tests/support/test_system.h"
@@ -73,6 +75,52 @@ TEST(KSSemaphore, ThePostIsSeenAtTheLastAttempt) {
             semaphore.post();
     };
     EXPECT_TRUE(semaphore.tryWait(100, 10));
+}
+
+// The system itself, but it says when somebody begins a pause.
+class WatchedPauses : public KSSystem {
+  public:
+    WatchedPauses() { ks_useSystem(this); }
+    ~WatchedPauses() override { ks_useSystem(nullptr); }
+
+    int waitForCount(sem_t& semaphore, timeval timeout) override {
+        begun.count_down();
+        return KSSystem::waitForCount(semaphore, timeout);
+    }
+
+    std::latch begun{1};
+};
+
+constexpr unsigned tooLongMs = 3600000;  // nobody waits for it: the test would be ended before
+
+TEST(KSSemaphore, APostEndsThePauseAndIsTaken) {
+    WatchedPauses system;
+    KSSemaphore semaphore(1, 0);
+    int carried = 0;
+    std::thread waiter([&] {
+        EXPECT_TRUE(semaphore.tryWait(tooLongMs, tooLongMs));
+        EXPECT_EQ(carried, 7);
+    });
+    system.begun.wait();
+    carried = 7;
+    semaphore.post();
+    waiter.join();
+    EXPECT_FALSE(semaphore.tryWait());
+}
+
+TEST(KSSemaphore, APauseThatNobodyEndsPasses) {
+    KSSemaphore semaphore(1, 0);
+    EXPECT_FALSE(semaphore.tryWait(2, 1));
+}
+
+TEST(KSSemaphore, ASignalEndsAPauseAndIsReported) {
+    SleeplessSystem system;
+    system.napResult = -1;
+    KSSemaphore semaphore(1, 0);
+    testing::internal::CaptureStderr();
+    EXPECT_FALSE(semaphore.tryWait(2, 1));
+    const std::string line = "*** sleep_us interupted by signal ***\n";
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), line + line);
 }
 
 std::atomic<int> signalsHandled{0};

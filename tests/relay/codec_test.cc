@@ -1,5 +1,6 @@
 // Frames, header blocks, networks and the command line.
 #include <gmock/gmock.h>
+#include <netinet/tcp.h>
 
 #include <algorithm>
 #include <cstring>
@@ -8,6 +9,7 @@
 #include "relay/command_line.h"
 #include "relay/ended.h"
 #include "relay/message.h"
+#include "relay/stream.h"
 #include "tests/support/fake_norv.h"
 #include "tests/support/tcp.h"
 
@@ -103,6 +105,24 @@ TEST_F(RelayMessage, WithoutMemoryItIsRefused) {
 
 TEST_F(RelayMessage, AnAddressIsFiveWords) {
     EXPECT_EQ(encodeAddress({5, 2, 0, 3, 4, 1, 0}), words({1, 2, 3, 4, 5}));
+}
+
+// A host whose machine has gone is not waited for as long as the system would, idle or not.
+TEST(RelayStream, AHostThatHasGoneWithoutAWordIsNoticed) {
+    const auto option = [](Patience patience, int level, int name) {
+        const int fd = ::socket(AF_INET, SOCK_STREAM, 0);
+        const Stream stream(Descriptor(fd), patience);
+        int value = -1;
+        socklen_t size = sizeof value;
+        getsockopt(fd, level, name, &value, &size);
+        return value;
+    };
+    EXPECT_EQ(option({}, SOL_SOCKET, SO_KEEPALIVE), 1);
+    EXPECT_EQ(option({}, IPPROTO_TCP, TCP_KEEPIDLE), 30);
+    EXPECT_EQ(option({}, IPPROTO_TCP, TCP_USER_TIMEOUT), 60000);
+    Patience patient;
+    patient.write = std::chrono::minutes(5);
+    EXPECT_EQ(option(patient, IPPROTO_TCP, TCP_USER_TIMEOUT), 300000);
 }
 
 TEST(RelayCidr, ContainsTheAddressesOfItsNetwork) {

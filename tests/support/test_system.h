@@ -3,6 +3,7 @@
 #define TESTS_SUPPORT_TEST_SYSTEM_H
 
 #include <algorithm>
+#include <cerrno>
 #include <functional>
 #include <mutex>
 #include <utility>
@@ -46,7 +47,15 @@ class SleeplessSystem : public KSSystem {
         return napResult;
     }
 
+    // A wait that nothing cuts short.
+    int waitForCount(sem_t& /*semaphore*/, timeval timeout) override { return interruptedOrOver(timeout); }
+    int waitForLock(pthread_mutex_t& /*mutex*/, timeval timeout) override {
+        return interruptedOrOver(timeout);
+    }
+
   private:
+    int interruptedOrOver(timeval timeout) { return waitFor(timeout) == 0 ? ETIMEDOUT : EINTR; }
+
     mutable std::mutex lock_;
     std::vector<long> naps_;
     std::vector<unsigned> sleeps_;

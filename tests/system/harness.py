@@ -159,6 +159,10 @@ class Program:
         self.errors = Stream(self._process.stderr)
 
     @property
+    def pid(self):
+        return self._process.pid
+
+    @property
     def journal(self):
         return self._fifos["journal"].stream
 

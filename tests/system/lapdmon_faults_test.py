@@ -161,7 +161,7 @@ LOADS = [
     Row("burst=10000", log=shown(MANY), frames=capture(*MANY, MARK, interval=0.004)),
     Row("never-waits"),
     # The last event comes again, before the program has ended and after.
-    Row("events-while-stopping=500", screen=f"{MARKED}*"),
+    Row("events-while-stopping=100", screen=f"{MARKED}*"),
     # Here the mark is the last that comes; then two commands find no answer.
     Row("silent=100", screen=timeout(6) + timeout(7), log=shown(numbered(99)),
         frames=capture(*numbered(99), MARK, *numbered(50), interval=0.004)),

@@ -116,6 +116,7 @@ def measure(options, folder):
         program.kill()
         for each in busy:
             each.kill()
+            each.wait()
         os.close(held_open)
     return figures, program.returncode
 

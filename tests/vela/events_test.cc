@@ -441,10 +441,21 @@ TEST_F(EvtCallbackTest, DestroyingTheObjectWaitsForItsCallbacks) {
     ccs_->asyncRegisterMsgType(Reply, &busy, &Busy::onMsg, 0);
     ASSERT_TRUE(sendReply());
     ASSERT_TRUE(busy.begun.wait());
+    const Addressable keepsTheQueue(*ccs_);
+    CCS next(ccs_->getTgtDesc(), ccs_->getMsgQueue());
     std::thread destroyer([&] {
         end();
         EXPECT_TRUE(busy.done);
     });
+    // The address is free once the object has left its queue, which comes before it waits.
+    for (bool left = false; !left;) {
+        try {
+            next.asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
+            left = true;
+        } catch (const vela::Exception&) {
+            std::this_thread::yield();
+        }
+    }
     busy.mayEnd.raise();
     destroyer.join();
 }

@@ -86,6 +86,15 @@ TEST_F(MsgTest, WithABodyItPrintsThePayloadDecodedInHexadecimal) {
     EXPECT_EQ(printed(*msg), std::string(Head) + "Size: 8 Trans: 10001 Body: {Parm 0xa Val 0x3e9}}");
 }
 
+TEST_F(MsgTest, TakesTheBodyThatItHasAgain) {
+    const auto msg = messageOf(fake_norv::words({10, 1001}));
+    auto body = std::make_unique<vela::StdResource::MsgSetParm_t>();
+    vela::MsgBody* const same = body.release();
+    msg->setBodyDef(same);
+    msg->setBodyDef(same);
+    EXPECT_THAT(printed(*msg), testing::HasSubstr("{Parm 0xa Val 0x3e9}"));
+}
+
 TEST_F(MsgTest, GivesTheStreamItsFlagsBack) {
     const auto msg = messageOf({10});
     std::ostringstream out;

@@ -111,6 +111,14 @@ TEST_F(ReceiverTest, AnotherHandlerForUnregisteredSourcesOwnsTheMessage) {
     EXPECT_EQ(errors.text(), "");
 }
 
+TEST_F(ReceiverTest, NullAsksForTheReportOfUnregisteredSourcesAgain) {
+    object_.getMsgQueue()->unregisteredSource([](MsgQueue*, Msg* msg) { delete msg; });
+    object_.getMsgQueue()->unregisteredSource(nullptr);
+    CapturedErrors errors;
+    ASSERT_TRUE(send(1001, Ccs));
+    EXPECT_NE(errors.text().find("Unregisterd Source sent to MsgQueue"), std::string::npos);
+}
+
 TEST_F(ReceiverTest, TheQueueGoesOnAfterAReceiverOrAHandlerThatThrows) {
     CapturedErrors errors;
     object_.getMsgQueue()->unregisteredSource([](MsgQueue*, Msg* msg) {

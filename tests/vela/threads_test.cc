@@ -140,6 +140,28 @@ TEST(Thread, AbandonedRunsOnWithoutItsObject) {
     EXPECT_TRUE(job.ended.wait());
 }
 
+// A thread that lets itself go while whoever started it may not know yet that it runs.
+struct Leaver {
+    std::unique_ptr<Thread> thread;
+    Signal gone;
+};
+
+void* leaves(Thread::control*, void* arg) {
+    auto* const leaver = static_cast<Leaver*>(arg);
+    leaver->thread->abandon();
+    leaver->gone.raise();
+    return nullptr;
+}
+
+TEST(Thread, AbandonedByItsOwnBodyIsLetGoOnce) {
+    for (int round = 0; round < 200; ++round) {
+        Leaver leaver{std::make_unique<Thread>(&leaves, 0), {}};
+        leaver.thread->start(&leaver);
+        ASSERT_TRUE(leaver.gone.wait());
+        EXPECT_THROW(leaver.thread->start(&leaver), Thread::AlreadyActive);
+    }
+}
+
 TEST(Thread, AbandonedBeforeItIsStartedOrAfterItHasEndedLeavesNothingBehind) {
     Job job;
     job.mayEnd = true;

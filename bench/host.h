@@ -1,0 +1,93 @@
+// A host at its barest: tells the CCS component of board 1 what it wants, and reads what comes.
+#ifndef BENCH_HOST_H
+#define BENCH_HOST_H
+
+#include <cstdint>
+#include <cstdlib>
+#include <cstring>
+#include <memory>
+#include <vector>
+
+#include "hostsvc/KSAbstractMsgQueue.h"
+#include "hostsvc/KSMsgRef.h"
+
+namespace bench {
+
+class Host {
+  public:
+    explicit Host(std::unique_ptr<KSAbstractMsgQueue> queue) : queue_(std::move(queue)) {}
+
+    void askProtocol() {
+        tell(GetParm, {ProtocolParm, 0, 0, 0});
+        hear();
+    }
+
+    // From here on there are events; the first is read.
+    void startTrace() {
+        tell(DetectEvt, detectBody());
+        tell(SetParm, {TraceParm, 0, 0, 0, 1, 0, 0, 0});
+        while (!hearEvent()) {
+        }
+    }
+    void endTrace() {
+        tell(SetParm, {TraceParm, 0, 0, 0, 0, 0, 0, 0});
+        while (hear() != SetParm + 1) {
+        }
+    }
+
+    // Reads the next message; whether it is an event.
+    bool hearEvent() { return hear() == EvtDetected; }
+
+  private:
+    static constexpr NvCompDesc Ccs{1, 1, 0, 1, 0x15, 0, 0};
+    static constexpr unsigned SetParm = 8;
+    static constexpr unsigned GetParm = 18;
+    static constexpr unsigned DetectEvt = 22;
+    static constexpr unsigned EvtDetected = 32;
+    static constexpr std::uint8_t TraceParm = 10;
+    static constexpr std::uint8_t ProtocolParm = 7;
+
+    void tell(unsigned type, const std::vector<std::uint8_t>& body) {
+        KSMsgRef msg(static_cast<unsigned>(body.size()));
+        msg.setMsgType(type);
+        msg.setSrcAddr(queue_->getHostDesc());
+        msg.setTgtAddr(Ccs);
+        std::memcpy(msg.getMsgRef() + 1, body.data(), body.size());
+        queue_->msgWrite(msg.getMsgRef());
+    }
+
+    // The type of the next message.
+    unsigned hear() {
+        NvMsg32Bit* read = nullptr;
+        if (queue_->msgRead(&read) != 0)
+            std::exit(EXIT_FAILURE);
+        KSMsgRef msg(read);
+        const unsigned type = msg.getMsgType();
+        msg.free();
+        return type;
+    }
+
+    std::vector<std::uint8_t> detectBody() const {
+        const NvCompDesc host = queue_->getHostDesc();
+        return {static_cast<std::uint8_t>(host.instance),
+                static_cast<std::uint8_t>(host.instance >> 8),
+                host.board,
+                host.processor,
+                host.component,
+                host.node,
+                2,
+                0,
+                0,
+                0,
+                0,
+                0,
+                0,
+                0};
+    }
+
+    std::unique_ptr<KSAbstractMsgQueue> queue_;
+};
+
+}  // namespace bench
+
+#endif

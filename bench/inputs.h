@@ -1,0 +1,21 @@
+// The frames that the benches work on.
+#ifndef BENCH_INPUTS_H
+#define BENCH_INPUTS_H
+
+#include <string>
+
+#include "softboard/scenario.h"
+
+namespace bench {
+
+// The value of `swit` for a trunk of the software board's name or number ("net5", "12").
+int variantOf(const std::string& protocol);
+
+// A capture, a golden file of the decoder, or a folder of them, of which those cases are taken that are meant
+// for the variant; an element or a message alone is put into a frame. Throws softboard::BadInput, or
+// std::runtime_error for a golden file that cannot be read.
+softboard::Frames readInput(const std::string& path, int variant);
+
+}  // namespace bench
+
+#endif

@@ -1,0 +1,37 @@
+// When the traced program had each event from the transport, in memory that it shares with the bench.
+#ifndef BENCH_ROAD_STAMPS_H
+#define BENCH_ROAD_STAMPS_H
+
+#include <atomic>
+#include <cstddef>
+#include <cstdint>
+#include <ctime>
+
+namespace bench {
+
+// Nanoseconds on a clock that all processes share.
+inline std::int64_t nowNs() {
+    std::timespec now{};
+    clock_gettime(CLOCK_MONOTONIC, &now);
+    return now.tv_sec * std::int64_t{1000000000} + now.tv_nsec;
+}
+
+// One process adds, in the order of arrival, another reads. An event's stamp stands until so many more came,
+// and there are never as many on the road.
+struct Stamps {
+    static constexpr std::size_t kept = std::size_t{1} << 16;
+
+    void add(std::int64_t at) {
+        const std::uint64_t i = count.load(std::memory_order_relaxed);
+        stamp[i % kept].store(at, std::memory_order_relaxed);
+        count.store(i + 1, std::memory_order_release);
+    }
+    std::int64_t of(std::uint64_t i) const { return stamp[i % kept].load(std::memory_order_relaxed); }
+
+    std::atomic<std::uint64_t> count;
+    std::atomic<std::int64_t> stamp[kept];
+};
+
+}  // namespace bench
+
+#endif

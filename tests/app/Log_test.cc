@@ -1,0 +1,142 @@
+#include "app/Log.h"
+
+#include <fcntl.h>
+#include <gtest/gtest.h>
+#include <sys/ioctl.h>
+#include <sys/resource.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <csignal>
+#include <cstdio>
+#include <fstream>
+#include <sstream>
+#include <thread>
+
+namespace app {
+namespace {
+
+std::string contents(const std::string& path) {
+    std::ostringstream text;
+    text << std::ifstream(path).rdbuf();
+    return text.str();
+}
+
+class LogTest : public testing::Test {
+  protected:
+    LogTest() {
+        std::signal(SIGPIPE, SIG_IGN);
+        std::signal(SIGXFSZ, SIG_IGN);
+        getrlimit(RLIMIT_FSIZE, &before_);
+        std::remove(path_.c_str());
+        testing::internal::CaptureStderr();
+    }
+    ~LogTest() override {
+        setrlimit(RLIMIT_FSIZE, &before_);
+        std::remove(path_.c_str());
+    }
+
+    void limitFileSize(rlim_t octets) {
+        rlimit limit = before_;
+        limit.rlim_cur = octets;
+        ASSERT_EQ(setrlimit(RLIMIT_FSIZE, &limit), 0);
+    }
+
+    void frame(char letter, std::size_t size) {
+        log_.frameFollows();
+        log_.write(std::string(size, letter));
+    }
+
+    // What was said until the log is closed.
+    std::string saidAtTheEnd() {
+        log_.close();
+        setrlimit(RLIMIT_FSIZE, &before_);  // standard error is a file meanwhile
+        return testing::internal::GetCapturedStderr();
+    }
+
+    const std::string path_ = testing::TempDir() + "log-" + std::to_string(getpid());
+    rlimit before_{};
+    Log log_;
+};
+
+TEST_F(LogTest, HoldsLessThanABlockUntilTheEnd) {
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    frame('a', 4095);
+    EXPECT_EQ(contents(path_), "");
+    frame('b', 1);
+    EXPECT_EQ(contents(path_), std::string(4095, 'a') + "b");
+    frame('c', 1);
+    EXPECT_EQ(saidAtTheEnd(), "");
+    EXPECT_EQ(contents(path_), std::string(4095, 'a') + "bc");
+    EXPECT_TRUE(log_.complete());
+}
+
+TEST_F(LogTest, TakesBackWhatIsInTheFileOfAFrameAndSaysWhereFramesAreMissing) {
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    frame('a', 5000);
+    limitFileSize(7000);
+    frame('b', 1500);
+    frame('c', 4000);  // with it the block is written; only 500 octets of it find room
+    setrlimit(RLIMIT_FSIZE, &before_);
+    const std::string kept = std::string(5000, 'a') + std::string(1500, 'b');
+    EXPECT_EQ(contents(path_), kept);
+    EXPECT_EQ(log_.lost(), 1U);
+    frame('d', 5000);
+    EXPECT_EQ(contents(path_), kept + "Frames Lost: 1 \n" + std::string(5000, 'd'));
+    EXPECT_EQ(saidAtTheEnd(), path_ + ": File too large\n" + path_ + ": frames lost: 1\n");
+    EXPECT_FALSE(log_.complete());
+}
+
+TEST_F(LogTest, WritesABlockBehindAGapWholeOrNotAtAll) {
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    limitFileSize(4200);
+    frame('a', 5000);
+    frame('b', 100);
+    frame('c', 5000);
+    EXPECT_EQ(log_.lost(), 3U);
+    EXPECT_EQ(contents(path_), "");
+    EXPECT_EQ(saidAtTheEnd(), path_ + ": File too large\n" + path_ + ": frames lost: 3\n");
+}
+
+TEST_F(LogTest, DoesNotCountWhatIsNoFrame) {
+    ASSERT_NE(log_.open("/dev/full"), nullptr);
+    log_.write("head\n");
+    frame('a', 10);
+    EXPECT_EQ(saidAtTheEnd(), "/dev/full: No space left on device\n/dev/full: frames lost: 1\n");
+}
+
+TEST_F(LogTest, GivesANewReaderOfAPipeTheRestOfTheFrameFirst) {
+    ASSERT_EQ(mkfifo(path_.c_str(), 0600), 0);
+    int reader = open(path_.c_str(), O_RDONLY | O_NONBLOCK);
+    ASSERT_EQ(fcntl(reader, F_SETPIPE_SZ, 4096), 4096);
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    std::thread goesWhenThePipeIsFull([&] {
+        for (int unread = 0; unread < 4096; ioctl(reader, FIONREAD, &unread))
+            std::this_thread::yield();
+        close(reader);
+    });
+    frame('a', 10000);
+    goesWhenThePipeIsFull.join();
+    EXPECT_EQ(log_.lost(), 0U);
+
+    reader = open(path_.c_str(), O_RDONLY | O_NONBLOCK);
+    fcntl(reader, F_SETFL, 0);
+    std::string text;
+    std::thread reads([&] {
+        std::array<char, 4096> some{};
+        for (ssize_t got = 1; got > 0;) {
+            got = read(reader, some.data(), some.size());
+            text.append(some.data(), static_cast<std::size_t>(std::max<ssize_t>(got, 0)));
+        }
+    });
+    frame('b', 5000);
+    EXPECT_EQ(saidAtTheEnd(), path_ + ": Broken pipe\n" + path_ + ": frames lost: 0\n");
+    reads.join();
+    close(reader);
+    EXPECT_EQ(text, std::string(10000, 'a') + std::string(5000, 'b'));
+}
+
+}  // namespace
+}  // namespace app

@@ -1,0 +1,36 @@
+#include "app/unhandled.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <fstream>
+#include <sstream>
+#include <stdexcept>
+#include <thread>
+
+#include "app/Log.h"
+#include "app/guarded.h"
+
+namespace app {
+namespace {
+
+[[noreturn]] void endByAnException(const std::string& name) {
+    closeLogWhenUnhandled();
+    traceLog.open(name.c_str());
+    traceLog.write("one entry\n");
+    std::thread([] { guarded(215, [] { throw std::runtime_error("out of luck"); }); }).join();
+    std::abort();
+}
+
+TEST(UnhandledDeathTest, ClosesTheLogAndSaysWhatAndWhere) {
+    GTEST_FLAG_SET(death_test_style, "threadsafe");
+    const std::string name = testing::TempDir() + "unhandled.log";
+    EXPECT_EXIT(endByAnException(name), testing::ExitedWithCode(1),
+                "lapdmon: the trace ends, nobody handled std::runtime_error: out of luck in lapdmon.215.");
+    std::ostringstream log;
+    log << std::ifstream(name).rdbuf();
+    EXPECT_EQ(log.str(), "one entry\n");
+}
+
+}  // namespace
+}  // namespace app

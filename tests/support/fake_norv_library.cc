@@ -1,0 +1,265 @@
+// The library's side of the scripted transport library.
+#include <algorithm>
+#include <cstdarg>
+#include <cstring>
+#include <utility>
+
+#include "tests/support/fake_norv_state.h"
+
+using namespace fake_norv;  // NOLINT(google-build-using-namespace): the functions below are part of it
+
+namespace {
+
+// ---- Body fields.
+
+std::size_t elementSize(std::uint32_t descriptor) {
+    switch (descriptor >> 19 & 0x1F) {
+        case 0:
+        case 4:
+        case 10:
+            return 1;
+        case 1:
+        case 5:
+            return 2;
+        default:
+            return 4;
+    }
+}
+
+struct Field {
+    std::uint32_t descriptor;
+    void* storage;
+
+    std::size_t size() const { return elementSize(descriptor) * ((descriptor >> 11 & 0xFF) + 1); }
+};
+
+std::vector<Field> fieldsOf(std::uint32_t count, va_list list) {
+    std::vector<Field> fields;
+    for (std::uint32_t i = 0; i < count; ++i) {
+        // NOLINTNEXTLINE(clang-analyzer-valist.Uninitialized): the callers start it
+        const std::uint32_t descriptor = va_arg(list, std::uint32_t);
+        fields.push_back({descriptor, va_arg(list, void*)});
+    }
+    return fields;
+}
+
+// Moves the fields that lie in the body whole; the first one that does not ends it. The host and the wire are
+// both little-endian.
+template <typename Move>
+std::uint32_t moveFields(State& s, Op op, NvMsg32Bit* msg, std::uint32_t* offset,
+                         const std::vector<Field>& fields, Move move) {
+    const char* const name = op == Op::VarFieldGet ? "nvMsgVarFieldGet" : "nvMsgVarFieldPut";
+    Call call{op, name, Done, static_cast<std::uint32_t>(fields.size()), {}, *offset};
+    if (callersBuffer(s, msg, name) == nullptr || fails(s, op))
+        call.status = Failed;
+    std::size_t at = *offset;
+    for (const Field& field : fields) {
+        call.descriptors.push_back(field.descriptor);
+        if (call.status != Done || at + field.size() > msg->size) {
+            call.status = Failed;
+            continue;
+        }
+        move(octets(msg) + NVMSG_HEADER_SIZE + at, field);
+        at += field.size();
+    }
+    if (!(s.firstOffsetStaysZero && *offset == 0))
+        *offset = static_cast<std::uint32_t>(at);
+    return record(s, std::move(call));
+}
+
+}  // namespace
+
+uint32_t nvDrvSetInterface(uint32_t a, uint32_t b) {
+    State& s = state();
+    const Lock lock(s.lock);
+    const uint32_t status = fails(s, Op::SetInterface) ? Failed : Done;
+    return record(s, {Op::SetInterface, text("nvDrvSetInterface(", a, ", ", b, ")"), status});
+}
+
+uint32_t nvMsgAllocate(uint32_t size, NvMsg32Bit** msg) {
+    State& s = state();
+    const Lock lock(s.lock);
+    NvMsg32Bit* const fresh = fails(s, Op::Allocate) ? nullptr : newBuffer(s, size);
+    if (fresh != nullptr)
+        *msg = fresh;
+    const uint32_t status = fresh == nullptr ? Failed : Done;
+    return record(s, {Op::Allocate, text("nvMsgAllocate(", size, ")"), status});
+}
+
+uint32_t nvMsgReallocate(uint32_t size, NvMsg32Bit** msg) {
+    State& s = state();
+    const Lock lock(s.lock);
+    uint32_t status = Failed;
+    if (callersBuffer(s, *msg, "nvMsgReallocate") == nullptr) {
+        // noted
+    } else if (fails(s, Op::Reallocate)) {
+        *msg = nullptr;
+    } else {
+        NvMsg32Bit* const grown = newBuffer(s, size);
+        std::memcpy(octets(grown), octets(*msg), NVMSG_HEADER_SIZE + std::min(size, (*msg)->size));
+        grown->size = size;
+        release(s, *msg);
+        *msg = grown;
+        status = Done;
+    }
+    return record(s, {Op::Reallocate, text("nvMsgReallocate(", size, ")"), status});
+}
+
+uint32_t nvMsgFree(NvMsg32Bit* msg) {
+    State& s = state();
+    const Lock lock(s.lock);
+    uint32_t status = Failed;
+    if (callersBuffer(s, msg, "nvMsgFree") != nullptr) {
+        release(s, msg);
+        status = fails(s, Op::Free) ? Failed : Done;
+    }
+    return record(s, {Op::Free, "nvMsgFree()", status});
+}
+
+// The library's fixed fields are its own affair: 32 bits under each index, 0 until put.
+uint32_t nvMsgFieldGet(NvMsg32Bit* msg, uint32_t index, void* value) {
+    State& s = state();
+    const Lock lock(s.lock);
+    uint32_t status = Failed;
+    Buffer* const buffer = callersBuffer(s, msg, "nvMsgFieldGet");
+    if (buffer != nullptr && !fails(s, Op::FieldGet)) {
+        std::memcpy(value, &buffer->fixedFields[index], sizeof(uint32_t));
+        status = Done;
+    }
+    return record(s, {Op::FieldGet, text("nvMsgFieldGet(", index, ")"), status});
+}
+
+uint32_t nvMsgFieldPut(NvMsg32Bit* msg, uint32_t index, void* value) {
+    State& s = state();
+    const Lock lock(s.lock);
+    uint32_t status = Failed;
+    Buffer* const buffer = callersBuffer(s, msg, "nvMsgFieldPut");
+    if (buffer != nullptr && !fails(s, Op::FieldPut)) {
+        std::memcpy(&buffer->fixedFields[index], value, sizeof(uint32_t));
+        status = Done;
+    }
+    return record(s, {Op::FieldPut, text("nvMsgFieldPut(", index, ")"), status});
+}
+
+uint32_t nvMsgVarFieldGet(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...) {
+    va_list list;
+    va_start(list, offset);
+    const std::vector<Field> fields = fieldsOf(count, list);
+    va_end(list);
+    const Lock lock(state().lock);
+    return moveFields(
+        state(), Op::VarFieldGet, msg, offset, fields,
+        [](const uint8_t* body, const Field& field) { std::memcpy(field.storage, body, field.size()); });
+}
+
+uint32_t nvMsgVarFieldPut(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...) {
+    va_list list;
+    va_start(list, offset);
+    const std::vector<Field> fields = fieldsOf(count, list);
+    va_end(list);
+    const Lock lock(state().lock);
+    return moveFields(state(), Op::VarFieldPut, msg, offset, fields, [](uint8_t* body, const Field& field) {
+        std::memcpy(body, field.storage, field.size());
+    });
+}
+
+uint32_t nvQueueOpen() {
+    State& s = state();
+    const Lock lock(s.lock);
+    uint32_t handle = Failed;
+    if (!fails(s, Op::Open)) {
+        handle = s.nextQueue++;
+        s.queues[handle] = Queue();
+    }
+    return record(s, {Op::Open, "nvQueueOpen()", handle});
+}
+
+uint32_t nvQueueBind(uint32_t handle, NvCompDesc* host) {
+    State& s = state();
+    const Lock lock(s.lock);
+    uint32_t status = Failed;
+    Queue* const queue = openQueue(s, handle, "nvQueueBind");
+    if (queue != nullptr && !fails(s, Op::Bind)) {
+        queue->bound = true;
+        queue->address = *host = s.nextHost;
+        ++s.nextHost.instance;
+        status = Done;
+    }
+    return record(s, {Op::Bind, text("nvQueueBind(", handle, ")"), status});
+}
+
+uint32_t nvQueueUnbind(uint32_t handle, NvCompDesc host) {
+    State& s = state();
+    const Lock lock(s.lock);
+    uint32_t status = Failed;
+    Queue* const queue = openQueue(s, handle, "nvQueueUnbind");
+    if (queue != nullptr && !(queue->bound && same(queue->address, host)))
+        misuse(s, "nvQueueUnbind: not the address of the queue");
+    else if (queue != nullptr && !fails(s, Op::Unbind)) {
+        queue->bound = false;
+        status = Done;
+    }
+    return record(s, {Op::Unbind, text("nvQueueUnbind(", handle, ", ", hex(host.instance), ")"), status});
+}
+
+// What is left in the queue goes with it; a reader blocked there returns.
+uint32_t nvQueueClose(uint32_t handle) {
+    State& s = state();
+    const Lock lock(s.lock);
+    uint32_t status = Failed;
+    Queue* const queue = openQueue(s, handle, "nvQueueClose");
+    if (queue != nullptr && !fails(s, Op::Close)) {
+        for (NvMsg32Bit* const msg : queue->pending)
+            release(s, msg);
+        s.queues.erase(handle);
+        status = Done;
+    }
+    return record(s, {Op::Close, text("nvQueueClose(", handle, ")"), status});
+}
+
+uint32_t nvMsgRead(uint32_t handle, uint32_t zero, NvMsg32Bit** msg) {
+    State& s = state();
+    Lock lock(s.lock);
+    const auto read = [&](uint32_t status) {
+        return record(s, {Op::Read, text("nvMsgRead(", handle, ", ", zero, ")"), status});
+    };
+    if (openQueue(s, handle, "nvMsgRead") == nullptr || fails(s, Op::Read))
+        return read(Failed);
+    ++s.queues[handle].readers;
+    s.changed.notify_all();
+    s.changed.wait(lock, [&] {
+        const auto found = s.queues.find(handle);
+        return found == s.queues.end() || !found->second.pending.empty();
+    });
+    const auto found = s.queues.find(handle);
+    if (found == s.queues.end())
+        return read(Failed);
+    Queue& queue = found->second;
+    --queue.readers;
+    *msg = queue.pending.front();
+    queue.pending.pop_front();
+    s.buffers[*msg].withLibrary = false;
+    return read(Done);
+}
+
+uint32_t nvMsgWrite(uint32_t handle, NvMsg32Bit* msg, uint32_t /*zero*/) {
+    State& s = state();
+    Lock lock(s.lock);
+    if (openQueue(s, handle, "nvMsgWrite") == nullptr || callersBuffer(s, msg, "nvMsgWrite") == nullptr)
+        return record(s, {Op::Write, "nvMsgWrite()", Failed});
+    const Message message = seen(msg);
+    const bool lost = fails(s, Op::Write);
+    Queue* const queue = lost ? nullptr : boundTo(s, message.target);
+    if (queue != nullptr)
+        enqueue(s, *queue, msg);
+    else
+        release(s, msg);
+    s.written.push_back(message);
+    const std::uint32_t status = record(
+        s, {Op::Write, text("nvMsgWrite(", handle, ", type ", hex(message.type), ")"), lost ? Failed : Done});
+    const std::function<void(const Message&)> script = s.script;
+    lock.unlock();
+    if (script && !lost)
+        script(message);
+    return status;
+}
