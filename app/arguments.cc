@@ -45,7 +45,7 @@ void readFileName(std::string_view text) {
 
 }  // namespace
 
-void parseArgs(int argc, char** argv) {
+bool readArgs(int argc, char** argv) {
     INST_NUM = 1;
     readFileName(DefaultLogFile);
     decoder::file_output = true;
@@ -80,7 +80,11 @@ void parseArgs(int argc, char** argv) {
                 status = -1;
         }
     }
-    if (status < 1)
+    return status == 1;
+}
+
+void parseArgs(int argc, char** argv) {
+    if (!readArgs(argc, argv))
         showUsage();
     std::cout << "filename: " << log_file_name.data() << std::endl;
 }

@@ -14,6 +14,8 @@ inline std::array<char, 100> log_file_name{};  // terminated
 // Reads the arguments. When they ask for help or cannot be used, prints the usage and ends the process with
 // status 0.
 void parseArgs(int argc, char** argv);
+// As parseArgs, but returns false where that shows the usage.
+bool readArgs(int argc, char** argv);
 
 }  // namespace app
 

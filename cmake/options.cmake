@@ -3,6 +3,7 @@ include(GNUInstallDirs)
 
 option(LAPDMON_TESTS "Build the tests" ON)
 option(LAPDMON_WERROR "Treat warnings as errors" OFF)
+option(LAPDMON_FUZZ "Build the fuzz targets for libFuzzer (clang), and no other tests" OFF)
 set(LAPDMON_SANITIZE "" CACHE STRING "Comma-separated sanitizers, e.g. address,undefined or thread")
 
 # The transport library stands in a folder of its own, where the loader does not look unless told to.
@@ -15,7 +16,7 @@ target_compile_options(lapdmon_options INTERFACE
     -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Woverloaded-virtual
     -Wcast-align -Wformat=2 -Wimplicit-fallthrough
     # The optimiser of g++ 12 sees faults of these kinds in the standard library's own code.
-    -Wno-restrict -Wno-array-bounds -Wno-stringop-overflow -Wno-stringop-overread)
+    $<$<CXX_COMPILER_ID:GNU>:-Wno-restrict -Wno-array-bounds -Wno-stringop-overflow -Wno-stringop-overread>)
 if(LAPDMON_WERROR)
     target_compile_options(lapdmon_options INTERFACE -Werror)
 endif()
@@ -23,6 +24,9 @@ if(LAPDMON_SANITIZE)
     target_compile_options(lapdmon_options INTERFACE
         -fsanitize=${LAPDMON_SANITIZE} -fno-omit-frame-pointer -fno-sanitize-recover=all)
     target_link_options(lapdmon_options INTERFACE -fsanitize=${LAPDMON_SANITIZE})
+endif()
+if(LAPDMON_FUZZ)
+    target_compile_options(lapdmon_options INTERFACE -fsanitize=fuzzer-no-link)
 endif()
 
 # A program that links the transport library. In the build tree RUNPATH (not RPATH, so that LD_LIBRARY_PATH

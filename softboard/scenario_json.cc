@@ -10,6 +10,14 @@ namespace {
 
 using nlohmann::json;
 
+// A path may hold any octet but 0, and JSON none that are not UTF-8.
+std::string pathToHex(const std::string& path) { return hex(std::vector<uint8_t>(path.begin(), path.end())); }
+
+std::string pathFromHex(const std::string& text) {
+    const std::vector<uint8_t> octets = fromHex(text);
+    return {octets.begin(), octets.end()};
+}
+
 json toJson(const Frame& frame) {
     return {{"transmitted", frame.transmitted}, {"ticks", frame.ticks}, {"octets", hex(frame.octets)}};
 }
@@ -44,7 +52,7 @@ DChannel channelFrom(const json& from) {
 }  // namespace
 
 std::string toJson(const Scenario& scenario) {
-    json to{{"journal", scenario.journal},
+    json to{{"journal", pathToHex(scenario.journal)},
             {"channels", json::array()},
             {"captures", json::array()},
             {"faults", json::array()}};
@@ -66,7 +74,7 @@ std::string toJson(const Scenario& scenario) {
 Scenario fromJson(const std::string& text) {
     const json from = json::parse(text);
     Scenario scenario;
-    scenario.journal = from.at("journal");
+    scenario.journal = pathFromHex(from.at("journal").get<std::string>());
     for (const json& fault : from.at("faults")) {
         scenario.faults.push_back(parseFault(fault.get<std::string>()));
     }

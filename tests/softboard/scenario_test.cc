@@ -204,6 +204,16 @@ TEST(HandoverTest, AScenarioComesBackAsItWas) {
     EXPECT_EQ(fromJson(toJson(scenario)), scenario);
 }
 
+TEST(HandoverTest, AJournalsPathMayHoldOctetsThatAreNoUtf8) {
+    Scenario scenario = oneChannel({});
+    scenario.journal =
+        "/tmp/gespr\xe4"
+        "ch.txt";
+    EXPECT_EQ(fromJson(toJson(scenario)).journal,
+              "/tmp/gespr\xe4"
+              "ch.txt");
+}
+
 TEST(HandoverTest, WhatIsNoScenarioIsRefused) {
     for (const char* text :
          {"", "{}", "[]", "{\"journal\":\"\",\"captures\":[],\"channels\":[{}]}", "\x00\xff"}) {

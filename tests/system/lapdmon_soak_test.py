@@ -1,0 +1,58 @@
+"""A short soak, and that a soak sees what it looks for."""
+
+import types
+import unittest
+
+import soak
+
+
+def checked(numbers):
+    checker = soak.Checker()
+    for number in numbers:
+        checker.frame(number)
+    return checker.frames, checker.lost, checker.disordered, checker.wrong
+
+
+def block(direction, ticks, octets):
+    return (f"\nSat Nov 21 11:25:33 2026\n{direction}X Frame: Time = {ticks // 250}.{ticks % 250 * 4}\n"
+            "0x00 0x00  Information\nHex Dump: \n" + octets.hex(" ") + " \n").encode()
+
+
+class Soak(unittest.TestCase):
+    def test_nothing_grows_is_lost_or_out_of_order_while_faults_come_and_go(self):
+        self.assertEqual(soak.main(["--frames", "8000", "--phase", "1000", "--stall", "0.5", "--seed", "1"]), 0)
+
+    def test_what_is_lost_repeated_or_out_of_order_is_told_apart(self):
+        self.assertEqual(checked([0, 1, 2, 3]), (4, 0, 0, 0))
+        self.assertEqual(checked([0, 1, 3, 4]), (5, 1, 0, 0))
+        self.assertEqual(checked([0, 2, 1, 3]), (4, 0, 1, 0))
+        self.assertEqual(checked([0, 1, 1, None, 2]), (3, 0, 0, 2))
+
+    def test_a_frame_is_its_direction_its_time_and_its_octets(self):
+        log = [(*soak.frame_of(number), number) for number in (0, 1, 2)]
+        text = b"".join(block("T" if sent else "R", ticks, octets) for sent, octets, ticks in log)
+        for changed, expected in ((text, (3, 0)), (text.replace(b"TX", b"RX"), (3, 1)),
+                                  (text.replace(b"02 01 02 00", b"02 01 02 02"), (3, 1)),
+                                  (text.replace(b"Time = 0.4\n", b"Time = 0.12\n"), (3, 1))):
+            checker = soak.Checker()
+            for at in range(0, len(changed), 7):  # as it may come through a FIFO
+                checker.feed(changed[at:at + 7])
+            checker.end()
+            self.assertEqual((checker.frames, checker.wrong), expected)
+
+    def test_each_thing_that_grows_is_said(self):
+        for name, by, complaint in (("memory", 5000, "memory grew"), ("descriptors", 1, "descriptors grew"),
+                                    ("threads", 101, "threads grew"), ("held", 100, "messages still waited"),
+                                    ("memory", 0, None)):
+            soaked = soak.Soak(types.SimpleNamespace(seed=1), types.SimpleNamespace(said=[]))
+            calm = {"memory": 9000, "threads": 5, "descriptors": 8, "held": 1}
+            more = {**calm, name: calm[name] + by}
+            soaked.calm = [types.SimpleNamespace(**each) for each in 3 * [calm] + 3 * [more]]
+            soaked.samples = soaked.calm[:1]
+            said = list(soaked.complaints(0))
+            self.assertEqual(len(said), 1 if complaint else 0, said)
+            self.assertIn(complaint or "", "".join(said))
+
+
+if __name__ == "__main__":
+    unittest.main()

@@ -1,0 +1,347 @@
+"""Runs the trace at line rate while faults are switched on and off at random; says what came of it.
+
+    scripts/soak --minutes 30            scripts/soak --frames 10000 --seed 7
+
+The board plays numbered frames in both directions; the log is read through a FIFO as it is written, and kept nowhere.
+Troubled times and calm ones take turns. The exit status is 1 when a frame is lost, damaged or out of order, when memory,
+threads, descriptors or waiting messages grow from one calm time to the next, or when the program does not end in order.
+"""
+
+import argparse
+import os
+import pathlib
+import random
+import re
+import select
+import signal
+import socket
+import struct
+import subprocess
+import sys
+import tempfile
+import threading
+import time
+
+from order import LINE_RATE, MOST_THREADS, PAUSE, number_of
+
+ROUND = 20000        # frames in the capture, which is played again and again
+LIMIT = 120          # seconds without a frame, after which none is waited for
+QUEUE = 64           # messages that wait for the program before the board waits
+GROWTH = 4096        # kB of memory that are no growth: what the C library keeps for threads that have been
+
+# Wrong events come beside the right ones, one for each hundred frames (docs/softboard.md): name, least and most number.
+WRONG_EVENTS = (
+    ("event-truncated", 0, 19), ("event-overlong", 1, 2000), ("event-length", 0, 4000), ("event-label", 0, 99),
+    ("event-type", 100, 9999), ("event-source", 50, 65535),
+)
+OTHER_FAULTS = (("burst", 101, 3000), ("silent", 0, 50), ("never-waits", None, None), ("offset-stays-0", None, None))
+OUTSIDE = ("the log is not read", "the program is stopped", "the machine is busy")
+
+HEADER = re.compile(rb"([RT])X Frame: Time = (\d+)\.(\d+)\n")
+DUMP = re.compile(rb"Hex Dump: \n((?: *(?:[0-9a-f]{2} )+\n)+)")
+
+
+def frame_of(number):
+    """Direction (whether transmitted) and octets: the shortest frames, and every tenth a message with its number."""
+    at = number % ROUND
+    octets = bytes((2, 1, 2 * (at % 127), 2 * (at // 127 % 127)))
+    if at % 10 == 0:
+        octets += bytes((8, 2, at >> 8, at & 0xFF, 0x7D))
+    return at % 2 == 1, octets
+
+
+def write_capture(path):
+    """A pcap file of one round, 4 ms from frame to frame, so that the board's time is the number."""
+    with open(path, "wb") as file:
+        file.write(struct.pack("<IHHiIII", 0xA1B2C3D4, 2, 4, 0, 0, 65535, 177))
+        for number in range(ROUND):
+            transmitted, octets = frame_of(number)
+            packet = struct.pack(">HHH8sH", 4 if transmitted else 0, 0, 0, bytes(8), 0x30) + octets
+            file.write(struct.pack("<IIII", *divmod(4000 * number, 1_000_000), len(packet), len(packet)) + packet)
+
+
+class Checker:
+    """Looks for each frame in its turn; what else is in the log must be what the board sent wrong."""
+
+    def __init__(self):
+        self.frames = self.lost = self.disordered = self.wrong = 0
+        self._text = b""
+
+    def feed(self, some):
+        text = self._text + some
+        headers = list(HEADER.finditer(text))
+        for header, following in zip(headers, headers[1:]):
+            self._block(header, text[header.end():following.start()])
+        self._text = text[headers[-1].start():] if headers else text
+
+    def end(self):
+        header = HEADER.match(self._text)
+        if header:
+            self._block(header, self._text[header.end():])
+
+    def _block(self, header, text):
+        ticks = int(header[2]) * 250 + int(header[3]) // 4
+        dump = DUMP.search(text)
+        octets = bytes.fromhex(dump[1].decode()) if dump else b""
+        number = number_of(ticks, ROUND)
+        in_round = ticks % (ROUND - 1 + PAUSE) < ROUND
+        self.frame(number if in_round and frame_of(number) == (header[1] == b"T", octets) else None)
+
+    def frame(self, number):
+        """The next in the log; None is one that the board never had."""
+        if number is None or number == self.frames - 1:
+            self.wrong += 1
+        elif number >= self.frames:
+            self.lost += number - self.frames
+            self.frames = number + 1
+        else:
+            self.disordered += 1
+            self.lost -= 1
+
+
+class Sample:
+    """What the program has at a time."""
+
+    def __init__(self, pid, held):
+        status = pathlib.Path(f"/proc/{pid}/status").read_text()
+        self.memory = int(re.search(r"^VmRSS:\s+(\d+)", status, re.M)[1])
+        self.threads = int(re.search(r"^Threads:\s+(\d+)", status, re.M)[1])
+        self.descriptors = len(os.listdir(f"/proc/{pid}/fd"))
+        self.held = held
+
+
+class Program:
+    """The trace on the software board, its log and its faults."""
+
+    def __init__(self, options, folder):
+        write_capture(folder / "numbered.pcap")
+        log = folder / "log"
+        os.mkfifo(log)
+        self._log = os.open(log, os.O_RDONLY | os.O_NONBLOCK)
+        self._held_open = os.open(log, os.O_WRONLY)
+        self._switch, theirs = socket.socketpair()
+        self._switch.settimeout(LIMIT)
+        asan = os.environ.get("ASAN_OPTIONS", "") + ":verify_asan_link_order=0"
+        self._process = subprocess.Popen(
+            [options.softboard, "--rate", str(options.rate), "--loop", "--frames", str(folder / "numbered.pcap"), "--",
+             "env", "LD_PRELOAD=" + options.fault_switch, options.lapdmon, "-b1", "-f", str(log)],
+            stdin=subprocess.PIPE, stdout=subprocess.DEVNULL, stderr=subprocess.PIPE, pass_fds=[theirs.fileno()],
+            env={**os.environ, "FAULT_SWITCH": str(theirs.fileno()), "ASAN_OPTIONS": asan})
+        theirs.close()
+        self.pid = self._process.pid
+        self.said = []
+        self._listener = threading.Thread(target=self._listen, daemon=True)
+        self._listener.start()
+
+    def _listen(self):
+        """Keeps what a sanitizer says; the rest is reports of wrong events."""
+        for line in self._process.stderr:
+            if self.said or re.search(rb"Sanitizer|runtime error|softboard:", line):
+                self.said.append(line.decode("latin-1"))
+
+    def read(self):
+        """Some of the log, b"" at its end."""
+        if not select.select([self._log], [], [], LIMIT)[0]:
+            raise TimeoutError(f"no frame within {LIMIT} seconds")
+        some = os.read(self._log, 1 << 16)
+        if self._held_open is not None:  # now the program has it open
+            os.close(self._held_open)
+            self._held_open = None
+        return some
+
+    def _ask(self, line):
+        self._switch.sendall(line.encode() + b"\n")
+        answer = b""
+        while not answer.endswith(b"\n"):
+            answer += self._switch.recv(100) or b"?\n"
+        return answer.decode().strip()
+
+    def set_faults(self, faults):
+        self._ask("faults " + " ".join(faults))
+
+    def sample(self):
+        return Sample(self.pid, int(self._ask("held")))
+
+    def pause(self, seconds):
+        os.kill(self.pid, signal.SIGSTOP)
+        time.sleep(seconds)
+        os.kill(self.pid, signal.SIGCONT)
+
+    def types_q(self):
+        self._process.stdin.write(b"q\n")
+        self._process.stdin.flush()
+
+    def status(self):
+        status = self._process.wait(LIMIT)
+        self._listener.join(LIMIT)
+        return status
+
+    def end(self):
+        self._process.kill()
+        self._process.wait()
+        self._process.stdin.close()
+        os.close(self._log)
+        if self._held_open is not None:
+            os.close(self._held_open)
+        self._switch.close()
+
+
+class Soak:
+    def __init__(self, options, program):
+        self._options = options
+        self._program = program
+        self._random = random.Random(options.seed)
+        self._most_wrong = 0
+        self._busy = []
+        self.checker = Checker()
+        self.samples = []
+        self.calm = []
+        self.times = {}
+        self._last_sample = 0
+
+    def run(self):
+        start = time.monotonic()
+        self._follow(self._options.phase)
+        self.calm.append(self._program.sample())
+        while self._goes_on(start):
+            self._trouble()
+            self._calm()
+        self.seconds = time.monotonic() - start
+        self._program.types_q()
+        while some := self._program.read():
+            self.checker.feed(some)
+        self.checker.end()
+        return self._program.status()
+
+    def _goes_on(self, start):
+        if self._options.minutes:
+            return time.monotonic() - start < 60 * self._options.minutes
+        return self.checker.frames < self._options.frames
+
+    def _follow(self, frames):
+        """Reads the log until so many more frames have come."""
+        wanted = self.checker.frames + frames
+        while self.checker.frames < wanted:
+            some = self._program.read()
+            if not some:
+                raise EOFError("the program has ended")
+            self.checker.feed(some)
+            if time.monotonic() - self._last_sample > 0.5:
+                self._last_sample = time.monotonic()
+                self.samples.append(self._program.sample())
+
+    def _trouble(self):
+        chance = self._random
+        faults, wrong_events = [], 0
+        for name, least, most in chance.sample(WRONG_EVENTS + OTHER_FAULTS, chance.randint(1, 4)):
+            faults.append(name if least is None else f"{name}={chance.randint(least, most)}")
+            wrong_events += name.startswith("event-")
+            self._count(name)
+        silent = any(fault.startswith("silent") for fault in faults)
+        before = self.checker.frames
+        self._program.set_faults(faults)
+        outside = chance.choice(OUTSIDE)
+        self._count(outside)
+        self._outside(outside, chance.uniform(0.1, self._options.stall))
+        if silent:  # no more frames come than had been sent
+            self._program.set_faults([fault for fault in faults if not fault.startswith("silent")])
+        self._follow(chance.randint(self._options.phase // 2, 2 * self._options.phase))
+        self._program.set_faults([])
+        # A fault sends its event before the first frame, too, and those that wait were sent while it stood.
+        sent = self.checker.frames - before + self._program.sample().held + MOST_THREADS
+        self._most_wrong += wrong_events * (2 + sent // 50)
+
+    def _count(self, name):
+        self.times[name] = self.times.get(name, 0) + 1
+
+    def _outside(self, what, seconds):
+        if what == "the log is not read":
+            time.sleep(seconds)
+        elif what == "the program is stopped":
+            self._program.pause(seconds)
+        else:
+            self._busy += [subprocess.Popen([sys.executable, "-c", "while True: pass"])
+                           for _ in range(2 * (os.cpu_count() or 1))]
+
+    def _calm(self):
+        self.idle()
+        self._follow(self._random.randint(self._options.phase // 2, self._options.phase))
+        # What had to wait is gone before it is called calm.
+        end = time.monotonic() + LIMIT
+        while self._program.sample().held > QUEUE and time.monotonic() < end:
+            self._follow(100)
+        self.calm.append(self._program.sample())
+
+    def idle(self):
+        for each in self._busy:
+            each.kill()
+            each.wait()
+        self._busy = []
+
+    def complaints(self, status):
+        """What is wrong, a sentence each."""
+        checker, calm = self.checker, self.calm
+        if status != 0:
+            yield f"it ended with status {status}"
+        if self._program.said:
+            yield "it said:\n" + "".join(self._program.said[:50])
+        if checker.lost:
+            yield f"{checker.lost} frames were lost"
+        if checker.disordered:
+            yield f"{checker.disordered} frames were out of order"
+        if checker.wrong > self._most_wrong:
+            yield f"{checker.wrong} frames were not the board's, of which {self._most_wrong} may be"
+        if max(sample.threads for sample in self.samples) > MOST_THREADS:
+            yield "there were too many threads"
+        if calm[-1].descriptors > calm[0].descriptors:
+            yield "descriptors grew"
+        if calm[-1].threads > calm[0].threads + 100:
+            yield "threads grew"
+        if calm[-1].held > QUEUE:
+            yield f"{calm[-1].held} messages still waited in calm"
+        third = len(calm) // 3
+        if third >= 2 and (min(sample.memory for sample in calm[-third:])
+                           > max(sample.memory for sample in calm[:third]) + GROWTH):
+            yield "memory grew"
+
+    def report(self):
+        checker, calm, samples = self.checker, self.calm, self.samples
+        yield f"{self.seconds:.0f} seconds, seed {self._options.seed}, {len(calm) - 1} troubled times"
+        yield (f"frames       {checker.frames} ({checker.frames / self.seconds:.0f} a second), lost {checker.lost}, "
+               f"out of order {checker.disordered}; sent wrong by the board {checker.wrong}")
+        for says, name, unit in (("memory", "memory", " kB"), ("threads", "threads", ""),
+                                 ("descriptors", "descriptors", ""), ("waiting", "held", " messages")):
+            values = [getattr(sample, name) for sample in samples + calm]
+            yield (f"{says:12} {getattr(calm[0], name)} in the first calm, {getattr(calm[-1], name)} in the last, "
+                   f"at most {max(values)}{unit}")
+        yield "faults       " + ", ".join(f"{name} {times}" for name, times in sorted(self.times.items()))
+
+
+def main(arguments):
+    parser = argparse.ArgumentParser(description=__doc__, formatter_class=argparse.RawDescriptionHelpFormatter)
+    parser.add_argument("--minutes", type=float, help="how long")
+    parser.add_argument("--frames", type=int, default=100_000, help="how many frames, where no time is given")
+    parser.add_argument("--seed", type=int, default=int(time.time()), help="of what is switched when")
+    parser.add_argument("--rate", default=LINE_RATE, help="frames a second")
+    parser.add_argument("--phase", type=int, default=4000, help="frames of a calm time, about")
+    parser.add_argument("--stall", type=float, default=3, help="seconds for which the log is not read, at most")
+    parser.add_argument("--lapdmon", default=os.environ.get("LAPDMON"))
+    parser.add_argument("--softboard", default=os.environ.get("SOFTBOARD"))
+    parser.add_argument("--fault-switch", default=os.environ.get("FAULT_SWITCH_LIBRARY"))
+    options = parser.parse_args(arguments)
+    print(f"seed {options.seed}", flush=True)
+    with tempfile.TemporaryDirectory(prefix="soak-") as folder:
+        program = Program(options, pathlib.Path(folder))
+        soak = Soak(options, program)
+        try:
+            complaints = list(soak.complaints(soak.run()))
+        finally:
+            soak.idle()
+            program.end()
+    print("\n".join(soak.report()))
+    print("\n".join(complaints) if complaints else "nothing was lost, nothing out of order, nothing grew")
+    return 1 if complaints else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main(sys.argv[1:]))
