@@ -10,6 +10,7 @@ import time
 import unittest
 
 from harness import LAPDMON, LIMIT, MARK, RECEIVED, SystemTest, capture, time_of
+from order import MOST_THREADS
 
 FRAMES = 250
 NUMBERED = [(RECEIVED, bytes((2, 1, 1, i % 251))) for i in range(FRAMES)]
@@ -159,7 +160,7 @@ class StalledLog(SystemTest):
         self.assertEqual(re.findall(r"Time = (\S+)", text), [time_of(i) for i in range(self.MANY + 1)])
         self.assertNotIn("Enqueue Failed", text)
         self.assertEqual(program.journal.lines()[-1], BALANCE)
-        self.assertLessEqual(self.threads, 110)
+        self.assertLessEqual(self.threads, MOST_THREADS)
         self.assertLess(self.grown - at_the_stall, 65536)
 
     def wait_until_stalled(self, reader):

@@ -22,7 +22,7 @@ import time
 LINE_RATE = 2 * 1142  # frames a second: the shortest I frames that a 64 kbit/s channel carries, both ways
 ROUND = 50000         # frames in the capture, which is played again and again
 PAUSE = 250           # ticks between two rounds
-MOST_THREADS = 110    # 100 deliveries, and those that are always there
+MOST_THREADS = 150    # 100 deliveries at work, those that have not ended yet, and those that are always there
 TIME = re.compile(rb"X Frame: Time = (\d+)\.(\d+)\n")
 
 
