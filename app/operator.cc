@@ -40,7 +40,7 @@ bool awaitSignal(int timeoutMs, int input) {
 void exit_handle(int) {
     const int saved = errno;
     for (const int each : Signals)
-        std::signal(each, SIG_DFL);
+        static_cast<void>(std::signal(each, SIG_DFL));
     wakeWaiter();
     errno = saved;
 }
@@ -60,8 +60,8 @@ void watchSignals() {
 }
 
 void outliveOutput() {
-    std::signal(SIGPIPE, SIG_IGN);
-    std::signal(SIGXFSZ, SIG_IGN);
+    static_cast<void>(std::signal(SIGPIPE, SIG_IGN));
+    static_cast<void>(std::signal(SIGXFSZ, SIG_IGN));
 }
 
 void boardLost() {

@@ -215,4 +215,4 @@ void KSRemoteMsgQueue::wakeReader() {
         connection_.shutdown(SHUT_RDWR);
 }
 
-void KSRemoteMsgQueue::close() { wakeReader(); }
+void KSRemoteMsgQueue::close() { KSRemoteMsgQueue::wakeReader(); }

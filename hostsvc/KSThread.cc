@@ -24,7 +24,7 @@ KSThread::KSThread(void* (*body)(void*, void*), unsigned stackSize) : KSThread(K
 KSThread::KSThread(void* object, void* (KSRunnable::*body)(void*, void*), unsigned stackSize)
     : KSThread(KSBody(object, body), stackSize) {}
 
-KSThread::KSThread(KSBody body, unsigned stackSize)
+KSThread::KSThread(const KSBody& body, unsigned stackSize)
     : body_(body), stackSize_(stackSize), control_(status_, lock_), handedControl_(&control_) {
     lock_.unlock();
 }

@@ -54,7 +54,7 @@ class KSThread {
   private:
     enum Life : unsigned { Abandoned = 1, Ended = 2 };  // Ended: since the last start, and not yet joined
 
-    KSThread(KSBody body, unsigned stackSize);
+    KSThread(const KSBody& body, unsigned stackSize);
     static void* entry(void* thread);
     static void finish(void* thread);
 

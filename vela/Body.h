@@ -92,12 +92,11 @@ class Body : public MsgBody, public Row {
     // alone.
     template <std::size_t i>
     static constexpr std::size_t runLength() {
-        if constexpr (i >= n)
-            return 0;
-        else if constexpr (!ScalarField<FieldAt<i>>)
-            return 0;
-        else
-            return i == 0 ? 1 : 1 + runLength<i + 1>();
+        if constexpr (i < n) {
+            if constexpr (ScalarField<FieldAt<i>>)
+                return i == 0 ? 1 : 1 + runLength<i + 1>();
+        }
+        return 0;
     }
 
     template <Move direction>

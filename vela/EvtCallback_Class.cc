@@ -194,8 +194,10 @@ void EvtCallback::dispatchTo(linkedList<callbackInfo>& callbacks, unsigned int k
         auto delivery = std::make_unique<Delivery>(entry.handler, owner(), type, deliveries_);
         if (entry.handler.takesBody())
             delivery->body = bodyOf(*msg, key, isEvent);
+        else if (single)
+            delivery->msg.swap(msg);
         else
-            delivery->msg = single ? std::move(msg) : std::make_unique<Msg>(*msg);
+            delivery->msg = std::make_unique<Msg>(*msg);
         run(std::move(delivery), entry.threadParam);
     }
 }

@@ -14,7 +14,8 @@ class MsgDefault_t : public MsgBody {
     explicit MsgDefault_t(staticList<unsigned char>& bytes) : used_(&bytes) {}
     MsgDefault_t(const MsgDefault_t& other) : MsgBody(other), own_(*other.used_) {}
     MsgDefault_t& operator=(const MsgDefault_t& other) {
-        *used_ = *other.used_;
+        if (this != &other)
+            *used_ = *other.used_;
         return *this;
     }
     ~MsgDefault_t() override = default;

@@ -20,6 +20,7 @@ class StdResource : public Addressable, public StdResourceMessages {
 
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
 
+    // NOLINTNEXTLINE(bugprone-virtual-near-miss): both names are prescribed
     void msgQueueAttach(MsgQueue* queue) { MsgQueueAttach(queue); }
     // Marks the component as in use, with a word of the user's own, or as no longer in use, or gives an
     // allocated instance back: requests to the board's resource manager. Throw Timeout, UnexpectedMsg.

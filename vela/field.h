@@ -37,7 +37,8 @@ class Field {
     Field() = default;
     Field(const Field& other) : own_(*other.used_) {}
     Field& operator=(const Field& other) {
-        *used_ = *other.used_;
+        if (this != &other)
+            *used_ = *other.used_;
         return *this;
     }
     Field& operator=(const T& value) {

@@ -86,8 +86,8 @@ class staticList : public list<T> {
     }
     staticList(const staticList& other) : list<T>() { *this = other; }
     staticList(staticList&& other) noexcept
-        : list<T>(other), array_(std::move(other.array_)), capacity_(std::exchange(other.capacity_, 0)) {
-        other.length_ = 0;
+        : list<T>(), array_(std::move(other.array_)), capacity_(std::exchange(other.capacity_, 0)) {
+        length_ = std::exchange(other.length_, 0);
     }
     ~staticList() override = default;
 
