@@ -33,6 +33,7 @@ install_packages() {
 }
 
 BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libpcap-dev libtomlplusplus-dev nlohmann-json3-dev)
+CHECK_PACKAGES=(clang-format clang-tidy cppcheck)
 TEST_PACKAGES=(libgtest-dev libgmock-dev libbenchmark-dev python3)
 
 # Configures and builds one preset; says what it does and shows the compiler's words only when it fails.
