@@ -29,6 +29,15 @@ if(LAPDMON_FUZZ)
     target_compile_options(lapdmon_options INTERFACE -fsanitize=fuzzer-no-link)
 endif()
 
+# What makes a fault harder to use against the programs that are installed; tests/build looks for it in them.
+include(CheckPIESupported)
+check_pie_supported()
+set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+set(hardened "$<CONFIG:Release,RelWithDebInfo,MinSizeRel>")
+target_compile_options(lapdmon_options INTERFACE
+    "$<${hardened}:-U_FORTIFY_SOURCE;-D_FORTIFY_SOURCE=2;-fstack-protector-strong>")
+target_link_options(lapdmon_options INTERFACE "$<${hardened}:LINKER:-z,relro,-z,now,-z,noexecstack>")
+
 # A program that links the transport library. In the build tree RUNPATH (not RPATH, so that LD_LIBRARY_PATH
 # comes first) leads to the software board's; the installed program has none. CMake's own handling would leave
 # an empty entry in the list, which stands for the current directory.
