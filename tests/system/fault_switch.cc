@@ -2,9 +2,10 @@
 // while the program runs, and ask what is held. FAULT_SWITCH is the number of a descriptor that takes lines
 // and answers each:
 //
-//     faults event-label=3 silent     from now on these, and no others     "ok"
-//     held                                                                 message buffers not freed, queued
-//     ones too
+//     faults event-label=3 silent    from now on these and no others: "ok"
+//     held                           message buffers not freed, those that wait in a queue among them
+//     settle                         memory that is free goes back to the system: "ok"
+#include <malloc.h>
 #include <unistd.h>
 
 #include <cstdio>
@@ -27,6 +28,10 @@ std::string answerTo(const std::string& line) {
     words >> word;
     if (word == "held")
         return std::to_string(softboard::outstanding());
+    if (word == "settle") {
+        malloc_trim(0);
+        return "ok";
+    }
     std::vector<softboard::Fault> faults;
     while (words >> word)
         faults.push_back(softboard::parseFault(word));

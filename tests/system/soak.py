@@ -1,10 +1,11 @@
-"""Runs the trace at line rate while faults are switched on and off at random; says what came of it.
+"""Runs the trace at line rate while faults are switched on and off at random, and says what came of it.
 
     scripts/soak --minutes 30            scripts/soak --frames 10000 --seed 7
 
-The board plays numbered frames in both directions; the log is read through a FIFO as it is written, and kept nowhere.
-Troubled times and calm ones take turns. The exit status is 1 when a frame is lost, damaged or out of order, when memory,
-threads, descriptors or waiting messages grow from one calm time to the next, or when the program does not end in order.
+The board plays numbered frames in both directions; the log is read through a FIFO as it is written, and kept
+nowhere. Troubled times and calm ones take turns. The exit status is 1 when a frame is lost, damaged or out of order,
+when memory, threads, descriptors or waiting messages grow from the first calm times to the last, or when the program
+does not end in order.
 """
 
 import argparse
@@ -27,7 +28,7 @@ from order import LINE_RATE, MOST_THREADS, PAUSE, number_of
 ROUND = 20000        # frames in the capture, which is played again and again
 LIMIT = 120          # seconds without a frame, after which none is waited for
 QUEUE = 64           # messages that wait for the program before the board waits
-GROWTH = 4096        # kB of memory that are no growth: what the C library keeps for threads that have been
+GROWTH = 4096        # kB of memory that are no growth: the C library keeps stacks of threads that have ended
 
 # Wrong events come beside the right ones, one for each hundred frames (docs/softboard.md): name, least and most number.
 WRONG_EVENTS = (
@@ -159,6 +160,11 @@ class Program:
     def set_faults(self, faults):
         self._ask("faults " + " ".join(faults))
 
+    def calm_sample(self):
+        """What was needed for a moment has been given back, as far as the C library does that."""
+        self._ask("settle")
+        return self.sample()
+
     def sample(self):
         return Sample(self.pid, int(self._ask("held")))
 
@@ -202,7 +208,7 @@ class Soak:
     def run(self):
         start = time.monotonic()
         self._follow(self._options.phase)
-        self.calm.append(self._program.sample())
+        self.calm.append(self._program.calm_sample())
         while self._goes_on(start):
             self._trouble()
             self._calm()
@@ -270,7 +276,7 @@ class Soak:
         end = time.monotonic() + LIMIT
         while self._program.sample().held > QUEUE and time.monotonic() < end:
             self._follow(100)
-        self.calm.append(self._program.sample())
+        self.calm.append(self._program.calm_sample())
 
     def idle(self):
         for each in self._busy:
