@@ -27,7 +27,7 @@ from order import LINE_RATE, MOST_THREADS, PAUSE, number_of
 
 ROUND = 20000        # frames in the capture, which is played again and again
 LIMIT = 120          # seconds without a frame, after which none is waited for
-QUEUE = 64           # messages that wait for the program before the board waits
+QUEUE = 64 + 8       # messages that wait for the program before the board waits, and those on their way through it
 GROWTH = 4096        # kB of memory that are no growth: the C library keeps stacks of threads that have ended
 
 # Wrong events come beside the right ones, one for each hundred frames (docs/softboard.md): name, least and most number.
