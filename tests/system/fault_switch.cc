@@ -4,7 +4,8 @@
 //
 //     faults event-label=3 silent    from now on these and no others: "ok"
 //     held                           message buffers not freed, those that wait in a queue among them
-//     settle                         memory that is free goes back to the system: "ok"
+//     settle                         the board forgets its journal, free memory goes back to the system: "ok"
+//     used                           kB of allocated memory
 #include <malloc.h>
 #include <unistd.h>
 
@@ -29,8 +30,13 @@ std::string answerTo(const std::string& line) {
     if (word == "held")
         return std::to_string(softboard::outstanding());
     if (word == "settle") {
+        softboard::clearJournal();
         malloc_trim(0);
         return "ok";
+    }
+    if (word == "used") {
+        const auto memory = mallinfo2();
+        return std::to_string((memory.uordblks + memory.hblkhd) / 1024);
     }
     std::vector<softboard::Fault> faults;
     while (words >> word)

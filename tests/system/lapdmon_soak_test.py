@@ -41,11 +41,11 @@ class Soak(unittest.TestCase):
             self.assertEqual((checker.frames, checker.wrong), expected)
 
     def test_each_thing_that_grows_is_said(self):
-        for name, by, complaint in (("memory", 5000, "memory grew"), ("descriptors", 1, "descriptors grew"),
+        for name, by, complaint in (("used", 600, "memory grew"), ("descriptors", 1, "descriptors grew"),
                                     ("threads", 101, "threads grew"), ("held", 100, "messages still waited"),
-                                    ("memory", 0, None)):
+                                    ("used", 0, None)):
             soaked = soak.Soak(types.SimpleNamespace(seed=1), types.SimpleNamespace(said=[]))
-            calm = {"memory": 9000, "threads": 5, "descriptors": 8, "held": 1}
+            calm = {"used": 9000, "threads": 5, "descriptors": 8, "held": 1}
             more = {**calm, name: calm[name] + by}
             soaked.calm = [types.SimpleNamespace(**each) for each in 3 * [calm] + 3 * [more]]
             soaked.samples = soaked.calm[:1]

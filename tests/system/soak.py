@@ -28,7 +28,7 @@ from order import LINE_RATE, MOST_THREADS, PAUSE, number_of
 ROUND = 20000        # frames in the capture, which is played again and again
 LIMIT = 120          # seconds without a frame, after which none is waited for
 QUEUE = 64 + 8       # messages that wait for the program before the board waits, and those on their way through it
-GROWTH = 4096        # kB of memory that are no growth: the C library keeps stacks of threads that have ended
+GROWTH = 512         # kB of allocated memory that are no growth: messages that are on their way
 
 # Wrong events come beside the right ones, one for each hundred frames (docs/softboard.md): name, least and most number.
 WRONG_EVENTS = (
@@ -103,12 +103,13 @@ class Checker:
 class Sample:
     """What the program has at a time."""
 
-    def __init__(self, pid, held):
+    def __init__(self, pid, held, used):
         status = pathlib.Path(f"/proc/{pid}/status").read_text()
-        self.memory = int(re.search(r"^VmRSS:\s+(\d+)", status, re.M)[1])
+        self.resident = int(re.search(r"^VmRSS:\s+(\d+)", status, re.M)[1])
         self.threads = int(re.search(r"^Threads:\s+(\d+)", status, re.M)[1])
         self.descriptors = len(os.listdir(f"/proc/{pid}/fd"))
         self.held = held
+        self.used = used
 
 
 class Program:
@@ -161,12 +162,12 @@ class Program:
         self._ask("faults " + " ".join(faults))
 
     def calm_sample(self):
-        """What was needed for a moment has been given back, as far as the C library does that."""
+        """The board's journal, which grows at first, is none of the program's memory."""
         self._ask("settle")
         return self.sample()
 
     def sample(self):
-        return Sample(self.pid, int(self._ask("held")))
+        return Sample(self.pid, int(self._ask("held")), int(self._ask("used")))
 
     def pause(self, seconds):
         os.kill(self.pid, signal.SIGSTOP)
@@ -306,8 +307,8 @@ class Soak:
         if calm[-1].held > QUEUE:
             yield f"{calm[-1].held} messages still waited in calm"
         third = len(calm) // 3
-        if third >= 2 and (min(sample.memory for sample in calm[-third:])
-                           > max(sample.memory for sample in calm[:third]) + GROWTH):
+        if third >= 2 and (min(sample.used for sample in calm[-third:])
+                           > max(sample.used for sample in calm[:third]) + GROWTH):
             yield "memory grew"
 
     def report(self):
@@ -315,7 +316,7 @@ class Soak:
         yield f"{self.seconds:.0f} seconds, seed {self._options.seed}, {len(calm) - 1} troubled times"
         yield (f"frames       {checker.frames} ({checker.frames / self.seconds:.0f} a second), lost {checker.lost}, "
                f"out of order {checker.disordered}; sent wrong by the board {checker.wrong}")
-        for says, name, unit in (("memory", "memory", " kB"), ("threads", "threads", ""),
+        for says, name, unit in (("in use", "used", " kB"), ("resident", "resident", " kB"), ("threads", "threads", ""),
                                  ("descriptors", "descriptors", ""), ("waiting", "held", " messages")):
             values = [getattr(sample, name) for sample in samples + calm]
             yield (f"{says:12} {getattr(calm[0], name)} in the first calm, {getattr(calm[-1], name)} in the last, "
