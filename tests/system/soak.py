@@ -187,6 +187,8 @@ class Program:
         self._process.kill()
         self._process.wait()
         self._process.stdin.close()
+        self._listener.join(LIMIT)
+        self._process.stderr.close()
         os.close(self._log)
         if self._held_open is not None:
             os.close(self._held_open)
