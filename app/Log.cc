@@ -43,9 +43,13 @@ std::FILE* Log::open(const char* name) {
     return stream_;
 }
 
-void Log::write(std::string_view entry) {
-    held_ += entry;
-    entries_.push_back({held_.size(), std::exchange(isFrame_, false)});
+void Log::write(std::string_view text) {
+    held_ += text;
+    if (writesOfFrame_ > 1) {
+        --writesOfFrame_;
+        return;
+    }
+    entries_.push_back({held_.size(), std::exchange(writesOfFrame_, 0) == 1});
     if (held_.size() >= BlockSize)
         writeOut();
 }

@@ -25,9 +25,9 @@ class Log {
     // Creates or empties the file; waits for the reader of a FIFO. Null, with errno, when it cannot. The
     // stream is the log's own and writes nothing itself.
     std::FILE* open(const char* name);
-    // The next entry is a frame.
-    void frameFollows() { isFrame_ = true; }
-    void write(std::string_view entry);
+    // The next entry is a frame, which comes in so many writes.
+    void frameFollows(unsigned int writes = 1) { writesOfFrame_ = writes; }
+    void write(std::string_view text);
     // Writes what is held. After a write that failed, says how many frames are missing. Nothing the second
     // time.
     void close();
@@ -54,8 +54,8 @@ class Log {
     std::FILE* stream_ = nullptr;
     std::string held_;
     std::vector<Entry> entries_;
-    std::string rest_;  // of an entry that is in the file in part and could not be taken back
-    bool isFrame_ = false;
+    std::string rest_;                // of an entry that is in the file in part and could not be taken back
+    unsigned int writesOfFrame_ = 0;  // still to come
     bool restIsFrame_ = false;
     bool complete_ = true;
     unsigned long lost_ = 0;

@@ -101,10 +101,11 @@ void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
         std::cout << "ERROR - received unexpected rtc event" << std::endl;
         return;
     }
-    traceLog.frameFollows();
-    writeHeader(rec.Direction, rec.Timestamp);
     octets = rec.List.value();
     decoder::msglen = frameLength(rec.Length, octets.length());
+    // A refusal reaches the log before the screen, and so in two parts.
+    traceLog.frameFollows(decoder::msglen > decoder::maximumFrame ? 2 : 1);
+    writeHeader(rec.Direction, rec.Timestamp);
     decoder::RingBuffer frame;
     if (decoder::getBlock(&frame, octets, decoder::msglen)) {
         decoder::parse_isdn_frame(frame);

@@ -12,6 +12,7 @@
 #include <csignal>
 #include <cstdio>
 #include <fstream>
+#include <iterator>
 #include <sstream>
 #include <thread>
 
@@ -98,6 +99,66 @@ TEST_F(LogTest, WritesABlockBehindAGapWholeOrNotAtAll) {
     EXPECT_EQ(log_.lost(), 3U);
     EXPECT_EQ(contents(path_), "");
     EXPECT_EQ(saidAtTheEnd(), path_ + ": File too large\n" + path_ + ": frames lost: 3\n");
+}
+
+TEST_F(LogTest, WritesAFrameThatComesInPiecesWholeOrNotAtAll) {
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    log_.frameFollows(2);
+    log_.write(std::string(5000, 'a'));
+    EXPECT_EQ(contents(path_), "");
+    log_.write(std::string(10, 'a'));
+    EXPECT_EQ(contents(path_), std::string(5010, 'a'));
+    limitFileSize(10000);
+    log_.frameFollows(2);
+    log_.write(std::string(4985, 'b'));
+    log_.write(std::string(10, 'b'));
+    EXPECT_EQ(contents(path_), std::string(5010, 'a'));
+    EXPECT_EQ(saidAtTheEnd(), path_ + ": File too large\n" + path_ + ": frames lost: 1\n");
+}
+
+// The text's letters, once each frame is found whole; what a gap says is missing stands in `said`.
+std::string framesIn(const std::string& text, std::size_t size, unsigned long& said) {
+    const std::string gap = "Frames Lost: ";
+    std::string letters;
+    for (std::size_t at = 0; at < text.size();) {
+        if (text.compare(at, gap.size(), gap) == 0) {
+            said += std::stoul(text.substr(at + gap.size()));
+            at = text.find('\n', at) + 1;
+        } else if (text.compare(at, size, std::string(size, text[at])) == 0) {
+            letters += text[at];
+            at += size;
+        } else {
+            return "no whole frame at " + std::to_string(at);
+        }
+    }
+    return letters;
+}
+
+TEST_F(LogTest, KeepsWholeFramesAndCountsTheOthersWhereverTheFileEndsForAWhile) {
+    constexpr std::size_t size = 1300;
+    const std::string all = "abcdefghijklmnopqrst";
+    for (rlim_t limit = 1; limit < 12 * size; limit += 61) {
+        Log log;
+        ASSERT_NE(log.open(path_.c_str()), nullptr);
+        limitFileSize(limit);
+        for (const char letter : all) {
+            if (letter == 'm')
+                setrlimit(RLIMIT_FSIZE, &before_);
+            log.frameFollows();
+            log.write(std::string(size, letter));
+        }
+        log.close();
+        unsigned long said = 0;
+        const std::string letters = framesIn(contents(path_), size, said);
+        std::string kept;
+        std::set_intersection(all.begin(), all.end(), letters.begin(), letters.end(),
+                              std::back_inserter(kept));
+        EXPECT_EQ(letters, kept) << "limit " << limit;  // in order, none twice
+        EXPECT_EQ(letters.size() + log.lost(), all.size()) << "limit " << limit;
+        EXPECT_EQ(said, log.lost()) << "limit " << limit;
+        EXPECT_EQ(log.complete(), log.lost() == 0) << "limit " << limit;
+    }
+    static_cast<void>(saidAtTheEnd());
 }
 
 TEST_F(LogTest, DoesNotCountWhatIsNoFrame) {

@@ -86,6 +86,18 @@ class BrokenLog(SystemTest):
             self.assertEqual(times, [t for t in expected if t in set(times)])
         self.traced_whole(program)
 
+    def test_a_frame_that_is_too_long_is_in_a_file_that_reaches_its_limit_whole_or_not_at_all(self):
+        many = 100
+        for blocks in range(9, 16):
+            with self.subTest(blocks):
+                program = self.on_board("--rate", "max", frames=capture(*many * [MARK], interval=0.004),
+                                        run=("sh", "-c", f'ulimit -f {blocks}; exec "$0" -b1', LAPDMON))
+                program.screen.wait("Frame Error", times=many)
+                program.types("q")
+                program.ends(status=1, errors=re.compile(r"\Alapdmon.log: File too large\n.*: frames lost: \d+\n\Z"))
+                times, _ = self.frames_of(program.log())
+                self.assertEqual(len(times) + int(program.errors.lines()[-1].split()[-1]), many)
+
     def test_a_pipe_whose_reader_goes_is_said_once_and_its_next_reader_gets_whole_frames(self):
         path = self.folder / "pipe"
         os.mkfifo(path)
