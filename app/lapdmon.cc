@@ -81,9 +81,18 @@ bool setProtocol(unsigned int type) {
     return true;
 }
 
+// What nobody registered for is reported as ever, but on the reader thread: while nobody reads the standard
+// error stream, messages stay with the transport, and no threads pile up.
+void reportInTurn(vela::CCS& reporting) {
+    const vela::Handler asEver(vela::Handler::MsgFunction{nullptr});
+    reporting.asyncUnregisteredMsgType(asEver, vela::EvtCallback::OnDispatchingThread);
+    reporting.asyncUnregisteredEvtGroup(asEver, vela::EvtCallback::OnDispatchingThread);
+}
+
 // Once the board reports events, the instance is quit's to switch off and to destroy.
 void startTrace(std::unique_ptr<vela::CCS> opened) {
     opened->SetParm(L2TraceParm, 1, nullptr);
+    reportInTurn(*opened);
     opened->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0);
     opened->DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
     ccs = std::move(opened);
@@ -104,6 +113,7 @@ int awaitEnd() {
 
 // The exit status.
 int trace(int argc, char** argv) {
+    openStandardStreams();
     outliveOutput();
     vela::MsgQueue::DefaultDepth = QueueDepth;
     parseArgs(argc, argv);

@@ -59,6 +59,13 @@ void watchSignals() {
     }
 }
 
+void openStandardStreams() {
+    for (const int each : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
+        if (fcntl(each, F_GETFD) < 0)
+            static_cast<void>(open("/dev/null", O_RDWR));  // the lowest number that is free: this one
+    }
+}
+
 void outliveOutput() {
     static_cast<void>(std::signal(SIGPIPE, SIG_IGN));
     static_cast<void>(std::signal(SIGXFSZ, SIG_IGN));

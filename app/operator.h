@@ -9,6 +9,10 @@ namespace app {
 // ignored from the start, under nohup, stays so.
 void watchSignals();
 
+// Standard streams that are closed lead nowhere from here on. Otherwise the next files that are opened would
+// take their numbers: reports would end up in the log, or wake whoever waits for a signal.
+void openStandardStreams();
+
 // A screen or a log that nobody reads any more, or that grows past the limit of its size, must not end the
 // process, least of all its shutdown.
 void outliveOutput();

@@ -1,0 +1,93 @@
+"""Standard streams that are closed, or that nobody reads."""
+
+import fcntl
+import os
+import pathlib
+import re
+import struct
+import termios
+import time
+import unittest
+from signal import SIGTERM
+
+from harness import BANNER, LAPDMON, LIMIT, MARK, RECEIVED, SystemTest, capture
+from order import MOST_THREADS
+
+FRAMES = [(RECEIVED, bytes((2, 1, 1, i % 251))) for i in range(250)]
+BALANCE = "buffers outstanding 0, queues open 0"
+
+
+class ClosedStreams(SystemTest):
+    def test_the_log_is_the_log_alone_and_the_trace_goes_on_whatever_is_closed(self):
+        for closed in ("<&-", ">&-", "2>&-", ">&- 2>&-", "<&- >&- 2>&-"):
+            with self.subTest(closed):
+                program = self.on_board("--rate", "500", "--loop", "--fault", "event-label=3",
+                                        run=("sh", "-c", f'exec "$0" -b1 {closed}', LAPDMON),
+                                        frames=capture(*FRAMES, interval=0.004))
+                program.journal.wait(" EvtDetected ", times=300)  # with four that are reported
+                program.gets(SIGTERM)
+                program.ends(errors=re.compile(""))
+                self.assertEqual(program.heard()[-2:], ["26 CancelEvt {Type 2}", "8 SetParm {Parm 10 Val 0}"])
+                self.assertEqual(program.journal.lines()[-1], BALANCE)
+                self.assertNotIn("Unregisterd", "".join(program.journal.lines()))
+                log = program.log()
+                self.assertRegex(log, BANNER)
+                frames = log[BANNER.match(log).end():]
+                self.assertRegex(frames, r"\ANET5 Switch \n(\nDATE\nRX Frame: Time = .*\nCommand=1   SAPI=0x00\nTEI=0x00\n"
+                                         r"0x01 0x.. .*\nHex Dump: \n02 01 01 .. \n)+\Z")
+
+    def test_a_screen_whose_reader_goes_ends_nothing(self):
+        program = self.on_board("--rate", "max", run=("bash", "-c", 'exec "$0" -b1 > >(head -n 1)', LAPDMON),
+                                frames=capture(*FRAMES, MARK, interval=0.004))
+        program.journal.wait(" EvtDetected ", times=len(FRAMES) + 1)
+        program.quits()
+        self.assertEqual(program.screen.text(), "filename: lapdmon.log\n")
+        self.assertEqual(program.journal.lines()[-1], BALANCE)
+
+
+class StalledStandardError(SystemTest):
+    """A terminal that was stopped, say: 1000 events come that are to be reported."""
+
+    MANY = 1000
+
+    def threads(self, program):
+        status = (pathlib.Path("/proc") / str(program.pid) / "status").read_text()
+        return int(re.search(r"^Threads:\s+(\d+)", status, re.M)[1])
+
+    def test_events_to_be_reported_wait_with_the_transport_and_make_no_threads(self):
+        path = self.folder / "stopped"
+        os.mkfifo(path)
+        reader = os.open(path, os.O_RDONLY | os.O_NONBLOCK)
+        self.addCleanup(os.close, reader)
+        frames = [(RECEIVED, bytes((2, 1, 1, i % 251))) for i in range(self.MANY)]
+        self.file("frames.pcap", capture(*frames, interval=0.004))
+        scenario = self.file("other.toml", 'frames = "frames.pcap"\nlabel = 3\nrate = "max"\n')
+        program = self.on_board("--scenario", scenario, "--fault", f"burst={self.MANY}",
+                                run=("sh", "-c", 'exec "$0" -b1 2>stopped', LAPDMON))
+        program.journal.wait(" EvtDetected ", times=self.MANY)
+        self.wait_until_stalled(reader)
+        most = 0
+        for _ in range(30):  # a thread for each event would be made meanwhile
+            most = max(most, self.threads(program))
+            time.sleep(0.01)
+        self.assertLessEqual(most, MOST_THREADS)
+        os.set_blocking(reader, True)
+        text = ""
+        while text.count("Unregisterd EventGroup 3\n") < self.MANY:
+            text += os.read(reader, 65536).decode()
+        program.types("q")
+        while some := os.read(reader, 65536).decode():
+            text += some
+        program.ends()
+        self.assertEqual(text.count("Unregisterd "), self.MANY)
+        self.assertEqual(program.journal.lines()[-1], BALANCE)
+
+    def wait_until_stalled(self, reader):
+        end = time.monotonic() + LIMIT
+        while struct.unpack("i", fcntl.ioctl(reader, termios.FIONREAD, bytes(4)))[0] < 45000:
+            self.assertLess(time.monotonic(), end)
+            time.sleep(0.01)
+
+
+if __name__ == "__main__":
+    unittest.main()
