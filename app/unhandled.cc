@@ -3,11 +3,14 @@
 #include <cxxabi.h>
 #include <unistd.h>
 
+#include <atomic>
 #include <cstdlib>
 #include <exception>
 #include <iostream>
+#include <memory>
 #include <sstream>
 #include <string>
+#include <string_view>
 
 #include "app/Log.h"
 #include "app/display.h"
@@ -58,15 +61,36 @@ void closeInTime() {
     queueGuard.unlock();
 }
 
+// Given back for the last words: that there is no memory may be what ends the process.
+constexpr std::size_t ReserveSize = 65536;
+std::atomic<char*> reserve = nullptr;
+
+void sayWhatAndWhere() {
+    try {
+        std::cerr << "lapdmon: the trace ends, nobody handled " + whatIsWrong() + " " + place() + "\n"
+                  << std::flush;
+    } catch (...) {
+        constexpr std::string_view words = "lapdmon: the trace ends, nobody handled an exception\n";
+        static_cast<void>(!write(STDERR_FILENO, words.data(), words.size()));
+    }
+}
+
 [[noreturn]] void endUnhandled() {
-    closeInTime();
-    std::cerr << "lapdmon: the trace ends, nobody handled " + whatIsWrong() + " " + place() + "\n"
-              << std::flush;
+    std::unique_ptr<char[]>(reserve.exchange(nullptr)).reset();
+    try {
+        closeInTime();
+    } catch (...) {  // the words matter all the same
+    }
+    sayWhatAndWhere();
     _exit(EXIT_FAILURE);
 }
 
 }  // namespace
 
-void closeLogWhenUnhandled() { std::set_terminate(endUnhandled); }
+void closeLogWhenUnhandled() {
+    if (reserve == nullptr)
+        reserve = std::make_unique<char[]>(ReserveSize).release();
+    std::set_terminate(endUnhandled);
+}
 
 }  // namespace app
