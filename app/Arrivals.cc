@@ -36,14 +36,20 @@ void Arrivals::endTurnLocked(unsigned int number) {
     room_.notify_one();
 }
 
-void Arrivals::leave(unsigned int number) {
+void Arrivals::leave(unsigned int number, bool delivered) {
     {
         const std::lock_guard guard(mutex_);
+        lost_ += delivered || closed_ ? 0 : 1;
         endTurnLocked(number);
         if (--present_ == 0)
             none_.notify_all();
     }
     room_.notify_one();
+}
+
+unsigned long Arrivals::lost() const {
+    const std::lock_guard guard(mutex_);
+    return lost_;
 }
 
 bool Arrivals::awaitNone(std::chrono::milliseconds limit) {
@@ -84,6 +90,7 @@ Turn::Turn(const vela::CCS::EvtL2Trace_t* rec) {
     const auto* const arrived = dynamic_cast<const ArrivedRecord*>(rec);
     if (arrived == nullptr)
         return;
+    arrived->place.delivered();
     number_ = arrived->place.number();
     arrivals.awaitTurn(*number_);
 }

@@ -27,15 +27,18 @@ class Arrivals {
     class Place {
       public:
         explicit Place(Arrivals& arrivals) : arrivals_(arrivals), number_(arrivals.arrive()) {}
-        ~Place() { arrivals_.leave(number_); }
+        ~Place() { arrivals_.leave(number_, delivered_); }
         Place(const Place&) = delete;
         Place& operator=(const Place&) = delete;
 
         unsigned int number() const { return number_; }
+        // On the delivery's thread. A record that goes without it, found no thread or no memory, and is lost.
+        void delivered() const { delivered_ = true; }
 
       private:
         Arrivals& arrivals_;
         unsigned int number_;
+        mutable bool delivered_ = false;
     };
 
     void awaitTurn(unsigned int number);
@@ -44,6 +47,9 @@ class Arrivals {
 
     // Until no record is there; false when `limit` has passed first.
     bool awaitNone(std::chrono::milliseconds limit);
+
+    // Records that were lost before the end.
+    unsigned long lost() const;
 
     // Nobody waits any more: places are unlimited and in no order. For the end of whoever shows records.
     void close();
@@ -57,14 +63,15 @@ class Arrivals {
 
     unsigned int arrive();
     bool hasRoom() const { return present_ < Most && next_ - turn_ < Slots; }
-    void leave(unsigned int number);
+    void leave(unsigned int number, bool delivered);
     void endTurnLocked(unsigned int number);
 
-    std::mutex mutex_;
+    mutable std::mutex mutex_;
     std::condition_variable room_;
     std::condition_variable none_;
     std::atomic<bool> traceEnded_ = false;
     bool closed_ = false;
+    unsigned long lost_ = 0;
     unsigned int present_ = 0;
     unsigned int next_ = 0;                             // the number of the next to arrive; wraps
     unsigned int turn_ = 0;                             // the number whose turn it is

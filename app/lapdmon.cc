@@ -4,6 +4,7 @@
 #include <cstdlib>
 #include <iostream>
 #include <memory>
+#include <string>
 #include <utility>
 
 #include "app/Arrivals.h"
@@ -134,6 +135,16 @@ int trace(int argc, char** argv) {
     return awaitEnd();
 }
 
+// Whether every frame is in the log. Says how many found no thread or no memory; the log says of itself what
+// it could not write.
+bool isWhole() {
+    const unsigned long lost = arrivals.lost();
+    if (lost != 0)
+        std::cerr << "lapdmon: frames lost for want of threads or memory: " + std::to_string(lost) + "\n"
+                  << std::flush;
+    return lost == 0 && traceLog.complete();
+}
+
 // One step of the shutdown, which goes on whatever happens.
 template <typename Step>
 void attempt(Step step) {
@@ -173,7 +184,7 @@ int runTrace(int argc, char** argv) {
     quit();           // now, while the status can still say what became of the log
     discardQueued();  // of a start that failed
     closeLog();
-    return traceLog.complete() ? status : EXIT_FAILURE;
+    return isWhole() ? status : EXIT_FAILURE;
 }
 
 }  // namespace app

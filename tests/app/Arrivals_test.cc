@@ -103,6 +103,19 @@ TEST(Arrivals, RecordsThatGoUnseenBehindOneThatIsSlowLoseNobodysTurn) {
     arrivals.awaitTurn(next.number());  // would wait for ever if a turn were lost
 }
 
+TEST(Arrivals, RecordsThatNobodyDeliversAreLostUntilTheyAreClosed) {
+    Arrivals arrivals;
+    for (int i = 0; i < 300; ++i) {
+        const Place place(arrivals);
+        if (i % 3 == 0)
+            place.delivered();
+    }
+    EXPECT_EQ(arrivals.lost(), 200U);
+    arrivals.close();
+    { const Place late(arrivals); }
+    EXPECT_EQ(arrivals.lost(), 200U);
+}
+
 TEST(Arrivals, ManyMoreThanThereArePlacesPassThrough) {
     Arrivals arrivals;
     for (unsigned int i = 0; i < 1000; ++i) {
@@ -148,7 +161,7 @@ TEST(Turn, MayOutliveItsRecord) {
         const Turn turn(rec.get());
         rec.reset();
     }
-    arrivals.awaitTurn(next.place.number());
+    const Turn turn(&next);  // would wait for ever if a turn were lost
 }
 
 // Last: the program-wide arrivals do not come back.

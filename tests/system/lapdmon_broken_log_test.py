@@ -146,6 +146,23 @@ class BrokenLog(SystemTest):
         self.assertGreater(len(parts), 10)
 
 
+class FewThreads(SystemTest):
+    def test_frames_for_which_the_system_has_no_thread_are_counted_and_the_status_is_1(self):
+        program = self.on_board("--rate", "max", frames=DAY, run=(
+            "env", "LD_PRELOAD=" + os.environ["FEW_THREADS_LIBRARY"], "FEW_FROM=100", "FEW_TO=109",
+            "ASAN_OPTIONS=exitcode=99:verify_asan_link_order=0", LAPDMON, "-b1"))
+        program.screen.wait("Frame Error")
+        program.types("q")
+        program.ends(status=1, errors=re.compile(
+            r"\A(\(EvtCallback_Class214\) vela internal error\nvela::Thread::CreationError\n){10}"
+            r"lapdmon: frames lost for want of threads or memory: 10\n\Z"))
+        times = re.findall(r"Time = (\S+)", program.log())
+        wanted = [time_of(i) for i in range(FRAMES + 1)]
+        at = next(i for i in range(FRAMES) if times[i] != wanted[i])
+        self.assertEqual(times, wanted[:at] + wanted[at + 10:])
+        self.assertEqual(program.journal.lines()[-1], BALANCE)
+
+
 class StalledLog(SystemTest):
     """Nobody reads the FIFO for a while: 1000 events come all at once meanwhile."""
 
