@@ -1,5 +1,7 @@
+#include <fcntl.h>
 #include <sys/resource.h>
 #include <sys/signalfd.h>
+#include <unistd.h>
 
 #include <csignal>
 #include <cstdlib>
@@ -31,6 +33,16 @@ relay::Descriptor awaitedSignals() {
     return relay::Descriptor(signalfd(-1, &signals, SFD_CLOEXEC | SFD_NONBLOCK));
 }
 
+// A log that nobody reads any more ends no connection; and no connection gets the number of a stream that was
+// closed, and with it the log's lines.
+void outliveStreams() {
+    for (const int each : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
+        if (fcntl(each, F_GETFD) < 0)
+            static_cast<void>(open("/dev/null", O_RDWR));  // the lowest number that is free: this one
+    }
+    static_cast<void>(std::signal(SIGPIPE, SIG_IGN));
+}
+
 // Each connection takes a descriptor, and the transport library may keep one for its queue.
 void allowMoreOpenFiles() {
     rlimit limit{};
@@ -54,6 +66,7 @@ void serve(const relay::Options& options) {
 }  // namespace
 
 int main(int argc, char** argv) {
+    outliveStreams();
     try {
         const relay::CommandLine commandLine = relay::parseCommandLine(argc, argv);
         if (!commandLine.told.empty())

@@ -3,9 +3,10 @@
 import os
 import signal
 import socket
+import struct
 import unittest
 
-from relay_harness import CLOSE, RELAY, Program, Relay, RelayTest
+from relay_harness import CLOSE, RELAY, SOFTBOARD, Host, Program, Relay, RelayTest
 
 
 class TheProgram(RelayTest):
@@ -42,6 +43,31 @@ class TheProgram(RelayTest):
             self.assertEqual(host.read_frame()[0], CLOSE)
             self.assertIsNone(host.read_frame())
             relay.ends()
+
+    def test_it_serves_on_when_nobody_reads_its_lines(self):
+        os.mkfifo(self.folder / "gone")
+        name = "kv9relayd-test-" + str(os.getpid())
+        for streams in ("2>gone", "2>&-", ">&- 2>&-", "<&- >&- 2>&-"):
+            with self.subTest(streams), socket.socket(socket.AF_UNIX, socket.SOCK_DGRAM) as manager:
+                reader = os.open(self.folder / "gone", os.O_RDONLY | os.O_NONBLOCK)
+                manager.settimeout(60)
+                manager.bind("\0" + name)
+                port = self.free_port()
+                relay = Program(self, SOFTBOARD, "--", "sh", "-c", f'exec "$0" --listen 127.0.0.1:{port} {streams}', RELAY,
+                                NOTIFY_SOCKET="@" + name)
+                self.assertEqual(manager.recv(100), b"READY=1")
+                os.close(reader)
+                for _ in range(3):
+                    host = Host(port)
+                    self.addCleanup(host.close)
+                    self.assertEqual(host.ask(18, struct.pack("<I", 7))[0], 19)
+                    host.leave()
+                relay.process.terminate()
+                relay.ends()
+
+    def free_port(self):
+        with socket.create_server(("127.0.0.1", 0)) as server:
+            return server.getsockname()[1]
 
     def test_the_service_manager_is_told(self):
         for name in (str(self.folder / "notify"), "\0kv9relayd-test-" + str(os.getpid())):
