@@ -7,7 +7,7 @@ log ends with a whole entry. Frames that the board sent in order stand in the lo
 import re
 import unittest
 
-from harness import (MARK, RECEIVED, TRANSMITTED, SystemTest, capture, time_of)
+from harness import (MARK, RECEIVED, SOFTBOARD, TRANSMITTED, SystemTest, capture, time_of)
 
 AT_ONCE = 32  # programs; most of their time they wait for a reply that does not come
 FRAMES = 250
@@ -213,6 +213,11 @@ class Faults(SystemTest):
             for row, name, program in running:
                 with self.subTest(" ".join(row.faults)):
                     self.check(row, program, name)
+
+    def test_every_fault_has_a_row(self):
+        _, _, listed = self.run_tool(SOFTBOARD, "--help").partition("\nFaults ")
+        rows = [fault.partition("=")[0] for row in REPLIES + CALLS + EVENTS + LOADS for fault in row.faults]
+        self.assertEqual(set(rows), set(re.findall(r"^  ([a-z][a-z0-9-]+)[= ]", listed.partition("\n\n")[0], re.M)))
 
     def test_replies(self):
         self.run_rows(REPLIES)
