@@ -16,7 +16,7 @@ class Promises(unittest.TestCase):
                 named = re.fullmatch(r"`(\S+)`: `(\w+)`", shown)
                 self.assertIsNotNone(named, shown)
                 text = (ROOT / named[1]).read_text()
-                self.assertRegex(text, rf"(def |TEST\w*\([^)]*)\w*{named[2]}\w*")
+                self.assertRegex(text, rf"(def |TEST\w*\([^)]*\b){named[2]}\b")
 
 
 if __name__ == "__main__":
