@@ -13,7 +13,7 @@ std::atomic<int> made = 0;
 
 int numberFrom(const char* variable) {
     const char* const text = std::getenv(variable);
-    return text == nullptr ? 0 : std::atoi(text);
+    return text == nullptr ? 0 : static_cast<int>(std::strtol(text, nullptr, 10));
 }
 
 }  // namespace
