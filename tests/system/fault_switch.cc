@@ -63,7 +63,7 @@ void serve(int descriptor) {
 const struct Switch {
     Switch() {
         if (const char* const descriptor = std::getenv("FAULT_SWITCH"); descriptor != nullptr)
-            std::thread(serve, std::atoi(descriptor)).detach();
+            std::thread(serve, static_cast<int>(std::strtol(descriptor, nullptr, 10))).detach();
     }
 } theSwitch;
 
