@@ -12,6 +12,7 @@
 #include "app/Log.h"
 #include "app/display.h"
 #include "app/guarded.h"
+#include "decoder/state.h"
 
 namespace app {
 
@@ -54,6 +55,7 @@ std::string place() {
 void closeInTime() {
     if (!queueGuard.tryLock(PatienceMs, PollMs))
         return;
+    decoder::ofp = nullptr;  // the display thread may go on until the process ends
     traceLog.close();
     queueGuard.unlock();
 }
