@@ -86,9 +86,11 @@ int measure(int argc, char** argv) {
 
 int main(int argc, char** argv) {
     if (argc == 4 && argv[1] == std::string("--traced"))
-        return bench::runTraced(std::atoi(argv[2]), argv[3]);
+        return bench::runTraced(bench::numberIn(argv[2], 0, 1 << 20).value_or(-1), argv[3]);
     if (argc == 4 && argv[1] == std::string("--reading")) {
-        std::cout << bench::readEvents(std::atof(argv[2]), argv[3] == std::string("1")) << std::endl;
+        std::cout << bench::readEvents(bench::numberIn(argv[2], 0.0, 3600.0).value_or(0),
+                                       argv[3] == std::string("1"))
+                  << std::endl;
         return EXIT_SUCCESS;
     }
     try {
