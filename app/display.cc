@@ -31,6 +31,12 @@ constexpr unsigned int Transmitted = 1;
 constexpr unsigned int TicksPerSecond = 250;
 constexpr unsigned int MillisecondsPerTick = 4;
 
+// What the reports of foreign exceptions carry.
+constexpr int CallbackPlace = 100;
+constexpr int DisplayThreadPlace = 215;
+
+static_assert(Arrivals::Most <= unsigned{QueueCapacity}, "a record that has a place finds room in the queue");
+
 // The second it is, in the C library's 24-character form and a line end. Under queueGuard. Frames of one
 // second share the text, whose making takes as long as the decoding of a frame.
 std::string_view localTime() {
@@ -119,7 +125,7 @@ void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
 
 void HANDLE_L2Trace_events(vela::CCS*, unsigned int, Record* rec) {
     std::unique_ptr<Record> held(rec);
-    guarded(100, [&] {
+    guarded(CallbackPlace, [&] {
         const Turn turn(held.get());
         if (turn.isLate())
             return;
@@ -139,7 +145,7 @@ void* Process_L2_Trace(vela::Thread::control* ctl, void*) {
     struct NoMoreRoom {
         ~NoMoreRoom() { arrivals.close(); }
     } const whenItEnds;
-    guarded(215, [&] { displayForEver(*ctl); });
+    guarded(DisplayThreadPlace, [&] { displayForEver(*ctl); });
     return nullptr;
 }
 

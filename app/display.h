@@ -23,7 +23,8 @@ void HANDLE_L2Trace_events(vela::CCS* ccs, unsigned int evtGroup, vela::CCS::Evt
 // The display thread's body.
 void* Process_L2_Trace(vela::Thread::control* ctl, void* arg);
 
-// Writes one record to the log. Under queueGuard.
+// Writes one record to the log. Under queueGuard. `octets` is room for the frame's, kept from record to
+// record by whoever shows them.
 void showRecord(vela::CCS::EvtL2Trace_t& rec, vela::staticList<unsigned char>& octets);
 
 // Destroys what is still queued at the end, when no thread uses the queue any more.

@@ -17,7 +17,7 @@ constexpr std::array Signals{SIGINT, SIGTERM, SIGHUP};
 constexpr int PauseMs = 10000;
 constexpr int ForEver = -1;
 
-// The handler's end and the waiter's end.
+// The pipe that ends the wait: the waiter's end, the handler's end.
 std::array<int, 2> signalled{-1, -1};
 
 std::atomic<bool> lost = false;
@@ -27,7 +27,8 @@ void wakeWaiter() {
     static_cast<void>(!write(signalled[1], &mark, 1));
 }
 
-// True when a signal came; otherwise the time is over or, if it is watched, the input can be read.
+// True when a signal came or the board was lost; otherwise the time is over or, if it is watched, the input
+// can be read.
 bool awaitSignal(int timeoutMs, int input) {
     std::array<pollfd, 2> waited{pollfd{signalled[0], POLLIN, 0}, pollfd{input, POLLIN, 0}};
     while (poll(waited.data(), waited.size(), timeoutMs) < 0 && errno == EINTR) {

@@ -1,4 +1,4 @@
-// What ends a trace: the operator's "q", or a signal.
+// What ends a trace: the operator's "q", a signal, or a board that is lost.
 #ifndef APP_OPERATOR_H
 #define APP_OPERATOR_H
 

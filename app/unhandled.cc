@@ -15,6 +15,7 @@
 #include "app/Log.h"
 #include "app/display.h"
 #include "app/guarded.h"
+#include "decoder/state.h"
 
 namespace app {
 
@@ -57,6 +58,7 @@ std::string place() {
 void closeInTime() {
     if (!queueGuard.tryLock(PatienceMs, PollMs))
         return;
+    decoder::ofp = nullptr;  // the display thread may go on until the process ends
     traceLog.close();
     queueGuard.unlock();
 }

@@ -5,7 +5,9 @@
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
+#include <iostream>
 #include <memory>
+#include <utility>
 #include <vector>
 
 #include "hostsvc/KSAbstractMsgQueue.h"
@@ -56,11 +58,13 @@ class Host {
         queue_->msgWrite(msg.getMsgRef());
     }
 
-    // The type of the next message.
+    // The type of the next message. Ends the process when there is none.
     unsigned hear() {
         NvMsg32Bit* read = nullptr;
-        if (queue_->msgRead(&read) != 0)
+        if (queue_->msgRead(&read) != 0) {
+            std::cerr << "the transport cannot be read any more" << std::endl;
             std::exit(EXIT_FAILURE);
+        }
         KSMsgRef msg(read);
         const unsigned type = msg.getMsgType();
         msg.free();

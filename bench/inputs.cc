@@ -2,8 +2,10 @@
 
 #include <algorithm>
 #include <filesystem>
+#include <utility>
 #include <vector>
 
+#include "app/protocol.h"
 #include "decoder/cursor.h"
 #include "softboard/capture.h"
 #include "softboard/settings.h"
@@ -34,9 +36,7 @@ void addCase(softboard::Frames& frames, const golden::Case& kase) {
         frame.ticks = static_cast<std::uint32_t>(frames.size());
         frame.octets = headersOf(kase.kind);
         frame.octets.insert(frame.octets.end(), octets.begin(), octets.end());
-        if (frame.octets.size() <=
-            decoder::maximumFrame)  // longer ones are refused, and say so on the screen
-            frames.push_back(std::move(frame));
+        frames.push_back(std::move(frame));
     }
 }
 
@@ -62,9 +62,10 @@ std::vector<fs::path> goldensIn(const fs::path& folder) {
 }  // namespace
 
 int variantOf(const std::string& protocol) {
-    const std::uint32_t type = softboard::parseProtocol(protocol);
-    constexpr int ni2Variant = 10;
-    return type == softboard::ni2 ? ni2Variant : static_cast<int>(type);
+    const app::Protocol* const known = app::protocolOf(softboard::parseProtocol(protocol));
+    if (known == nullptr)
+        throw softboard::BadInput(protocol + ": no protocol that is decoded");
+    return known->variant;
 }
 
 softboard::Frames readInput(const std::string& path, int variant) {
@@ -76,8 +77,10 @@ softboard::Frames readInput(const std::string& path, int variant) {
     } else if (named.extension() == ".golden") {
         addGolden(frames, named, variant);
     } else {
-        return softboard::readCapture(path);
+        frames = softboard::readCapture(path);
     }
+    std::erase_if(frames,
+                  [](const softboard::Frame& frame) { return frame.octets.size() > decoder::maximumFrame; });
     if (frames.empty())
         throw softboard::BadInput(path + ": nothing for this variant");
     return frames;

@@ -2,6 +2,8 @@
 
 #include <array>
 #include <cstddef>
+#include <string_view>
+#include <utility>
 
 #include "decoder/elements.h"
 #include "decoder/layer3.h"
@@ -11,12 +13,26 @@ namespace decoder {
 
 namespace {
 
-// The rows, each at the place of its code.
+struct MessageRow {
+    unsigned char code;
+    std::string_view name;
+};
+
+struct ElementRow {
+    unsigned char code;
+    ElementDecoder decode;
+};
+
+// The rows, each at the place of its code. Two rows of one code do not compile.
 template <typename Row, std::size_t N>
-constexpr std::array<Row, 256> byCode(const Row (&rows)[N]) {
+consteval std::array<Row, 256> byCode(const Row (&rows)[N]) {
     std::array<Row, 256> table{};
-    for (const Row& row : rows)
+    std::array<bool, 256> taken{};
+    for (const Row& row : rows) {
+        if (std::exchange(taken[row.code], true))
+            throw "the code has a row already";
         table[row.code] = row;
+    }
     return table;
 }
 
@@ -45,7 +61,7 @@ constexpr FrameName frameRows[] = {
     {0xBF, unnumbered, "Exchange Identification"},
 };
 
-constexpr MessageName messageRows[] = {
+constexpr MessageRow messageRows[] = {
     {0x01, "ALERTING"},
     {0x02, "CALL PROCEEDING"},
     {0x03, "CALL PROGRESS"},
@@ -70,7 +86,7 @@ constexpr MessageName messageRows[] = {
     {0x7D, "STATUS"},
 };
 
-constexpr MessageName maintenanceRows[] = {
+constexpr MessageRow maintenanceRows[] = {
     {0x07, "SERVICE ACKNOWLEDGE"},
     {0x0F, "SERVICE"},
 };
@@ -86,7 +102,7 @@ void changeStatusOrAdvice(unsigned char id, RingBuffer* rb) {
 // Only the identifier is consumed: length and contents are taken as further identifiers.
 void identifierOnly(unsigned char, RingBuffer*) {}
 
-constexpr ElementName elementRows[] = {
+constexpr ElementRow elementRows[] = {
     {0x01, changeStatusOrAdvice},
     {0x03, BlockChanId},
     {0x04, bearer_capability},

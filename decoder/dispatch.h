@@ -16,17 +16,7 @@ struct FrameName {
     std::string_view name;
 };
 
-struct MessageName {
-    unsigned char code;
-    std::string_view name;
-};
-
 using ElementDecoder = void (*)(unsigned char id, RingBuffer* rb);
-
-struct ElementName {
-    unsigned char code;
-    ElementDecoder decode;
-};
 
 // By the first control octet; of kind `none` when it names no supervisory or unnumbered frame.
 const FrameName& frameName(unsigned char control);

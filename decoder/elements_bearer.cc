@@ -11,6 +11,12 @@ constexpr int layer1 = 1;
 constexpr int layer2 = 2;
 constexpr int layer3 = 3;
 
+// Octet 5, taken already. Returns the layer-1 protocol.
+int layer1Octet5(Element& ie) {
+    ie.extension("  5:  ", asBit8).text("      -01----- Layer 1 Indent").bits(5, 1, " User Info. Layer 1");
+    return ie.value(5, 1);
+}
+
 void bearerOctet5a(Element& ie) {
     ie.octet(" 5a:  ", asBit8);
     if (on(dms100))
@@ -43,8 +49,7 @@ void bearerOctet5b(Element& ie, int protocol) {
 }
 
 void bearerLayer1(Element& ie) {
-    const int protocol = ie.value(5, 1);
-    ie.extension("  5:  ", asBit8).text("      -01----- Layer 1 Indent").bits(5, 1, " User Info. Layer 1");
+    const int protocol = layer1Octet5(ie);
     if (ie.more())
         bearerOctet5a(ie);
     if (!ie.left() || !on(net5))
@@ -127,8 +132,7 @@ void lowLayerOctet5b(Element& ie, int protocol) {
 
 // 5c shows the octet before it once more.
 void lowLayer1(Element& ie) {
-    const int protocol = ie.value(5, 1);
-    ie.extension("  5:  ", asBit8).text("      -01----- Layer 1 Indent").bits(5, 1, " User Info. Layer 1");
+    const int protocol = layer1Octet5(ie);
     if (!ie.more())
         return;
     ie.octet(" 5a:  ", asBit8)

@@ -1,5 +1,7 @@
 // Facilities, texts and user data (Q.931, 4.5.16, 4.5.21, 4.5.15, 4.5.30; Q.932, 8.2.3; and the switches'
 // own).
+#include <string_view>
+
 #include "decoder/element.h"
 #include "decoder/elements.h"
 

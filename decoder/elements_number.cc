@@ -6,6 +6,15 @@
 
 namespace decoder {
 
+namespace {
+
+// The octet taken last: 3a, or what is shown as 3.1.
+void presentation(Element& ie) {
+    ie.bits(7, 6, " Presentation Indicator").text("      ---000-- Spare").bits(2, 1, " Screening Indicator");
+}
+
+}  // namespace
+
 // On the trunks of the short form there is no header line, and octet 3a is shown as a digit.
 void calling_party_num(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
@@ -16,10 +25,7 @@ void calling_party_num(unsigned char id, RingBuffer* rb) {
         return;
     ie.octet("  3:  ", asBit8).bits(7, 5, " Type Of Number").bits(4, 1, " Numbering Plan ID");
     if (ie.more() && on(inFull))
-        ie.octet(" 3a:  ", fixed)
-            .bits(7, 6, " Presentation Indicator")
-            .text("      ---000-- Spare")
-            .bits(2, 1, " Screening Indicator");
+        presentation(ie.octet(" 3a:  ", fixed));
     ie.characters("  Number Digit(s)");
 }
 
@@ -62,10 +68,7 @@ void connected_number(unsigned char id, RingBuffer* rb) {
     ie.length();
     ie.octet("  3:  ", asBit8).bits(7, 5, " Type of Number").bits(4, 1, " Numbering Plan Identification");
     if (on(dms100) && ie.more())
-        ie.again("3.1:  ", fixed)
-            .bits(7, 6, " Presentation Indicator")
-            .text("      ---000-- Spare")
-            .bits(2, 1, " Screening Indicator");
+        presentation(ie.again("3.1:  ", fixed));
     ie.rest(
         [&](int i) { ie.text("  ", dec(i + 4), ":        0x", hex(ie.value(7, 1)), " Number Digit(s)"); });
 }
@@ -78,10 +81,7 @@ void original_called_num(unsigned char id, RingBuffer* rb) {
         return;
     ie.octet("  3:  ", asBit8).bits(7, 5, " Type Of Number").bits(4, 1, " Numbering Plan ID");
     if (ie.more()) {
-        ie.octet(" 3a:  ", asBit8)
-            .bits(7, 6, " Presentation Indicator")
-            .text("      ---000-- Spare")
-            .bits(2, 1, " Screening Indicator");
+        presentation(ie.octet(" 3a:  ", asBit8));
         if (ie.more()) {
             ie.octet(" 3b:  ", asBit8)
                 .text("      -000---- Spare")
@@ -107,9 +107,7 @@ void redirecting_number(unsigned char id, RingBuffer* rb) {
             ie.text(" 3a:  0-------  Extension Bit");
         else
             ie.text(" 3a:  1-------  Extension Bit");
-        ie.bits(7, 6, " Presentation Indicator")
-            .text("      ---000-- Spare")
-            .bits(2, 1, " Screening Indicator");
+        presentation(ie);
         if (ie.more())
             ie.octet(" 3b:  ", fixed).text("      -000---- Spare").bits(4, 1, " Reason For Redirect");
     }

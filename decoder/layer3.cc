@@ -1,5 +1,7 @@
 #include "decoder/layer3.h"
 
+#include <string_view>
+
 #include "decoder/dispatch.h"
 #include "decoder/element.h"
 #include "decoder/lines.h"

@@ -1,5 +1,5 @@
 // Where decoded text is composed. It goes to the log alone and never to the screen: pieces are put together
-// in memory, and flushLines hands them to the log in one write.
+// in memory, and flushLines hands them to the log in one piece.
 //
 // Text is made of literals, octets and numbers; nothing is parsed while the program runs:
 //
@@ -145,7 +145,7 @@ constexpr std::size_t sizeOf(HexUnpadded) { return 2; }
 constexpr std::size_t sizeOf(HexBlankPadded) { return 2; }
 template <std::integral Number>
 constexpr std::size_t sizeOf(Decimal<Number>) {
-    return 3 * sizeof(Number);
+    return 3 * sizeof(Number) + 1;
 }
 template <std::same_as<char> Character>  // not whatever converts to one
 constexpr std::size_t sizeOf(Character) {

@@ -1,6 +1,5 @@
 #include "hostsvc/KSByteOrder.h"
 
-#include <cstddef>
 #include <cstdint>
 #include <cstring>
 

@@ -3,7 +3,6 @@
 #define HOSTSVC_KSTHREAD_H
 
 #include <atomic>
-#include <cstdint>
 
 #include "hostsvc/KSException.h"
 #include "hostsvc/KSMutex.h"

@@ -1,7 +1,6 @@
 #include "hostsvc/hostnames.h"
 
 #include <netdb.h>
-#include <netinet/in.h>
 
 #include <array>
 #include <cerrno>

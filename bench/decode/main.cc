@@ -5,7 +5,9 @@
 //     bench-decode [--variant V] CAPTURE REPEAT LOG
 //
 // CAPTURE is a capture file, or the decoder's golden files; V a name as of the software board's --protocol.
-// Both ways are gone five times in turn, and the medians shown. The log stays.
+// All ways are gone five times in turn, and the medians shown: fwrite has a round of CAPTURE at a time, and
+// then blocks as large as the log's own. What stays in LOG is what fwrite wrote: the first round of CAPTURE,
+// REPEAT times. A LOG that keeps nothing, like /dev/null, is compared with nothing.
 #include <algorithm>
 #include <array>
 #include <cerrno>
@@ -14,6 +16,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <exception>
+#include <filesystem>
 #include <fstream>
 #include <iomanip>
 #include <iostream>
@@ -23,6 +26,7 @@
 
 #include "app/Log.h"
 #include "app/display.h"
+#include "bench/arguments.h"
 #include "bench/inputs.h"
 #include "decoder/lines.h"
 #include "decoder/state.h"
@@ -51,8 +55,9 @@ Arguments parse(std::vector<std::string> words) {
         arguments.variant = words[1];
         words.erase(words.begin(), words.begin() + 2);
     }
+    constexpr unsigned long most = 1000000000;
     if (words.size() == 3)
-        arguments.repeat = std::strtoul(words[1].c_str(), nullptr, 10);
+        arguments.repeat = bench::numberIn(words[1], 1UL, most).value_or(0);
     if (arguments.repeat == 0)
         fail("syntax: bench-decode [--variant V] CAPTURE REPEAT LOG");
     arguments.capture = words[0];
@@ -103,22 +108,26 @@ double decode(std::vector<Record>& records, const Arguments& arguments) {
     return seconds;
 }
 
-// One round of the capture at a time, as the first round of the log has it.
-double copy(const std::string& round, const Arguments& arguments) {
+// The first round of the log again and again, in pieces.
+double copy(const std::string& round, std::size_t piece, const Arguments& arguments) {
     std::FILE* const log = std::fopen(arguments.log.c_str(), "w");
     if (log == nullptr)
         failAt(arguments.log);
     return timed([&] {
-        for (unsigned long i = 0; i < arguments.repeat; ++i)
-            (void)std::fwrite(round.data(), 1, round.size(), log);
+        for (unsigned long i = 0; i < arguments.repeat; ++i) {
+            for (std::size_t at = 0; at < round.size(); at += piece)
+                (void)std::fwrite(round.data() + at, 1, std::min(piece, round.size() - at), log);
+        }
         const bool bad = std::ferror(log) != 0;
         if (std::fclose(log) != 0 || bad)
             failAt(arguments.log);
     });
 }
 
-// All rounds are of one length: they differ in the time of day alone.
+// All rounds are of one length: they differ in the time of day alone. Empty when the log keeps nothing.
 std::string firstRound(const Arguments& arguments) {
+    if (!std::filesystem::is_regular_file(arguments.log))
+        return {};
     std::ifstream log(arguments.log, std::ios::binary | std::ios::ate);
     std::string text(static_cast<std::size_t>(log.tellg()) / arguments.repeat, '\0');
     log.seekg(0);
@@ -127,9 +136,34 @@ std::string firstRound(const Arguments& arguments) {
     return text;
 }
 
-double median(std::array<double, passes> values) {
+using Seconds = std::array<double, passes>;
+
+double median(Seconds values) {
     std::sort(values.begin(), values.end());
     return values[passes / 2];
+}
+
+// Of each pass.
+struct Times {
+    Seconds decoding{};
+    Seconds copying{};
+    Seconds copyingBlocks{};
+};
+
+void show(double frames, double megabytes, const Times& times) {
+    const double decoding = median(times.decoding);
+    const auto share = [&](const char* of, double copying) {
+        std::cout << ", " << 100 * copying / decoding << " % of what " << of << " (" << megabytes / copying
+                  << " MB/s)";
+    };
+    std::cout << std::fixed << std::setprecision(0) << frames / decoding << " frames/s";
+    if (megabytes > 0) {
+        std::cout << ", " << megabytes / decoding << " MB/s of text (" << megabytes << " MB, "
+                  << megabytes * 1e6 / frames << " octets a frame)";
+        share("fwrite writes", median(times.copying));
+        share("it writes in blocks of 4 kB", median(times.copyingBlocks));
+    }
+    std::cout << std::endl;
 }
 
 void measure(const Arguments& arguments) {
@@ -138,20 +172,19 @@ void measure(const Arguments& arguments) {
     decoder::swit = variant;
     decoder::file_output = true;
 
-    std::array<double, passes> decoding{};
-    std::array<double, passes> copying{};
+    Times times;
     std::string round;
     for (int i = 0; i < passes; ++i) {
-        decoding[i] = decode(records, arguments);
+        times.decoding[i] = decode(records, arguments);
         round = firstRound(arguments);
-        copying[i] = copy(round, arguments);
+        if (!round.empty()) {
+            times.copying[i] = copy(round, round.size(), arguments);
+            times.copyingBlocks[i] = copy(round, app::Log::BlockSize, arguments);
+        }
     }
     const double frames = static_cast<double>(records.size() * arguments.repeat);
     const double megabytes = static_cast<double>(round.size() * arguments.repeat) / 1e6;
-    std::cout << std::fixed << std::setprecision(0) << frames / median(decoding) << " frames/s, "
-              << megabytes / median(decoding) << " MB/s of text (" << megabytes * 1e6 / frames
-              << " octets a frame), " << 100 * median(copying) / median(decoding)
-              << " % of what fwrite writes (" << megabytes / median(copying) << " MB/s)" << std::endl;
+    show(frames, megabytes, times);
 }
 
 }  // namespace

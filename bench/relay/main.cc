@@ -14,8 +14,10 @@
 #include <memory>
 #include <string>
 #include <thread>
+#include <utility>
 #include <vector>
 
+#include "bench/arguments.h"
 #include "bench/host.h"
 #include "hostsvc/KSLocalMsgQueue.h"
 #include "hostsvc/KSRemoteMsgQueue.h"
@@ -91,7 +93,11 @@ void print(const char* way, const Figures& figures) {
 }  // namespace
 
 int main(int argc, char** argv) {
-    const double seconds = argc > 1 ? std::strtod(argv[1], nullptr) : 2;
+    const double seconds = argc > 1 ? bench::numberIn(argv[1], 0.01, 3600.0).value_or(0) : 2;
+    if (seconds == 0 || argc > 2) {
+        std::cerr << "syntax: bench-relay [SECONDS], 0.01 to 3600" << std::endl;
+        return EXIT_FAILURE;
+    }
     nvDrvSetInterface(0, 0);
     const Figures local = measure(std::make_unique<KSLocalMsgQueue>(NvCompDesc{}, 512, 50), seconds);
     const BackgroundRelay relay;

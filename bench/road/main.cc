@@ -5,7 +5,7 @@
 //
 // First as fast as the board can, until FRAMES are in the log (200000); then for SECONDS (5) at the rate of a
 // D channel that is full in both directions. A time ends when the header line can be read from the log, which
-// the stream's buffer keeps back until it is full. The processor's time includes the software board's; how
+// is written when there are 4 kB of it. The processor's time includes the software board's; how
 // much of it is spent before lapdmon has done anything is shown by programs that read the events alone.
 #include <algorithm>
 #include <cstdlib>
@@ -13,7 +13,9 @@
 #include <iomanip>
 #include <iostream>
 #include <string>
+#include <vector>
 
+#include "bench/arguments.h"
 #include "bench/road/reading.h"
 #include "bench/road/run.h"
 #include "bench/road/traced.h"
@@ -48,21 +50,35 @@ bool show(const std::string& what, bench::Run run) {
 }
 
 // What the board, and a thread for each event, cost at line rate. False when they could not be run.
-bool showLeast(const std::string& what, double seconds, const char* threads) {
-    const double used = bench::runReading(std::to_string(lineRate), seconds, threads);
+bool showLeast(const std::string& what, double seconds, bool threadForEach) {
+    const double used = bench::runReading(std::to_string(lineRate), seconds, threadForEach);
+    if (!(used > 0)) {
+        std::cout << what << ": could not be run" << std::endl;
+        return false;
+    }
     std::cout << what << ": " << std::setprecision(1) << used << " us of CPU a frame ("
               << used * lineRate / 1e4 << " % of a core)" << std::endl;
-    return used > 0;
+    return true;
 }
 
+// Fewer frames than these may all be in the first piece of the log that is read: then there is no time
+// between the first and the last.
+constexpr std::uint64_t fewest = 1000;
+constexpr double shortest = 0.1;
+
 int measure(int argc, char** argv) {
-    const std::uint64_t frames = argc > 1 ? std::strtoull(argv[1], nullptr, 10) : 200000;
-    const double seconds = argc > 2 ? std::strtod(argv[2], nullptr) : 5;
-    const bool fast = show("as fast as it goes", bench::runRoad("max", frames));
+    const auto frames = argc > 1 ? bench::numberIn<std::uint64_t>(argv[1], fewest, 100000000) : 200000;
+    const auto seconds = argc > 2 ? bench::numberIn<double>(argv[2], shortest, 3600) : 5;
+    if (!frames || !seconds || argc > 3) {
+        std::cerr << "syntax: bench-road [FRAMES [SECONDS]], at least " << fewest << " and " << shortest
+                  << std::endl;
+        return EXIT_FAILURE;
+    }
+    const bool fast = show("as fast as it goes", bench::runRoad("max", *frames));
     const bool paced = show("at line rate", bench::runRoad(std::to_string(lineRate),
-                                                           static_cast<std::uint64_t>(seconds * lineRate)));
-    const bool board = showLeast("  of which the board and the reading", seconds, "0");
-    const bool threads = showLeast("  the same and an idle thread an event", seconds, "1");
+                                                           static_cast<std::uint64_t>(*seconds * lineRate)));
+    const bool board = showLeast("  of which the board and the reading", *seconds, false);
+    const bool threads = showLeast("  the same and an idle thread an event", *seconds, true);
     return fast && paced && board && threads ? EXIT_SUCCESS : EXIT_FAILURE;
 }
 
@@ -70,9 +86,11 @@ int measure(int argc, char** argv) {
 
 int main(int argc, char** argv) {
     if (argc == 4 && argv[1] == std::string("--traced"))
-        return bench::runTraced(std::atoi(argv[2]), argv[3]);
+        return bench::runTraced(bench::numberIn(argv[2], 0, 1 << 20).value_or(-1), argv[3]);
     if (argc == 4 && argv[1] == std::string("--reading")) {
-        std::cout << bench::readEvents(std::atof(argv[2]), argv[3] == std::string("1")) << std::endl;
+        std::cout << bench::readEvents(bench::numberIn(argv[2], 0.0, 3600.0).value_or(0),
+                                       argv[3] == std::string("1"))
+                  << std::endl;
         return EXIT_SUCCESS;
     }
     try {

@@ -97,14 +97,8 @@ class SharedStamps {
     const Stamps* stamps_ = nullptr;
 };
 
-// This program on the software board, as the shell runs it.
-std::string onTheBoard(const std::string& rate, const std::string& mode, const std::string& first,
-                       const std::string& second) {
-    const fs::path self = fs::read_symlink("/proc/self/exe");
-    const std::string board = self.parent_path() / "softboard";
-    return "exec '" + board + "' --loop --rate " + rate + " -- '" + self.string() + "' " + mode + " " +
-           first + " '" + second + "'";
-}
+std::string thisProgram() { return fs::read_symlink("/proc/self/exe"); }
+std::string softwareBoard() { return fs::path(thisProgram()).parent_path() / "softboard"; }
 
 // The program that is measured, with a pipe for its standard input and its screen thrown away.
 class Traced {
@@ -165,8 +159,8 @@ class Traced {
   private:
     [[noreturn]] static void become(const std::string& rate, const std::string& stamps,
                                     const std::string& log, int input) {
-        const std::string self = fs::read_symlink("/proc/self/exe");
-        const std::string board = fs::path(self).parent_path() / "softboard";
+        const std::string self = thisProgram();
+        const std::string board = softwareBoard();
         dup2(input, STDIN_FILENO);
         dup2(open("/dev/null", O_WRONLY), STDOUT_FILENO);
         execl(board.c_str(), board.c_str(), "--loop", "--rate", rate.c_str(), "--", self.c_str(), "--traced",
@@ -212,7 +206,7 @@ class Measurement {
     void account(std::uint64_t headers, std::int64_t now) {
         for (; headers > 0 && logged_ < wanted_; --headers, ++logged_)
             run_.latencies.push_back(static_cast<double>(now - stamps_.get().of(logged_)) / 1e3);
-        if (logged_ == 0 || run_.frames > 0)
+        if (logged_ == 0 || finished_)
             return;
         if (start_ == 0)
             begin(now);
@@ -235,6 +229,7 @@ class Measurement {
     }
 
     void finish(std::int64_t now) {
+        finished_ = true;
         run_.seconds = static_cast<double>(now - start_) / 1e9;
         run_.cpuSeconds = traced_.cpuSeconds() - startCpu_;
         run_.frames = logged_ - firstFrames_;
@@ -256,14 +251,17 @@ class Measurement {
     std::int64_t lastLook_ = 0;
     double startCpu_ = 0;
     std::uint64_t firstFrames_ = 0;
+    bool finished_ = false;
 };
 
 }  // namespace
 
 Run runRoad(const std::string& rate, std::uint64_t frames) { return Measurement(rate, frames).measure(); }
 
-double runReading(const std::string& rate, double seconds, const std::string& threads) {
-    const std::string command = onTheBoard(rate, "--reading", std::to_string(seconds), threads);
+double runReading(const std::string& rate, double seconds, bool threadForEach) {
+    const std::string command = "exec '" + softwareBoard() + "' --loop --rate " + rate + " -- '" +
+                                thisProgram() + "' --reading " + std::to_string(seconds) +
+                                (threadForEach ? " 1" : " 0");
     double used = 0;
     FILE* const output = popen(command.c_str(), "r");
     if (output == nullptr)

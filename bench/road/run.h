@@ -14,11 +14,11 @@ struct Run {
     double seconds = 0;        // from the first frame in the log to the last one wanted
     double cpuSeconds = 0;     // of the process in that time, the software board included
     std::uint64_t frames = 0;  // in that time
-    std::vector<double>
-        latencies;  // of each frame, from nvMsgRead to its header line in the log; microseconds
+    // Of each frame, from nvMsgRead to its header line in the log; microseconds.
+    std::vector<double> latencies;
     long mostThreads = 0;
-    long peakKilobytes = 0;
-    int status = 0;  // of the process
+    long peakKilobytes = 0;  // resident
+    int status = 0;          // of the process
     Checked checked;
 };
 
@@ -27,7 +27,7 @@ struct Run {
 Run runRoad(const std::string& rate, std::uint64_t frames);
 
 // readEvents of reading.h in a process of its own at the board's rate: microseconds, 0 when it failed.
-double runReading(const std::string& rate, double seconds, const std::string& threads);
+double runReading(const std::string& rate, double seconds, bool threadForEach);
 
 }  // namespace bench
 

@@ -8,6 +8,7 @@
 #include <sstream>
 #include <string>
 
+#include "decoder/lines.h"
 #include "decoder/state.h"
 
 namespace app::testing {
@@ -33,6 +34,7 @@ class Log {
   public:
     Log() : stream_(open_memstream(&data_, &size_)) {
         decoder::ofp = stream_;
+        decoder::writeLog = decoder::writeToStream;  // whatever log a test before this one has left
         decoder::file_output = true;
     }
     ~Log() {
