@@ -24,7 +24,7 @@ SOFTBOARD = os.environ["SOFTBOARD"]
 OTHER_LIBRARY = os.environ["OTHER_LIBRARY"]
 
 SANITIZERS = {
-    "ASAN_OPTIONS": "exitcode=99",
+    "ASAN_OPTIONS": "exitcode=99:verify_asan_link_order=0",  # a test may load a library before it
     "UBSAN_OPTIONS": "exitcode=99:print_stacktrace=1",
     "TSAN_OPTIONS": "exitcode=99:report_mutex_bugs=0:halt_on_error=1",
 }
@@ -141,10 +141,24 @@ class Fifo:
         return self.stream.text()
 
 
+def wait_until_full(reader):
+    """Until a pipe holds so much that who writes small pieces has to wait."""
+    end = time.monotonic() + LIMIT
+    while struct.unpack("i", fcntl.ioctl(reader, termios.FIONREAD, bytes(4)))[0] < 45000:
+        if time.monotonic() > end:
+            raise AssertionError("the pipe is never full")
+        time.sleep(0.005)
+
+
 class Program:
     """A running program."""
 
-    def __init__(self, test, words, env, cwd, fifos):
+    @property
+    def threads(self):
+        status = (pathlib.Path("/proc") / str(self.pid) / "status").read_text()
+        return int(re.search(r"^Threads:\s+(\d+)", status, re.M)[1])
+
+    def __init__(self, test, words, env, cwd, fifos, descriptors=()):
         self._test = test
         self._fifos = fifos
         self._folder = pathlib.Path(cwd)
@@ -152,7 +166,7 @@ class Program:
         self._unread = os.dup(stdin)
         try:
             self._process = subprocess.Popen(words, stdin=stdin, stdout=subprocess.PIPE, stderr=subprocess.PIPE,
-                                             env=env, cwd=cwd)
+                                             env=env, cwd=cwd, pass_fds=descriptors)
         finally:
             os.close(stdin)
         self.screen = Stream(self._process.stdout)
@@ -262,8 +276,9 @@ class SystemTest(unittest.TestCase):
         fifos[key] = Fifo(path)
         return str(path)
 
-    def start(self, words, fifos=None, cwd=None, **variables):
-        program = Program(self, words, environment(**variables), cwd or self.folder, fifos or {})
+    def start(self, words, fifos=None, cwd=None, switch=None, **variables):
+        descriptors = () if switch is None else (switch.descriptor,)
+        program = Program(self, words, environment(**variables), cwd or self.folder, fifos or {}, descriptors)
         self.addCleanup(program.kill)
         return program
 
@@ -272,8 +287,9 @@ class SystemTest(unittest.TestCase):
         path.write_bytes(content if isinstance(content, bytes) else content.encode())
         return str(path)
 
-    def on_board(self, *board, run=("lapdmon", "-b1"), frames=None, cwd=None, log_fifo=False):
-        """A program on the software board, with the board's options and the frames it plays."""
+    def on_board(self, *board, run=("lapdmon", "-b1"), frames=None, cwd=None, log_fifo=False, switch=None):
+        """A program on the software board, with the board's options and the frames it plays; a FaultSwitch is loaded
+        into it."""
         fifos = {}
         words = [SOFTBOARD, "--journal", self.fifo(fifos, "journal", "journal"), *board]
         if frames is not None:
@@ -281,7 +297,12 @@ class SystemTest(unittest.TestCase):
         run = list(run)
         if log_fifo:
             run += ["-f", self.fifo(fifos, "log", "log")]
-        return self.start(words + ["--", *run], fifos, cwd)
+        if switch is None:
+            return self.start(words + ["--", *run], fifos, cwd)
+        self.addCleanup(switch.close)
+        program = self.start(words + ["--", *switch.words, *run], fifos, cwd, switch, **switch.variables)
+        switch.given()
+        return program
 
     def traces(self, *board, **more):
         """As on_board, with a capture that is one mark; returns when the trace runs."""

@@ -1,16 +1,12 @@
 """Standard streams that are closed, or that nobody reads."""
 
-import fcntl
 import os
-import pathlib
 import re
-import struct
-import termios
 import time
 import unittest
 from signal import SIGTERM
 
-from harness import BANNER, LAPDMON, LIMIT, MARK, RECEIVED, SystemTest, capture
+from harness import BANNER, LAPDMON, MARK, RECEIVED, SystemTest, capture, wait_until_full
 from order import MOST_THREADS
 
 FRAMES = [(RECEIVED, bytes((2, 1, 1, i % 251))) for i in range(250)]
@@ -50,10 +46,6 @@ class StalledStandardError(SystemTest):
 
     MANY = 1000
 
-    def threads(self, program):
-        status = (pathlib.Path("/proc") / str(program.pid) / "status").read_text()
-        return int(re.search(r"^Threads:\s+(\d+)", status, re.M)[1])
-
     def test_events_to_be_reported_wait_with_the_transport_and_make_no_threads(self):
         path = self.folder / "stopped"
         os.mkfifo(path)
@@ -65,10 +57,10 @@ class StalledStandardError(SystemTest):
         program = self.on_board("--scenario", scenario, "--fault", f"burst={self.MANY}",
                                 run=("sh", "-c", 'exec "$0" -b1 2>stopped', LAPDMON))
         program.journal.wait(" EvtDetected ", times=self.MANY)
-        self.wait_until_stalled(reader)
+        wait_until_full(reader)
         most = 0
         for _ in range(30):  # a thread for each event would be made meanwhile
-            most = max(most, self.threads(program))
+            most = max(most, program.threads)
             time.sleep(0.01)
         self.assertLessEqual(most, MOST_THREADS)
         os.set_blocking(reader, True)
@@ -81,12 +73,6 @@ class StalledStandardError(SystemTest):
         program.ends()
         self.assertEqual(text.count("Unregisterd "), self.MANY)
         self.assertEqual(program.journal.lines()[-1], BALANCE)
-
-    def wait_until_stalled(self, reader):
-        end = time.monotonic() + LIMIT
-        while struct.unpack("i", fcntl.ioctl(reader, termios.FIONREAD, bytes(4)))[0] < 45000:
-            self.assertLess(time.monotonic(), end)
-            time.sleep(0.01)
 
 
 if __name__ == "__main__":

@@ -15,7 +15,6 @@ import random
 import re
 import select
 import signal
-import socket
 import struct
 import subprocess
 import sys
@@ -23,6 +22,7 @@ import tempfile
 import threading
 import time
 
+from fault_switch import LIBRARY, FaultSwitch
 from order import LINE_RATE, MOST_THREADS, PAUSE, number_of
 
 ROUND = 20000        # frames in the capture, which is played again and again
@@ -121,15 +121,14 @@ class Program:
         os.mkfifo(log)
         self._log = os.open(log, os.O_RDONLY | os.O_NONBLOCK)
         self._held_open = os.open(log, os.O_WRONLY)
-        self._switch, theirs = socket.socketpair()
-        self._switch.settimeout(LIMIT)
+        self._switch = FaultSwitch(LIMIT, options.fault_switch)
         asan = os.environ.get("ASAN_OPTIONS", "") + ":verify_asan_link_order=0"
         self._process = subprocess.Popen(
             [options.softboard, "--rate", str(options.rate), "--loop", "--frames", str(folder / "numbered.pcap"), "--",
-             "env", "LD_PRELOAD=" + options.fault_switch, options.lapdmon, "-b1", "-f", str(log)],
-            stdin=subprocess.PIPE, stdout=subprocess.DEVNULL, stderr=subprocess.PIPE, pass_fds=[theirs.fileno()],
-            env={**os.environ, "FAULT_SWITCH": str(theirs.fileno()), "ASAN_OPTIONS": asan})
-        theirs.close()
+             *self._switch.words, options.lapdmon, "-b1", "-f", str(log)],
+            stdin=subprocess.PIPE, stdout=subprocess.DEVNULL, stderr=subprocess.PIPE, pass_fds=[self._switch.descriptor],
+            env={**os.environ, **self._switch.variables, "ASAN_OPTIONS": asan})
+        self._switch.given()
         self.pid = self._process.pid
         self.said = []
         self._listener = threading.Thread(target=self._listen, daemon=True)
@@ -151,23 +150,16 @@ class Program:
             self._held_open = None
         return some
 
-    def _ask(self, line):
-        self._switch.sendall(line.encode() + b"\n")
-        answer = b""
-        while not answer.endswith(b"\n"):
-            answer += self._switch.recv(100) or b"?\n"
-        return answer.decode().strip()
-
     def set_faults(self, faults):
-        self._ask("faults " + " ".join(faults))
+        self._switch.ask("faults " + " ".join(faults))
 
     def calm_sample(self):
         """The board's journal, which grows at first, is none of the program's memory."""
-        self._ask("settle")
+        self._switch.ask("settle")
         return self.sample()
 
     def sample(self):
-        return Sample(self.pid, int(self._ask("held")), int(self._ask("used")))
+        return Sample(self.pid, self._switch.held(), int(self._switch.ask("used")))
 
     def pause(self, seconds):
         os.kill(self.pid, signal.SIGSTOP)
@@ -341,7 +333,7 @@ def main(arguments):
     parser.add_argument("--stall", type=float, default=3, help="seconds for which the log is not read, at most")
     parser.add_argument("--lapdmon", default=os.environ.get("LAPDMON"))
     parser.add_argument("--softboard", default=os.environ.get("SOFTBOARD"))
-    parser.add_argument("--fault-switch", default=os.environ.get("FAULT_SWITCH_LIBRARY"))
+    parser.add_argument("--fault-switch", default=LIBRARY)
     options = parser.parse_args(arguments)
     print(f"seed {options.seed}", flush=True)
     with tempfile.TemporaryDirectory(prefix="soak-") as folder:
