@@ -27,7 +27,7 @@ class Log {
     std::FILE* open(const char* name);
     // The next entry is a frame, which comes in so many writes.
     void frameFollows(unsigned int writes = 1) { writesOfFrame_ = writes; }
-    void write(std::string_view text);
+    void write(std::string_view text);  // while it is open
     // Writes what is held. After a write that failed, says how many frames are missing. Nothing the second
     // time.
     void close();

@@ -105,7 +105,7 @@ void startTrace(std::unique_ptr<vela::CCS> opened) {
 }
 
 // The exit status.
-int awaitEnd() {
+int untilEnded() {
     if (awaitQuit() == Ending::Asked)
         return EXIT_SUCCESS;
     std::cerr << "lapdmon: the board cannot be reached any more, the trace ends\n" << std::flush;
@@ -133,7 +133,7 @@ int trace(int argc, char** argv) {
     if (!setProtocol(reply.Val))
         return EXIT_FAILURE;  // nothing has been switched on yet
     startTrace(std::move(opened));
-    return awaitEnd();
+    return untilEnded();
 }
 
 // Whether every frame is in the log. Says how many found no thread or no memory; the log says of itself what
