@@ -4,9 +4,11 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <iostream>
+#include <iterator>
 #include <utility>
 
 namespace app {
@@ -49,28 +51,35 @@ void Log::write(std::string_view text) {
         --writesOfFrame_;
         return;
     }
-    entries_.push_back({held_.size(), std::exchange(writesOfFrame_, 0) == 1});
+    entries_.push_back({held_.size(), std::exchange(writesOfFrame_, 0) == 1, false});
     if (held_.size() >= BlockSize)
         writeOut();
 }
 
-// What has to come before the text that is held.
-std::string Log::makeHead() const {
-    return gap_ == 0 ? rest_ : rest_ + "Frames Lost: " + std::to_string(gap_) + " \n";
-}
-
-void Log::writeOut() {
-    const std::string head = makeHead();
+// Puts before what is held what has to come first. Returns its length.
+std::size_t Log::putHead() {
+    std::string head = std::exchange(rest_, {});
+    std::vector<Entry> first;
+    if (!head.empty())
+        first.push_back({head.size(), restIsFrame_, true});
+    if (gap_ != 0) {
+        head += "Frames Lost: " + std::to_string(gap_) + " \n";
+        first.push_back({head.size(), false, false});
+    }
     held_.insert(0, head);
     for (Entry& entry : entries_)
         entry.end += head.size();
+    entries_.insert(entries_.begin(), first.begin(), first.end());
+    return head.size();
+}
+
+void Log::writeOut() {
+    const std::size_t headSize = putHead();
     const std::size_t written = writeAll(fileno(stream_), held_);
-    if (written < held_.size()) {
-        writeFailed(head.size(), written, errno);
-    } else {
-        rest_.clear();
+    if (written < held_.size())
+        writeFailed(headSize, written, errno);
+    else
         gap_ = 0;
-    }
     held_.clear();
     entries_.clear();
 }
@@ -79,36 +88,25 @@ void Log::writeFailed(std::size_t headSize, std::size_t written, int reason) {
     complain(reason);
     // What squeezes in behind a gap, before a disk is full again, is not worth a line that says how much.
     const bool again = gap_ != 0 && takeBack(written);
-    const std::size_t kept = again ? 0 : settle(headSize, written);
+    const std::size_t kept = again ? 0 : settle(written);
     if (kept >= headSize)
         gap_ = 0;
     countLost(kept);
 }
 
-// Leaves whole entries in the file: takes back what is there of an entry, or keeps what is missing of it for
-// later. Returns how much of what is held is in the file or will be.
-std::size_t Log::settle(std::size_t headSize, std::size_t written) {
-    std::size_t before = 0;
-    std::size_t after = rest_.size();
-    bool isFrame = restIsFrame_;
-    const auto pass = [&](std::size_t end, bool frame) {
-        if (after >= written)
-            return;
-        before = after;
-        after = end;
-        isFrame = frame;
-    };
-    pass(headSize, false);
-    for (const Entry& entry : entries_)
-        pass(entry.end, entry.isFrame);
-    const bool restLeft = written < rest_.size();
-    if (written == after || (!restLeft && takeBack(written - before))) {
-        rest_.clear();
-        return written == after ? after : before;
-    }
-    rest_ = held_.substr(written, after - written);
-    restIsFrame_ = isFrame;
-    return after;
+// Leaves whole entries in the file: takes back what is there of the entry in which a write has ended, or
+// keeps what is missing of it for later. Returns how much of what is held is in the file or will be.
+std::size_t Log::settle(std::size_t written) {
+    const auto cut = std::find_if(entries_.begin(), entries_.end(),
+                                  [written](const Entry& entry) { return written <= entry.end; });
+    if (written == cut->end)
+        return written;
+    const std::size_t begin = cut == entries_.begin() ? 0 : std::prev(cut)->end;
+    if (!cut->isBegun && (written == begin || takeBack(written - begin)))
+        return begin;
+    rest_ = held_.substr(written, cut->end - written);
+    restIsFrame_ = cut->isFrame;
+    return cut->end;
 }
 
 // Shortens the file, if it is one that can be.

@@ -40,12 +40,13 @@ class Log {
     struct Entry {
         std::size_t end;  // in held_
         bool isFrame;
+        bool isBegun;  // its beginning is in the file
     };
 
     void writeOut();
-    std::string makeHead() const;
+    std::size_t putHead();
     void writeFailed(std::size_t headSize, std::size_t written, int reason);
-    std::size_t settle(std::size_t headSize, std::size_t written);
+    std::size_t settle(std::size_t written);
     bool takeBack(std::size_t octets) const;
     void countLost(std::size_t kept);
     void complain(int reason);
