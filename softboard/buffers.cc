@@ -11,6 +11,7 @@ namespace softboard {
 namespace {
 
 constexpr size_t remembered = 256;
+constexpr size_t fewBuckets = 4096;
 constexpr auto freedOctet = std::byte{0xdd};
 
 // The address sanitizer keeps freed memory back by itself, and reports whoever touches it.
@@ -118,6 +119,9 @@ void Buffers::retire(Entries::const_iterator entry) {
     freed_.emplace_back(node.key(), std::move(memory));
     if (freed_.size() > remembered) {
         freed_.pop_front();
+    }
+    if (live_.bucket_count() > fewBuckets && live_.size() < live_.bucket_count() / 64) {
+        live_.rehash(0);  // a backlog's table goes with it
     }
     fewer_.notify_all();
 }
