@@ -24,6 +24,13 @@ using Frames = std::vector<Frame>;
 struct Rate {
     enum class Kind { recorded, perSecond, max };
 
+    // In frames a second; outside of them time would overflow.
+    static constexpr double slowest = 1e-6;
+    static constexpr double fastest = 1e6;
+    static constexpr bool isPossible(double perSecond) {
+        return slowest <= perSecond && perSecond <= fastest;
+    }
+
     Kind kind = Kind::recorded;
     double perSecond = 0;
 

@@ -1,5 +1,7 @@
+#include <limits>
 #include <nlohmann/json.hpp>
 #include <stdexcept>
+#include <string>
 
 #include "softboard/hex.h"
 #include "softboard/scenario.h"
@@ -18,12 +20,23 @@ std::string pathFromHex(const std::string& text) {
     return {octets.begin(), octets.end()};
 }
 
+// Whole and in range; the JSON library would convert whatever is there.
+template <typename Number>
+Number numberFrom(const json& from) {
+    constexpr uint64_t most = std::numeric_limits<Number>::max();
+    if (!from.is_number_unsigned() || from.get<uint64_t>() > most) {
+        throw std::runtime_error("not a number from 0 to " + std::to_string(most) + ": " + from.dump());
+    }
+    return from.get<Number>();
+}
+
 json toJson(const Frame& frame) {
     return {{"transmitted", frame.transmitted}, {"ticks", frame.ticks}, {"octets", hex(frame.octets)}};
 }
 
 Frame frameFrom(const json& from) {
-    return {from.at("transmitted"), from.at("ticks"), fromHex(from.at("octets").get<std::string>())};
+    return {from.at("transmitted"), numberFrom<uint32_t>(from.at("ticks")),
+            fromHex(from.at("octets").get<std::string>())};
 }
 
 json toJson(const DChannel& channel) {
@@ -37,15 +50,24 @@ json toJson(const DChannel& channel) {
             {"capture", channel.capture}};
 }
 
+Rate rateFrom(const json& from) {
+    const auto kind = static_cast<Rate::Kind>(numberFrom<uint8_t>(from.at("rate")));
+    const double perSecond = from.at("perSecond");
+    if (kind > Rate::Kind::max || (kind == Rate::Kind::perSecond && !Rate::isPossible(perSecond))) {
+        throw std::runtime_error("a D channel has no possible rate");
+    }
+    return {kind, perSecond};
+}
+
 DChannel channelFrom(const json& from) {
     DChannel channel;
-    channel.board = from.at("board");
-    channel.number = from.at("number");
-    channel.protocol = from.at("protocol");
-    channel.rate = {static_cast<Rate::Kind>(from.at("rate").get<int>()), from.at("perSecond")};
+    channel.board = numberFrom<uint8_t>(from.at("board"));
+    channel.number = numberFrom<uint16_t>(from.at("number"));
+    channel.protocol = numberFrom<uint32_t>(from.at("protocol"));
+    channel.rate = rateFrom(from);
     channel.loop = from.at("loop");
-    channel.label = from.at("label");
-    channel.capture = from.at("capture");
+    channel.label = numberFrom<uint32_t>(from.at("label"));
+    channel.capture = numberFrom<size_t>(from.at("capture"));
     return channel;
 }
 

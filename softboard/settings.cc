@@ -105,9 +105,8 @@ uint32_t parseProtocol(const std::string& text) {
 }
 
 Rate framesPerSecond(double rate) {
-    constexpr double fastest = 1e6;
-    if (!(rate > 0 && rate <= fastest)) {
-        throw BadInput("frames per second must be above 0 and at most 1000000");
+    if (!Rate::isPossible(rate)) {
+        throw BadInput("frames per second must be at least 0.000001 and at most 1000000");
     }
     return {Rate::Kind::perSecond, rate};
 }

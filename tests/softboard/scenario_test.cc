@@ -53,9 +53,9 @@ TEST(SettingsTest, ARateIsRecordedMaxOrFramesPerSecond) {
         EXPECT_EQ(complaint([&] { parseRate(text); }),
                   "\"" + std::string(text) + "\" is neither recorded, max nor a number of frames per second");
     }
-    for (const char* text : {"0", "-3", "nan", "inf", "1000001"}) {
+    for (const char* text : {"0", "-3", "nan", "inf", "1e-7", "1000001"}) {
         EXPECT_EQ(complaint([&] { parseRate(text); }),
-                  "frames per second must be above 0 and at most 1000000")
+                  "frames per second must be at least 0.000001 and at most 1000000")
             << text;
     }
 }
@@ -154,7 +154,7 @@ TEST(ScenarioTest, ABadFileIsRefusedWithItsPlaceAndTheReason) {
         {"dchannels = 0\n", ":1: dchannels: must be a number from 1 to 255"},
         {"rate = \"fast\"\n",
          ":1: rate: \"fast\" is neither recorded, max nor a number of frames per second"},
-        {"rate = 0\n", ":1: rate: frames per second must be above 0 and at most 1000000"},
+        {"rate = 0\n", ":1: rate: frames per second must be at least 0.000001 and at most 1000000"},
         {"rate = true\n", ":1: rate: must be a name or a number"},
         {"protocol = -1\n", ":1: protocol: must be a name or a number"},
         {"protocol = \"q\"\n",
@@ -222,6 +222,29 @@ TEST(HandoverTest, WhatIsNoScenarioIsRefused) {
     Scenario scenario = oneChannel({});
     scenario.captures.clear();
     EXPECT_THROW(fromJson(toJson(scenario)), std::runtime_error);
+}
+
+TEST(HandoverTest, NumbersThatDoNotFitAreRefused) {
+    const std::string good = toJson(oneChannel({{true, 7, {}}}, {Rate::Kind::perSecond, 2.5}));
+    ASSERT_EQ(fromJson(good).channels.size(), 1U);
+    const std::vector<std::pair<std::string, std::string>> wrong{
+        {"\"protocol\":7", "\"protocol\":1e99"},
+        {"\"protocol\":7", "\"protocol\":7.5"},
+        {"\"protocol\":7", "\"protocol\":-1"},
+        {"\"board\":1", "\"board\":256"},
+        {"\"number\":1", "\"number\":65536"},
+        {"\"label\":2", "\"label\":4294967296"},
+        {"\"ticks\":7", "\"ticks\":\"7\""},
+        {"\"capture\":0", "\"capture\":1"},
+        {"\"rate\":1", "\"rate\":3"},
+        {"\"perSecond\":2.5", "\"perSecond\":1e-300"},
+    };
+    for (const auto& [from, to] : wrong) {
+        std::string text = good;
+        ASSERT_NE(text.find(from), std::string::npos) << from;
+        text.replace(text.find(from), from.size(), to);
+        EXPECT_THROW(fromJson(text), std::exception) << to;
+    }
 }
 
 }  // namespace
