@@ -51,10 +51,12 @@ void Log::write(std::string_view text) {
         --writesOfFrame_;
         return;
     }
-    entries_.push_back({held_.size(), std::exchange(writesOfFrame_, 0) == 1, false});
+    endEntry();
     if (held_.size() >= BlockSize)
         writeOut();
 }
+
+void Log::endEntry() { entries_.push_back({held_.size(), std::exchange(writesOfFrame_, 0) != 0, false}); }
 
 // Puts before what is held what has to come first. Returns its length.
 std::size_t Log::putHead() {
@@ -136,6 +138,8 @@ void Log::complain(int reason) {
 void Log::close() {
     if (stream_ == nullptr)
         return;
+    if (held_.size() > (entries_.empty() ? 0 : entries_.back().end))
+        endEntry();  // a frame whose writes do not come any more
     if (!held_.empty() || !rest_.empty())
         writeOut();
     if (!rest_.empty() && restIsFrame_)

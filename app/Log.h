@@ -43,6 +43,7 @@ class Log {
         bool isBegun;  // its beginning is in the file
     };
 
+    void endEntry();
     void writeOut();
     std::size_t putHead();
     void writeFailed(std::size_t headSize, std::size_t written, int reason);

@@ -163,6 +163,13 @@ TEST_F(LogTest, KeepsWholeFramesAndCountsTheOthersWhereverTheFileEndsForAWhile) 
     std::cerr.clear();  // its file was under the limit as well
 }
 
+TEST_F(LogTest, CountsAFrameWhoseLastPiecesNeverCame) {
+    ASSERT_NE(log_.open("/dev/full"), nullptr);
+    log_.frameFollows(2);
+    log_.write("the first of two pieces\n");
+    EXPECT_EQ(saidAtTheEnd(), "/dev/full: No space left on device\n/dev/full: frames lost: 1\n");
+}
+
 TEST_F(LogTest, DoesNotCountWhatIsNoFrame) {
     ASSERT_NE(log_.open("/dev/full"), nullptr);
     log_.write("head\n");
