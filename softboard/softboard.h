@@ -23,7 +23,7 @@ void reset(const Scenario& scenario);
 // Other faults from now on, on the boards as they are; what they count begins at 1.
 void setFaults(const std::vector<Fault>& faults);
 
-// Every message so far, a line each, and notes (docs/softboard.md gives the form).
+// Every message so far, a line each, and notes (docs/user/softboard.md gives the form).
 std::string journal();
 // What the host has sent to boards, "8 {Parm 10 Val 1}\n" each.
 std::string heard();

@@ -62,7 +62,7 @@ TEST(FaultTest, IsRefusedWithASentenceWhenItMakesNoSense) {
 
 TEST(FaultTest, StandsInTheDocument) {
     std::ostringstream document;
-    document << std::ifstream(LAPDMON_SOURCE_DIR "/docs/softboard.md").rdbuf();
+    document << std::ifstream(LAPDMON_SOURCE_DIR "/docs/user/softboard.md").rdbuf();
     for (const FaultName& row : faultNames()) {
         const std::string form = std::string("| `") + row.name + (row.takesNumber ? "=N` |" : "` |");
         EXPECT_NE(document.str().find(form), std::string::npos) << form;

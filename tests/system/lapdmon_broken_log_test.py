@@ -125,7 +125,7 @@ class BrokenLog(SystemTest):
         self.assertEqual(self.frames_of(program.log()), ([time_of(i) for i in range(FRAMES + 1)], 0))
 
     def test_a_log_may_be_a_descriptor_with_a_rotating_writer_behind_it(self):
-        """As docs/log-format.md shows: bash makes /dev/fd/N of it."""
+        """As docs/user/log-format.md shows: bash makes /dev/fd/N of it."""
         rotating = ("bash", "-c", 'exec "$0" -b1 -f >(exec split --lines=100 - part.)', LAPDMON)
         program = self.on_board("--rate", "max", run=rotating, frames=DAY)
         program.screen.wait("filename: /dev/fd/")

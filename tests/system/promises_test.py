@@ -1,4 +1,4 @@
-"""Every promise in docs/promises.md names a test that exists."""
+"""Every promise in docs/internals/promises.md names a test that exists."""
 
 import pathlib
 import re
@@ -9,7 +9,7 @@ ROOT = pathlib.Path(__file__).resolve().parents[2]
 
 class Promises(unittest.TestCase):
     def test_each_names_a_test_that_exists(self):
-        rows = re.findall(r"^\| (?!Promise|---)(.*?) \| (.*?) \|$", (ROOT / "docs/promises.md").read_text(), re.M)
+        rows = re.findall(r"^\| (?!Promise|---)(.*?) \| (.*?) \|$", (ROOT / "docs/internals/promises.md").read_text(), re.M)
         self.assertGreater(len(rows), 10)
         for promise, shown in rows:
             with self.subTest(promise):

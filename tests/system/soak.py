@@ -30,7 +30,7 @@ LIMIT = 120          # seconds without a frame, after which none is waited for
 QUEUE = 64 + 8       # messages that wait for the program before the board waits, and those on their way through it
 GROWTH = 512         # kB of allocated memory that are no growth: messages that are on their way
 
-# Wrong events come beside the right ones, one for each hundred frames (docs/softboard.md): name, least and most number.
+# Wrong events come beside the right ones, one for each hundred frames (docs/user/softboard.md): name, least and most number.
 WRONG_EVENTS = (
     ("event-truncated", 0, 19), ("event-overlong", 1, 2000), ("event-length", 0, 4000), ("event-label", 0, 99),
     ("event-type", 100, 9999), ("event-source", 50, 65535),

@@ -1,4 +1,4 @@
-// The table of message types in docs/vela.md is the code's own. UPDATE_GOLDEN=1 writes it.
+// The table of message types in docs/internals/object-layer.md is the code's own. UPDATE_GOLDEN=1 writes it.
 #include <gtest/gtest.h>
 
 #include <cstdlib>
@@ -67,7 +67,7 @@ std::string tables() {
 }
 
 TEST(MessageTypes, StandInTheDocumentAsTheyStandInTheCode) {
-    const std::string path = LAPDMON_SOURCE_DIR "/docs/vela.md";
+    const std::string path = LAPDMON_SOURCE_DIR "/docs/internals/object-layer.md";
     const std::string begin = "<!-- message types: written by tests/vela/message_types_test.cc -->\n";
     const std::string end = "<!-- end of the message types -->\n";
     std::string document = textOf(std::ifstream(path).rdbuf());
