@@ -35,6 +35,8 @@ std::size_t writeAll(int file, std::string_view text) {
     return written;
 }
 
+std::string gapLine(unsigned long frames) { return "Frames Lost: " + std::to_string(frames) + " \n"; }
+
 }  // namespace
 
 Log::~Log() { close(); }
@@ -56,17 +58,24 @@ void Log::write(std::string_view text) {
         writeOut();
 }
 
-void Log::endEntry() { entries_.push_back({held_.size(), std::exchange(writesOfFrame_, 0) != 0, false}); }
+void Log::framesMissing(unsigned long frames) {
+    held_ += gapLine(frames);
+    entries_.push_back({.end = held_.size(), .missing = frames});
+}
+
+void Log::endEntry() {
+    entries_.push_back({.end = held_.size(), .isFrame = std::exchange(writesOfFrame_, 0) != 0});
+}
 
 // Puts before what is held what has to come first. Returns its length.
 std::size_t Log::putHead() {
     std::string head = std::exchange(rest_, {});
     std::vector<Entry> first;
     if (!head.empty())
-        first.push_back({head.size(), restIsFrame_, true});
+        first.push_back({.end = head.size(), .isFrame = restIsFrame_, .isBegun = true});
     if (gap_ != 0) {
-        head += "Frames Lost: " + std::to_string(gap_) + " \n";
-        first.push_back({head.size(), false, false});
+        head += gapLine(gap_);
+        first.push_back({.end = head.size()});
     }
     held_.insert(0, head);
     for (Entry& entry : entries_)
@@ -123,10 +132,10 @@ bool Log::takeBack(std::size_t octets) const {
 
 void Log::countLost(std::size_t kept) {
     for (const Entry& entry : entries_) {
-        if (entry.end > kept && entry.isFrame) {
-            ++lost_;
-            ++gap_;
-        }
+        if (entry.end <= kept)
+            continue;
+        lost_ += entry.isFrame ? 1 : 0;
+        gap_ += entry.isFrame ? 1 : entry.missing;
     }
 }
 

@@ -28,6 +28,10 @@ class Log {
     // The next entry is a frame, which comes in so many writes.
     void frameFollows(unsigned int writes = 1) { writesOfFrame_ = writes; }
     void write(std::string_view text);  // while it is open
+    // Says in the log, behind what was written so far, that this many frames are missing here because they
+    // were lost before they came to the log. The caller counts them: lost() and complete() do not change.
+    // Call it while the log is open, and not between the writes of one frame.
+    void framesMissing(unsigned long frames);
     // Writes what is held. After a write that failed, says how many frames are missing. Nothing the second
     // time.
     void close();
@@ -39,8 +43,9 @@ class Log {
   private:
     struct Entry {
         std::size_t end;  // in held_
-        bool isFrame;
-        bool isBegun;  // its beginning is in the file
+        bool isFrame = false;
+        bool isBegun = false;       // its beginning is in the file
+        unsigned long missing = 0;  // frames that framesMissing was told of
     };
 
     void endEntry();
@@ -61,7 +66,7 @@ class Log {
     bool restIsFrame_ = false;
     bool complete_ = true;
     unsigned long lost_ = 0;
-    unsigned long gap_ = 0;  // frames lost since the last text that was written
+    unsigned long gap_ = 0;  // frames missing since the last text that was written
 };
 
 // There for the whole process.

@@ -91,6 +91,28 @@ TEST_F(LogTest, TakesBackWhatIsInTheFileOfAFrameAndSaysWhereFramesAreMissing) {
     EXPECT_FALSE(log_.complete());
 }
 
+TEST_F(LogTest, SaysWhereFramesAreMissingThatNeverCameToIt) {
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    frame('a', 100);
+    log_.framesMissing(7);
+    frame('b', 100);
+    EXPECT_EQ(saidAtTheEnd(), "");
+    EXPECT_EQ(contents(path_), std::string(100, 'a') + "Frames Lost: 7 \n" + std::string(100, 'b'));
+    EXPECT_EQ(log_.lost(), 0U);
+    EXPECT_TRUE(log_.complete());
+}
+
+TEST_F(LogTest, SaysThemWithItsOwnWhenTheirLineCannotBeWritten) {
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    limitFileSize(1000);
+    log_.framesMissing(7);
+    frame('a', 5000);
+    setrlimit(RLIMIT_FSIZE, &before_);
+    frame('b', 5000);
+    EXPECT_EQ(contents(path_), "Frames Lost: 8 \n" + std::string(5000, 'b'));
+    EXPECT_EQ(saidAtTheEnd(), path_ + ": File too large\n" + path_ + ": frames lost: 1\n");
+}
+
 TEST_F(LogTest, WritesABlockBehindAGapWholeOrNotAtAll) {
     ASSERT_NE(log_.open(path_.c_str()), nullptr);
     limitFileSize(4200);
