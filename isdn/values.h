@@ -1,0 +1,106 @@
+// Elements as values, for programs that compute with them. Every function takes any octets: what is missing
+// or contradictory gives no value.
+#ifndef ISDN_VALUES_H
+#define ISDN_VALUES_H
+
+#include <bitset>
+#include <cstdint>
+#include <optional>
+#include <string_view>
+
+#include "isdn/Layer3.h"
+#include "isdn/octets.h"
+
+namespace isdn {
+
+// CHANNEL IDENTIFICATION (Q.931 4.5.13).
+struct ChannelId {
+    enum class Selection : std::uint8_t { none, indicated, any };
+
+    Selection selection = Selection::none;
+    bool primaryRate = false;                // the interface is not a basic one
+    bool exclusive = false;                  // no other channel will do
+    bool dChannel = false;                   // the D channel is meant
+    bool slotMap = false;                    // coded as a map
+    std::optional<std::uint32_t> interface;  // the interface identifier, when it is given explicitly
+    std::uint8_t channelType = 0x03;         // 3: B channels
+    std::bitset<128> channels;               // numbers as coded; on basic access 1 for B1 and 2 for B2
+};
+
+std::optional<ChannelId> channelId(const Element& element);
+
+// Called, calling, connected, redirecting, redirection and original called numbers (Q.931 4.5.8, 4.5.10 and
+// Q.951, EN 300 207).
+struct PartyNumber {
+    std::uint8_t type = 0;                     // of number, 0 to 7
+    std::uint8_t plan = 0;                     // numbering plan, 0 to 15
+    std::optional<std::uint8_t> presentation;  // 0 allowed, 1 restricted, 2 not available
+    std::optional<std::uint8_t> screening;     // 0 to 3
+    std::optional<std::uint8_t> reason;        // of redirection, 0 to 15
+    std::string_view digits;                   // as coded, whatever characters they are
+    Octets digitOctets;                        // the same, where they stand
+};
+
+std::optional<PartyNumber> partyNumber(const Element& element);
+
+// The digits of a KEYPAD FACILITY element.
+std::string_view keypadDigits(const Element& element);
+
+// CAUSE (Q.850 2). Values have names in `causeName` if the coding standard is 0.
+struct Cause {
+    std::uint8_t codingStandard = 0;  // 0 ITU-T, 1 ISO/IEC, 2 national, 3 of this location
+    std::uint8_t location = 0;        // 0 to 15
+    std::optional<std::uint8_t> recommendation;
+    std::uint8_t value = 0;  // 1 to 127
+    Octets diagnostics;
+};
+
+std::optional<Cause> cause(const Element& element);
+
+// "user busy"; empty if the value has no name.
+std::string_view causeName(std::uint8_t value);
+// "remote user"; empty if reserved.
+std::string_view locationName(std::uint8_t location);
+
+// CALL STATE (Q.931 4.5.7). States are those of the user, 0 to 25, or 61 and 62 of the global reference.
+struct CallState {
+    std::uint8_t codingStandard = 0;
+    std::uint8_t value = 0;
+};
+
+std::optional<CallState> callState(const Element& element);
+std::string_view callStateName(std::uint8_t value);
+
+// RESTART INDICATOR (Q.931 4.5.25): 0 the channels that are named, 6 one interface, 7 all interfaces.
+std::optional<std::uint8_t> restartClass(const Element& element);
+
+// CHANGE STATUS of SERVICE: 0 in service, 1 maintenance, 2 out of service.
+struct ChangeStatus {
+    std::uint8_t status = 0;
+    bool channel =
+        false;  // the preference bit: it is about a channel, else about a D channel or an interface
+};
+
+std::optional<ChangeStatus> changeStatus(const Element& element);
+
+// PROGRESS INDICATOR (Q.931 4.5.23).
+struct Progress {
+    std::uint8_t codingStandard = 0;
+    std::uint8_t location = 0;
+    std::uint8_t value = 0;
+};
+
+std::optional<Progress> progress(const Element& element);
+
+// SEGMENTED MESSAGE (Q.931 4.5.26): the first element of a SEGMENT.
+struct SegmentHeader {
+    bool first = false;
+    std::uint8_t remaining = 0;    // segments that follow
+    std::uint8_t messageType = 0;  // of the message that was cut
+};
+
+std::optional<SegmentHeader> segmentHeader(const Element& element);
+
+}  // namespace isdn
+
+#endif
