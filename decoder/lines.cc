@@ -9,6 +9,12 @@ namespace {
 // A frame of calls makes about 2 kB of text, the longest possible one some hundred.
 constexpr std::size_t firstCapacity = 65536;
 
+// Below one: none.
+void dashes(long long count) {
+    for (; count > 0; --count)
+        text('-');
+}
+
 }  // namespace
 
 void LineBuffer::grow(std::size_t n) {
@@ -37,12 +43,10 @@ void bitwise(int value, int high, int low) {
         return;
     }
     text("      ");
-    for (int position = 8; position > std::clamp(high, 0, 8); --position)
-        text('-');
+    dashes(8LL - high);
     for (int position = std::min(high, 8); position >= std::max(low, 1); --position)
         text(((value >> (position - 1)) & 1) != 0 ? '1' : '0');
-    for (int position = std::clamp(low, 1, 9) - 1; position >= 1; --position)
-        text('-');
+    dashes(low - 1LL);
 }
 
 }  // namespace decoder

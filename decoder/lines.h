@@ -227,9 +227,9 @@ inline void output(int f) {
         text(indent);
 }
 
-// The frame's indent, six blanks and the bits `high` to `low` of the value at their own places, "-"
-// elsewhere; no line end. Bits are numbered 8 (most significant) to 1; a position outside 8..1 writes
-// nothing.
+// Writes the frame's indent, six blanks, 8 - high dashes, the bits `high` to `low` of the value, and low - 1
+// dashes; no line end. Bits are numbered 8 (most significant) to 1; a position outside 8..1 has no digit. A
+// field inside the octet therefore makes eight characters; one outside can make more.
 void bitwise(int value, int high, int low);
 
 }  // namespace decoder

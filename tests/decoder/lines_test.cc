@@ -33,7 +33,8 @@ TEST(Bitwise, ShowsTheFieldAtItsPlacesBehindSixBlanks) {
         EXPECT_EQ(bits(c.value, c.high, c.low), c.expected) << c.says;
 }
 
-TEST(Bitwise, WritesNothingForPositionsOutsideTheOctet) {
+// 8 - high dashes, the digits of positions in the octet, low - 1 dashes; a number below zero is none.
+TEST(Bitwise, CountsItsDashesFromTheArgumentsAndShowsNoDigitOutsideTheOctet) {
     const struct {
         const char* says;
         int value, high, low;
@@ -45,8 +46,11 @@ TEST(Bitwise, WritesNothingForPositionsOutsideTheOctet) {
         {"all above", 0xFF, 12, 9, "      --------"},
         {"all below", 0xFF, 0, -2, "      --------"},
         {"no position at all", 0xFF, 3, 5, "      ---------"},
+        {"a field that ends below the octet", 0xFF, -2, -4, "      ----------"},
+        {"a field that begins above the octet", 0xFF, 12, 11, "      ----------"},
+        {"a field from above the octet", 0xA5, 10, 6, "      101-----"},
+        {"crosswise beyond the octet", 0xFF, -1, 10, "      ------------------"},
         {"as far as numbers go", 0xA5, INT_MAX, INT_MIN, "      10100101"},
-        {"as far as numbers go, crosswise", 0xA5, INT_MIN, INT_MAX, "      ----------------"},
         {"bits above the eighth", 0x1FF, 8, 8, "      1-------"},
         {"a negative value", -1, 4, 3, "      ----11--"},
     };
