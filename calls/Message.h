@@ -1,0 +1,38 @@
+// A layer-3 message as the state machines take it.
+#ifndef CALLS_MESSAGE_H
+#define CALLS_MESSAGE_H
+
+#include <cstdint>
+
+#include "capture/Frame.h"
+#include "isdn/Layer2.h"
+#include "isdn/Layer3.h"
+#include "isdn/Variant.h"
+
+namespace calls {
+
+// Which end of the link: ours, whose frames count as transmitted, or the other one.
+enum class Side : std::uint8_t { us, peer };
+constexpr Side other(Side side) { return side == Side::us ? Side::peer : Side::us; }
+
+inline constexpr std::int64_t millisecond = 1'000'000;
+inline constexpr std::int64_t second = 1'000 * millisecond;
+
+// A message that the receiver's layer 2 accepts: no duplicate, none out of sequence. A message of segments
+// comes once, put together, as part of its last frame. All views are valid during the call alone.
+struct Message {
+    const capture::Frame* frame = nullptr;
+    std::uint64_t number = 0;  // of the frame in the input, from 1
+    // Nanoseconds on the clock of this D channel, which never goes back: durations are differences of it.
+    std::int64_t at = 0;
+    std::uint32_t group = 0;  // the D channel, or the group of D channels that share their calls (NFAS)
+    isdn::Layer2 layer2;
+    isdn::Layer3 layer3;
+    isdn::Variant variant = isdn::Variant::net5;
+
+    Side from() const { return frame->transmitted ? Side::us : Side::peer; }
+};
+
+}  // namespace calls
+
+#endif
