@@ -1,12 +1,10 @@
 #include "app/display.h"
 
 #include <algorithm>
-#include <array>
 #include <ctime>
 #include <iostream>
 #include <memory>
 #include <mutex>
-#include <string_view>
 
 #include "app/Arrivals.h"
 #include "app/Log.h"
@@ -14,6 +12,7 @@
 #include "decoder/cursor.h"
 #include "decoder/frame.h"
 #include "decoder/lines.h"
+#include "decoder/time_lines.h"
 
 namespace app {
 
@@ -21,6 +20,7 @@ vela::Queue event_queue(QueueCapacity);
 vela::Mutex queueGuard;
 vela::Semaphore sema(QueueCapacity, 0);
 vela::Thread Process(&Process_L2_Trace, 0);
+int trunkVariant = 0;
 
 namespace {
 
@@ -28,8 +28,6 @@ using Record = vela::CCS::EvtL2Trace_t;
 
 constexpr unsigned int FrameLabel = 2;
 constexpr unsigned int Transmitted = 1;
-constexpr unsigned int TicksPerSecond = 250;
-constexpr unsigned int MillisecondsPerTick = 4;
 
 // What the reports of foreign exceptions carry.
 constexpr int CallbackPlace = 100;
@@ -37,39 +35,8 @@ constexpr int DisplayThreadPlace = 215;
 
 static_assert(Arrivals::Most <= unsigned{QueueCapacity}, "a record that has a place finds room in the queue");
 
-// The second it is, in the C library's 24-character form and a line end. Under queueGuard. Frames of one
-// second share the text, whose making takes as long as the decoding of a frame.
-std::string_view localTime() {
-    static std::time_t shown = -1;
-    static long shownZone = 0;
-    static std::array<char, 26> text{};
-    if (const std::time_t now = std::time(nullptr); now != shown || timezone != shownZone) {
-        if (ctime_r(&now, text.data()) == nullptr)
-            text = {"\n"};
-        shown = now;
-        shownZone = timezone;  // as ctime_r has found it
-    }
-    return text.data();
-}
-
-void writeHeader(unsigned int direction, unsigned int timestamp) {
-    const std::string_view timeLine = localTime();
-    const auto seconds = decoder::dec(timestamp / TicksPerSecond);
-    const auto milliseconds = decoder::dec(timestamp % TicksPerSecond * MillisecondsPerTick);
-    if (direction == Transmitted) {
-        decoder::flag = 0;
-        decoder::text("\n");
-        decoder::output(decoder::flag);
-        decoder::text(timeLine);
-        decoder::output(decoder::flag);
-        decoder::text("TX Frame: Time = ", seconds, ".", milliseconds, "\n");
-    } else {
-        decoder::flag = 1;
-        decoder::output(decoder::flag);
-        decoder::text("\n", timeLine);
-        decoder::text("RX Frame: Time = ", seconds, ".", milliseconds, "\n");
-    }
-}
+// Under queueGuard.
+decoder::LocalTime localTime;
 
 // The announced length; no more than the list holds unless it is too much anyway.
 int frameLength(unsigned int announced, unsigned int held) {
@@ -89,6 +56,7 @@ std::unique_ptr<Record> takeRecord() {
 }
 
 void displayForEver(vela::Thread::control& ctl) {
+    decoder::swit = trunkVariant;
     vela::staticList<unsigned char> octets;  // reused for every record
     while (true) {
         while (!sema.tryWait(10, 10))
@@ -111,15 +79,15 @@ void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
     decoder::msglen = frameLength(rec.Length, octets.length());
     // A refusal reaches the log before the screen, and so in two parts.
     traceLog.frameFollows(decoder::msglen > decoder::maximumFrame ? 2 : 1);
-    writeHeader(rec.Direction, rec.Timestamp);
+    decoder::timeLines(rec.Direction == Transmitted, rec.Timestamp, localTime.of(std::time(nullptr)));
     decoder::RingBuffer frame;
     if (decoder::getBlock(&frame, octets, decoder::msglen)) {
         decoder::parse_isdn_frame(frame);
         return;
     }
     decoder::output(decoder::flag);
-    std::cout << "Frame Error" << std::endl;
-    decoder::text("Frame Error \n");
+    std::cout << decoder::frameError << std::endl;
+    decoder::text(decoder::frameError, " \n");
     decoder::flushLines();
 }
 

@@ -16,6 +16,7 @@ extern vela::Queue event_queue;
 extern vela::Mutex queueGuard;  // guards event_queue; held by the display thread for all of one record
 extern vela::Semaphore sema;    // one count for each queued record
 extern vela::Thread Process;    // the display thread
+extern int trunkVariant;        // decoder::swit of the display thread; set before it starts
 
 // The callback for layer-2 trace events, on the delivery thread of one event. Takes over rec.
 void HANDLE_L2Trace_events(vela::CCS* ccs, unsigned int evtGroup, vela::CCS::EvtL2Trace_t* rec);

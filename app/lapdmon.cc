@@ -67,7 +67,7 @@ std::unique_ptr<vela::CCS> openCcs(const vela::Instance& instance) {
     return opened;
 }
 
-// Sets the decoder's variant; false for a type that nobody knows how to decode.
+// Sets the variant that frames are decoded by; false for a type that nobody knows how to decode.
 bool setProtocol(unsigned int type) {
     std::cout << "CCS protocol type is " << type << std::endl;
     const Protocol* const protocol = protocolOf(type);
@@ -76,7 +76,7 @@ bool setProtocol(unsigned int type) {
                   << "Program is terminating!" << std::endl;
         return false;
     }
-    decoder::swit = protocol->variant;
+    trunkVariant = protocol->variant;
     std::cout << protocol->screenLine << std::endl;
     decoder::text(protocol->logLine);
     decoder::flushLines();

@@ -1,7 +1,6 @@
 #include "decoder/cursor.h"
 
 #include <algorithm>
-#include <iostream>
 
 #include "decoder/lines.h"
 
@@ -17,22 +16,25 @@ RingBuffer& RingBuffer::operator=(const RingBuffer& other) {
     return *this;
 }
 
-bool getBlock(RingBuffer* rb, vela::staticList<unsigned char>& octets, int len) {
+bool getBlock(RingBuffer* rb, std::span<const unsigned char> octets, int len) {
     rb->readPtr = rb->data;
     rb->writePtr = rb->data;
     rb->count = 0;
     if (len > maximumFrame) {
         output(flag);
-        std::cout << "Oversized frame, frame will not be interpreted" << std::endl;
-        text("Oversized frame, frame will not be interpreted \n");
+        writeScreen(oversizedFrame);
+        text(oversizedFrame, " \n");
         flushLines();
         return false;
     }
-    const unsigned wanted = static_cast<unsigned>(std::max(len, 0));
-    const unsigned held = std::min(wanted, octets.length());
-    rb->writePtr = std::copy(octets.begin(), octets.begin() + held, rb->data);
+    const std::size_t held = std::min(static_cast<std::size_t>(std::max(len, 0)), octets.size());
+    rb->writePtr = std::copy_n(octets.begin(), held, rb->data);
     rb->count = static_cast<int>(held);
     return true;
+}
+
+bool getBlock(RingBuffer* rb, vela::staticList<unsigned char>& octets, int len) {
+    return getBlock(rb, std::span<const unsigned char>(octets.begin(), octets.length()), len);
 }
 
 }  // namespace decoder

@@ -2,12 +2,17 @@
 #ifndef DECODER_CURSOR_H
 #define DECODER_CURSOR_H
 
+#include <span>
+
 #include "vela/list.h"
 
 namespace decoder {
 
-// The longest frame that is decoded, in octets.
+// The longest frame that is decoded, in octets; and what stands for a longer one, on the screen and in the
+// log.
 inline constexpr int maximumFrame = 257;
+inline constexpr char oversizedFrame[] = "Oversized frame, frame will not be interpreted";
+inline constexpr char frameError[] = "Frame Error";
 
 // Despite its name it never wraps: it is filled once from the start and read once from the start.
 // A copy has pointers into its own octets.
@@ -30,6 +35,7 @@ struct RingBuffer {
 // Empties the cursor and fills it with the first `len` octets, or with as many as there are. A `len` above
 // maximumFrame is refused with a line on the screen and one in the log; the cursor is then empty.
 bool getBlock(RingBuffer* rb, vela::staticList<unsigned char>& octets, int len);
+bool getBlock(RingBuffer* rb, std::span<const unsigned char> octets, int len);
 
 // Hands out the next octet. At the end of the frame it returns false and leaves *out untouched; decoders
 // do not look at the result, so that past the end they show once more what they read last.

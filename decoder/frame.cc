@@ -29,11 +29,15 @@ void hexDump(const RingBuffer& rb) {
 
 }  // namespace
 
-void parse_isdn_frame(RingBuffer rb) {
+void composeFrame(RingBuffer rb) {
     layer_2(&rb);
     if (rb.count > 0)
         layer_3(&rb);
     hexDump(rb);
+}
+
+void parse_isdn_frame(RingBuffer rb) {
+    composeFrame(rb);
     flushLines();
 }
 

@@ -6,8 +6,10 @@
 
 namespace decoder {
 
-// Writes the layer-2 lines (Q.921), the layer-3 lines (Q.931) when there is a message, and the hexadecimal
-// dump of the first `msglen` octets, ten to a line; then hands all text composed so far to the log.
+// Composes the layer-2 lines (Q.921), the layer-3 lines (Q.931) when there is a message, and the hexadecimal
+// dump of the first `msglen` octets, ten to a line.
+void composeFrame(RingBuffer rb);
+// The same; then hands all text composed so far to the log.
 void parse_isdn_frame(RingBuffer rb);
 
 }  // namespace decoder

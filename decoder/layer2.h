@@ -7,8 +7,8 @@
 namespace decoder {
 
 // Of the frame decoded last; a TEI-management frame leaves both 0.
-inline int sapi = 0;
-inline int tei = 0;
+inline constinit thread_local int sapi = 0;
+inline constinit thread_local int tei = 0;
 
 // Decodes both fields. What it leaves in the cursor is a layer-3 message.
 void layer_2(RingBuffer* rb);

@@ -7,8 +7,8 @@
 
 namespace decoder {
 
-inline int prtcol_discr = 0;  // protocol discriminator of the message being decoded
-inline int Lock_shift = 0;    // 1 after a locking shift to codeset 6 in this message
+inline constinit thread_local int prtcol_discr = 0;  // protocol discriminator of the message being decoded
+inline constinit thread_local int Lock_shift = 0;    // 1 after a locking shift to codeset 6 in this message
 
 // Decodes a whole message: the header, then elements until the frame is used up.
 void layer_3(RingBuffer* rb);

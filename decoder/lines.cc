@@ -1,6 +1,8 @@
 #include "decoder/lines.h"
 
 #include <algorithm>
+#include <iostream>
+#include <memory>
 
 namespace decoder {
 
@@ -15,6 +17,9 @@ void dashes(long long count) {
         text('-');
 }
 
+// What the thread's lineBuffer points into.
+thread_local std::unique_ptr<char[]> memory;
+
 }  // namespace
 
 void LineBuffer::grow(std::size_t n) {
@@ -23,7 +28,8 @@ void LineBuffer::grow(std::size_t n) {
     auto grown = std::make_unique_for_overwrite<char[]>(capacity);
     at_ = std::copy(kept.begin(), kept.end(), grown.get());
     end_ = grown.get() + capacity;
-    begin_ = std::move(grown);
+    begin_ = grown.get();
+    memory = std::move(grown);
 }
 
 void flushLines() {
@@ -35,6 +41,8 @@ void flushLines() {
 
 // A write that fails leaves its mark on the stream, for whoever owns it.
 void writeToStream(std::string_view composed) { (void)std::fwrite(composed.data(), 1, composed.size(), ofp); }
+
+void writeToStandardOutput(std::string_view line) { std::cout << line << std::endl; }
 
 void bitwise(int value, int high, int low) {
     output(flag);

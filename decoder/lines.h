@@ -5,7 +5,8 @@
 //
 //     text("TEI=0x", hex(tei), "\n");        line("  3:     0x", hex(octet), "  Signal Value");
 //
-// As with state.h, only one thread composes at a time.
+// Each thread composes text of its own. Only one at a time hands it to the log, which is the caller's
+// business.
 #ifndef DECODER_LINES_H
 #define DECODER_LINES_H
 
@@ -17,14 +18,14 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
-#include <memory>
 #include <string_view>
 
 #include "decoder/state.h"
 
 namespace decoder {
 
-// The text composed and not yet in the log. It grows as needed and keeps what it grew to.
+// The text that a thread has composed and that is not yet in the log. It grows as needed and keeps what it
+// grew to, until the thread ends.
 class LineBuffer {
   public:
     // A place where n characters can be written; commit says where writing ended.
@@ -35,18 +36,20 @@ class LineBuffer {
     }
     void commit(char* at) { at_ = at; }
 
-    std::string_view composed() const { return {begin_.get(), static_cast<std::size_t>(at_ - begin_.get())}; }
-    void clear() { at_ = begin_.get(); }
+    std::string_view composed() const { return {begin_, static_cast<std::size_t>(at_ - begin_)}; }
+    void clear() { at_ = begin_; }
 
   private:
     [[gnu::cold, gnu::noinline]] void grow(std::size_t n);
 
-    std::unique_ptr<char[]> begin_;
+    // The thread's memory has an owner of its own (lines.cc): a thread_local object without a destructor is
+    // reached without a check whether it was constructed.
+    char* begin_ = nullptr;
     char* at_ = nullptr;
     char* end_ = nullptr;
 };
 
-inline constinit LineBuffer lineBuffer;
+inline constinit thread_local LineBuffer lineBuffer;
 
 // Hands the text composed so far to the log; drops it when there is none (file_output, ofp).
 void flushLines();
@@ -56,6 +59,13 @@ void flushLines();
 using LogWriter = void (*)(std::string_view composed);
 void writeToStream(std::string_view composed);
 inline constinit LogWriter writeLog = writeToStream;
+
+// Takes the one line that the decoder has for the screen, "Oversized frame, frame will not be interpreted",
+// without its line end. It goes to the standard output stream, unless the program has put a function of its
+// own here.
+using ScreenWriter = void (*)(std::string_view line);
+void writeToStandardOutput(std::string_view line);
+inline constinit ScreenWriter writeScreen = writeToStandardOutput;
 
 // ---- pieces of text
 

@@ -1,5 +1,6 @@
-// The decoder's program-wide words. Only one thread decodes at a time: whoever decodes, or composes lines,
-// holds off the others (the trace application does so with its queue's mutex), so they are plain variables.
+// The decoder's words. Those that speak of a frame are each thread's own, so that several threads may decode
+// at a time, each a trunk of its own variant. Where text goes is the same for the whole program: whoever
+// opens the log sets it before another thread writes.
 #ifndef DECODER_STATE_H
 #define DECODER_STATE_H
 
@@ -7,13 +8,14 @@
 
 namespace decoder {
 
-inline int flag = 0;              // 0: every line is indented (transmitted frames), 1: none is (received)
+inline constinit thread_local int flag = 0;       // 0: lines are indented (transmitted frames), 1: they are not
+inline constinit thread_local int bit_field = 0;  // the octet masked to the field being shown
+inline constinit thread_local int ielength = 0;   // octets the element still announces; may go below zero
+inline constinit thread_local int msglen = 0;     // octets of the frame being decoded
+inline constinit thread_local int swit = 0;       // switch variant of the trunk, see trunks.h
+
 inline bool file_output = false;  // a log is written
 inline std::FILE* ofp = nullptr;  // the log, owned by whoever opened it
-inline int bit_field = 0;         // the octet masked to the field being shown
-inline int ielength = 0;          // octets that the current element still announces; may go below zero
-inline int msglen = 0;            // octets of the frame being decoded
-inline int swit = 0;              // switch variant of the trunk, see trunks.h
 
 }  // namespace decoder
 

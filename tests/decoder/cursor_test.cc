@@ -81,6 +81,18 @@ TEST(Cursor, RefusesAFrameOf258OctetsOnScreenAndInTheLog) {
     EXPECT_EQ(rb.writePtr, rb.data);
 }
 
+TEST(Cursor, ARefusalIsToldToTheProgramsOwnFunctionIfItHasOne) {
+    static std::string told;
+    Capture log;
+    RingBuffer rb;
+    ::testing::internal::CaptureStdout();
+    writeScreen = [](std::string_view line) { told += line; };
+    getBlock(&rb, counting(258), 258);
+    writeScreen = writeToStandardOutput;
+    EXPECT_EQ(told, "Oversized frame, frame will not be interpreted");
+    EXPECT_EQ(::testing::internal::GetCapturedStdout(), "");
+}
+
 TEST(Cursor, ARefusalIsInTheLogAtOnceAndBehindWhatWasComposedBefore) {
     Capture log;
     vela::staticList<unsigned char> list = listOf(counting(258));
