@@ -1,0 +1,104 @@
+// Types of ASN.1 as tables, and the values of a tree told apart by them.
+#ifndef ISDN_BER_TYPES_H
+#define ISDN_BER_TYPES_H
+
+#include <cstdint>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "isdn/ber.h"
+
+namespace isdn {
+
+struct BerType;
+
+// A number of an ENUMERATED or INTEGER, and what it means.
+struct BerName {
+    std::int64_t number;
+    std::string_view name;
+};
+
+// A member of a SEQUENCE, an alternative of a CHOICE, or the one member type of a SEQUENCE OF.
+struct BerMember {
+    // How a context tag stands to the type's own: it is none, it replaces it, it stands around it.
+    enum class Tagging : std::uint8_t { none, implicit, explicitly };
+    // Whether a line of words shows the member's name, or its value alone.
+    enum class Words : std::uint8_t { named, valueAlone };
+
+    std::string_view name;
+    const BerType* type;
+    Tagging tagging = Tagging::none;
+    std::uint32_t tag = 0;
+    Words words = Words::named;
+};
+
+struct BerType {
+    enum class Kind : std::uint8_t {
+        boolean,
+        integer,
+        enumerated,
+        null,
+        digits,  // NumericString
+        text,    // IA5String
+        name,    // OCTET STRING that holds characters
+        octets,  // OCTET STRING
+        sequence,
+        sequenceOf,
+        choice
+    };
+
+    Kind kind;
+    std::span<const BerMember> members{};
+    std::span<const BerName> names{};
+    bool personal = false;  // identifies a person
+};
+
+// What a value of the tree is. A value that no type describes has no type and no name.
+struct BerMeaning {
+    std::string_view name;
+    const BerType* type = nullptr;
+    BerMember::Words words = BerMember::Words::named;
+    // Of a member that is a choice, the alternative that was taken.
+    std::string_view alternative{};
+    BerMember::Words alternativeWords = BerMember::Words::valueAlone;
+    std::string_view says{};  // what its value means, where more than its type tells
+};
+
+// Tells what values of a tree are. Members that are absent, or that the type does not know, are passed over.
+class BerMeanings {
+  public:
+    // The tree is only looked at and must outlive this.
+    explicit BerMeanings(const BerTree& tree) : tree_(&tree), meanings_(tree.values().size()) {}
+
+    // The value at `index`, and all that it holds, is `member`. False, with nothing told, if it cannot be.
+    bool tell(std::size_t index, const BerMember& member);
+    // The same of a value whose tag is not part of any type.
+    void name(std::size_t index, std::string_view name) { meanings_[index].name = name; }
+    void say(std::size_t index, std::string_view meaning) { meanings_[index].says = meaning; }
+
+    const BerMeaning& operator[](std::size_t index) const { return meanings_[index]; }
+
+  private:
+    void tellContents(std::size_t index, const BerType& type);
+    void tellSequence(std::size_t index, std::span<const BerMember> members);
+
+    const BerTree* tree_;
+    std::vector<BerMeaning> meanings_;
+};
+
+// A primitive value in words: "busy", "12345", "yes", "0.4.0.359.1.2"; empty if it has no value or is
+// damaged. Characters are given as they came, control characters too. Without a type the value's own tag
+// decides.
+std::string wordsOf(const BerTree& tree, const BerValue& value, const BerType* type);
+
+// Whether a primitive value holds characters.
+bool isText(const BerValue& value, const BerType* type);
+
+// Whether a primitive value identifies a person. Where no type is known, each string and number may.
+bool isPersonal(const BerValue& value, const BerType* type);
+
+}  // namespace isdn
+
+#endif
