@@ -3,10 +3,13 @@
 #ifndef APP_LOG_H
 #define APP_LOG_H
 
+#include <chrono>
 #include <cstdio>
 #include <string>
 #include <string_view>
-#include <vector>
+
+#include "app/LogBlock.h"
+#include "app/LogFile.h"
 
 namespace app {
 
@@ -15,15 +18,16 @@ namespace app {
 // says how many frames are missing there. Not locked: whoever writes holds off the others.
 class Log {
   public:
-    static constexpr std::size_t BlockSize = 4096;  // text is written when as much is held
+    static constexpr std::size_t BlockSize = 4096;            // octets; text is written when so much is held
+    static constexpr std::chrono::milliseconds DueAfter{10};  // of the last write
 
     Log() = default;
     Log(const Log&) = delete;
     Log& operator=(const Log&) = delete;
     ~Log();
 
-    // Creates or empties the file; waits for the reader of a FIFO. Null, with errno, when it cannot. The
-    // stream is the log's own and writes nothing itself.
+    // Opens the file as LogFile does: null, with errno, when it cannot be opened, EWOULDBLOCK when another
+    // trace writes to it. The stream is the log's own and writes nothing itself.
     std::FILE* open(const char* name);
     // The next entry is a frame, which comes in so many writes.
     void frameFollows(unsigned int writes = 1) { writesOfFrame_ = writes; }
@@ -32,38 +36,35 @@ class Log {
     // were lost before they came to the log. The caller counts them: lost() and complete() do not change.
     // Call it while the log is open, and not between the writes of one frame.
     void framesMissing(unsigned long frames);
+
+    // Both write what is held, for the time when no frame waits to be shown. `flushIfDue` does so only when
+    // the last write is longer ago than DueAfter, so that it may be called after each frame; whoever calls it
+    // calls `flush` when nothing has come for a while.
+    void flush();
+    void flushIfDue();
+
     // Writes what is held. After a write that failed, says how many frames are missing. Nothing the second
     // time.
     void close();
+
+    // From here on nothing waits until the file takes more; a write that waits returns. What the file does
+    // not take at once is lost and counted. From any thread, and from a signal handler.
+    void giveUp() { file_.giveUp(); }
 
     // False once a write has failed.
     bool complete() const { return complete_; }
     unsigned long lost() const { return lost_; }  // frames
 
   private:
-    struct Entry {
-        std::size_t end;  // in held_
-        bool isFrame = false;
-        bool isBegun = false;       // its beginning is in the file
-        unsigned long missing = 0;  // frames that framesMissing was told of
-    };
-
-    void endEntry();
+    bool holdsSomethingNew() const;
     void writeOut();
-    std::size_t putHead();
-    void writeFailed(std::size_t headSize, std::size_t written, int reason);
-    std::size_t settle(std::size_t written);
-    bool takeBack(std::size_t octets) const;
-    void countLost(std::size_t kept);
     void complain(int reason);
 
     std::string name_;
-    std::FILE* stream_ = nullptr;
-    std::string held_;
-    std::vector<Entry> entries_;
-    std::string rest_;                // of an entry that is in the file in part and could not be taken back
+    LogFile file_;
+    LogBlock block_;
     unsigned int writesOfFrame_ = 0;  // still to come
-    bool restIsFrame_ = false;
+    std::chrono::steady_clock::time_point lastWrite_;
     bool complete_ = true;
     unsigned long lost_ = 0;
     unsigned long gap_ = 0;  // frames missing since the last text that was written

@@ -2,9 +2,11 @@
 
 #include <fcntl.h>
 #include <gtest/gtest.h>
+#include <sys/file.h>
 #include <sys/ioctl.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -16,6 +18,17 @@
 #include <iterator>
 #include <sstream>
 #include <thread>
+
+namespace {
+// What flock reports instead of locking; 0: it locks.
+int flockFails = 0;
+}  // namespace
+
+// In place of the C library's.
+extern "C" int flock(int file, int operation) noexcept {
+    errno = flockFails;
+    return flockFails != 0 ? -1 : static_cast<int>(syscall(SYS_flock, file, operation));
+}
 
 namespace app {
 namespace {
@@ -184,6 +197,103 @@ TEST_F(LogTest, KeepsWholeFramesAndCountsTheOthersWhereverTheFileEndsForAWhile) 
     }
     static_cast<void>(saidAtTheEnd());
     std::cerr.clear();  // its file was under the limit as well
+}
+
+TEST_F(LogTest, AddsUpWhatIsMissingAtOnePlace) {
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    log_.framesMissing(7);
+    log_.framesMissing(5);
+    frame('a', 1);
+    log_.framesMissing(3);
+    EXPECT_EQ(saidAtTheEnd(), "");
+    EXPECT_EQ(contents(path_), "Frames Lost: 12 \naFrames Lost: 3 \n");
+}
+
+TEST_F(LogTest, WritesWhatItHoldsWhenNothingWaits) {
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    frame('a', 1);
+    log_.flush();
+    EXPECT_EQ(contents(path_), "a");
+    log_.flush();
+    EXPECT_EQ(contents(path_), "a");
+    EXPECT_EQ(saidAtTheEnd(), "");
+}
+
+TEST_F(LogTest, WritesALoneFrameAsSoonAsItHasCome) {
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    frame('a', 1);
+    log_.flushIfDue();
+    EXPECT_EQ(contents(path_), "a");
+    EXPECT_EQ(saidAtTheEnd(), "");
+}
+
+TEST_F(LogTest, TriesNoMoreThanOnceWhatAPipeHasRefusedOfAFrameWhileNothingNewComes) {
+    ASSERT_EQ(mkfifo(path_.c_str(), 0600), 0);
+    const int reader = open(path_.c_str(), O_RDONLY | O_NONBLOCK);
+    ASSERT_EQ(fcntl(reader, F_SETPIPE_SZ, 4096), 4096);
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    log_.giveUp();
+    frame('a', 5000);
+    std::array<char, 4096> some{};
+    EXPECT_EQ(read(reader, some.data(), some.size()), 4096);
+    log_.flush();
+    EXPECT_EQ(read(reader, some.data(), some.size()), -1);
+    frame('b', 1);
+    log_.flush();
+    EXPECT_EQ(read(reader, some.data(), some.size()), 905);
+    close(reader);
+    static_cast<void>(saidAtTheEnd());
+}
+
+TEST_F(LogTest, RefusesAFileThatAnotherLogWritesAndLeavesItAsItIs) {
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    frame('a', 5000);
+    Log second;
+    EXPECT_EQ(second.open(path_.c_str()), nullptr);
+    EXPECT_EQ(errno, EWOULDBLOCK);
+    second.close();
+    EXPECT_EQ(contents(path_), std::string(5000, 'a'));
+    EXPECT_EQ(saidAtTheEnd(), "");
+    EXPECT_NE(second.open(path_.c_str()), nullptr);
+    EXPECT_EQ(contents(path_), "");
+}
+
+TEST_F(LogTest, GoesOnWithoutALockWhereTheFileSystemHasNoneAndSaysSo) {
+    flockFails = ENOLCK;
+    const std::FILE* const stream = log_.open(path_.c_str());
+    flockFails = 0;
+    ASSERT_NE(stream, nullptr);
+    frame('a', 1);
+    EXPECT_EQ(saidAtTheEnd(), "lapdmon: cannot lock " + path_ +
+                                  ": No locks available; make sure that no other trace writes to it\n");
+    EXPECT_EQ(contents(path_), "a");
+}
+
+TEST_F(LogTest, DoesNotLockAFifo) {
+    ASSERT_EQ(mkfifo(path_.c_str(), 0600), 0);
+    const int reader = open(path_.c_str(), O_RDONLY | O_NONBLOCK);
+    Log second;
+    EXPECT_NE(log_.open(path_.c_str()), nullptr);
+    EXPECT_NE(second.open(path_.c_str()), nullptr);
+    close(reader);
+    EXPECT_EQ(saidAtTheEnd(), "");
+}
+
+TEST_F(LogTest, GivesUpAWriteThatWaitsForAReader) {
+    ASSERT_EQ(mkfifo(path_.c_str(), 0600), 0);
+    const int reader = open(path_.c_str(), O_RDONLY | O_NONBLOCK);
+    ASSERT_EQ(fcntl(reader, F_SETPIPE_SZ, 4096), 4096);
+    ASSERT_NE(log_.open(path_.c_str()), nullptr);
+    std::thread givesUpWhenThePipeIsFull([&] {
+        for (int unread = 0; unread < 4096; ioctl(reader, FIONREAD, &unread))
+            std::this_thread::yield();
+        log_.giveUp();
+    });
+    frame('a', 5000);
+    givesUpWhenThePipeIsFull.join();
+    frame('b', 10);
+    EXPECT_EQ(saidAtTheEnd(), path_ + ": given up, since nobody reads it\n" + path_ + ": frames lost: 2\n");
+    close(reader);
 }
 
 TEST_F(LogTest, CountsAFrameWhoseLastPiecesNeverCame) {
