@@ -55,16 +55,25 @@ std::unique_ptr<Record> takeRecord() {
     return std::unique_ptr<Record>(taken);
 }
 
+void flushLog() {
+    const std::lock_guard guard(queueGuard);
+    traceLog.flush();
+}
+
 void displayForEver(vela::Thread::control& ctl) {
     decoder::swit = trunkVariant;
     vela::staticList<unsigned char> octets;  // reused for every record
     while (true) {
-        while (!sema.tryWait(10, 10))
+        while (!sema.tryWait(10, 10)) {
+            flushLog();
             ctl.testCancel();
+        }
         const std::lock_guard guard(queueGuard);
         ctl.testCancel();
         if (const std::unique_ptr<Record> rec = takeRecord(); rec != nullptr)
             showRecord(*rec, octets);
+        if (event_queue.isempty())
+            traceLog.flushIfDue();
     }
 }
 

@@ -1,10 +1,12 @@
 """The log: what becomes of frames."""
 
 import re
+import time
 import unittest
+from signal import SIGKILL
 
-from harness import (BANNER, BLANKS, MARK, MARK_IN_LOG, MARK_ON_SCREEN, RECEIVED, TRANSMITTED, SystemTest, capture,
-                     time_of)
+from harness import (BANNER, BLANKS, LIMIT, MARK, MARK_IN_LOG, MARK_ON_SCREEN, RECEIVED, TRANSMITTED, SystemTest,
+                     capture, time_of)
 
 FRAMES = [
     (TRANSMITTED, bytes.fromhex("00 01 7f")),
@@ -100,6 +102,22 @@ class Log(SystemTest):
         self.assertEqual(log[banner.end():],
                          "NET5 Switch \n" + LOG + "\nDATE\nRX Frame: Time = 1.200\n" + MARK_IN_LOG)
         self.assertNotIn("Hex Dump", program.screen.text())
+
+    def test_a_lone_frame_is_in_the_file_while_nothing_more_comes_and_stays_whatever_ends_the_program(self):
+        program = self.on_board(frames=capture(FRAMES[1]))
+        path, end = self.folder / "lapdmon.log", time.monotonic() + LIMIT
+        while not path.exists() or b"00 01 73 \n" not in path.read_bytes():
+            self.assertLess(time.monotonic(), end)
+            time.sleep(0.005)
+        program.gets(SIGKILL)
+        program.ends(status=-SIGKILL)
+        self.assertTrue(program.log().endswith("\nDATE\nRX Frame: Time = 0.0\nResponse=0    SAPI=0x00\nTEI=0x00\n"
+                                               "    0x73  Unnumbered Acknowledgment\nHex Dump: \n00 01 73 \n"))
+
+    def test_a_lone_frame_reaches_the_reader_of_a_FIFO_while_nothing_more_comes(self):
+        program = self.on_board(frames=capture(FRAMES[1]), log_fifo=True)
+        program.log_lines.wait("00 01 73 \n")
+        program.quits()
 
     def test_an_oversized_frame_is_reported_and_the_next_is_decoded(self):
         program = self.traces(frames=capture(MARK, FRAMES[1], MARK))
