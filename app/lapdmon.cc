@@ -1,7 +1,9 @@
 #include "app/lapdmon.h"
 
+#include <cerrno>
 #include <chrono>
 #include <cstdlib>
+#include <cstring>
 #include <iostream>
 #include <memory>
 #include <string>
@@ -45,12 +47,17 @@ void openLog() {
     if (!decoder::file_output)
         return;
     decoder::ofp = traceLog.open(log_file_name.data());
-    if (decoder::ofp == nullptr)
+    if (decoder::ofp == nullptr) {
+        const char* const why = errno == EWOULDBLOCK ? "another trace writes to it" : std::strerror(errno);
+        std::cerr << "lapdmon: cannot open " + std::string(log_file_name.data()) + ": " + why + "\n"
+                  << std::flush;
         std::exit(EXIT_FAILURE);
+    }
     decoder::writeLog = [](std::string_view entry) { traceLog.write(entry); };
 }
 
 void closeLog() {
+    const WritingOut writingOut;
     decoder::ofp = nullptr;
     traceLog.close();
 }
@@ -160,11 +167,13 @@ void attempt(Step step) {
 void quit() {
     if (ccs == nullptr)
         return;
+    shutdownBegins();
     std::cout << "One moment. Program Exiting" << std::endl;
     // The board first, so that no callback waits for the queue when the display thread goes; the log last.
     attempt([] { ccs->CancelEvt(vela::CCS::L2TraceGroup, nullptr); });
     attempt([] { ccs->SetParm(L2TraceParm, 0, nullptr); });
     attempt([] {
+        const WritingOut writingOut;
         arrivals.end();
         Process.cancel();
         Process.join();

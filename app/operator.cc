@@ -9,6 +9,8 @@
 #include <cerrno>
 #include <csignal>
 
+#include "app/Log.h"
+
 namespace app {
 
 namespace {
@@ -21,6 +23,14 @@ constexpr int ForEver = -1;
 std::array<int, 2> signalled{-1, -1};
 
 std::atomic<bool> lost = false;
+
+enum class State { Tracing, ShuttingDown, WritingOut };
+std::atomic<State> state = State::Tracing;
+std::atomic<bool> hurried = false;
+static_assert(std::atomic<State>::is_always_lock_free, "a signal handler uses it");
+
+// True when the state was `from`.
+bool moveOn(State from, State to) { return state.compare_exchange_strong(from, to); }
 
 void wakeWaiter() {
     const char mark = 's';
@@ -38,13 +48,28 @@ bool awaitSignal(int timeoutMs, int input) {
 
 }  // namespace
 
-void exit_handle(int) {
+void exit_handle(int signal) {
     const int saved = errno;
-    for (const int each : Signals)
-        static_cast<void>(std::signal(each, SIG_DFL));
-    wakeWaiter();
+    if (moveOn(State::Tracing, State::ShuttingDown)) {
+        wakeWaiter();
+    } else if (signal == SIGHUP) {  // the shutdown runs already
+    } else if (moveOn(State::WritingOut, State::ShuttingDown)) {
+        hurried = true;
+        traceLog.giveUp();
+    } else {
+        static_cast<void>(std::signal(signal, SIG_DFL));
+        static_cast<void>(raise(signal));  // takes effect as the handler returns
+    }
     errno = saved;
 }
+
+void shutdownBegins() { moveOn(State::Tracing, State::ShuttingDown); }
+
+WritingOut::WritingOut() { moveOn(State::ShuttingDown, State::WritingOut); }
+
+WritingOut::~WritingOut() { moveOn(State::WritingOut, State::ShuttingDown); }
+
+bool shutdownHurried() { return hurried; }
 
 void watchSignals() {
     if (pipe2(signalled.data(), O_CLOEXEC | O_NONBLOCK) != 0)

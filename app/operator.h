@@ -4,10 +4,34 @@
 
 namespace app {
 
-// From here on SIGINT, SIGTERM and SIGHUP end awaitQuit instead of the process. Only the first of them: the
-// next one finds the system's own behaviour, so that a shutdown that hangs can be ended. A SIGHUP that was
-// ignored from the start, under nohup, stays so.
+// From here on a signal does what the trace's state calls for:
+//
+//                                SIGINT, SIGTERM                     SIGHUP
+//     the trace runs             ends the trace (awaitQuit returns)  ends the trace
+//     the shutdown runs          ends the process as signals do      nothing
+//     the shutdown writes out    gives up writing                    nothing
+//     and has given that up      ends the process as signals do      nothing
+//
+// A terminal that closes sends SIGHUP twice, which must not end the shutdown. A SIGHUP that was ignored from
+// the start, under nohup, stays ignored. Without a pipe to wake awaitQuit, all three keep what they did
+// before.
 void watchSignals();
+
+// The shutdown runs from here on, also when no signal began it.
+void shutdownBegins();
+
+// While one lives, the shutdown writes out what waits.
+class WritingOut {
+  public:
+    WritingOut();
+    ~WritingOut();
+    WritingOut(const WritingOut&) = delete;
+    WritingOut& operator=(const WritingOut&) = delete;
+};
+
+// True once a signal has given up writing: the log takes only what its file has room for, and what still
+// waits for it is to be counted and dropped. From any thread.
+bool shutdownHurried();
 
 // Standard streams that are closed lead nowhere from here on. Otherwise the next files that are opened would
 // take their numbers: reports would end up in the log, or wake whoever waits for a signal.

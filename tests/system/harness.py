@@ -9,6 +9,7 @@ import fcntl
 import os
 import pathlib
 import re
+import select
 import struct
 import subprocess
 import tempfile
@@ -142,21 +143,44 @@ class Fifo:
 
 
 def wait_until_full(reader):
-    """Until a pipe holds so much that who writes small pieces has to wait."""
-    end = time.monotonic() + LIMIT
-    while struct.unpack("i", fcntl.ioctl(reader, termios.FIONREAD, bytes(4)))[0] < 45000:
-        if time.monotonic() > end:
-            raise AssertionError("the pipe is never full")
-        time.sleep(0.005)
+    """Until whoever writes to a pipe has to wait."""
+    writer = os.open(f"/proc/self/fd/{reader}", os.O_WRONLY | os.O_NONBLOCK)
+    try:
+        room = select.poll()
+        room.register(writer, select.POLLOUT)
+        end = time.monotonic() + LIMIT
+        while room.poll(0):
+            if time.monotonic() > end:
+                raise AssertionError("the pipe is never full")
+            time.sleep(0.005)
+    finally:
+        os.close(writer)
 
 
 class Program:
     """A running program."""
 
+    def status(self, name):
+        """A line of the system's about the process, or its first thread."""
+        status = (pathlib.Path("/proc") / str(self.pid) / "status").read_text()
+        return re.search(rf"^{name}:\s+(\S+)", status, re.M)[1]
+
     @property
     def threads(self):
-        status = (pathlib.Path("/proc") / str(self.pid) / "status").read_text()
-        return int(re.search(r"^Threads:\s+(\d+)", status, re.M)[1])
+        return int(self.status("Threads"))
+
+    def wait_until_idle(self):
+        """Until the first thread waits for something that does not come. (A thread that waits for a reply looks for it
+        every 10 ms.)"""
+        end = time.monotonic() + LIMIT
+        seen, times = None, 0
+        while times < 20:
+            now = self.status("voluntary_ctxt_switches")
+            times = times + 1 if now == seen else 0
+            seen = now
+            if time.monotonic() > end:
+                raise AssertionError("the first thread is never idle")
+            time.sleep(0.01)
 
     def __init__(self, test, words, env, cwd, fifos, descriptors=()):
         self._test = test
@@ -310,10 +334,11 @@ class SystemTest(unittest.TestCase):
         program.screen.wait("Frame Error")
         return program
 
-    def on_other_library(self, script="", run=("-b1",), **variables):
+    def on_other_library(self, script="", run=("-b1",), under=(), **variables):
+        """The program on the other transport library, started by the words in `under`."""
         fifos = {}
         talk = self.fifo(fifos, "talk", "talk")
-        return self.start([LAPDMON, *run], fifos, LD_LIBRARY_PATH=os.path.dirname(OTHER_LIBRARY),
+        return self.start([*under, LAPDMON, *run], fifos, LD_LIBRARY_PATH=os.path.dirname(OTHER_LIBRARY),
                           OTHER_SCRIPT=script, OTHER_TALK=talk, **variables)
 
     def run_tool(self, *words, **options):

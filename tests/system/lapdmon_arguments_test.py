@@ -85,10 +85,18 @@ class Arguments(SystemTest):
         self.assertIn("TSC Component Information{Node 0 Board 0 Processor 1 Component 18 Instance 0}",
                       program.screen.lines())
 
-    def test_a_log_that_cannot_be_created_ends_the_program_without_a_word(self):
-        program = self.on_board(run=("lapdmon", "-b1", "-f", "missing/trace.txt")).ends(status=1)
+    def test_a_log_that_cannot_be_created_ends_the_program_with_the_reason(self):
+        program = self.on_board(run=("lapdmon", "-b1", "-f", "missing/trace.txt")).ends(
+            status=1, errors="lapdmon: cannot open missing/trace.txt: No such file or directory\n")
         self.assertEqual(program.screen.text(), "filename: missing/trace.txt\n")
         self.assertEqual(program.heard(), [])
+
+    def test_a_log_that_another_trace_writes_is_refused_and_left_as_it_is(self):
+        first = self.traces()
+        second = self.on_board().ends(status=1, errors="lapdmon: cannot open lapdmon.log: another trace writes to it\n")
+        self.assertEqual(second.screen.text(), "filename: lapdmon.log\n")
+        self.assertEqual(second.heard(), [])
+        self.assertTrue(first.quits().log().endswith("Frame Error \n"))
 
 
 if __name__ == "__main__":

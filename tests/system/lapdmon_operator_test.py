@@ -1,9 +1,11 @@
 """What ends a trace: the operator's "q", or a signal."""
 
+import os
+import re
 import signal
 import unittest
 
-from harness import SystemTest
+from harness import SystemTest, wait_until_full
 
 OFF = ["26 CancelEvt {Type 2}", "8 SetParm {Parm 10 Val 0}"]
 
@@ -64,15 +66,76 @@ class Operator(SystemTest):
         self.assert_orderly(program.ends())
 
     def test_a_second_signal_kills_a_shutdown_that_hangs(self):
-        for first, second in ((signal.SIGINT, signal.SIGTERM), (signal.SIGTERM, signal.SIGTERM)):
+        for first, second in ((signal.SIGINT, signal.SIGTERM), (signal.SIGTERM, signal.SIGTERM),
+                              (signal.SIGHUP, signal.SIGINT)):
             with self.subTest(f"{first.name}, {second.name}"):
-                program = self.on_other_library("silent=26")  # nobody answers CancelEvt
-                program.screen.wait("Frame Error")
+                program = self.hanging()
                 program.gets(first)
                 program.talk.wait("heard 26")
                 program.gets(second)
                 program.ends(status=-second)
                 self.assertEqual(program.screen.lines()[-1], "One moment. Program Exiting")
+
+    def test_a_signal_kills_a_shutdown_that_q_began_and_that_hangs(self):
+        program = self.hanging()
+        program.types("q")
+        program.talk.wait("heard 26")
+        program.gets(signal.SIGTERM)
+        program.ends(status=-signal.SIGTERM)
+
+    def test_a_SIGHUP_never_ends_a_shutdown(self):
+        """A terminal that closes sends it twice."""
+        for first in (signal.SIGHUP, signal.SIGINT, signal.SIGTERM):
+            with self.subTest(first.name):
+                program = self.hanging()
+                program.gets(first)
+                program.talk.wait("heard 26")
+                program.gets(signal.SIGHUP)
+                program.gets(signal.SIGHUP)
+                program.talk.wait("heard 8", times=2)  # the shutdown goes on: the request timed out
+                program.ends()
+                self.assertEqual(program.screen.lines()[-1], "general Exception caught in lapdmon(215)")
+
+    def test_a_SIGHUP_that_was_ignored_from_the_start_stays_so_whatever_comes(self):
+        program = self.hanging(under=("sh", "-c", 'trap "" HUP; exec "$@"', "sh"))
+        self.assertTrue(self.ignores_SIGHUP(program))
+        program.gets(signal.SIGHUP)
+        program.types("q")
+        program.talk.wait("heard 26")
+        program.gets(signal.SIGHUP)
+        self.assertTrue(self.ignores_SIGHUP(program))
+        program.gets(signal.SIGINT)
+        program.ends(status=-signal.SIGINT)
+
+    def test_a_second_signal_gives_up_a_log_that_nobody_reads(self):
+        """The rest is counted, and nothing is killed."""
+        for first in ("q", signal.SIGINT):
+            with self.subTest(first):
+                path = self.folder / f"log-{str(first)[:3]}"
+                os.mkfifo(path)
+                reader = os.open(path, os.O_RDONLY | os.O_NONBLOCK)
+                self.addCleanup(os.close, reader)
+                program = self.on_board("--rate", "max", "--loop", run=("lapdmon", "-b1", "-f", path.name))
+                wait_until_full(reader)
+                program.types("q") if first == "q" else program.gets(first)
+                program.journal.wait("SetParmCmplt", times=2)
+                # From here on the shutdown only writes out. It may be some steps before that.
+                program.wait_until_idle()
+                program.gets(signal.SIGHUP)
+                program.gets(signal.SIGTERM)
+                program.ends(status=1, errors=re.compile(rf"(?m)^{path.name}: given up, since nobody reads it\n(.*\n)*"
+                                                         rf"{path.name}: frames lost: [1-9]\d*\n"))
+                self.assertEqual(program.heard()[-2:], OFF)
+                self.assertEqual(program.journal.lines()[-1], "buffers outstanding 0, queues open 0")
+
+    def ignores_SIGHUP(self, program):
+        return int(program.status("SigIgn"), 16) >> (signal.SIGHUP - 1) & 1 == 1
+
+    def hanging(self, under=()):
+        """A trace whose shutdown hangs for 5 seconds: nobody answers CancelEvt."""
+        program = self.on_other_library("silent=26", under=under)
+        program.screen.wait("Frame Error")
+        return program
 
 
 if __name__ == "__main__":
