@@ -1,4 +1,4 @@
-// The transport's interface, exported: the library is built with everything else hidden.
+// The transport's interface with its symbols exported. All other symbols of the library are hidden.
 #ifndef SOFTBOARD_ABI_H
 #define SOFTBOARD_ABI_H
 

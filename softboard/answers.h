@@ -1,4 +1,4 @@
-// The commands that a board answers, a row each.
+// The commands that a board answers. Each command is a row of a table.
 #ifndef SOFTBOARD_ANSWERS_H
 #define SOFTBOARD_ANSWERS_H
 
@@ -11,15 +11,15 @@
 
 namespace softboard {
 
-// A command being carried out.
+// A command that a board is carrying out, and the reply that is being made.
 struct Request {
     Board& board;
     Component* component;  // null when the managers are addressed
     Address from;          // the command's source
-    BodyReader body;       // the command's
-    BodyWriter reply;      // the reply's body
+    BodyReader body;       // of the command
+    BodyWriter reply;      // the body of the reply
 
-    // Turns the reply into an error reply; data is what its last field holds.
+    // Makes the board send an error reply with this code instead; `data` becomes its last field.
     void refuse(ErrorCode code, Octets data = {}) {
         error = code;
         errorData = std::move(data);
@@ -31,12 +31,12 @@ struct Request {
 
 using Action = void (*)(Request&);
 
-// Who answers: components, the board's managers, or both.
+// Who answers a command: components, the board's managers, or both.
 enum class At { component, managers, both };
 
 struct Answer {
     uint32_t command;
-    std::optional<uint32_t> reply;  // none: the command is carried out in silence
+    std::optional<uint32_t> reply;  // message type; none if the command has no reply
     At at;
     Action action;
 };
@@ -44,6 +44,7 @@ struct Answer {
 std::span<const Answer> standardAnswers();  // parameters, events
 std::span<const Answer> managerAnswers();   // find, use
 
+// The action of a command that changes nothing in the simulated board. It leaves the reply's body empty.
 void acknowledge(Request& request);
 
 }  // namespace softboard

@@ -1,4 +1,6 @@
-// One board: its managers and components, and what they answer. Not locked: the network that owns it is.
+// One simulated board: its managers and components, and how they answer commands.
+//
+// A board has no lock. The Network that owns it calls it under the network's lock.
 #ifndef SOFTBOARD_BOARD_H
 #define SOFTBOARD_BOARD_H
 
@@ -19,9 +21,10 @@ class Board {
     // The managers' address.
     Address address() const { return {0, number_, 0, 0, 0}; }
     std::deque<Component>& components() { return components_; }
+    // Null when no component has the address. The board keeps the ownership.
     Component* at(const Address& address);
 
-    // Carries the command out; none for a command that has no reply.
+    // Carries the command out and returns the reply; none for a command that has no reply.
     std::optional<Message> answer(const Message& command);
 
   private:

@@ -10,11 +10,12 @@ namespace softboard {
 
 namespace {
 
-constexpr size_t remembered = 256;
-constexpr size_t fewBuckets = 4096;
+constexpr size_t remembered = 256;   // freed buffers that are kept
+constexpr size_t fewBuckets = 4096;  // a table of this size is not worth shrinking
 constexpr auto freedOctet = std::byte{0xdd};
 
-// The address sanitizer keeps freed memory back by itself, and reports whoever touches it.
+// The address sanitizer itself keeps freed memory for a while and reports who touches it. Then the memory is
+// freed at once, so that the sanitizer can do so.
 #if defined(__SANITIZE_ADDRESS__)
 constexpr bool keepsMemory = false;
 #else
@@ -121,7 +122,7 @@ void Buffers::retire(Entries::const_iterator entry) {
         freed_.pop_front();
     }
     if (live_.bucket_count() > fewBuckets && live_.size() < live_.bucket_count() / 64) {
-        live_.rehash(0);  // a backlog's table goes with it
+        live_.rehash(0);  // a backlog has been freed: give the memory of its large table back
     }
     fewer_.notify_all();
 }

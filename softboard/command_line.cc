@@ -9,8 +9,8 @@ namespace softboard {
 namespace {
 
 const char* const examples =
-    R"(PROGRAM is looked for beside softboard, then on PATH; it gets its own arguments, standard input, signals and exit
-status. Without options a built-in capture of calls plays on D channel 1 of board 1, again and again.
+    R"(softboard looks for PROGRAM in its own folder, then on PATH. Standard input, signals and exit status are those of
+PROGRAM. Without options, a built-in capture of calls plays on D channel 1 of board 1 again and again.
 
 Examples:
   softboard -- lapdmon -b1
@@ -20,7 +20,7 @@ Examples:
   softboard --board 3 --dchannels 2 --rate max -- lapdmon -b3 -d2
       as fast as the program reads, once
   softboard --scenario two.toml --journal talk.txt -- lapdmon -b1 -d2
-      a file tells what is on each D channel; talk.txt shows every message
+      a file with settings for each D channel; every message is written to talk.txt
 
 Exit status: that of PROGRAM; 2 for a bad option, file or capture (PROGRAM is not started); 126 when PROGRAM cannot
 be executed, 127 when it is not found.
@@ -33,7 +33,8 @@ class Help : public CLI::Formatter {
     }
 };
 
-// CLI11 hands over the text; the setting is what `parse` makes of it.
+// Adds an option whose text becomes a setting by `parse`. A BadInput of `parse` becomes CLI11's error, with
+// the name of the option.
 template <class T, class Parse>
 void addParsed(CLI::App& app, const char* name, std::optional<T>& setting, Parse parse, const char* help,
                const char* form) {
@@ -75,7 +76,7 @@ void addOptions(CLI::App& app, CommandLine& to) {
         "How many D channels the board has, numbered from 1 (default: 1)", "N");
     app.add_option(
            "--scenario", to.scenario,
-           "TOML file with these settings, and D channels with frames of their own; options come first")
+           "TOML file with these settings, also for each D channel; options override those at its top")
         ->type_name("FILE");
     app.add_option("--journal", to.journal, "Write every message between program and board to FILE")
         ->type_name("FILE");
@@ -90,7 +91,7 @@ void addOptions(CLI::App& app, CommandLine& to) {
                    }
                }
            },
-           "Something that board or library do wrong, from the list below; may be given again and again")
+           "Something that the board or the library does wrong (list below); may be given several times")
         ->expected(1)
         ->take_all()
         ->type_name("NAME[=N]");
@@ -98,9 +99,9 @@ void addOptions(CLI::App& app, CommandLine& to) {
     app.set_version_flag("--version", "softboard " SOFTBOARD_VERSION, "Print the version and exit");
 }
 
-// One line for each fault; the number in brackets is the one that is meant when none is given.
+// The list of faults in the help, a line each.
 std::string faultList() {
-    std::string list = "Faults (N counts from 1; the number when there is none in brackets):\n";
+    std::string list = "Faults (N counts from 1; the number in brackets is used if none is given):\n";
     for (const FaultName& row : faultNames()) {
         std::string form = std::string("  ") + row.name;
         if (row.takesNumber) {
@@ -125,7 +126,7 @@ CommandLine parseCommandLine(const std::vector<std::string>& arguments) {
     addOptions(app, commandLine);
     const auto separator = std::find(arguments.begin(), arguments.end(), "--");
     std::vector<std::string> options(arguments.begin(), separator);
-    std::reverse(options.begin(), options.end());  // as CLI11 takes them
+    std::reverse(options.begin(), options.end());  // CLI11 takes the last word first
     try {
         app.parse(options);
     } catch (const CLI::CallForHelp&) {

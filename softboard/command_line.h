@@ -10,19 +10,20 @@
 namespace softboard {
 
 struct CommandLine {
-    std::string told;  // --help or --version: what to print instead of running anything
+    std::string told;  // for --help or --version: the text to print instead of starting the program
     Settings settings;
     std::optional<uint32_t> dchannels;
     std::optional<std::string> scenario;
     std::optional<std::string> journal;
-    std::vector<Fault> faults;         // beside those of the scenario file
-    std::vector<std::string> program;  // with its arguments
+    std::vector<Fault> faults;         // those of the scenario file are added to them
+    std::vector<std::string> program;  // the program and its arguments
 };
 
-// Without argv[0]; throws BadInput.
+// `arguments` are those of the launcher, without argv[0]. Throws BadInput.
 CommandLine parseCommandLine(const std::vector<std::string>& arguments);
 
-// What to play, captures read and the journal's path made absolute; throws BadInput.
+// Makes the scenario that the command line asks for: reads the scenario file and the captures, and makes the
+// journal's path absolute. Throws BadInput.
 Scenario scenarioOf(const CommandLine& commandLine);
 
 }  // namespace softboard

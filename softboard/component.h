@@ -1,4 +1,7 @@
-// One component instance of a board: its parameters, its subscriptions, and the frames it has to report.
+// One component instance of a board: its parameters, the subscriptions to its events, and the frames that it
+// plays.
+//
+// A component has no lock. The Network calls it under the network's lock.
 #ifndef SOFTBOARD_COMPONENT_H
 #define SOFTBOARD_COMPONENT_H
 
@@ -13,11 +16,13 @@ namespace softboard {
 
 struct Parameter {
     uint32_t value = 0;
-    uint32_t largest = 0;  // that may be set
+    uint32_t largest = 0;  // the largest value that a host may set
     bool settable = false;
     std::string text;
 };
 
+// Events of type `event` are sent to the host queue with the address `returnTo`. Events of type `event` are
+// sent to the host queue with the address `returnTo`.
 struct Subscription {
     uint32_t event = 0;
     Address returnTo;
@@ -28,22 +33,25 @@ struct Component {
     uint8_t type = 0;
     std::map<uint32_t, Parameter> parameters;
     std::vector<Subscription> subscriptions;
-    std::optional<Player> player;  // of a D channel
-    uint32_t label = 0;            // of its trace events
-    bool played = false;           // since the trace was switched on: it plays once
+    std::optional<Player> player;  // a D channel has one
+    uint32_t label = 0;            // the first field of its trace events
+    bool played = false;           // the player was started since the trace was switched on
 
     void subscribe(uint32_t event, const Address& returnTo);
     void cancel(uint32_t event, const Address& returnTo);
-    // Ends all that would go to the address.
+    // Ends all subscriptions of the address.
     void forget(const Address& returnTo);
 
-    // Where trace events go.
+    // The addresses that are subscribed to trace events.
     std::vector<Address> traceTargets() const;
-    // Starts or stops the player as parameters and subscriptions say.
+    // Starts the player when the trace parameter is 1 and somebody is subscribed to trace events; stops it
+    // when one of the two has ended. A player that has come to its end is not started again until then.
     void updatePlayer(Player::Time now);
 };
 
+// The telephony service component of a board.
 Component tscComponent(uint8_t board);
+// The component of a D channel, which plays the frames.
 Component ccsComponent(const DChannel& channel, std::shared_ptr<const Frames> frames);
 
 }  // namespace softboard

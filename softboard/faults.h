@@ -1,4 +1,4 @@
-// What the board and its library can be told to do wrong: each fault has a name and, most of them, a number.
+// Faults: what the boards and the library can be told to do wrong. docs/user/softboard.md describes each.
 #ifndef SOFTBOARD_FAULTS_H
 #define SOFTBOARD_FAULTS_H
 
@@ -35,7 +35,8 @@ enum class FaultKind {
 
 struct Fault {
     FaultKind kind{};
-    uint32_t argument = 0;
+    uint32_t argument = 0;  // the N of NAME=N; 0 for a fault that takes no number  // the N of NAME=N; 0 for
+                            // a fault that takes no number
 
     bool operator==(const Fault&) const = default;
 };
@@ -44,17 +45,18 @@ struct FaultName {
     FaultKind kind;
     const char* name;
     bool takesNumber;
-    uint32_t otherwise;  // the number that is meant when none is given
-    uint32_t least;
+    uint32_t otherwise;  // the number if none is given
+    uint32_t least;      // the numbers that are allowed: least to most
     uint32_t most;
     const char* help;
 };
 
-// All of them, a row each.
+// The table of all faults.
 std::span<const FaultName> faultNames();
 
-// "NAME" or "NAME=NUMBER"; throws std::invalid_argument with a sentence that says what is wrong.
+// Reads "NAME" or "NAME=NUMBER". Throws std::invalid_argument with a sentence that says what is wrong.
 Fault parseFault(const std::string& text);
+// The text that parseFault reads.
 std::string toText(const Fault& fault);
 
 }  // namespace softboard

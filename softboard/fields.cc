@@ -6,7 +6,7 @@
 
 namespace softboard {
 
-static_assert(std::endian::native == std::endian::little, "elements are moved as they stand");
+static_assert(std::endian::native == std::endian::little, "elements are moved without changing their octets");
 
 namespace {
 
@@ -24,7 +24,8 @@ uint32_t elementSize(uint32_t type) {
     }
 }
 
-// Where the field begins, and the offset past it; false when it is not whole inside `size` octets.
+// Sets `begin` to the place of a field of so many octets and advances the offset past it. Returns false when
+// the field is not wholly inside a body of `size` octets; the offset advances all the same.
 bool advance(size_t size, uint32_t& offset, uint32_t octets, uint32_t& begin) {
     begin = offset;
     offset += octets;

@@ -1,4 +1,4 @@
-// The run of body fields that nvMsgVarFieldGet and nvMsgVarFieldPut move.
+// Moves one field of a body, as nvMsgVarFieldGet and nvMsgVarFieldPut do for each of their descriptors.
 #ifndef SOFTBOARD_FIELDS_H
 #define SOFTBOARD_FIELDS_H
 
@@ -7,11 +7,13 @@
 
 namespace softboard {
 
-// Octets that a descriptor stands for: bits 11 to 18 element count less one, bits 19 to 23 element type.
+// The size in octets of the field that a descriptor describes. Bits 11 to 18 are the number of elements less
+// one, bits 19 to 23 the element type.
 uint32_t fieldOctets(uint32_t descriptor);
 
-// One field between the body at offset and the caller's storage. The offset advances past the field even when
-// it does not lie whole inside the body; then nothing is moved and the result is false.
+// getField copies a field from the body at `offset` to the caller's storage, putField the other way. The
+// offset advances past the field in any case. If the field is not wholly inside the body, nothing is copied
+// and the result is false.
 bool getField(std::span<const uint8_t> body, uint32_t& offset, uint32_t descriptor, void* storage);
 bool putField(std::span<uint8_t> body, uint32_t& offset, uint32_t descriptor, const void* storage);
 

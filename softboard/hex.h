@@ -11,7 +11,7 @@
 namespace softboard {
 
 std::string hex(std::span<const uint8_t> octets);
-// Throws std::invalid_argument for what is no hexadecimal or ends within an octet.
+// Throws std::invalid_argument for an odd number of characters and for any character but 0 to 9 and a to f.
 std::vector<uint8_t> fromHex(std::string_view text);
 
 }  // namespace softboard

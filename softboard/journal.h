@@ -1,4 +1,7 @@
-// A record of every message between host and board, in order. Safe from any thread.
+// The journal: every message between host and boards as a line of text, in the order in which the board saw
+// them. docs/user/softboard.md gives the form.
+//
+// Any thread may call any function; the class has a lock of its own.
 #ifndef SOFTBOARD_JOURNAL_H
 #define SOFTBOARD_JOURNAL_H
 
@@ -15,6 +18,7 @@ namespace softboard {
 
 class Journal {
   public:
+    // From whom to whom. "Nobody": no board or host queue has the target address.
     enum class Way { hostToBoard, boardToHost, hostToHost, hostToNobody, boardToNobody };
 
     Journal() = default;
@@ -22,27 +26,29 @@ class Journal {
     Journal(const Journal&) = delete;
     Journal& operator=(const Journal&) = delete;
 
-    // From now on each line also goes to the end of the file at once. False, with errno, when it cannot.
+    // From now on appends each new line to the file at once. Returns false, with errno set, when the file
+    // cannot be opened.
     bool writeTo(const std::string& file);
 
     void add(Way way, const Message& message);
-    // A line that is no message.
+    // Adds a line that is not about a message.
     void note(const std::string& text);
 
-    // The lines as they stand in the file; the newest 65536 of them.
+    // All lines as they are in the file. Only the newest 65536 are kept in memory.
     std::string text() const;
-    // What the host has sent, as "8 {Parm 10 Val 1}\n" each.
+    // Only the messages that the host has sent to boards, a line each: "8 {Parm 10 Val 1}\n".
     std::string heard() const;
+    // Empties the memory, not the file.
     void clear();
 
-    // Waits until `count` messages of the type have been recorded since clear(); false when `limit` passed
-    // first.
+    // Waits until `count` messages of the type have been added since clear(). Returns false when `limit` has
+    // passed before.
     bool waitFor(uint32_t type, size_t count, std::chrono::milliseconds limit) const;
 
   private:
     struct Line {
         std::string text;
-        std::string heard;  // empty for what the host did not send
+        std::string heard;  // empty when the host did not send the message
     };
 
     void append(Line line);

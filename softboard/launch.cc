@@ -21,7 +21,8 @@ namespace fs = std::filesystem;
 constexpr int notExecutable = 126;
 constexpr int notFound = 127;
 
-// Shells keep the low numbers for themselves.
+// The descriptor of the scenario's file is at least this, because a shell that is the program may use the low
+// numbers for files of its own.
 constexpr int firstDescriptor = 100;
 
 void startJournal(const std::string& path) {
@@ -46,7 +47,8 @@ void writeWhole(int file, const std::string& text) {
     }
 }
 
-// A file in memory that lives on in the program and in what it starts; each opens it for itself by this path.
+// Writes the scenario into a file in memory and returns its path. The descriptor stays open in the program
+// and in the processes that the program starts, so each of them can open the file by this path.
 std::string handOver(const Scenario& scenario) {
     int file = ::memfd_create("softboard-scenario", 0);
     if (file < 0) {

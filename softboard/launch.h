@@ -1,4 +1,4 @@
-// Starting a program on the software board.
+// Starts a program on the software board.
 #ifndef SOFTBOARD_LAUNCH_H
 #define SOFTBOARD_LAUNCH_H
 
@@ -10,9 +10,12 @@
 
 namespace softboard {
 
-// Becomes the program. `self` is the launcher's own path: the library stands in ../lib/lapdmon beside it, and
-// a program named without a slash may stand there too. Returns the exit status, having said why, only when
-// the program could not be started; throws BadInput when the journal or the library is at fault.
+// Replaces this process by the program, with the library and the scenario in its environment. `self` is the
+// path of the launcher. The library is in ../lib/lapdmon, seen from the launcher's folder. A program that is
+// named without a slash is looked for in the launcher's folder first, then on PATH.
+//
+// Returns only when the program could not be started: the exit status, after a line on the standard error
+// stream. Throws BadInput when the journal cannot be written or the library is missing.
 int launch(const std::filesystem::path& self, const Scenario& scenario,
            const std::vector<std::string>& program);
 

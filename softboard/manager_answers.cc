@@ -1,4 +1,4 @@
-// What a board's managers answer: finding components and reserving them.
+// The commands that a board's managers answer: finding components and reserving them.
 #include <algorithm>
 #include <tuple>
 #include <vector>
@@ -22,7 +22,8 @@ struct Search {
     }
 };
 
-// A count, then key and value of each; keys other than the component type do not narrow the search.
+// Reads a count, and then a key and a value for each attribute. Only the component type narrows the search;
+// other keys are ignored.
 void readAttributes(BodyReader& body, Search& search) {
     for (uint32_t left = body.u32(); left > 0 && body.ok(); --left) {
         const uint32_t key = body.u32();
@@ -57,7 +58,8 @@ void find(Request& request) {
 // The order in which components are listed.
 auto place(const Address& a) { return std::tuple(a.node, a.board, a.processor, a.component, a.instance); }
 
-// Those from the first address to the last, in order; a reply that does not hold them all names the next one.
+// Lists the components from the first address to the last, in order. A reply holds mostFound of them; it
+// names the next one, or address 0 when there are no more.
 void findAll(Request& request) {
     const Address first = request.body.address();
     const Address last = request.body.address();

@@ -1,4 +1,4 @@
-// A transport message as the board sees it: a value, no buffer.
+// A transport message as a value. Unlike a message buffer it can be copied, and nobody has to free it.
 #ifndef SOFTBOARD_MESSAGE_H
 #define SOFTBOARD_MESSAGE_H
 
@@ -11,7 +11,7 @@
 
 namespace softboard {
 
-// Where a component instance, a manager (0, board, 0, 0, 0) or a host queue is.
+// The address of a component instance, of a board's managers (0, board, 0, 0, 0) or of a host queue.
 struct Address {
     uint16_t instance = 0;
     uint8_t board = 0;
@@ -30,14 +30,16 @@ std::string toString(const Address& address);
 using Octets = std::vector<uint8_t>;
 
 struct Message {
-    uint32_t transaction = 0;  // the header's word: bits 8 to 31 the id, bits 0 to 7 carried along
+    uint32_t transaction =
+        0;  // the header's word: bits 8 to 31 are the number, bits 0 to 7 the library's own
     uint32_t type = 0;
     Address source;
     Address target;
     Octets body;
 };
 
-// To and from a buffer, which must hold nv.size octets of body.
+// Reads a message from a buffer, which holds nv.size octets of body; writes a message into a buffer, which
+// must have room for the message's body.
 Message messageOf(const NvMsg32Bit& nv);
 void store(const Message& message, NvMsg32Bit& nv);
 

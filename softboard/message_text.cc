@@ -22,7 +22,7 @@ struct Field {
 struct Row {
     uint32_t type;
     const char* name;
-    std::array<Field, 5> fields{};  // ends at the first without a label
+    std::array<Field, 5> fields{};  // up to the first field without a label
 };
 
 constexpr auto number = Kind::number;
@@ -76,7 +76,7 @@ const Row* rowOf(uint32_t type) {
     return row == std::end(rows) ? nullptr : row;
 }
 
-// A count, then key and value of each.
+// Reads a count, and then a key and a value for each attribute.
 std::string attributesText(BodyReader& body) {
     std::string text;
     for (uint32_t left = body.u32(); left > 0 && body.ok() && body.left() > 0; --left) {

@@ -1,4 +1,4 @@
-// Messages as text, for the journal.
+// Messages as text, in the form of the journal.
 #ifndef SOFTBOARD_MESSAGE_TEXT_H
 #define SOFTBOARD_MESSAGE_TEXT_H
 
@@ -9,12 +9,12 @@
 
 namespace softboard {
 
-// "SetParm"; "?" for a type that has no name here, "Wake" for the message without type or body with which a
-// host wakes its own reader.
+// The name of the message's type, for example "SetParm"; "?" for a type without a name in the table. A
+// message of type 0 without a body is "Wake": a host sends it to its own queue to wake its reader thread.
 std::string messageName(const Message& message);
 
-// "{Parm 10 Val 1}". What a body holds beyond its known fields follows as "+" and octets in hexadecimal; a
-// field that is missing ends the text with "...". An empty body is "{}".
+// The fields of the body, for example "{Parm 10 Val 1}"; "{}" for an empty body. Octets after the known
+// fields follow as "+" and hexadecimal digits. If the body ends before a field, the text ends with "...".
 std::string bodyText(const Message& message);
 
 }  // namespace softboard

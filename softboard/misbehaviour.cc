@@ -19,7 +19,7 @@ constexpr uint16_t otherInstance = 0x4000;
 constexpr size_t labelAt = 0;
 constexpr size_t lengthAt = 12;
 
-// The word of an event's body, if it is there.
+// Changes the 32-bit word at this offset of the body; does nothing if the body ends before the word does.
 void setWord(Octets& body, size_t at, uint32_t value) {
     const Octets word = BodyWriter().u32(value).take();
     if (at + word.size() <= body.size()) {

@@ -1,4 +1,4 @@
-// Where the faults of a scenario take hold.
+// Applies the faults of a scenario to what the network does.
 #ifndef SOFTBOARD_MISBEHAVIOUR_H
 #define SOFTBOARD_MISBEHAVIOUR_H
 
@@ -13,28 +13,30 @@ namespace softboard {
 
 using Messages = std::vector<Message>;
 
-// What a network without faults would do goes in, what it does instead comes out. Not locked: the network
-// that owns it is.
+// The network tells what it would do without faults, and is told what to do instead. The class has no lock:
+// the Network that owns it calls it under the network's lock.
 class Misbehaviour {
   public:
-    // Events that are wrong come beside the right ones: before the first frame and before each hundredth
-    // after it, so that what is right can still be looked for whole.
+    // A wrong event is sent in addition to the right ones, before the first frame and before each hundredth
+    // after it. So a test can still look for every right event.
     static constexpr uint64_t framesBetween = 100;
 
     Misbehaviour() = default;
     explicit Misbehaviour(std::vector<Fault> faults);
 
-    // Whether this call of the library fails; `kind` says which call it is, and each one counts.
+    // Whether this call of the library fails. `kind` is the fault of that call (openFails, for example);
+    // every call counts, and the fault's number says which one fails.
     bool fails(FaultKind kind);
-    // What is sent instead of the reply to the command.
+    // The messages to send instead of the reply to the command: none, one or several.
     Messages repliesFor(const Message& command, const Message& reply);
-    // What is sent ahead of a frame's event.
+    // The wrong events to send before the event of a frame. Call it once for every event of a frame.
     Messages aheadOf(const Message& event);
-    // What is sent before and once more after the reply to the command.
+    // The events to send before the reply to the command, and to send again after it.
     Messages beside(const Message& command) const;
 
-    // Frames still to be sent at once, the one at hand included.
+    // Whether the next frame belongs to a burst, and is sent without waiting.
     bool bursting() const;
+    // Whether the boards have fallen silent: no frames, no replies, no command carried out.
     bool silent() const;
     bool has(FaultKind kind) const { return argument(kind).has_value(); }
 
@@ -46,8 +48,8 @@ class Misbehaviour {
     std::map<FaultKind, uint64_t> calls_;
     uint64_t replies_ = 0;
     uint64_t events_ = 0;
-    Messages late_;
-    std::optional<Message> lastEvent_;
+    Messages late_;                     // replies to send with the next reply
+    std::optional<Message> lastEvent_;  // the event that eventsWhileStopping sends again
 };
 
 }  // namespace softboard

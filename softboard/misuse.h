@@ -1,4 +1,4 @@
-// What a program must not do with the transport: said on the standard error stream, then the process aborts.
+// Ends a process that misuses the transport library.
 #ifndef SOFTBOARD_MISUSE_H
 #define SOFTBOARD_MISUSE_H
 
@@ -6,7 +6,8 @@
 
 namespace softboard {
 
-// `function` is the transport call that was misused.
+// Writes "softboard: FUNCTION: WHAT" to the standard error stream and aborts the process. `function` is the
+// transport function that was called.
 [[noreturn]] void misuse(const char* function, const std::string& what);
 
 }  // namespace softboard

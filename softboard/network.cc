@@ -11,10 +11,11 @@ namespace softboard {
 
 namespace {
 
-// A frame waits while so many messages wait in the queue that it is for.
+// A frame waits while this many messages wait unread in a queue that it is for.
 constexpr size_t mostWaiting = 64;
-// So many frames in a row leave those who write, read and close no moment. Each such moment costs a time
-// slice where processors are taken.
+// After this many frames in a row the playing thread gives the lock back for a moment, so that hosts can
+// read, write and close. It does not do so after each frame, because on a busy machine each yield costs a
+// time slice.
 constexpr unsigned mostInARow = 16;
 
 }  // namespace
@@ -79,7 +80,7 @@ uint32_t Network::bindQueue(uint32_t handle, NvCompDesc& host) {
         return NVSTATUS_ERROR;
     }
     host = compDescOf(queues_.bind(*queue));
-    changed_.notify_all();  // frames may have waited for this address
+    changed_.notify_all();  // frames may wait for a queue with this address
     return NVSTATUS_OK;
 }
 
@@ -108,7 +109,7 @@ void Network::closeQueue(uint32_t handle) {
     queue->waiting.clear();
 }
 
-// Ends what boards would send to the address.
+// Ends all subscriptions of the address, on all boards.
 void Network::forget(const Address& host) {
     for (auto& [number, board] : boards_) {
         for (Component& component : board.components()) {
@@ -157,7 +158,7 @@ void Network::write(uint32_t handle, NvMsg32Bit* msg) {
     toBoard(message);
 }
 
-// A board that is not there does not answer.
+// A command to a board that does not exist is lost, as with an empty slot: the host's time-out ends the wait.
 void Network::toBoard(const Message& command) {
     const auto board = boards_.find(command.target.board);
     if (board == boards_.end() || command.target.node != board->second.address().node) {
@@ -232,7 +233,8 @@ void Network::updatePlayers() {
     changed_.notify_all();
 }
 
-// Tried once: called for a C program, which has no use for an exception and none for the same line again.
+// The transport's functions are called by C programs, so a thread that cannot be made is reported on the
+// standard error stream and not by an exception. It is tried and reported once only.
 void Network::startPlaying() {
     if (player_.joinable() || ending_ || threadless_) {
         return;
@@ -245,8 +247,9 @@ void Network::startPlaying() {
     }
 }
 
-// Whether somebody receives the component's frames and nobody who does is behind. Without a queue to fill,
-// nothing would ever slow them down.
+// Whether the component's next frame may be sent: at least one subscribed queue exists, and none of them has
+// mostWaiting unread messages. Frames are not sent to nobody, because then nothing would slow the player
+// down.
 bool Network::heard(const Component& component) const {
     bool any = false;
     const bool waits = !misbehaviour_.bursting() && !misbehaviour_.has(FaultKind::neverWaits);
@@ -260,7 +263,7 @@ bool Network::heard(const Component& component) const {
     return any;
 }
 
-// The component whose frame is due first, of those that are heard.
+// Of the components whose next frame may be sent, the one whose frame is due first; null when there is none.
 Component* Network::nextPlaying() {
     Component* next = nullptr;
     for (auto& [number, board] : boards_) {

@@ -1,4 +1,5 @@
-// Which frame of a D channel comes next, and when. No thread and no clock of its own.
+// Decides which frame of a D channel comes next, and when. A player has no thread and no clock: its caller
+// tells it the time, and locks it.
 #ifndef SOFTBOARD_PLAYER_H
 #define SOFTBOARD_PLAYER_H
 
@@ -16,22 +17,24 @@ class Player {
 
     struct Shown {
         const Frame* frame = nullptr;
-        uint32_t ticks = 0;  // the board's clock: from the first frame on, through all rounds of a loop
+        uint32_t ticks =
+            0;  // the board's clock: 4 ms since the first frame, counted on through a loop's rounds
     };
 
-    // Time between the last frame of a round and the first of the next, at recorded rate.
+    // How long a loop pauses between its rounds, at recorded rate.
     static constexpr uint32_t ticksBetweenRounds = 250;
 
     Player(std::shared_ptr<const Frames> frames, Rate rate, bool loop);
 
-    // From the first frame; nothing when it plays already.
+    // Begins with the first frame. Does nothing when the player is playing or has no frames.
     void start(Time now);
     void stop() { playing_ = false; }
     bool playing() const { return playing_; }
 
-    // When the next frame is due. While playing only.
+    // When the next frame is due. Call it only while playing.
     Time due() const;
-    // The next frame; after the last one of all the player has stopped.
+    // Returns the next frame and moves on. After the last frame the player stops, unless it loops. Call it
+    // only while playing.
     Shown next(Time now);
 
   private:
@@ -42,10 +45,10 @@ class Player {
     bool loop_;
     bool playing_ = false;
     Time started_;
-    Time last_;
-    size_t position_ = 0;
-    uint64_t shown_ = 0;
-    uint64_t roundStart_ = 0;  // in ticks
+    Time last_;                // when the frame before was taken
+    size_t position_ = 0;      // of the next frame
+    uint64_t shown_ = 0;       // frames since start()
+    uint64_t roundStart_ = 0;  // in ticks since start()
 };
 
 }  // namespace softboard

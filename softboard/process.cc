@@ -37,7 +37,7 @@ Scenario loadScenario() {
 
 Network* make() {
     const Scenario scenario = loadScenario();
-    auto* network = new Network(scenario);  // for as long as the process lives
+    auto* network = new Network(scenario);  // never deleted: it lives as long as the process
     if (!scenario.journal.empty() && !network->journal().writeTo(scenario.journal)) {
         std::cerr << "softboard: " << scenario.journal << ": " << std::strerror(errno) << std::endl;
     }
@@ -45,7 +45,7 @@ Network* make() {
     return network;
 }
 
-// After the program's own exit handlers and destructors.
+// Runs after the program's own exit handlers and destructors. Writes the last line of the journal.
 __attribute__((destructor)) void tearDown() {
     if (Network* network = made; network != nullptr) {
         network->shutDown();

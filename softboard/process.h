@@ -6,8 +6,9 @@
 
 namespace softboard {
 
-// Plays the scenario that the launcher left, or the built-in one. Never destroyed: threads of the program may
-// wait in a queue until the very end.
+// The first call makes the network, with the scenario that the launcher handed over or the built-in one. It
+// ends the process when the scenario cannot be read. The network is never destroyed, because threads of the
+// program may wait in a queue until the process ends.
 Network& network();
 
 }  // namespace softboard

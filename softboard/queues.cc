@@ -8,9 +8,9 @@ namespace softboard {
 
 namespace {
 
-// Past NVSTATUS_ERROR, which nvQueueOpen returns for none.
+// No handle is NVSTATUS_ERROR, because nvQueueOpen returns that when it opens no queue.
 constexpr uint32_t firstHandle = 100;
-// Boards are at node 0.
+// Boards have node 0, so that no host address is a board's.
 constexpr uint8_t hostNode = 1;
 
 }  // namespace

@@ -1,4 +1,6 @@
-// The host's message queues. Not locked: the network that owns them is.
+// The host's message queues.
+//
+// The classes have no lock. The Network that owns them calls them under the network's lock.
 #ifndef SOFTBOARD_QUEUES_H
 #define SOFTBOARD_QUEUES_H
 
@@ -17,27 +19,29 @@ struct Queue {
     bool bound = false;
     bool everBound = false;
     Address host;
-    std::deque<NvMsg32Bit*> waiting;  // owned by the library
-    std::condition_variable arrived;  // a message, or the close
+    std::deque<NvMsg32Bit*> waiting;  // unread messages; the library owns their buffers
+    std::condition_variable arrived;  // a message has arrived, or the queue was closed
 };
 
-// Handles are never used twice, so that a call on a closed queue is told from one on a queue of somebody
-// else.
+// A handle is never used again for another queue, so that a call on a closed queue does not reach a queue
+// that was opened later.
 class Queues {
   public:
     Queues();
 
     uint32_t open();
-    // Null for a queue that was closed; a handle that never was one is misuse.
+    // Null for a queue that was closed. A number that never was a handle is misuse, reported under the name
+    // of the transport function.
     std::shared_ptr<Queue> find(const char* function, uint32_t handle) const;
-    // As find, and a closed queue is misuse too.
+    // The same, but a closed queue is misuse as well; never null.
     std::shared_ptr<Queue> get(const char* function, uint32_t handle) const;
-    // The queue ends; a reader that waits in it still holds it.
+    // Closes the queue and wakes its readers. A reader that waits in it keeps the object alive until it
+    // returns.
     void close(uint32_t handle);
 
-    // A host address that no other queue has.
+    // Gives the queue a host address that no other queue has, and returns it.
     Address bind(Queue& queue);
-    // The queue that receives at the address; null when there is none.
+    // The queue that is bound to the address; null when there is none.
     Queue* at(const Address& host) const;
 
     size_t openCount() const { return queues_.size(); }

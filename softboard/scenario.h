@@ -1,4 +1,4 @@
-// What the software board simulates: boards, their D channels and the frames on them.
+// A scenario: what the software board simulates. Boards, their D channels, and the frames on them.
 #ifndef SOFTBOARD_SCENARIO_H
 #define SOFTBOARD_SCENARIO_H
 
@@ -24,7 +24,7 @@ using Frames = std::vector<Frame>;
 struct Rate {
     enum class Kind { recorded, perSecond, max };
 
-    // In frames a second; outside of them time would overflow.
+    // The limits, in frames a second. Beyond them the computation of times would overflow.
     static constexpr double slowest = 1e-6;
     static constexpr double fastest = 1e6;
     static constexpr bool isPossible(double perSecond) {
@@ -42,34 +42,36 @@ enum Protocol : uint32_t { att4ess = 1, att5ess = 2, dms100 = 3, ntt = 4, net5 =
 struct DChannel {
     uint8_t board = 1;
     uint16_t number = 1;       // of the CCS instance
-    uint32_t protocol = net5;  // value of the protocol parameter
+    uint32_t protocol = net5;  // value of the protocol parameter: one of Protocol, or any other number: one
+                               // of Protocol, or any other number
     Rate rate;
     bool loop = false;
     uint32_t label = 2;  // first field of each trace event
-    size_t capture = 0;  // which of the scenario's captures plays on it
+    size_t capture = 0;  // index into the scenario's captures: the frames of this D channel
 
     bool operator==(const DChannel&) const = default;
 };
 
-// A board is there when it has a D channel.
+// The boards are those that the D channels name.
 struct Scenario {
     std::vector<DChannel> channels;
     std::vector<Frames> captures;
     std::vector<Fault> faults;
-    std::string journal;  // file that the journal is also written to; empty: none
+    std::string journal;  // path of the file that the journal is written to; empty: no file
 
     bool operator==(const Scenario&) const = default;
 };
 
-// One D channel of board 1 with one capture; what tests start from.
+// Board 1 with D channel 1, which plays the frames. Tests use it.
 Scenario oneChannel(Frames frames, Rate rate = {Rate::Kind::max, 0});
 
-// Board 1, D channel 1, the built-in capture again and again at recorded rate.
+// Board 1 with D channel 1, which plays the built-in capture again and again at recorded rate.
 Scenario builtinScenario();
-// A trunk of protocol net5: the link comes up, calls, keep-alives.
+// The built-in capture: the frames of examples/net5.frames.
 const Frames& builtinFrames();
 
-// The text form in which the launcher hands a scenario to the library; fromJson throws std::runtime_error.
+// The text in which the launcher hands a scenario to the library. fromJson throws std::runtime_error for a
+// text that is no scenario.
 std::string toJson(const Scenario& scenario);
 Scenario fromJson(const std::string& text);
 

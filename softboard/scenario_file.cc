@@ -14,7 +14,7 @@ namespace softboard {
 
 namespace {
 
-// Reads one table; every key must be one that was asked for.
+// Reads one table of the file. A key that nobody has asked for when the table ends is an error.
 class TableReader {
   public:
     TableReader(const std::string& path, const toml::table& table) : path_(path), table_(table) {}
@@ -58,7 +58,7 @@ class TableReader {
         return node->value<std::string>();
     }
 
-    // A path that counts from the scenario file's folder.
+    // A path; a relative one is relative to the folder of the scenario file.
     std::optional<std::string> file(const char* key) {
         auto name = text(key);
         if (name) {

@@ -12,7 +12,7 @@ namespace {
 
 using nlohmann::json;
 
-// A path may hold any octet but 0, and JSON none that are not UTF-8.
+// Paths are written in hexadecimal, because a path may contain octets that are not UTF-8 and JSON may not.
 std::string pathToHex(const std::string& path) { return hex(std::vector<uint8_t>(path.begin(), path.end())); }
 
 std::string pathFromHex(const std::string& text) {
@@ -20,7 +20,8 @@ std::string pathFromHex(const std::string& text) {
     return {octets.begin(), octets.end()};
 }
 
-// Whole and in range; the JSON library would convert whatever is there.
+// Reads a whole number that the type can hold, and throws for any other value. (The JSON library would
+// convert it.)
 template <typename Number>
 Number numberFrom(const json& from) {
     constexpr uint64_t most = std::numeric_limits<Number>::max();

@@ -26,12 +26,12 @@ std::optional<T> parseNumber(const std::string& text) {
     return value;
 }
 
-// The captures of a scenario, each read once.
+// Adds captures to a scenario. A capture that several D channels play is read once.
 class Captures {
   public:
     explicit Captures(Scenario& scenario) : scenario_(scenario) {}
 
-    // The built-in capture when there is no path.
+    // The index of the capture in the scenario; without a path, of the built-in capture.
     size_t indexOf(const std::optional<std::string>& path) {
         const auto [known, isNew] = known_.try_emplace(path, scenario_.captures.size());
         if (isNew) {

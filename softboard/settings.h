@@ -1,4 +1,5 @@
-// What the command line and the scenario file may say, as far as they say it.
+// The settings of the command line and of a scenario file, before they become a Scenario. A setting that was
+// not given is empty.
 #ifndef SOFTBOARD_SETTINGS_H
 #define SOFTBOARD_SETTINGS_H
 
@@ -11,7 +12,7 @@
 
 namespace softboard {
 
-// A bad option, file or capture; what() names the place and the reason.
+// A bad option, file or capture. what() names the place (option, file, line) and the reason.
 class BadInput : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
@@ -25,11 +26,11 @@ struct Settings {
     std::optional<uint32_t> board;
     std::optional<uint32_t> label;
 
-    // What is not said here is taken from `base`.
+    // These settings, and those of `base` for what is not given here.
     Settings over(const Settings& base) const;
 };
 
-// A D channel of a scenario file; `place` ("day.toml:7") is for reports.
+// One [[dchannel]] of a scenario file. `place` is where it stands, for example "day.toml:7"; reports name it.
 struct ChannelSettings {
     std::optional<uint32_t> number;
     Settings settings;
@@ -37,7 +38,7 @@ struct ChannelSettings {
 };
 
 struct ScenarioFile {
-    Settings settings;  // of every D channel that does not say otherwise
+    Settings settings;  // those at the top of the file, for every D channel that does not give its own
     std::optional<uint32_t> dchannels;
     std::optional<std::string> journal;
     std::vector<Fault> faults;
@@ -57,10 +58,12 @@ Rate framesPerSecond(double rate);
 Fault parseFaultSetting(const std::string& text);
 uint32_t parseNumberIn(const std::string& text, uint32_t least, uint32_t most);
 
-// The scenario that the command line and the file (null: none) ask for; reads the captures. Throws BadInput.
+// Makes the scenario from the command line and the scenario file (null: there is none), and reads the
+// captures. A D channel's own settings come first, then the command line, then the top of the file, then the
+// defaults. Throws BadInput.
 Scenario resolve(const Settings& commandLine, std::optional<uint32_t> dchannels, const ScenarioFile* file);
 
-// Throws BadInput.
+// Reads a TOML file. Throws BadInput.
 ScenarioFile readScenarioFile(const std::string& path);
 
 }  // namespace softboard

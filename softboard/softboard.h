@@ -1,6 +1,7 @@
-// The software board from inside its process: what tests set up, watch and wait for.
+// Controls the software board from inside its process. Tests set it up, watch it and wait for it with these
+// functions.
 //
-// Every function may be called from any thread. Waits end with false after `limit`.
+// Any thread may call any function. A function that waits returns false when `limit` has passed.
 #ifndef SOFTBOARD_SOFTBOARD_H
 #define SOFTBOARD_SOFTBOARD_H
 
@@ -17,28 +18,31 @@ namespace softboard {
 
 constexpr std::chrono::milliseconds longEnough{20000};
 
-// Other boards, with nothing subscribed or switched on, and an empty journal. Queues and buffers stay.
+// Replaces the boards by those of the scenario, with no subscriptions and no trace switched on, and empties
+// the journal. The host's queues and buffers stay.
 void reset(const Scenario& scenario);
 
-// Other faults from now on, on the boards as they are; what they count begins at 1.
+// Replaces the faults; the boards stay as they are. The counts of the new faults begin at 1.
 void setFaults(const std::vector<Fault>& faults);
 
-// Every message so far, a line each, and notes (docs/user/softboard.md gives the form).
+// The journal: every message so far, a line each (docs/user/softboard.md gives the form).
 std::string journal();
-// What the host has sent to boards, "8 {Parm 10 Val 1}\n" each.
+// Only the messages that the host has sent to boards, a line each: "8 {Parm 10 Val 1}\n".
 std::string heard();
 void clearJournal();
-// Until `count` messages of the type were recorded since the journal was cleared.
+// Waits until `count` messages of the type were sent since the journal was cleared.
 bool waitForMessages(uint32_t type, size_t count, std::chrono::milliseconds limit = longEnough);
 
-// Message buffers not freed yet, those that wait in a queue included.
+// How many message buffers are not freed yet, those that wait in a queue included.
 size_t outstanding();
+// Waits until outstanding() is `count`.
 bool waitForOutstanding(size_t count, std::chrono::milliseconds limit = longEnough);
 size_t openQueues();
 // "buffers outstanding N, queues open M".
 std::string balance();
 
-// Sends a message to the host queue bound to `target`, as if from `source`; false when there is none.
+// Delivers a message to the host queue with the address `target`, as if `source` had sent it. Returns false
+// when there is no such queue.
 bool send(uint32_t type, const NvCompDesc& source, const NvCompDesc& target, const std::vector<uint8_t>& body,
           uint32_t transaction = 0);
 

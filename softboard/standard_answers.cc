@@ -1,14 +1,14 @@
-// What every component instance answers: communication test, parameters, event subscriptions.
+// The commands that every component instance answers: communication test, parameters, event subscriptions.
 #include "softboard/answers.h"
 
 namespace softboard {
 
 namespace {
 
-// Data of the error reply to a parameter command.
+// The last field of the error reply to a parameter command.
 Octets parameterData(uint32_t number, uint32_t value) { return BodyWriter().u32(number).u32(value).take(); }
 
-// The parameter, or null and the request refused.
+// Returns the parameter. If the component has none of this number, refuses the request and returns null.
 Parameter* findParameter(Request& request, uint32_t number, uint32_t value) {
     auto& parameters = request.component->parameters;
     const auto found = parameters.find(number);
@@ -50,7 +50,7 @@ void getParm(Request& request) {
 void detectEvt(Request& request) {
     const Address returnTo = request.body.address();
     const uint32_t event = request.body.u32();
-    request.body.u32();  // the event's own group: the board reports the whole type
+    request.body.u32();  // EvtGroup is ignored: EvtType alone says which events are subscribed to
     if (!request.body.ok()) {
         request.refuse(ErrorCode::bodyTooShort);
         return;
@@ -72,7 +72,7 @@ void detectxEvts(Request& request) {
     }
 }
 
-// A cancellation names no return address: it ends what goes to the queue that sends it.
+// The command names no return address: it ends the subscription of the queue that sends it.
 void cancelEvt(Request& request) {
     const uint32_t event = request.body.u32();
     if (!request.body.ok()) {

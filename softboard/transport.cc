@@ -1,4 +1,4 @@
-// The transport library's functions.
+// The functions of norv/norv.h. Each checks its arguments, reports misuse, and calls the network.
 #include <cstdarg>
 #include <cstdint>
 #include <cstring>
@@ -13,7 +13,7 @@ namespace {
 using softboard::misuse;
 using softboard::network;
 
-// No message is as long.
+// No message is this long, so an offset beyond it is misuse.
 constexpr uint32_t wildOffset = softboard::Buffers::largestBody;
 
 std::span<uint8_t> bodyOf(const char* function, NvMsg32Bit* msg) {
@@ -36,7 +36,8 @@ void checkStorage(const char* function, const void* storage) {
     }
 }
 
-// The pairs of descriptor and storage, each moved by `move`, which tells whether the field was there.
+// Goes over the pairs of descriptor and storage in `fields`. `move` moves one field and returns whether the
+// body holds it. Returns NVSTATUS_ERROR when a field was missing.
 template <class Move>
 uint32_t moveFields(const char* function, uint32_t count, va_list fields, Move move) {
     uint32_t status = NVSTATUS_OK;
@@ -89,7 +90,7 @@ uint32_t nvMsgFree(NvMsg32Bit* msg) {
     return NVSTATUS_OK;
 }
 
-// A fixed field is one of the body's 32-bit words.
+// A fixed field is a 32-bit word of the body; `index` counts words.
 uint32_t nvMsgFieldGet(NvMsg32Bit* msg, uint32_t index, void* value) {
     const auto body = bodyOf("nvMsgFieldGet", msg);
     checkStorage("nvMsgFieldGet", value);
@@ -110,7 +111,7 @@ uint32_t nvMsgFieldPut(NvMsg32Bit* msg, uint32_t index, void* value) {
     return NVSTATUS_OK;
 }
 
-// A body may be shorter than the fields that its reader looks for: those are left as they are.
+// A body may end before the fields that are asked for. The storage of such a field is left unchanged.
 uint32_t nvMsgVarFieldGet(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...) {
     const auto body = bodyOf("nvMsgVarFieldGet", msg);
     checkOffset("nvMsgVarFieldGet", offset, wildOffset);

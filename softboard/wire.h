@@ -1,4 +1,4 @@
-// Message bodies: little-endian fields, packed, in order.
+// Reads and writes message bodies: little-endian fields, packed, in order.
 #ifndef SOFTBOARD_WIRE_H
 #define SOFTBOARD_WIRE_H
 
@@ -9,7 +9,8 @@
 
 namespace softboard {
 
-// Takes fields off the front of a body. A field that is not there whole reads as 0 and leaves ok() false.
+// Reads the fields of a body from front to back. If the body ends within a field, the field is 0, and ok() is
+// false from then on. The body must outlive the reader.
 class BodyReader {
   public:
     explicit BodyReader(std::span<const uint8_t> body) : rest_(body) {}
@@ -18,10 +19,10 @@ class BodyReader {
     uint16_t u16() { return static_cast<uint16_t>(number(2)); }
     uint32_t u32() { return number(4); }
     Address address();
-    Octets rest();
+    Octets rest();  // all that has not been read
 
     bool ok() const { return ok_; }
-    size_t left() const { return rest_.size(); }
+    size_t left() const { return rest_.size(); }  // octets
 
   private:
     uint32_t number(size_t octets);
