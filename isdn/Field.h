@@ -17,8 +17,9 @@
 
 namespace isdn {
 
-// A field is some bits of one octet, or several whole octets. The fields of an element cover each of its bits
-// exactly once, in their order, so that whoever prints or rewrites them leaves nothing out.
+// A field is some bits of one octet, or several octets from a bit of the first to one of the last. The fields
+// of an element cover each of its bits exactly once, in their order, so that whoever prints or rewrites them
+// leaves nothing out.
 struct Field {
     enum class Kind : std::uint8_t {
         value,      // a number, and its name in `meaning` if the number has one
@@ -35,8 +36,9 @@ struct Field {
     std::string_view clause;   // "Q.931 4.5.12"
     Octets at;                 // the octets in which it stands, within the frame
     std::uint64_t value = 0;   // of at most eight octets; of more the last eight
-    std::uint8_t high = 8;     // bits of the octet, 8 to 1; of several octets 8 and 1
-    std::uint8_t low = 1;
+    std::uint8_t high = 8;     // of the first octet, 8 to 1
+
+    std::uint8_t low = 1;  // of the last octet
     Kind kind = Kind::value;
     bool personal = false;   // identifies a person: a number, a name, user data
     std::uint8_t depth = 0;  // 0, or how deep it stands in nested contents (facility)

@@ -24,6 +24,9 @@ constexpr Variants only(Variant variant) {
 }
 
 inline constexpr Variants everywhere{0x3F};
+constexpr Variants everywhereBut(Variant variant) {
+    return {static_cast<std::uint8_t>(everywhere.members & ~only(variant).members)};
+}
 inline constexpr Variants northAmerica =
     only(Variant::ni2) | only(Variant::ess4) | only(Variant::ess5) | only(Variant::dms100);
 

@@ -11,6 +11,11 @@ namespace isdn {
 // A view of octets of a frame. Whoever handed in the frame keeps it for as long as any view of it is used.
 using Octets = std::span<const std::uint8_t>;
 
+// The same octets as characters, whatever they are.
+inline std::string_view asCharacters(Octets octets) {
+    return {reinterpret_cast<const char*>(octets.data()), octets.size()};  // NOLINT(*-reinterpret-cast)
+}
+
 // What is wrong with a frame, a message or an element. Its octets are handed out all the same.
 enum class Problem : std::uint8_t {
     none,

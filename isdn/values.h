@@ -4,6 +4,7 @@
 #define ISDN_VALUES_H
 
 #include <bitset>
+#include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <string_view>
@@ -28,6 +29,14 @@ struct ChannelId {
 };
 
 std::optional<ChannelId> channelId(const Element& element);
+
+// The channel of a slot map's bit, 8 to 1, of its octet `index` of `octets` (figure 4-21): three octets hold
+// the channels 24 to 1, any other number of octets begins with its highest slot and ends with slot 0.
+constexpr int slotOf(std::size_t index, unsigned bit, std::size_t octets) {
+    constexpr std::size_t octetsOf1544 = 3;
+    const int below = static_cast<int>((octets - 1 - index) * 8 + bit);
+    return octets == octetsOf1544 ? below : below - 1;
+}
 
 // Called, calling, connected, redirecting, redirection and original called numbers (Q.931 4.5.8, 4.5.10 and
 // Q.951, EN 300 207).
@@ -59,7 +68,7 @@ std::optional<Cause> cause(const Element& element);
 
 // "user busy"; empty if the value has no name.
 std::string_view causeName(std::uint8_t value);
-// "remote user"; empty if reserved.
+// "remote public network"; empty if reserved.
 std::string_view locationName(std::uint8_t location);
 
 // CALL STATE (Q.931 4.5.7). States are those of the user, 0 to 25, or 61 and 62 of the global reference.
@@ -91,6 +100,10 @@ struct Progress {
 };
 
 std::optional<Progress> progress(const Element& element);
+std::string_view progressName(std::uint8_t value);
+
+// NOTIFICATION INDICATOR (Q.931 4.5.22 and the supplementary services).
+std::string_view notificationName(std::uint8_t value);
 
 // SEGMENTED MESSAGE (Q.931 4.5.26): the first element of a SEGMENT.
 struct SegmentHeader {

@@ -1,0 +1,315 @@
+// How an element is described: a table of rows, each a field at its place. One engine reads every table
+// (isdn/engine.cc).
+//
+//     inline constexpr Row progressRows[] = {
+//         {"3", bits(7, 6), "coding standard", codingStandards},
+//         {"", bits(4, 1), "location", locations},
+//         {"4", bits(7, 1), "progress description", progressDescriptions},
+//     };
+//
+// A row with a label begins an octet, or octets; one without a label is another field of the same octet. Bits
+// that no row names need no row: bit 8 is then the extension bit, and any other is spare. What a row's `when`
+// asks for decides in the first row of an octet whether the octet is there, and in any other row whether the
+// field is.
+#ifndef ISDN_TABLE_H
+#define ISDN_TABLE_H
+
+#include <algorithm>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <initializer_list>
+#include <iterator>
+#include <span>
+#include <string_view>
+
+#include "isdn/Field.h"
+#include "isdn/Variant.h"
+#include "isdn/octets.h"
+
+namespace isdn {
+
+struct Name {
+    std::uint8_t value;
+    std::string_view text;
+};
+
+// The names of a field's values: rows, or a function that knows them.
+class Names {
+  public:
+    constexpr Names() = default;
+    template <std::size_t N>
+    constexpr Names(const Name (&rows)[N])
+        : rows_(rows) {}  // NOLINT(*-explicit-*): tables name it in passing
+    constexpr Names(std::string_view (*function)(std::uint8_t))
+        : function_(function) {}  // NOLINT(*-explicit-*)
+
+    // Empty if the value has no name.
+    constexpr std::string_view operator()(std::uint8_t value) const {
+        if (function_ != nullptr)
+            return function_(value);
+        for (const Name& row : rows_) {
+            if (row.value == value)
+                return row.text;
+        }
+        return {};
+    }
+
+  private:
+    std::span<const Name> rows_;
+    std::string_view (*function_)(std::uint8_t) = nullptr;
+};
+
+constexpr std::uint8_t bitsOf(std::uint8_t octet, unsigned high, unsigned low) {
+    return static_cast<std::uint8_t>((octet & ((1U << high) - 1U)) >> (low - 1U));
+}
+
+// Whether bits of an octet have one of some values, all of them below 64. Nothing is asked while high is 0.
+struct Test {
+    std::string_view octet;
+    std::uint8_t high = 0;
+    std::uint8_t low = 0;
+    std::uint64_t values = 0;
+
+    constexpr Test() = default;
+    constexpr Test(std::string_view label, unsigned highest, unsigned lowest,
+                   std::initializer_list<unsigned> accepted)
+        : octet(label), high(static_cast<std::uint8_t>(highest)), low(static_cast<std::uint8_t>(lowest)) {
+        for (const unsigned value : accepted)
+            values |= std::uint64_t{1} << value;
+    }
+    constexpr bool given() const { return high != 0; }
+    constexpr bool admits(std::uint8_t value) const {
+        const unsigned field = bitsOf(value, high, low);
+        return field < 64 && (values >> field & 1U) != 0;
+    }
+};
+
+// When an octet, or a field, is there.
+class When {
+  public:
+    enum class Presence : std::uint8_t {
+        mandatory,  // its absence is a problem
+        optional,   // it is there if the element goes on
+        extended,   // it is there if bit 8 of the octet before it is clear
+    };
+
+    constexpr When() = default;
+    constexpr explicit When(Presence given) : presence(given) {}
+
+    Presence presence = Presence::mandatory;
+    std::array<Test, 3> seen;  // of octets before it; all must pass
+    Test next;                 // of the octet itself
+    Variants variants = everywhere;
+
+    // Both conditions.
+    friend constexpr When operator&(const When& a, const When& b) {
+        When both = a;
+        if (b.presence != Presence::mandatory)
+            both.presence = b.presence;
+        for (const Test& test : b.seen) {
+            if (test.given())
+                both.free() = test;
+        }
+        if (b.next.given())
+            both.next = b.next;
+        both.variants.members &= b.variants.members;
+        return both;
+    }
+
+  private:
+    constexpr Test& free() {
+        for (Test& test : seen) {
+            if (!test.given())
+                return test;
+        }
+        throw "a row asks for three tests at most";
+    }
+};
+
+inline constexpr When always{};
+inline constexpr When optional{When::Presence::optional};
+inline constexpr When extended{When::Presence::extended};
+
+// Bits `high` to `low` of the octet of this label have one of these values.
+constexpr When ifSeen(std::string_view octet, unsigned high, unsigned low,
+                      std::initializer_list<unsigned> values) {
+    When when;
+    when.seen[0] = {octet, high, low, values};
+    return when;
+}
+// The octet of this label is not 0 in bits 6 to 1.
+constexpr When ifNotZero(std::string_view octet) {
+    When when = ifSeen(octet, 6, 1, {});
+    when.seen[0].values = ~std::uint64_t{1};
+    return when;
+}
+// The next octet has one of these values in these bits.
+constexpr When ifNext(unsigned high, unsigned low, std::initializer_list<unsigned> values) {
+    When when = optional;
+    when.next = {"", high, low, values};
+    return when;
+}
+constexpr When on(Variants variants) {
+    When when;
+    when.variants = variants;
+    return when;
+}
+
+// The octets of an element that have been read, by their labels.
+class Seen {
+  public:
+    void add(std::string_view label, std::uint8_t octet) {
+        if (count_ < octets_.size())
+            octets_[count_++] = {label, octet};
+    }
+    // The last octet of this label, or null.
+    const std::uint8_t* find(std::string_view label) const {
+        for (std::size_t i = count_; i-- > 0;) {
+            if (octets_[i].label == label)
+                return &octets_[i].octet;
+        }
+        return nullptr;
+    }
+    bool passes(std::span<const Test> tests) const {
+        return std::ranges::all_of(tests, [&](const Test& test) {
+            if (!test.given())
+                return true;
+            const std::uint8_t* const octet = find(test.octet);
+            return octet != nullptr && test.admits(*octet);
+        });
+    }
+
+  private:
+    struct Entry {
+        std::string_view label;
+        std::uint8_t octet;
+    };
+    std::array<Entry, 24> octets_;
+    std::size_t count_ = 0;
+};
+
+// Octets that a reader of its own takes apart: characters, digits, diagnostics, components.
+struct Contents {
+    Octets octets;
+    std::string_view octet;  // the label of the first
+    std::string_view name;
+    std::string_view clause;
+    bool personal;
+    Variant variant;
+    const Seen& seen;  // what came before in the element
+};
+// Appends fields that cover the octets, each exactly once.
+using ContentsReader = Problem (*)(const Contents&, Fields&);
+
+struct Place {
+    enum class Kind : std::uint8_t {
+        bits,      // of one octet
+        heading,   // bits that hold the identifier
+        reserved,  // bits that are spare although one might take them for another thing
+        nothing,   // no field: the octet's fields are those of the rows that follow
+        octets,
+    };
+    enum class Repeat : std::uint8_t { once, whileExtended, toEnd };
+
+    Kind kind = Kind::bits;
+    std::uint8_t high = 8;
+    std::uint8_t low = 1;
+    Repeat repeat = Repeat::once;
+    std::uint8_t count = 0;           // of octets; 0 stands for all that are left
+    std::string_view countedBy;       // the label of the octet that holds the number of octets, if any
+    std::uint8_t alreadyCounted = 0;  // octets that this number includes and that other rows have taken
+    ContentsReader reader = nullptr;  // null reads octets as they are
+};
+
+constexpr Place bits(unsigned high, unsigned low) {
+    return {Place::Kind::bits,
+            static_cast<std::uint8_t>(high),
+            static_cast<std::uint8_t>(low),
+            Place::Repeat::once,
+            0,
+            {},
+            0,
+            nullptr};
+}
+constexpr Place heading(unsigned high, unsigned low) {
+    Place place = bits(high, low);
+    place.kind = Place::Kind::heading;
+    return place;
+}
+constexpr Place reserved(unsigned high, unsigned low) {
+    Place place = bits(high, low);
+    place.kind = Place::Kind::reserved;
+    return place;
+}
+inline constexpr Place nothing{Place::Kind::nothing, 8, 1, Place::Repeat::once, 0, {}, 0, nullptr};
+// The octet is read again while bit 8 of the last one is clear.
+constexpr Place repeated(Place place) {
+    place.repeat = Place::Repeat::whileExtended;
+    return place;
+}
+// The octet is read again until the element ends.
+constexpr Place toEnd(Place place) {
+    place.repeat = Place::Repeat::toEnd;
+    return place;
+}
+constexpr Place octets(unsigned count, ContentsReader reader = nullptr) {
+    return {Place::Kind::octets, 8, 1, Place::Repeat::once, static_cast<std::uint8_t>(count), {}, 0, reader};
+}
+constexpr Place rest(ContentsReader reader = nullptr) { return octets(0, reader); }
+constexpr Place counted(std::string_view by, unsigned already, ContentsReader reader = nullptr) {
+    return {
+        Place::Kind::octets, 8, 1, Place::Repeat::once, 0, by, static_cast<std::uint8_t>(already), reader};
+}
+
+struct Row {
+    std::string_view octet;
+    Place place;
+    std::string_view name = {};
+    Names names = {};
+    When when = {};
+    bool isPersonal = false;
+    std::string_view clause = {};  // where it is not the element's own
+};
+
+// The field identifies a person.
+constexpr Row personal(Row row) {
+    row.isPersonal = true;
+    return row;
+}
+
+// Rows after rows, for elements that share some.
+template <std::size_t... Sizes>
+consteval auto join(const Row (&... parts)[Sizes]) {
+    std::array<Row, (Sizes + ...)> all{};
+    auto end = all.begin();
+    ((end = std::copy(std::begin(parts), std::end(parts), end)), ...);
+    return all;
+}
+
+struct ElementTable {
+    // What becomes of octets when `understood` fails.
+    enum class Otherwise : std::uint8_t {
+        unnamed,  // they are fields all the same, but their values have no names
+        raw,      // they are raw
+    };
+
+    std::uint8_t codeset;
+    std::uint8_t id;  // of a single-octet element the bits that identify it, the others 0
+    std::string_view name;
+    std::string_view clause;
+    std::span<const Row> rows;
+    Variants variants = everywhere;
+    Test understood = {};  // the coding standard, where there is one
+    Otherwise otherwise = Otherwise::unnamed;
+};
+
+// The table of an element on a variant, or null.
+const ElementTable* elementTable(std::uint8_t codeset, std::uint8_t id, Variant variant);
+
+// Reads octets by a table and appends their fields.
+Problem readRows(const ElementTable& table, Octets octets, Variant variant, Fields& fields);
+
+}  // namespace isdn
+
+#endif

@@ -1,0 +1,29 @@
+// Readers of contents that are no fields of bits: characters, diagnostics, subaddresses, maps, components.
+#ifndef ISDN_READERS_H
+#define ISDN_READERS_H
+
+#include "isdn/Table.h"
+
+namespace isdn {
+
+Problem readCharacters(const Contents& contents, Fields& fields);
+Problem readNumber(const Contents& contents, Fields& fields);       // of several octets, the highest first
+Problem readSubaddress(const Contents& contents, Fields& fields);   // Q.931 4.5.9
+Problem readSlotMap(const Contents& contents, Fields& fields);      // Q.931 4.5.13, figures 4-20 and 4-21
+Problem readDiagnostics(const Contents& contents, Fields& fields);  // Q.850 table 1
+Problem readUserInformation(const Contents& contents, Fields& fields);
+
+// DISPLAY. On North American trunks an octet with bit 8 set may precede the characters, or fields of their
+// own.
+Problem readDisplay(const Contents& contents, Fields& fields);
+Problem readDisplayFields(const Contents& contents, Fields& fields);
+
+// FACILITY and EXTENDED FACILITY (Q.932 8.2).
+Problem readFacility(const Contents& contents, Fields& fields);
+
+// A message type of call control, for fields that hold one.
+std::string_view callControlMessageName(std::uint8_t type);
+
+}  // namespace isdn
+
+#endif
