@@ -1,0 +1,53 @@
+// Which frames of a link are commands, and with it which end is the user: found out from the frames
+// themselves.
+#ifndef CALLS_COMMANDBITS_H
+#define CALLS_COMMANDBITS_H
+
+#include <array>
+#include <cstdint>
+#include <optional>
+
+#include "calls/Message.h"
+#include "capture/Frame.h"
+#include "isdn/Layer2.h"
+
+namespace calls {
+
+constexpr std::size_t indexOf(Side side) { return static_cast<std::size_t>(side); }
+
+// Commands of the user and responses of the network have C/R 0, the other two have 1 (Q.921 3.3.2). The first
+// frame that is always a command or always a response tells how its sender codes commands; the other side
+// codes them the other way. A poll and its answer carry one value, of which the earlier is the command.
+class CommandBits {
+  public:
+    enum class Lesson : std::uint8_t {
+        nothing,       // the frame says nothing, or nothing new
+        learnt,        // from now on commands are known
+        contradicted,  // the frame codes a command otherwise than an earlier one of its sender
+        sameRole       // both sides code commands alike
+    };
+
+    // `longest` is how long after a poll its answer may come, in nanoseconds.
+    Lesson learn(const isdn::Layer2& frame, Side from, std::int64_t at, std::int64_t longest);
+
+    // Empty until it is known.
+    std::optional<bool> isCommand(bool cr, Side from) const;
+    // Of our side.
+    capture::Role role() const;
+
+  private:
+    struct Poll {
+        bool cr;
+        Side from;
+        std::int64_t at;
+    };
+
+    Lesson learn(bool commandBit, Side from);
+
+    std::array<std::optional<bool>, 2> bits_;  // of a side's commands, as its own frames show
+    std::optional<Poll> poll_;                 // the last frame with P/F set, until the commands are known
+};
+
+}  // namespace calls
+
+#endif

@@ -1,0 +1,120 @@
+// The I frames of one side of a link, as the other side's layer 2 takes them.
+#ifndef CALLS_STREAM_H
+#define CALLS_STREAM_H
+
+#include <array>
+#include <cstdint>
+#include <optional>
+#include <string_view>
+#include <vector>
+
+#include "calls/Message.h"
+#include "capture/Frame.h"
+
+namespace calls {
+
+// Sequence numbers count modulo 128 (Q.921 3.5.2.1).
+constexpr unsigned ahead(std::uint8_t number, std::uint8_t of) {
+    return static_cast<unsigned>(number - of) & 0x7FU;
+}
+// No more than half of all numbers can be ahead; others lie behind.
+constexpr bool isAhead(std::uint8_t number, std::uint8_t of) {
+    const unsigned distance = ahead(number, of);
+    return distance > 0 && distance < 64;
+}
+constexpr std::uint8_t after(std::uint8_t number) { return static_cast<std::uint8_t>((number + 1) & 0x7F); }
+
+// A frame as a machine takes it.
+struct Sample {
+    const capture::Frame* frame;
+    std::uint64_t number;  // in the input, from 1
+    std::int64_t at;       // nanoseconds on the D channel's clock
+    isdn::Layer2 layer2;
+    std::optional<bool> command{};  // empty while it is not known
+    std::optional<bool> assumed{};  // the same, where the link itself does not tell
+
+    Side from() const { return frame->transmitted ? Side::us : Side::peer; }
+};
+
+// A frame that was kept, with octets of its own.
+struct KeptFrame {
+    explicit KeptFrame(const Sample& sample);
+    // A view of it, valid as long as this.
+    Sample sample() const;
+
+    std::vector<std::uint8_t> octets;
+    capture::Frame frame;
+    std::uint64_t number;
+    std::int64_t at;
+};
+
+// Numbers that are missing in what a side sent.
+struct Hole {
+    std::uint8_t first = 0;   // the first missing N(S)
+    unsigned count = 0;       // how many are missing
+    std::uint64_t frame = 0;  // number of the frame behind it
+    std::int64_t at = 0;
+    std::string_view reason{};  // what the recorder says about it; empty if it says nothing
+};
+
+// Who lost the frames of a hole.
+enum class LostBy : std::uint8_t { line, recorder, unknown };
+
+class Stream {
+  public:
+    enum class Verdict : std::uint8_t {
+        accepted,   // the receiver's layer 2 hands it up
+        duplicate,  // the receiver has it already
+        waiting,    // ahead of a hole: what the receiver says next decides
+        ahead       // the receiver waits for an earlier one that was lost on the line
+    };
+    struct Taken {
+        Verdict verdict = Verdict::accepted;
+        bool again = false;           // its number was seen before
+        std::optional<Hole> found{};  // a hole in front of it
+        std::optional<LostBy> by{};   // who lost the frames of `found` or `decided`
+        std::optional<Hole> decided{};
+    };
+
+    // An I frame of this side. `recorded` is what says that the recorder has missed frames since the last
+    // one; empty if nothing does. A hole in what our own side sent is the recorder's.
+    Taken take(const Sample& sample, std::string_view recorded);
+    // N(R) of the other side; `rejects` if it came in REJ. What was waiting and was accepted goes to
+    // `accepted`.
+    Taken acknowledged(const Sample& sample, std::string_view recorded, std::vector<KeptFrame>& accepted);
+
+    // The link was set up: numbers begin at 0.
+    void reset();
+    // Frames may be missing from here on: the next number is taken as it comes.
+    void loosen();
+
+    // A hole about which nothing was decided. It is closed.
+    std::optional<Hole> giveUp();
+
+    unsigned outstanding() const { return firm_ ? ahead(next_, acknowledged_) : 0; }
+    // N(R) that acknowledges what this side has not sent, as far as the trace shows.
+    bool isBeyond(std::uint8_t nr) const { return firm_ && isAhead(nr, next_); }
+    // The number of the last frame of this side that the other one has acknowledged; 0 if none is in the
+    // trace.
+    std::uint64_t lastAcknowledged() const { return frames_[(acknowledged_ + 127U) & 0x7FU]; }
+    bool isFirm() const { return firm_; }
+    std::uint8_t next() const { return next_; }
+
+  private:
+    void takeAhead(const Sample& sample, std::string_view recorded, Taken& taken);
+    void keep(const Sample& sample);
+
+    bool known_ = false;                       // some number was seen
+    bool firm_ = false;                        // the next number is known for sure
+    std::uint8_t next_ = 0;                    // V(S): behind the highest number that was sent
+    std::uint8_t expected_ = 0;                // V(R) of the receiver
+    std::uint8_t acknowledged_ = 0;            // the last N(R) of the receiver
+    bool recovering_ = false;                  // the receiver waits for `expected_` to be sent again
+    std::array<std::uint64_t, 128> frames_{};  // by N(S): the number of the frame that carried it last
+    std::optional<Hole> hole_;
+    std::vector<KeptFrame> waiting_;  // behind the hole; at most `mostWaiting`
+};
+
+}  // namespace calls
+
+#endif
