@@ -32,14 +32,14 @@ struct LinkWitness {
     }
 };
 
-// Gives the witness of a link; null if nothing is known of it.
+// Gives the witness of the link of a TEI that carries a table's calls; null if nothing is known of it.
 class LinkWitnesses {
   public:
     LinkWitnesses() = default;
     LinkWitnesses(const LinkWitnesses&) = delete;
     LinkWitnesses& operator=(const LinkWitnesses&) = delete;
     virtual ~LinkWitnesses() = default;
-    virtual const LinkWitness* witness(std::uint32_t group, std::uint8_t tei) const = 0;
+    virtual const LinkWitness* witness(std::uint8_t tei) const = 0;
 };
 
 }  // namespace calls

@@ -26,12 +26,26 @@ struct Message {
     // Nanoseconds on the clock of this D channel, which never goes back: durations are differences of it.
     std::int64_t at = 0;
     std::uint32_t group = 0;  // the D channel, or the group of D channels that share their calls (NFAS)
+    capture::Role role = capture::Role::unknown;  // of our side, as the link's frames have shown it
     isdn::Layer2 layer2;
     isdn::Layer3 layer3;
     isdn::Variant variant = isdn::Variant::net5;
 
     Side from() const { return frame->transmitted ? Side::us : Side::peer; }
+    // Of the side that sent it.
+    capture::Role senderRole() const {
+        if (role == capture::Role::unknown || from() == Side::us)
+            return role;
+        return role == capture::Role::user ? capture::Role::network : capture::Role::user;
+    }
 };
+
+// DISCONNECT, RELEASE or RELEASE COMPLETE (Q.931 5.3).
+constexpr bool isClearing(std::uint8_t messageType) {
+    namespace type = isdn::message;
+    return messageType == type::disconnect || messageType == type::release ||
+           messageType == type::releaseComplete;
+}
 
 }  // namespace calls
 

@@ -1,0 +1,149 @@
+// One life of a call reference: what the messages of a call have said of it so far.
+#ifndef CALLS_CALL_H
+#define CALLS_CALL_H
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "calls/Message.h"
+#include "isdn/values.h"
+
+namespace calls {
+
+// A frame, and when it passed.
+struct Moment {
+    std::uint64_t frame = 0;  // its number in the input, from 1
+    std::int64_t at = 0;      // nanoseconds on the D channel's clock; for durations
+    capture::Clock clock = capture::Clock::none;
+    std::int64_t time = 0;  // nanoseconds, as `clock` says; for people
+};
+Moment momentOf(const Message& message);
+
+enum class Kind : std::uint8_t {
+    call,       // with a B channel, as far as is known
+    signalling  // a connection without a B channel, or a transaction (REGISTER)
+};
+
+enum class Phase : std::uint8_t { setUp, talking, clearing, held, ended };
+
+enum class EndedBy : std::uint8_t {
+    open,       // it has not ended in the trace
+    release,    // RELEASE COMPLETE, crossing RELEASEs, RESUME REJECT, or STATUS with state 0
+    restart,    // RESTART ACKNOWLEDGE for its channel
+    link,       // the link was down for longer than T309
+    replaced,   // its reference was used for a new call
+    suspended,  // SUSPEND ACKNOWLEDGE
+};
+
+enum class ClearedBy : std::uint8_t { unknown, us, peer, both, nobody };
+
+enum class Outcome : std::uint8_t {
+    open,
+    answered,
+    busy,
+    noAnswer,
+    abandoned,
+    rejected,
+    number,
+    incompatible,
+    congestion,
+    protocol,
+    other
+};
+
+std::string_view nameOf(Kind kind);
+std::string_view nameOf(Phase phase);
+std::string_view nameOf(EndedBy endedBy);
+std::string_view nameOf(ClearedBy clearedBy);
+std::string_view nameOf(Outcome outcome);
+
+// A cause as a message of the call gave it.
+struct CauseGiven {
+    std::uint64_t frame = 0;
+    std::uint8_t message = 0;  // the message type
+    Side from = Side::us;
+    capture::Role role = capture::Role::unknown;  // of the side that sent it
+    std::uint8_t codingStandard = 0;
+    std::uint8_t location = 0;
+    std::uint8_t value = 0;
+    std::vector<std::uint8_t> diagnostics;
+};
+
+// A party's number as it was signalled.
+struct Number {
+    std::string digits;
+    std::uint8_t type = 0;
+    std::uint8_t plan = 0;
+    std::optional<std::uint8_t> presentation;
+};
+
+struct Call {
+    std::uint64_t number = 0;   // in order of beginning, over all D channels, from 1
+    std::uint64_t resumes = 0;  // the number of the suspended call that this one goes on with, or 0
+    std::uint32_t group = 0;
+    std::string file;
+    std::string dChannel;
+    Moment begin;
+    Moment end;  // of the message that ended it, else of the last one
+    std::uint8_t tei = 0;
+    std::uint64_t reference = 0;
+    std::uint8_t referenceLength = 0;
+    Side origin = Side::us;  // the side that chose the reference
+    Kind kind = Kind::call;
+    Phase phase = Phase::setUp;
+
+    Number calling;
+    Number called;
+    Number redirecting;
+    Number connected;
+    std::string bearer;  // in words: "speech", "64k unrestricted"
+    std::optional<isdn::ChannelId> asked;
+    std::optional<isdn::ChannelId> granted;  // of the first answer that names one
+
+    // Nanoseconds since `begin`; empty if there was no such message.
+    std::optional<std::int64_t> firstResponse;
+    std::optional<std::int64_t> progress;
+    std::optional<std::int64_t> alerting;
+    std::optional<std::int64_t> connect;
+    std::optional<std::int64_t> lastDigit;  // of overlap sending
+    std::optional<std::int64_t> duration;   // from CONNECT to the first clearing message
+
+    EndedBy endedBy = EndedBy::open;
+    ClearedBy clearedBy = ClearedBy::unknown;
+    Outcome outcome = Outcome::open;
+    bool clearingSeen = false;              // DISCONNECT, RELEASE or RELEASE COMPLETE has passed
+    std::optional<CauseGiven> cause;        // of the first of these; empty if it has none
+    std::optional<CauseGiven> causeBefore;  // of PROGRESS, or of a terminal that refused earlier
+    std::vector<CauseGiven> laterCauses;    // of the clearing messages after the first, in order
+
+    std::vector<std::uint64_t> frames;  // numbers; the first `mostFrames` of them
+    std::uint64_t messages = 0;
+
+    // What is special about it.
+    bool beforeTrace = false;  // its SETUP is not in the trace
+    bool uncertain = false;    // the board restarted meanwhile, or frames are missing
+    bool setupRepeated = false;
+    bool broadcast = false;
+    bool overlap = false;
+    bool released = false;  // RELEASE has passed
+
+    static constexpr std::size_t mostFrames = 1000;
+
+    // The channel that it holds as far as is known: the one granted, else the one asked for.
+    const std::optional<isdn::ChannelId>& channel() const { return granted ? granted : asked; }
+};
+
+// "before-trace setup-repeated"; blanks between, empty for none.
+std::string flagsOf(const Call& call);
+
+// Whether an engineer would call it failed. Calls that the trace does not see the end of have not failed.
+bool hasFailed(const Call& call);
+// Whether nobody answered it, for whatever reason.
+bool isUnanswered(const Call& call);
+
+}  // namespace calls
+
+#endif

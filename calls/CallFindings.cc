@@ -1,0 +1,204 @@
+#include "calls/CallFindings.h"
+
+#include <algorithm>
+#include <array>
+#include <utility>
+
+#include "calls/ElementRules.h"
+#include "isdn/words.h"
+
+namespace calls {
+
+namespace {
+
+namespace element = isdn::element;
+namespace type = isdn::message;
+
+constexpr std::uint8_t statusEnquiryAnswer = 30, invalidReference = 81, timerExpired = 102;
+constexpr std::uint8_t numberIncomplete = 28;
+
+std::string wordsOf(const isdn::Element& found, const Message& message) {
+    std::string words;
+    isdn::appendWords(words, found, message.variant);
+    return words;
+}
+
+std::string nameOf(const Message& message) {
+    const std::string_view name = isdn::messageName(message.layer3);
+    return name.empty() ? "message " + std::to_string(message.layer3.type) : std::string(name);
+}
+
+// Causes by which one side tells the other that it did not understand (Q.850 2.2.7), and how bad that is.
+const FindingKind* protocolFinding(std::uint8_t cause) {
+    switch (cause) {
+        case invalidReference:
+            return &findings::unknownReference;
+        case 97:
+        case 99:
+            return &findings::elementIgnored;
+        case 96:
+        case 98:
+        case 100:
+        case 101:
+        case 111:
+            return &findings::protocolError;
+        case timerExpired:
+            return &findings::timer102;
+        default:
+            return nullptr;
+    }
+}
+
+}  // namespace
+
+void CallFindings::heard(Call& call, const Message& message) {
+    if (call.phase == Phase::ended) {
+        checkElements(&call, message, false);
+        return;
+    }
+    Notes& notes = notes_[call.number];
+    const bool clearsFirst = isClearing(message.layer3.type) && !notes.cleared && !call.beforeTrace;
+    checkElements(&call, message, clearsFirst);
+    checkDigits(call, notes, message);
+    checkCause(call, message);
+    checkStatus(call, notes, message);
+    checkChannel(call, notes, message);
+    notes.cleared = notes.cleared || isClearing(message.layer3.type);
+}
+
+void CallFindings::heardWithoutCall(const Message& message) {
+    if (message.layer3.discriminator == isdn::callControl ||
+        isdn::isMaintenance(message.layer3.discriminator))
+        checkElements(nullptr, message, false);
+}
+
+void CallFindings::checkElements(const Call* call, const Message& message, bool clearsFirst) {
+    for (BrokenRule& broken : brokenElementRules(message, clearsFirst))
+        report(*broken.kind, call, message, std::move(broken.sentence));
+}
+
+void CallFindings::checkCause(const Call& call, const Message& message) {
+    const isdn::Element found = message.layer3.elements.find(element::cause);
+    const auto cause = isdn::cause(found);
+    if (!cause || cause->codingStandard != 0)
+        return;
+    if (const FindingKind* const kind = protocolFinding(cause->value); kind != nullptr)
+        report(*kind, &call, message, nameOf(message) + " says " + wordsOf(found, message));
+}
+
+void CallFindings::checkStatus(const Call& call, Notes& notes, const Message& message) {
+    if (message.layer3.type == type::statusEnquiry) {
+        notes.enquired = true;
+        return;
+    }
+    if (message.layer3.type != type::status)
+        return;
+    const bool asked = std::exchange(notes.enquired, false);
+    const isdn::Element state = message.layer3.elements.find(element::callState);
+    const auto value = isdn::callState(state);
+    if (value && value->codingStandard == 0 && value->value == 0 && !notes.cleared) {
+        report(findings::statusIncompatible, &call, message, "STATUS names state 0 for a call that is alive");
+        return;
+    }
+    const auto cause = isdn::cause(message.layer3.elements.find(element::cause));
+    if (!asked && cause && cause->codingStandard == 0 && cause->value == statusEnquiryAnswer)
+        report(findings::statusUnasked, &call, message, "STATUS answers an enquiry that is not in the trace");
+}
+
+void CallFindings::checkDigits(const Call& call, Notes& notes, const Message& message) {
+    const std::uint8_t messageType = message.layer3.type;
+    if (message.from() == call.origin) {
+        if (messageType == type::setup || messageType == type::information)
+            notes.lastDigit = message.at;
+        if (!message.layer3.elements.find(element::sendingComplete).octets.empty())
+            notes.sendingComplete = true;
+        return;
+    }
+    if (messageType == type::setupAcknowledge) {
+        notes.acknowledged = true;
+        notes.lastDigit = message.at;
+        return;
+    }
+    const std::int64_t waited = message.at - notes.lastDigit;
+    constexpr std::int64_t shortestT302 = 10 * second;
+    const bool inTime = waited >= shortestT302 && waited <= timers_.t302 + timers_.slack;
+    const bool goesOn = messageType == type::callProceeding || messageType == type::alerting;
+    if (goesOn && inTime && !notes.sendingComplete && !call.beforeTrace && !notes.cleared &&
+        (notes.acknowledged || call.firstResponse == message.at - call.begin.at))
+        report(findings::waitsForDigits, &call, message,
+               nameOf(message) + " came " + std::to_string(waited / second) + " s after the last digit");
+    const auto cause = isdn::cause(message.layer3.elements.find(element::cause));
+    if (isClearing(messageType) && !notes.cleared && notes.acknowledged && cause && waited >= shortestT302 &&
+        (cause->value == numberIncomplete || cause->value == timerExpired))
+        report(findings::setupAcknowledgeUnanswered, &call, message,
+               "no further digit came for " + std::to_string(waited / second) + " s after \"" +
+                   call.called.digits + "\"");
+    if (goesOn || messageType == type::connect)
+        notes.acknowledged = false;
+}
+
+// Only a SETUP that says "no other channel" is contradicted by another one.
+void CallFindings::checkChannel(const Call& call, Notes& notes, const Message& message) {
+    if (notes.channelChecked || !call.granted)
+        return;
+    notes.channelChecked = true;
+    if (!call.asked || !call.asked->exclusive || call.asked->channels.none() || call.granted->channels.none())
+        return;
+    if (call.asked->interface && call.granted->interface &&
+        call.asked->interface != call.granted->interface) {
+        report(findings::interfaceMismatch, &call, message,
+               nameOf(message) + " names another interface than SETUP");
+        return;
+    }
+    if (call.asked->channels == call.granted->channels)
+        return;
+    report(findings::channelChanged, &call, message,
+           nameOf(message) + " answers with " +
+               wordsOf(message.layer3.elements.find(element::channelIdentification), message) +
+               " where SETUP demanded its own");
+}
+
+void CallFindings::ended(Call& call, const Message* by) {
+    if (call.broadcast && !call.firstResponse && call.endedBy == EndedBy::release && by == nullptr) {
+        Finding finding;
+        finding.kind = &findings::broadcastUnanswered;
+        finding.severity = finding.kind->severity;
+        finding.frame = call.begin.frame;
+        finding.clock = call.begin.clock;
+        finding.time = call.begin.time;
+        finding.dChannel = call.dChannel;
+        finding.call = call.number;
+        finding.sentence = "no terminal answered";
+        sink_.report(std::move(finding));
+    }
+}
+
+void CallFindings::replaced(Call& old, Call& by, const Message& message) {
+    report(findings::referenceInUse, &by, message,
+           nameOf(message) + " takes the reference of call " + std::to_string(old.number) +
+               ", which had not ended");
+}
+
+void CallFindings::stray(const Message& message) {
+    checkElements(nullptr, message, false);
+    report(findings::unknownReference, nullptr, message,
+           nameOf(message) + " for a reference whose call ended long before");
+}
+
+void CallFindings::report(const FindingKind& kind, const Call* call, const Message& message,
+                          std::string sentence) {
+    Finding finding;
+    finding.kind = &kind;
+    finding.severity = kind.severity;
+    finding.frame = message.number;
+    finding.clock = message.frame->clock;
+    finding.time = message.frame->time;
+    if (message.frame->interface != nullptr)
+        finding.dChannel = message.frame->interface->name;
+    if (call != nullptr)
+        finding.call = call->number;
+    finding.sentence = std::move(sentence);
+    sink_.report(std::move(finding));
+}
+
+}  // namespace calls

@@ -1,0 +1,51 @@
+// What a call's messages show to be wrong at once, without a timer: elements, causes, states, references.
+#ifndef CALLS_CALLFINDINGS_H
+#define CALLS_CALLFINDINGS_H
+
+#include <map>
+
+#include "calls/CallTable.h"
+#include "calls/FindingKinds.h"
+#include "calls/FindingSink.h"
+#include "calls/Timers.h"
+
+namespace calls {
+
+class CallFindings : public CallObserver {
+  public:
+    CallFindings(const Timers& timers, FindingSink& sink) : timers_(timers), sink_(sink) {}
+
+    void heard(Call& call, const Message& message) override;
+    void ended(Call& call, const Message* by) override;
+    void gone(const Call& call) override { notes_.erase(call.number); }
+    void replaced(Call& old, Call& by, const Message& message) override;
+    void stray(const Message& message) override;
+    // A message of the global or the dummy reference, or one that belongs to no call.
+    void heardWithoutCall(const Message& message);
+
+  private:
+    // What has to be remembered of a call that is alive.
+    struct Notes {
+        bool enquired = false;      // STATUS ENQUIRY has passed, not yet answered
+        bool acknowledged = false;  // SETUP ACKNOWLEDGE has passed, and nothing later
+        bool sendingComplete = false;
+        bool cleared = false;  // a clearing message has passed
+        bool channelChecked = false;
+        std::int64_t lastDigit = 0;  // or SETUP, or SETUP ACKNOWLEDGE
+    };
+
+    void checkElements(const Call* call, const Message& message, bool clearsFirst);
+    void checkCause(const Call& call, const Message& message);
+    void checkStatus(const Call& call, Notes& notes, const Message& message);
+    void checkDigits(const Call& call, Notes& notes, const Message& message);
+    void checkChannel(const Call& call, Notes& notes, const Message& message);
+    void report(const FindingKind& kind, const Call* call, const Message& message, std::string sentence);
+
+    const Timers& timers_;
+    FindingSink& sink_;
+    std::map<std::uint64_t, Notes> notes_;  // by number of the call
+};
+
+}  // namespace calls
+
+#endif

@@ -1,0 +1,385 @@
+#include "calls/CallTable.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "calls/Life.h"
+
+namespace calls {
+
+namespace {
+
+namespace element = isdn::element;
+namespace type = isdn::message;
+
+bool initiates(const isdn::Layer3& layer3) {
+    return !layer3.callReference.flag &&
+           (layer3.type == type::setup || layer3.type == type::resume || layer3.type == type::registration);
+}
+
+bool hasReferenceOfItsOwn(const isdn::Layer3& layer3) {
+    return layer3.discriminator == isdn::callControl && layer3.hasCallReference && layer3.hasType &&
+           !layer3.callReference.dummy() && !layer3.callReference.global();
+}
+
+bool namesNullState(const Message& message) {
+    if (message.layer3.type != type::status)
+        return false;
+    const auto state = isdn::callState(message.layer3.elements.find(element::callState));
+    return state && state->codingStandard == 0 && state->value == 0;
+}
+
+std::vector<std::uint8_t> copyOf(isdn::Octets octets) { return {octets.begin(), octets.end()}; }
+
+std::vector<std::uint8_t> identityIn(const Message& message) {
+    return copyOf(message.layer3.elements.find(element::callIdentity).contents);
+}
+
+// What a RESTART ACKNOWLEDGE names.
+struct Restarted {
+    static constexpr std::uint8_t channels = 0, oneInterface = 6, allInterfaces = 7;
+
+    std::uint8_t kind;
+    std::optional<isdn::ChannelId> channel;
+
+    bool covers(const Call& call) const {
+        const auto& held = call.channel();
+        if (kind == allInterfaces)
+            return true;
+        if (!held || (channel && channel->interface != held->interface))
+            return false;
+        return kind == oneInterface || (channel && (channel->channels & held->channels).any());
+    }
+};
+
+}  // namespace
+
+CallTable::CallTable(const Timers& timers, CallNumbers& numbers, CallObserver& observer)
+    : timers_(timers), numbers_(numbers), observer_(observer) {}
+
+CallTable::~CallTable() = default;
+
+Call* CallTable::take(const Message& message) {
+    advance(message.at);
+    if (!hasReferenceOfItsOwn(message.layer3))
+        return nullptr;
+    const bool toOrigin = message.layer3.callReference.flag;
+    const CallKey key{message.layer3.callReference.value, message.layer2.tei,
+                      toOrigin ? other(message.from()) : message.from()};
+    Life* const life = initiates(message.layer3) ? &beginOrRepeat(message, key) : belongsTo(message, key);
+    if (life == nullptr) {
+        observer_.stray(message);
+        return nullptr;
+    }
+    hear(*life, message);
+    return &life->call;
+}
+
+Life* CallTable::find(const CallKey& key) const {
+    const auto found = lives_.find(key);
+    return found == lives_.end() ? nullptr : found->second.get();
+}
+
+// A terminal that answers a SETUP to all joins its call; from then on the call's messages go to and fro
+// between that terminal and the network.
+Life* CallTable::findBroadcast(const Message& message, const CallKey& key) const {
+    Life* const life = find({key.value, isdn::groupTei, key.origin});
+    const std::uint8_t tei = message.layer2.tei;
+    if (life == nullptr || life->joined.test(tei))
+        return life;
+    const bool answers = message.from() != key.origin && message.at - life->lastSetup <= timers_.t312;
+    if (!answers)
+        return nullptr;
+    life->joined.set(tei);
+    return life;
+}
+
+Life& CallTable::beginOrRepeat(const Message& message, const CallKey& key) {
+    Life* const old = find(key);
+    if (old == nullptr)
+        return begin(message, key);
+    if (repeats(*old, message)) {
+        old->lastSetup = message.at;
+        old->call.setupRepeated = true;
+        return *old;
+    }
+    if (old->ended) {
+        forget(*old);
+        return begin(message, key);
+    }
+    // The old call has to be there until its observer has seen the new one.
+    end(*old, EndedBy::replaced, momentOf(message), nullptr);
+    const std::unique_ptr<Life> kept = std::move(lives_.find(key)->second);
+    inOrder_.erase(kept->call.number);
+    lives_.erase(key);
+    Life& life = begin(message, key);
+    observer_.replaced(kept->call, life.call, message);
+    observer_.gone(kept->call);
+    return life;
+}
+
+// A SETUP is a repetition while nothing has answered it, and if it is the same to the octet.
+bool CallTable::repeats(const Life& life, const Message& message) const {
+    return message.layer3.type == type::setup && !life.answered && !life.ended &&
+           message.at - life.lastSetup <= 2 * timers_.t303 &&
+           std::equal(life.setup.begin(), life.setup.end(), message.layer3.octets.begin(),
+                      message.layer3.octets.end());
+}
+
+Life& CallTable::begin(const Message& message, const CallKey& key) {
+    if (lives_.size() >= mostAlive)
+        dropOldest();
+    auto life = std::make_unique<Life>();
+    life->key = key;
+    Call& call = life->call;
+    call.number = ++numbers_.last;
+    call.group = message.group;
+    call.file = message.frame->place.file;
+    if (message.frame->interface != nullptr)
+        call.dChannel = message.frame->interface->name;
+    call.begin = momentOf(message);
+    call.tei = key.tei;
+    call.reference = key.value;
+    call.referenceLength = message.layer3.callReference.length;
+    call.origin = key.origin;
+    const std::uint8_t messageType = message.layer3.type;
+    call.beforeTrace = !initiates(message.layer3);
+    call.kind = messageType == type::registration ? Kind::signalling : Kind::call;
+    if (messageType == type::setup) {
+        life->setup = copyOf(message.layer3.octets);
+        life->lastSetup = message.at;
+        call.broadcast = key.tei == isdn::groupTei;
+        if (call.broadcast)
+            schedule(*life, message.at + timers_.t312 + timers_.slack);
+    }
+    if (messageType == type::resume)
+        joinSuspended(*life, message);
+    inOrder_.emplace(call.number, key);
+    return *(lives_[key] = std::move(life));
+}
+
+void CallTable::joinSuspended(Life& life, const Message& message) {
+    life.identity = identityIn(message);
+    std::erase_if(suspended_, [&](const Suspended& each) { return message.at - each.at > timers_.t307; });
+    const auto found = std::find_if(suspended_.begin(), suspended_.end(),
+                                    [&](const Suspended& each) { return each.identity == life.identity; });
+    if (found == suspended_.end())
+        return;
+    life.call.resumes = found->call;
+    suspended_.erase(found);
+}
+
+// The call of a message that begins none. What comes long after the end of a call, and only ends or asks, is
+// nobody's; anything else shows a call whose beginning is not in the trace.
+Life* CallTable::belongsTo(const Message& message, const CallKey& key) {
+    if (Life* const life = find(key); life != nullptr)
+        return life;
+    if (Life* const life = findBroadcast(message, key); life != nullptr)
+        return life;
+    const std::uint8_t messageType = message.layer3.type;
+    const bool onlyEndsOrAsks = messageType == type::release || messageType == type::releaseComplete ||
+                                messageType == type::disconnect || messageType == type::status ||
+                                messageType == type::statusEnquiry;
+    if (namesNullState(message) || (onlyEndsOrAsks && remembered_.contains(key)))
+        return nullptr;
+    return &begin(message, key);
+}
+
+void CallTable::hear(Life& life, const Message& message) {
+    const bool hadEnded = life.ended;
+    learn(life, message);
+    if (!hadEnded && message.layer3.type == type::suspend)
+        life.identity = identityIn(message);
+    if (life.call.broadcast && !life.winner && message.layer3.type == type::connectAcknowledge &&
+        message.from() == life.call.origin) {
+        life.winner = message.layer2.tei;
+        life.call.tei = message.layer2.tei;
+    }
+    observer_.heard(life.call, message);
+    if (!hadEnded)
+        endIfLast(life, message);
+}
+
+void CallTable::endIfLast(Life& life, const Message& message) {
+    if (life.call.broadcast && !(life.winner && *life.winner == message.layer2.tei)) {
+        endTerminal(life, message);
+        return;
+    }
+    switch (message.layer3.type) {
+        case type::release:
+            life.call.released = true;
+            if (!life.releasedBy)
+                life.releasedBy = message.from();
+            else if (*life.releasedBy != message.from())
+                end(life, EndedBy::release, momentOf(message), &message);
+            break;
+        case type::releaseComplete:
+        case type::resumeReject:
+            end(life, EndedBy::release, momentOf(message), &message);
+            break;
+        case type::suspendAcknowledge:
+            if (suspended_.size() < mostRemembered)
+                suspended_.push_back({life.call.number, message.at, life.identity});
+            end(life, EndedBy::suspended, momentOf(message), &message);
+            break;
+        case type::status:
+            if (namesNullState(message))
+                end(life, EndedBy::release, momentOf(message), &message);
+            break;
+        default:
+            break;
+    }
+}
+
+// A terminal leaves a call that was offered to all. The call ends when the last one has left and no other can
+// join any more.
+void CallTable::endTerminal(Life& life, const Message& message) {
+    if (message.layer3.type == type::releaseComplete)
+        life.left.set(message.layer2.tei);
+    if (life.winner || life.left != life.joined)
+        return;
+    if (message.at - life.lastSetup > timers_.t312 || life.call.clearingSeen)
+        endIfAllTerminalsLeft(life, momentOf(message), &message);
+}
+
+void CallTable::endIfAllTerminalsLeft(Life& life, const Moment& moment, const Message* message) {
+    if (life.winner || life.left != life.joined)
+        return;
+    if (!life.call.clearingSeen && life.call.causeBefore)
+        life.call.cause = std::exchange(life.call.causeBefore, std::nullopt);
+    end(life, EndedBy::release, moment, message);
+}
+
+void CallTable::end(Life& life, EndedBy by, const Moment& moment, const Message* message) {
+    conclude(life, by, moment);
+    schedule(life, moment.at + timers_.t308 + timers_.slack);
+    observer_.ended(life.call, message);
+}
+
+// Older deadlines of the life are void.
+void CallTable::schedule(Life& life, std::int64_t at) {
+    deadlines_.emplace(at, std::pair(life.key, ++life.generation));
+}
+
+void CallTable::forget(Life& life) {
+    const CallKey key = life.key;
+    remember(key, life.call.end.at);
+    observer_.gone(life.call);
+    inOrder_.erase(life.call.number);
+    lives_.erase(key);
+}
+
+void CallTable::remember(const CallKey& key, std::int64_t at) {
+    const auto [entry, isNew] = remembered_.insert_or_assign(key, at);
+    if (!isNew)
+        return;
+    rememberedInOrder_.push_back(key);
+    if (rememberedInOrder_.size() <= mostRemembered)
+        return;
+    remembered_.erase(rememberedInOrder_.front());
+    rememberedInOrder_.pop_front();
+}
+
+void CallTable::dropOldest() {
+    ++dropped_;
+    Life& life = *find(inOrder_.begin()->second);
+    if (!life.ended) {
+        life.call.uncertain = true;
+        conclude(life, EndedBy::open, life.call.end);
+        observer_.ended(life.call, nullptr);
+    }
+    forget(life);
+}
+
+void CallTable::advance(std::int64_t at) {
+    while (!deadlines_.empty() && deadlines_.begin()->first <= at) {
+        const auto [key, generation] = deadlines_.begin()->second;
+        deadlines_.erase(deadlines_.begin());
+        Life* const life = find(key);
+        if (life != nullptr && life->generation == generation)
+            due(*life, at);
+    }
+    endLostLinks(at);
+}
+
+// Stragglers come no more, or terminals cannot join any more.
+void CallTable::due(Life& life, std::int64_t at) {
+    if (life.ended) {
+        forget(life);
+        return;
+    }
+    Moment moment = life.call.end;
+    moment.at = std::min(at, life.lastSetup + timers_.t312);
+    endIfAllTerminalsLeft(life, moment, nullptr);
+}
+
+void CallTable::linkDown(std::uint8_t tei, std::int64_t at) { downSince_.try_emplace(tei, at); }
+
+void CallTable::linkUp(std::uint8_t tei) { downSince_.erase(tei); }
+
+void CallTable::endLostLinks(std::int64_t at) {
+    for (auto down = downSince_.begin(); down != downSince_.end();) {
+        if (at - down->second <= timers_.t309) {
+            ++down;
+            continue;
+        }
+        const std::int64_t endedAt = down->second + timers_.t309;
+        for (const auto& [key, life] : lives_) {
+            if (life->ended || life->call.tei != down->first)
+                continue;
+            Moment moment = life->call.end;
+            moment.at = endedAt;
+            end(*life, EndedBy::link, moment, nullptr);
+        }
+        down = downSince_.erase(down);
+    }
+}
+
+void CallTable::restarted(const Message& acknowledge) {
+    advance(acknowledge.at);
+    const isdn::Elements& elements = acknowledge.layer3.elements;
+    const Restarted restarted{
+        isdn::restartClass(elements.find(element::restartIndicator)).value_or(Restarted::channels),
+        isdn::channelId(elements.find(element::channelIdentification))};
+    for (const auto& [key, life] : lives_) {
+        if (!life->ended && restarted.covers(life->call))
+            end(*life, EndedBy::restart, momentOf(acknowledge), &acknowledge);
+    }
+}
+
+void CallTable::boardRestarted() {
+    for (const auto& [key, life] : lives_)
+        life->call.uncertain = !life->ended || life->call.uncertain;
+}
+
+void CallTable::finish() {
+    std::vector<Life*> rest;
+    for (const auto& [number, key] : inOrder_)
+        rest.push_back(find(key));
+    for (Life* life : rest) {
+        if (!life->ended) {
+            conclude(*life, EndedBy::open, life->call.end);
+            observer_.ended(life->call, nullptr);
+        }
+    }
+    std::stable_sort(rest.begin(), rest.end(), [](const Life* a, const Life* b) {
+        const auto rank = [](const Life* life) {
+            const bool isOpen = life->call.endedBy == EndedBy::open;
+            return std::pair(isOpen, isOpen ? std::int64_t{0} : life->call.end.at);
+        };
+        return rank(a) < rank(b);
+    });
+    for (Life* life : rest)
+        forget(*life);
+}
+
+std::vector<const Call*> CallTable::open() const {
+    std::vector<const Call*> calls;
+    for (const auto& [number, key] : inOrder_) {
+        if (const Life* const life = find(key); !life->ended)
+            calls.push_back(&life->call);
+    }
+    return calls;
+}
+
+}  // namespace calls

@@ -1,0 +1,25 @@
+// Which elements a message must have, and which may stand in it more than once (Q.931 3.1, 4.5).
+#ifndef CALLS_ELEMENTRULES_H
+#define CALLS_ELEMENTRULES_H
+
+#include <string>
+#include <vector>
+
+#include "calls/FindingKinds.h"
+#include "calls/Message.h"
+
+namespace calls {
+
+// A broken rule: its kind, and the case in words.
+struct BrokenRule {
+    const FindingKind* kind;
+    std::string sentence;
+};
+
+// `clearsFirst`: the message is the first of its call that clears it, and so must name a cause. The message
+// is one of call control or maintenance.
+std::vector<BrokenRule> brokenElementRules(const Message& message, bool clearsFirst);
+
+}  // namespace calls
+
+#endif

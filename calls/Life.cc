@@ -1,0 +1,256 @@
+#include "calls/Life.h"
+
+#include <algorithm>
+
+#include "calls/causes.h"
+#include "isdn/words.h"
+
+namespace calls {
+
+namespace {
+
+using isdn::Element;
+namespace element = isdn::element;
+namespace type = isdn::message;
+
+Number numberOf(const isdn::PartyNumber& party) {
+    return {std::string(party.digits), party.type, party.plan, party.presentation};
+}
+
+// The first element counts when one stands twice (Q.931 4.5.1).
+void learnNumber(Number& number, const Element& found) {
+    if (!number.digits.empty() || found.octets.empty())
+        return;
+    if (const auto party = isdn::partyNumber(found))
+        number = numberOf(*party);
+}
+
+// The digits of the called party come in SETUP and, one by one, in INFORMATION.
+void learnDigits(Life& life, const Message& message) {
+    Call& call = life.call;
+    const isdn::Layer3& layer3 = message.layer3;
+    const bool isSetup = layer3.type == type::setup;
+    if (message.from() != call.origin || life.proceeding || (!isSetup && layer3.type != type::information))
+        return;
+    const auto party = isdn::partyNumber(layer3.elements.find(element::calledNumber));
+    const std::string_view keypad = isdn::keypadDigits(layer3.elements.find(element::keypad));
+    std::string_view digits;
+    if (party && !life.digitsFromKeypad) {
+        if (call.called.digits.empty())
+            call.called = numberOf(*party);
+        else
+            digits = party->digits;
+    } else if (!keypad.empty() && (life.digitsFromKeypad || call.called.digits.empty())) {
+        life.digitsFromKeypad = true;
+        digits = keypad;
+    }
+    constexpr std::size_t most = 256;  // more are no number that anybody dials
+    if (call.called.digits.size() + digits.size() <= most)
+        call.called.digits.append(digits);
+    if (!isSetup && (party || !keypad.empty())) {
+        call.overlap = true;
+        call.lastDigit = message.at - call.begin.at;
+    }
+}
+
+void learnBearer(Call& call, const Message& message) {
+    const Element bearer = message.layer3.elements.find(element::bearerCapability);
+    if (call.bearer.empty() && !bearer.octets.empty())
+        isdn::appendWords(call.bearer, bearer, message.variant);
+}
+
+void learnChannel(Life& life, const Message& message) {
+    const Element found = message.layer3.elements.find(element::channelIdentification);
+    if (found.octets.empty())
+        return;
+    const auto channel = isdn::channelId(found);
+    if (!channel)
+        return;
+    Call& call = life.call;
+    if (message.from() == call.origin) {
+        if (message.layer3.type == type::setup && !call.asked)
+            call.asked = channel;
+    } else if (!call.granted && !isClearing(message.layer3.type)) {
+        call.granted = channel;
+    }
+}
+
+void learnTime(std::optional<std::int64_t>& since, const Call& call, const Message& message) {
+    if (!since)
+        since = message.at - call.begin.at;
+}
+
+void learnTimes(Life& life, const Message& message) {
+    Call& call = life.call;
+    if (message.from() == call.origin)
+        return;
+    life.answered = true;
+    if (call.beforeTrace)
+        return;  // the time of SETUP is not known
+    switch (message.layer3.type) {
+        case type::progress:
+            learnTime(call.progress, call, message);
+            break;
+        case type::alerting:
+            learnTime(call.alerting, call, message);
+            break;
+        case type::connect:
+            learnTime(call.connect, call, message);
+            break;
+        default:
+            break;
+    }
+    learnTime(call.firstResponse, call, message);
+}
+
+std::optional<CauseGiven> causeOf(const Message& message) {
+    const auto cause = isdn::cause(message.layer3.elements.find(element::cause));
+    if (!cause)
+        return std::nullopt;
+    return CauseGiven{message.number,        message.layer3.type,
+                      message.from(),        message.senderRole(),
+                      cause->codingStandard, cause->location,
+                      cause->value,          {cause->diagnostics.begin(), cause->diagnostics.end()}};
+}
+
+// N(R) of the message covers the frame that began the clearing (modulo 128).
+bool covers(const Message& message, std::uint8_t ns) {
+    const unsigned ahead = (message.layer2.nr - ns - 1U) & 127U;
+    return message.layer2.hasNr() && ahead < 64;
+}
+
+// A terminal refuses a call to all terminals, or is let go because another one has it.
+bool concernsOneTerminal(const Life& life, const Message& message) {
+    if (!life.call.broadcast)
+        return false;
+    return life.winner ? *life.winner != message.layer2.tei : message.from() != life.call.origin;
+}
+
+void learnClearing(Life& life, const Message& message) {
+    Call& call = life.call;
+    const std::uint8_t messageType = message.layer3.type;
+    std::optional<CauseGiven> cause = causeOf(message);
+    if (!isClearing(messageType)) {
+        if (cause && messageType == type::progress && !call.causeBefore)
+            call.causeBefore = std::move(cause);
+        return;
+    }
+    if (concernsOneTerminal(life, message)) {
+        if (cause && !call.causeBefore && message.from() != call.origin)
+            call.causeBefore = std::move(cause);
+        return;
+    }
+    if (!call.clearingSeen) {
+        call.clearingSeen = true;
+        call.cause = std::move(cause);
+        call.clearedBy = message.from() == Side::us ? ClearedBy::us : ClearedBy::peer;
+        life.clearedFirst = message.from();
+        life.clearingNumbered = message.layer2.hasNs();
+        life.clearingNs = message.layer2.ns;
+        if (life.connectAt)
+            call.duration = message.at - *life.connectAt;
+        return;
+    }
+    if (cause && call.laterCauses.size() < 16)
+        call.laterCauses.push_back(std::move(*cause));
+    if (life.crossingDecided || message.from() == life.clearedFirst)
+        return;
+    life.crossingDecided = true;
+    if (messageType != type::releaseComplete && life.clearingNumbered && message.layer2.hasNs() &&
+        !covers(message, life.clearingNs))
+        call.clearedBy = ClearedBy::both;
+}
+
+void learnPhase(Life& life, const Message& message) {
+    Call& call = life.call;
+    switch (message.layer3.type) {
+        case type::callProceeding:
+        case type::alerting:
+        case type::connect:
+            life.proceeding = life.proceeding || message.from() != call.origin;
+            break;
+        default:
+            break;
+    }
+    if (call.clearingSeen) {
+        call.phase = Phase::clearing;
+        return;
+    }
+    switch (message.layer3.type) {
+        case type::connect:
+            if (!life.connectAt)
+                life.connectAt = message.at;
+            call.phase = Phase::talking;
+            break;
+        case type::connectAcknowledge:
+        case type::retrieveAcknowledge:
+        case type::resumeAcknowledge:
+            call.phase = Phase::talking;
+            if (!life.connectAt)
+                life.connectAt = message.at;
+            break;
+        case type::holdAcknowledge:
+            call.phase = Phase::held;
+            break;
+        default:
+            break;
+    }
+}
+
+bool isWithoutChannel(const Call& call) {
+    const auto& channel = call.channel();
+    return channel && (channel->dChannel || channel->selection == isdn::ChannelId::Selection::none) &&
+           channel->channels.none();
+}
+
+}  // namespace
+
+void learn(Life& life, const Message& message) {
+    Call& call = life.call;
+    ++call.messages;
+    if (call.frames.size() < Call::mostFrames)
+        call.frames.push_back(message.number);
+    if (life.ended) {
+        learnClearing(life, message);
+        return;
+    }
+    call.end = momentOf(message);
+    const isdn::Elements& elements = message.layer3.elements;
+    learnNumber(call.calling, elements.find(element::callingNumber));
+    learnNumber(call.connected, elements.find(element::connectedNumber));
+    learnNumber(call.redirecting, elements.find(element::redirectingNumber));
+    learnNumber(call.redirecting, elements.find(element::originalCalledNumber));
+    learnDigits(life, message);
+    learnBearer(call, message);
+    learnChannel(life, message);
+    learnTimes(life, message);
+    learnClearing(life, message);
+    learnPhase(life, message);
+}
+
+void conclude(Life& life, EndedBy by, const Moment& end) {
+    Call& call = life.call;
+    life.ended = true;
+    call.phase = Phase::ended;
+    call.endedBy = by;
+    call.end = end;
+    if (call.kind == Kind::call && isWithoutChannel(call) && life.connectAt)
+        call.kind = Kind::signalling;
+    if (!call.clearingSeen && by != EndedBy::open)
+        call.clearedBy = ClearedBy::nobody;
+    if (life.connectAt && !call.duration && by != EndedBy::open)
+        call.duration = end.at - *life.connectAt;
+    const bool byOrigin = life.clearedFirst == call.origin && call.clearedBy != ClearedBy::both;
+    if (life.connectAt)
+        call.outcome = Outcome::answered;
+    else if (by == EndedBy::open)
+        call.outcome = Outcome::open;
+    else if (call.broadcast && !call.firstResponse)
+        call.outcome = Outcome::noAnswer;
+    else if (call.clearingSeen && byOrigin && !call.beforeTrace)
+        call.outcome = Outcome::abandoned;
+    else
+        call.outcome = call.cause ? outcomeOf(*call.cause) : Outcome::other;
+}
+
+}  // namespace calls

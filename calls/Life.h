@@ -1,0 +1,46 @@
+// A call, and what the table and its progress need to know besides. Internal to calls/.
+#ifndef CALLS_LIFE_H
+#define CALLS_LIFE_H
+
+#include <bitset>
+#include <cstdint>
+#include <optional>
+#include <vector>
+
+#include "calls/CallTable.h"
+
+namespace calls {
+
+struct Life {
+    Call call;
+    CallKey key;
+    std::vector<std::uint8_t> setup;  // the octets of SETUP's message, to know its repetitions by
+    std::int64_t lastSetup = 0;       // when it was sent last
+    bool answered = false;            // any message from the other side
+    bool proceeding = false;          // CALL PROCEEDING or later: no more digits come
+    bool digitsFromKeypad = false;
+    bool ended = false;
+    std::uint64_t generation = 0;      // of its deadlines; older ones are void
+    std::optional<Side> releasedBy;    // who sent RELEASE first
+    std::optional<Side> clearedFirst;  // who sent the first clearing message
+    std::uint8_t clearingNs = 0;       // its N(S), if it was an I frame
+    bool clearingNumbered = false;
+    bool crossingDecided = false;  // whether the other side cleared on its own
+    std::optional<std::int64_t> connectAt;
+    std::vector<std::uint8_t> identity;  // of SUSPEND or RESUME
+    // Of a broadcast SETUP: the terminals that answered, and those that are out of it.
+    std::bitset<128> joined;
+    std::bitset<128> left;
+    std::optional<std::uint8_t> winner;  // the one that got CONNECT ACKNOWLEDGE
+};
+
+// Takes over what a message says about the call: numbers, bearer, channel, times, causes. Whether the call
+// begins or ends with it is not looked at.
+void learn(Life& life, const Message& message);
+
+// Fills in what is known only at the end: outcome, duration, who cleared.
+void conclude(Life& life, EndedBy by, const Moment& end);
+
+}  // namespace calls
+
+#endif

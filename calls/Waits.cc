@@ -1,0 +1,242 @@
+#include "calls/Waits.h"
+
+#include <algorithm>
+#include <bitset>
+
+namespace calls {
+
+namespace {
+
+namespace element = isdn::element;
+namespace type = isdn::message;
+
+using Types = std::bitset<128>;
+Types typesOf(std::initializer_list<std::uint8_t> list) {
+    Types types;
+    for (const std::uint8_t each : list)
+        types.set(each);
+    return types;
+}
+
+constexpr std::uint8_t endToEndNot = 1, destinationNotIsdn = 2, inBandInformation = 8;
+
+bool announces(const Message& message, std::initializer_list<std::uint8_t> descriptions) {
+    const auto progress = isdn::progress(message.layer3.elements.find(element::progressIndicator));
+    return progress &&
+           std::find(descriptions.begin(), descriptions.end(), progress->value) != descriptions.end();
+}
+
+std::string seconds(std::int64_t nanoseconds) {
+    const std::int64_t tenths = (nanoseconds + 50 * millisecond) / (100 * millisecond);
+    std::string text = std::to_string(tenths / 10);
+    if (tenths % 10 != 0)
+        text += "." + std::to_string(tenths % 10);
+    return text + " s";
+}
+
+}  // namespace
+
+// A row for each question. The finding comes one timer after the last repetition.
+struct Waits::Rule {
+    std::uint8_t ask;
+    capture::Role asker;            // of which side; unknown: of either
+    Types answers;                  // from the side that must answer
+    bool clearingAnswers;           // a clearing message of either side ends the wait
+    bool sameSideAnswers;           // the side that sent `ask` has to go on
+    std::string_view timer;         // its name, for people
+    std::int64_t Timers::*user;     // its value if the user waits
+    std::int64_t Timers::*network;  // if the network does
+    bool isRepeated;                // the sender repeats it once
+    const FindingKind* finding;
+    const FindingKind* repetition;
+};
+
+const std::vector<Waits::Rule>& Waits::rules() {
+    using T = Timers;
+    const Types clearing = typesOf({type::disconnect, type::release, type::releaseComplete});
+    static const std::vector<Rule> rows{
+        {type::setup, capture::Role::unknown,
+         typesOf(
+             {type::callProceeding, type::setupAcknowledge, type::alerting, type::progress, type::connect}) |
+             clearing,
+         true, false, "T303", &T::t303, &T::t303, true, &findings::setupUnanswered, &findings::setupRepeated},
+        {type::callProceeding, capture::Role::unknown, typesOf({type::alerting, type::connect}), true, true,
+         "T310", &T::t310User, &T::t310Network, false, &findings::proceedingUnanswered, nullptr},
+        {type::connect, capture::Role::user, typesOf({type::connectAcknowledge}), true, false, "T313",
+         &T::t313, &T::t313, false, &findings::connectNotAcknowledged, nullptr},
+        // The standard leaves the answer to the user: it is missed only if this user has given it before.
+        {type::connect, capture::Role::network, typesOf({type::connectAcknowledge}), true, false, "T313",
+         &T::t313, &T::t313, false, &findings::connectNeverAcknowledged, nullptr},
+        {type::disconnect, capture::Role::unknown, clearing, false, false, "T305", &T::t305, &T::t305, false,
+         &findings::disconnectUnanswered, nullptr},
+        {type::release, capture::Role::unknown, typesOf({type::release, type::releaseComplete}), false, false,
+         "T308", &T::t308, &T::t308, true, &findings::releaseUnanswered, &findings::releaseRepeated},
+        {type::statusEnquiry, capture::Role::unknown, typesOf({type::status}), true, false, "T322", &T::t322,
+         &T::t322, true, &findings::statusEnquiryUnanswered, nullptr},
+    };
+    return rows;
+}
+
+void Waits::heard(Call& call, const Message& message) {
+    seen_ |= message.from() == Side::us ? 1U : 2U;
+    if (call.phase == Phase::ended)
+        return;
+    if (message.layer3.type == type::connectAcknowledge && message.senderRole() == capture::Role::user)
+        acknowledging_.insert(message.layer2.tei);
+    answer(call, message);
+    ask(call, message);
+}
+
+std::vector<std::uint64_t> Waits::waitsOf(const Call& call) const {
+    const auto found = ofCall_.find(call.number);
+    return found == ofCall_.end() ? std::vector<std::uint64_t>() : found->second;
+}
+
+void Waits::answer(Call& call, const Message& message) {
+    const std::uint8_t messageType = message.layer3.type;
+    const bool clears = isClearing(messageType);
+    const std::vector<std::uint64_t> pending = waitsOf(call);
+    for (const std::uint64_t id : pending) {
+        const Wait& wait = waits_.at(id);
+        const Rule& rule = *wait.rule;
+        const Side answering = rule.sameSideAnswers ? wait.asker : other(wait.asker);
+        const bool answered = (message.from() == answering && rule.answers.test(messageType & 127U)) ||
+                              (rule.ask == type::callProceeding && messageType == type::progress &&
+                               announces(message, {endToEndNot, destinationNotIsdn, inBandInformation})) ||
+                              (clears && rule.clearingAnswers);
+        if (answered) {
+            drop(id);
+        } else if (rule.ask == type::disconnect && messageType == type::release &&
+                   message.from() == wait.asker) {
+            expire(wait, message.at);  // its sender has given up waiting
+            drop(id);
+        }
+    }
+}
+
+void Waits::ask(Call& call, const Message& message) {
+    const auto rule = std::find_if(rules().begin(), rules().end(), [&](const Rule& each) {
+        return each.ask == message.layer3.type &&
+               (each.asker == capture::Role::unknown || each.asker == message.senderRole());
+    });
+    if (rule == rules().end() || call.broadcast)
+        return;
+    for (const std::uint64_t id : waitsOf(call)) {
+        Wait& wait = waits_.at(id);
+        if (wait.rule == &*rule && wait.asker == message.from()) {
+            repeat(wait, message);
+            return;
+        }
+    }
+    Wait wait;
+    wait.rule = &*rule;
+    wait.call = &call;
+    wait.asker = message.from();
+    wait.tei = message.layer2.tei;
+    wait.first = wait.last = momentOf(message);
+    wait.timer = timerOf(*rule, message);
+    wait.deadline = message.at + wait.timer * (rule->isRepeated ? 2 : 1) + timers_.slack;
+    const std::uint64_t id = ++lastId_;
+    ofCall_[call.number].push_back(id);
+    deadlines_.emplace(wait.deadline, id);
+    waits_.emplace(id, std::move(wait));
+}
+
+// Who waits decides: a timer may differ between the user and the network side.
+std::int64_t Waits::timerOf(const Rule& rule, const Message& message) const {
+    if (rule.ask == type::disconnect && announces(message, {inBandInformation}))
+        return timers_.t306;
+    const capture::Role sender = message.senderRole();
+    const bool networkWaits =
+        rule.sameSideAnswers ? sender == capture::Role::user : sender == capture::Role::network;
+    return networkWaits ? timers_.*rule.network : timers_.*rule.user;
+}
+
+void Waits::repeat(Wait& wait, const Message& message) {
+    ++wait.repetitions;
+    if (wait.repetitions == 1 && wait.rule->repetition != nullptr) {
+        wait.last = momentOf(message);
+        report(*wait.rule->repetition, wait,
+               std::string(isdn::messageName(message.layer3)) + " repeated after " +
+                   seconds(message.at - wait.first.at));
+    }
+    wait.last = momentOf(message);
+    const auto old = std::find_if(deadlines_.begin(), deadlines_.end(),
+                                  [&](const auto& each) { return &waits_.at(each.second) == &wait; });
+    const std::uint64_t id = old->second;
+    deadlines_.erase(old);
+    wait.deadline = message.at + wait.timer + timers_.slack;
+    deadlines_.emplace(wait.deadline, id);
+}
+
+void Waits::ended(Call& call, const Message*) { dropAll(call); }
+
+void Waits::advance(std::int64_t at) {
+    while (!deadlines_.empty() && deadlines_.begin()->first <= at) {
+        const std::uint64_t id = deadlines_.begin()->second;
+        const Wait& wait = waits_.at(id);
+        expire(wait, wait.deadline - timers_.slack);
+        drop(id);
+    }
+}
+
+void Waits::expire(const Wait& wait, std::int64_t until) {
+    if (seen_ != 3U)
+        return;
+    if (wait.rule->finding == &findings::connectNeverAcknowledged && !acknowledging_.contains(wait.tei))
+        return;
+    const Rule& rule = *wait.rule;
+    const std::string name(isdn::messageName(isdn::callControl, rule.ask));
+    std::string what = name + " of frame " + std::to_string(wait.first.frame) + " got no answer for " +
+                       seconds(until - wait.first.at) + " (" + std::string(rule.timer);
+    what += wait.repetitions == 0 ? ")" : ", repeated " + std::to_string(wait.repetitions) + "x)";
+    if (const std::string_view doubt = doubtAbout(wait); !doubt.empty())
+        report(findings::cannotBeTold, wait, what + ", but " + std::string(doubt));
+    else
+        report(*rule.finding, wait, std::move(what));
+}
+
+std::string_view Waits::doubtAbout(const Wait& wait) const {
+    const LinkWitness* const link = links_.witness(wait.tei);
+    if (link == nullptr)
+        return "nothing is known of the link";
+    if (!link->wasUpSince(wait.first.at))
+        return "the link was down meanwhile";
+    if (!link->hasArrived(wait.first.frame, wait.asker))
+        return "the receiver's link layer did not acknowledge it";
+    const Side answering = wait.rule->sameSideAnswers ? wait.asker : other(wait.asker);
+    if (!link->isWholeSince(wait.first.at, answering))
+        return "a frame that may be the answer is missing in the trace";
+    return {};
+}
+
+void Waits::report(const FindingKind& kind, const Wait& wait, std::string sentence) {
+    Finding finding;
+    finding.kind = &kind;
+    finding.severity = kind.severity;
+    finding.frame = wait.last.frame;
+    finding.clock = wait.last.clock;
+    finding.time = wait.last.time;
+    finding.dChannel = wait.call->dChannel;
+    finding.call = wait.call->number;
+    finding.sentence = std::move(sentence);
+    sink_.report(std::move(finding));
+}
+
+void Waits::drop(std::uint64_t id) {
+    const auto wait = waits_.find(id);
+    const Call& call = *wait->second.call;
+    deadlines_.erase({wait->second.deadline, id});
+    std::vector<std::uint64_t>& siblings = ofCall_[call.number];
+    std::erase(siblings, id);
+    if (siblings.empty())
+        ofCall_.erase(call.number);
+    waits_.erase(wait);
+}
+
+void Waits::dropAll(const Call& call) {
+    for (const std::uint64_t id : waitsOf(call))
+        drop(id);
+}
+
+}  // namespace calls

@@ -1,0 +1,154 @@
+#include "calls/Waits.h"
+
+#include <gtest/gtest.h>
+
+#include "tests/calls/Findings.h"
+
+namespace calls {
+
+namespace {
+
+using namespace test;
+namespace m = isdn::message;
+
+// An earlier call, so that both directions have been heard.
+CallScript afterACall(capture::Role role = capture::Role::user) {
+    CallScript script(role);
+    script.at(0).us(m::setup, 1, false, {bearerSpeech()});
+    script.at(5).peer(m::releaseComplete, 1, true, {cause(17)});
+    return script;
+}
+
+}  // namespace
+
+TEST(Waits, FindASetupThatIsNotAnsweredAfterItsRepetition) {
+    CallScript script = afterACall();
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    script.at(14000).us(m::setup, 2, false, {bearerSpeech()});
+    EXPECT_EQ(findingsOf(script, 17990), "4 setup-repeated\n");
+    EXPECT_EQ(findingsOf(script, 18010), "4 setup-repeated\n4 setup-unanswered\n");
+}
+
+TEST(Waits, AreOverWithAnyAnswerToSetup) {
+    for (const std::uint8_t answer : {m::callProceeding, m::setupAcknowledge, m::alerting, m::connect}) {
+        CallScript script = afterACall();
+        script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+        script.at(13900).peer(answer, 2, true);
+        EXPECT_EQ(findingsOf(script, 19000), "") << int{answer};
+    }
+}
+
+TEST(Waits, FindAConnectOfTheUserThatTheNetworkDoesNotAcknowledge) {
+    CallScript script = afterACall(capture::Role::user);
+    script.at(10000).peer(m::setup, 2, false, {bearerSpeech()});
+    script.at(11000).us(m::connect, 2, true);
+    EXPECT_EQ(findingsOf(script, 14900), "");
+    EXPECT_EQ(findingsOf(script, 15100), "4 connect-not-acknowledged\n");
+    script.at(12000).peer(m::connectAcknowledge, 2, false);
+    EXPECT_EQ(findingsOf(script, 15100), "");
+}
+
+TEST(Waits, AreSilentIfTheCallerNeverAcknowledgesConnect) {
+    CallScript script = afterACall(capture::Role::user);
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    script.at(11000).peer(m::connect, 2, true);
+    EXPECT_EQ(findingsOf(script, 30000), "");
+}
+
+TEST(Waits, NoteAConnectThatTheUserDoesNotAcknowledgeAlthoughItDidBefore) {
+    CallScript script = afterACall(capture::Role::user);
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    script.at(11000).peer(m::connect, 2, true);
+    script.at(11010).us(m::connectAcknowledge, 2, false);
+    script.at(20000).us(m::setup, 3, false, {bearerSpeech()});
+    script.at(21000).peer(m::connect, 3, true);
+    EXPECT_EQ(findingsOf(script, 30000), "7 connect-acknowledge-missing\n");
+}
+
+TEST(Waits, FindADisconnectThatNobodyAnswers) {
+    CallScript script = afterACall();
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    script.at(11000).peer(m::connect, 2, true);
+    script.at(12000).us(m::disconnect, 2, false, {cause(16)});
+    EXPECT_EQ(findingsOf(script, 41900), "");
+    EXPECT_EQ(findingsOf(script, 42100), "5 disconnect-unanswered\n");
+    script.at(42000).us(m::release, 2, false);
+    script.at(42010).peer(m::releaseComplete, 2, true);
+    EXPECT_EQ(findingsOf(script, 50000), "5 disconnect-unanswered\n");
+}
+
+TEST(Waits, GiveADisconnectWithAnAnnouncementTheTimeOfT306) {
+    CallScript script = afterACall();
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    script.at(11000).peer(m::callProceeding, 2, true);
+    script.at(12000).peer(m::disconnect, 2, true, {cause(1, 2), progress(8)});
+    script.at(37000).us(m::release, 2, false);
+    script.at(37010).peer(m::releaseComplete, 2, true);
+    EXPECT_EQ(findingsOf(script, 60000), "");
+}
+
+TEST(Waits, FindAReleaseThatIsNotAnsweredAfterItsRepetition) {
+    CallScript script = afterACall();
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    script.at(11000).peer(m::connect, 2, true);
+    script.at(12000).us(m::release, 2, false, {cause(16)});
+    script.at(16000).us(m::release, 2, false, {cause(16)});
+    EXPECT_EQ(findingsOf(script, 19900), "6 release-repeated\n");
+    EXPECT_EQ(findingsOf(script, 20100), "6 release-repeated\n6 release-unanswered\n");
+}
+
+TEST(Waits, TakeACollisionOfReleasesForAnswers) {
+    CallScript script = afterACall();
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    script.at(11000).peer(m::connect, 2, true);
+    script.crossing().at(12000).us(m::release, 2, false, {cause(16)}).peer(m::release, 2, true, {cause(16)});
+    EXPECT_EQ(findingsOf(script, 60000), "");
+}
+
+TEST(Waits, FindACallThatProceedsToNothing) {
+    CallScript script = afterACall();
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    script.at(10100).peer(m::callProceeding, 2, true);
+    EXPECT_EQ(findingsOf(script, 130000), "");  // the user's T310 is 120 s
+    EXPECT_EQ(findingsOf(script, 130200), "4 proceeding-unanswered\n");
+    script.at(20000).peer(m::progress, 2, true, {progress(8)});
+    EXPECT_EQ(findingsOf(script, 130200), "");
+}
+
+TEST(Waits, FindAStatusEnquiryThatIsNotAnswered) {
+    CallScript script = afterACall();
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    script.at(11000).peer(m::connect, 2, true);
+    script.at(12000).us(m::statusEnquiry, 2, false);
+    script.at(16000).us(m::statusEnquiry, 2, false);
+    EXPECT_EQ(findingsOf(script, 20100), "6 status-enquiry-unanswered\n");
+    script.at(17000).peer(m::status, 2, true, {cause(30), callState(10)});
+    EXPECT_EQ(findingsOf(script, 20100), "");
+}
+
+TEST(Waits, SayThatItCannotBeToldWhenTheLinkLeavesADoubt) {
+    CallScript script = afterACall();
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    struct {
+        const char* says;
+        void (*spoil)(LinkWitness&);
+    } const doubts[] = {
+        {"down", [](LinkWitness& link) { link.up = false; }},
+        {"was down", [](LinkWitness& link) { link.lastDown = 12 * second; }},
+        {"not acknowledged", [](LinkWitness& link) { link.acknowledged[0] = 2; }},
+        {"hole", [](LinkWitness& link) { link.lastHole[1] = 12 * second; }},
+    };
+    for (const auto& doubt : doubts) {
+        HealthyLink link;
+        doubt.spoil(link.own);
+        EXPECT_EQ(findingsOf(script, 20000, link), "3 cannot-be-told\n") << doubt.says;
+    }
+}
+
+TEST(Waits, SayNothingWhileOnlyOneDirectionIsHeard) {
+    CallScript script;
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    EXPECT_EQ(findingsOf(script, 100000), "");
+}
+
+}  // namespace calls
