@@ -47,7 +47,9 @@ struct Frame {
     // Address, control and information, without the check sequence. They belong to whoever gave the frame
     // and are valid until the next one is asked for; Batch keeps copies.
     std::span<const std::uint8_t> octets;
-    bool transmitted = false;  // by our side
+    // By our side. Where an input has no direction, the user side counts as ours (Directions), and `role` is
+    // user.
+    bool transmitted = false;
     Role role = Role::unknown;
     Clock clock = Clock::none;
     std::int64_t time = 0;               // nanoseconds, as `clock` says

@@ -22,7 +22,7 @@ class Reader {
   public:
     enum class Next : std::uint8_t {
         item,   // `item` holds the next one
-        pause,  // only when following: nothing more is there just now; see wait()
+        pause,  // nothing more is there just now: a pipe, or a file that is followed; see wait()
         end     // for good
     };
     // How far reading has come, in octets; `of` is 0 when the length is unknown (a pipe).

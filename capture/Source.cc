@@ -1,0 +1,193 @@
+#include "capture/Source.h"
+
+#include <fcntl.h>
+#include <poll.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <cstring>
+#include <utility>
+
+namespace capture {
+
+namespace {
+
+constexpr std::size_t readSize = std::size_t{1} << 18;
+constexpr std::size_t lastSize = 64;             // of the octets that tell one content from another
+constexpr std::chrono::milliseconds glance{20};  // how often a growing file is looked at
+
+[[noreturn]] void fail(const std::string& name) { throw BadInput(name + ": " + std::strerror(errno)); }
+
+int open(const std::string& name) {
+    if (name == "-")
+        return STDIN_FILENO;
+    const int file = ::open(name.c_str(), O_RDONLY | O_CLOEXEC);
+    if (file < 0)
+        fail(name);
+    return file;
+}
+
+struct stat statusOf(int file, const std::string& name) {
+    struct stat status {};
+    if (fstat(file, &status) != 0)
+        fail(name);
+    return status;
+}
+
+}  // namespace
+
+Source::Source(std::string path, bool follow)
+    : name_(std::move(path)), file_(open(name_)), follow_(follow), capacity_(2 * readSize) {
+    const struct stat status = statusOf(file_, name_);
+    isRegular_ = S_ISREG(status.st_mode);
+    if (follow_ && S_ISFIFO(status.st_mode) && file_ != STDIN_FILENO)
+        ownWriter_ = ::open(name_.c_str(), O_WRONLY | O_NONBLOCK | O_CLOEXEC);
+    buffer_ = std::make_unique_for_overwrite<char[]>(capacity_);
+}
+
+Source::~Source() {
+    for (const int file : {file_, ownWriter_}) {
+        if (file > STDIN_FILENO)
+            ::close(file);
+    }
+}
+
+Source::State Source::want(std::size_t octets) {
+    while (end_ - begin_ < octets) {
+        if (ended_ || replaced_)
+            return State::end;
+        makeRoom(octets);
+        if (const State state = readMore(); state != State::ready)
+            return state;
+    }
+    return State::ready;
+}
+
+// For what is wanted, and for a whole read behind what is held.
+void Source::makeRoom(std::size_t octets) {
+    const std::size_t held = end_ - begin_;
+    const std::size_t needed = std::max(octets, held) + readSize;
+    if (capacity_ - begin_ >= needed)
+        return;
+    if (capacity_ < needed) {
+        capacity_ = std::max(needed, 2 * capacity_);
+        auto grown = std::make_unique_for_overwrite<char[]>(capacity_);
+        std::memcpy(grown.get(), buffer_.get() + begin_, held);
+        buffer_ = std::move(grown);
+    } else {
+        std::memmove(buffer_.get(), buffer_.get() + begin_, held);
+    }
+    begin_ = 0;
+    end_ = held;
+}
+
+Source::State Source::readMore() {
+    if (!isRegular_ && !isReadable())
+        return State::pause;
+    if (std::exchange(paused_, false) && isRegular_ && isAnotherContent()) {
+        replaced_ = true;
+        return State::end;
+    }
+    const ssize_t some = ::read(file_, buffer_.get() + end_, readSize);
+    if (some > 0) {
+        end_ += static_cast<std::size_t>(some);
+        read_ += static_cast<std::uint64_t>(some);
+        return State::ready;
+    }
+    if (some == 0)
+        return atEnd();
+    if (errno == EINTR || errno == EAGAIN)
+        return State::pause;
+    fail(name_);
+}
+
+Source::State Source::atEnd() {
+    if (!follow_ || !isRegular_) {
+        ended_ = !follow_ || ownWriter_ < 0;
+        return ended_ ? State::end : State::pause;
+    }
+    if (isReplaced()) {
+        replaced_ = true;
+        return State::end;
+    }
+    keepLastOctets();
+    paused_ = true;
+    return State::pause;
+}
+
+bool Source::isReadable() const {
+    pollfd input{file_, POLLIN, 0};
+    return ::poll(&input, 1, 0) > 0;
+}
+
+// At the end of what is there. A name that leads nowhere may be about to lead to a new file.
+bool Source::isReplaced() const {
+    const struct stat here = statusOf(file_, name_);
+    if (static_cast<std::uint64_t>(here.st_size) < read_)
+        return true;
+    struct stat named {};
+    if (file_ == STDIN_FILENO || ::stat(name_.c_str(), &named) != 0)
+        return false;
+    // What was written to the old file before the new one came is still to be read.
+    return (named.st_ino != here.st_ino || named.st_dev != here.st_dev) &&
+           static_cast<std::uint64_t>(here.st_size) == read_;
+}
+
+bool Source::isAnotherContent() const {
+    if (static_cast<std::uint64_t>(statusOf(file_, name_).st_size) < read_)
+        return true;
+    std::array<char, lastSize> now{};
+    const ssize_t size = ::pread(file_, now.data(), last_.size(), static_cast<off_t>(read_ - last_.size()));
+    return size != static_cast<ssize_t>(last_.size()) || std::string_view(now.data(), last_.size()) != last_;
+}
+
+// They are read again: the window may no longer hold them.
+void Source::keepLastOctets() {
+    std::array<char, lastSize> octets{};
+    const std::size_t size = std::min<std::uint64_t>(lastSize, read_);
+    const ssize_t some = ::pread(file_, octets.data(), size, static_cast<off_t>(read_ - size));
+    last_.assign(octets.data(), some > 0 ? static_cast<std::size_t>(some) : 0);
+}
+
+void Source::restart() {
+    const int file = open(name_);
+    if (file_ > STDIN_FILENO)
+        ::close(file_);
+    file_ = file;
+    if (file_ == STDIN_FILENO)
+        static_cast<void>(::lseek(file_, 0, SEEK_SET));
+    replaced_ = paused_ = false;
+    begin_ = end_ = 0;
+    read_ = 0;
+    last_.clear();
+}
+
+void Source::wait(std::chrono::milliseconds most) {
+    const auto until = std::chrono::steady_clock::now() + most;
+    pollfd input{file_, POLLIN, 0};
+    if (!isRegular_) {
+        ::poll(&input, 1, static_cast<int>(most.count()));
+        return;
+    }
+    const std::uint64_t before = read_;
+    while (std::chrono::steady_clock::now() < until) {
+        const auto size = static_cast<std::uint64_t>(statusOf(file_, name_).st_size);
+        if (size != before || isReplaced())
+            return;
+        if (::poll(nullptr, 0, static_cast<int>(std::min(glance, most).count())) < 0)
+            return;  // a signal
+    }
+}
+
+Reader::Progress Source::progress() const {
+    const std::uint64_t done = read_ - (end_ - begin_);
+    if (!isRegular_)
+        return {done, 0};
+    struct stat status {};
+    return {done, fstat(file_, &status) == 0 ? static_cast<std::uint64_t>(status.st_size) : 0};
+}
+
+}  // namespace capture

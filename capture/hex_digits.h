@@ -1,0 +1,51 @@
+// Octets as hexadecimal digits.
+#ifndef CAPTURE_HEX_DIGITS_H
+#define CAPTURE_HEX_DIGITS_H
+
+#include <array>
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace capture {
+
+namespace tables {
+
+constexpr std::array<std::int8_t, 256> makeHexValues() {
+    std::array<std::int8_t, 256> values{};
+    values.fill(-1);
+    for (int i = 0; i < 10; ++i)
+        values[static_cast<std::size_t>('0' + i)] = static_cast<std::int8_t>(i);
+    for (int i = 0; i < 6; ++i) {
+        values[static_cast<std::size_t>('a' + i)] = static_cast<std::int8_t>(10 + i);
+        values[static_cast<std::size_t>('A' + i)] = static_cast<std::int8_t>(10 + i);
+    }
+    return values;
+}
+
+inline constexpr auto hexValues = makeHexValues();
+
+}  // namespace tables
+
+// Below 0 for what is no hexadecimal digit.
+inline int hexValue(char c) { return tables::hexValues[static_cast<unsigned char>(c)]; }
+
+// Appends the octets that the digits, an even number of them, stand for; false, with the octets before the
+// place, when they are none.
+inline bool appendOctets(std::string_view digits, std::vector<std::uint8_t>& octets) {
+    if (digits.size() % 2 != 0)
+        return false;
+    for (std::size_t at = 0; at < digits.size(); at += 2) {
+        const int high = hexValue(digits[at]);
+        const int low = hexValue(digits[at + 1]);
+        if (high < 0 || low < 0)
+            return false;
+        octets.push_back(static_cast<std::uint8_t>(high << 4 | low));
+    }
+    return true;
+}
+
+}  // namespace capture
+
+#endif

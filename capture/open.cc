@@ -1,0 +1,128 @@
+#include "capture/open.h"
+
+#include <algorithm>
+#include <array>
+#include <cctype>
+#include <utility>
+#include <vector>
+
+#include "capture/pcap.h"
+#include "capture/pcapng.h"
+#include "capture/text_forms.h"
+
+namespace capture {
+
+namespace {
+
+constexpr std::array allForms{pcapForm, pcapngForm, hexForm, dumpForm};
+
+// How much of an input is looked at, at most, to find out its form.
+constexpr std::size_t beginningSize = std::size_t{1} << 16;
+
+class AnyReader final : public Reader {
+  public:
+    AnyReader(const std::string& path, ReadOptions options, std::span<const Form> forms)
+        : source_(path, options.follow),
+          options_(std::move(options)),
+          unnamed_(
+              interfaces_.of({options_.trunk.empty() ? trunkOf(path) : options_.trunk, options_.variant})),
+          forms_(forms.begin(), forms.end()) {}
+
+    Next next(Item& item) override {
+        while (true) {
+            if (parser_ == nullptr) {
+                if (const Next found = recognise(); found != Next::item)
+                    return found;
+            }
+            if (const Next result = parser_->next(item); result != Next::end || !source_.replaced())
+                return result;
+            beginAnew(item);
+            return Next::item;
+        }
+    }
+
+    void wait(std::chrono::milliseconds most) override { source_.wait(most); }
+    Progress progress() const override { return source_.progress(); }
+
+  private:
+    // Item when the form is known.
+    Next recognise() {
+        while (true) {
+            const std::size_t held = source_.held().size();
+            const Source::State state = held < beginningSize ? source_.want(held + 1) : Source::State::end;
+            const bool isAll = state == Source::State::end;
+            bool isOpen = false;
+            for (const Form& form : forms_) {
+                const Form::Match match = form.matches(source_.held().substr(0, beginningSize), isAll);
+                if (match == Form::Match::yes) {
+                    parser_ = form.read({source_, options_, interfaces_, unnamed_});
+                    return Next::item;
+                }
+                isOpen = isOpen || match == Form::Match::perhaps;
+            }
+            if (state == Source::State::pause)
+                return Next::pause;
+            if (isAll && source_.replaced()) {
+                source_.restart();
+                continue;
+            }
+            if (isAll || !isOpen)
+                failUnknown();
+        }
+    }
+
+    [[noreturn]] void failUnknown() const {
+        if (source_.held().empty())
+            throw BadInput(source_.name() + ": truncated dump file: it is empty");
+        throw BadInput(source_.name() + ": unknown file format");
+    }
+
+    void beginAnew(Item& item) {
+        source_.restart();
+        parser_.reset();
+        item = {};
+        item.kind = Item::Kind::replaced;
+        item.frame.interface = unnamed_;
+        item.frame.place = {source_.name(), 1, Place::Unit::line};
+        item.text = "the file was emptied or replaced";
+    }
+
+    Source source_;
+    ReadOptions options_;
+    Interfaces interfaces_;
+    const Interface* unnamed_;
+    std::vector<Form> forms_;
+    std::unique_ptr<Parser> parser_;
+};
+
+bool isStart(std::string_view name) {
+    constexpr std::size_t dateSize = 8;
+    return name.size() >= dateSize && std::all_of(name.begin(), name.begin() + dateSize,
+                                                  [](unsigned char c) { return std::isdigit(c) != 0; });
+}
+
+}  // namespace
+
+const Interface* Interfaces::of(const Interface& wanted) {
+    const auto found = std::find(interfaces_.begin(), interfaces_.end(), wanted);
+    return found == interfaces_.end() ? &interfaces_.emplace_back(wanted) : &*found;
+}
+
+std::span<const Form> forms() { return allForms; }
+
+std::unique_ptr<Reader> openReader(const std::string& path, const ReadOptions& options,
+                                   std::span<const Form> known) {
+    return std::make_unique<AnyReader>(path, options, known);
+}
+
+std::string trunkOf(std::string_view path) {
+    const std::string_view name = path.substr(path.rfind('/') + 1);
+    for (std::size_t dot = name.find('.'); dot != std::string_view::npos; dot = name.find('.', dot + 1)) {
+        if (dot > 0 && isStart(name.substr(dot + 1)))
+            return std::string(name.substr(0, dot));
+    }
+    const std::size_t dot = name.rfind('.');
+    return std::string(dot == std::string_view::npos || dot == 0 ? name : name.substr(0, dot));
+}
+
+}  // namespace capture
