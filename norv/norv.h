@@ -1,7 +1,8 @@
 /* The C interface of the board's message-transport library, libnorv.so.
  *
- * Layouts and prototypes are the library's ABI, to the letter: a program built against this header runs
- * against any library that offers it. Statuses and queue handles are 32-bit unsigned. */
+ * Layouts and prototypes are exactly the library's binary interface: a program that is built with this header
+ * runs with every library that offers the interface. Statuses and queue handles are 32-bit unsigned numbers.
+ * A function without a comment on its result returns a status. */
 #ifndef NORV_NORV_H
 #define NORV_NORV_H
 
@@ -13,7 +14,7 @@ extern "C" {
 
 enum {
     NVSTATUS_OK = 0,
-    NVSTATUS_ERROR = 2 /* the failure value; also what nvQueueOpen returns when it opens nothing */
+    NVSTATUS_ERROR = 2 /* a failure; nvQueueOpen returns it too when it opens no queue */
 };
 
 enum {
@@ -35,7 +36,7 @@ typedef struct NvCompDesc {
 /* A message buffer: this header, in host byte order, followed by `size` octets of body. Body fields are
  * little-endian, packed, in field order. */
 typedef struct NvMsg32Bit {
-    uint32_t transaction; /* bits 8 to 31: transaction id; bits 0 to 7: the library's own */
+    uint32_t transaction; /* bits 8 to 31: transaction number; bits 0 to 7: for the library's own use */
     uint32_t type;
     uint16_t sourceInstance;
     uint8_t sourceBoard;
@@ -50,33 +51,36 @@ typedef struct NvMsg32Bit {
     uint32_t size; /* of the body, octets */
 } NvMsg32Bit;
 
-/* Makes the library ready for use; called once, with 0 and 0, before anything else. */
+/* Makes the library ready for use. Call it once, with 0 and 0, before any other function. */
 uint32_t nvDrvSetInterface(uint32_t, uint32_t);
 
-/* *msg becomes a new buffer for a body of `size` octets, or stays as it is when there is no memory. */
+/* Sets *msg to a new buffer for a body of `size` octets, which the caller owns. Leaves *msg unchanged when
+ * there is no memory. */
 uint32_t nvMsgAllocate(uint32_t size, NvMsg32Bit** msg);
-/* Changes the body's size; the buffer may move. */
+/* Changes the size of the body. The buffer may move: *msg is set to its new place. */
 uint32_t nvMsgReallocate(uint32_t size, NvMsg32Bit** msg);
 uint32_t nvMsgFree(NvMsg32Bit* msg);
 
-/* One fixed field, by index. */
+/* Reads or writes one fixed field, which is named by its index. */
 uint32_t nvMsgFieldGet(NvMsg32Bit* msg, uint32_t index, void* value);
 uint32_t nvMsgFieldPut(NvMsg32Bit* msg, uint32_t index, void* value);
 
-/* A run of body fields at *offset, which advances past them. Then come `count` pairs: a uint32_t descriptor
- * (bits 11 to 18: element count less one; bits 19 to 23: element type) and a void* to the elements. */
+/* Reads or writes body fields from *offset on, and advances *offset past them. The further arguments are
+ * `count` pairs: a uint32_t descriptor (bits 11 to 18: number of elements less one; bits 19 to 23: element
+ * type) and a void* to the elements. */
 uint32_t nvMsgVarFieldGet(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...);
 uint32_t nvMsgVarFieldPut(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...);
 
+/* Returns the handle of a new queue, or NVSTATUS_ERROR. */
 uint32_t nvQueueOpen(void);
-/* Fills in the host address under which the queue receives. */
+/* Sets *host to the host address at which the queue receives. */
 uint32_t nvQueueBind(uint32_t queue, NvCompDesc* host);
 uint32_t nvQueueUnbind(uint32_t queue, NvCompDesc host);
 uint32_t nvQueueClose(uint32_t queue);
 
-/* Waits for the next message of the queue; the caller owns the buffer. */
+/* Waits for the next message of the queue and sets *msg to its buffer, which the caller then owns. */
 uint32_t nvMsgRead(uint32_t queue, uint32_t zero, NvMsg32Bit** msg);
-/* Sends the message to its target address; the library takes the buffer over. */
+/* Sends the message to its target address. The library becomes the owner of the buffer. */
 uint32_t nvMsgWrite(uint32_t queue, NvMsg32Bit* msg, uint32_t zero);
 
 #ifdef __cplusplus

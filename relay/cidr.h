@@ -8,11 +8,12 @@
 
 namespace relay {
 
-// A network: "192.168.1.0/24", or one machine, "192.168.1.7". Addresses in host order.
+// A network, "192.168.1.0/24", or one machine, "192.168.1.7". All addresses are in host byte order.
 struct Cidr {
     std::uint32_t network = 0;
     std::uint32_t mask = 0;
 
+    // Nothing when the text is neither.
     static std::optional<Cidr> parse(const std::string& text);
     bool contains(std::uint32_t address) const { return (address & mask) == network; }
 };
@@ -23,9 +24,10 @@ struct Endpoint {
     std::uint32_t address = 0;
     std::uint16_t port = 0;
 
-    // "ADDR:PORT" or "ADDR"; port 0 has the system choose one.
+    // Reads "ADDR:PORT", or "ADDR" with the default port. Nothing for any other text. To listen on port 0
+    // lets the system choose a port.
     static std::optional<Endpoint> parse(const std::string& text, std::uint16_t defaultPort);
-    std::string text() const;
+    std::string text() const;  // "ADDR:PORT"
 };
 
 }  // namespace relay

@@ -8,8 +8,8 @@ namespace relay {
 
 namespace {
 
-// After so many messages a host is read no further until it has taken the answers, so that the queue of one
-// that does not read stays short.
+// After this many messages the relay reads no more from a host until the host has taken everything in its
+// queue. So the queue of a host that does not read stays short.
 constexpr unsigned mostAhead = 64;
 
 std::string text(const NvCompDesc& address) {
@@ -70,26 +70,27 @@ void Client::serve() {
     host_.write(lastWord);
 }
 
-// What to say to the host when everything else has been said: that the relay has closed, or closes.
+// Carries messages from the host to the boards until the connection ends. Returns the last frame to send to
+// the host: that the relay has closed the queue as asked, or that it closes by itself (drain).
 Octets Client::converse(TransportQueue& queue, Forwarder& forwarder) {
     try {
         return encodeFrame(frame_type::closed, takeMessages(queue, forwarder));
     } catch (const Ended&) {
-        forwarder.check();  // what ended the one end shows at the other as a mere close
+        forwarder.check();  // if the forwarder ended the connection, its reason is the one to report
         if (!draining_)
             throw;
         return encodeFrame(frame_type::close, 0);
     }
 }
 
-// Until the host closes; the transaction of its request.
+// Carries messages until the host asks to close. Returns the transaction of that request.
 std::uint32_t Client::takeMessages(TransportQueue& queue, Forwarder& forwarder) {
     for (unsigned ahead = 1;; ++ahead) {
         const Frame frame = host_.readFrame();
         if (frame.header.type == frame_type::close)
             return frame.header.transaction;
         checkType(frame, frame_type::message);
-        static_cast<void>(queue.write(decodeMessage(frame)));  // one that is lost shows as silence
+        static_cast<void>(queue.write(decodeMessage(frame)));  // if it is lost, the host's time-out notices
         if (ahead % mostAhead == 0)
             forwarder.catchUp();
     }

@@ -1,4 +1,4 @@
-// One connection: a host, and the queue of the transport library that it has opened.
+// One connection: a host, and the transport library's queue that it has opened.
 #ifndef RELAY_CLIENT_H
 #define RELAY_CLIENT_H
 
@@ -14,19 +14,24 @@
 
 namespace relay {
 
-// Has a thread of its own, and one more while a queue is open. Nothing that a host sends, or does not send,
-// ends more than its connection; then the queue and every buffer go back to the library.
+// A client has a thread that reads what the host sends, and, while a queue is open, a second one that sends
+// what the queue receives (Forwarder). Whatever the host does ends at most this connection. At the end the
+// queue and all message buffers go back to the library.
 class Client {
   public:
-    // `ended` is called on the client's thread, last of all.
+    // Starts the client's thread. That thread calls `ended` as the last thing it does. `name` begins the
+    // client's lines in the log.
     Client(Descriptor socket, std::string name, Patience patience, Log log, std::function<void()> ended);
-    ~Client();  // ends the connection at once
+    ~Client();  // ends the connection at once and waits for the client's thread
     Client(const Client&) = delete;
     Client& operator=(const Client&) = delete;
 
-    // Takes no more frames; sends the host what its queue holds, and that the relay closes.
+    // Reads no more frames. The client's thread then sends the host what its queue holds and tells it that
+    // the relay closes. Returns at once; any thread may call it.
     void drain();
+    // Ends the connection. Returns at once; any thread may call it.
     void abort();
+    // True once the client's thread has nothing more to do but to call `ended`.
     bool ended() const { return ended_; }
 
   private:

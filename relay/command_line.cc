@@ -9,15 +9,17 @@ namespace relay {
 namespace {
 
 constexpr const char* footer =
-    "Hosts reach the boards of this machine with REMOTE_NORV=ADDR:PORT. Whoever may connect may drive the\n"
-    "boards, and what is said can be read on the way. Without options only this machine may: hosts "
-    "elsewhere\n"
-    "come through SSH,\n"
+    "A host reaches the boards of this machine with REMOTE_NORV=ADDR:PORT.\n"
+    "\n"
+    "There is no password and no encryption: whoever may connect may drive the boards, and others on the "
+    "way\n"
+    "can read the messages. Without options only this machine may connect. Let hosts connect through SSH:\n"
     "  ssh -N -L 6554:127.0.0.1:6554 user@board-machine\n"
-    "or, in a network that is trusted, directly:\n"
+    "or, in a network that you trust, directly:\n"
     "  kv9relayd --listen 0.0.0.0:6554 --allow 192.168.1.0/24\n";
 
-// Given as text, checked and stored by us, so that what is wrong is said in our words.
+// The options whose text this program reads itself, and not CLI11, so that a report says what is wrong in its
+// own words.
 struct Given {
     std::string listen;
     std::vector<std::string> allow;
@@ -27,20 +29,22 @@ struct Given {
 
 void addOptions(CLI::App& app, Given& given, Options& options) {
     app.add_option("--listen", given.listen,
-                   "Where to listen; port 0 has the system choose one (default: 127.0.0.1:6554)")
+                   "IPv4 address to listen on; with port 0 the system chooses one (default: 127.0.0.1:6554)")
         ->type_name("ADDR[:PORT]");
     app.add_option("--allow", given.allow,
-                   "Who may connect, this machine included; may be given again (default: 127.0.0.0/8)")
+                   "Who may connect, for example 192.168.1.0/24; may be given several times; replaces the "
+                   "default (127.0.0.0/8)")
         ->type_name("CIDR")
         ->allow_extra_args(false);
     app.add_option("--max-clients", options.maxClients, "Most connections at a time (default: 128)")
         ->type_name("N")
         ->check(CLI::Range(1, 10000));
     app.add_option("--frame-timeout", given.frameTimeout,
-                   "Time for a host to send the rest of a frame (default: 10)")
+                   "How long a host may take to finish a frame that it has begun (default: 10)")
         ->type_name("SECONDS")
         ->check(CLI::Range(0.001, 3600.0));
-    app.add_option("--write-timeout", given.writeTimeout, "Time for a host to take a frame (default: 10)")
+    app.add_option("--write-timeout", given.writeTimeout,
+                   "How long a host may take to accept a frame (default: 10)")
         ->type_name("SECONDS")
         ->check(CLI::Range(0.001, 3600.0));
     app.set_help_flag("--help,-h", "Print this and exit");

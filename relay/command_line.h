@@ -1,3 +1,4 @@
+// The command line of kv9relayd.
 #ifndef RELAY_COMMAND_LINE_H
 #define RELAY_COMMAND_LINE_H
 
@@ -8,7 +9,7 @@
 
 namespace relay {
 
-// What is wrong with the command line, and what to do.
+// The command line is wrong. what() says how, and what to do.
 class BadCommandLine : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
@@ -16,7 +17,7 @@ class BadCommandLine : public std::runtime_error {
 
 struct CommandLine {
     Options options;
-    std::string told;  // what --help or --version asks for; then nothing else counts
+    std::string told;  // for --help or --version: the text to print instead of starting the relay
 };
 
 // Throws BadCommandLine.

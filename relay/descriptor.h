@@ -1,3 +1,4 @@
+// A file descriptor with an owner.
 #ifndef RELAY_DESCRIPTOR_H
 #define RELAY_DESCRIPTOR_H
 
@@ -7,7 +8,7 @@
 
 namespace relay {
 
-// Owns a file descriptor, or nothing (-1).
+// Owns a file descriptor and closes it at its end; -1 is no descriptor.
 class Descriptor {
   public:
     explicit Descriptor(int fd = -1) : fd_(fd) {}

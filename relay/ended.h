@@ -1,4 +1,4 @@
-// Why a connection ends, in the words of the log.
+// A connection ends. what() is the reason as the log shows it.
 #ifndef RELAY_ENDED_H
 #define RELAY_ENDED_H
 

@@ -54,7 +54,7 @@ void Forwarder::run() {
     }
 }
 
-// False when there is no more to forward.
+// Sends one message. Returns false when the thread is to end.
 bool Forwarder::forward(Message msg) {
     if (stopping_)
         return false;
@@ -68,7 +68,8 @@ bool Forwarder::forward(Message msg) {
     return true;
 }
 
-// False for a mark that nobody waits for: it is the host's own message.
+// Notes that a mark has been read and wakes catchUp(). Returns false when nobody waits for a mark: the
+// message is then one that the host sent to itself, and is forwarded.
 bool Forwarder::met() {
     const std::lock_guard guard(lock_);
     if (marks_ == 0)

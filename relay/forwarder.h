@@ -1,4 +1,4 @@
-// The road from a queue to its host.
+// Sends a host the messages that its queue receives.
 #ifndef RELAY_FORWARDER_H
 #define RELAY_FORWARDER_H
 
@@ -13,21 +13,25 @@
 
 namespace relay {
 
-// A thread that sends every message of the queue to the host. When it cannot go on, it shuts the connection
-// down, so that whoever reads it notices too.
+// A thread that reads every message of the queue and sends it to the host. When the thread cannot go on, it
+// shuts the connection down, so that the thread that reads the connection ends as well.
+//
+// The other functions are called by that other thread, the client's.
 class Forwarder {
   public:
     Forwarder(TransportQueue& queue, Stream& host);
-    // Ends at once; what the queue holds is left. Shuts the connection down unless finish() has been called.
+    // Unless finish() has been called, shuts the connection down and ends the thread at once; messages that
+    // are still in the queue are not sent.
     ~Forwarder();
     Forwarder(const Forwarder&) = delete;
     Forwarder& operator=(const Forwarder&) = delete;
 
-    // Returns when the host has been sent all that was in the queue. Throws Ended when it cannot be.
+    // Returns when every message that was in the queue has been sent to the host. Throws Ended when that is
+    // not possible.
     void catchUp();
-    // Catches up and ends the thread; the connection stays.
+    // Catches up, then ends the thread. The connection stays open.
     void finish();
-    // Throws Ended with what has ended the thread, if something has.
+    // Throws Ended with the reason if the thread could not go on.
     void check();
 
   private:
@@ -41,10 +45,10 @@ class Forwarder {
     Stream& host_;
     std::atomic<bool> stopping_{false};
 
-    std::mutex lock_;  // over the following
+    std::mutex lock_;  // guards marks_ and failure_
     std::condition_variable changed_;
-    unsigned marks_ = 0;  // not met yet
-    std::string failure_;
+    unsigned marks_ = 0;   // marks (TransportQueue::mark) that the thread has not read yet
+    std::string failure_;  // why the thread could not go on; empty: it goes on
 
     std::thread thread_;
 };

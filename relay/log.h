@@ -1,3 +1,4 @@
+// Where the relay's log goes.
 #ifndef RELAY_LOG_H
 #define RELAY_LOG_H
 
@@ -6,7 +7,7 @@
 
 namespace relay {
 
-// Takes one line, without its end. Called on any thread.
+// Writes one line, which is given without its line end. Any thread calls it.
 using Log = std::function<void(const std::string&)>;
 
 }  // namespace relay

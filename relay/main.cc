@@ -17,13 +17,14 @@ namespace {
 
 constexpr int badCommandLine = 2;
 
-// One line in one piece, whichever thread it is from.
+// Writes a line with one system call, so that lines of several threads do not mix.
 void logLine(const std::string& line) {
     const std::string whole = "kv9relayd: " + line + "\n";
     static_cast<void>(!write(STDERR_FILENO, whole.data(), whole.size()));
 }
 
-// Both signals as a descriptor, for this thread and those to come.
+// Blocks SIGTERM and SIGINT in this thread and in all threads that it starts later, and returns a descriptor
+// from which they are read.
 relay::Descriptor awaitedSignals() {
     sigset_t signals;
     sigemptyset(&signals);
@@ -33,17 +34,19 @@ relay::Descriptor awaitedSignals() {
     return relay::Descriptor(signalfd(-1, &signals, SFD_CLOEXEC | SFD_NONBLOCK));
 }
 
-// A log that nobody reads any more ends no connection; and no connection gets the number of a stream that was
-// closed, and with it the log's lines.
+// Ignores SIGPIPE, so that a log that nobody reads any more does not end the relay. Opens /dev/null for each
+// standard stream that is closed; otherwise a connection would get the stream's number, and the lines of the
+// log.
 void outliveStreams() {
     for (const int each : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
         if (fcntl(each, F_GETFD) < 0)
-            static_cast<void>(open("/dev/null", O_RDWR));  // the lowest number that is free: this one
+            static_cast<void>(open("/dev/null", O_RDWR));  // open() takes the lowest free number: `each`
     }
     static_cast<void>(std::signal(SIGPIPE, SIG_IGN));
 }
 
-// Each connection takes a descriptor, and the transport library may keep one for its queue.
+// Raises the limit of open files to the hard limit: each connection takes a descriptor, and the transport
+// library may take another for its queue.
 void allowMoreOpenFiles() {
     rlimit limit{};
     if (getrlimit(RLIMIT_NOFILE, &limit) == 0) {

@@ -19,7 +19,7 @@ std::span<const std::uint8_t> bodyOf(const NvMsg32Bit& msg) {
     return {reinterpret_cast<const std::uint8_t*>(&msg) + NVMSG_HEADER_SIZE, msg.size};
 }
 
-// The words of a header block, one after the other.
+// Reads the words of a header block one after another. Throws Ended for a word that its field cannot hold.
 class Words {
   public:
     explicit Words(std::span<const std::uint8_t> octets) : octets_(octets) {}

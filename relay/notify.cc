@@ -20,7 +20,7 @@ void notify(const std::string& state) {
     address.sun_family = AF_UNIX;
     std::memcpy(address.sun_path, path, length);
     if (*path == '@')
-        address.sun_path[0] = '\0';  // a name of its own, not a file
+        address.sun_path[0] = '\0';  // an abstract name instead of a file
     const Descriptor socket(::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0));
     sendto(socket.get(), state.data(), state.size(), MSG_NOSIGNAL,
            reinterpret_cast<const sockaddr*>(&address),

@@ -1,3 +1,4 @@
+// Readiness for a service manager.
 #ifndef RELAY_NOTIFY_H
 #define RELAY_NOTIFY_H
 
@@ -5,7 +6,7 @@
 
 namespace relay {
 
-// Tells the service manager, where there is one (NOTIFY_SOCKET): "READY=1", "STOPPING=1".
+// Sends "READY=1" or "STOPPING=1" to the service manager that NOTIFY_SOCKET names. Does nothing without one.
 void notify(const std::string& state);
 
 }  // namespace relay

@@ -1,4 +1,4 @@
-// Big-endian 32-bit words in a row of octets.
+// Big-endian words of 32 bits among octets.
 #ifndef RELAY_OCTETS_H
 #define RELAY_OCTETS_H
 
@@ -16,6 +16,7 @@ inline void appendWord(Octets& to, std::uint32_t word) {
         to.push_back(static_cast<std::uint8_t>(word >> shift));
 }
 
+// The word number `index`, which must be wholly inside the octets.
 inline std::uint32_t wordAt(std::span<const std::uint8_t> octets, std::size_t index) {
     std::uint32_t word = 0;
     for (const std::uint8_t octet : octets.subspan(4 * index, 4))

@@ -17,7 +17,7 @@ namespace relay {
 namespace {
 
 constexpr int forEver = -1;
-constexpr int retryMs = 1000;  // when there was no descriptor for a connection
+constexpr int retryMs = 1000;  // how long to wait after the system had no descriptor for a connection
 
 [[noreturn]] void fail(const std::string& what) {
     throw std::system_error(errno, std::generic_category(), what);
@@ -80,7 +80,7 @@ void Server::run(int stop, const std::function<void()>& stopping) {
     drain(stop);
 }
 
-// A connection, the end of one, or the word to stop.
+// Waits for a new connection, for the end of one, or for `stop`, and deals with it.
 void Server::awaitChange(int stop, int timeoutMs) {
     std::array<pollfd, 3> waited{pollfd{stop, POLLIN, 0}, pollfd{ended_.get(), POLLIN, 0},
                                  pollfd{full_ ? -1 : listener_.get(), POLLIN, 0}};
@@ -114,7 +114,7 @@ void Server::accept() try {
     const auto onEnd = [counter = ended_.get()] { eventfd_write(counter, 1); };
     clients_.push_back(
         std::make_unique<Client>(std::move(socket), host.text(), options_.patience, log_, onEnd));
-} catch (const std::exception& error) {  // no thread or memory for one more
+} catch (const std::exception& error) {  // there is no thread or no memory for another connection
     log_(std::string("a connection was refused: ") + error.what());
 }
 

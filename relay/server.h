@@ -1,4 +1,4 @@
-// Accepts hosts and keeps track of them.
+// Accepts the connections of hosts and owns them.
 #ifndef RELAY_SERVER_H
 #define RELAY_SERVER_H
 
@@ -15,23 +15,25 @@ namespace relay {
 
 struct Options {
     Endpoint listen{0x7F000001, 6554};
-    std::vector<Cidr> allow{};  // empty: this machine alone
+    std::vector<Cidr> allow{};  // who may connect; empty: only this machine
     unsigned maxClients = 128;
     Patience patience{};
 };
 
+// The functions are called on one thread.
 class Server {
   public:
-    // Listens. Throws std::system_error.
+    // Begins to listen. Throws std::system_error when it cannot.
     Server(const Options& options, Log log);
     ~Server();  // ends every connection
     Server(const Server&) = delete;
     Server& operator=(const Server&) = delete;
 
-    Endpoint endpoint() const;  // with the port that the system chose
+    Endpoint endpoint() const;  // where it listens, with the port that the system chose
 
-    // Serves until `stop` can be read; what is read from it is dropped. Then, having called `stopping`, lets
-    // every connection drain, for no longer than the patience for a frame, or until `stop` can be read again.
+    // Accepts connections until the descriptor `stop` can be read, and reads from it. Then calls `stopping`,
+    // lets every connection drain, and returns when all have ended, when the patience for a frame is over, or
+    // when `stop` can be read again. Connections that are left are ended at once.
     void run(
         int stop, const std::function<void()>& stopping = [] {});
 
@@ -45,10 +47,10 @@ class Server {
     Options options_;
     Log log_;
     Descriptor listener_;
-    Descriptor ended_;  // counts connections that have ended
+    Descriptor ended_;  // an event counter: clients count it up as they end
     std::list<std::unique_ptr<Client>> clients_;
-    bool stopped_ = false;
-    bool full_ = false;  // no descriptors for more connections
+    bool stopped_ = false;  // `stop` could be read
+    bool full_ = false;     // the system has no descriptor for another connection
 };
 
 }  // namespace relay

@@ -21,13 +21,13 @@ using Clock = std::chrono::steady_clock;
 
 constexpr int forEver = -1;
 
-// Milliseconds as poll takes them, rounded up.
+// The time until the deadline in milliseconds, rounded up, as poll takes it.
 int left(Clock::time_point deadline) {
     const auto rest = std::chrono::ceil<std::chrono::milliseconds>(deadline - Clock::now());
     return static_cast<int>(std::clamp<std::int64_t>(rest.count(), 0, 3600000));
 }
 
-// False when the time is over.
+// Waits until the socket is ready. Returns false when the time is over.
 bool await(int socket, short events, int timeoutMs) {
     pollfd waited{socket, events, 0};
     int result = 0;
@@ -40,8 +40,9 @@ std::string lasting(std::chrono::milliseconds time) { return std::to_string(time
 
 }  // namespace
 
-// Frames are small and waited for. A host that has gone without a word is noticed: by keep-alive, or, while
-// something is on its way to it and keep-alive rests, by the user time-out.
+// TCP_NODELAY, because frames are small and somebody waits for them. The other options notice a host that has
+// disappeared: keep-alive while nothing is on its way to the host, and the user time-out while something is,
+// because keep-alive does not work then.
 Stream::Stream(Descriptor socket, Patience patience) : socket_(std::move(socket)), patience_(patience) {
     const auto userTimeout = static_cast<int>(std::max<std::int64_t>(60000, patience.write.count()));
     const struct {

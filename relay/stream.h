@@ -1,4 +1,4 @@
-// A connection to a host: whole frames, each within a time.
+// A connection to a host, which carries whole frames. Each frame must pass within a time limit.
 #ifndef RELAY_STREAM_H
 #define RELAY_STREAM_H
 
@@ -12,25 +12,27 @@
 namespace relay {
 
 struct Patience {
-    std::chrono::milliseconds frame{10000};  // for a host to send the rest of a frame, or its first one
-    std::chrono::milliseconds write{10000};  // for a host to take a frame
+    std::chrono::milliseconds frame{10000};  // in which a host finishes a frame, or sends its first one
+    std::chrono::milliseconds write{10000};  // in which a host accepts a frame
 };
 
-// One thread reads while another writes; any may shut it down.
+// One thread may read while another writes. Any thread may shut the connection down.
 class Stream {
   public:
     Stream(Descriptor socket, Patience patience);
 
-    // The next frame, whose first octet may take for ever. Throws Ended.
+    // Waits for the next frame without limit, and once its first octet has come, for the rest within the
+    // patience for a frame. Throws Ended when the time is over, the connection has ended or the frame is too
+    // large.
     Frame readFrame();
-    // As readFrame, but all of it within the patience for a frame.
+    // The same, but the first octet must come within that time as well.
     Frame readFirstFrame();
-    // Throws Ended.
+    // Sends all octets. Throws Ended when the host does not accept them in time or the connection has ended.
     void write(std::span<const std::uint8_t> octets);
 
-    // Reads end once what has arrived is read.
+    // Receives nothing more. What has arrived can still be read; then reading throws.
     void shutDownReading();
-    // Reads and writes end at once.
+    // Ends reading and writing at once.
     void shutDown();
 
   private:

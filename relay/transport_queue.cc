@@ -6,7 +6,8 @@ namespace relay {
 
 namespace {
 
-// Nothing that a board sends; a host that sends one gets it back, or another just like it.
+// The transaction of a mark. Boards do not send it. A host that sends such a message to its own queue
+// receives that message, or a mark, which looks the same.
 constexpr std::uint32_t markTransaction = 0xFFFFFF;
 
 }  // namespace

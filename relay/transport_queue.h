@@ -8,28 +8,28 @@
 
 namespace relay {
 
-// Opened, bound, and given back at the end. One thread reads while another writes.
+// Opens and binds a queue, and closes it at its end. One thread may read while another writes.
 class TransportQueue {
   public:
-    TransportQueue();  // throws Ended
+    TransportQueue();  // throws Ended when the library opens or binds no more queues
     ~TransportQueue();
     TransportQueue(const TransportQueue&) = delete;
     TransportQueue& operator=(const TransportQueue&) = delete;
 
     const NvCompDesc& address() const { return address_; }
 
-    // Waits for the next message; null when the queue has failed or is closed.
+    // Waits for the next message. Null when the queue has failed or is closed.
     Message read() const;
-    // Sends msg under the queue's own address, whoever it says it is from. False when the library refuses it;
-    // gone it is all the same.
+    // Sends msg with this queue's address as its source, whatever source it names. Returns false when the
+    // library refuses it. The message is given to the library in either case.
     bool write(Message msg) const;
 
-    // An empty message to the queue itself, which comes behind everything that is in the queue. False when
-    // the library has no memory for it, or refuses it: it will not come.
+    // Sends a mark, which is an empty message, to this queue itself. Whoever reads it knows that all messages
+    // before it have been read. Returns false when the library has no memory for the mark or refuses it.
     bool mark() const;
     bool isMark(const NvMsg32Bit& msg) const;
 
-    // Ends a read that is under way, where no mark can.
+    // Closes the queue. A thread that waits in read() returns; this ends it when a mark cannot be sent.
     void close();
 
   private:

@@ -49,7 +49,7 @@ class Buffers {
     struct Entry {
         std::unique_ptr<std::byte[]> memory;
         uint32_t size = 0;
-        bool host = true;  // the host owns it, not the library  // the host owns it, not the library
+        bool host = true;  // the host owns it, not the library
     };
     using Entries = std::unordered_map<const NvMsg32Bit*, Entry>;
 

@@ -21,8 +21,7 @@ struct Parameter {
     std::string text;
 };
 
-// Events of type `event` are sent to the host queue with the address `returnTo`. Events of type `event` are
-// sent to the host queue with the address `returnTo`.
+// Events of type `event` are sent to the host queue with the address `returnTo`.
 struct Subscription {
     uint32_t event = 0;
     Address returnTo;

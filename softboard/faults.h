@@ -35,8 +35,7 @@ enum class FaultKind {
 
 struct Fault {
     FaultKind kind{};
-    uint32_t argument = 0;  // the N of NAME=N; 0 for a fault that takes no number  // the N of NAME=N; 0 for
-                            // a fault that takes no number
+    uint32_t argument = 0;  // the N of NAME=N; 0 for a fault that takes no number
 
     bool operator==(const Fault&) const = default;
 };

@@ -42,8 +42,7 @@ enum Protocol : uint32_t { att4ess = 1, att5ess = 2, dms100 = 3, ntt = 4, net5 =
 struct DChannel {
     uint8_t board = 1;
     uint16_t number = 1;       // of the CCS instance
-    uint32_t protocol = net5;  // value of the protocol parameter: one of Protocol, or any other number: one
-                               // of Protocol, or any other number
+    uint32_t protocol = net5;  // value of the protocol parameter: one of Protocol, or any other number
     Rate rate;
     bool loop = false;
     uint32_t label = 2;  // first field of each trace event
