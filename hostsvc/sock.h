@@ -53,7 +53,10 @@ class sock {
     long snd_msg(const msg_t& m);
     // 0 once a frame has been received: the parts are the caller's, to be given back with free_msg, whatever
     // the result; where there are none the pointers are null. A part above msg_t::Largest is read all the
-    // same, so that the next frame is found, and the result is -1. Sizes beyond reason end the reading.
+    // same, so that the next frame is found, and the result is -1. A negative size, or no memory for a part,
+    // is said on the standard error stream, and the result is -1; the parts are not read, and the next call
+    // takes what follows for a frame. A part above ten times msg_t::Largest is treated likewise and sets the
+    // error flag too.
     long get_msg(msg_t& m);
 
     bool failed() const { return error_.load() != 0; }

@@ -13,14 +13,16 @@ namespace {
 constexpr int ConvertedSize = 24;  // the header and a word that is not sent
 using Header = std::array<char, ConvertedSize>;
 
-// A part above the limit is still read, so that the connection stays in step; one as large as this is an
+// A part above msg_t::Largest is still read, so that the next frame is found. One above this size is an
 // attack, or the connection is out of step already.
-constexpr std::int32_t BeyondReason = 10 * msg_t::Largest;
+constexpr std::int32_t LargestRead = 10 * msg_t::Largest;
+
+bool beyondReason(const msg_t& m) { return m.size > LargestRead || m.ex_size > LargestRead; }
 
 bool sendable(std::int32_t size) { return size >= 0 && size <= msg_t::Largest; }
 
 char* allocatePart(std::int32_t size) {
-    if (size < 0 || size > BeyondReason)
+    if (size < 0 || size > LargestRead)
         return nullptr;
     return static_cast<char*>(std::calloc(static_cast<std::size_t>(size) + 1, 1));
 }
@@ -58,7 +60,8 @@ long sock::get_msg(msg_t& m) {
     KS_ntohU32(&m, header.data(), ConvertedSize);
     if (!allocateParts(m)) {
         std::cerr << "Unable to allocate memory in get_msg" << std::endl;
-        error_ = 1;  // the parts stay unread, so what follows would be no frame
+        if (beyondReason(m))
+            error_ = 1;
         return -1;
     }
     const long first = readblock(m.data, m.size);

@@ -314,6 +314,20 @@ TEST_F(KSRemoteMsgQueueTest, FramesBeyondTheLimitAreErrors) {
     sender.join();
 }
 
+TEST_F(KSRemoteMsgQueueTest, AFrameOfNegativeSizeIsAnErrorAndTheNextOneIsRead) {
+    auto [queue, relay] = open();
+    SleeplessSystem system;
+    relay.write(words({1001, 0, 56, 0xFFFFFFFF, 0}) + MessageFrame);
+    NvMsg32Bit* read = nullptr;
+    CaptureStderr();
+    EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
+    EXPECT_EQ(GetCapturedStderr(), "Unable to allocate memory in get_msg\n" + errorLine());
+    EXPECT_THAT(system.sleeps(), ElementsAre());
+    ASSERT_EQ(queue->msgRead(&read), 0U);
+    KSMsgRef(read).free();
+    close(queue, relay);
+}
+
 TEST_F(KSRemoteMsgQueueTest, OneOctetAtATimeIsAFrameToo) {
     auto [queue, relay] = open();
     std::thread sender([&relay = relay] {

@@ -140,7 +140,7 @@ TEST_F(SockTest, APartJustAboveTheLimitIsReadAndRefusedAndTheNextFrameIsFound) {
 
 TEST_F(SockTest, SizesBeyondReasonEndTheReading) {
     for (const auto& [size, extra] :
-         {std::pair{-1, 0}, {0, -1}, {-2147483647 - 1, 0}, {2147483647, 0}, {0, 2147483647}}) {
+         {std::pair{1024001, 0}, {0, 1024001}, {2147483647, 0}, {0, 2147483647}, {-1, 2147483647}}) {
         ASSERT_EQ(pairOfDescriptors(fds_), 0);
         sock receiver(fds_[0]);
         const Connection sender(fds_[1]);
@@ -153,6 +153,24 @@ TEST_F(SockTest, SizesBeyondReasonEndTheReading) {
         EXPECT_EQ(m.data, nullptr);
         EXPECT_EQ(m.ex_data, nullptr);
         EXPECT_EQ(receiver.get_msg(m), -1);
+    }
+}
+
+TEST_F(SockTest, ANegativeSizeIsAFailedAllocationAndTheNextFrameIsRead) {
+    for (const auto& [size, extra] : {std::pair{-1, 0}, {0, -1}, {-1, -1}, {-2147483647 - 1, 0}, {7, -2}}) {
+        peer_.write(words({1001, 0, static_cast<std::uint32_t>(size), static_cast<std::uint32_t>(extra), 0}) +
+                    words({1003, 5, 2, 0, 0}) + text("ab"));
+        msg_t m;
+        CaptureStderr();
+        EXPECT_EQ(sock_.get_msg(m), -1);
+        EXPECT_EQ(GetCapturedStderr(), "Unable to allocate memory in get_msg\n");
+        EXPECT_EQ(m.data, nullptr);
+        EXPECT_EQ(m.ex_data, nullptr);
+        EXPECT_FALSE(sock_.failed());
+        ASSERT_EQ(sock_.get_msg(m), 0);
+        EXPECT_EQ(m.type, 1003U);
+        EXPECT_STREQ(m.data, "ab");
+        free_msg(m);
     }
 }
 
