@@ -28,7 +28,7 @@ void* KSMsgQueueThread_Cleanup(void* slot) {
 KSMsgQueue::KSMsgQueue(NvCompDesc desc, unsigned a, unsigned b, const char* hostName)
     : reader_(static_cast<KSRunnable*>(this),
               static_cast<void* (KSRunnable::*)(void*, void*)>(&KSMsgQueue::readerBody), 0),
-      transport_(openTransport(desc, a, b, hostName)),
+      transport_(ks_openTransport(desc, a, b, hostName)),
       hostDesc_(transport_->getHostDesc()) {
     replyLock_.lock();
     messageAvailable_.lock();

@@ -44,7 +44,7 @@ void KSThread::start(void* arg) {
     result_.store(nullptr);
     life_.fetch_and(~unsigned{Ended});
     status_.store(ThreadStatus::Running);
-    if (ks_startDetached(entry, this, stackSize_))
+    if (ks_startDetached(KSThread_run, this, stackSize_))
         return;  // an abandoned object may be gone by now
     status_.store(ThreadStatus::Stopped);
     lock_.unlock();
@@ -81,8 +81,8 @@ void KSThread::abandon() {
     delete this;
 }
 
-void* KSThread::entry(void* thread) {
-    ks_atThreadEnd(finish, thread);
+void* KSThread_run(void* thread) {
+    ks_atThreadEnd(KSThread::finish, thread);
     static_cast<KSThread*>(thread)->run();
     return nullptr;
 }

@@ -9,6 +9,9 @@
 #include "hostsvc/KSRunnable.h"
 #include "hostsvc/KSThreadControl.h"
 
+// The entry function of every KSThread: runs the thread object that it is given on the new thread.
+void* KSThread_run(void* thread);
+
 // Cancellation is cooperative: cancel() sets the status, and the body ends at its next control::testCancel().
 // The lock is held from start() until the started thread touches the object no more, whichever way its body
 // ends; then it is unlocked, once for each start, as the thread's very last act on the object.
@@ -54,7 +57,7 @@ class KSThread {
     enum Life : unsigned { Abandoned = 1, Ended = 2 };  // Ended: since the last start, and not yet joined
 
     KSThread(const KSBody& body, unsigned stackSize);
-    static void* entry(void* thread);
+    friend void* KSThread_run(void* thread);
     static void finish(void* thread);
 
     std::atomic<ThreadStatus> status_{ThreadStatus::Stopped};

@@ -9,11 +9,11 @@
 // The machine to reach the board through, or null for the transport library on this one. A host name (given,
 // or else REMOTE_NORV) that begins with this machine's own, HOST, is this machine: a prefix is enough. Any of
 // the three may be null.
-const char* chooseHost(const char* hostName, const char* remoteNorv, const char* host);
+const char* ks_chooseHost(const char* hostName, const char* remoteNorv, const char* host);
 
 // Opens the queue that hostName and the environment (REMOTE_NORV, HOST) ask for. Throws
 // KSResource_CreationError.
-std::unique_ptr<KSAbstractMsgQueue> openTransport(NvCompDesc desc, unsigned a, unsigned b,
-                                                  const char* hostName);
+std::unique_ptr<KSAbstractMsgQueue> ks_openTransport(NvCompDesc desc, unsigned a, unsigned b,
+                                                     const char* hostName);
 
 #endif

@@ -34,7 +34,7 @@ constexpr Case Cases[] = {
 TEST(KSTransportChoice, AQueueIsRemoteWhenAHostIsNamedThatDoesNotBeginWithThisOne) {
     for (const Case& each : Cases) {
         SCOPED_TRACE(each.says);
-        EXPECT_STREQ(chooseHost(each.hostName, each.remoteNorv, each.host), each.chosen);
+        EXPECT_STREQ(ks_chooseHost(each.hostName, each.remoteNorv, each.host), each.chosen);
     }
 }
 
@@ -53,16 +53,16 @@ class KSTransportOpening : public testing::Test {
 
 TEST_F(KSTransportOpening, TheEnvironmentIsAskedForTheHost) {
     setenv("REMOTE_NORV", "127.0.0.1:1", 1);  // where nobody listens
-    EXPECT_THROW(openTransport({}, 0, 0, nullptr), KSResource_CreationError);
+    EXPECT_THROW(ks_openTransport({}, 0, 0, nullptr), KSResource_CreationError);
     EXPECT_EQ(fake_norv::count(fake_norv::Op::Open), 0U);
     setenv("HOST", "127.0.0.1", 1);
-    EXPECT_NE(openTransport({}, 0, 0, nullptr), nullptr);
+    EXPECT_NE(ks_openTransport({}, 0, 0, nullptr), nullptr);
     EXPECT_EQ(fake_norv::count(fake_norv::Op::Open), 1U);
 }
 
 TEST_F(KSTransportOpening, AHostThatIsGivenComesBeforeTheEnvironment) {
-    EXPECT_NE(openTransport({}, 0, 0, nullptr), nullptr);
-    EXPECT_THROW(openTransport({}, 0, 0, "127.0.0.1:1"), KSResource_CreationError);
+    EXPECT_NE(ks_openTransport({}, 0, 0, nullptr), nullptr);
+    EXPECT_THROW(ks_openTransport({}, 0, 0, "127.0.0.1:1"), KSResource_CreationError);
 }
 
 }  // namespace
