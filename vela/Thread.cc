@@ -42,7 +42,8 @@ void* Thread::Errand::run(control* ctl) const {
 }
 
 void Thread::control::pushCleanup(void* object, void* (Runnable::*routine)(void*), void* arg) {
-    primitive_->pushCleanup(object, reinterpret_cast<void* (KSRunnable::*)(void*)>(routine), arg);
+    primitive_->pushCleanup(static_cast<KSRunnable*>(static_cast<Runnable*>(object)),
+                            static_cast<void* (KSRunnable::*)(void*)>(routine), arg);
 }
 
 Thread::Thread(Function body, unsigned int stackSize)

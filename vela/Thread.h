@@ -24,7 +24,7 @@ class Thread : public virtualObject {
     };
 
     // The base of objects whose member functions run as threads.
-    class Runnable {};
+    class Runnable : public KSRunnable {};
 
     // Handed to the body; used on the body's own thread only.
     class control {
