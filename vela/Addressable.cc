@@ -20,13 +20,15 @@ Addressable::Addressable(const CompDesc_t& target, MsgQueue* queue)
     Addressable::MsgQueueAttach(queue);
 }
 
-Addressable::Addressable(const Addressable& other)
-    : virtualObject(other),
-      target_(other.target_),
+// The base has no state to copy.  NOLINTNEXTLINE(bugprone-copy-constructor-init)
+Addressable::Addressable(const Addressable& other) : Addressable(other.target_, other) {}
+
+Addressable::Addressable(const CompDesc_t& target, const Addressable& origin)
+    : target_(target),
       objId_(getUniqueObjId()),
-      responseTimeout_(other.responseTimeout_),
-      errorWaitTime_(other.errorWaitTime_) {
-    Addressable::MsgQueueAttach(other.queue_);
+      responseTimeout_(origin.responseTimeout_),
+      errorWaitTime_(origin.errorWaitTime_) {
+    Addressable::MsgQueueAttach(origin.queue_);
 }
 
 Addressable::~Addressable() {

@@ -83,7 +83,8 @@ class Addressable : public virtualObject {
 
     // A null queue gives the object a private one.
     Addressable(const CompDesc_t& target, MsgQueue* queue);
-    Addressable(const Addressable& other);  // same address, same queue; no callbacks
+    // A copy has the same address, the same queue and the two time-outs as they are now. No callbacks.
+    Addressable(const Addressable& other);
     explicit Addressable(const Addressable* other) : Addressable(*other) {}
     Addressable& operator=(const Addressable&) = delete;
     // Waits for callbacks that run. Not from a callback on the dispatching thread.
@@ -100,8 +101,10 @@ class Addressable : public virtualObject {
     unsigned int getObjId() const { return objId_; }
     unsigned int getResponseTimeout() const { return responseTimeout_; }
     unsigned int getErrorWaitTime() const { return errorWaitTime_; }
-    void setResponseTimeout(unsigned int ms) { responseTimeout_ = ms; }
-    void setErrorWaitTime(unsigned int ms) { errorWaitTime_ = ms; }
+    // In ms. For this object's requests from now on, and for objects that are copied from it or found through
+    // it afterwards. Those that exist keep theirs.
+    virtual void setResponseTimeout(unsigned int ms) { responseTimeout_ = ms; }
+    virtual void setErrorWaitTime(unsigned int ms) { errorWaitTime_ = ms; }
 
     // Sends cmd and reads the reply into ret unless that is null; trans 0 takes a number of its own. Throws
     // Timeout, UnexpectedMsg, and the transport's KSMsgRef::AllocationError.
@@ -160,6 +163,10 @@ class Addressable : public virtualObject {
     void toStream(std::ostream* out) const override;
 
   protected:
+    // An object at another address, on the queue of the one that leads to it and with its two time-outs as
+    // they are now.
+    Addressable(const CompDesc_t& target, const Addressable& origin);
+
     // A command and the reply that its type names, or without reply. Throw Timeout, UnexpectedMsg.
     template <typename Cmd>
     void command(Cmd&& cmd, typename std::remove_reference_t<Cmd>::Reply* reply, Wait wait) {

@@ -35,6 +35,18 @@ MsgBody* Board::MsgBodyLookup(unsigned int msgType) {
 
 MsgBody* Board::EvtBodyLookup(unsigned int evtType) { return superEvtBodyLookup(evtType); }
 
+void Board::setResponseTimeout(unsigned int ms) {
+    Addressable::setResponseTimeout(ms);
+    resourceMgr_->setResponseTimeout(ms);
+    clusterMgr_->setResponseTimeout(ms);
+}
+
+void Board::setErrorWaitTime(unsigned int ms) {
+    Addressable::setErrorWaitTime(ms);
+    resourceMgr_->setErrorWaitTime(ms);
+    clusterMgr_->setErrorWaitTime(ms);
+}
+
 Component Board::findComp(unsigned char compType, unsigned char processor) {
     return Component(resourceMgr_->find(compType, processor, 0, {}));
 }

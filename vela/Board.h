@@ -28,7 +28,11 @@ class Board : public Addressable {
     Component findComp(unsigned char compType, unsigned char processor);
     Instance findInst(unsigned char compType, unsigned char processor, unsigned short instance);
 
-    // The board's own, with time-outs of their own.
+    // The managers' time-outs too, and with them those of what is found from now on.
+    void setResponseTimeout(unsigned int ms) override;
+    void setErrorWaitTime(unsigned int ms) override;
+
+    // The board's own. A time-out that is set on a manager is that manager's alone.
     ResourceMgr& resourceMgr() { return *resourceMgr_; }
     ClusterMgr& clusterMgr() { return *clusterMgr_; }
 

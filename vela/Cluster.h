@@ -38,6 +38,8 @@ class Cluster : public Addressable, public ClusterMessages {
     Cluster(const CompDesc_t& target, MsgQueue* queue) : Addressable(target, queue) {}
     explicit Cluster(const Addressable& found) : Addressable(found) {}
     Cluster(const Cluster& other) = default;
+    // What was found at the address through `finder`: on its queue and with its time-outs.
+    Cluster(const CompDesc_t& target, const Addressable& finder) : Addressable(target, finder) {}
     ~Cluster() override { endCallbacks(); }
 
     MsgBody* MsgBodyLookup(unsigned int msgType) override;

@@ -3,10 +3,7 @@
 namespace vela {
 
 ClusterMgr::ClusterMgr(const Addressable* object)
-    : Addressable(CompDesc_t(0, object->getTgtDesc().Board, 0, 0, 0), object->getMsgQueue()) {
-    setResponseTimeout(object->getResponseTimeout());
-    setErrorWaitTime(object->getErrorWaitTime());
-}
+    : Addressable(CompDesc_t(0, object->getTgtDesc().Board, 0, 0, 0), *object) {}
 
 MsgBody* ClusterMgr::MsgBodyLookup(unsigned int msgType) {
     MsgBody* const body = Bodies::make(msgType);
@@ -17,7 +14,7 @@ template <typename Cmd>
 Cluster ClusterMgr::clusterFrom(Cmd&& cmd, Wait wait) {
     ClusterResult_t reply;
     command(cmd, &reply, wait);
-    return Cluster(reply.desc, getMsgQueue());
+    return Cluster(reply.desc, *this);
 }
 
 Cluster ClusterMgr::find(CompDesc_t start, staticList<CompAttr_t>& attributes, Wait wait) {
@@ -40,7 +37,7 @@ StdResource ClusterMgr::componentByAttr(CompDesc_t cluster, unsigned int compTyp
                                         staticList<CompAttr_t>& attributes, Wait wait) {
     ComponentResult_t reply;
     command(ClusterCompByAttr_t(cluster, compType, attributes), &reply, wait);
-    return StdResource(reply.desc, getMsgQueue());
+    return StdResource(reply.desc, *this);
 }
 
 }  // namespace vela

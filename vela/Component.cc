@@ -7,8 +7,10 @@ namespace vela {
 Instance::Instance(const CompDesc_t& target, MsgQueue* queue, int inUse)
     : StdResource(target, queue, inUse), reserved_(inUse != 0) {}
 
-Instance::Instance(const TmpInstance& other, int inUse)
-    : Instance(other.getTgtDesc(), other.getMsgQueue(), inUse) {}
+Instance::Instance(const TmpInstance& other, int inUse) : StdResource(other) {
+    if (inUse != 0)
+        Instance::use(0);
+}
 
 void Instance::use(unsigned int payload) {
     StdResource::use(payload);
@@ -30,7 +32,7 @@ Instance::~Instance() {
     if (!ownsUse_ || !reserved_)
         return;
     try {
-        unuse();
+        Instance::unuse();
     } catch (const Exception& exception) {
         report(exception);  // nobody is left to tell
     } catch (...) {

@@ -27,13 +27,13 @@ class Instance : public StdResource {
     Instance(const CompDesc_t& target, MsgQueue* queue) : Instance(target, queue, 0) {}
     explicit Instance(const StdResource& found) : StdResource(found) {}
     Instance(const Instance& other) : StdResource(other) {}  // reserves nothing of its own
-    Instance(const TmpInstance& other, int inUse);
+    Instance(const TmpInstance& other, int inUse);           // as a copy, and then as the first
     ~Instance() override;
 
     // As StdResource's, and remembered.
-    void use(unsigned int payload);
-    void unuse();
-    void free();
+    void use(unsigned int payload) override;
+    void unuse() override;
+    void free() override;
 
   protected:
     void giveUpOwnership() { ownsUse_ = reserved_ = false; }

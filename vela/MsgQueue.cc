@@ -109,7 +109,8 @@ void MsgQueue::connectionLost(ConnectionLost handler) {
 
 void MsgQueue::lost(void* queue) {
     auto* const self = static_cast<MsgQueue*>(queue);
-    self->connectionLost_.load()(self);
+    if (const ConnectionLost handler = self->connectionLost_; handler != nullptr)
+        handler(self);
 }
 
 int MsgQueue::MsgRouter(KSMsgRef& ref) {

@@ -82,8 +82,9 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
     // standard error stream and deleted, which is what null asks for again.
     void unregisteredSource(UnregisteredSource handler);
 
-    // What happens when the connection to a board in another machine is lost for good; nothing by default.
-    // Called once, on the routing thread, or at once when it is lost already.
+    // What happens when the connection to a board in another machine is lost for good: nothing by default,
+    // which is what null asks for again. Called once, on the routing thread, or at once when it is lost
+    // already.
     using ConnectionLost = void (*)(MsgQueue*);
     void connectionLost(ConnectionLost handler);
 

@@ -25,11 +25,7 @@ void append(ResourceMgr::Found& all, const ResourceMgr::Found& more) {
 
 }  // namespace
 
-ResourceMgr::ResourceMgr(const Addressable* object)
-    : Addressable(managerOf(object->getTgtDesc()), object->getMsgQueue()) {
-    setResponseTimeout(object->getResponseTimeout());
-    setErrorWaitTime(object->getErrorWaitTime());
-}
+ResourceMgr::ResourceMgr(const Addressable* object) : Addressable(managerOf(object->getTgtDesc()), *object) {}
 
 MsgBody* ResourceMgr::MsgBodyLookup(unsigned int msgType) {
     MsgBody* const body = Bodies::make(msgType);
@@ -47,7 +43,7 @@ StdResource ResourceMgr::find(unsigned char compType, unsigned char processor, u
     addType(attributes, compType);
     ComponentResult_t found;
     command(CompFind_t(start, attributes), &found, wait);
-    return StdResource(found.desc, getMsgQueue());
+    return StdResource(found.desc, *this);
 }
 
 // The manager names the component to go on from; none, or one that it named before, is the end.
@@ -88,7 +84,7 @@ StdResource ResourceMgr::allocate(unsigned char compType, unsigned char processo
     addType(attributes, compType);
     ComponentResult_t found;
     command(CompInstAllocate_t(start, cluster, attributes), &found, wait);
-    return StdResource(found.desc, getMsgQueue());
+    return StdResource(found.desc, *this);
 }
 
 void ResourceMgr::use(const CompDesc_t& component, unsigned int payload, Wait wait) {

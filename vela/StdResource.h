@@ -16,6 +16,8 @@ class StdResource : public Addressable, public StdResourceMessages {
     StdResource(const CompDesc_t& target, MsgQueue* queue, int inUse);
     explicit StdResource(const Addressable& other) : Addressable(other) {}
     StdResource(const StdResource& other) = default;
+    // What was found at the address through `finder`: on its queue and with its time-outs.
+    StdResource(const CompDesc_t& target, const Addressable& finder) : Addressable(target, finder) {}
     ~StdResource() override { endCallbacks(); }
 
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
@@ -24,9 +26,10 @@ class StdResource : public Addressable, public StdResourceMessages {
     void msgQueueAttach(MsgQueue* queue) { MsgQueueAttach(queue); }
     // Marks the component as in use, with a word of the user's own, or as no longer in use, or gives an
     // allocated instance back: requests to the board's resource manager. Throw Timeout, UnexpectedMsg.
-    void use(unsigned int payload);
-    void unuse();
-    void free();
+    // Virtual, so that an Instance remembers what was done through a reference to this base.
+    virtual void use(unsigned int payload);
+    virtual void unuse();
+    virtual void free();
 
     // Commands. Each takes a prepared body, or its fields, and waits for the completion, which it reads into
     // reply unless that is null; without a wait of its own as long as the object's response time-out says.

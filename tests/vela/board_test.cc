@@ -165,6 +165,68 @@ TEST_F(BoardTest, AnInstanceThatCannotBeGivenBackSaysSo) {
     EXPECT_THAT(errors.text(), testing::HasSubstr("Addressable::UnexpectedMsg"));
 }
 
+// Each call of an instance is remembered, through whatever reference it is made.
+TEST_F(BoardTest, AnInstanceGivesBackWhatItReservedAndHasNotGivenBackItself) {
+    const struct {
+        const char* says;
+        void (*act)(vela::StdResource&);
+        std::vector<std::uint32_t> sent;
+    } cases[] = {
+        {"reserved", [](vela::StdResource& r) { r.use(1001); }, {CompUse, CompUnuse}},
+        {"reserved and given back",
+         [](vela::StdResource& r) {
+             r.use(1001);
+             r.unuse();
+         },
+         {CompUse, CompUnuse}},
+        {"reserved and freed",
+         [](vela::StdResource& r) {
+             r.use(1001);
+             r.free();
+         },
+         {CompUse, CompInstFree}},
+        {"reserved again",
+         [](vela::StdResource& r) {
+             r.use(1001);
+             r.unuse();
+             r.use(1002);
+         },
+         {CompUse, CompUnuse, CompUse, CompUnuse}},
+    };
+    for (const auto& c : cases) {
+        {
+            Instance instance(Found, board_.getMsgQueue());
+            c.act(instance);
+        }
+        EXPECT_EQ(sentTypes(), c.sent) << c.says;
+    }
+}
+
+TEST_F(BoardTest, AnInstanceThatTheBoardRefusesStaysAsItWas) {
+    script_.answers(CompUse, 0, fake_norv::words({CompUse, 1}));
+    script_.answers(CompInstFree, 0, fake_norv::words({CompInstFree, 1}));
+    {
+        Instance refused(Found, board_.getMsgQueue());
+        EXPECT_THROW(refused.use(0), vela::Addressable::UnexpectedMsg);
+    }
+    EXPECT_THAT(sentTypes(), testing::ElementsAre(CompUse)) << "nothing was reserved";
+    script_.answers(CompUse, ResultComplete);
+    {
+        Instance kept(Found, board_.getMsgQueue(), 1);
+        EXPECT_THROW(kept.free(), vela::Addressable::UnexpectedMsg);
+    }
+    EXPECT_THAT(sentTypes(), testing::ElementsAre(CompUse, CompInstFree, CompUnuse)) << "still reserved";
+}
+
+TEST_F(BoardTest, ATemporaryInstanceGivesNothingBackWhateverWasDoneWithIt) {
+    {
+        TmpInstance temporary(Found, board_.getMsgQueue());
+        temporary.use(1001);
+        const TmpInstance copy(temporary);
+    }
+    EXPECT_THAT(sentTypes(), testing::ElementsAre(CompUse));
+}
+
 TEST_F(BoardTest, AResourceIsUsedUnusedAndFreedThroughTheManager) {
     vela::StdResource resource(Found, board_.getMsgQueue());
     resource.use(1001);

@@ -429,11 +429,4 @@ TEST_F(CommandTest, TheFamiliesKnowTheirOwnCodesAlone) {
     EXPECT_FALSE(knows(resources_, 8));
 }
 
-TEST_F(CommandTest, AManagerHasTheTimeoutsOfTheObjectItIsMadeFrom) {
-    resource_.setResponseTimeout(1001);
-    resource_.setErrorWaitTime(1002);
-    EXPECT_EQ(ResourceMgr(resource_).getResponseTimeout(), 1001U);
-    EXPECT_EQ(ClusterMgr(resource_).getErrorWaitTime(), 1002U);
-}
-
 }  // namespace
