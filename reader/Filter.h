@@ -1,0 +1,59 @@
+// The filters that all commands share.
+#ifndef READER_FILTER_H
+#define READER_FILTER_H
+
+#include <memory>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "reader/Options.h"
+#include "reader/Seen.h"
+
+namespace reader {
+
+// One condition on a frame. Asked by several threads at once.
+class Condition {
+  public:
+    virtual ~Condition() = default;
+    virtual bool holds(const Seen& seen) const = 0;
+    // Conditions on time learn when the stream began. Called once, before `holds`.
+    virtual void begin(Instant /*firstFrame*/) {}
+    // Conditions on time are asked about losses and other events as well.
+    virtual bool isAboutTime() const { return false; }
+};
+
+// A filter as the command line knows it.
+struct FilterRow {
+    std::string_view name;
+    std::string_view form;  // of its value; empty if it takes none
+    std::string_view help;
+    // Throws UsageError for a value that means nothing.
+    std::unique_ptr<Condition> (*make)(const std::string& value);
+};
+std::span<const FilterRow> filterRows();
+
+// Frames pass if they meet at least one of the values of each filter, and none of those behind --not.
+class Filter {
+  public:
+    // Throws UsageError. Dates are taken in the local time of now.
+    explicit Filter(const std::vector<FilterWord>& words);
+
+    // Before the first item is asked about.
+    void begin(Instant firstFrame);
+    bool passes(const Seen& seen) const;
+
+  private:
+    struct Group {
+        std::string name;
+        bool negated;
+        std::vector<std::unique_ptr<Condition>> anyOf;
+    };
+
+    std::vector<Group> groups_;
+};
+
+}  // namespace reader
+
+#endif

@@ -1,0 +1,111 @@
+#include "reader/Joined.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace reader {
+
+void Names::keep(capture::Item& item) {
+    capture::Frame& frame = item.frame;
+    // An interface may learn its variant while it is read, so that its address alone tells nothing.
+    if (frame.interface != nullptr) {
+        if (frame.interface != lastGiven_ || !(*frame.interface == lastSeen_)) {
+            lastGiven_ = frame.interface;
+            lastSeen_ = *frame.interface;
+            capture::Interface wanted = lastSeen_;
+            if (!trunk_.empty())
+                wanted.name = trunk_;
+            const auto known = std::find(interfaces_.begin(), interfaces_.end(), wanted);
+            lastKept_ = known != interfaces_.end() ? &*known : &interfaces_.emplace_back(std::move(wanted));
+        }
+        frame.interface = lastKept_;
+    }
+    if (frame.place.file != lastFile_)
+        lastFile_ = *files_.emplace(frame.place.file).first;
+    frame.place.file = lastFile_;
+}
+
+Sequence::Sequence(std::vector<Opener> inputs, std::string trunk)
+    : inputs_(std::move(inputs)), names_(std::move(trunk)) {}
+
+capture::Reader::Next Sequence::next(capture::Item& item) {
+    while (true) {
+        if (current_ == nullptr) {
+            if (nextInput_ == inputs_.size())
+                return Next::end;
+            current_ = inputs_[nextInput_++]();
+        }
+        const Next got = current_->next(item);
+        if (got == Next::item)
+            names_.keep(item);
+        if (got != Next::end || nextInput_ == inputs_.size())
+            return got;
+        current_ = nullptr;
+    }
+}
+
+void Sequence::wait(std::chrono::milliseconds most) {
+    if (current_ != nullptr)
+        current_->wait(most);
+}
+
+// Of several inputs nobody knows the length of those that are not open yet.
+capture::Reader::Progress Sequence::progress() const {
+    if (current_ == nullptr)
+        return {};
+    return inputs_.size() == 1 ? current_->progress() : Progress{current_->progress().octets, 0};
+}
+
+Merge::Merge(const std::vector<Opener>& inputs, std::string trunk) : names_(std::move(trunk)) {
+    for (const Opener& open : inputs)
+        inputs_.push_back({open(), {}});
+}
+
+capture::Reader::Next Merge::next(capture::Item& item) {
+    Input* earliest = nullptr;
+    bool pausing = false;
+    for (Input& input : inputs_) {
+        if (input.given && input.state != Next::end) {
+            input.state = input.reader->next(input.item);
+            input.given = input.state != Next::item;
+        }
+        pausing = pausing || input.state == Next::pause;
+        if (input.given)
+            continue;
+        const bool hasNoTime = input.item.frame.clock == capture::Clock::none;
+        if (earliest == nullptr || hasNoTime || input.item.frame.time < earliest->item.frame.time)
+            earliest = &input;
+        if (hasNoTime)
+            break;
+    }
+    if (earliest == nullptr)
+        return pausing ? Next::pause : Next::end;
+    item = earliest->item;
+    names_.keep(item);
+    earliest->given = true;
+    return Next::item;
+}
+
+// The first that is waiting may not be the first to have something: look at the others now and then.
+void Merge::wait(std::chrono::milliseconds most) {
+    const auto pausing = std::count_if(inputs_.begin(), inputs_.end(),
+                                       [](const Input& input) { return input.state == Next::pause; });
+    const auto waiting = std::find_if(inputs_.begin(), inputs_.end(),
+                                      [](const Input& input) { return input.state == Next::pause; });
+    if (waiting != inputs_.end())
+        waiting->reader->wait(pausing > 1 ? std::min(most, std::chrono::milliseconds(20)) : most);
+}
+
+capture::Reader::Progress Merge::progress() const {
+    Progress sum;
+    bool known = true;
+    for (const Input& input : inputs_) {
+        const Progress part = input.reader->progress();
+        sum.octets += part.octets;
+        sum.of += part.of;
+        known = known && part.of != 0;
+    }
+    return {sum.octets, known ? sum.of : 0};
+}
+
+}  // namespace reader

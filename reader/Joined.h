@@ -1,0 +1,77 @@
+// Several inputs as one stream: one after another, or by time.
+#ifndef READER_JOINED_H
+#define READER_JOINED_H
+
+#include <cstdint>
+#include <functional>
+#include <list>
+#include <memory>
+#include <set>
+#include <string>
+#include <vector>
+
+#include "capture/Reader.h"
+
+namespace reader {
+
+// Opens an input when its turn comes, so that a thousand files need no thousand descriptors.
+using Opener = std::function<std::unique_ptr<capture::Reader>()>;
+
+// Keeps the names that items refer to for longer than the reader they came from.
+class Names {
+  public:
+    // A name that is not empty takes the place of the D channel's own.
+    explicit Names(std::string trunk) : trunk_(std::move(trunk)) {}
+    void keep(capture::Item& item);
+
+  private:
+    std::string trunk_;
+    std::list<capture::Interface> interfaces_;
+    std::set<std::string, std::less<>> files_;
+    const capture::Interface* lastGiven_ = nullptr;
+    capture::Interface lastSeen_;
+    const capture::Interface* lastKept_ = nullptr;
+    std::string_view lastFile_;
+};
+
+// One after another; an input that is followed never ends, and so must be the last.
+class Sequence : public capture::Reader {
+  public:
+    Sequence(std::vector<Opener> inputs, std::string trunk);
+
+    Next next(capture::Item& item) override;
+    void wait(std::chrono::milliseconds most) override;
+    Progress progress() const override;
+
+  private:
+    std::vector<Opener> inputs_;
+    std::size_t nextInput_ = 0;
+    std::unique_ptr<capture::Reader> current_;
+    Names names_;
+};
+
+// By time. Inputs without times, and those that have nothing to give just now, hold nobody up. Items of equal
+// times come in the order of the inputs.
+class Merge : public capture::Reader {
+  public:
+    Merge(const std::vector<Opener>& inputs, std::string trunk);
+
+    Next next(capture::Item& item) override;
+    void wait(std::chrono::milliseconds most) override;
+    Progress progress() const override;
+
+  private:
+    struct Input {
+        std::unique_ptr<capture::Reader> reader;
+        capture::Item item;
+        Next state = Next::pause;
+        bool given = true;  // the item was handed out, and the next one is not asked for yet
+    };
+
+    std::vector<Input> inputs_;
+    Names names_;
+};
+
+}  // namespace reader
+
+#endif

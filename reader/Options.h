@@ -1,0 +1,72 @@
+// What the command line asks for.
+#ifndef READER_OPTIONS_H
+#define READER_OPTIONS_H
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "capture/Frame.h"
+#include "reader/Chatter.h"
+#include "reader/TimeText.h"
+
+namespace reader {
+
+enum class ColorMode { automatic, always, never };
+
+// A filter as it was typed: "--not --callref 0378".
+struct FilterWord {
+    std::string name;  // without the dashes
+    std::string value;
+    bool negated = false;
+};
+
+// Names an input, and how it is read.
+struct InputOptions {
+    std::vector<std::string> files;  // "-" is the standard input
+    bool follow = false;
+    bool merge = false;
+    std::string trunk;  // the D channel's name; empty: as the input has it
+    capture::Role role = capture::Role::unknown;
+    capture::Variant variant = capture::Variant::unknown;
+    std::string zone;
+};
+
+struct OutputOptions {
+    std::string path;  // empty or "-": standard output
+    ColorMode color = ColorMode::automatic;
+    bool lineBuffered = false;
+    unsigned jobs = 0;  // 0: one for each processor
+};
+
+struct ListOptions {
+    TimeForm time = TimeForm::absolute;
+    bool wide = false;
+    std::vector<std::string> columns;  // empty: those of `wide`, or the usual ones
+};
+
+enum class ExplainAs { guess, frame, element };
+
+struct RecordOptions {
+    std::string folder = ".";
+    std::uint64_t size = 0;    // octets of a file; 0: no limit
+    std::int64_t seconds = 0;  // clock-aligned; 0: no limit
+    unsigned files = 0;        // how many files are kept; 0: all
+};
+
+struct Options {
+    std::vector<std::string> words;  // files, or the hexadecimal digits that `explain` takes
+    InputOptions input;
+    OutputOptions output;
+    std::vector<FilterWord> filters;
+    std::uint64_t first = 0;  // how many frames are shown; 0: all
+    Loudness loudness = Loudness::usual;
+    ListOptions list;
+    ExplainAs explainAs = ExplainAs::guess;
+    std::string form;  // the form to convert to, or to record in
+    RecordOptions record;
+};
+
+}  // namespace reader
+
+#endif

@@ -1,0 +1,57 @@
+// Where a command's data goes: standard output or a file, through a buffer.
+#ifndef READER_OUTPUT_H
+#define READER_OUTPUT_H
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+
+namespace reader {
+
+// Gathers text and writes it in large pieces. Not shared between threads.
+class Output {
+  public:
+    // Standard output, which stays open.
+    Output();
+
+    // A file, created or emptied. Throws FileError.
+    explicit Output(const std::string& path);
+
+    // An open descriptor, which the caller closes; the name is for messages.
+    Output(int descriptor, std::string name);
+
+    // Does not flush: an output that is left by an exception may hold half a line.
+    ~Output();
+
+    Output(const Output&) = delete;
+    Output& operator=(const Output&) = delete;
+
+    // Both throw ReaderGone when a pipe has no reader any more, and FileError when the text cannot be
+    // written.
+    void write(std::string_view text) {
+        buffer_.append(text);
+        if (buffer_.size() >= most_)
+            flush();
+    }
+    void flush();
+
+    bool isTerminal() const { return terminal_; }
+    int descriptor() const { return descriptor_; }
+    const std::string& name() const { return name_; }
+
+  private:
+    static constexpr std::size_t most_ = 256 * 1024;
+
+    int descriptor_;
+    bool ours_;
+    bool terminal_;
+    std::string name_;
+    std::string buffer_;
+};
+
+// Writes all of it, however often the system writes less or is interrupted. Returns 0 or the error's number.
+int writeAll(int descriptor, std::string_view text);
+
+}  // namespace reader
+
+#endif

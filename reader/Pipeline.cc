@@ -1,0 +1,147 @@
+#include "reader/Pipeline.h"
+
+#include <algorithm>
+#include <chrono>
+#include <vector>
+
+#include "reader/Crew.h"
+
+namespace reader {
+
+namespace {
+
+// Large enough that handing over costs nothing, small enough that a few of them fit into the cache.
+constexpr std::size_t itemsInChunk = 256;
+constexpr std::size_t chunksForEachThread = 3;
+constexpr std::chrono::milliseconds longestWait{500};
+
+void composeChunk(Chunk& chunk, const Filter& filter, Composer& composer) {
+    for (std::size_t i = 0; i < chunk.size(); ++i) {
+        Seen& seen = chunk.seen()[i];
+        readHeaders(seen);
+        if (!filter.passes(seen))
+            continue;
+        Piece piece{.item = i, .instant = seen.instant()};
+        composer.compose(seen, chunk.text, piece);
+        piece.end = chunk.text.size();
+        chunk.pieces.push_back(piece);
+    }
+}
+
+class Run {
+  public:
+    Run(capture::Reader& reader, Tracker& tracker, Filter& filter, Consumer& consumer, Chatter& chatter,
+        const Work& work)
+        : reader_(reader),
+          tracker_(tracker),
+          filter_(filter),
+          consumer_(consumer),
+          chatter_(chatter),
+          work_(work),
+          left_(work.first),
+          crew_(jobs()) {}
+
+    void run() {
+        bool more = true;
+        while (more && !isStopped()) {
+            const auto next = readChunk();
+            const std::size_t most = work_.jobs == 1 ? 0 : work_.jobs * chunksForEachThread;
+            const bool nowOrNever = next != capture::Reader::Next::item || work_.eachAtOnce;
+            more = handOn(nowOrNever ? 0 : most) && next != capture::Reader::Next::end;
+            if (nowOrNever)
+                consumer_.flush();
+            if (more && next == capture::Reader::Next::pause)
+                reader_.wait(longestWait);
+            const auto [done, of] = reader_.progress();
+            chatter_.progress(done, of);
+        }
+        handOn(0);
+        consumer_.flush();
+    }
+
+  private:
+    using Next = capture::Reader::Next;
+
+    std::vector<Crew::Job> jobs() {
+        std::vector<Crew::Job> jobs;
+        for (unsigned i = 0; i < work_.jobs; ++i) {
+            jobs.emplace_back([this, composer = std::shared_ptr<Composer>(work_.makeComposer())](
+                                  Chunk& chunk) { composeChunk(chunk, filter_, *composer); });
+        }
+        return jobs;
+    }
+
+    bool isStopped() const { return work_.stopped != nullptr && work_.stopped->load(); }
+
+    // Reads a chunk and hands it in. Returns why it holds no more.
+    Next readChunk() {
+        std::unique_ptr<Chunk> chunk = freeChunk();
+        const std::size_t most = work_.eachAtOnce ? 1 : itemsInChunk;
+        Next next = Next::item;
+        while (chunk->size() < most && (next = reader_.next(item_)) == Next::item) {
+            begin();
+            chunk->add(tracker_.see(item_));
+        }
+        chunk->seal();
+        begun_ = begun_ || !chunk->empty();
+        crew_.handIn(std::move(chunk));
+        return next;
+    }
+
+    // Tells the filter what the first time of the stream is, while no other thread asks it. A stream whose
+    // first chunk has no time is one without times.
+    void begin() {
+        if (begun_ || item_.frame.clock == capture::Clock::none)
+            return;
+        filter_.begin({item_.frame.clock, item_.frame.time});
+        begun_ = true;
+    }
+
+    // Hands finished chunks on until no more than `most` are held. False once nothing more is wanted.
+    bool handOn(std::size_t most) {
+        while (crew_.held() > most) {
+            std::unique_ptr<Chunk> chunk = crew_.takeBack();
+            std::size_t wanted = chunk->pieces.size();
+            if (work_.first != 0) {
+                wanted = std::min<std::uint64_t>(wanted, left_);
+                left_ -= wanted;
+            }
+            if (wanted > 0)
+                consumer_.take(*chunk, wanted);
+            free_.push_back(std::move(chunk));
+            if (work_.first != 0 && left_ == 0)
+                return false;
+        }
+        return true;
+    }
+
+    std::unique_ptr<Chunk> freeChunk() {
+        if (free_.empty())
+            return std::make_unique<Chunk>();
+        std::unique_ptr<Chunk> chunk = std::move(free_.back());
+        free_.pop_back();
+        chunk->clear();
+        return chunk;
+    }
+
+    capture::Reader& reader_;
+    Tracker& tracker_;
+    Filter& filter_;
+    Consumer& consumer_;
+    Chatter& chatter_;
+    const Work& work_;
+    std::uint64_t left_;
+    bool begun_ = false;
+    capture::Item item_;
+    std::vector<std::unique_ptr<Chunk>> free_;
+    Crew crew_;
+};
+
+}  // namespace
+
+void runPipeline(capture::Reader& reader, Tracker& tracker, Filter& filter, Consumer& consumer,
+                 Chatter& chatter, const Work& work) {
+    Run(reader, tracker, filter, consumer, chatter, work).run();
+}
+
+}  // namespace reader

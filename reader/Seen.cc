@@ -1,0 +1,30 @@
+#include "reader/Seen.h"
+
+namespace reader {
+
+isdn::Variant standardVariant(capture::Variant variant) {
+    switch (variant) {
+        case capture::Variant::att4ess:
+            return isdn::Variant::ess4;
+        case capture::Variant::ess5:
+            return isdn::Variant::ess5;
+        case capture::Variant::dms100:
+            return isdn::Variant::dms100;
+        case capture::Variant::ntt:
+            return isdn::Variant::ntt;
+        case capture::Variant::ni2:
+            return isdn::Variant::ni2;
+        case capture::Variant::net5:
+        case capture::Variant::unknown:
+            break;
+    }
+    return isdn::Variant::net5;
+}
+
+std::string_view direction(const Seen& seen) {
+    if (seen.role == capture::Role::unknown)
+        return "?>?";
+    return seen.frame().transmitted == (seen.role == capture::Role::user) ? "U>N" : "N>U";
+}
+
+}  // namespace reader

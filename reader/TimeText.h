@@ -1,0 +1,68 @@
+// Times as people read them, and times that people type.
+#ifndef READER_TIME_TEXT_H
+#define READER_TIME_TEXT_H
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "capture/Frame.h"
+
+namespace reader {
+
+// How the time of a frame is shown: date, time and offset; seconds since the first frame; or seconds since
+// the frame that was shown before it.
+enum class TimeForm { absolute, relative, delta };
+
+// A time and what it counts from.
+struct Instant {
+    capture::Clock clock = capture::Clock::none;
+    std::int64_t time = 0;  // nanoseconds
+};
+
+// Makes `zone` ("Europe/Berlin", "UTC", "CET-1CEST") the local time of the whole process, before threads
+// start. Throws UsageError for a zone that the system does not know.
+void useTimeZone(const std::string& zone);
+
+// Writes times in the process's local time. Remembers the last minute, since looking an offset up takes
+// longer than writing the rest. Not shared between threads.
+class TimeText {
+  public:
+    // "2026-11-21T11:25:33.300+01:00"; of a relative clock seconds, "12.300"; "-" without a clock.
+    // Parts of a millisecond are cut off.
+    void append(std::string& to, Instant instant);
+
+  private:
+    void lookUp(std::int64_t minute);
+
+    std::int64_t minute_ = INT64_MIN;
+    char date_[24] = {};  // "2026-11-21T11:25:"
+    std::size_t dateLength_ = 0;
+    char offset_[8] = {};  // "+01:00"
+};
+
+// Signed seconds with three digits: "0.040", "-1.000". Parts of a millisecond are cut off towards zero.
+void appendSeconds(std::string& to, std::int64_t nanoseconds);
+
+// What a user may give as a time: an ISO date with or without time and offset (local time without), a time of
+// day (of the first frame's day), or "+" and seconds since the first frame.
+class TimePoint {
+  public:
+    // Throws UsageError.
+    explicit TimePoint(const std::string& text);
+
+    // The point on the clock of a stream whose first frame has this time. Nothing if it cannot be told: a
+    // date, for a stream of relative times.
+    std::optional<std::int64_t> on(Instant first) const;
+
+  private:
+    enum class Kind { absolute, timeOfDay, sinceFirst };
+
+    Kind kind_ = Kind::absolute;
+    std::int64_t nanoseconds_ = 0;
+};
+
+}  // namespace reader
+
+#endif

@@ -1,0 +1,69 @@
+#include "reader/commands.h"
+
+#include <algorithm>
+#include <array>
+
+#include "reader/convert.h"
+#include "reader/decode.h"
+#include "reader/explain.h"
+#include "reader/list.h"
+
+namespace reader {
+
+namespace {
+
+constexpr char listExamples[] = R"(  lapdread lapdmon.log
+      a line a frame
+  lapdread --no-keepalive --callref 0378 lapdmon.log
+      one call, without the link's polls
+  lapdread --follow --message SETUP,DISCONNECT lapdmon.log
+      calls as they come and go
+  lapdread --columns time,dir,message,details day1.pcapng day2.pcapng
+      two files, one after another, and four columns
+)";
+
+constexpr char decodeExamples[] = R"(  lapdread decode day.pcapng
+      what lapdmon would have written of these frames
+  lapdread decode --variant ni2 --callref 0378 day.pcap
+      one call of an NI2 trunk
+)";
+
+constexpr char explainExamples[] = R"(  lapdread explain 08 02 80 90
+      an element: its second octet tells its length
+  lapdread explain 02 01 01 97
+      a frame
+  lapdread explain --callref 0378 --message DISCONNECT lapdmon.log
+      frames of a file
+)";
+
+constexpr char convertExamples[] = R"(  lapdread convert lapdmon.log day.pcapng
+      a capture that Wireshark opens, with direction, role and times
+  lapdread convert --to jsonl --message SETUP lapdmon.log
+      a JSON object a frame, to standard output
+  lapdread convert --follow --to pcapng lapdmon.log - | tshark -l -r -
+      the trunk as it runs
+)";
+
+constexpr std::array table{
+    Command{"list", "[FILE...]", "a line a frame; what lapdread does when no command is named", listExamples,
+            declareList, runList},
+    Command{"decode", "[FILE...]", "frames in the words of lapdmon's log", decodeExamples, nullptr,
+            runDecode},
+    Command{"explain", "[HEX|FILE...]",
+            "every octet of a frame or an element: its bits, its field, what it means", explainExamples,
+            declareExplain, runExplain},
+    Command{"convert", "IN [OUT]", "frames in files that other tools read", convertExamples, declareConvert,
+            runConvert},
+};
+
+}  // namespace
+
+std::span<const Command> commands() { return table; }
+
+const Command* commandNamed(std::string_view name) {
+    const auto* const found = std::find_if(table.begin(), table.end(),
+                                           [&](const Command& command) { return command.name == name; });
+    return found == table.end() ? nullptr : found;
+}
+
+}  // namespace reader

@@ -1,0 +1,73 @@
+#include "reader/convert.h"
+
+#include <CLI/CLI.hpp>
+
+#include "reader/TextConsumer.h"
+#include "reader/errors.h"
+#include "reader/forms.h"
+#include "reader/session.h"
+
+namespace reader {
+
+namespace {
+
+// Two words are IN and OUT; with -o all of them are inputs.
+Options withOutput(Options options) {
+    const std::size_t inputs = options.input.files.size() + options.words.size();
+    if (!options.output.path.empty() || inputs < 2)
+        return options;
+    if (inputs > 2 || options.words.empty())
+        throw UsageError("convert takes IN and OUT; for more than one input name the output with -o OUT");
+    options.output.path = options.words.back();
+    options.words.pop_back();
+    return options;
+}
+
+const Form& formOf(const Options& options) {
+    if (!options.form.empty())
+        return formNamed(options.form);
+    if (const Form* form = formOfFile(options.output.path); form != nullptr)
+        return *form;
+    throw UsageError("convert needs --to FORM, or an OUT whose name ends in one");
+}
+
+void write(Session& session, const Form& form, Output& out) {
+    if (form.makeComposer != nullptr) {
+        TextConsumer consumer(out);
+        out.write(form.header);
+        session.run(consumer, form.makeComposer);
+        return;
+    }
+    const auto writer = form.makeWriter(out.descriptor(), out.name());
+    WriterConsumer consumer(*writer);
+    session.run(consumer, [] { return std::make_unique<NoComposer>(); });
+    consumer.finish();
+}
+
+}  // namespace
+
+void declareConvert(CLI::App& app, Options& options) {
+    std::string names;
+    for (const Form& form : forms())
+        (names += names.empty() ? "" : "|") += form.name;
+    app.add_option("--to", options.form, "The form to write; without it the end of OUT's name tells")
+        ->type_name(names)
+        ->check([](const std::string& name) {
+            formNamed(name);
+            return std::string();
+        });
+}
+
+int runConvert(const Options& given, Chatter& chatter) {
+    const Options options = withOutput(given);
+    const Form& form = formOf(options);
+    Session session(options, chatter);
+    Output& out = session.output(form.what, form.looksRight);
+    if (form.binary && out.isTerminal())
+        throw UsageError(std::string(form.name) +
+                         " is not for a terminal: name a file, or send it through a pipe");
+    write(session, form, out);
+    return good;
+}
+
+}  // namespace reader

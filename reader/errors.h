@@ -1,0 +1,27 @@
+// What ends lapdread early, and the exit status that goes with it.
+#ifndef READER_ERRORS_H
+#define READER_ERRORS_H
+
+#include <stdexcept>
+
+namespace reader {
+
+enum ExitStatus { good = 0, badUsage = 1, cannotRead = 2, found = 3 };
+
+// The command line cannot be obeyed; exit status 1.
+class UsageError : public std::runtime_error {
+    using std::runtime_error::runtime_error;
+};
+
+// An input cannot be opened or read, or an output cannot be written; exit status 2. The text names the file
+// and the reason.
+class FileError : public std::runtime_error {
+    using std::runtime_error::runtime_error;
+};
+
+// Whoever read the output is gone. The program ends without a word, exit status 0.
+class ReaderGone {};
+
+}  // namespace reader
+
+#endif

@@ -1,0 +1,256 @@
+#include "reader/explain.h"
+
+#include <CLI/CLI.hpp>
+#include <filesystem>
+
+#include "reader/Columns.h"
+#include "reader/TextConsumer.h"
+#include "reader/errors.h"
+#include "reader/session.h"
+#include "reader/text.h"
+
+namespace reader {
+
+namespace {
+
+constexpr std::string_view bold = "\x1b[1m", red = "\x1b[31m", plain = "\x1b[0m";
+
+constexpr std::size_t positionWidth = 5, octetWidth = 5, hexWidth = 3, bitsWidth = 9, nameWidth = 34,
+                      valueWidth = 6;
+constexpr std::size_t octetsInLine = 16;
+
+// "-00-----": the bits of the field at their places.
+void appendBits(std::string& to, unsigned octet, unsigned high, unsigned low) {
+    for (unsigned bit = 8; bit >= 1; --bit) {
+        if (bit > high || bit < low)
+            to += '-';
+        else
+            to += ((octet >> (bit - 1)) & 1U) != 0 ? '1' : '0';
+    }
+}
+
+void appendPadded(std::string& to, std::string_view text, std::size_t width, bool right = false) {
+    const std::size_t start = to.size();
+    appendSafe(to, text);
+    padTo(to, start, width, right);
+    to += ' ';
+}
+
+std::string number(std::uint64_t value) {
+    std::string text;
+    appendNumber(text, value);
+    return text;
+}
+
+void endLine(std::string& text) {
+    text.erase(text.find_last_not_of(' ') + 1);
+    text += '\n';
+}
+
+}  // namespace
+
+void ExplainComposer::putHeading(std::string& text, std::string_view words) {
+    if (colors_)
+        text += bold;
+    appendSafe(text, words);
+    if (colors_)
+        text += plain;
+    text += '\n';
+}
+
+void ExplainComposer::putProblem(std::string& text, isdn::Problem problem) {
+    if (problem == isdn::Problem::none)
+        return;
+    if (colors_)
+        text += red;
+    (text += "      ** ") += isdn::nameOf(problem);
+    if (colors_)
+        text += plain;
+    text += '\n';
+}
+
+void ExplainComposer::putRow(std::string& text, const isdn::Field& field) {
+    if (field.at.empty())
+        return;
+    const auto position = static_cast<std::size_t>(field.at.data() - begin_) + 1;
+    const bool oneOctet = field.at.size() == 1;
+    appendPadded(text, number(position), positionWidth, true);
+    appendPadded(text, field.octet, octetWidth, true);
+    std::string hex;
+    std::string bits;
+    if (oneOctet) {
+        appendHex(hex, field.at);
+        appendBits(bits, field.at[0], field.high, field.low);
+    }
+    appendPadded(text, hex, hexWidth);
+    appendPadded(text, bits, bitsWidth);
+    appendPadded(text, std::string(2U * field.depth, ' ') + std::string(field.name), nameWidth);
+    const bool isNumber = field.kind != isdn::Field::Kind::text && field.at.size() <= sizeof field.value;
+    appendPadded(text, isNumber ? number(field.value) : "", valueWidth, true);
+    appendSafe(text, field.meaning);
+    if (!field.clause.empty()) {
+        text += text.back() == ' ' ? "(" : " (";
+        (text += field.clause) += ')';
+    }
+    endLine(text);
+    for (std::size_t i = 0; i < field.at.size() && !oneOctet; i += octetsInLine) {
+        text.append(positionWidth + octetWidth + 2, ' ');
+        for (const std::uint8_t octet : field.at.subspan(i, std::min(octetsInLine, field.at.size() - i))) {
+            appendHex(text, std::span(&octet, 1));
+            text += ' ';
+        }
+        endLine(text);
+    }
+}
+
+void ExplainComposer::putRows(std::string& text) {
+    for (const isdn::Field& field : fields_)
+        putRow(text, field);
+    fields_.clear();
+}
+
+void ExplainComposer::putElement(std::string& text, const isdn::Element& element, isdn::Variant variant) {
+    std::string heading(isdn::elementName(element, variant));
+    if (heading.empty())
+        heading = "unknown element";
+    if (element.codeset != 0)
+        heading += ", codeset " + number(element.codeset);
+    fields_.clear();
+    const isdn::Problem problem = isdn::fieldsOf(element, variant, fields_);
+    putHeading(text, heading);
+    putRows(text);
+    putProblem(text, problem);
+}
+
+void ExplainComposer::putMessage(std::string& text, const isdn::Layer3& message, isdn::Variant variant) {
+    putHeading(text,
+               message.hasType ? isdn::messageName(message) : isdn::protocolName(message.discriminator));
+    fields_.clear();
+    const isdn::Problem problem = isdn::fieldsOf(message, fields_);
+    putRows(text);
+    putProblem(text, problem);
+    for (const isdn::Element& element : message.elements)
+        putElement(text, element, variant);
+}
+
+void ExplainComposer::putContents(std::string& text, std::span<const std::uint8_t> octets,
+                                  isdn::Variant variant) {
+    begin_ = octets.data();
+    const isdn::Layer2 link = isdn::parseLayer2(octets);
+    fields_.clear();
+    const isdn::Problem problem = isdn::fieldsOf(link, fields_);
+    putHeading(text, isdn::nameOf(link.type));
+    putRows(text);
+    putProblem(text, problem);
+    if (link.carriesMessage())
+        putMessage(text, isdn::parseLayer3(link.information), variant);
+}
+
+void ExplainComposer::explainFrame(std::span<const std::uint8_t> octets, isdn::Variant variant,
+                                   std::string& text) {
+    putContents(text, octets, variant);
+}
+
+void ExplainComposer::explainElement(std::span<const std::uint8_t> octets, isdn::Variant variant,
+                                     std::string& text) {
+    begin_ = octets.data();
+    for (const isdn::Element& element : isdn::Elements(octets))
+        putElement(text, element, variant);
+}
+
+void ExplainComposer::compose(const Seen& seen, std::string& text, Piece& /*piece*/) {
+    text += "Frame ";
+    appendNumber(text, seen.number);
+    text += ", ";
+    times_.append(text, seen.instant());
+    text += seen.frame().transmitted ? ", TX " : ", RX ";
+    (text += direction(seen)) += ", ";
+    appendSafe(text, capture::toString(seen.frame().place));
+    text += '\n';
+    if (seen.isFrame()) {
+        putContents(text, seen.frame().octets, seen.variant);
+    } else {
+        appendEvent(text, *seen.item);
+        text += '\n';
+    }
+    text += '\n';
+}
+
+std::optional<std::vector<std::uint8_t>> readHex(std::string_view text) {
+    std::string digits;
+    for (const char character : text) {
+        if (character == ' ' || character == ':' || character == '-')
+            continue;
+        digits += character;
+    }
+    if (digits.empty() || digits.size() % 2 != 0)
+        return std::nullopt;
+    std::vector<std::uint8_t> octets;
+    for (std::size_t i = 0; i < digits.size(); i += 2) {
+        unsigned octet = 0;
+        if (!readNumber(std::string_view(digits).substr(i, 2), octet, 16))
+            return std::nullopt;
+        octets.push_back(static_cast<std::uint8_t>(octet));
+    }
+    return octets;
+}
+
+bool looksLikeElement(std::span<const std::uint8_t> octets) {
+    return octets.size() >= 2 && (octets[0] & 0x80U) == 0 && octets[1] == octets.size() - 2;
+}
+
+void declareExplain(CLI::App& app, Options& options) {
+    const std::string group = "Octets";
+    app.add_flag_callback(
+           "--frame", [&options] { options.explainAs = ExplainAs::frame; },
+           "The digits are a frame, address field first")
+        ->group(group);
+    app.add_flag_callback(
+           "--element", [&options] { options.explainAs = ExplainAs::element; },
+           "The digits are elements, identifier first")
+        ->group(group);
+}
+
+namespace {
+
+// The octets that the words are, unless they name files.
+std::optional<std::vector<std::uint8_t>> octetsOf(const Options& options) {
+    std::string digits;
+    for (const std::string& word : options.words) {
+        if (options.explainAs == ExplainAs::guess && std::filesystem::exists(word))
+            return std::nullopt;
+        digits += word + ' ';
+    }
+    auto octets = readHex(digits);
+    if (!octets && options.explainAs != ExplainAs::guess)
+        throw UsageError("--frame and --element take hexadecimal digits, two for each octet");
+    return octets;
+}
+
+}  // namespace
+
+int runExplain(const Options& options, Chatter& chatter) {
+    const auto octets = octetsOf(options);
+    if (!octets) {
+        Session session(options, chatter);
+        const bool colors = session.useColors();
+        TextConsumer consumer(session.output());
+        session.run(consumer, [colors] { return std::make_unique<ExplainComposer>(colors); });
+        return good;
+    }
+    Output out;
+    ExplainComposer composer(useColors(options.output, out));
+    const isdn::Variant variant = standardVariant(options.input.variant);
+    const bool isElement = options.explainAs == ExplainAs::element ||
+                           (options.explainAs == ExplainAs::guess && looksLikeElement(*octets));
+    std::string text;
+    if (isElement)
+        composer.explainElement(*octets, variant, text);
+    else
+        composer.explainFrame(*octets, variant, text);
+    out.write(text);
+    out.flush();
+    return good;
+}
+
+}  // namespace reader

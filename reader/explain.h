@@ -1,0 +1,58 @@
+// Every octet of a frame or of an element: its bits, the field they are, its value, what it means, the
+// clause.
+#ifndef READER_EXPLAIN_H
+#define READER_EXPLAIN_H
+
+#include <cstdint>
+#include <optional>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "isdn/Field.h"
+#include "reader/Pipeline.h"
+
+namespace CLI {
+class App;
+}
+
+namespace reader {
+
+// Composes a paragraph for each frame.
+class ExplainComposer : public Composer {
+  public:
+    explicit ExplainComposer(bool colors) : colors_(colors) {}
+
+    void compose(const Seen& seen, std::string& text, Piece& piece) override;
+
+    // The rows of octets that came without a time or a direction.
+    void explainFrame(std::span<const std::uint8_t> octets, isdn::Variant variant, std::string& text);
+    void explainElement(std::span<const std::uint8_t> octets, isdn::Variant variant, std::string& text);
+
+  private:
+    void putRows(std::string& text);
+    void putRow(std::string& text, const isdn::Field& field);
+    void putElement(std::string& text, const isdn::Element& element, isdn::Variant variant);
+    void putMessage(std::string& text, const isdn::Layer3& message, isdn::Variant variant);
+    void putHeading(std::string& text, std::string_view words);
+    void putProblem(std::string& text, isdn::Problem problem);
+    void putContents(std::string& text, std::span<const std::uint8_t> octets, isdn::Variant variant);
+
+    bool colors_;
+    TimeText times_;
+    isdn::Fields fields_;
+    const std::uint8_t* begin_ = nullptr;  // of the octets that positions count from
+};
+
+// The octets of hexadecimal digits, which blanks, colons and dashes may part; nothing for any other text.
+std::optional<std::vector<std::uint8_t>> readHex(std::string_view text);
+
+// Whether octets that came without further words are an element: the second one tells how many follow.
+bool looksLikeElement(std::span<const std::uint8_t> octets);
+
+void declareExplain(CLI::App& app, Options& options);
+int runExplain(const Options& options, Chatter& chatter);
+
+}  // namespace reader
+
+#endif

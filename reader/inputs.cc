@@ -1,0 +1,52 @@
+#include "reader/inputs.h"
+
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstring>
+
+#include "reader/Joined.h"
+#include "reader/errors.h"
+
+namespace reader {
+
+namespace {
+
+std::unique_ptr<capture::Reader> openOne(const std::string& file, const InputOptions& /*options*/) {
+    throw FileError(file + ": its form is not known");
+}
+
+void checkReadable(const std::string& file) {
+    if (file != "-" && access(file.c_str(), R_OK) != 0)
+        throw FileError("cannot read " + file + ": " + std::strerror(errno));
+}
+
+}  // namespace
+
+std::vector<std::string> inputFiles(const Options& options) {
+    std::vector<std::string> files = options.input.files;
+    files.insert(files.end(), options.words.begin(), options.words.end());
+    if (files.empty() && isatty(STDIN_FILENO) == 1)
+        throw UsageError(
+            "nothing to read: lapdread FILE, or - for the standard input (lapdread --help tells more)");
+    if (files.empty())
+        files.emplace_back("-");
+    return files;
+}
+
+std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*chatter*/) {
+    const std::vector<std::string> files = inputFiles(options);
+    const InputOptions& input = options.input;
+    if (input.follow && files.size() > 1 && !input.merge)
+        throw UsageError("--follow takes one input, or several with --merge");
+    std::vector<Opener> openers;
+    for (const std::string& file : files) {
+        checkReadable(file);
+        openers.emplace_back([file, &input] { return openOne(file, input); });
+    }
+    if (input.merge && files.size() > 1)
+        return std::make_unique<Merge>(openers, input.trunk);
+    return std::make_unique<Sequence>(std::move(openers), input.trunk);
+}
+
+}  // namespace reader

@@ -1,0 +1,25 @@
+// The inputs that the options name, as one stream.
+#ifndef READER_INPUTS_H
+#define READER_INPUTS_H
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "capture/Reader.h"
+#include "reader/Chatter.h"
+#include "reader/Options.h"
+
+namespace reader {
+
+// Their names; the standard input alone ("-") if none is given and it is no terminal. Throws UsageError if
+// there is nothing to read.
+std::vector<std::string> inputFiles(const Options& options);
+
+// One after another, or by time with --merge. Throws FileError for one that cannot be opened or is of no
+// known form, before anything is read.
+std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& chatter);
+
+}  // namespace reader
+
+#endif

@@ -1,0 +1,242 @@
+#include "reader/json.h"
+
+#include "reader/Columns.h"
+#include "reader/text.h"
+
+namespace reader {
+
+namespace {
+
+using Kind = capture::Item::Kind;
+
+void putKey(std::string& to, std::string_view key) {
+    if (to.back() != '{')
+        to += ',';
+    ((to += '"') += key) += "\":";
+}
+
+void putText(std::string& to, std::string_view key, std::string_view value) {
+    putKey(to, key);
+    appendJsonString(to, value);
+}
+
+template <std::integral Number>
+void putNumber(std::string& to, std::string_view key, Number value) {
+    putKey(to, key);
+    appendNumber(to, value);
+}
+
+void putTruth(std::string& to, std::string_view key, bool value) {
+    putKey(to, key);
+    to += value ? "true" : "false";
+}
+
+void putNull(std::string& to, std::string_view key) {
+    putKey(to, key);
+    to += "null";
+}
+
+void putHex(std::string& to, std::string_view key, std::span<const std::uint8_t> octets) {
+    putKey(to, key);
+    to += '"';
+    appendHex(to, octets);
+    to += '"';
+}
+
+// A number that is only there in some frames.
+template <std::integral Number>
+void putNumberIf(std::string& to, std::string_view key, bool present, Number value) {
+    if (present)
+        putNumber(to, key, value);
+    else
+        putNull(to, key);
+}
+
+std::string_view nameOf(capture::Role role) { return role == capture::Role::user ? "user" : "network"; }
+
+// The value of "event".
+std::string_view nameOf(Kind kind) {
+    switch (kind) {
+        case Kind::frame:
+            return "";
+        case Kind::oversized:
+            return "oversized";
+        case Kind::cut:
+            return "cut";
+        case Kind::lost:
+            return "frames-lost";
+        case Kind::notQueued:
+            return "not-queued";
+        case Kind::notTaken:
+            return "not-taken";
+        case Kind::dropped:
+            return "dropped";
+        case Kind::run:
+            return "run";
+        case Kind::restart:
+            return "restart";
+        case Kind::replaced:
+            return "replaced";
+        case Kind::mixed:
+            return "mixed";
+        case Kind::unproved:
+            return "unproved";
+        case Kind::damaged:
+            return "damaged";
+        case Kind::comment:
+            return "comment";
+    }
+    return "";
+}
+
+void putField(std::string& to, const isdn::Field& field) {
+    to += to.back() == '[' ? "{" : ",{";
+    putText(to, "octet", field.octet);
+    putText(to, "bits", field.bits());
+    putText(to, "name", field.name);
+    if (field.at.size() <= sizeof field.value && field.kind != isdn::Field::Kind::text)
+        putNumber(to, "value", field.value);
+    else
+        putHex(to, "value", field.at);
+    putText(to, "meaning", field.meaning);
+    to += '}';
+}
+
+bool isWorthAKey(const isdn::Field& field) {
+    using enum isdn::Field::Kind;
+    return field.kind != extension && field.kind != spare && field.kind != header;
+}
+
+void putMarks(std::string& to, std::string_view marks) {
+    putKey(to, "marks");
+    to += '[';
+    for (const std::string& mark : splitAtCommas(marks)) {
+        if (to.back() != '[')
+            to += ',';
+        appendJsonString(to, mark);
+    }
+    to += ']';
+}
+
+}  // namespace
+
+void appendJsonString(std::string& to, std::string_view text) {
+    to += '"';
+    for (const char character : text) {
+        const auto octet = static_cast<unsigned char>(character);
+        if (octet >= ' ' && octet < 0x7F && octet != '"' && octet != '\\') {
+            to += character;
+        } else {
+            constexpr char digits[] = "0123456789abcdef";
+            const char escape[] = {'\\', 'u', '0', '0', digits[octet >> 4], digits[octet & 15]};
+            to.append(escape, sizeof escape);
+        }
+    }
+    to += '"';
+}
+
+void JsonComposer::compose(const Seen& seen, std::string& text, Piece& /*piece*/) {
+    const capture::Frame& frame = seen.frame();
+    text += '{';
+    putNumber(text, "v", jsonVersion);
+    putNumberIf(text, "n", seen.number != 0, seen.number);
+    putText(text, "file", frame.place.file);
+    putText(text, "interface", frame.interface != nullptr ? std::string_view(frame.interface->name) : "");
+    putKey(text, "time");
+    if (frame.clock == capture::Clock::absolute) {
+        text += '"';
+        times_.append(text, seen.instant());
+        text += '"';
+    } else {
+        text += "null";
+    }
+    putKey(text, "seconds");
+    if (frame.clock == capture::Clock::none)
+        text += "null";
+    else
+        appendSeconds(text, seen.sinceFirst);
+    putNumberIf(text, "ticks", frame.ticks.has_value(), frame.ticks.value_or(0));
+    if (!seen.isFrame()) {
+        putText(text, "event", nameOf(seen.item->kind));
+        putNumber(text, "count", seen.item->count);
+        putText(text, "text", seen.item->text);
+        putTruth(text, "oversized", seen.item->kind == Kind::oversized);
+    }
+    if (seen.number != 0)
+        putFrame(text, seen);
+    text += "}\n";
+}
+
+void JsonComposer::putFrame(std::string& text, const Seen& seen) {
+    const capture::Frame& frame = seen.frame();
+    putText(text, "dir", frame.transmitted ? "tx" : "rx");
+    if (seen.role == capture::Role::unknown)
+        putNull(text, "role");
+    else
+        putText(text, "role", nameOf(seen.role));
+    if (frame.octets.empty())
+        return;
+    const isdn::Layer2& link = seen.link;
+    putNumber(text, "sapi", link.sapi);
+    putNumberIf(text, "tei", link.octets.size() > 1, link.tei);
+    if (seen.command)
+        putTruth(text, "command", *seen.command);
+    else
+        putNull(text, "command");
+    putText(text, "frame", isdn::nameOf(link.type));
+    putNumberIf(text, "ns", link.hasNs(), link.ns);
+    putNumberIf(text, "nr", link.hasNr(), link.nr);
+    putNumberIf(text, "pf", link.hasPf(), link.pf ? 1 : 0);
+    if (link.problem != isdn::Problem::none)
+        putText(text, "problem", isdn::nameOf(link.problem));
+    if (seen.hasMessage)
+        putMessage(text, seen);
+    putMarks(text, seen.marks);
+    putHex(text, "hex", frame.octets);
+}
+
+void JsonComposer::putMessage(std::string& text, const Seen& seen) {
+    const isdn::Layer3& message = seen.message;
+    putNumber(text, "pd", message.discriminator);
+    if (message.hasCallReference) {
+        putKey(text, "callref");
+        text += '{';
+        putNumber(text, "value", message.callReference.value);
+        putNumber(text, "flag", message.callReference.flag ? 1 : 0);
+        putNumber(text, "length", message.callReference.length);
+        text += '}';
+    }
+    if (message.hasType) {
+        putText(text, "message", isdn::messageName(message));
+        putNumber(text, "code", message.type);
+    }
+    putKey(text, "elements");
+    text += '[';
+    for (const isdn::Element& element : message.elements)
+        putElement(text, element, seen.variant);
+    text += ']';
+}
+
+void JsonComposer::putElement(std::string& text, const isdn::Element& element, isdn::Variant variant) {
+    fields_.clear();
+    const isdn::Problem problem = isdn::fieldsOf(element, variant, fields_);
+    text += text.back() == '[' ? "{" : ",{";
+    putNumber(text, "codeset", element.codeset);
+    putNumber(text, "id", element.id);
+    putText(text, "name", isdn::elementName(element, variant));
+    putHex(text, "hex", element.octets);
+    putKey(text, "fields");
+    text += '[';
+    for (const isdn::Field& field : fields_) {
+        if (isWorthAKey(field))
+            putField(text, field);
+    }
+    text += ']';
+    if (problem == isdn::Problem::none)
+        putNull(text, "problem");
+    else
+        putText(text, "problem", isdn::nameOf(problem));
+    text += '}';
+}
+
+}  // namespace reader

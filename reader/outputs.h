@@ -1,0 +1,21 @@
+// Which file a command may write over.
+#ifndef READER_OUTPUTS_H
+#define READER_OUTPUTS_H
+
+#include <span>
+#include <string>
+#include <string_view>
+
+namespace reader {
+
+// Throws FileError if the file exists, is a regular one, and is neither empty nor begins with what
+// `looksRight` accepts; or if it is one of the inputs. `form` is for the message: "a pcapng file".
+void checkOutput(const std::string& path, std::span<const std::string> inputs, std::string_view form,
+                 bool (*looksRight)(std::string_view beginning));
+
+// The beginning of a text that some program may have printed: no capture, no log, nothing binary.
+bool looksLikeText(std::string_view beginning);
+
+}  // namespace reader
+
+#endif

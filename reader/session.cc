@@ -1,0 +1,72 @@
+#include "reader/session.h"
+
+#include <algorithm>
+#include <atomic>
+#include <csignal>
+#include <cstdlib>
+#include <thread>
+
+#include "reader/errors.h"
+#include "reader/inputs.h"
+#include "reader/outputs.h"
+
+namespace reader {
+
+namespace {
+
+std::atomic<bool> stopped = false;
+
+// SIGINT and SIGTERM let the program end what it writes; a second one kills it.
+void stopOnSignals() {
+    struct sigaction action {};
+    action.sa_handler = [](int) { stopped = true; };
+    action.sa_flags = static_cast<int>(SA_RESETHAND);  // and no SA_RESTART: a read that waits returns
+    for (const int signal : {SIGINT, SIGTERM})
+        sigaction(signal, &action, nullptr);
+}
+
+bool isStandard(const std::string& path) { return path.empty() || path == "-"; }
+
+}  // namespace
+
+bool useColors(const OutputOptions& options, const Output& out) {
+    if (options.color != ColorMode::automatic)
+        return options.color == ColorMode::always;
+    const char* const noColor = std::getenv("NO_COLOR");
+    const char* const terminal = std::getenv("TERM");
+    const bool dumb = terminal != nullptr && std::string_view(terminal) == "dumb";
+    return out.isTerminal() && !dumb && (noColor == nullptr || *noColor == '\0');
+}
+
+Session::Session(const Options& options, Chatter& chatter)
+    : options_(options),
+      chatter_(chatter),
+      filter_(options.filters),
+      tracker_(options.input),
+      reader_(openInputs(options, chatter)) {}
+
+Output& Session::output(std::string_view form, bool (*looksRight)(std::string_view)) {
+    if (output_ == nullptr && isStandard(options_.output.path)) {
+        output_ = std::make_unique<Output>();
+    } else if (output_ == nullptr) {
+        checkOutput(options_.output.path, inputFiles(options_), form, looksRight);
+        output_ = std::make_unique<Output>(options_.output.path);
+    }
+    if (output_->isTerminal())
+        chatter_.forbidProgress();
+    return *output_;
+}
+
+void Session::run(Consumer& consumer, const std::function<std::unique_ptr<Composer>()>& makeComposer) {
+    stopOnSignals();
+    Work work;
+    work.makeComposer = makeComposer;
+    work.first = options_.first;
+    work.jobs =
+        options_.output.jobs != 0 ? options_.output.jobs : std::max(1U, std::thread::hardware_concurrency());
+    work.eachAtOnce = options_.output.lineBuffered;
+    work.stopped = &stopped;
+    runPipeline(*reader_, tracker_, filter_, consumer, chatter_, work);
+}
+
+}  // namespace reader

@@ -1,0 +1,53 @@
+// What every command begins with: its inputs, its output, and the way between them.
+#ifndef READER_SESSION_H
+#define READER_SESSION_H
+
+#include <functional>
+#include <memory>
+
+#include "capture/Reader.h"
+#include "reader/Chatter.h"
+#include "reader/Filter.h"
+#include "reader/Options.h"
+#include "reader/Output.h"
+#include "reader/Pipeline.h"
+#include "reader/Tracker.h"
+#include "reader/outputs.h"
+
+namespace reader {
+
+// What the options and the terminal say about colours on this output.
+bool useColors(const OutputOptions& options, const Output& out);
+
+// Holds what the options name. There is one in the process; the signals that end a program end its work in
+// order.
+class Session {
+  public:
+    // Opens the inputs. Throws UsageError or FileError.
+    Session(const Options& options, Chatter& chatter);
+
+    // Opened by the first call: standard output, or the file that the options name, created or emptied. A
+    // file that is neither empty nor of the right form ("text") is refused with FileError, and so is one of
+    // the inputs.
+    Output& output(std::string_view form = "text", bool (*looksRight)(std::string_view) = looksLikeText);
+    bool useColors() { return reader::useColors(options_.output, output()); }
+
+    // Says so once if frames are `done` ("decoded") by the rules of a variant that nobody has named.
+    void tellGuessedVariant(std::string_view done) { tracker_.tellGuessedVariant(chatter_, done); }
+
+    // Hands all that passes the filters on to the consumer. Throws FileError for an input that cannot be
+    // read.
+    void run(Consumer& consumer, const std::function<std::unique_ptr<Composer>()>& makeComposer);
+
+  private:
+    const Options& options_;
+    Chatter& chatter_;
+    Filter filter_;
+    Tracker tracker_;
+    std::unique_ptr<capture::Reader> reader_;
+    std::unique_ptr<Output> output_;
+};
+
+}  // namespace reader
+
+#endif
