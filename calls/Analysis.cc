@@ -1,0 +1,274 @@
+#include "calls/Analysis.h"
+
+#include <algorithm>
+#include <array>
+#include <utility>
+
+#include "calls/CallFindings.h"
+#include "calls/CallTable.h"
+#include "calls/ChannelClock.h"
+#include "calls/FindingSink.h"
+#include "calls/Segments.h"
+#include "calls/Waits.h"
+#include "calls/WitnessKeeper.h"
+
+namespace calls {
+
+namespace {
+
+isdn::Variant variantOf(capture::Variant variant, isdn::Variant otherwise) {
+    switch (variant) {
+        case capture::Variant::att4ess:
+            return isdn::Variant::ess4;
+        case capture::Variant::ess5:
+            return isdn::Variant::ess5;
+        case capture::Variant::dms100:
+            return isdn::Variant::dms100;
+        case capture::Variant::ntt:
+            return isdn::Variant::ntt;
+        case capture::Variant::net5:
+            return isdn::Variant::net5;
+        case capture::Variant::ni2:
+            return isdn::Variant::ni2;
+        case capture::Variant::unknown:
+            break;
+    }
+    return otherwise;
+}
+
+}  // namespace
+
+// The calls of one D channel or of several that share them, and those who watch them.
+class Analysis::Group : public CallObserver, public LinkWitnesses, public FindingSink {
+  public:
+    Group(const Timers& timers, CallNumbers& numbers, Listener& listener)
+        : listener_(listener),
+          table_(timers, numbers, *this),
+          waits_(timers, *this, *this),
+          findings_(timers, *this) {}
+
+    void take(const Message& message, const LinkWitness& link) {
+        links_[message.layer2.tei] = &link;
+        advance(message.at);
+        const Call* const call = table_.take(message);
+        if (message.layer3.type == isdn::message::restartAcknowledge &&
+            message.layer3.discriminator == isdn::callControl && message.layer3.callReference.global())
+            table_.restarted(message);
+        if (call == nullptr)
+            findings_.heardWithoutCall(message);
+        listener_.heard(message, call);
+    }
+    void advance(std::int64_t at) {
+        waits_.advance(at);
+        table_.advance(at);
+    }
+    CallTable& table() { return table_; }
+    const CallTable& table() const { return table_; }
+
+    void heard(Call& call, const Message& message) override {
+        waits_.heard(call, message);
+        findings_.heard(call, message);
+    }
+    void ended(Call& call, const Message* by) override {
+        waits_.ended(call, by);
+        findings_.ended(call, by);
+    }
+    void gone(const Call& call) override {
+        findings_.gone(call);
+        listener_.gone(call);
+    }
+    void replaced(Call& old, Call& by, const Message& message) override {
+        findings_.replaced(old, by, message);
+    }
+    void stray(const Message& message) override { findings_.stray(message); }
+
+    const LinkWitness* witness(std::uint8_t tei) const override { return links_[tei & 127U]; }
+    void report(Finding finding) override { listener_.found(finding); }
+
+  private:
+    Listener& listener_;
+    std::array<const LinkWitness*, 128> links_{};  // by TEI, of the D channel that was used last
+    CallTable table_;
+    Waits waits_;
+    CallFindings findings_;
+};
+
+struct Analysis::Channel {
+    Channel(const Options& options, const std::string& itsName, Group& itsGroup, std::uint32_t number,
+            isdn::Variant ofTrunk)
+        : name(itsName),
+          links(options.timers, options.role),
+          group(itsGroup),
+          groupNumber(number),
+          variant(ofTrunk) {}
+
+    Message messageOf(const capture::Frame& frame, std::uint64_t number, std::int64_t at,
+                      const isdn::Layer2& layer2) const {
+        Message message;
+        message.frame = &frame;
+        message.number = number;
+        message.at = at;
+        message.group = groupNumber;
+        message.role = links.marks().role;
+        message.variant = variant;
+        message.layer2 = layer2;
+        message.layer3 = isdn::parseLayer3(layer2.information);
+        return message;
+    }
+    // A frame that the receiver's layer 2 hands up.
+    void accept(Message message, const Timers& timers) {
+        WitnessKeeper& keeper = keepers[message.layer2.tei];
+        Segments& pieces = segments[message.layer2.tei];
+        const Segments::Taken taken = pieces.take(message);
+        reportUnfinished(pieces, message, timers);
+        if (taken == Segments::Taken::kept)
+            return;
+        if (taken == Segments::Taken::outOfOrder)
+            report(findings::segmentsUnfinished, message, message.number,
+                   "a SEGMENT does not follow those before it");
+        group.take(message, keeper.witness());
+    }
+    void reportUnfinished(Segments& pieces, const Message& message, const Timers& timers) {
+        while (const std::uint64_t frame = pieces.unfinished(message.at, timers.t314 + timers.slack))
+            report(findings::segmentsUnfinished, message, frame, "the next SEGMENT did not come");
+    }
+    void report(const FindingKind& kind, const Message& message, std::uint64_t frame, std::string sentence) {
+        Finding finding;
+        finding.kind = &kind;
+        finding.severity = kind.severity;
+        finding.frame = frame;
+        finding.clock = message.frame->clock;
+        finding.time = message.frame->time;
+        finding.dChannel = message.frame->interface->name;
+        finding.sentence = std::move(sentence);
+        group.report(std::move(finding));
+    }
+
+    std::string name;
+    DChannel links;
+    ChannelClock clock;
+    Group& group;
+    std::uint32_t groupNumber;
+    isdn::Variant variant;
+    std::map<std::uint8_t, WitnessKeeper> keepers;  // by TEI, of call control
+    std::map<std::uint8_t, Segments> segments;      // by TEI
+};
+
+Analysis::Analysis(const Options& options, Listener& listener)
+    : options_(options), listener_(listener), numbers_(std::make_unique<CallNumbers>()) {}
+
+Analysis::~Analysis() = default;
+
+std::uint32_t Analysis::groupOf(const std::string& name) {
+    for (const auto& [other, channel] : channels_) {
+        const auto together = [&, &known = other](const std::vector<std::string>& group) {
+            return std::find(group.begin(), group.end(), name) != group.end() &&
+                   std::find(group.begin(), group.end(), known) != group.end();
+        };
+        if (std::any_of(options_.groups.begin(), options_.groups.end(), together))
+            return channel->groupNumber;
+    }
+    groups_.push_back(std::make_unique<Group>(options_.timers, *numbers_, listener_));
+    return static_cast<std::uint32_t>(groups_.size() - 1);
+}
+
+Analysis::Channel& Analysis::channelOf(const capture::Interface& interface) {
+    if (last_ != nullptr && last_->name == interface.name)
+        return *last_;
+    auto found = channels_.find(interface.name);
+    if (found == channels_.end()) {
+        const std::uint32_t group = groupOf(interface.name);
+        found = channels_
+                    .emplace(interface.name,
+                             std::make_unique<Channel>(options_, interface.name, *groups_[group], group,
+                                                       variantOf(interface.variant, options_.variant)))
+                    .first;
+    }
+    last_ = found->second.get();
+    if (interface.variant != capture::Variant::unknown)
+        last_->variant = variantOf(interface.variant, options_.variant);
+    return *last_;
+}
+
+const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
+    Channel& channel = channelOf(*frame.interface);
+    const std::int64_t at = channel.clock.at(frame);
+    if (channel.clock.hasRestarted()) {
+        channel.links.restarted();
+        channel.group.table().boardRestarted();
+    }
+    const Marks& marks = channel.links.take(frame, number, at);
+    const isdn::Layer2& layer2 = channel.links.layer2();
+    if (layer2.sapi != isdn::callControlSapi || layer2.header.size() < 3)
+        return marks;
+    channel.keepers[layer2.tei].take(layer2, frame.transmitted ? Side::us : Side::peer, number, at, marks,
+                                     channel.links.events());
+    if (marks.linkUp)
+        channel.group.table().linkUp(layer2.tei);
+    else if (marks.linkDown)
+        channel.group.table().linkDown(layer2.tei, at);
+    for (const KeptFrame& late : channel.links.late()) {
+        capture::Frame kept = late.frame;
+        kept.octets = late.octets;
+        kept.interface = frame.interface;  // its reader may be gone
+        kept.place.file = frame.place.file;
+        const isdn::Layer2 keptLayer2 = isdn::parseLayer2(kept.octets);
+        if (keptLayer2.carriesMessage())
+            channel.accept(channel.messageOf(kept, late.number, at, keptLayer2), options_.timers);
+    }
+    if (layer2.carriesMessage() && marks.accepted.value_or(false))
+        channel.accept(channel.messageOf(frame, number, at, layer2), options_.timers);
+    return marks;
+}
+
+void Analysis::mayMiss(const capture::Interface& interface, std::string_view reason) {
+    channelOf(interface).links.mayMiss(reason);
+}
+
+void Analysis::mayLack(const capture::Interface& interface, Side side) {
+    channelOf(interface).links.mayLack(side);
+}
+
+void Analysis::restarted(const capture::Interface& interface) {
+    Channel& channel = channelOf(interface);
+    channel.links.restarted();
+    channel.group.table().boardRestarted();
+}
+
+void Analysis::advance(std::int64_t nanoseconds) {
+    for (const auto& [name, channel] : channels_) {
+        channel->clock.advance(nanoseconds);
+        channel->group.advance(channel->clock.now());
+    }
+}
+
+void Analysis::finish() {
+    for (const auto& [name, channel] : channels_)
+        channel->links.finish();
+    for (const auto& group : groups_)
+        group->table().finish();
+}
+
+std::vector<const Call*> Analysis::open() const {
+    std::vector<const Call*> calls;
+    for (const auto& group : groups_) {
+        const std::vector<const Call*> some = group->table().open();
+        calls.insert(calls.end(), some.begin(), some.end());
+    }
+    std::sort(calls.begin(), calls.end(), [](const Call* a, const Call* b) { return a->number < b->number; });
+    return calls;
+}
+
+std::uint64_t Analysis::dropped() const {
+    std::uint64_t sum = 0;
+    for (const auto& group : groups_)
+        sum += group->table().dropped();
+    return sum;
+}
+
+const DChannel* Analysis::dChannel(std::string_view name) const {
+    const auto found = channels_.find(name);
+    return found == channels_.end() ? nullptr : &found->second->links;
+}
+
+}  // namespace calls

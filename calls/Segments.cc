@@ -1,0 +1,57 @@
+#include "calls/Segments.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "isdn/values.h"
+
+namespace calls {
+
+Segments::Taken Segments::take(Message& message) {
+    const isdn::Layer3& layer3 = message.layer3;
+    if (layer3.discriminator != isdn::callControl || !layer3.hasType || layer3.type != isdn::message::segment)
+        return Taken::no;
+    const auto header = isdn::segmentHeader(layer3.elements.find(isdn::element::segmentedMessage));
+    const Key key{layer3.callReference.value, message.from(), layer3.callReference.flag};
+    const auto known = pieces_.find(key);
+    if (!header || header->remaining >= mostSegments)
+        return Taken::outOfOrder;
+    if (header->first) {
+        if (known == pieces_.end() && pieces_.size() >= mostMessages)
+            return Taken::outOfOrder;
+        Pieces pieces;
+        pieces.type = header->messageType;
+        // The header of the whole message is that of its segments, but for the type.
+        pieces.octets.assign(layer3.header.begin(), layer3.header.end());
+        pieces.octets.back() = header->messageType;
+        pieces.remaining = header->remaining + 1U;
+        pieces_[key] = std::move(pieces);
+    } else if (known == pieces_.end() || known->second.type != header->messageType ||
+               known->second.remaining != header->remaining + 1U) {
+        pieces_.erase(key);
+        return Taken::outOfOrder;
+    }
+    Pieces& pieces = pieces_.at(key);
+    pieces.octets.insert(pieces.octets.end(), layer3.raw.begin(), layer3.raw.end());
+    pieces.remaining = header->remaining;
+    pieces.frame = message.number;
+    pieces.at = message.at;
+    if (pieces.remaining != 0)
+        return Taken::kept;
+    whole_ = std::move(pieces.octets);
+    pieces_.erase(key);
+    message.layer3 = isdn::parseLayer3(whole_);
+    return Taken::complete;
+}
+
+std::uint64_t Segments::unfinished(std::int64_t at, std::int64_t limit) {
+    const auto late = std::find_if(pieces_.begin(), pieces_.end(),
+                                   [&](const auto& each) { return at - each.second.at > limit; });
+    if (late == pieces_.end())
+        return 0;
+    const std::uint64_t frame = late->second.frame;
+    pieces_.erase(late);
+    return frame;
+}
+
+}  // namespace calls

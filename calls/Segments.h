@@ -1,0 +1,53 @@
+// Puts the messages together that a side has sent in segments (Q.931 annex H).
+#ifndef CALLS_SEGMENTS_H
+#define CALLS_SEGMENTS_H
+
+#include <compare>
+#include <cstdint>
+#include <map>
+#include <vector>
+
+#include "calls/Message.h"
+
+namespace calls {
+
+// Of one link and both sides. Memory is bounded: a few messages at a time, of eight segments each.
+class Segments {
+  public:
+    enum class Taken : std::uint8_t {
+        no,         // the message is no segment
+        kept,       // more segments are to come
+        complete,   // `message.layer3` is the whole message now, valid until the next call
+        outOfOrder  // a segment without its beginning, or one that does not follow: dropped
+    };
+    Taken take(Message& message);
+
+    // The frame of a message whose next segment has not come for `limit` nanoseconds, and which is forgotten
+    // now; 0 if there is none. To be asked until it says 0.
+    std::uint64_t unfinished(std::int64_t at, std::int64_t limit);
+
+  private:
+    static constexpr std::size_t mostMessages = 64;
+    static constexpr unsigned mostSegments = 8;  // Q.931 H.2
+
+    struct Key {
+        std::uint64_t reference;
+        Side from;
+        bool flag;
+        auto operator<=>(const Key&) const = default;
+    };
+    struct Pieces {
+        std::vector<std::uint8_t> octets;  // of the message as it was before it was cut
+        std::uint8_t type = 0;
+        unsigned remaining = 0;
+        std::uint64_t frame = 0;
+        std::int64_t at = 0;
+    };
+
+    std::map<Key, Pieces> pieces_;
+    std::vector<std::uint8_t> whole_;
+};
+
+}  // namespace calls
+
+#endif
