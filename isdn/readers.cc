@@ -4,6 +4,7 @@
 #include <string>
 
 #include "isdn/facility.h"
+#include "isdn/tables/numbers.h"
 #include "isdn/values.h"
 
 namespace isdn {
@@ -68,14 +69,14 @@ constexpr Row rejectionRows[] = {
     {"6", toEnd(bits(8, 1)), "element", nameOfElement, optional & byElement},
 };
 
-constexpr Name completions[] = {{1, "call completion possible"}, {2, "call completion not possible"}};
+constexpr Name completions[] = {{1, "possible"}, {2, "not possible"}};
 constexpr Row completionRows[] = {{"5", bits(7, 1), "call completion", completions}};
 
 constexpr Row elementRows[] = {{"5", toEnd(bits(8, 1)), "element", nameOfElement, optional}};
 constexpr Row messageRows[] = {{"5", bits(8, 1), "message", callControlMessageName}};
 constexpr Row transitNetworkRows[] = {
-    {"5", bits(7, 5), "type of network identification"},
-    {"", bits(4, 1), "network identification plan"},
+    {"5", bits(7, 5), "type of network identification", tables::networkTypes},
+    {"", bits(4, 1), "network identification plan", tables::networkPlans},
     {"6", rest(readCharacters), "network", {}, optional},
 };
 
@@ -128,6 +129,7 @@ constexpr Row displayTypeRows[] = {
     personal({"4", rest(readCharacters), "display", {}, optional}),
 };
 
+constexpr std::uint8_t callAppearance = 0x94;  // of the tags: no characters, and nobody's name
 constexpr Row displayKindRows[] = {{"3", bits(7, 1), "kind of display"}};
 
 // The fields of a display, as North American switches send them to their terminals.
@@ -272,9 +274,10 @@ Problem readDisplayFields(const Contents& contents, Fields& fields) {
         if (size != 0) {
             Field text = fieldAt(contents, at + 2, size, fields);
             text.name = tag.meaning.empty() ? contents.name : tag.meaning;
-            text.kind = Field::Kind::text;
-            text.meaning = asCharacters(text.at);
-            text.personal = true;
+            text.personal = octets[at] != callAppearance;
+            text.kind = text.personal ? Field::Kind::text : Field::Kind::raw;
+            if (text.personal)
+                text.meaning = asCharacters(text.at);
             fields.add(text);
         }
         at += 2 + size;

@@ -87,7 +87,7 @@ std::optional<std::uint8_t> restartClass(const Element& element);
 struct ChangeStatus {
     std::uint8_t status = 0;
     bool channel =
-        false;  // the preference bit: it is about a channel, else about a D channel or an interface
+        false;  // the preference bit: the status is a channel's
 };
 
 std::optional<ChangeStatus> changeStatus(const Element& element);

@@ -1,5 +1,6 @@
 #include "isdn/words.h"
 
+#include <algorithm>
 #include <array>
 #include <charconv>
 
@@ -46,43 +47,50 @@ struct Context {
 
 using Wording = void (*)(std::string&, const Element&, const Context&);
 
-// "64k unrestricted", "6x64k unrestricted", "packet, unrestricted".
-void addDigital(std::string& line, const Element& element, std::string_view what) {
-    constexpr std::uint8_t packetMode = 2;
-    struct Rate {
-        std::uint8_t code;
-        std::string_view text;
-    };
-    constexpr Rate rates[] = {
-        {0x10, "64k "}, {0x11, "2x64k "}, {0x13, "384k "}, {0x15, "1536k "}, {0x17, "1920k "}};
-    constexpr std::uint8_t multirate = 0x18;
-    const Octets contents = element.contents;
-    if (contents.size() > 1 && bitsOf(contents[1], 7, 6) == packetMode) {
-        line.append("packet, ").append(what);
-        return;
-    }
-    const std::uint8_t rate = contents.size() > 1 ? contents[1] & 0x1FU : 0;
-    for (const Rate& row : rates) {
-        if (row.code == rate)
-            line.append(row.text);
-    }
-    if (rate == multirate && contents.size() > 2) {
-        add(line, contents[2] & 0x7FU);
-        line.append("x64k ");
-    }
-    line.append(what);
+// What follows a group of octets, of which all but the last have bit 8 clear.
+Octets behindGroup(Octets octets) {
+    const auto last = std::ranges::find_if(octets, [](std::uint8_t octet) { return (octet & 0x80U) != 0; });
+    return last == octets.end() ? Octets()
+                                : octets.subspan(static_cast<std::size_t>(last - octets.begin()) + 1);
 }
 
-// Octet 5, the layer 1 protocol, if it is there.
-std::optional<std::uint8_t> layer1Of(Octets contents) {
-    std::size_t at = 1;
-    while (at < contents.size() && (contents[at] & 0x80U) == 0)
-        ++at;
-    const bool multirate = contents.size() > 1 && (contents[1] & 0x1FU) == 0x18;
-    at += multirate ? 2 : 1;
-    if (at >= contents.size() || bitsOf(contents[at], 7, 6) != 1)
-        return std::nullopt;
-    return bitsOf(contents[at], 5, 1);
+// Octets 4 and following of a bearer, and what they say.
+struct Transfer {
+    explicit Transfer(Octets contents) : octet4(behindGroup(contents)) {
+        if (octet4.empty())
+            return;
+        packet = bitsOf(octet4[0], 7, 6) == 2;
+        rate = bitsOf(octet4[0], 5, 1);
+        Octets rest = behindGroup(octet4);
+        if (rate == multirate && !rest.empty()) {
+            multiplier = bitsOf(rest[0], 7, 1);
+            rest = rest.subspan(1);
+        }
+        if (!rest.empty() && bitsOf(rest[0], 7, 6) == 1)
+            layer1 = bitsOf(rest[0], 5, 1);
+    }
+
+    static constexpr std::uint8_t multirate = 0x18;
+    Octets octet4;
+    bool packet = false;
+    std::uint8_t rate = 0;
+    std::uint8_t multiplier = 0;
+    std::optional<std::uint8_t> layer1;  // its protocol
+};
+
+// "64k unrestricted", "6x64k unrestricted", "packet, unrestricted".
+void addDigital(std::string& line, const Transfer& transfer, std::string_view what) {
+    constexpr Name rates[] = {
+        {0x10, "64k "}, {0x11, "2x64k "}, {0x13, "384k "}, {0x15, "1536k "}, {0x17, "1920k "}};
+    if (transfer.packet) {
+        line.append("packet, ");
+    } else if (transfer.multiplier != 0) {
+        add(line, transfer.multiplier);
+        line.append("x64k ");
+    } else {
+        line.append(Names(rates)(transfer.rate));
+    }
+    line.append(what);
 }
 
 void addTransfer(std::string& line, const Element& element) {
@@ -96,16 +104,16 @@ void addTransfer(std::string& line, const Element& element) {
         return;
     }
     const std::uint8_t capability = octet3 & 0x1FU;
+    const Transfer transfer(element.contents);
     if (capability == unrestricted)
-        addDigital(line, element, "unrestricted");
+        addDigital(line, transfer, "unrestricted");
     else if (capability == restricted)
-        addDigital(line, element, "restricted");
+        addDigital(line, transfer, "restricted");
     else
         addName(line, tables::transferCapabilities, capability);
-    const auto layer1 = layer1Of(element.contents);
-    if (layer1 && capability != speech) {
+    if (transfer.layer1 && capability != speech) {
         line.append(", ");
-        addName(line, tables::layer1Protocols, *layer1);
+        addName(line, tables::layer1Protocols, *transfer.layer1);
     }
 }
 
@@ -296,7 +304,7 @@ void statusWords(std::string& line, const Element& element, const Context&) {
     const auto found = changeStatus(element);
     if (!found)
         return;
-    line.append(found->channel ? "channel " : "interface ");
+    line.append(found->channel ? "channel " : "");
     addName(line, tables::serviceStates, found->status);
 }
 

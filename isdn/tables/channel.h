@@ -21,6 +21,8 @@ inline constexpr Name channelTypes[] = {{3, "B channels"}, {6, "H0"}, {8, "H11"}
 inline constexpr When ofBasicInterface = ifSeen("3", 6, 6, {0});
 inline constexpr When ofOtherInterface = ifSeen("3", 6, 6, {1});
 inline constexpr When channelIndicated = ofOtherInterface & ifSeen("3", 2, 1, {1});
+// Some equipment names a channel although it says "any" or "none".
+inline constexpr When channelNamedAllTheSame = optional & ofOtherInterface & ifSeen("3", 2, 1, {0, 2, 3});
 
 inline constexpr Row channelIdRows[] = {
     {"3", bits(7, 7), "interface identifier", identifiersPresent},
@@ -33,8 +35,11 @@ inline constexpr Row channelIdRows[] = {
     {"3.2", bits(7, 6), "coding standard", codingStandards, channelIndicated},
     {"", bits(5, 5), "number or map", numberOrMap},
     {"", bits(4, 1), "channel type", channelTypes},
-    {"3.3", repeated(bits(7, 1)), "channel number", {}, channelIndicated & ifSeen("3.2", 5, 5, {0})},
-    {"3.3", rest(readSlotMap), "slot map", {}, channelIndicated & ifSeen("3.2", 5, 5, {1})},
+    {"3.2", bits(7, 6), "coding standard", codingStandards, channelNamedAllTheSame},
+    {"", bits(5, 5), "number or map", numberOrMap},
+    {"", bits(4, 1), "channel type", channelTypes},
+    {"3.3", repeated(bits(7, 1)), "channel number", {}, ifSeen("3.2", 5, 5, {0})},
+    {"3.3", rest(readSlotMap), "slot map", {}, ifSeen("3.2", 5, 5, {1})},
 };
 
 // As channel identification, but the interface stands in it when bit 7 is clear, and there is no preference.
@@ -58,7 +63,7 @@ inline constexpr Name restartClasses[] = {
 inline constexpr Row restartRows[] = {{"3", bits(3, 1), "class", restartClasses}};
 
 inline constexpr Name serviceStates[] = {{0, "in service"}, {1, "maintenance"}, {2, "out of service"}};
-inline constexpr Name subjects[] = {{0, "interface"}, {1, "channel"}};
+inline constexpr Name subjects[] = {{1, "channel"}};
 inline constexpr Row changeStatusRows[] = {
     {"3", bits(7, 7), "preference", subjects},
     {"", bits(3, 1), "new status", serviceStates},

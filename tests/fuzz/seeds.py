@@ -56,6 +56,19 @@ def frames():
     yield bytes(258)
 
 
+def elements():
+    """Every frame, and the golden elements of isdn as frames: the codeset is shifted to."""
+    yield from frames()
+    for path in sorted((TREE / "tests/isdn/golden").glob("*.golden")):
+        for case in re.split(r"^== ", path.read_text("latin-1"), flags=re.M)[1:]:
+            head = dict(line.split(" ", 1) for line in case.split("\n--\n")[0].split("\n")[1:])
+            if "frame" in head:
+                yield bytes.fromhex(head["frame"])
+            elif "element" in head:
+                shift = bytes([0x98 + int(head.get("codeset", 0))]) if "codeset" in head else b""
+                yield bytes.fromhex("00010000 0802008105") + shift + bytes.fromhex(head["element"])
+
+
 def events():
     for number, (*_, octets) in enumerate(packets(EXAMPLES / "net5.pcap")):
         yield struct.pack("<IIII", 2, number % 2, number, len(octets)) + octets
@@ -175,7 +188,7 @@ def command_lines():
 
 
 SEEDS = {
-    "frame": frames, "event": events, "message": messages, "relay": connections, "capture": captures,
+    "frame": frames, "isdn": elements, "event": events, "message": messages, "relay": connections, "capture": captures,
     "scenario": scenarios, "handover": handovers, "command_line": command_lines,
 }
 
