@@ -108,7 +108,7 @@ std::optional<ChannelId> channelId(const Element& element) {
             channel.channels.set(selection);
         return channel;
     }
-    if (selection != 1 || rest.empty())
+    if (channel.selection != ChannelId::Selection::indicated || rest.empty())
         return channel;
     channel.slotMap = (rest[0] & 0x10U) != 0;
     channel.channelType = rest[0] & 0x0FU;

@@ -25,7 +25,7 @@ struct ChannelId {
     bool slotMap = false;                    // coded as a map
     std::optional<std::uint32_t> interface;  // the interface identifier, when it is given explicitly
     std::uint8_t channelType = 0x03;         // 3: B channels
-    std::bitset<128> channels;               // numbers as coded; on basic access 1 for B1 and 2 for B2
+    std::bitset<128> channels;               // those indicated, as coded; on basic access 1 is B1 and 2 is B2
 };
 
 std::optional<ChannelId> channelId(const Element& element);
@@ -86,8 +86,7 @@ std::optional<std::uint8_t> restartClass(const Element& element);
 // CHANGE STATUS of SERVICE: 0 in service, 1 maintenance, 2 out of service.
 struct ChangeStatus {
     std::uint8_t status = 0;
-    bool channel =
-        false;  // the preference bit: the status is a channel's
+    bool channel = false;  // the preference bit: the status is a channel's
 };
 
 std::optional<ChangeStatus> changeStatus(const Element& element);

@@ -155,7 +155,8 @@ TEST(Values, AgreeWithTheFieldsOfTheTables) {
                     ASSERT_NE(field, nullptr);
                     ASSERT_EQ(field->value, found->value);
                 }
-                if (const auto found = channelId(element)) {
+                const auto found = channelId(element);
+                if (found && found->selection == ChannelId::Selection::indicated) {
                     for (const Field& field : fields) {
                         if (field.name == "channel number") {
                             ASSERT_TRUE(found->channels[field.value & 0x7F]);
