@@ -44,12 +44,14 @@ constexpr FrameType typeOf(std::uint8_t control) {
     return (control & 2U) == 0 ? supervisory(control) : unnumbered(control);
 }
 
-constexpr auto frameTypes = [] {
+consteval std::array<FrameType, 256> typesByControl() {
     std::array<FrameType, 256> types{};
     for (unsigned control = 0; control < types.size(); ++control)
         types[control] = typeOf(static_cast<std::uint8_t>(control));
     return types;
-}();
+}
+
+constexpr std::array<FrameType, 256> frameTypes = typesByControl();
 
 constexpr unsigned addressOctets = 2;
 

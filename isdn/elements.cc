@@ -5,6 +5,7 @@
 #include "isdn/Table.h"
 #include "isdn/tables/bearer.h"
 #include "isdn/tables/channel.h"
+#include "isdn/tables/compatibility.h"
 #include "isdn/tables/numbers.h"
 #include "isdn/tables/services.h"
 #include "isdn/tables/states.h"
@@ -14,17 +15,18 @@ namespace isdn {
 namespace {
 
 constexpr std::span<const ElementTable> families[] = {
-    tables::bearerTables,  tables::channelTables, tables::numberTables,
-    tables::serviceTables, tables::stateTables,
+    tables::bearerTables, tables::compatibilityTables, tables::channelTables,
+    tables::numberTables, tables::serviceTables,       tables::stateTables,
 };
 
 constexpr std::size_t codesets = 8;
-constexpr std::size_t tablesInAll = [] {
+consteval std::size_t countTables() {
     std::size_t count = 0;
     for (const auto& family : families)
         count += family.size();
     return count;
-}();
+}
+constexpr std::size_t tablesInAll = countTables();
 
 // The tables in one row, sorted into chains of one codeset and identifier; 0 ends a chain, others count
 // from 1.
@@ -34,7 +36,7 @@ struct Index {
     std::array<const ElementTable*, tablesInAll + 1> tables{};
 };
 
-constexpr Index index = [] {
+consteval Index makeIndex() {
     Index made;
     std::uint8_t number = 0;
     for (const auto& family : families) {
@@ -50,7 +52,9 @@ constexpr Index index = [] {
         }
     }
     return made;
-}();
+}
+
+constexpr Index tableIndex = makeIndex();
 
 // Single-octet elements are identified by bits 7 to 5, but for those of type 2, 1010 (Q.931 4.5.1, figure
 // 4-7).
@@ -95,10 +99,11 @@ Problem unknownContents(Octets contents, Fields& fields) {
 const ElementTable* elementTable(std::uint8_t codeset, std::uint8_t id, Variant variant) {
     if ((id & 0xF0U) == tables::shiftTable.id)
         return &tables::shiftTable;
-    const std::uint8_t first = index.first[codeset % codesets][identifierOf(id)];
-    for (std::uint8_t number = first; number != 0; number = index.next[number]) {
-        if (index.tables[number]->variants.has(variant))
-            return index.tables[number];
+    const std::uint8_t first = tableIndex.first[codeset % codesets][identifierOf(id)];
+    for (std::uint8_t number = first; number != 0; number = tableIndex.next[number]) {
+        const ElementTable& table = *tableIndex.tables[number];
+        if (table.variants.has(variant))
+            return &table;
     }
     return nullptr;
 }

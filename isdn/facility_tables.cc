@@ -239,8 +239,9 @@ constexpr std::array<std::string_view, 5> errorProblems{
 
 template <std::size_t n>
 std::string_view at(const std::array<std::string_view, n>& names, std::int64_t number) {
-    return number >= 0 && static_cast<std::uint64_t>(number) < n ? names[static_cast<std::size_t>(number)]
-                                                                 : "";
+    if (number < 0 || static_cast<std::uint64_t>(number) >= n)
+        return {};
+    return names[static_cast<std::size_t>(number)];
 }
 
 const Operation* find(std::span<const Operation> operations, const Code& code) {

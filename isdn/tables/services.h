@@ -4,7 +4,7 @@
 #define ISDN_TABLES_SERVICES_H
 
 #include "isdn/readers.h"
-#include "isdn/tables/bearer.h"
+#include "isdn/tables/compatibility.h"
 #include "isdn/tables/numbers.h"
 
 namespace isdn::tables {
