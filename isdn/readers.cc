@@ -111,16 +111,26 @@ struct DiagnosticRow {
 };
 
 // Q.850 table 1, the column "diagnostics". Those of other causes are raw.
-constexpr DiagnosticRow diagnosticRows[] = {
-    {1, readAs<conditionRows>},   {3, readAs<conditionRows>},      {16, readAs<conditionRows>},
-    {49, readAs<conditionRows>},  {2, readAs<transitNetworkRows>}, {17, readAs<completionRows>},
-    {34, readAs<completionRows>}, {21, readAs<rejectionRows>},     {22, readPersonal},
-    {43, readAs<elementRows>},    {88, readAs<elementRows>},       {96, readAs<elementRows>},
-    {99, readAs<elementRows>},    {100, readAs<elementRows>},      {97, readAs<messageRows>},
-    {98, readAs<messageRows>},    {101, readAs<messageRows>},      {102, readTimer},
-};
-
 // clang-format off
+constexpr DiagnosticRow diagnosticRows[] = {
+    {1, readAs<conditionRows>},
+    {2, readAs<transitNetworkRows>},
+    {3, readAs<conditionRows>},
+    {17, readAs<completionRows>},
+    {21, readAs<rejectionRows>},
+    {22, readPersonal},
+    {34, readAs<completionRows>},
+    {43, readAs<elementRows>},
+    {49, readAs<conditionRows>},
+    {88, readAs<elementRows>},
+    {96, readAs<elementRows>},
+    {97, readAs<messageRows>},
+    {98, readAs<messageRows>},
+    {99, readAs<elementRows>},
+    {100, readAs<elementRows>},
+    {101, readAs<messageRows>},
+    {102, readTimer},
+};
 
 constexpr Name displayTypes[] = {{1, "calling party name"}};
 constexpr Row displayTypeRows[] = {
