@@ -22,7 +22,7 @@ Link& DChannel::linkOf(const isdn::Layer2& frame) {
     std::unique_ptr<Link>& link = byAddress_[placeOf(frame.sapi, frame.tei)];
     if (!link) {
         link = std::make_unique<Link>(timers_);
-        links_.push_back(link.get());
+        links_.emplace_back(frame.tei, link.get());
     }
     return *link;
 }
@@ -37,7 +37,8 @@ const Marks& DChannel::take(const capture::Frame& frame, std::uint64_t number, s
     late_.clear();
     marks_ = {};
     link_ = nullptr;
-    sample_ = {&frame, number, at, isdn::parseLayer2(frame.octets)};
+    frame_ = frame;
+    sample_ = {&frame_, number, at, isdn::parseLayer2(frame.octets)};
     if (sample_.layer2.header.size() < 3) {
         marks_.role = role();
         return marks_;
@@ -49,6 +50,8 @@ const Marks& DChannel::take(const capture::Frame& frame, std::uint64_t number, s
         sample_.assumed = commandBy(frame.role, sample_);
     link_ = &linkOf(sample_.layer2);
     marks_ = link_->take(sample_, events_, late_);
+    for (LinkEvent& event : events_)
+        event.tei = sample_.layer2.tei;
     if (fixed_ != capture::Role::unknown)
         marks_.role = fixed_;
     else if (marks_.role == capture::Role::unknown)
@@ -59,26 +62,30 @@ const Marks& DChannel::take(const capture::Frame& frame, std::uint64_t number, s
 capture::Role DChannel::role() const { return fixed_ != capture::Role::unknown ? fixed_ : shared_.role(); }
 
 void DChannel::mayMiss(std::string_view reason) {
-    for (Link* const link : links_)
+    for (const auto& [tei, link] : links_)
         for (const Side side : {Side::us, Side::peer})
             link->mayMiss(side, reason);
 }
 
 void DChannel::mayLack(Side side) {
-    for (Link* const link : links_)
+    for (const auto& [tei, link] : links_)
         link->mayLack(side);
 }
 
 void DChannel::restarted() {
-    for (Link* const link : links_)
+    for (const auto& [tei, link] : links_)
         link->forget();
 }
 
 void DChannel::finish() {
     events_.clear();
     late_.clear();
-    for (Link* const link : links_)
+    for (const auto& [tei, link] : links_) {
+        const std::size_t before = events_.size();
         link->finish(events_);
+        for (std::size_t i = before; i < events_.size(); ++i)
+            events_[i].tei = tei;
+    }
 }
 
 }  // namespace calls

@@ -6,6 +6,7 @@
 #include <memory>
 #include <span>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include "calls/CommandBits.h"
@@ -38,6 +39,7 @@ class DChannel {
     // No frame follows. What was left open is in events().
     void finish();
 
+    const Sample& sample() const { return sample_; }
     const isdn::Layer2& layer2() const { return sample_.layer2; }
     const Marks& marks() const { return marks_; }
     // The link of the last frame; null before the first one, and for a frame without an address.
@@ -60,8 +62,9 @@ class DChannel {
     capture::Role fixed_;
     CommandBits shared_;  // from all links: for those that have not shown it themselves
     std::vector<std::unique_ptr<Link>> byAddress_;
-    std::vector<Link*> links_;
+    std::vector<std::pair<std::uint8_t, Link*>> links_;  // with their TEIs
     Link* link_ = nullptr;
+    capture::Frame frame_;  // the last one; its octets are the caller's
     Sample sample_{};
     Marks marks_;
     std::vector<LinkEvent> events_;

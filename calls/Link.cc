@@ -87,9 +87,6 @@ void Link::enter(LinkState state, const Sample& sample) {
     heard_ = {};
     if (state == state_)
         return;
-    if (state_ != LinkState::unknown || state != LinkState::up)
-        witness_.lastDown = sample.at;
-    witness_.up = state == LinkState::up;
     state_ = state;
     since_ = sample.at;
     sinceFrame_ = sample.number;
@@ -203,7 +200,6 @@ void Link::mayLack(Side side) {
 void Link::forget() {
     state_ = LinkState::unknown;
     sawSetUp_ = false;
-    witness_ = {};
     settingUp_ = releasing_ = heard_ = {};
     streams_ = {};
     missing_ = {};

@@ -10,7 +10,6 @@
 #include <vector>
 
 #include "calls/CommandBits.h"
-#include "calls/LinkWitness.h"
 #include "calls/Message.h"
 #include "calls/Stream.h"
 #include "calls/Timers.h"
@@ -69,6 +68,7 @@ struct LinkEvent {
     Hole hole{};
     LostBy by = LostBy::unknown;
     std::uint8_t number = 0;
+    std::uint8_t tei = 0;  // of the link; set by DChannel
 };
 
 class Link {
@@ -94,7 +94,6 @@ class Link {
     std::uint64_t sinceFrame() const { return sinceFrame_; }
     // The set-up itself was seen; otherwise the link is up at least since `since`.
     bool sawSetUp() const { return sawSetUp_; }
-    const LinkWitness& witness() const { return witness_; }
     const CommandBits& commands() const { return commands_; }
     const Stream& sentBy(Side side) const { return streams_[indexOf(side)]; }
 
@@ -137,7 +136,6 @@ class Link {
     std::int64_t since_ = 0;
     std::uint64_t sinceFrame_ = 0;
     bool sawSetUp_ = false;
-    LinkWitness witness_;
     std::array<Stream, 2> streams_;
     std::array<bool, 2> settingUp_{}, releasing_{};  // SABME, DISC of a side waits for its answer
     std::array<bool, 2> heard_{};                    // I or S frames of a side since the state was entered

@@ -27,8 +27,6 @@ void Link::supervise(const Sample& sample, std::vector<LinkEvent>& events, std::
     if (stream.isBeyond(sample.layer2.nr) && missing_[indexOf(sender)].reason.empty() && !pending)
         pending = PendingNr{sample.layer2.nr, sample.number, sample.at};
     report(sample, sender, stream.acknowledged(sample, missing_[indexOf(sender)].reason, late), events);
-    if (const std::uint64_t frame = stream.lastAcknowledged())
-        witness_.acknowledged[indexOf(sender)] = frame;
 }
 
 // Both numbers are 0, the octets are new ones, and this does not come of counting.
@@ -98,8 +96,6 @@ void Link::settleNr(const Sample& sample, std::vector<LinkEvent>& events) {
 
 void Link::report(const Sample& sample, Side sender, const Stream::Taken& taken,
                   std::vector<LinkEvent>& events) {
-    if (taken.found)
-        witness_.lastHole[indexOf(sender)] = sample.at;
     if (!taken.by)
         return;
     const Hole& hole = taken.decided ? *taken.decided : *taken.found;

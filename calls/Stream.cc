@@ -27,7 +27,6 @@ void Stream::reset() {
     recovering_ = false;
     known_ = firm_ = true;
     next_ = expected_ = acknowledged_ = 0;
-    frames_ = {};
 }
 
 void Stream::loosen() {
@@ -77,10 +76,8 @@ Stream::Taken Stream::take(const Sample& sample, std::string_view recorded) {
         expected_ = after(ns);
         recovering_ = false;
     }
-    if (!taken.again) {
+    if (!taken.again)
         next_ = after(ns);
-        frames_[ns] = sample.number;
-    }
     return taken;
 }
 

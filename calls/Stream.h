@@ -2,7 +2,6 @@
 #ifndef CALLS_STREAM_H
 #define CALLS_STREAM_H
 
-#include <array>
 #include <cstdint>
 #include <optional>
 #include <string_view>
@@ -92,11 +91,9 @@ class Stream {
     std::optional<Hole> giveUp();
 
     unsigned outstanding() const { return firm_ ? ahead(next_, acknowledged_) : 0; }
+    std::uint8_t acknowledged() const { return acknowledged_; }
     // N(R) that acknowledges what this side has not sent, as far as the trace shows.
     bool isBeyond(std::uint8_t nr) const { return firm_ && isAhead(nr, next_); }
-    // The number of the last frame of this side that the other one has acknowledged; 0 if none is in the
-    // trace.
-    std::uint64_t lastAcknowledged() const { return frames_[(acknowledged_ + 127U) & 0x7FU]; }
     bool isFirm() const { return firm_; }
     std::uint8_t next() const { return next_; }
 
@@ -104,13 +101,12 @@ class Stream {
     void takeAhead(const Sample& sample, std::string_view recorded, Taken& taken);
     void keep(const Sample& sample);
 
-    bool known_ = false;                       // some number was seen
-    bool firm_ = false;                        // the next number is known for sure
-    std::uint8_t next_ = 0;                    // V(S): behind the highest number that was sent
-    std::uint8_t expected_ = 0;                // V(R) of the receiver
-    std::uint8_t acknowledged_ = 0;            // the last N(R) of the receiver
-    bool recovering_ = false;                  // the receiver waits for `expected_` to be sent again
-    std::array<std::uint64_t, 128> frames_{};  // by N(S): the number of the frame that carried it last
+    bool known_ = false;             // some number was seen
+    bool firm_ = false;              // the next number is known for sure
+    std::uint8_t next_ = 0;          // V(S): behind the highest number that was sent
+    std::uint8_t expected_ = 0;      // V(R) of the receiver
+    std::uint8_t acknowledged_ = 0;  // the last N(R) of the receiver
+    bool recovering_ = false;        // the receiver waits for `expected_` to be sent again
     std::optional<Hole> hole_;
     std::vector<KeptFrame> waiting_;  // behind the hole; at most `mostWaiting`
 };

@@ -370,19 +370,6 @@ TEST_F(DChannelTest, ForgetsTheLinksWhenTheRecorderIsStartedAgain) {
     EXPECT_EQ(told("0 > I 9 3\n0.1 < RR 10\n"), "4 user command accepted unknown\n5 user response up\n");
 }
 
-TEST_F(DChannelTest, TellsWhatTheOtherSideHasAcknowledged) {
-    told("0 > SABME\n0.01 < UA\n1 > I 0 0\n1.1 > I 1 0\n1.2 < RR 1\n");
-    const LinkWitness* witness = &channel.find(0, 0)->witness();
-    EXPECT_TRUE(witness->hasArrived(3, Side::us));
-    EXPECT_FALSE(witness->hasArrived(4, Side::us));
-    EXPECT_TRUE(witness->wasUpSince(11 * millisecond));
-    EXPECT_FALSE(witness->wasUpSince(10 * millisecond));
-    told("2 < I 0 1\n2.1 < I 2 1\n");
-    EXPECT_TRUE(witness->isWholeSince(2 * second, Side::us));
-    EXPECT_FALSE(witness->isWholeSince(2 * second, Side::peer));
-    EXPECT_TRUE(witness->isWholeSince(2101 * millisecond, Side::peer));
-}
-
 // Each excerpt on a D channel of its own: what is accepted, and what happens besides.
 std::string toldOf(std::string_view excerpt) {
     DChannel channel;

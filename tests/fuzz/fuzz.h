@@ -37,6 +37,7 @@ class Input {
             return 0;
         return rest_[at_++];
     }
+    bool atEnd() const { return at_ == rest_.size(); }
     Octets rest() const { return {rest_.begin() + static_cast<std::ptrdiff_t>(at_), rest_.end()}; }
     std::string text() const { return {rest_.begin() + static_cast<std::ptrdiff_t>(at_), rest_.end()}; }
 

@@ -1,0 +1,323 @@
+#include "calls/LinkWatch.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "calls/FindingKinds.h"
+
+namespace calls {
+
+using isdn::FrameType;
+
+namespace {
+
+constexpr unsigned repetitions200 = 3;  // N200
+constexpr std::int64_t flapTime = 60 * second;
+constexpr std::size_t flapTimes = 3;
+constexpr std::int64_t notReadyTime = 10 * second;
+constexpr std::int64_t hour = 3600 * second;
+constexpr unsigned idlePeriods = 3;
+// Fewer repetitions than these are an accident, not a line that loses frames.
+constexpr std::uint64_t leastRepeated = 10, leastOccasions = 3;
+
+constexpr std::array bothSides{Side::us, Side::peer};
+
+std::string nameOf(Side side) { return side == Side::us ? "our side" : "the other side"; }
+
+std::string secondsOf(std::int64_t duration) {
+    const std::int64_t tenths = (duration + 50 * millisecond) / (100 * millisecond);
+    return std::to_string(tenths / 10) + "." + std::to_string(tenths % 10) + " s";
+}
+
+bool isSetUp(FrameType type) { return type == FrameType::SABME || type == FrameType::SABM; }
+
+bool isPoll(const Sample& sample) {
+    return sample.layer2.hasNr() && sample.layer2.pf && sample.command.value_or(false);
+}
+
+bool isFinal(const Sample& sample) {
+    return sample.layer2.hasNr() && sample.layer2.pf && sample.command && !*sample.command;
+}
+
+}  // namespace
+
+std::string LinkWatch::linkWords() const { return "TEI " + std::to_string(tei_); }
+
+void LinkWatch::observe(const FindingKind& kind, std::uint64_t frame, std::int64_t at, std::string sentence,
+                        std::optional<Severity> severity) {
+    observations_.push_back(
+        {&kind, severity.value_or(kind.severity), frame, at, linkWords() + ": " + std::move(sentence)});
+}
+
+void LinkWatch::take(const DChannel& channel, const Sample& sample, const Circumstances& around) {
+    const Marks& marks = channel.marks();
+    const std::size_t from = indexOf(sample.from()), to = indexOf(other(sample.from()));
+    demands_[to] = {};
+    silent_[from] = false;
+    for (std::array<Asked, 2>* const asked : {&polls_, &setUps_})
+        (*asked)[to].heard = true;
+    keepAlives(sample, marks);
+    polls(sample);
+    setUps(sample, marks, around);
+    demands(sample, around);
+    if (sample.layer2.hasNr() && channel.link() != nullptr)
+        windows(sample, *channel.link(), around);
+    if (sample.layer2.type == FrameType::I)
+        repetitions(sample, marks);
+    up_ = marks.state == LinkState::up;
+    keepAliveReported_ = false;
+    lastFrame_ = sample.number;
+    lastAt_ = sample.at;
+    schedule(around);
+}
+
+// A poll ends with F; SABME, DISC and DM end the wait for it.
+void LinkWatch::polls(const Sample& sample) {
+    if (isSetUp(sample.layer2.type) || sample.layer2.type == FrameType::DISC ||
+        sample.layer2.type == FrameType::DM) {
+        polls_ = {};
+        return;
+    }
+    if (isPoll(sample)) {
+        polls_[indexOf(sample.from())].add(sample);
+    } else if (isFinal(sample)) {
+        Asked& asked = polls_[indexOf(other(sample.from()))];
+        if (asked.count > 1 && !asked.reported)
+            observe(findings::pollUnanswered, asked.frame, asked.first,
+                    std::to_string(asked.count - 1) + " of " + nameOf(other(sample.from())) +
+                        "'s polls got no answer before one was answered",
+                    Severity::note);
+        asked = {};
+    }
+}
+
+void LinkWatch::setUps(const Sample& sample, const Marks& marks, const Circumstances& around) {
+    const Side from = sample.from();
+    if (isSetUp(sample.layer2.type)) {
+        setUps_[indexOf(from)].add(sample);
+    } else if (sample.layer2.type == FrameType::UA || sample.layer2.type == FrameType::DM) {
+        setUps_[indexOf(other(from))] = {};
+    } else if (sample.layer2.hasNr() && marks.state == LinkState::up) {
+        setUps_ = {};
+    }
+    if (sample.layer2.type == FrameType::DISC)
+        released_ = true;
+    if (sample.layer2.type == FrameType::DM)
+        lost_ = up_ && !released_;
+    flaps(sample, marks, around);
+}
+
+// A basic access sets its links up as needed; a standby D channel carries nothing that could be lost.
+void LinkWatch::flaps(const Sample& sample, const Marks& marks, const Circumstances& around) {
+    const bool mayFlap =
+        around.access != Access::basic && !around.outOfService && (sentInformation_ || !around.grouped);
+    if (isSetUp(sample.layer2.type) && up_ && mayFlap)
+        observe(findings::linkFlap, sample.number, sample.at,
+                nameOf(sample.from()) + " set the link up again while it was up");
+    if (!marks.linkUp)
+        return;
+    const bool again = std::exchange(lost_, false) && !released_;
+    released_ = false;
+    if (!again)
+        return;
+    setUpTimes_.push_back(sample.at);
+    if (setUpTimes_.size() > flapTimes)
+        setUpTimes_.erase(setUpTimes_.begin());
+    if (mayFlap && setUpTimes_.size() == flapTimes && sample.at - setUpTimes_.front() <= flapTime)
+        observe(findings::linkFlap, sample.number, sample.at,
+                "set up again " + std::to_string(flapTimes) + " times within " +
+                    secondsOf(sample.at - setUpTimes_.front()));
+}
+
+// What is on its way when the window is full waits for the receiver, who may say that it is not ready.
+void LinkWatch::windows(const Sample& sample, const Link& link, const Circumstances& around) {
+    const FrameType type = sample.layer2.type;
+    Since& notReady = notReady_[indexOf(sample.from())];
+    if (type == FrameType::RNR)
+        notReady.begin(sample);
+    else if (type == FrameType::RR || type == FrameType::REJ)
+        notReady = {};
+    sentInformation_ = sentInformation_ || type == FrameType::I;
+    for (const Side sender : bothSides) {
+        const unsigned outstanding = link.sentBy(sender).outstanding();
+        unsigned& window = window_[indexOf(sender)];
+        window = std::max(window, outstanding);
+        const unsigned least = around.access == Access::basic ? 1 : 7;
+        Since& full = full_[indexOf(sender)];
+        std::uint8_t& acknowledged = acknowledged_[indexOf(sender)];
+        if (std::exchange(acknowledged, link.sentBy(sender).acknowledged()) != acknowledged)
+            full = {};
+        if (outstanding < std::max(window, least))
+            full = {};
+        else
+            full.begin(sample);
+    }
+}
+
+// I frames and polls demand an answer, whichever it is. A burst of them is one demand.
+void LinkWatch::demands(const Sample& sample, const Circumstances& around) {
+    if (tei_ == isdn::groupTei || (sample.layer2.type != FrameType::I && !isPoll(sample)))
+        return;
+    Asked& asked = demands_[indexOf(sample.from())];
+    if (asked.count > 0 && sample.at - asked.last < around.timers->t200 * 9 / 10)
+        return;
+    asked.add(sample);
+}
+
+// Learns how often a side polls while nothing else happens.
+void LinkWatch::keepAlives(const Sample& sample, const Marks& marks) {
+    const bool keepsAlive = sample.layer2.type == FrameType::RR && sample.layer2.pf && !marks.pollUnanswered;
+    if (!keepsAlive) {
+        for (Idle& idle : idle_)
+            idle.busy = true;
+        return;
+    }
+    if (!isPoll(sample))
+        return;
+    Idle& idle = idle_[indexOf(sample.from())];
+    if (idle.last && !idle.busy) {
+        const std::int64_t period = sample.at - *idle.last;
+        const bool same = std::abs(period - idle.period) <= idle.period / 4;
+        if (same)
+            ++idle.seen;
+        else if (period > idle.period)
+            idle.seen = 1;
+        idle.period = std::max(idle.period, period);
+    }
+    idle.last = sample.at;
+    idle.busy = false;
+}
+
+void LinkWatch::repetitions(const Sample& sample, const Marks& marks) {
+    Repeated& repeated = repeated_[indexOf(sample.from())];
+    if (repeated.sent > 0 && sample.at - repeated.since >= hour)
+        endHour(repeated, sample.from());
+    if (repeated.sent++ == 0)
+        repeated.since = sample.at;
+    if (marks.retransmitted) {
+        ++repeated.again;
+        if (!repeated.running)
+            ++repeated.occasions;
+        repeated.lastAgain = sample.number;
+        repeated.lastAgainAt = sample.at;
+    }
+    repeated.running = marks.retransmitted;
+}
+
+void LinkWatch::endHour(Repeated& repeated, Side side) {
+    if (repeated.again * 100 > repeated.sent && repeated.again >= leastRepeated &&
+        repeated.occasions >= leastOccasions)
+        observe(findings::retransmissions, repeated.lastAgain, repeated.lastAgainAt,
+                std::to_string(repeated.again) + " of " + std::to_string(repeated.sent) + " I frames of " +
+                    nameOf(side) + " were sent again within an hour");
+    repeated = {};
+}
+
+bool LinkWatch::mayMissKeepAlives(const Circumstances& around) const {
+    return up_ && around.access != Access::basic && !keepAliveReported_ && lastFrame_ != 0;
+}
+
+void LinkWatch::schedule(const Circumstances& around) {
+    due_ = never;
+    const std::int64_t wait = around.timers->t200 + around.timers->slack;
+    const auto by = [&](bool waits, std::int64_t at) {
+        if (waits)
+            due_ = std::min(due_, at);
+    };
+    for (const std::size_t side : {std::size_t{0}, std::size_t{1}}) {
+        for (const Asked* const asked : {&polls_[side], &setUps_[side], &demands_[side]})
+            by(asked->count > repetitions200 && !asked->reported, asked->last + wait);
+        by(full_[side].holds && !full_[side].reported, full_[side].at + wait);
+        by(notReady_[side].holds && !notReady_[side].reported, notReady_[side].at + notReadyTime);
+        by(idle_[side].seen >= 2 && mayMissKeepAlives(around), lastAt_ + idlePeriods * idle_[side].period);
+    }
+}
+
+void LinkWatch::expire(std::int64_t at, const Circumstances& around) {
+    for (const Side side : bothSides) {
+        expireDemands(side, at, around);
+        expireSetUps(side, at, around);
+        expireWindows(side, at, around);
+        expireKeepAlives(side, at, around);
+    }
+    schedule(around);
+}
+
+bool LinkWatch::ranOut(const Asked& asked, std::int64_t at, const Circumstances& around) {
+    return asked.count > repetitions200 && !asked.reported &&
+           at > asked.last + around.timers->t200 + around.timers->slack;
+}
+
+void LinkWatch::expireDemands(Side side, std::int64_t at, const Circumstances& around) {
+    Asked& demand = demands_[indexOf(side)];
+    if (around.bothHeard && ranOut(demand, at, around)) {
+        demand.reported = silent_[indexOf(other(side))] = true;
+        observe(findings::oneDirectionSilent, demand.frame, demand.first,
+                nameOf(other(side)) + " sent nothing for " + secondsOf(at - demand.first) + ", although " +
+                    nameOf(side) + " demanded an answer " + std::to_string(demand.count) + " times");
+    }
+    Asked& poll = polls_[indexOf(side)];
+    if (around.bothHeard && ranOut(poll, at, around)) {
+        poll.reported = true;
+        if (poll.heard)
+            observe(findings::pollUnanswered, poll.frame, poll.first,
+                    std::to_string(poll.count) + " polls of " + nameOf(side) + " got no answer");
+    }
+}
+
+// After a direction fell silent, SABMEs without an answer are what follows from it.
+void LinkWatch::expireSetUps(Side side, std::int64_t at, const Circumstances& around) {
+    Asked& setUp = setUps_[indexOf(side)];
+    if (!ranOut(setUp, at, around))
+        return;
+    setUp.reported = true;
+    if (!silent_[indexOf(other(side))])
+        observe(findings::sabmeUnanswered, setUp.frame, setUp.first,
+                nameOf(side) + " sent SABME " + std::to_string(setUp.count) + " times without an answer");
+}
+
+void LinkWatch::expireWindows(Side side, std::int64_t at, const Circumstances& around) {
+    Since& full = full_[indexOf(side)];
+    if (full.holds && !full.reported && at > full.at + around.timers->t200 + around.timers->slack) {
+        full.reported = true;
+        if (around.bothHeard && up_ && !notReady_[indexOf(other(side))].holds)
+            observe(findings::windowStalled, full.frame, full.at,
+                    std::to_string(window_[indexOf(side)]) + " frames of " + nameOf(side) +
+                        " wait for an acknowledgement longer than " + secondsOf(around.timers->t200));
+    }
+    Since& notReady = notReady_[indexOf(side)];
+    if (notReady.holds && !notReady.reported && at > notReady.at + notReadyTime) {
+        notReady.reported = true;
+        observe(findings::receiverNotReady, notReady.frame, notReady.at,
+                nameOf(side) + " has been not ready to receive for more than " + secondsOf(notReadyTime));
+    }
+}
+
+void LinkWatch::expireKeepAlives(Side side, std::int64_t at, const Circumstances& around) {
+    const Idle& idle = idle_[indexOf(side)];
+    if (idle.seen < 2 || !mayMissKeepAlives(around) || at <= lastAt_ + idlePeriods * idle.period)
+        return;
+    keepAliveReported_ = true;
+    observe(findings::keepAliveMissing, lastFrame_, lastAt_,
+            nameOf(side) + " polled every " + secondsOf(idle.period) + ", and then nothing was sent for " +
+                secondsOf(at - lastAt_));
+}
+
+void LinkWatch::forget() {
+    polls_ = setUps_ = demands_ = {};
+    full_ = notReady_ = {};
+    for (Idle& idle : idle_)
+        idle = {.last = std::nullopt, .busy = true, .period = idle.period, .seen = idle.seen};
+    setUpTimes_.clear();
+    silent_ = {};
+    released_ = lost_ = up_ = false;
+    lastFrame_ = 0;
+    due_ = never;
+}
+
+void LinkWatch::finish() {
+    for (const Side side : bothSides)
+        endHour(repeated_[indexOf(side)], side);
+}
+
+}  // namespace calls

@@ -1,0 +1,34 @@
+#include "calls/RepeatedFindings.h"
+
+#include <utility>
+
+namespace calls {
+
+namespace {
+
+constexpr std::int64_t quiet = 600 * second;
+
+}  // namespace
+
+void RepeatedFindings::report(Finding finding, std::uint8_t tei, std::int64_t at) {
+    const auto [place, isFirst] = repeats_.try_emplace({finding.kind, finding.severity, tei}, Repeats{at});
+    Repeats& repeats = place->second;
+    if (!isFirst && at - repeats.reported < quiet) {
+        finding.count = repeats.last ? repeats.last->count + 1 : 1;
+        repeats.last = std::move(finding);
+        return;
+    }
+    if (std::optional<Finding> last = std::exchange(repeats.last, std::nullopt))
+        sink_->report(std::move(*last));
+    repeats.reported = at;
+    sink_->report(std::move(finding));
+}
+
+void RepeatedFindings::finish() {
+    for (auto& [key, repeats] : repeats_)
+        if (repeats.last)
+            sink_->report(std::move(*repeats.last));
+    repeats_.clear();
+}
+
+}  // namespace calls

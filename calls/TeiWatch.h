@@ -1,0 +1,40 @@
+// What the management of TEIs shows: TEIs that were denied, removed, doubled or assigned (Q.921 5.3).
+#ifndef CALLS_TEIWATCH_H
+#define CALLS_TEIWATCH_H
+
+#include <array>
+#include <cstdint>
+#include <optional>
+#include <vector>
+
+#include "calls/LinkWatch.h"
+#include "calls/Stream.h"
+
+namespace calls {
+
+class TeiWatch {
+  public:
+    // Takes a UI frame of management and appends what it shows. `longest` (T201) is how far apart the answers
+    // to one check may be.
+    void take(const Sample& sample, std::int64_t longest, std::vector<Observation>& found);
+    // The D channel is one of a primary rate: TEIs need not be assigned there. Gives the first that was.
+    std::optional<Observation> isPrimary();
+
+  private:
+    struct Answer {  // to a check
+        std::int64_t at = 0;
+        std::uint16_t reference = 0;
+        bool there = false;
+    };
+
+    void answers(const Sample& sample, const isdn::TeiMessage& message, std::int64_t longest,
+                 std::vector<Observation>& found);
+
+    std::array<Answer, 128> answers_{};  // by TEI
+    std::optional<Observation> assigned_;
+    bool assignedReported_ = false;
+};
+
+}  // namespace calls
+
+#endif
