@@ -157,6 +157,13 @@ constexpr struct {
 };
 // clang-format on
 
+isdn::Sender senderOf(const Seen& seen) {
+    if (seen.role == capture::Role::unknown)
+        return isdn::Sender::unknown;
+    const bool sentByNetwork = seen.frame().transmitted == (seen.role == capture::Role::network);
+    return sentByNetwork ? isdn::Sender::network : isdn::Sender::user;
+}
+
 }  // namespace
 
 std::span<const Column> columns() { return table; }
@@ -205,7 +212,7 @@ void appendMessageName(std::string& to, const Seen& seen) {
 void appendDetails(std::string& to, const Seen& seen) {
     std::string words;
     if (seen.hasMessage)
-        isdn::appendWords(words, seen.message, seen.variant);
+        isdn::appendWords(words, seen.message, seen.variant, senderOf(seen));
     else if (seen.link.carriesTeiMessage())
         isdn::appendWords(words, isdn::parseTeiMessage(seen.link.information));
     else if (seen.link.type == isdn::FrameType::FRMR)
