@@ -8,6 +8,7 @@
 #include "calls/CallTable.h"
 #include "calls/ChannelClock.h"
 #include "calls/FindingSink.h"
+#include "calls/LinkFindings.h"
 #include "calls/Segments.h"
 #include "calls/Waits.h"
 #include "calls/WitnessKeeper.h"
@@ -34,6 +35,13 @@ isdn::Variant variantOf(capture::Variant variant, isdn::Variant otherwise) {
             break;
     }
     return otherwise;
+}
+
+bool isGrouped(const Options& options, const std::string& name) {
+    return std::any_of(options.groups.begin(), options.groups.end(),
+                       [&](const std::vector<std::string>& group) {
+                           return std::find(group.begin(), group.end(), name) != group.end();
+                       });
 }
 
 }  // namespace
@@ -98,6 +106,9 @@ struct Analysis::Channel {
             isdn::Variant ofTrunk)
         : name(itsName),
           links(options.timers, options.role),
+          linkFindings(
+              {.dChannel = itsName, .timers = options.timers, .grouped = isGrouped(options, itsName)},
+              itsGroup),
           group(itsGroup),
           groupNumber(number),
           variant(ofTrunk) {}
@@ -114,6 +125,12 @@ struct Analysis::Channel {
         message.layer2 = layer2;
         message.layer3 = isdn::parseLayer3(layer2.information);
         return message;
+    }
+    // The recorder, or the board, was started again.
+    void restarted() {
+        links.restarted();
+        linkFindings.restarted();
+        group.table().boardRestarted();
     }
     // A frame that the receiver's layer 2 hands up.
     void accept(Message message, const Timers& timers) {
@@ -146,6 +163,7 @@ struct Analysis::Channel {
 
     std::string name;
     DChannel links;
+    LinkFindings linkFindings;
     ChannelClock clock;
     Group& group;
     std::uint32_t groupNumber;
@@ -193,11 +211,10 @@ Analysis::Channel& Analysis::channelOf(const capture::Interface& interface) {
 const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
     Channel& channel = channelOf(*frame.interface);
     const std::int64_t at = channel.clock.at(frame);
-    if (channel.clock.hasRestarted()) {
-        channel.links.restarted();
-        channel.group.table().boardRestarted();
-    }
+    if (channel.clock.hasRestarted())
+        channel.restarted();
     const Marks& marks = channel.links.take(frame, number, at);
+    channel.linkFindings.take(channel.links);
     const isdn::Layer2& layer2 = channel.links.layer2();
     if (layer2.sapi != isdn::callControlSapi || layer2.header.size() < 3)
         return marks;
@@ -222,29 +239,30 @@ const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
 }
 
 void Analysis::mayMiss(const capture::Interface& interface, std::string_view reason) {
-    channelOf(interface).links.mayMiss(reason);
+    Channel& channel = channelOf(interface);
+    channel.links.mayMiss(reason);
+    channel.linkFindings.lost(std::string(reason));
 }
 
 void Analysis::mayLack(const capture::Interface& interface, Side side) {
     channelOf(interface).links.mayLack(side);
 }
 
-void Analysis::restarted(const capture::Interface& interface) {
-    Channel& channel = channelOf(interface);
-    channel.links.restarted();
-    channel.group.table().boardRestarted();
-}
+void Analysis::restarted(const capture::Interface& interface) { channelOf(interface).restarted(); }
 
 void Analysis::advance(std::int64_t nanoseconds) {
     for (const auto& [name, channel] : channels_) {
         channel->clock.advance(nanoseconds);
         channel->group.advance(channel->clock.now());
+        channel->linkFindings.advance(channel->clock.now());
     }
 }
 
 void Analysis::finish() {
-    for (const auto& [name, channel] : channels_)
+    for (const auto& [name, channel] : channels_) {
         channel->links.finish();
+        channel->linkFindings.finish(channel->links);
+    }
     for (const auto& group : groups_)
         group->table().finish();
 }

@@ -202,22 +202,26 @@ void LinkFindings::observe(Observation observation, std::uint8_t tei) {
     findings_.report(std::move(finding), tei, observation.at);
 }
 
-void LinkFindings::lost(std::uint64_t number, std::int64_t at, const std::string& sentence) {
+void LinkFindings::forgetWhatWaits() {
     hasLost_ = true;
-    lostAt_ = at;
+    lostAt_ = lastAt_;
     for (auto& [address, watch] : watches_)
         watch.forget();
-    observe({&findings::framesLost, findings::framesLost.severity, number, at, sentence}, 0);
 }
 
-void LinkFindings::restarted(std::uint64_t number, std::int64_t at) {
-    hasLost_ = true;
-    lostAt_ = at;
-    for (auto& [address, watch] : watches_)
-        watch.forget();
-    observe({&findings::boardRestarted, findings::boardRestarted.severity, number, at,
-             "the board's clock began anew"},
+void LinkFindings::lost(std::string sentence) {
+    forgetWhatWaits();
+    observe({&findings::framesLost, findings::framesLost.severity, lastFrame_, lastAt_, std::move(sentence)},
             0);
+}
+
+void LinkFindings::restarted() {
+    forgetWhatWaits();
+    // Before the first frame, a start is nothing that was interrupted.
+    if (lastFrame_ != 0)
+        observe({&findings::boardRestarted, findings::boardRestarted.severity, lastFrame_, lastAt_,
+                 "the recorder or the board was started again"},
+                0);
 }
 
 void LinkFindings::finish(const DChannel& channel) {

@@ -38,10 +38,10 @@ class LinkFindings {
     void take(const DChannel& channel);
     // The clock has come to `at` and no frame has.
     void advance(std::int64_t at);
-    // The recorder says, in `sentence`, that frames are missing behind frame `number`.
-    void lost(std::uint64_t number, std::int64_t at, const std::string& sentence);
-    // The board, or the recorder, was started again behind frame `number`.
-    void restarted(std::uint64_t number, std::int64_t at);
+    // The recorder says, in `sentence`, that frames are missing behind the last one.
+    void lost(std::string sentence);
+    // The board, or the recorder, was started again behind the last frame.
+    void restarted();
     // The end of the trace. The channel was told before.
     void finish(const DChannel& channel);
 
@@ -53,6 +53,7 @@ class LinkFindings {
     void event(const LinkEvent& event, const Sample& sample);
     void expire(std::int64_t at);
     void collect(LinkWatch& watch, std::uint8_t tei);
+    void forgetWhatWaits();
     void observe(Observation observation, std::uint8_t tei);
 
     Options options_;

@@ -149,4 +149,23 @@ TEST_F(AnalysisTest, FollowsTheRecordedCallsAndFindsNothingWrongInThem) {
     }
 }
 
+TEST_F(AnalysisTest, FindsWhatIsWrongWithLinks) {
+    const capture::Interface standby{"standby"}, trunk{"trunk"};
+    const std::vector<testing::ScriptFrame> refused = testing::script("0 > SABME\n0.01 < DM F\n");
+    Options options;
+    options.groups = {{"standby", "primary"}};
+    Analysis analysis(options, told);
+    analysis.mayMiss(trunk, "Frames Lost");
+    for (const capture::Interface* const interface : {&standby, &trunk}) {
+        for (const testing::ScriptFrame& scripted : refused) {
+            capture::Frame frame = testing::frameOf(scripted);
+            frame.interface = interface;
+            analysis.take(frame, ++number);
+        }
+    }
+    analysis.restarted(trunk);
+    analysis.finish();
+    EXPECT_EQ(told.foundLines, "0 frames-lost\n4 link-refused\n4 board-restarted\n");
+}
+
 }  // namespace calls

@@ -43,12 +43,12 @@ class Trunk {
     }
     Trunk& missing() {
         channel_.mayMiss("Frames Lost");
-        findings_.lost(number_, at_, "Frames Lost: 3");
+        findings_.lost("Frames Lost: 3");
         return *this;
     }
     Trunk& restarted() {
         channel_.restarted();
-        findings_.restarted(number_, at_);
+        findings_.restarted();
         return *this;
     }
     std::string found() {

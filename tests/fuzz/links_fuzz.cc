@@ -28,13 +28,13 @@ class Trunk {
             accept(number_);
         findings_.take(channel_);
     }
-    void restart(std::int64_t at) {
+    void restart() {
         channel_.restarted();
-        findings_.restarted(number_, at);
+        findings_.restarted();
     }
-    void lose(std::int64_t at) {
+    void lose() {
         channel_.mayMiss("Frames Lost");
-        findings_.lost(number_, at, "Frames Lost: 1");
+        findings_.lost("Frames Lost: 1");
     }
     void lack() { channel_.mayLack(calls::Side::peer); }
     void finish() {
@@ -65,9 +65,9 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         const std::uint8_t what = input.octet();
         at += std::int64_t{input.octet()} * input.octet() * calls::millisecond;
         if (what % 32 == 31)
-            trunk.restart(at);
+            trunk.restart();
         else if (what % 32 == 30)
-            trunk.lose(at);
+            trunk.lose();
         else if (what % 32 == 29)
             trunk.lack();
         fuzz::Octets octets(input.octet() % 16);
