@@ -7,6 +7,11 @@
 //     MsgSetParm_t own;                 // its own storage; own.Parm = 10;
 //     MsgSetParm_t bound{parm, val};    // reads into and writes from the caller's two variables
 //
+// Where the first fields of a row decide whether the others are there, the row says how many of its fields
+// the message has:
+//
+//     struct IEPubData { U8<"IEId"> IEId; ...; std::size_t fieldsPresent() const { return ...; } };
+//
 // A family lists its bodies in a BodyTable, which makes them by code and refuses two of one code.
 #ifndef VELA_BODY_H
 #define VELA_BODY_H
@@ -58,23 +63,63 @@ class Body : public MsgBody, public Row {
     unsigned int readMsg(Msg* msg, unsigned int offset) override { return move<Move::Get>(msg, offset); }
 
     unsigned int GetByteSize() const override {
-        return std::apply([](const auto&... field) { return (0U + ... + field.byteSize()); }, fields());
+        unsigned int size = 0;
+        forEachField([&](const auto& field, bool isPresent, unsigned int announced) {
+            if (!isPresent)
+                return;
+            if constexpr (requires { field.byteSize(announced); })
+                size += field.byteSize(announced);
+            else
+                size += field.byteSize();
+        });
+        return size;
     }
 
     // "{", each field's label and value, "}".
     void toStream(std::ostream* out) const override {
         *out << "{";
         const char* separator = "";
-        const auto print = [&](const auto& field) {
+        forEachField([&]<typename FieldType>(const FieldType& field, bool isPresent, unsigned int) {
             *out << std::exchange(separator, " ") << field.label() << " ";
+            if constexpr (requires { FieldType::absent; }) {
+                if (!isPresent) {
+                    *out << FieldType::absent;
+                    return;
+                }
+            }
             field.print(out);
-        };
-        std::apply([&](const auto&... field) { (print(field), ...); }, fields());
+        });
         *out << "}";
     }
 
   private:
     static constexpr std::size_t n = FieldCount<Row>;
+    static constexpr bool hasOptionalFields = requires(const Row& row) { row.fieldsPresent(); };
+
+    // Whether the message has the field. For one that is read: once the fields before it have been read.
+    bool isPresent(std::size_t field) const {
+        if constexpr (hasOptionalFields)
+            return field < Row::fieldsPresent();
+        else
+            return true;
+    }
+
+    // Calls visit(field, whether it is present, what the fields before it announce) for each field, in order.
+    template <typename Visit>
+    void forEachField(Visit visit) const {
+        std::size_t i = 0;
+        unsigned int announced = 0;
+        const auto one = [&](const auto& field) {
+            visit(field, isPresent(i++), announced);
+            note(field, announced);
+        };
+        std::apply([&](const auto&... field) { (one(field), ...); }, fields());
+    }
+    template <typename FieldType>
+    static void note(const FieldType& field, unsigned int& announced) {
+        if constexpr (AnnouncingField<FieldType>)
+            announced = field.value();
+    }
     template <std::size_t i>
     using FieldAt = vela::FieldAt<Row, i>;
 
@@ -107,8 +152,13 @@ class Body : public MsgBody, public Row {
         return mover.offset();
     }
 
-    template <std::size_t i, typename Mover>
-    void moveFrom(Mover& mover, Msg* msg, unsigned int& announced) {
+    template <std::size_t i, Move direction>
+    void moveFrom(FieldMover<direction>& mover, Msg* msg, unsigned int& announced) {
+        if (hasOptionalFields && !isPresent(i)) {
+            if constexpr (direction == Move::Get)
+                emptyListsFrom<i>();
+            return;
+        }
         if constexpr (constexpr std::size_t run = runLength<i>(); run > 0) {
             moveRun<i>(mover, announced, std::make_index_sequence<run>{});
             moveFrom<i + run>(mover, msg, announced);
@@ -121,11 +171,17 @@ class Body : public MsgBody, public Row {
     template <std::size_t start, typename Mover, std::size_t... i>
     void moveRun(Mover& mover, unsigned int& announced, std::index_sequence<i...>) {
         mover.scalars(std::get<start + i>(fields())...);
-        const auto take = [&](auto& field) {
-            if constexpr (CountField<std::remove_reference_t<decltype(field)>>)
-                announced = field.value();
-        };
-        (take(std::get<start + i>(fields())), ...);
+        (note(std::get<start + i>(fields()), announced), ...);
+    }
+
+    // A message without them was read.
+    template <std::size_t i>
+    void emptyListsFrom() {
+        if constexpr (i < n) {
+            if constexpr (requires { FieldAt<i>::isArray; })
+                std::get<i>(fields())->realloc(0);
+            emptyListsFrom<i + 1>();
+        }
     }
 
     template <std::size_t... i>
@@ -137,7 +193,8 @@ class Body : public MsgBody, public Row {
         if constexpr (CountField<FieldAt<i>>) {
             constexpr std::size_t counted = nextArray<i + 1>();
             static_assert(counted < n, "a count needs a list after it");
-            std::get<i>(fields()).count(std::get<counted>(fields()).length());
+            if (isPresent(i))
+                std::get<i>(fields()).count(std::get<counted>(fields()).length());
         }
     }
     template <std::size_t i>

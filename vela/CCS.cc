@@ -7,34 +7,10 @@ namespace vela {
 
 namespace rows {
 
-bool IEPubData_t::isSingleOctet() const {
+std::size_t IEPubData::fieldsPresent() const {
     constexpr std::array<unsigned char, 6> singles{144, 160, 161, 176, 191, 208};
-    return std::find(singles.begin(), singles.end(), IEId.value()) != singles.end();
+    return std::find(singles.begin(), singles.end(), IEId.value()) != singles.end() ? 1 : 3;
 }
-
-template <Move direction>
-unsigned int IEPubData_t::move(Msg* msg, unsigned int offset) {
-    FieldMover<direction> mover(msg->getNvMsgRef(), offset);
-    mover.scalars(IEId);
-    if (!isSingleOctet()) {
-        mover.scalars(Length);
-        Value.transfer(mover, msg, Length);
-    }
-    return mover.offset();
-}
-
-unsigned int IEPubData_t::writeMsg(Msg* msg, unsigned int offset) {
-    Length.count(Value.length());
-    return move<Move::Put>(msg, offset);
-}
-
-unsigned int IEPubData_t::readMsg(Msg* msg, unsigned int offset) {
-    Length = 0;
-    Value->realloc(0);
-    return move<Move::Get>(msg, offset);
-}
-
-unsigned int IEPubData_t::GetByteSize() const { return isSingleOctet() ? 1 : Body::GetByteSize(); }
 
 }  // namespace rows
 

@@ -12,28 +12,13 @@ struct EvtL2Trace {
     U32<"Label"> Label; U32<"Direction"> Direction; U32<"Timestamp"> Timestamp; U32<"Length"> Length;
     RestBytes<"List"> List;
 };
+// One information element: an identifier, and unless that is a single-octet element, a length and a value.
 struct IEPubData {
     U8<"IEId"> IEId; Count8<"Length"> Length; Array<unsigned char, WireType::Unsigned8, "Value"> Value;
+    std::size_t fieldsPresent() const;
 };
-// clang-format on
-
-// One information element: an identifier, and unless that is a single-octet element, a length and a value.
-struct IEPubData_t : Body<NoCode, IEPubData> {
-    using Body::Body;
-
-    bool isSingleOctet() const;
-    unsigned int writeMsg(Msg* msg, unsigned int offset) override;
-    unsigned int readMsg(Msg* msg, unsigned int offset) override;
-    unsigned int GetByteSize() const override;
-
-  private:
-    template <Move direction>
-    unsigned int move(Msg* msg, unsigned int offset);
-};
-
-// clang-format off
 struct ieMessage {
-    using IEPubData_t = rows::IEPubData_t;
+    using IEPubData_t = Body<NoCode, rows::IEPubData>;
     U16<"CallId"> CallId; U16<"CallRef"> CallRef; Count16<"IEPrivBufLen"> IEPrivBufLen;
     U8<"MessageId"> MessageId; Array<unsigned char, WireType::Unsigned8, "IEPrivData"> IEPrivData;
     RestOf<IEPubData_t, "IEPubData"> IEPubData;

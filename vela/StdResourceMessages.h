@@ -21,7 +21,12 @@ struct TypeGroup  { U32<"EvtType"> EvtType; U32<"EvtGroup"> EvtGroup; };
 struct GroupOnly  { U32<"EvtGroup"> EvtGroup; };
 struct GroupAction { U32<"EvtGroup"> EvtGroup; U32<"Action"> Action; };
 
-struct ErrorHead { U32<"ErrorMsg"> ErrorMsg; U32<"ErrorCode"> ErrorCode; };
+// The code of the command that failed, the component's error number, and for the parameter commands the
+// parameter that was refused and its value.
+struct Error {
+    U32<"ErrorMsg"> ErrorMsg; U32<"ErrorCode"> ErrorCode; Nested<Body<NoCode, NumVal>, "Data"> Data;
+    std::size_t fieldsPresent() const;
+};
 
 struct ParmValList {
     using Parms_t = Body<NoCode, ParmVal>;
@@ -70,23 +75,8 @@ struct StdResourceMessages {
     using Data_ErrorMsg_0x2d_t = Data_ErrorMsg_0x8_t;
     using Data_ErrorMsg_0x2f_t = Data_ErrorMsg_0x8_t;
 
-    // The reply to a failed command. Data is there for the parameter commands alone.
-    struct MsgError_t : Body<0, rows::ErrorHead> {
-        Nested<Data_ErrorMsg_0x8_t, "Data"> Data;
-
-        MsgError_t() = default;
-        MsgError_t(unsigned int& errorMsg, unsigned int& errorCode, Data_ErrorMsg_0x8_t& data);
-
-        auto fields() { return std::tuple_cat(Body::fields(), std::tie(Data)); }
-        auto fields() const { return std::tuple_cat(Body::fields(), std::tie(Data)); }
-        bool hasData() const;
-        unsigned int writeMsg(Msg* msg, unsigned int offset) override;
-        unsigned int readMsg(Msg* msg, unsigned int offset) override;
-        unsigned int GetByteSize() const override;
-        void toStream(std::ostream* out) const override;  // "NULL" in place of data that is not there
-    };
-
     // clang-format off
+    struct MsgError_t : Body<0, rows::Error> { using Body::Body; };  // the reply to a failed command
     struct MsgAck_t : Body<1> {};
     struct MsgComtestCmplt_t : Body<3> {};
     struct MsgComtest_t : Command<2, MsgComtestCmplt_t> {};

@@ -3,38 +3,20 @@
 #define VELA_TSCCOMPONENT_H
 
 #include "vela/Component.h"
+#include "vela/described.h"
 
 namespace vela {
 
 namespace rows {
 // clang-format off
-struct ParmFieldDef { U32<"Parm"> Parm; U32<"FieldDef"> FieldDef; };
-// clang-format on
-
-// A parameter whose value is as many elements, of the type, as its FieldDef says, which is a descriptor word.
-// Elements narrower than 32 bits are numbers of 32 bits here.
-struct ParmFieldDefVal_t : Body<NoCode, ParmFieldDef> {
-    Field<staticList<unsigned int>, "Val"> Val;
-
-    ParmFieldDefVal_t() = default;
-    ParmFieldDefVal_t(unsigned int& parm, unsigned int& fieldDef, staticList<unsigned int>& val);
-
-    auto fields() { return std::tuple_cat(Body::fields(), std::tie(Val)); }
-    auto fields() const { return std::tuple_cat(Body::fields(), std::tie(Val)); }
-    // A list that is too short for FieldDef grows, with zeros; one that is too long is not sent whole.
-    unsigned int writeMsg(Msg* msg, unsigned int offset) override;
-    unsigned int readMsg(Msg* msg, unsigned int offset) override;
-    unsigned int GetByteSize() const override;
-    void toStream(std::ostream* out) const override;
-};
-
-// clang-format off
+// A parameter whose value is as many elements, of the type, as its FieldDef says.
+struct ParmFieldDefVal { U32<"Parm"> Parm; Descriptor32<"FieldDef"> FieldDef; Described<"Val"> Val; };
 struct Std_ParmValList {
     using Parms_t = Body<NoCode, ParmVal>;
     Count32<"Count"> Count; ListOf<Parms_t, "Parms"> Parms;
 };
 struct Std_ParmFieldDefValList {
-    using Parms_t = ParmFieldDefVal_t;
+    using Parms_t = Body<NoCode, ParmFieldDefVal>;
     Count32<"Count"> Count; ListOf<Parms_t, "Parms"> Parms;
 };
 struct BChannel { U8<"BChanId"> BChanId; U8<"SlotId"> SlotId; U8<"Direction"> Direction; U8<"Count"> Count; };

@@ -90,6 +90,7 @@ using Value32 = Scalar<unsigned int, WireType::Value32, name>;
 template <typename Number>
 struct CountOf : Number {
     using Number::operator=;
+    static constexpr bool announces = true;
 
     // Throws Exception when there are more than the field can say.
     void count(unsigned int elements) {
@@ -110,6 +111,11 @@ concept ScalarField = requires {
     T::wire;
 }
 &&!requires { T::isArray; };
+// Its value is handed to the field behind it, which depends on it.
+template <typename T>
+concept AnnouncingField = requires {
+    T::announces;
+};
 template <typename T>
 concept CountField = ScalarField<T> && requires(T& field) {
     []<typename N>(CountOf<N>&) {}(field);
@@ -120,6 +126,7 @@ template <typename NestedBody, Label name>
 class Nested : public Field<NestedBody, name> {
   public:
     using Field<NestedBody, name>::operator=;
+    static constexpr const char* absent = "NULL";  // printed where the message has no such field
 
     unsigned int byteSize() const { return this->value().GetByteSize(); }
     void print(std::ostream* out) const { *out << this->value(); }
@@ -211,6 +218,11 @@ class ListOf : public Field<staticList<Element>, name> {
         for (Element& element : this->value())
             mover.nested(msg, element);
     }
+    // What an entry held before does not stay.
+    static void getOne(FieldMover<Move::Get>& mover, Msg* msg, Element& element) {
+        element = Element();
+        mover.nested(msg, element);
+    }
 
   private:
     // No entry is smaller than an empty one: what is left after the last whole entry is not read.
@@ -220,7 +232,7 @@ class ListOf : public Field<staticList<Element>, name> {
         elements.realloc(std::min(announced, mover.rest() / least));
         unsigned int n = 0;
         for (; n < elements.length() && mover.rest() >= least; ++n)
-            mover.nested(msg, elements[n]);
+            this->getOne(mover, msg, elements[n]);
         elements.realloc(n);
     }
 };
@@ -245,7 +257,7 @@ class RestOf : public ListOf<Element, name> {
         this->value().realloc(mover.rest());
         for (Element& element : this->value()) {
             if (mover.rest() > 0)
-                mover.nested(msg, element);
+                this->getOne(mover, msg, element);
             else
                 element = Element();
         }

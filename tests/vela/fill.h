@@ -13,6 +13,8 @@
 
 class Filler {
   public:
+    using Parm = vela::TSCComponent::Std_MsgSetxParms_t::Parms_t;
+
     void fill(unsigned int& value) { value = next_++; }
     void fill(int& value) { value = -static_cast<int>(next_++); }
     void fill(unsigned short& value) { value = static_cast<unsigned short>(next_++); }
@@ -44,7 +46,7 @@ class Filler {
             fill(element);
     }
     // Eight signed octets, then two numbers.
-    void fill(vela::staticList<vela::rows::ParmFieldDefVal_t>& parms) {
+    void fill(vela::staticList<Parm>& parms) {
         parms.realloc(2);
         fill(parms[0], 0x3800, 8, 900);
         fill(parms[1], 0x380800, 2, 0);
@@ -70,8 +72,7 @@ class Filler {
         if constexpr (!vela::CountField<FieldType>)
             fill(field.value());
     }
-    void fill(vela::rows::ParmFieldDefVal_t& parm, unsigned int fieldDef, unsigned int count,
-              unsigned int less) {
+    void fill(Parm& parm, unsigned int fieldDef, unsigned int count, unsigned int less) {
         fill(parm.Parm.value());
         parm.FieldDef = fieldDef;
         parm.Val->realloc(count);

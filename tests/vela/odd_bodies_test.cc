@@ -40,6 +40,24 @@ TEST_F(OddBodyTest, ASingleOctetElementIsOneOctet) {
     }
 }
 
+TEST_F(OddBodyTest, ASingleOctetElementIsWrittenAsItsOctetWhateverElseItHolds) {
+    unsigned char id = 161, length = 77;
+    staticList<unsigned char> value(300);
+    IEPubData element(id, length, value);
+    EXPECT_EQ(encoded(element), Octets{161});
+    EXPECT_EQ(length, 77);
+    EXPECT_EQ(value.length(), 300U);
+}
+
+TEST_F(OddBodyTest, ASingleOctetElementThatIsReadLeavesABoundLengthAlone) {
+    unsigned char id = 8, length = 77;
+    staticList<unsigned char> value{'x'};
+    IEPubData element(id, length, value);
+    EXPECT_EQ(messageOf({161, 2, 'a', 'b'})->read(&element, 0), 1U);
+    EXPECT_EQ(id, 161);
+    EXPECT_EQ(length, 77);
+}
+
 TEST_F(OddBodyTest, AnElementHoldsUpTo255Octets) {
     for (const unsigned int size : {0U, 1U, 254U, 255U}) {
         IEPubData element;
@@ -172,12 +190,30 @@ TEST_F(OddBodyTest, AValueListThatIsTooShortGrowsAndOneThatIsTooLongIsNotSentWho
     EXPECT_EQ(parm.Val->length(), 3U);
 }
 
+TEST_F(OddBodyTest, AValueListGrowsWhenItIsReadAndNeverShrinks) {
+    unsigned int number = 0, fieldDef = 0;
+    staticList<unsigned int> value{11, 12, 13, 14};
+    Parm parm(number, fieldDef, value);
+    EXPECT_EQ(messageOf(words({1001, 0x380800, 1, 2}))->read(&parm, 0), 16U);
+    EXPECT_EQ(value, (staticList<unsigned int>{1, 2, 13, 14}));
+    EXPECT_EQ(messageOf(words({1001, 0x382000, 1, 2, 3, 4, 5}))->read(&parm, 0), 28U);
+    EXPECT_EQ(value, (staticList<unsigned int>{1, 2, 3, 4, 5}));
+}
+
+TEST_F(OddBodyTest, AListOfParametersThatIsReadAgainKeepsNothingOfTheFirstTime) {
+    TSCComponent::Std_MsgGetxParmsCmplt_t list;
+    messageOf(words({1, 1001, 0x380800, 7, 8}))->read(&list, 0);
+    messageOf(words({1, 1002, 0x380000, 9}))->read(&list, 0);
+    EXPECT_EQ(printed(list), "{Count 1 Parms {{Parm 1002 FieldDef 3670016 Val {9}}}}");
+}
+
 TEST_F(OddBodyTest, AValueThatIsCutIs0WhereNothingIsThere) {
     Parm parm;
     messageOf(words({1001, 0x380800, 7}))->read(&parm, 0);
     EXPECT_EQ(printed(parm), "{Parm 1001 FieldDef 3672064 Val {7 0}}");
-    messageOf(words({1001}))->read(&parm, 0);
-    EXPECT_EQ(printed(parm), "{Parm 1001 FieldDef 0 Val {0}}");
+    Parm other;
+    messageOf(words({1001}))->read(&other, 0);
+    EXPECT_EQ(printed(other), "{Parm 1001 FieldDef 0 Val {0}}");
 }
 
 TEST_F(OddBodyTest, AListOfParametersEndsWithThePayload) {

@@ -1,0 +1,72 @@
+// A value whose element type and count stand in a descriptor word before it.
+#ifndef VELA_DESCRIBED_H
+#define VELA_DESCRIBED_H
+
+#include <algorithm>
+
+#include "vela/field.h"
+
+namespace vela {
+
+// The descriptor word: announces to the Described field behind it what that holds.
+template <Label name>
+struct Descriptor32 : U32<name> {
+    using U32<name>::operator=;
+    static constexpr bool announces = true;
+};
+
+// As many elements, of the type, as the descriptor says. Elements narrower than 32 bits are numbers of 32
+// bits here. A list that is shorter than announced grows, with zeros; one that is longer keeps its length,
+// and only the announced elements are sent or read.
+template <Label name>
+class Described : public Field<staticList<unsigned int>, name> {
+  public:
+    using Field<staticList<unsigned int>, name>::operator=;
+
+    unsigned int byteSize(unsigned int descriptorWord) const {
+        return descriptorCount(descriptorWord) * elementSize(descriptorType(descriptorWord));
+    }
+    void print(std::ostream* out) const { *out << this->value(); }
+
+    template <Move move>
+    void transfer(FieldMover<move>& mover, Msg*, unsigned int descriptorWord) {
+        const unsigned int count = descriptorCount(descriptorWord);
+        const WireType type = descriptorType(descriptorWord);
+        grow(count);
+        switch (elementSize(type)) {
+            case 1:
+                return moveAs<unsigned char>(mover, count, type);
+            case 2:
+                return moveAs<unsigned short>(mover, count, type);
+            default:
+                return moveAs<unsigned int>(mover, count, type);
+        }
+    }
+
+  private:
+    void grow(unsigned int count) {
+        staticList<unsigned int>& numbers = this->value();
+        const unsigned int held = numbers.length();
+        if (held >= count)
+            return;
+        numbers.realloc(count);
+        std::fill(numbers.begin() + held, numbers.end(), 0U);  // not what the list held before it shrank
+    }
+
+    // In the width that the elements have on the wire.
+    template <typename Element, Move move>
+    void moveAs(FieldMover<move>& mover, unsigned int count, WireType type) {
+        unsigned int* const numbers = this->value().begin();
+        staticList<Element> elements(count);
+        if constexpr (move == Move::Put)
+            std::transform(numbers, numbers + count, elements.begin(),
+                           [](unsigned int number) { return static_cast<Element>(number); });
+        mover.array(elements.begin(), count, type);
+        if constexpr (move == Move::Get)
+            std::copy(elements.begin(), elements.end(), numbers);
+    }
+};
+
+}  // namespace vela
+
+#endif
