@@ -23,7 +23,8 @@ struct ElementRow {
     ElementDecoder decode;
 };
 
-// The rows, each at the place of its code. Two rows of one code do not compile.
+// Makes a table in which each row is at the index that is its code. Two rows with the same code do not
+// compile.
 template <typename Row, std::size_t N>
 consteval std::array<Row, 256> byCode(const Row (&rows)[N]) {
     std::array<Row, 256> table{};
@@ -40,7 +41,8 @@ consteval std::array<Row, 256> byCode(const Row (&rows)[N]) {
 
 using enum FrameKind;
 
-// Unnumbered frames come with the poll/final bit clear and set. Supervisory ones are known by these octets alone.
+// Each unnumbered frame has two rows, with the poll/final bit clear and set. Supervisory frames are only
+// those with exactly these first octets.
 constexpr FrameName frameRows[] = {
     {0x01, supervisory, "Receive Ready"},
     {0x05, supervisory, "Receive Not Ready"},
@@ -91,7 +93,8 @@ constexpr MessageRow maintenanceRows[] = {
     {0x0F, "SERVICE"},
 };
 
-// One identifier, two elements; on NI2 neither.
+// The identifier 01 is CHANGE STATUS on some trunks and ADVICE OF CHARGE on NTT. On NI2 it is neither:
+// nothing is shown, and the element's length and content are taken as further identifiers.
 void changeStatusOrAdvice(unsigned char id, RingBuffer* rb) {
     if (on(att4ess | ess5 | net5 | dms100))
         changestatus(id, rb);
@@ -99,7 +102,8 @@ void changeStatusOrAdvice(unsigned char id, RingBuffer* rb) {
         AdviceOfCharge(id, rb);
 }
 
-// Only the identifier is consumed: length and contents are taken as further identifiers.
+// Shows nothing and takes only the identifier. The element's length and content are taken as further
+// identifiers.
 void identifierOnly(unsigned char, RingBuffer*) {}
 
 constexpr ElementRow elementRows[] = {

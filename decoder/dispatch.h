@@ -1,4 +1,4 @@
-// The look-ups by code: frame names, message types, element identifiers.
+// The tables of codes: names of frames and messages, and the decoder of each element.
 #ifndef DECODER_DISPATCH_H
 #define DECODER_DISPATCH_H
 
@@ -18,14 +18,16 @@ struct FrameName {
 
 using ElementDecoder = void (*)(unsigned char id, RingBuffer* rb);
 
-// By the first control octet; of kind `none` when it names no supervisory or unnumbered frame.
+// Looks a frame up by its first control octet. The kind is `none` when the octet is no supervisory or
+// unnumbered frame of the table.
 const FrameName& frameName(unsigned char control);
 
-// Empty when the type is not known. Maintenance messages have a table of their own.
+// The name of a message type, empty when it is not known. Messages of the maintenance protocols have a table
+// of their own.
 std::string_view messageName(unsigned char type);
 std::string_view maintenanceMessageName(unsigned char type);
 
-// Null when the identifier is not known.
+// The decoder of an element, by its identifier. Null when the identifier is not known.
 ElementDecoder elementDecoder(unsigned char id);
 
 }  // namespace decoder

@@ -1,4 +1,4 @@
-// The vocabulary of element decoders. With it a decoder reads like the octet table of the standard:
+// The functions of which element decoders are made. A decoder reads like the octet table of the standard:
 //
 //     Element ie(id, rb);
 //     ie.header("PROGRESS INDICATOR");
@@ -8,9 +8,10 @@
 //         .text("      ---0---- Spare")
 //         .bits(4, 1, " Location");
 //
-// A line that only some trunks show names them first: .bits(ntt | net5, 6, 6, " Negotiation").
-// Past the end of the frame the octet taken last is taken again, the length octet for one; a missing length
-// octet is 0.
+// A line that only some trunks show names these first: .bits(ntt | net5, 6, 6, " Negotiation").
+//
+// Past the end of the frame, taking an octet yields the octet of the element that was taken last, which may
+// be its length octet. A length octet that is missing is 0.
 #ifndef DECODER_ELEMENT_H
 #define DECODER_ELEMENT_H
 
@@ -21,16 +22,18 @@
 
 namespace decoder {
 
-// The extension line of an octet: always with "1", with bit 8 as it is, or with "1" when it is set and not at
-// all when it is clear.
+// What the extension line of an octet shows. fixed: always "1". asBit8: the value of bit 8. whenSet: "1" when
+// bit 8 is set, and no line when it is clear.
 enum Extension { fixed, asBit8, whenSet };
 
-// The header line; its indent has been written with the identifier (ie_id).
+// Writes the header line. ie_id has already written its indent.
 template <std::size_t N>
 void header(const char (&name)[N], unsigned char id) {
     text("  1:           ", name, "(0x", hex(id), ")\n");
 }
 
+// One element that is being decoded. "Takes" means: reads the next octet through the cursor. "Counts" means:
+// subtracts 1 from `ielength`, the number of octets that the element still announces.
 class Element {
   public:
     Element(unsigned char id, RingBuffer* rb) : rb_(rb), id_(id) {}
@@ -55,24 +58,26 @@ class Element {
         return take().extension(label, form);
     }
 
-    // Takes and counts only; or takes without counting.
+    // Takes and counts an octet, and shows nothing.
     Element& take() {
         --ielength;
         return takeUncounted();
     }
+    // Takes an octet without counting it.
     Element& takeUncounted() {
         getblockchar(rb_, &octet_);
         return *this;
     }
 
-    // Counts once more and shows the octet taken last under another label.
+    // Counts, takes nothing, and shows the octet taken last under another label.
     template <std::size_t N>
     Element& again(const char (&label)[N], Extension form) {
         --ielength;
         return extension(label, form);
     }
 
-    // Repeats octets of a group up to the one with bit 8 set, or to the end of the frame.
+    // Takes and counts the octets of a group and calls `show` after each. The group ends after the octet with
+    // bit 8 set, or at the end of the frame.
     template <typename Show>
     void group(Show show) {
         while (getblockchar(rb_, &octet_)) {
@@ -83,7 +88,8 @@ class Element {
         }
     }
 
-    // Takes as many octets as are still announced, without counting them; i counts from 0.
+    // Takes all octets that are still announced, without counting them, and calls show(i) after each, with i
+    // from 0.
     template <typename Show>
     void rest(Show show) {
         for (int i = 0; i < ielength; ++i) {
@@ -92,7 +98,7 @@ class Element {
         }
     }
 
-    // Takes as many octets as are still announced and shows them as characters on one line.
+    // Takes all octets that are still announced and shows them as characters on one line, unchanged.
     template <std::size_t N>
     void characters(const char (&label)[N]) {
         output(flag);
@@ -112,7 +118,7 @@ class Element {
         return *this;
     }
 
-    // The bits `high` to `low` at their places, and what they mean.
+    // Shows the bits `high` to `low` at their places, and the label.
     template <std::size_t N>
     Element& bits(int high, int low, const char (&label)[N]) {
         bit_field = value() & maskOf(high, low);
@@ -120,7 +126,7 @@ class Element {
         return *this;
     }
 
-    // The same without a line end: what comes next stands on the same line.
+    // The same without a line end: the next text follows in the same line.
     template <typename Label>
     Element& bitsUnended(int high, int low, const Label& label) {
         bit_field = value() & maskOf(high, low);
@@ -129,14 +135,14 @@ class Element {
         return *this;
     }
 
-    // A line as it stands.
+    // Writes a line that consists of these pieces.
     template <typename... Pieces>
     Element& text(Pieces&&... pieces) {
         line(pieces...);
         return *this;
     }
 
-    // The same lines, on some trunks only.
+    // The same, but only on these trunks.
     template <std::size_t N>
     Element& extension(Trunks trunks, const char (&label)[N], Extension form) {
         return on(trunks) ? extension(label, form) : *this;
@@ -152,16 +158,17 @@ class Element {
 
     // ---- questions
 
-    // Bit 8 of the octet taken last is clear: another octet of its group follows.
+    // Whether bit 8 of the octet taken last is clear, which means that another octet of its group follows.
     bool more() const { return (octet_ & 0x80) == 0; }
 
-    // Not as many octets taken as announced; true as well when more were taken than announced.
+    // Whether `ielength` is not zero. It is also true when more octets were counted than announced. Use it
+    // for an optional octet.
     bool left() const { return ielength != 0; }
 
-    // For loops over the octets left: nothing is left below zero either.
+    // Whether octets are left to take. Use it for loops, which must also end below zero.
     bool anyLeft() const { return ielength > 0; }
 
-    // The octet taken last, whole or the bits `high` to `low` of it shifted down.
+    // The octet taken last; or its bits `high` to `low`, shifted down.
     int value() const { return octet_; }
     int value(int high, int low) const { return (octet_ & maskOf(high, low)) >> (low - 1); }
 

@@ -1,8 +1,8 @@
 // The decoders of the information elements (Q.931, 4.5, and the switches' own elements).
 //
-// Each is handed the identifier, already taken, takes from the cursor what it knows of the element and writes
-// it line by line. What it leaves behind becomes the next identifiers. No decoder names the value of a field,
-// but for the carrier services of network_specific_fac.
+// Each gets the identifier, which has been taken already. It takes the octets of the element that it knows
+// from the cursor and writes them line by line. Octets that it does not take become the next identifiers.
+// Only network_specific_fac names values of a field (carrier services); all others show bits.
 #ifndef DECODER_ELEMENTS_H
 #define DECODER_ELEMENTS_H
 
@@ -20,7 +20,7 @@ void channel_identification(unsigned char id, RingBuffer* rb);
 void BlockChanId(unsigned char id, RingBuffer* rb);
 void changestatus(unsigned char id, RingBuffer* rb);
 void restart_indicator(unsigned char id, RingBuffer* rb);
-void call_appearance_ie(unsigned char id, RingBuffer* rb);  // no identifier reaches it
+void call_appearance_ie(unsigned char id, RingBuffer* rb);  // no identifier leads to it
 
 // elements_indication.cc
 void fun_cause(unsigned char id, RingBuffer* rb);
@@ -51,7 +51,7 @@ void display(unsigned char id, RingBuffer* rb);
 void datetime(unsigned char id, RingBuffer* rb);
 void useruser(unsigned char id, RingBuffer* rb);
 void user_to_user_facility(unsigned char id, RingBuffer* rb);
-void service_profile_id(unsigned char id, RingBuffer* rb);  // no identifier reaches these three
+void service_profile_id(unsigned char id, RingBuffer* rb);  // no identifier leads to these three
 void end_pointID(unsigned char id, RingBuffer* rb);
 void service_indicator(unsigned char id, RingBuffer* rb);
 

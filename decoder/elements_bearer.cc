@@ -6,12 +6,12 @@ namespace decoder {
 
 namespace {
 
-// What a layer octet describes, by its bits 7 and 6.
+// The values of bits 7 and 6 of a layer octet: the layer that the octet describes.
 constexpr int layer1 = 1;
 constexpr int layer2 = 2;
 constexpr int layer3 = 3;
 
-// Octet 5, taken already. Returns the layer-1 protocol.
+// Shows octet 5, which has been taken already, and returns the layer-1 protocol.
 int layer1Octet5(Element& ie) {
     ie.extension("  5:  ", asBit8).text("      -01----- Layer 1 Indent").bits(5, 1, " User Info. Layer 1");
     return ie.value(5, 1);
@@ -64,7 +64,8 @@ void bearerLayer1(Element& ie) {
 
 }  // namespace
 
-// On the trunks of the short form octets 3 and 4 are all. One layer octet is shown, whatever follows it.
+// Trunks of the short form show only octets 3 and 4. On the others one layer octet is shown; a second one is
+// not taken.
 void bearer_capability(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     ie.header("BEARER CAPABILITY");
@@ -120,7 +121,7 @@ void lowLayerOctet5b(Element& ie, int protocol) {
             .bits(2, 2, " Flow-Control on Rx")
             .text("      -------0 Spare");
     else if (protocol == 8)
-        ie.octet(" 5d:  ", fixed)  // not 5b
+        ie.octet(" 5d:  ", fixed)  // the label is 5d on purpose, although the octet is 5b
             .bits(7, 7, " Header/No Header")
             .bits(6, 6, " Multiple Frame Supp.")
             .bits(5, 5, " Mode of Operation")
@@ -130,7 +131,7 @@ void lowLayerOctet5b(Element& ie, int protocol) {
             .text("      -------0 Spare");
 }
 
-// 5c shows the octet before it once more.
+// The fields of 5c are shown from the octet before it, without taking another.
 void lowLayer1(Element& ie) {
     const int protocol = layer1Octet5(ie);
     if (!ie.more())
@@ -152,7 +153,7 @@ void lowLayer1(Element& ie) {
 
 }  // namespace
 
-// The octets of layers 2 and 3 stand after the one that tells them, and are numbered 5.
+// For layers 2 and 3 the octet after the layer octet is shown, under the label 5, on purpose.
 void low_layer_compat(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     ie.header("LOW LAYER COMP.");

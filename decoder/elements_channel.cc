@@ -12,7 +12,7 @@ void interfaceIdentifier(Element& ie) {
 
 }  // namespace
 
-// On the trunks of the short form octet 3 is all.
+// Trunks of the short form show only octet 3.
 void channel_identification(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     ie.header("CHANNEL ID");
@@ -37,7 +37,7 @@ void channel_identification(unsigned char id, RingBuffer* rb) {
         ie.octet("  4:  ", asBit8).bits(7, 1, " Channel Number/Slot Map");
 }
 
-// Interface identifiers stand here when bit 7 of octet 3 is clear.
+// Unlike in channel_identification, interface identifiers follow when bit 7 of octet 3 is clear.
 void BlockChanId(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     ie.header("BLOCKING CHANNEL ID");

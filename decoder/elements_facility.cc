@@ -19,7 +19,8 @@ void facility(unsigned char id, RingBuffer* rb) {
 
 namespace {
 
-// Shows one octet more than n, the announced length, and returns n less the two octets of 3.1 and 3.2.
+// n is the announced length of the network identification. Shows n + 1 octets, one too many on purpose, and
+// returns n less 2, the octets 3.1 and 3.2.
 int networkIdentification(Element& ie, int n) {
     ie.octet("3.1:  ", fixed).bits(7, 5, " Type Of Network ID").bits(4, 1, " Network ID Plan");
     ie.take().text("3.2:  0------- Spare");
@@ -32,7 +33,7 @@ int networkIdentification(Element& ie, int n) {
     return n;
 }
 
-// With its line end; empty when the service has no name.
+// The name of a carrier service with its line end; empty when the service has no name.
 std::string_view serviceName(int service) {
     switch (service) {
         case 1:
@@ -52,7 +53,7 @@ std::string_view serviceName(int service) {
     }
 }
 
-// After a service without a name the next output goes on in the same line.
+// A service without a name has no line end either: the next text follows in the same line.
 void facilityAtt4ess(Element& ie) {
     ie.take()
         .bits(8, 8, " Parameterized/Binary")
@@ -88,7 +89,7 @@ void facilityByCount(Element& ie, int n) {
 
 }  // namespace
 
-// On the trunks of the short form octet 3 is all.
+// Trunks of the short form show only octet 3, the length of the network identification.
 void network_specific_fac(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     ie.header("NETWORK SPEC. FAC.");
@@ -117,7 +118,8 @@ void display(unsigned char id, RingBuffer* rb) {
     ie.characters("  Display Information");
 }
 
-// Year, month, day, hour and minute are plain numbers and written as characters, deliberately.
+// Year, month, day, hour and minute are plain numbers. They are written as characters all the same, on
+// purpose.
 void datetime(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     ie.header("DATE/TIME");
@@ -134,7 +136,7 @@ void useruser(unsigned char id, RingBuffer* rb) {
     ie.rest([&](int) { ie.text("          0x", hex(ie.value()), " User Information"); });
 }
 
-// Octet 3 is not counted, so that one octet more than the element holds is taken.
+// Octet 3 is not counted, so the loop takes one octet more than the element holds, on purpose.
 void user_to_user_facility(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     ie.header("USER-TO-USER FAC.");
@@ -143,7 +145,7 @@ void user_to_user_facility(unsigned char id, RingBuffer* rb) {
     ie.rest([&](int i) { ie.text("  ", dec(i + 5), ":      0x", hex(ie.value()), " Diagnostic"); });
 }
 
-// Every octet is labelled 3.
+// Every octet has the label 3, on purpose.
 void service_profile_id(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     ie.header("SERVICE_PROFILE_ID");
@@ -162,7 +164,7 @@ void end_pointID(unsigned char id, RingBuffer* rb) {
         ie.octet("  4:  ", fixed).bits(7, 6, " Interpreter").bits(5, 1, " Terminal ID");
 }
 
-// Writes nothing and takes nothing, not even the length octet.
+// Writes nothing and takes no octet, not even the length octet.
 void service_indicator(unsigned char, RingBuffer*) {}
 
 }  // namespace decoder

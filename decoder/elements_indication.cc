@@ -4,8 +4,8 @@
 
 namespace decoder {
 
-// Octet 3 prints nothing on the trunks of the short form, and octet 4 no field, deliberately. Octet 3a is
-// known on two trunks; on the others it is shown as octet 4.
+// On trunks of the short form octet 3 shows nothing and octet 4 only its extension line, on purpose. Only NTT
+// and NET5 have an octet 3a; on other trunks it is shown as octet 4.
 void fun_cause(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     ie.header("CAUSE");

@@ -1,6 +1,6 @@
 // Party numbers and subaddresses (Q.931, 4.5.8 to 4.5.11 and 4.5.29; redirections of Q.952).
 //
-// The labels differ in capitals and wording from element to element.
+// The labels differ in capitals and wording from element to element, on purpose.
 #include "decoder/element.h"
 #include "decoder/elements.h"
 
@@ -8,14 +8,14 @@ namespace decoder {
 
 namespace {
 
-// The octet taken last: 3a, or what is shown as 3.1.
+// Shows the octet taken last as presentation and screening: octet 3a, or the octet that is labelled 3.1.
 void presentation(Element& ie) {
     ie.bits(7, 6, " Presentation Indicator").text("      ---000-- Spare").bits(2, 1, " Screening Indicator");
 }
 
 }  // namespace
 
-// On the trunks of the short form there is no header line, and octet 3a is shown as a digit.
+// Trunks of the short form have no header line here, and show octet 3a as the first digit.
 void calling_party_num(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     if (on(inFull))
@@ -41,7 +41,7 @@ void calling_party_subaddress(unsigned char id, RingBuffer* rb) {
     ie.rest([&](int) { ie.text(att4ess | ntt, "          0x", hex(ie.value()), " Subaddress Info."); });
 }
 
-// An octet 3a is shown as the first digit.
+// No octet 3a is known here: it is shown as the first digit.
 void called_party_num(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     ie.header("CALLED PARTY NUM");
@@ -61,7 +61,7 @@ void called_party_subaddress(unsigned char id, RingBuffer* rb) {
     ie.rest([&](int) { ie.text("          0x", hex(ie.value()), " Subaddress Info."); });
 }
 
-// On DMS100 the 3.1 fields are shown from octet 3 itself.
+// On DMS100 the fields labelled 3.1 are shown from octet 3, without taking another octet, on purpose.
 void connected_number(unsigned char id, RingBuffer* rb) {
     Element ie(id, rb);
     ie.header("CONNECTED NUMBER");

@@ -1,4 +1,4 @@
-// The decoder's entry: a frame in, text out.
+// The entry to the decoder: it turns a frame into text.
 #ifndef DECODER_FRAME_H
 #define DECODER_FRAME_H
 

@@ -7,8 +7,8 @@ namespace decoder {
 
 namespace {
 
-// The management entity's fields (Q.921, 5.3.1). The second octet of the reference number has no leading
-// zero.
+// The fields of a TEI-management message (Q.921, 5.3.1). The second octet of the reference number is written
+// without a leading zero, on purpose.
 void managementLines(RingBuffer* rb) {
     unsigned char octet = 0;
     getblockchar(rb, &octet);
@@ -28,7 +28,8 @@ void managementLines(RingBuffer* rb) {
 
 }  // namespace
 
-// One variable holds the octet read last: a frame that ends early is classified by its last octet.
+// `octet` keeps the octet that was read last. So a frame that ends before its control field is classified by
+// its last octet.
 void layer_2(RingBuffer* rb) {
     unsigned char octet = 0;
     if (!getblockchar(rb, &octet))
@@ -53,7 +54,8 @@ void layer_2(RingBuffer* rb) {
     text("0x", hex(octet), "  Information\n");
 }
 
-// Its first octet of its own is the one after the control octet: 0 when the frame ends there.
+// `octet` is a variable of its own, so a supervisory frame that ends after its first control octet shows 0 as
+// the second.
 void con_fld_com_rep(RingBuffer* rb, unsigned char control) {
     const FrameName& frame = frameName(control);
     unsigned char octet = 0;

@@ -6,14 +6,15 @@
 
 namespace decoder {
 
-// Of the frame decoded last; a TEI-management frame leaves both 0.
+// SAPI and TEI of the frame that this thread decoded last; both are 0 after a TEI-management frame.
 inline constinit thread_local int sapi = 0;
 inline constinit thread_local int tei = 0;
 
-// Decodes both fields. What it leaves in the cursor is a layer-3 message.
+// Decodes both fields. The octets that it leaves in the cursor are decoded as a layer-3 message.
 void layer_2(RingBuffer* rb);
 
-// Names a supervisory or unnumbered frame by its first control octet, and takes what belongs to it.
+// Writes the name of a supervisory or unnumbered frame. `control` is its first control octet, which has been
+// taken already; takes the second one of a supervisory frame, and the fields of a TEI-management frame.
 void con_fld_com_rep(RingBuffer* rb, unsigned char control);
 
 }  // namespace decoder

@@ -25,8 +25,9 @@ void layer_3(RingBuffer* rb) {
     }
 }
 
-// The one-octet form has no blank before CR. Any other length, the dummy call reference among them, writes
-// nothing: the message type then goes on in the same line.
+// The one-octet form has no blank before CR, on purpose. For any other length than 1 or 2, for example the
+// dummy call reference, nothing is written and no value is taken; the message type then follows in the same
+// line.
 void call_reference(RingBuffer* rb) {
     unsigned char value = 0;
     getblockchar(rb, &value);
@@ -61,7 +62,8 @@ void message_type(RingBuffer* rb) {
 
 namespace {
 
-// An identifier of 0x80 or above is a single-octet element. The empty line at the end has no indent.
+// An identifier of 0x80 or above is an element of one octet. The empty line at the end has no indent, on
+// purpose.
 void unknownElement(unsigned char id, RingBuffer* rb) {
     text("  *Unknown IE: 0x", hex(id), "\n");
     if (id >= 0x80)
@@ -98,7 +100,7 @@ void codeset6(unsigned char id) {
     Lock_shift = 1;
 }
 
-// The elements that follow are still decoded as codeset 0.
+// Sets no state: the elements that follow are still decoded as codeset 0.
 void codeset7(unsigned char id) {
     if (on(att4ess))
         header("CODESET 7", id);
@@ -134,7 +136,7 @@ void moredata(unsigned char id) { header("MORE DATA", id); }
 
 void sending_complete(unsigned char id) { header("SENDING COMPLETE", id); }
 
-// The level's bits are not decoded.
+// The bits of the level are not shown.
 void congestion_level(unsigned char id) { header("CONGESTION LEVEL", id); }
 
 }  // namespace decoder

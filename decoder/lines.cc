@@ -8,16 +8,16 @@ namespace decoder {
 
 namespace {
 
-// A frame of calls makes about 2 kB of text, the longest possible one some hundred.
+// An ordinary frame makes about 2 kB of text, the longest possible one some hundred kB.
 constexpr std::size_t firstCapacity = 65536;
 
-// Below one: none.
+// Writes no dash when the count is below 1.
 void dashes(long long count) {
     for (; count > 0; --count)
         text('-');
 }
 
-// What the thread's lineBuffer points into.
+// Owns the memory of this thread's lineBuffer.
 thread_local std::unique_ptr<char[]> memory;
 
 }  // namespace
@@ -39,7 +39,7 @@ void flushLines() {
     lineBuffer.clear();
 }
 
-// A write that fails leaves its mark on the stream, for whoever owns it.
+// A write that fails sets the stream's error indicator. The owner of the stream looks at it.
 void writeToStream(std::string_view composed) { (void)std::fwrite(composed.data(), 1, composed.size(), ofp); }
 
 void writeToStandardOutput(std::string_view line) { std::cout << line << std::endl; }

@@ -1,12 +1,12 @@
-// Where decoded text is composed. It goes to the log alone and never to the screen: pieces are put together
-// in memory, and flushLines hands them to the log in one piece.
+// Composes the decoded text. Pieces are put together in memory, and flushLines hands them to the log in one
+// piece. The text never goes to the screen.
 //
-// Text is made of literals, octets and numbers; nothing is parsed while the program runs:
+// Text is made of literals, octets and numbers. There are no format strings to read while the program runs:
 //
 //     text("TEI=0x", hex(tei), "\n");        line("  3:     0x", hex(octet), "  Signal Value");
 //
-// Each thread composes text of its own. Only one at a time hands it to the log, which is the caller's
-// business.
+// Each thread composes text of its own. Callers must see to it that only one thread at a time calls
+// flushLines.
 #ifndef DECODER_LINES_H
 #define DECODER_LINES_H
 
@@ -24,11 +24,12 @@
 
 namespace decoder {
 
-// The text that a thread has composed and that is not yet in the log. It grows as needed and keeps what it
-// grew to, until the thread ends.
+// The text that a thread has composed and not yet handed to the log. It grows as needed and keeps its memory
+// until the thread ends.
 class LineBuffer {
   public:
-    // A place where n characters can be written; commit says where writing ended.
+    // Returns a place where n characters can be written. Afterwards call commit with the end of what was
+    // written.
     char* room(std::size_t n) {
         if (static_cast<std::size_t>(end_ - at_) < n)
             grow(n);
@@ -42,8 +43,8 @@ class LineBuffer {
   private:
     [[gnu::cold, gnu::noinline]] void grow(std::size_t n);
 
-    // The thread's memory has an owner of its own (lines.cc): a thread_local object without a destructor is
-    // reached without a check whether it was constructed.
+    // Another thread_local object owns the memory (lines.cc). This one has no destructor, so that the
+    // compiler reaches it without checking whether it has been constructed.
     char* begin_ = nullptr;
     char* at_ = nullptr;
     char* end_ = nullptr;
@@ -51,18 +52,18 @@ class LineBuffer {
 
 inline constinit thread_local LineBuffer lineBuffer;
 
-// Hands the text composed so far to the log; drops it when there is none (file_output, ofp).
+// Hands the text that this thread has composed so far to the log, by writeLog. Drops it when there is no log
+// (file_output is false or ofp is null).
 void flushLines();
 
-// Takes the text of each flushLines. It is written to ofp as it is, unless whoever opened the log has put a
-// function of their own here.
+// Takes the text of each flushLines. By default it writes the text to ofp. Whoever opens the log may set
+// another function.
 using LogWriter = void (*)(std::string_view composed);
 void writeToStream(std::string_view composed);
 inline constinit LogWriter writeLog = writeToStream;
 
-// Takes the one line that the decoder has for the screen, "Oversized frame, frame will not be interpreted",
-// without its line end. It goes to the standard output stream, unless the program has put a function of its
-// own here.
+// Takes the only line that the decoder has for the screen, oversizedFrame, without its line end. By default
+// it writes the line to the standard output stream. A program may set another function.
 using ScreenWriter = void (*)(std::string_view line);
 void writeToStandardOutput(std::string_view line);
 inline constinit ScreenWriter writeScreen = writeToStandardOutput;
@@ -81,7 +82,7 @@ constexpr std::array<Pair, 256> makeHexPairs() {
     return pairs;
 }
 
-// The eight characters of an octet's bit pattern, most significant bit first.
+// An octet as eight characters, most significant bit first: `set` for 1, `clear` for 0.
 constexpr std::uint64_t patternOf(unsigned octet, char set, char clear) {
     std::array<char, 8> shown{};
     for (unsigned bit = 0; bit < 8; ++bit)
@@ -96,7 +97,8 @@ constexpr std::array<std::uint64_t, 256> makeDigits() {
     return patterns;
 }
 
-// By highest and lowest bit: all ones where the field's digits show, zero where a "-" does.
+// fields[high][low] has all bits set in the characters that belong to the field, and none in those that show
+// "-".
 constexpr std::array<std::array<std::uint64_t, 9>, 9> makeFields() {
     std::array<std::array<std::uint64_t, 9>, 9> fields{};
     for (unsigned high = 1; high <= 8; ++high) {
@@ -113,7 +115,8 @@ inline constexpr std::uint64_t dashes = patternOf(0xFF, '-', '-');
 
 }  // namespace tables
 
-// "%02x", "%x" and "%2x" of an octet, "%d" of a number, and "%c".
+// Numbers as printf would write them: an octet with "%02x", "%x" and "%2x", a number with "%d". A char is
+// written as itself.
 struct Hex {
     unsigned char value;
 };
@@ -142,13 +145,14 @@ struct Bits {
     int low;
 };
 
-// How many characters a piece takes at most, and how it is put down; put returns one past its last one.
+// For each kind of piece: sizeOf is the largest number of characters that it takes, and put writes it at `at`
+// and returns the place after its last character.
 template <std::size_t N>
 constexpr std::size_t sizeOf(const char (&)[N]) {
     return N - 1;
 }
 template <std::size_t N>
-std::size_t sizeOf(char (&)[N]) = delete;  // a buffer is no literal: pass it as a string_view
+std::size_t sizeOf(char (&)[N]) = delete;  // a char array that is no literal: pass it as a string_view
 constexpr std::size_t sizeOf(std::string_view words) { return words.size(); }
 constexpr std::size_t sizeOf(Hex) { return 2; }
 constexpr std::size_t sizeOf(HexUnpadded) { return 2; }
@@ -157,7 +161,7 @@ template <std::integral Number>
 constexpr std::size_t sizeOf(Decimal<Number>) {
     return 3 * sizeof(Number) + 1;
 }
-template <std::same_as<char> Character>  // not whatever converts to one
+template <std::same_as<char> Character>  // a char, and no other type that converts to one
 constexpr std::size_t sizeOf(Character) {
     return 1;
 }
@@ -212,7 +216,7 @@ inline char* put(char* at, Bits bits) {
 inline constexpr char indent[] = "                                 ";  // 33 blanks
 inline constexpr std::size_t indentSize = sizeof indent - 1;
 
-// Writes the pieces one after another as they stand: no indent, no line end.
+// Writes the pieces one after another, without indent and line end.
 template <typename... Pieces>
 void text(Pieces&&... pieces) {
     char* at = lineBuffer.room((sizeOf(pieces) + ... + 0));
@@ -231,7 +235,7 @@ void line(Pieces&&... pieces) {
     lineBuffer.commit(at);
 }
 
-// The indent of one line: 33 blanks when f is 0.
+// Writes the indent of a line: 33 blanks when f is 0, nothing otherwise.
 inline void output(int f) {
     if (f == 0)
         text(indent);

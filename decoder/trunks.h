@@ -6,7 +6,7 @@
 
 namespace decoder {
 
-// A set of variants; a variant's place in it is the value that `swit` has on such a trunk.
+// A set of variants. Bit n stands for the variant for which `swit` is n.
 struct Trunks {
     unsigned members;
 };
@@ -20,11 +20,11 @@ inline constexpr Trunks ntt{1U << 4};
 inline constexpr Trunks net5{1U << 7};
 inline constexpr Trunks ni2{1U << 10};
 
-// The trunks whose elements are shown in full. 5ESS and NI2, and a trunk of no known variant, get the short
-// form.
+// The trunks whose elements are shown in full. 5ESS and NI2, and trunks of unknown variants, have the short
+// form: several of their elements are shown only in part.
 inline constexpr Trunks inFull = att4ess | dms100 | ntt | net5;
 
-// Whether the trunk being traced is one of them.
+// Whether the trunk that this thread decodes for is one of them.
 inline bool on(Trunks trunks) { return swit > 0 && swit < 32 && ((trunks.members >> swit) & 1U) != 0; }
 
 }  // namespace decoder
