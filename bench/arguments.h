@@ -1,4 +1,4 @@
-// Numbers on a command line.
+// Reads numbers on a command line.
 #ifndef BENCH_ARGUMENTS_H
 #define BENCH_ARGUMENTS_H
 
@@ -9,7 +9,8 @@
 
 namespace bench {
 
-// The number that is the whole text; none when it is something else or lies outside `least` to `most`.
+// The number that the whole text is. Nothing when the text is not a number or the number is not between
+// `least` and `most`.
 template <typename Number>
 std::optional<Number> numberIn(std::string_view text, Number least, Number most) {
     Number value{};

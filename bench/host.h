@@ -1,4 +1,5 @@
-// A host at its barest: tells the CCS component of board 1 what it wants, and reads what comes.
+// The smallest possible host: sends commands to D channel 1 of board 1 and reads messages, without the object
+// layer.
 #ifndef BENCH_HOST_H
 #define BENCH_HOST_H
 
@@ -24,7 +25,7 @@ class Host {
         hear();
     }
 
-    // From here on there are events; the first is read.
+    // Subscribes, switches the trace on, and reads up to and including the first event.
     void startTrace() {
         tell(DetectEvt, detectBody());
         tell(SetParm, {TraceParm, 0, 0, 0, 1, 0, 0, 0});
@@ -37,7 +38,7 @@ class Host {
         }
     }
 
-    // Reads the next message; whether it is an event.
+    // Waits for the next message and frees it. Returns whether it was an event.
     bool hearEvent() { return hear() == EvtDetected; }
 
   private:
@@ -58,7 +59,8 @@ class Host {
         queue_->msgWrite(msg.getMsgRef());
     }
 
-    // The type of the next message. Ends the process when there is none.
+    // Waits for the next message, frees it and returns its type. Ends the process when the queue cannot be
+    // read.
     unsigned hear() {
         NvMsg32Bit* read = nullptr;
         if (queue_->msgRead(&read) != 0) {

@@ -17,7 +17,8 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// What stands before an element or a message in a frame: an I frame's header, and that of a SETUP.
+// The octets to put before a message or an element to make a frame of it: the header of an information frame,
+// and for an element also that of a SETUP.
 std::vector<std::uint8_t> headersOf(golden::Kind kind) {
     switch (kind) {
         case golden::Kind::frame:

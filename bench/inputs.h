@@ -1,4 +1,4 @@
-// The frames that the benches work on.
+// Reads the frames that the benches decode.
 #ifndef BENCH_INPUTS_H
 #define BENCH_INPUTS_H
 
@@ -8,14 +8,14 @@
 
 namespace bench {
 
-// The value of `swit` for a trunk of the software board's name or number ("net5", "12"). Throws
-// softboard::BadInput for a type that the program would refuse.
+// The value of `swit` for a protocol of the software board, by name or number ("net5", "12"). Throws
+// softboard::BadInput for a protocol that lapdmon refuses.
 int variantOf(const std::string& protocol);
 
-// A capture, a golden file of the decoder, or a folder of them, of which those cases are taken that are meant
-// for the variant; an element or a message alone is put into a frame. Without the frames that are too long to
-// be decoded, of which the program tells the screen. Throws softboard::BadInput, also when nothing is left,
-// or std::runtime_error for a golden file that cannot be read.
+// Reads a capture, a golden file of the decoder, or a folder of golden files. Of golden files it takes the
+// cases for the variant, and puts an element or a message without a frame into one. It leaves out frames that
+// are too long to be decoded. Throws softboard::BadInput, also when no frame is left, and std::runtime_error
+// for a golden file that cannot be read.
 softboard::Frames readInput(const std::string& path, int variant);
 
 }  // namespace bench

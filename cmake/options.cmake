@@ -1,4 +1,4 @@
-# What every target of the tree is built with.
+# Options of the build, and the compiler and linker options of every target.
 include(GNUInstallDirs)
 
 option(LAPDMON_TESTS "Build the tests" ON)
@@ -6,7 +6,7 @@ option(LAPDMON_WERROR "Treat warnings as errors" OFF)
 option(LAPDMON_FUZZ "Build the fuzz targets for libFuzzer (clang), and no other tests" OFF)
 set(LAPDMON_SANITIZE "" CACHE STRING "Comma-separated sanitizers, e.g. address,undefined or thread")
 
-# The transport library stands in a folder of its own, where the loader does not look unless told to.
+# The software board's libnorv.so is in a folder of its own, in which the loader does not look by itself.
 set(LAPDMON_TRANSPORT_DIR lib/lapdmon)
 
 add_library(lapdmon_options INTERFACE)
@@ -15,7 +15,7 @@ target_include_directories(lapdmon_options INTERFACE ${PROJECT_SOURCE_DIR})
 target_compile_options(lapdmon_options INTERFACE
     -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Woverloaded-virtual
     -Wcast-align -Wformat=2 -Wimplicit-fallthrough
-    # The optimiser of g++ 12 sees faults of these kinds in the standard library's own code.
+    # The optimiser of g++ 12 gives these warnings wrongly, for the standard library's own code.
     $<$<CXX_COMPILER_ID:GNU>:-Wno-restrict -Wno-array-bounds -Wno-stringop-overflow -Wno-stringop-overread>)
 if(LAPDMON_WERROR)
     target_compile_options(lapdmon_options INTERFACE -Werror)
@@ -29,7 +29,7 @@ if(LAPDMON_FUZZ)
     target_compile_options(lapdmon_options INTERFACE -fsanitize=fuzzer-no-link)
 endif()
 
-# What makes a fault harder to use against the programs that are installed; tests/build looks for it in them.
+# Hardening: makes it harder to exploit a fault of an installed program. tests/build checks the built files for it.
 include(CheckPIESupported)
 check_pie_supported()
 set(CMAKE_POSITION_INDEPENDENT_CODE ON)
@@ -38,9 +38,10 @@ target_compile_options(lapdmon_options INTERFACE
     "$<${hardened}:-U_FORTIFY_SOURCE;-D_FORTIFY_SOURCE=2;-fstack-protector-strong>")
 target_link_options(lapdmon_options INTERFACE "$<${hardened}:LINKER:-z,relro,-z,now,-z,noexecstack>")
 
-# A program that links the transport library. In the build tree RUNPATH (not RPATH, so that LD_LIBRARY_PATH
-# comes first) leads to the software board's; the installed program has none. CMake's own handling would leave
-# an empty entry in the list, which stands for the current directory.
+# lapdmon_program(TARGET): a program that links the transport library. In the build tree its RUNPATH leads to the
+# software board's library. It is RUNPATH and not RPATH, so that LD_LIBRARY_PATH comes first. The installed program
+# has no RUNPATH. The linker gets the path directly, because CMake's own handling would leave an empty entry, which
+# means the current directory.
 function(lapdmon_program target)
     target_link_libraries(${target} PRIVATE norv)
     target_link_options(${target} PRIVATE

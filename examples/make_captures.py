@@ -2,25 +2,26 @@
 """Makes the captures of this folder from their texts (*.frames), and the software board's built-in capture.
 
     examples/make_captures.py            writes every *.pcap and softboard/builtin_frames.inc
-    examples/make_captures.py --check    says which of them would change, status 1 when any would
+    examples/make_captures.py --check    names the files that would change; status 1 if there are any
 
 A line of a text is
 
     SECONDS DIRECTION WHAT ...           # comment
 
-SECONDS since the capture's start, in steps of 0.004. DIRECTION tx (the user side, where the board is) or rx.
-WHAT is a layer-2 frame, or a layer-3 message with its call reference and elements; the sequence numbers of
-layer 2 are kept here, so that a line can be added anywhere.
+SECONDS counts from the capture's start, in steps of 0.004. DIRECTION is tx (sent by the board, which is the user) or
+rx. WHAT is a layer-2 frame, or a layer-3 message with its call reference and elements. This program fills in the
+sequence numbers of layer 2, so that a line can be added anywhere.
 
     0.000 tx sabme                       sabme, disc (commands), ua, dm (answers)
     0.100 rx rr                          rr: acknowledges; poll: a command that asks; final: its answer
     0.200 tx tei-request 1234 ff         TEI management: reference number and action indicator
     0.300 rx setup 0093 bearer=8890 called=80"4021"
-    0.400 tx hex 02ff0308011405          a whole frame as it stands
+    0.400 tx hex 02ff0308011405          a whole frame in hexadecimal
 
-The call reference is the value's octets, its first bit set by the side that did not begin the call; "-" is the
-dummy reference. An element is NAME=VALUE, VALUE octets in hexadecimal and texts in quotes, or a name alone for one
-of a single octet. An identifier in hexadecimal serves as well as a name. "pd=43" sets the protocol discriminator.
+The call reference is written in hexadecimal. Its top bit is set in the frames of the side that did not begin the
+call; "-" is the dummy reference. An element is NAME=VALUE, where VALUE is octets in hexadecimal and texts in quotes,
+or only a name if the element has one octet. Instead of a name an identifier in hexadecimal may be given. "pd=43" sets
+the protocol discriminator.
 """
 
 import pathlib
@@ -80,7 +81,7 @@ class Link:
         return self.address(direction, command) + bytes([control])
 
     def expected(self, direction):
-        """N(R) of a frame: how many I frames of the other side have arrived."""
+        """N(R) of a frame: the number of information frames that the other side has sent so far."""
         return self.sent["rx" if direction == "tx" else "tx"] % 128
 
     def receive_ready(self, direction, name):

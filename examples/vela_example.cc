@@ -10,7 +10,7 @@
 vela::Semaphore frames(1000, 0);
 
 void onFrame(vela::CCS*, unsigned int, vela::CCS::EvtL2Trace_t* raw) {
-    const std::unique_ptr<vela::CCS::EvtL2Trace_t> record(raw);  // the callback's to delete
+    const std::unique_ptr<vela::CCS::EvtL2Trace_t> record(raw);  // the callback must delete it
     std::cout << (record->Direction == 1 ? "sent " : "received ") << record->List->length() << " octets\n";
     frames.post();
 }

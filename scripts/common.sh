@@ -1,4 +1,4 @@
-# What the scripts share; sourced, not run. Leaves the shell in the tree's root.
+# Functions that the scripts share. Scripts source this file; it changes to the tree's root.
 set -euo pipefail
 cd "$(dirname "${BASH_SOURCE[0]}")/.."
 
@@ -7,7 +7,8 @@ fail() {
     exit 1
 }
 
-# Installs those of the named Debian packages that are not there yet, quietly.
+# install_packages NAME...: installs those of the Debian packages that are missing. Needs to be root, or a sudo that
+# asks for no password; otherwise names the missing packages and ends the script.
 install_packages() {
     local missing=() package
     for package in "$@"; do
@@ -36,7 +37,7 @@ BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libpcap-dev libtomlplusplus-d
 CHECK_PACKAGES=(clang-format clang-tidy cppcheck)
 TEST_PACKAGES=(libgtest-dev libgmock-dev libbenchmark-dev python3)
 
-# Configures and builds one preset; says what it does and shows the compiler's words only when it fails.
+# build_preset PRESET [OPTION...]: configures and builds a preset. Shows the compiler's output only if that fails.
 build_preset() {
     local preset=$1 log
     shift

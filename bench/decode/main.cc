@@ -1,13 +1,14 @@
-// How fast frames become text in a log, by the program's own way from a trace record on: header lines,
-// getBlock, parse_isdn_frame, the log. Beside it, the same text written with plain fwrite: what the
+// Measures how fast trace records become text in a log, with the program's own code: time lines, getBlock,
+// parse_isdn_frame, app::Log. For comparison it writes the same text with fwrite, which is the most that the
 // file can take.
 //
 //     bench-decode [--variant V] CAPTURE REPEAT LOG
 //
-// CAPTURE is a capture file, or the decoder's golden files; V a name as of the software board's --protocol.
-// All ways are gone five times in turn, and the medians shown: fwrite has a round of CAPTURE at a time, and
-// then blocks as large as the log's own. What stays in LOG is what fwrite wrote: the first round of CAPTURE,
-// REPEAT times. A LOG that keeps nothing, like /dev/null, is compared with nothing.
+// CAPTURE is a capture file, a golden file of the decoder, or a folder of golden files. V is a name or number
+// of the software board's --protocol. Each of the three ways runs five times, in turn, and the medians are
+// shown: decoding; fwrite of one round of CAPTURE at a time; fwrite in blocks as large as the log's own. At
+// the end LOG holds what fwrite wrote: the text of the first round of CAPTURE, REPEAT times. If LOG keeps
+// nothing, like /dev/null, there is no comparison.
 #include <algorithm>
 #include <array>
 #include <cerrno>
@@ -78,7 +79,7 @@ std::vector<Record> recordsOf(const softboard::Frames& frames) {
     return records;
 }
 
-// Seconds that `write` takes, the closing of the log included.
+// The seconds that `write` takes. It must also close the log.
 template <typename Write>
 double timed(Write write) {
     const auto start = std::chrono::steady_clock::now();
@@ -104,11 +105,12 @@ double decode(std::vector<Record>& records, const Arguments& arguments) {
         log.close();
     });
     if (!log.complete())
-        std::exit(EXIT_FAILURE);  // the log has said why
+        std::exit(EXIT_FAILURE);  // the log has already reported the reason
     return seconds;
 }
 
-// The first round of the log again and again, in pieces.
+// Writes the text of the first round REPEAT times, in pieces of this size, and returns the seconds that it
+// took.
 double copy(const std::string& round, std::size_t piece, const Arguments& arguments) {
     std::FILE* const log = std::fopen(arguments.log.c_str(), "w");
     if (log == nullptr)
@@ -124,7 +126,8 @@ double copy(const std::string& round, std::size_t piece, const Arguments& argume
     });
 }
 
-// All rounds are of one length: they differ in the time of day alone. Empty when the log keeps nothing.
+// The text of the first round in the log; empty when the log keeps nothing. All rounds have the same length,
+// because they differ only in the time of day.
 std::string firstRound(const Arguments& arguments) {
     if (!std::filesystem::is_regular_file(arguments.log))
         return {};
@@ -143,7 +146,7 @@ double median(Seconds values) {
     return values[passes / 2];
 }
 
-// Of each pass.
+// The seconds of each pass.
 struct Times {
     Seconds decoding{};
     Seconds copying{};

@@ -1,4 +1,5 @@
-// From octets to text, which is composed and dropped. What is counted is the text.
+// Measures how octets become text. The text is composed and dropped; the octets a second that are shown are
+// those of the text.
 #include <benchmark/benchmark.h>
 
 #include <algorithm>
@@ -18,7 +19,7 @@ using Octets = std::vector<unsigned char>;
 
 constexpr int onNet5 = 7;
 
-// Composes with `compose` again and again, each time from nothing.
+// Calls `compose` again and again, each time with an empty buffer.
 template <typename Compose>
 void composing(benchmark::State& state, int flag, Compose compose) {
     decoder::file_output = false;
@@ -41,7 +42,7 @@ RingBuffer cursorOver(const Octets& octets) {
     return cursor;
 }
 
-// The argument is the flag: 0 indents.
+// The benchmark's argument is the decoder's `flag`: 0 indents lines.
 void bitwise(benchmark::State& state) {
     composing(state, static_cast<int>(state.range(0)), [] { decoder::bitwise(0x2A, 6, 2); });
 }
@@ -67,7 +68,7 @@ BENCHMARK_CAPTURE(anElement, cause, Octets{0x08, 0x02, 0x80, 0x90});
 BENCHMARK_CAPTURE(anElement, calledPartyNumber,
                   Octets{0x70, 0x08, 0xA1, 0x35, 0x35, 0x35, 0x31, 0x32, 0x31, 0x32});
 
-// The longest frame of the built-in capture, a SETUP; and one without a message.
+// The longest frame of the built-in capture, which is a SETUP. Below: a frame without a message.
 const Octets& longestFrame() {
     const softboard::Frames& frames = softboard::builtinFrames();
     return std::max_element(frames.begin(), frames.end(),

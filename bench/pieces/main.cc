@@ -1,4 +1,4 @@
-// What single pieces cost: text of a frame, bodies of messages, a request.
+// Measures single pieces with Google Benchmark: the text of a frame, the bodies of messages, a request.
 //
 //     bench-pieces [--benchmark_filter=REGEX] ...
 #include <benchmark/benchmark.h>

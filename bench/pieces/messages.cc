@@ -1,4 +1,5 @@
-// Bodies written into messages and read back, and a request there and back, on the software board.
+// Measures, on the software board, how bodies are written into messages and read back, and how long a request
+// takes until its reply is there.
 #include <benchmark/benchmark.h>
 
 #include <algorithm>
@@ -57,7 +58,7 @@ void aCommandWritten(benchmark::State& state) { writing(state, setParm()); }
 BENCHMARK(aCommandWritten);
 void aCommandRead(benchmark::State& state) { reading(state, setParm()); }
 BENCHMARK(aCommandRead);
-// The argument: octets of the frame.
+// The benchmark's argument is the number of octets in the frame.
 void aTraceRecordWritten(benchmark::State& state) {
     writing(state, recordOf(static_cast<unsigned int>(state.range(0))));
 }

@@ -1,9 +1,9 @@
-// What the road through the relay costs: events a second and the time of an answer, over the queue of this
-// machine and over a relay on loopback, in one run. Run it on the software board:
+// Measures what the relay costs: events a second and the time of a reply, with the queue of this machine and
+// through a relay on loopback, in one run. Run it on the software board:
 //
 //     softboard --rate max --loop -- bench-relay [SECONDS]
 //
-// Here the relay shares the process, and so the processors, with the board and the host.
+// The relay runs in the same process as the board and the host, and shares the processors with them.
 #include <sys/eventfd.h>
 
 #include <algorithm>
@@ -48,7 +48,7 @@ class BackgroundRelay {
 
 struct Figures {
     double eventsPerSecond;
-    double median;  // of an answer, in microseconds
+    double median;  // time of a reply, in microseconds
     double percentile99;
 };
 

@@ -1,4 +1,4 @@
-// Reads a log as it comes and checks it frame by frame against what the board played.
+// Reads a log while it is written and compares it, frame by frame, with what the board played.
 #ifndef BENCH_ROAD_LOG_WATCH_H
 #define BENCH_ROAD_LOG_WATCH_H
 
@@ -11,7 +11,8 @@
 
 namespace bench {
 
-// The frames of a capture that is played again and again, as the log shows them.
+// The frames of a capture that is played again and again, as the log shows them. Frame i is counted through
+// all rounds.
 class Played {
   public:
     explicit Played(const softboard::Frames& frames);
@@ -25,19 +26,20 @@ class Played {
 };
 
 struct Checked {
-    std::uint64_t frames = 0;      // whole in the log
-    std::uint64_t lost = 0;        // played before one that is there, and not there
-    std::uint64_t outOfOrder = 0;  // or not as they were played
-    std::uint64_t refused = 0;     // by the program's queue
+    std::uint64_t frames = 0;      // complete in the log
+    std::uint64_t lost = 0;        // missing, although a frame that was played later is in the log
+    std::uint64_t outOfOrder = 0;  // in the wrong place, or different from what was played
+    std::uint64_t refused = 0;     // lines "Enqueue Failed"
 };
 
 class LogWatch {
   public:
     explicit LogWatch(const Played& played) : played_(played) {}
 
-    // The next piece of the log. Returns how many header lines it ended.
+    // Takes the next piece of the log, which may begin and end anywhere. Returns how many header lines ("RX
+    // Frame ...") have been completed by it.
     std::uint64_t take(std::string_view piece);
-    // No more comes: a frame that was begun is whole.
+    // Call it at the end of the log: the last frame is then complete.
     void end() { endFrame(); }
 
     const Checked& checked() const { return checked_; }
@@ -49,10 +51,10 @@ class LogWatch {
     const Played& played_;
     Checked checked_;
     std::uint64_t headers_ = 0;
-    std::uint64_t next_ = 0;  // of those played
-    std::string rest_;        // a line that was begun
-    std::string header_;      // of the frame that was begun; empty: none was
-    std::string dump_;
+    std::uint64_t next_ = 0;  // the number of the frame that is expected next
+    std::string rest_;        // the beginning of a line that is not complete yet
+    std::string header_;      // the header line of the frame that is being read; empty: no frame
+    std::string dump_;        // the dump of that frame, as far as it has come
     bool inDump_ = false;
 };
 

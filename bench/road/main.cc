@@ -1,12 +1,13 @@
-// How well the whole program keeps up: a process of its own traces the software board's built-in capture, and
-// this one reads its log from a pipe, checks each frame, and takes the time.
+// Measures how well the whole program keeps up with a board. One process runs lapdmon on the software board
+// with its built-in capture. This process reads the log from a pipe, checks each frame, and measures the time
+// from the event to its line in the log.
 //
 //     bench-road [FRAMES [SECONDS]]
 //
-// First as fast as the board can, until FRAMES are in the log (200000); then for SECONDS (5) at the rate of a
-// D channel that is full in both directions. A time ends when the header line can be read from the log, which
-// is written when there are 4 kB of it. The processor's time includes the software board's; how
-// much of it is spent before lapdmon has done anything is shown by programs that read the events alone.
+// The first run is as fast as the board can, until FRAMES (200000) frames are in the log. The second run
+// lasts SECONDS (5) at line rate, which is a D channel that is full in both directions. The time of the
+// processor includes that of the software board. To show how much of it is spent before lapdmon has done
+// anything, two more programs only read the events.
 #include <algorithm>
 #include <cstdlib>
 #include <exception>
@@ -22,7 +23,8 @@
 
 namespace {
 
-// 64 kbit/s filled with the shortest frames (4 octets, check sequence and flag), both ways.
+// Line rate in frames a second: 64 kbit/s in both directions, filled with the shortest frames (4 octets,
+// check sequence and flag).
 constexpr unsigned lineRate = 2 * 1142;
 
 double percentile(std::vector<double>& values, double share) {
@@ -32,7 +34,8 @@ double percentile(std::vector<double>& values, double share) {
     return *at;
 }
 
-// False when the run was not what it should have been.
+// Prints the figures of a run. Returns false when the program failed, or when frames were lost, refused or
+// out of order.
 bool show(const std::string& what, bench::Run run) {
     if (run.frames == 0) {
         std::cout << what << ": ended before its time (status " << run.status << ")" << std::endl;
@@ -49,7 +52,8 @@ bool show(const std::string& what, bench::Run run) {
     return run.status == 0 && run.checked.lost + run.checked.refused + run.checked.outOfOrder == 0;
 }
 
-// What the board, and a thread for each event, cost at line rate. False when they could not be run.
+// Prints what it costs at line rate only to read the events, and, if threadForEach is set, to start a thread
+// that does nothing for each. Returns false when the program failed.
 bool showLeast(const std::string& what, double seconds, bool threadForEach) {
     const double used = bench::runReading(std::to_string(lineRate), seconds, threadForEach);
     if (!(used > 0)) {
@@ -61,8 +65,8 @@ bool showLeast(const std::string& what, double seconds, bool threadForEach) {
     return true;
 }
 
-// Fewer frames than these may all be in the first piece of the log that is read: then there is no time
-// between the first and the last.
+// The least number of frames. If there are fewer, all of them may be in the first piece of the log that is
+// read, and then no time passes between the first and the last.
 constexpr std::uint64_t fewest = 1000;
 constexpr double shortest = 0.1;
 

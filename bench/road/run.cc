@@ -44,7 +44,8 @@ class Descriptor {
     int descriptor_;
 };
 
-// A folder of its own with the log in it, which is a pipe: a line is in the log when it can be read from it.
+// A temporary folder with the log, which is a FIFO. A line counts as in the log when it can be read from the
+// FIFO.
 class LogPipe {
   public:
     LogPipe() : folder_(makeFolder()), path_(folder_ / "log"), reader_(make(), "log") {
@@ -100,7 +101,7 @@ class SharedStamps {
 std::string thisProgram() { return fs::read_symlink("/proc/self/exe"); }
 std::string softwareBoard() { return fs::path(thisProgram()).parent_path() / "softboard"; }
 
-// The program that is measured, with a pipe for its standard input and its screen thrown away.
+// The process that is measured. Its standard input is a pipe, and its screen is /dev/null.
 class Traced {
   public:
     Traced(const std::string& rate, int stamps, const std::string& log) {
@@ -131,7 +132,7 @@ class Traced {
         return static_cast<double>(used.tv_sec) + static_cast<double>(used.tv_nsec) / 1e9;
     }
 
-    // A number of /proc/PID/status.
+    // A number from /proc/PID/status; 0 when it has no such line.
     long status(const std::string& name) const {
         std::ifstream file("/proc/" + std::to_string(pid_) + "/status");
         for (std::string word; file >> word;) {
@@ -190,7 +191,8 @@ class Measurement {
     }
 
   private:
-    // False when the log has been closed, or there will be none.
+    // Reads what has come of the log. Returns false when the log has been closed or the process has ended
+    // without one.
     bool takePiece() {
         constexpr int patienceMs = 100;
         pollfd waited{log_.reader(), POLLIN, 0};

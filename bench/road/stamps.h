@@ -1,4 +1,5 @@
-// When the traced program had each event from the transport, in memory that it shares with the bench.
+// The times at which the traced program read each event from the transport, in memory that it shares with the
+// bench.
 #ifndef BENCH_ROAD_STAMPS_H
 #define BENCH_ROAD_STAMPS_H
 
@@ -9,15 +10,15 @@
 
 namespace bench {
 
-// Nanoseconds on a clock that all processes share.
+// The time in nanoseconds, on a clock that is the same for all processes.
 inline std::int64_t nowNs() {
     std::timespec now{};
     clock_gettime(CLOCK_MONOTONIC, &now);
     return now.tv_sec * std::int64_t{1000000000} + now.tv_nsec;
 }
 
-// One process adds, in the order of arrival, another reads. An event's stamp stands until so many more came,
-// and there are never as many on the road.
+// One process adds a stamp for each event in the order of arrival, and another reads them. A stamp is
+// overwritten after `kept` more events; there are never that many between the transport and the log.
 struct Stamps {
     static constexpr std::size_t kept = std::size_t{1} << 16;
 

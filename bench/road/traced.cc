@@ -18,7 +18,7 @@ bench::Stamps* stamps = nullptr;
 
 }  // namespace
 
-// Stands before the library's.
+// The program calls this function instead of the library's, which this one calls.
 uint32_t nvMsgRead(uint32_t queue, uint32_t zero, NvMsg32Bit** msg) {
     static const auto real = reinterpret_cast<decltype(&nvMsgRead)>(dlsym(RTLD_NEXT, "nvMsgRead"));
     const uint32_t status = real(queue, zero, msg);

@@ -1,10 +1,12 @@
-// The program that is measured: lapdmon as it is, but for a stamp on each event that nvMsgRead returns.
+// The program that is measured: lapdmon unchanged, except that each event that nvMsgRead returns gets a
+// stamp.
 #ifndef BENCH_ROAD_TRACED_H
 #define BENCH_ROAD_TRACED_H
 
 namespace bench {
 
-// Runs it on board 1 with the log given, and stamps into the Stamps behind the descriptor. Its exit status.
+// Traces board 1 into this log and adds stamps to the Stamps in the file of the descriptor. Returns the exit
+// status.
 int runTraced(int stampsDescriptor, char* log);
 
 }  // namespace bench

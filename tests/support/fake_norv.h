@@ -1,7 +1,11 @@
-// A transport library for tests: every nv* function, scripted and recorded. Link it in place of libnorv.
+// A scripted transport library for tests. It offers every nv* function, records each call, and answers as the
+// test says. Link it in place of libnorv.
 //
-// Buffers, queues and loop-back work as the real thing does; a board is whatever the test's script answers.
-// Misuse (a buffer freed twice or not the caller's, an unknown queue) is noted, not fatal: see misuses().
+// Buffers and queues work as in the real library, and messages to a host queue arrive there. There is no
+// board: a script of the test answers commands (onWrite). Misuse, for example a buffer that is freed twice or
+// an unknown queue, does not end the process; misuses() lists it.
+//
+// Any thread may call any function.
 #ifndef TESTS_SUPPORT_FAKE_NORV_H
 #define TESTS_SUPPORT_FAKE_NORV_H
 
@@ -15,7 +19,7 @@
 
 namespace fake_norv {
 
-// The transport's functions, as the recorder and the faults name them.
+// The names of the transport's functions in records and faults.
 enum class Op {
     SetInterface,
     Allocate,
@@ -33,7 +37,8 @@ enum class Op {
     Write
 };
 
-// Word 0's low octet in a new buffer, and what the 24 octets after the body hold: the library's own.
+// What a new buffer holds for the library's own use: the low octet of the transaction word, and each of the
+// 24 octets after the body.
 inline constexpr std::uint8_t LowOctet = 0x5A;
 inline constexpr std::uint8_t TailOctet = 0xE7;
 
@@ -46,25 +51,26 @@ struct Message {
     std::vector<std::uint8_t> body;
 };
 
-// The answer to a command: back to its source, with its transaction.
+// The reply to a command: source and target are exchanged, and the transaction is the same.
 Message replyTo(const Message& command, std::uint32_t type, std::vector<std::uint8_t> body = {});
 
-// 32-bit words, little-endian, as body octets.
+// The octets of a body that consists of these 32-bit words, little-endian.
 std::vector<std::uint8_t> words(const std::vector<std::uint32_t>& values);
 
-// One call, with its arguments: "nvQueueBind(100)", "nvMsgAllocate(16)", "nvMsgWrite(100, type 0x8)".
+// One call of the library, as text with its arguments: "nvQueueBind(100)", "nvMsgAllocate(16)",
+// "nvMsgWrite(100, type 0x8)".
 struct Call {
     Op op{};
     std::string text;
-    std::uint32_t status = 0;  // what it returned
-    // VarField calls: the count, one descriptor a field, and the offset that the call was given.
+    std::uint32_t status = 0;  // the status that it returned
+    // Of VarField calls only: the number of fields, the descriptor of each, and the offset before the call.
     std::uint32_t count = 0;
     std::vector<std::uint32_t> descriptors{};
     std::uint32_t offset = 0;
 };
 
-// Forgets everything: records, faults, modes, scripts, queues and buffers. First thing in each test, while no
-// other thread uses the transport.
+// Forgets everything: records, faults, modes, scripts, queues and buffers. Call it first in each test, while
+// no other thread uses the transport.
 void reset();
 
 // ---- What was called.
@@ -72,33 +78,35 @@ std::vector<Call> calls();
 std::vector<Call> calls(Op op);
 std::size_t count(Op op);
 std::vector<std::string> texts();  // of calls(), without the VarField calls and reads
-// The messages written, oldest first; a wake-up or loop-back is among them.
+// The messages that were written, oldest first, including those that a host writes to its own queue.
 std::vector<Message> written();
 
-// ---- Faults.
-// After `after` more calls of op that work, `times` calls fail. Allocate leaves the pointer null, as does
-// Reallocate, whose buffer stays the caller's; Write takes the buffer over and loses it.
+// ---- Faults. After `after` more calls of op that succeed, the next `times` calls fail. An Allocate that
+// fails leaves the pointer null. A Reallocate that fails does so too, and the caller keeps the buffer. A
+// Write that fails takes the buffer and loses the message.
 void fail(Op op, unsigned times = 1, unsigned after = 0);
-// The first VarField call on a body leaves the offset at 0, while the data moves.
+// From now on the first VarField call on a body moves the data but leaves the offset at 0.
 void leaveFirstOffsetAtZero(bool on = true);
-// Messages that reach a queue have their bodies cut to this many octets.
+// From now on the bodies of messages that reach a queue are cut to this many octets.
 void truncateBodies(std::size_t octets);
 
-// ---- The board's side.
-// Called on the writer's thread for each nvMsgWrite, before it returns; may deliver messages.
+// ---- The board's side. Sets the function that is called for each nvMsgWrite that succeeds, on the writer's
+// thread and before nvMsgWrite returns. It may call deliver().
 void onWrite(std::function<void(const Message&)> script);
-// Puts a message into the queue bound to its target; false when there is none.
+// Puts a message into the queue that is bound to its target. Returns false when there is none.
 bool deliver(const Message& message);
-// The address that the next queue bound gets; later ones count its instance up.
+// Sets the address that the next bound queue gets. Each later queue gets the next instance.
 void nextHostAddress(NvCompDesc address);
 
-// ---- Events to wait for. All return false after half a minute.
+// ---- Waiting. Each function returns false after half a minute.
+
+// Waits until op has been called so many times.
 bool waitForCalls(Op op, std::size_t calls);
-// A reader is blocked in nvMsgRead, and nothing is left in any queue.
+// Waits until a thread is blocked in nvMsgRead and all queues are empty.
 bool waitForIdleReader();
 
 // ---- Buffers and queues.
-std::size_t outstanding();  // buffers that callers hold: neither freed nor with the library
+std::size_t outstanding();  // buffers that callers own: not freed, and not handed over to the library
 std::size_t openQueues();
 std::vector<std::string> misuses();
 

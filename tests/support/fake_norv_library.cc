@@ -43,8 +43,8 @@ std::vector<Field> fieldsOf(std::uint32_t count, va_list list) {
     return fields;
 }
 
-// Moves the fields that lie in the body whole; the first one that does not ends it. The host and the wire are
-// both little-endian.
+// Moves fields until one is not wholly inside the body. The octets are moved unchanged, because both the host
+// and the wire are little-endian.
 template <typename Move>
 std::uint32_t moveFields(State& s, Op op, NvMsg32Bit* msg, std::uint32_t* offset,
                          const std::vector<Field>& fields, Move move) {
@@ -91,7 +91,7 @@ uint32_t nvMsgReallocate(uint32_t size, NvMsg32Bit** msg) {
     const Lock lock(s.lock);
     uint32_t status = Failed;
     if (callersBuffer(s, *msg, "nvMsgReallocate") == nullptr) {
-        // noted
+        // callersBuffer has recorded the misuse
     } else if (fails(s, Op::Reallocate)) {
         *msg = nullptr;
     } else {
@@ -116,7 +116,7 @@ uint32_t nvMsgFree(NvMsg32Bit* msg) {
     return record(s, {Op::Free, "nvMsgFree()", status});
 }
 
-// The library's fixed fields are its own affair: 32 bits under each index, 0 until put.
+// A fixed field is 32 bits under each index, 0 until it is put. It is kept apart from the body.
 uint32_t nvMsgFieldGet(NvMsg32Bit* msg, uint32_t index, void* value) {
     State& s = state();
     const Lock lock(s.lock);
@@ -202,7 +202,7 @@ uint32_t nvQueueUnbind(uint32_t handle, NvCompDesc host) {
     return record(s, {Op::Unbind, text("nvQueueUnbind(", handle, ", ", hex(host.instance), ")"), status});
 }
 
-// What is left in the queue goes with it; a reader blocked there returns.
+// Frees the messages that are left in the queue. A reader that is blocked in it returns.
 uint32_t nvQueueClose(uint32_t handle) {
     State& s = state();
     const Lock lock(s.lock);

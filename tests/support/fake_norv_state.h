@@ -1,5 +1,5 @@
-// What the scripted transport library knows, and what both of its sides do with it. For its own sources
-// alone.
+// The state of the scripted transport library, and what both of its sources do with it. Only they include
+// this header.
 #ifndef TESTS_SUPPORT_FAKE_NORV_STATE_H
 #define TESTS_SUPPORT_FAKE_NORV_STATE_H
 
@@ -72,17 +72,17 @@ std::string text(const Parts&... parts) {
 }
 std::string hex(std::uint32_t value);
 
-// ---- With the state's lock held.
+// ---- Call these functions with the state's lock held.
 
-// Notes the call; its status.
+// Records the call and returns its status.
 std::uint32_t record(State& s, Call call);
 void misuse(State& s, const std::string& what);
-// Whether this call is one that was told to fail.
+// Whether this call of op is to fail. Counts the call.
 bool fails(State& s, Op op);
 
 NvMsg32Bit* newBuffer(State& s, std::uint32_t size);
 void release(State& s, NvMsg32Bit* msg);
-// The caller's own buffer, or null and a note.
+// The buffer, which must belong to the caller. Otherwise records a misuse and returns null.
 Buffer* callersBuffer(State& s, NvMsg32Bit* msg, const char* function);
 
 Queue* openQueue(State& s, std::uint32_t handle, const char* function);

@@ -1,4 +1,5 @@
-// The other end of a connection, octet by octet. Nothing waits longer than half a minute.
+// The other end of a TCP connection, for tests that send and receive single octets. Nothing waits longer than
+// half a minute.
 #ifndef TESTS_SUPPORT_TCP_H
 #define TESTS_SUPPORT_TCP_H
 
@@ -17,7 +18,7 @@ namespace tcp {
 
 using Octets = std::vector<std::uint8_t>;
 
-// 32-bit words, big-endian.
+// The octets of 32-bit words, big-endian.
 inline Octets words(std::initializer_list<std::uint32_t> values) {
     Octets octets;
     for (const std::uint32_t value : values) {
@@ -59,7 +60,7 @@ class Connection {
         return connection;
     }
 
-    // As much as comes until there are so many octets, or the other end closes.
+    // Reads so many octets, or fewer if the other end closes before.
     Octets read(std::size_t size) const {
         Octets octets(size);
         std::size_t got = 0;
@@ -73,7 +74,7 @@ class Connection {
         return octets;
     }
 
-    // Whether the other end closes, whatever it sends before.
+    // Reads until the other end closes. Returns false when it does not.
     bool ends() const {
         Octets dropped(65536);
         ssize_t count = 0;

@@ -1,4 +1,5 @@
-// Stand-ins for the system calls of the host services.
+// Replacements for the system calls of the host services. An object replaces them from its constructor to its
+// destructor.
 #ifndef TESTS_SUPPORT_TEST_SYSTEM_H
 #define TESTS_SUPPORT_TEST_SYSTEM_H
 
@@ -11,25 +12,25 @@
 
 #include "hostsvc/KSSystem.h"
 
-// While it lives, sleeps take no time: they are noted, and the test may act instead.
+// Sleeps take no time: they are recorded, and a function of the test may run instead.
 class SleeplessSystem : public KSSystem {
   public:
     SleeplessSystem() { ks_useSystem(this); }
     ~SleeplessSystem() override { ks_useSystem(nullptr); }
 
-    // Microseconds of every short sleep so far.
+    // The microseconds of each short sleep so far.
     std::vector<long> naps() const {
         const std::lock_guard lock(lock_);
         return naps_;
     }
-    // Seconds of every long one.
+    // The seconds of each long sleep so far.
     std::vector<unsigned> sleeps() const {
         const std::lock_guard lock(lock_);
         return sleeps_;
     }
 
     std::function<void()> insteadOfNapping;  // set before any thread sleeps
-    int napResult = 0;                       // -1: a signal came first
+    int napResult = 0;                       // -1: as if a signal had interrupted the sleep
 
     unsigned sleep(unsigned seconds) override {
         const std::lock_guard lock(lock_);
@@ -47,7 +48,7 @@ class SleeplessSystem : public KSSystem {
         return napResult;
     }
 
-    // A wait that nothing cuts short.
+    // These waits last their whole time: no post and no unlock ends them.
     int waitForCount(sem_t& /*semaphore*/, timeval timeout) override { return interruptedOrOver(timeout); }
     int waitForLock(pthread_mutex_t& /*mutex*/, timeval timeout) override {
         return interruptedOrOver(timeout);
@@ -61,7 +62,7 @@ class SleeplessSystem : public KSSystem {
     std::vector<unsigned> sleeps_;
 };
 
-// While it lives, the system refuses every new thread.
+// The system refuses every new thread.
 class ThreadlessSystem : public KSSystem {
   public:
     ThreadlessSystem() { ks_useSystem(this); }
