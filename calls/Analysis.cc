@@ -7,11 +7,15 @@
 #include "calls/CallFindings.h"
 #include "calls/CallTable.h"
 #include "calls/ChannelClock.h"
+#include "calls/Channels.h"
 #include "calls/FindingSink.h"
 #include "calls/LinkFindings.h"
+#include "calls/Maintenance.h"
+#include "calls/Patterns.h"
 #include "calls/Segments.h"
 #include "calls/Waits.h"
 #include "calls/WitnessKeeper.h"
+#include "calls/findingOf.h"
 
 namespace calls {
 
@@ -53,22 +57,35 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
         : listener_(listener),
           table_(timers, numbers, *this),
           waits_(timers, *this, *this),
-          findings_(timers, *this) {}
+          findings_(timers, *this),
+          maintenance_(timers, *this, *this),
+          channels_(timers, maintenance_, *this),
+          patterns_(*this) {}
 
     void take(const Message& message, const LinkWitness& link) {
         links_[message.layer2.tei] = &link;
         advance(message.at);
+        maintenance_.take(message);
         const Call* const call = table_.take(message);
-        if (message.layer3.type == isdn::message::restartAcknowledge &&
-            message.layer3.discriminator == isdn::callControl && message.layer3.callReference.global())
+        const isdn::Layer3& layer3 = message.layer3;
+        if (layer3.discriminator == isdn::callControl && layer3.hasCallReference &&
+            layer3.callReference.global() && layer3.type == isdn::message::restartAcknowledge) {
             table_.restarted(message);
+            channels_.restarted(message);
+        }
         if (call == nullptr)
             findings_.heardWithoutCall(message);
         listener_.heard(message, call);
     }
     void advance(std::int64_t at) {
         waits_.advance(at);
+        maintenance_.advance(at);
+        channels_.advance(at);
         table_.advance(at);
+    }
+    void finish() {
+        channels_.finish();
+        table_.finish();
     }
     CallTable& table() { return table_; }
     const CallTable& table() const { return table_; }
@@ -76,13 +93,17 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
     void heard(Call& call, const Message& message) override {
         waits_.heard(call, message);
         findings_.heard(call, message);
+        channels_.heard(call, message);
     }
     void ended(Call& call, const Message* by) override {
         waits_.ended(call, by);
         findings_.ended(call, by);
+        channels_.ended(call, by);
+        patterns_.ended(call, by);
     }
     void gone(const Call& call) override {
         findings_.gone(call);
+        channels_.gone(call);
         listener_.gone(call);
     }
     void replaced(Call& old, Call& by, const Message& message) override {
@@ -99,6 +120,9 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
     CallTable table_;
     Waits waits_;
     CallFindings findings_;
+    Maintenance maintenance_;
+    Channels channels_;
+    Patterns patterns_;
 };
 
 struct Analysis::Channel {
@@ -150,14 +174,8 @@ struct Analysis::Channel {
             report(findings::segmentsUnfinished, message, frame, "the next SEGMENT did not come");
     }
     void report(const FindingKind& kind, const Message& message, std::uint64_t frame, std::string sentence) {
-        Finding finding;
-        finding.kind = &kind;
-        finding.severity = kind.severity;
+        Finding finding = findingOf(kind, message, nullptr, std::move(sentence));
         finding.frame = frame;
-        finding.clock = message.frame->clock;
-        finding.time = message.frame->time;
-        finding.dChannel = message.frame->interface->name;
-        finding.sentence = std::move(sentence);
         group.report(std::move(finding));
     }
 
@@ -213,6 +231,7 @@ const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
     const std::int64_t at = channel.clock.at(frame);
     if (channel.clock.hasRestarted())
         channel.restarted();
+    channel.group.advance(at);
     const Marks& marks = channel.links.take(frame, number, at);
     channel.linkFindings.take(channel.links);
     const isdn::Layer2& layer2 = channel.links.layer2();
@@ -264,7 +283,7 @@ void Analysis::finish() {
         channel->linkFindings.finish(channel->links);
     }
     for (const auto& group : groups_)
-        group->table().finish();
+        group->finish();
 }
 
 std::vector<const Call*> Analysis::open() const {

@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "calls/ElementRules.h"
+#include "calls/findingOf.h"
 #include "isdn/words.h"
 
 namespace calls {
@@ -160,16 +161,7 @@ void CallFindings::checkChannel(const Call& call, Notes& notes, const Message& m
 
 void CallFindings::ended(Call& call, const Message* by) {
     if (call.broadcast && !call.firstResponse && call.endedBy == EndedBy::release && by == nullptr) {
-        Finding finding;
-        finding.kind = &findings::broadcastUnanswered;
-        finding.severity = finding.kind->severity;
-        finding.frame = call.begin.frame;
-        finding.clock = call.begin.clock;
-        finding.time = call.begin.time;
-        finding.dChannel = call.dChannel;
-        finding.call = call.number;
-        finding.sentence = "no terminal answered";
-        sink_.report(std::move(finding));
+        sink_.report(findingOf(findings::broadcastUnanswered, call.begin, call, "no terminal answered"));
     }
 }
 
@@ -187,18 +179,7 @@ void CallFindings::stray(const Message& message) {
 
 void CallFindings::report(const FindingKind& kind, const Call* call, const Message& message,
                           std::string sentence) {
-    Finding finding;
-    finding.kind = &kind;
-    finding.severity = kind.severity;
-    finding.frame = message.number;
-    finding.clock = message.frame->clock;
-    finding.time = message.frame->time;
-    if (message.frame->interface != nullptr)
-        finding.dChannel = message.frame->interface->name;
-    if (call != nullptr)
-        finding.call = call->number;
-    finding.sentence = std::move(sentence);
-    sink_.report(std::move(finding));
+    sink_.report(findingOf(kind, message, call, std::move(sentence)));
 }
 
 }  // namespace calls

@@ -5,6 +5,7 @@
 #include <array>
 #include <cstdint>
 #include <limits>
+#include <string_view>
 
 #include "calls/Message.h"
 
@@ -31,6 +32,11 @@ struct LinkWitness {
         return lastHole[static_cast<std::size_t>(from)] < at;
     }
 };
+
+// Why it cannot be told whether a question of `asker`, asked in `frame` at `at`, was answered; empty if it
+// can. `link` may be null.
+std::string_view doubtAbout(const LinkWitness* link, std::uint64_t frame, std::int64_t at, Side asker,
+                            Side answering);
 
 // Gives the witness of the link of a TEI that carries a table's calls; null if nothing is known of it.
 class LinkWitnesses {

@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <bitset>
 
+#include "calls/findingOf.h"
+
 namespace calls {
 
 namespace {
@@ -190,37 +192,17 @@ void Waits::expire(const Wait& wait, std::int64_t until) {
     std::string what = name + " of frame " + std::to_string(wait.first.frame) + " got no answer for " +
                        seconds(until - wait.first.at) + " (" + std::string(rule.timer);
     what += wait.repetitions == 0 ? ")" : ", repeated " + std::to_string(wait.repetitions) + "x)";
-    if (const std::string_view doubt = doubtAbout(wait); !doubt.empty())
+    const Side answering = rule.sameSideAnswers ? wait.asker : other(wait.asker);
+    const std::string_view doubt =
+        doubtAbout(links_.witness(wait.tei), wait.first.frame, wait.first.at, wait.asker, answering);
+    if (!doubt.empty())
         report(findings::cannotBeTold, wait, what + ", but " + std::string(doubt));
     else
         report(*rule.finding, wait, std::move(what));
 }
 
-std::string_view Waits::doubtAbout(const Wait& wait) const {
-    const LinkWitness* const link = links_.witness(wait.tei);
-    if (link == nullptr)
-        return "nothing is known of the link";
-    if (!link->wasUpSince(wait.first.at))
-        return "the link was down meanwhile";
-    if (!link->hasArrived(wait.first.frame, wait.asker))
-        return "the receiver's link layer did not acknowledge it";
-    const Side answering = wait.rule->sameSideAnswers ? wait.asker : other(wait.asker);
-    if (!link->isWholeSince(wait.first.at, answering))
-        return "a frame that may be the answer is missing in the trace";
-    return {};
-}
-
 void Waits::report(const FindingKind& kind, const Wait& wait, std::string sentence) {
-    Finding finding;
-    finding.kind = &kind;
-    finding.severity = kind.severity;
-    finding.frame = wait.last.frame;
-    finding.clock = wait.last.clock;
-    finding.time = wait.last.time;
-    finding.dChannel = wait.call->dChannel;
-    finding.call = wait.call->number;
-    finding.sentence = std::move(sentence);
-    sink_.report(std::move(finding));
+    sink_.report(findingOf(kind, wait.last, *wait.call, std::move(sentence)));
 }
 
 void Waits::drop(std::uint64_t id) {

@@ -55,7 +55,6 @@ class Waits : public CallObserver {
     void drop(std::uint64_t id);
     void dropAll(const Call& call);
     std::int64_t timerOf(const Rule& rule, const Message& message) const;
-    std::string_view doubtAbout(const Wait& wait) const;
     void report(const FindingKind& kind, const Wait& wait, std::string sentence);
     std::vector<std::uint64_t> waitsOf(const Call& call) const;
 

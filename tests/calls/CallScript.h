@@ -88,6 +88,13 @@ class CallScript {
         append(octets, type, reference, originFlag, elements);
         return add(from, std::move(octets));
     }
+    // SERVICE or its answer, with protocol discriminator 03 and the global reference.
+    CallScript& maintenance(Side from, std::uint8_t type, bool originFlag,
+                            std::initializer_list<Bytes> elements) {
+        message(from, type, 0, originFlag, elements);
+        frames_.back().octets[4] = 0x03;
+        return *this;
+    }
     // A message to all terminals, in a UI frame.
     CallScript& broadcast(Side from, std::uint8_t type, std::uint16_t reference,
                           std::initializer_list<Bytes> elements = {}) {

@@ -1,0 +1,296 @@
+#include "calls/Channels.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "calls/FindingKinds.h"
+#include "calls/Stream.h"
+#include "calls/causes.h"
+#include "calls/findingOf.h"
+
+namespace calls {
+
+namespace {
+
+namespace type = isdn::message;
+
+constexpr std::uint8_t noChannel = 34, requestedNotAvailable = 44, doesNotExist = 82;
+constexpr unsigned setupsToJudgeHunting = 20;  // of each side
+
+std::string callName(std::uint64_t number) { return "call " + std::to_string(number); }
+
+bool share(const std::vector<ChannelKey>& a, const std::vector<ChannelKey>& b) {
+    return std::any_of(a.begin(), a.end(),
+                       [&](const ChannelKey& key) { return std::find(b.begin(), b.end(), key) != b.end(); });
+}
+
+bool accepts(std::uint8_t messageType) {
+    return messageType == type::callProceeding || messageType == type::setupAcknowledge ||
+           messageType == type::alerting || messageType == type::connect;
+}
+
+}  // namespace
+
+Channels::State* Channels::stateOf(const ChannelKey& key) {
+    if (const auto found = states_.find(key); found != states_.end())
+        return &found->second;
+    return states_.size() < mostChannels ? &states_[key] : nullptr;
+}
+
+void Channels::heard(Call& call, const Message& message) {
+    if (call.phase == Phase::ended)
+        return;
+    const auto [entry, isNew] = seizures_.try_emplace(call.number);
+    Seizure& seizure = entry->second;
+    seizure.origin = call.origin;
+    const std::uint8_t messageType = message.layer3.type;
+    if (messageType == type::setup && isNew) {
+        setUp(call, seizure, message);
+        return;
+    }
+    if (messageType == type::holdAcknowledge) {
+        release(call.number, seizure);
+        return;
+    }
+    const bool goesOn = messageType == type::retrieveAcknowledge || messageType == type::resumeAcknowledge ||
+                        (call.beforeTrace && isNew && !isClearing(messageType));
+    const bool taken = message.from() != call.origin && accepts(messageType) && !seizure.answered;
+    if (taken || goesOn ||
+        (seizure.answered && seizure.held.empty() && call.granted && call.phase == Phase::setUp)) {
+        seizure.answered = seizure.answered || taken;
+        hold(call, seizure, message);
+        settleGlare(call, seizure, &message);
+    }
+}
+
+void Channels::setUp(Call& call, Seizure& seizure, const Message& message) {
+    seizure.asked = channelsOf(call.asked);
+    seizure.numbered = message.layer2.hasNs();
+    seizure.setupNs = message.layer2.ns;
+    for (const ChannelKey& key : seizure.asked) {
+        static_cast<void>(stateOf(key));
+        if (maintenance_.serviceOf(key) != Service::in)
+            sink_.report(findingOf(findings::serviceChannelSeized, message, &call,
+                                   "SETUP asks for channel " + toString(key) + ", which is out of service"));
+    }
+    findGlare(call, seizure, message);
+    hunt(call, seizure, message);
+}
+
+// SETUPs cross if neither side had seen the other's: this one's N(R) does not cover the other one.
+void Channels::findGlare(Call& call, Seizure& seizure, const Message& message) {
+    if (!seizure.numbered)
+        return;
+    for (auto& [number, opposite] : seizures_) {
+        if (opposite.origin == call.origin || opposite.answered || !opposite.numbered ||
+            opposite.glare != 0 || !share(opposite.asked, seizure.asked) ||
+            isAhead(message.layer2.nr, opposite.setupNs))
+            continue;
+        seizure.glare = number;
+        opposite.glare = call.number;
+        return;
+    }
+}
+
+void Channels::hunt(const Call& call, const Seizure& seizure, const Message& message) {
+    if (seizure.asked.size() != 1 || glareProneSaid_)
+        return;
+    Hunting& own = hunting_[static_cast<std::size_t>(call.origin)];
+    const std::uint32_t number = seizure.asked.front().number;
+    if (own.last != 0 && number != own.last)
+        ++(number > own.last ? own.up : own.down);
+    own.last = number;
+    const auto direction = [](const Hunting& side) {
+        const unsigned all = side.up + side.down;
+        if (all < setupsToJudgeHunting)
+            return 0;
+        return side.up * 10 >= all * 8 ? 1 : side.down * 10 >= all * 8 ? -1 : 0;
+    };
+    const int ofUs = direction(hunting_[0]);
+    if (ofUs == 0 || ofUs != direction(hunting_[1]))
+        return;
+    glareProneSaid_ = true;
+    sink_.report(
+        findingOf(findings::glareProne, message, &call,
+                  ofUs > 0 ? "both ends take channels upwards" : "both ends take channels downwards"));
+}
+
+void Channels::hold(Call& call, Seizure& seizure, const Message& message) {
+    release(call.number, seizure);
+    seizure.held = channelsOf(call.channel());
+    for (const ChannelKey& key : seizure.held) {
+        State* const state = stateOf(key);
+        if (state == nullptr)
+            continue;
+        orphans_.erase(key);
+        state->refusals = 0;
+        for (const std::uint64_t holder : state->holders) {
+            if (seizure.glare == holder)
+                continue;  // said as glare
+            conflicts_.push_back(
+                {key, holder, call.number, message.at + timers_.slack,
+                 findingOf(findings::doubleSeizure, message, &call,
+                           "channel " + toString(key) + " is given to " + callName(call.number) + " while " +
+                               callName(holder) + " holds it")});
+        }
+        state->holders.push_back(call.number);
+    }
+}
+
+void Channels::release(std::uint64_t call, Seizure& seizure) {
+    for (const ChannelKey& key : seizure.held) {
+        State* const state = stateOf(key);
+        if (state == nullptr)
+            continue;
+        std::erase(state->holders, call);
+        state->seenFree = state->seenFree || state->holders.empty();
+    }
+    seizure.held.clear();
+}
+
+// Glare is settled when one of the two calls is moved to another channel or refused; it persists when both
+// have been given the channel.
+void Channels::settleGlare(Call& call, Seizure& seizure, const Message* message) {
+    if (seizure.glare == 0 || seizure.glareSettled)
+        return;
+    const auto found = seizures_.find(seizure.glare);
+    if (found == seizures_.end())
+        return;
+    Seizure& opposite = found->second;
+    const bool moved = message != nullptr && !share(seizure.held, seizure.asked);
+    const bool bothGoOn = message != nullptr && opposite.answered && share(seizure.held, opposite.held);
+    if (!moved && !bothGoOn && message != nullptr)
+        return;  // the other call decides
+    seizure.glareSettled = opposite.glareSettled = true;
+    const std::string which =
+        "SETUPs of " + callName(call.number) + " and " + callName(seizure.glare) + " crossed";
+    if (bothGoOn)
+        sink_.report(findingOf(findings::glarePersists, *message, &call, which + ", and both calls went on"));
+    else if (message != nullptr)
+        sink_.report(
+            findingOf(findings::glare, *message, &call, which + "; one was moved to another channel"));
+    else
+        sink_.report(findingOf(findings::glare, call.end, call, which + "; one gave way"));
+}
+
+void Channels::ended(Call& call, const Message*) {
+    const auto found = seizures_.find(call.number);
+    if (found == seizures_.end())
+        return;
+    Seizure& seizure = found->second;
+    if (call.endedBy == EndedBy::open)
+        return;
+    if (!seizure.answered)
+        noteRefusal(call, seizure);
+    settleGlare(call, seizure, nullptr);
+    const std::vector<ChannelKey> held = seizure.held;
+    release(call.number, seizure);
+    seizure.held = held;
+    noteOrphan(call, seizure);
+    seizure.held.clear();
+    seizure.asked.clear();
+}
+
+void Channels::gone(const Call& call) { seizures_.erase(call.number); }
+
+bool Channels::isKnownIdle(const std::vector<ChannelKey>& channels) const {
+    return !channels.empty() && std::all_of(channels.begin(), channels.end(), [&](const ChannelKey& key) {
+        const auto state = states_.find(key);
+        return state != states_.end() && state->second.seenFree && state->second.holders.empty() &&
+               maintenance_.serviceOf(key) == Service::in;
+    });
+}
+
+void Channels::noteRefusal(const Call& call, const Seizure& seizure) {
+    if (!call.cause || call.cause->from == call.origin || seizure.glare != 0 || !isKnownIdle(seizure.asked))
+        return;
+    const std::uint8_t value = call.cause->value;
+    const Made made = madeBy(*call.cause);
+    const bool aboutThisChannel = value == requestedNotAvailable || value == doesNotExist;
+    if (!aboutThisChannel && (value != noChannel || made != Made::thisExchange))
+        return;
+    const ChannelKey& key = seizure.asked.front();
+    State& state = *stateOf(key);
+    std::string sentence = "channel " + toString(key) + " was refused with cause " + std::to_string(value) +
+                           " although the trace shows it idle";
+    if (aboutThisChannel && ++state.refusals == 2)
+        sink_.report(
+            findingOf(findings::stuckChannel, call.end, call, std::move(sentence) + ", for the second time"));
+    else
+        sink_.report(findingOf(findings::channelRefused, call.end, call, std::move(sentence)));
+}
+
+// The call went without clearing: one end may still hold the channel.
+void Channels::noteOrphan(const Call& call, const Seizure& seizure) {
+    const bool lost = call.endedBy == EndedBy::replaced || call.endedBy == EndedBy::link;
+    if (!lost || call.clearingSeen)
+        return;
+    for (const ChannelKey& key : seizure.held) {
+        orphans_[key] = {call.end.at, findingOf(findings::stuckChannel, call.end, call,
+                                                "channel " + toString(key) + " of " + callName(call.number) +
+                                                    " was neither cleared nor restarted")};
+    }
+}
+
+void Channels::restarted(const Message& acknowledge) {
+    namespace element = isdn::element;
+    constexpr std::uint8_t namedChannels = 0;
+    const std::uint8_t kind = isdn::restartClass(acknowledge.layer3.elements.find(element::restartIndicator))
+                                  .value_or(namedChannels);
+    const auto channel = isdn::channelId(acknowledge.layer3.elements.find(element::channelIdentification));
+    const std::vector<ChannelKey> named = channelsOf(channel);
+    const auto isMeant = [&](const ChannelKey& key) {
+        if (kind == namedChannels)
+            return std::find(named.begin(), named.end(), key) != named.end();
+        return kind != 6 || !channel || channel->interface == key.interface;
+    };
+    for (const ChannelKey& key : named)
+        static_cast<void>(stateOf(key));
+    for (auto& [key, state] : states_) {
+        if (!isMeant(key))
+            continue;
+        orphans_.erase(key);
+        state.refusals = 0;
+        state.seenFree = state.seenFree || state.holders.empty();
+    }
+}
+
+void Channels::advance(std::int64_t at) {
+    for (std::size_t i = 0; i < conflicts_.size();) {
+        if (conflicts_[i].deadline > at) {
+            ++i;
+            continue;
+        }
+        Conflict conflict = std::move(conflicts_[i]);
+        conflicts_.erase(conflicts_.begin() + static_cast<std::ptrdiff_t>(i));
+        const std::vector<std::uint64_t>& holders = states_[conflict.channel].holders;
+        const auto holds = [&](std::uint64_t call) {
+            return std::find(holders.begin(), holders.end(), call) != holders.end();
+        };
+        if (holds(conflict.first) && holds(conflict.second))
+            sink_.report(std::move(conflict.finding));
+    }
+    for (auto orphan = orphans_.begin(); orphan != orphans_.end();) {
+        if (at - orphan->second.first <= timers_.t316) {
+            ++orphan;
+            continue;
+        }
+        sink_.report(std::move(orphan->second.second));
+        orphan = orphans_.erase(orphan);
+    }
+}
+
+void Channels::finish() {
+    for (auto& [key, orphan] : orphans_)
+        sink_.report(std::move(orphan.second));
+    orphans_.clear();
+}
+
+std::map<ChannelKey, std::vector<std::uint64_t>> Channels::holders() const {
+    std::map<ChannelKey, std::vector<std::uint64_t>> all;
+    for (const auto& [key, state] : states_)
+        all.emplace(key, state.holders);
+    return all;
+}
+
+}  // namespace calls

@@ -1,0 +1,95 @@
+// RESTART and SERVICE: what the two sides do about channels outside of calls (Q.931 5.5; the maintenance
+// messages of North American trunks).
+#ifndef CALLS_MAINTENANCE_H
+#define CALLS_MAINTENANCE_H
+
+#include <array>
+#include <bitset>
+#include <compare>
+#include <cstdint>
+#include <deque>
+#include <map>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "calls/Call.h"
+#include "calls/FindingSink.h"
+#include "calls/LinkWitness.h"
+#include "calls/Message.h"
+#include "calls/Timers.h"
+
+namespace calls {
+
+// One B channel of a group. The interface is empty if it is implicit.
+struct ChannelKey {
+    std::optional<std::uint32_t> interface;
+    std::uint32_t number = 0;
+    auto operator<=>(const ChannelKey&) const = default;
+};
+// The channels that an element names, in order.
+std::vector<ChannelKey> channelsOf(const std::optional<isdn::ChannelId>& channel);
+// "7", or "2/7" with an interface.
+std::string toString(const ChannelKey& channel);
+
+// How usable a side says that a channel is; the worse of the two sides counts.
+enum class Service : std::uint8_t { in, maintenance, out };
+
+class Maintenance {
+  public:
+    Maintenance(const Timers& timers, const LinkWitnesses& links, FindingSink& sink)
+        : timers_(timers), links_(links), sink_(sink) {}
+
+    // Any message; others than RESTART, SERVICE and their answers only show that their side is heard.
+    void take(const Message& message);
+    // The clock has come to `at`; to be called before what happened then is handed in.
+    void advance(std::int64_t at);
+
+    Service serviceOf(const ChannelKey& channel) const;
+    // Which side has taken the channel furthest out of service.
+    std::optional<Side> blockedBy(const ChannelKey& channel) const;
+
+  private:
+    // What a message is about.
+    struct Target {
+        std::uint8_t kind = 0;  // restart class, or status of SERVICE
+        std::optional<std::uint32_t> interface;
+        std::bitset<128> channels;
+        bool operator==(const Target&) const = default;
+    };
+    struct Asked {
+        bool service = false;
+        Target target;
+        Side asker = Side::us;
+        std::uint8_t tei = 0;
+        std::string dChannel;
+        Moment first;
+        Moment last;
+        unsigned repetitions = 0;
+    };
+
+    void restart(const Message& message);
+    void restartAcknowledge(const Message& message);
+    void service(const Message& message);
+    void serviceAcknowledge(const Message& message);
+    void ask(const Message& message, const Target& target, bool isService);
+    void countRestart(const Message& message, const Target& target);
+    bool isDue(const Asked& asked, std::int64_t at) const;
+    void expire(const Asked& asked);
+    void report(const FindingKind& kind, const Asked& asked, std::string sentence);
+
+    const Timers& timers_;
+    const LinkWitnesses& links_;
+    FindingSink& sink_;
+    std::vector<Asked> asked_;  // a few: at most `mostAsked`
+    unsigned heard_ = 0;        // bits 1 and 2: sides that have sent
+    std::array<bool, 2> acknowledgesService_{};
+    std::map<std::pair<Side, ChannelKey>, Service> status_;
+    // Times of the last restarts by side and channel; class 6 and 7 count as channels of their own.
+    std::map<std::pair<Side, ChannelKey>, std::deque<std::int64_t>> restarts_;
+};
+
+}  // namespace calls
+
+#endif

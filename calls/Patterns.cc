@@ -1,0 +1,111 @@
+#include "calls/Patterns.h"
+
+#include <algorithm>
+#include <array>
+#include <cstdlib>
+
+#include "calls/FindingKinds.h"
+#include "calls/Maintenance.h"
+#include "calls/findingOf.h"
+
+namespace calls {
+
+namespace {
+
+constexpr std::size_t callsThatEndTogether = 3;
+constexpr std::size_t callsOfOneLength = 5;
+// With more calls to compare, chance alone makes five of one length.
+constexpr std::size_t durationsCompared = 30;
+constexpr std::int64_t shortestLength = 10 * second;
+constexpr std::int64_t lengthTolerance = second / 2;
+constexpr std::size_t callsOfABurst = 5;
+constexpr std::int64_t burstWindow = 60 * second;
+constexpr std::int64_t burstSilence = 600 * second;
+constexpr std::size_t prefixDigits = 4;
+constexpr std::size_t mostFailures = 256;
+
+// Causes of everyday life: nobody looks for what such calls have in common.
+bool isOrdinary(std::uint8_t cause) {
+    constexpr std::array<std::uint8_t, 7> ordinary{16, 17, 18, 19, 21, 26, 31};
+    return std::find(ordinary.begin(), ordinary.end(), cause) != ordinary.end();
+}
+
+}  // namespace
+
+void Patterns::ended(Call& call, const Message*) {
+    if (call.endedBy == EndedBy::open)
+        return;
+    findMassClear(call);
+    findSameDuration(call);
+    findCauseBurst(call);
+}
+
+void Patterns::findMassClear(const Call& call) {
+    if (call.endedBy != EndedBy::link)
+        return;
+    while (!lost_.empty() && call.end.at - lost_.front() > second)
+        lost_.pop_front();
+    lost_.push_back(call.end.at);
+    if (lost_.size() != callsThatEndTogether)
+        return;
+    sink_.report(findingOf(findings::massClear, call.end, call,
+                           std::to_string(lost_.size()) + " calls or more ended with the link"));
+}
+
+void Patterns::findSameDuration(const Call& call) {
+    if (!call.duration || *call.duration < shortestLength || call.endedBy != EndedBy::release)
+        return;
+    durations_.push_back(*call.duration);
+    if (durations_.size() > durationsCompared)
+        durations_.pop_front();
+    const auto isAlike = [&](std::int64_t other) {
+        return std::abs(other - *call.duration) <= lengthTolerance;
+    };
+    if (static_cast<std::size_t>(std::count_if(durations_.begin(), durations_.end(), isAlike)) <
+            callsOfOneLength ||
+        std::any_of(lengthsSaid_.begin(), lengthsSaid_.end(), isAlike))
+        return;
+    lengthsSaid_.push_back(*call.duration);
+    if (lengthsSaid_.size() > durationsCompared)
+        lengthsSaid_.pop_front();
+    sink_.report(findingOf(findings::sameDuration, call.end, call,
+                           std::to_string(callsOfOneLength) + " of the last calls ended after " +
+                               std::to_string((*call.duration + second / 2) / second) + " s"));
+}
+
+void Patterns::findCauseBurst(const Call& call) {
+    if (!call.cause || call.cause->codingStandard != 0 || isOrdinary(call.cause->value) || !hasFailed(call))
+        return;
+    while (!failures_.empty() &&
+           (call.end.at - failures_.front().at > burstWindow || failures_.size() >= mostFailures))
+        failures_.pop_front();
+    const std::vector<ChannelKey> channels = channelsOf(call.channel());
+    failures_.push_back({call.end.at, call.cause->value, call.called.digits.substr(0, prefixDigits),
+                         channels.empty() ? std::string() : toString(channels.front()), call.bearer});
+    const Failure& last = failures_.back();
+    if (const auto said = burstSaid_.find(last.cause);
+        said != burstSaid_.end() && last.at - said->second < burstSilence)
+        return;
+    const auto alike = [&](std::string Failure::*property) {
+        return !(last.*property).empty() &&
+               static_cast<std::size_t>(
+                   std::count_if(failures_.begin(), failures_.end(), [&](const Failure& each) {
+                       return each.cause == last.cause && each.*property == last.*property;
+                   })) >= callsOfABurst;
+    };
+    std::string common;
+    if (alike(&Failure::prefix))
+        common = "to numbers that begin with \"" + last.prefix + "\"";
+    else if (alike(&Failure::channel))
+        common = "on channel " + last.channel;
+    else if (alike(&Failure::bearer))
+        common = "with bearer " + last.bearer;
+    else
+        return;
+    burstSaid_[last.cause] = last.at;
+    sink_.report(findingOf(findings::causeBurst, call.end, call,
+                           "cause " + std::to_string(last.cause) + " in " + std::to_string(callsOfABurst) +
+                               " calls within a minute, " + common));
+}
+
+}  // namespace calls

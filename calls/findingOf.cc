@@ -1,0 +1,35 @@
+#include "calls/findingOf.h"
+
+#include <utility>
+
+namespace calls {
+
+Finding findingOf(const FindingKind& kind, const Moment& moment, const std::string& dChannel,
+                  std::string sentence) {
+    Finding finding;
+    finding.kind = &kind;
+    finding.severity = kind.severity;
+    finding.frame = moment.frame;
+    finding.clock = moment.clock;
+    finding.time = moment.time;
+    finding.dChannel = dChannel;
+    finding.sentence = std::move(sentence);
+    return finding;
+}
+
+Finding findingOf(const FindingKind& kind, const Message& message, const Call* call, std::string sentence) {
+    const capture::Interface* const interface = message.frame->interface;
+    Finding finding = findingOf(kind, momentOf(message),
+                                interface == nullptr ? std::string() : interface->name, std::move(sentence));
+    if (call != nullptr)
+        finding.call = call->number;
+    return finding;
+}
+
+Finding findingOf(const FindingKind& kind, const Moment& moment, const Call& call, std::string sentence) {
+    Finding finding = findingOf(kind, moment, call.dChannel, std::move(sentence));
+    finding.call = call.number;
+    return finding;
+}
+
+}  // namespace calls

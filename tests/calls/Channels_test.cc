@@ -1,0 +1,168 @@
+#include "calls/Channels.h"
+
+#include <gtest/gtest.h>
+
+#include "tests/calls/analysed.h"
+
+namespace calls {
+
+namespace {
+
+using namespace test;
+namespace m = isdn::message;
+
+// A call of our side on a channel, answered; nothing clears it.
+CallScript& talk(CallScript& script, std::uint16_t ref, std::uint8_t number) {
+    script.us(m::setup, ref, false, {bearerSpeech(), channel(number)});
+    script.peer(m::callProceeding, ref, true, {channel(number)});
+    script.peer(m::connect, ref, true);
+    return script.us(m::connectAcknowledge, ref, false);
+}
+
+CallScript& clear(CallScript& script, std::uint16_t ref) {
+    script.us(m::disconnect, ref, false, {cause(16)});
+    script.peer(m::release, ref, true);
+    return script.us(m::releaseComplete, ref, false);
+}
+
+}  // namespace
+
+TEST(Channels, AreFreeForTheNextCallOnceTheLastHasEnded) {
+    CallScript script;
+    talk(script.at(0), 1, 30);
+    clear(script.at(5000), 1);
+    talk(script.at(5100), 2, 30);
+    EXPECT_EQ(findingsIn(script, 1000), "");
+}
+
+TEST(Channels, GivenToTwoCallsAreFound) {
+    CallScript script;
+    talk(script.at(0), 1, 30);
+    talk(script.at(5000), 2, 30);
+    EXPECT_EQ(findingsIn(script, 1000), "6 double-seizure\n");
+}
+
+TEST(Channels, MayBeGivenAwayJustBeforeTheOldCallIsSeenToEnd) {
+    CallScript script;
+    talk(script.at(0), 1, 30);
+    script.at(5000).us(m::disconnect, 1, false, {cause(16)});
+    script.at(5010).peer(m::release, 1, true);
+    script.at(5012).us(m::setup, 2, false, {bearerSpeech(), channel(30)});
+    script.at(5016).peer(m::callProceeding, 2, true, {channel(30)});
+    script.at(5020).us(m::releaseComplete, 1, false);
+    EXPECT_EQ(findingsIn(script, 1000), "");
+}
+
+TEST(Channels, AreFreeWhileTheirCallIsOnHold) {
+    CallScript script;
+    talk(script.at(0), 1, 30);
+    script.at(3000).us(m::hold, 1, false);
+    script.at(3010).peer(m::holdAcknowledge, 1, true);
+    talk(script.at(4000), 2, 30);
+    EXPECT_EQ(findingsIn(script, 1000), "");
+}
+
+TEST(Channels, ThatBothSidesTakeAtOnceAreANoteIfOneGivesWay) {
+    CallScript script;
+    script.at(0).crossing();
+    script.us(m::setup, 1, false, {bearerSpeech(), channel(5)});
+    script.peer(m::setup, 1, false, {bearerSpeech(), channel(5)});
+    script.at(20).us(m::callProceeding, 1, true, {channel(5)});
+    script.at(30).peer(m::releaseComplete, 1, true, {cause(44)});
+    EXPECT_EQ(findingsIn(script), "4 glare\n");
+}
+
+TEST(Channels, ThatBothSidesTakeAtOnceAreANoteIfOneIsMoved) {
+    CallScript script;
+    script.at(0).crossing();
+    script.us(m::setup, 1, false, {bearerSpeech(), channel(5, false)});
+    script.peer(m::setup, 1, false, {bearerSpeech(), channel(5)});
+    script.at(20).us(m::callProceeding, 1, true, {channel(5)});
+    script.at(30).peer(m::callProceeding, 1, true, {channel(6)});
+    EXPECT_EQ(findingsIn(script), "4 glare\n");
+}
+
+TEST(Channels, ThatBothSidesTakeAndKeepAreAWarning) {
+    CallScript script;
+    script.at(0).crossing();
+    script.us(m::setup, 1, false, {bearerSpeech(), channel(5)});
+    script.peer(m::setup, 1, false, {bearerSpeech(), channel(5)});
+    script.at(20).us(m::callProceeding, 1, true, {channel(5)});
+    script.at(30).peer(m::callProceeding, 1, true, {channel(5)});
+    EXPECT_EQ(findingsIn(script, 100), "4 glare-persists\n");
+}
+
+TEST(Channels, AreNoGlareIfTheSecondSideHadSeenTheFirst) {
+    CallScript script;
+    script.at(0).us(m::setup, 1, false, {bearerSpeech(), channel(5)});
+    script.at(10).peer(m::setup, 1, false, {bearerSpeech(), channel(5)});
+    script.at(20).us(m::releaseComplete, 1, true, {cause(44)});
+    EXPECT_EQ(findingsIn(script), "");
+}
+
+TEST(Channels, RefusedAlthoughIdleAreAWarningAndTheSecondTimeStuck) {
+    CallScript script;
+    talk(script.at(0), 1, 30);
+    clear(script.at(1000), 1);
+    script.at(2000).us(m::setup, 2, false, {bearerSpeech(), channel(30)});
+    script.at(2010).peer(m::releaseComplete, 2, true, {cause(44)});
+    script.at(3000).us(m::setup, 3, false, {bearerSpeech(), channel(30)});
+    script.at(3010).peer(m::releaseComplete, 3, true, {cause(44)});
+    EXPECT_EQ(findingsIn(script), "9 channel-refused-idle\n11 stuck-channel\n");
+}
+
+TEST(Channels, RefusedWhileNothingIsKnownOfThemAreNoFinding) {
+    CallScript script;
+    script.at(2000).us(m::setup, 2, false, {bearerSpeech(), channel(30)});
+    script.at(2010).peer(m::releaseComplete, 2, true, {cause(44)});
+    EXPECT_EQ(findingsIn(script), "");
+}
+
+TEST(Channels, WhoseCallWasReplacedAreStuckUntilTheyAreRestarted) {
+    CallScript script;
+    talk(script.at(0), 1, 30);
+    script.at(5000).us(m::setup, 1, false, {bearerSpeech(), channel(29)});
+    script.at(5010).peer(m::releaseComplete, 1, true, {cause(17)});
+    EXPECT_EQ(findingsIn(script), "5 reference-in-use\n5 stuck-channel\n");
+    script.at(9000).us(m::restart, 0, false, {channel(30), restartIndicator(0)});
+    script.at(9010).peer(m::restartAcknowledge, 0, true, {channel(30), restartIndicator(0)});
+    EXPECT_EQ(findingsIn(script), "5 reference-in-use\n");
+}
+
+TEST(Channels, OfALongCallOrThatNobodyUsesAreNeverStuck) {
+    CallScript script;
+    talk(script.at(0), 1, 30);
+    EXPECT_EQ(findingsIn(script, std::int64_t{3} * 86400 * 1000), "");
+}
+
+TEST(Channels, OutOfServiceAreNotToBeTaken) {
+    CallScript script;
+    const Bytes outOfService{0x01, 0x01, 0xC2}, inService{0x01, 0x01, 0xC0};
+    script.at(0).maintenance(Side::peer, m::service, false, {outOfService, channel(7)});
+    script.at(10).maintenance(Side::us, m::serviceAcknowledge, true, {outOfService, channel(7)});
+    script.at(20).us(m::setup, 1, false, {bearerSpeech(), channel(7)});
+    script.at(30).peer(m::releaseComplete, 1, true, {cause(44)});
+    EXPECT_EQ(findingsIn(script), "3 channel-out-of-service\n");
+    script.at(40).maintenance(Side::peer, m::service, false, {inService, channel(7)});
+    script.at(50).maintenance(Side::us, m::serviceAcknowledge, true, {inService, channel(7)});
+    talk(script.at(60), 2, 7);
+    EXPECT_EQ(findingsIn(script), "3 channel-out-of-service\n");
+}
+
+TEST(Channels, TakenInOneOrderByBothSidesAreProneToGlare) {
+    for (const bool peerGoesDown : {false, true}) {
+        CallScript script;
+        for (std::uint16_t i = 0; i < 25; ++i) {
+            const auto up = static_cast<std::uint8_t>(1 + i);
+            const auto down = static_cast<std::uint8_t>(31 - i);
+            script.at(i * 1000).us(m::setup, i + 1, false, {bearerSpeech(), channel(up)});
+            script.peer(m::releaseComplete, i + 1, true, {cause(17)});
+            script.at(i * 1000 + 500);
+            script.peer(m::setup, i + 1, false, {bearerSpeech(), channel(peerGoesDown ? down : up)});
+            script.us(m::releaseComplete, i + 1, true, {cause(17)});
+        }
+        EXPECT_EQ(findingsIn(script), peerGoesDown ? "" : "83 glare-prone\n");
+    }
+}
+
+}  // namespace calls

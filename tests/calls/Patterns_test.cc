@@ -1,0 +1,95 @@
+#include "calls/Patterns.h"
+
+#include <gtest/gtest.h>
+
+#include "tests/calls/analysed.h"
+
+namespace calls {
+
+namespace {
+
+using namespace test;
+namespace m = isdn::message;
+
+void call(CallScript& script, std::int64_t begin, std::uint16_t ref, std::int64_t length) {
+    script.at(begin).us(m::setup, ref, false, {bearerSpeech()});
+    script.at(begin + 10).peer(m::connect, ref, true);
+    script.at(begin + 10 + length).us(m::disconnect, ref, false, {cause(16)});
+    script.at(begin + 20 + length).peer(m::release, ref, true);
+    script.at(begin + 30 + length).us(m::releaseComplete, ref, false);
+}
+
+void failedCall(CallScript& script, std::int64_t begin, std::uint16_t ref, const std::string& number,
+                std::uint8_t value) {
+    script.at(begin).us(m::setup, ref, false, {called(number)});
+    script.at(begin + 10).peer(m::releaseComplete, ref, true, {cause(value, 2)});
+}
+
+std::string patternsIn(const CallScript& script) {
+    Collected collected;
+    Analysis analysis({}, collected);
+    std::uint64_t number = 0;
+    for (const Sent& sent : script.frames())
+        analysis.take(sent.frame, ++number);
+    analysis.finish();
+    std::string lines;
+    for (const Finding& finding : collected.findings) {
+        if (finding.kind->id != "element-absent")
+            lines += std::string(finding.kind->id) + "\n";
+    }
+    return lines;
+}
+
+}  // namespace
+
+TEST(Patterns, NoteCallsThatAllEndAfterTheSameTime) {
+    CallScript script;
+    for (std::uint16_t i = 0; i < 4; ++i)
+        call(script, i * 2000000, i + 1, 1800000 + i * 100);
+    EXPECT_EQ(patternsIn(script), "");
+    call(script, 9000000, 5, 1800200);
+    EXPECT_EQ(patternsIn(script), "same-duration\n");
+}
+
+TEST(Patterns, AreSilentOnCallsOfVariousLengths) {
+    CallScript script;
+    std::int64_t begin = 0;
+    for (std::uint16_t i = 0; i < 100; ++i) {
+        const std::int64_t length = 11000 + std::int64_t{i} * 7919 % 400 * 1000;
+        call(script, begin, i + 1, length);
+        begin += length + 1000;
+    }
+    EXPECT_EQ(patternsIn(script), "");
+}
+
+TEST(Patterns, FindOneCauseInManyCallsWithSomethingInCommon) {
+    CallScript script;
+    for (std::uint16_t i = 0; i < 5; ++i)
+        failedCall(script, i * 5000, i + 1, "003312" + std::to_string(i), 34);
+    EXPECT_EQ(patternsIn(script), "cause-burst\n");
+}
+
+TEST(Patterns, AreSilentWhenNothingIsCommonOrTheCauseIsOrdinary) {
+    CallScript script;
+    for (std::uint16_t i = 0; i < 5; ++i) {
+        failedCall(script, i * 5000, i + 1, std::to_string(i) + "12345", 34);
+        failedCall(script, i * 5000 + 2000, i + 101, "003312", 17);
+    }
+    EXPECT_EQ(patternsIn(script), "");
+}
+
+TEST(Patterns, FindCallsThatEndTogetherWithTheLink) {
+    CallScript script;
+    for (std::uint16_t i = 1; i <= 3; ++i) {
+        script.at(i * 100).us(m::setup, i, false, {bearerSpeech()});
+        script.at(i * 100 + 10).peer(m::connect, i, true);
+    }
+    script.at(5000).raw(Side::peer, true, {0x53});     // DISC, P = 1
+    script.at(5010).raw(Side::us, false, {0x73});      // UA, F = 1
+    script.at(200000).raw(Side::us, true, {0x7F});     // SABME, P = 1
+    script.at(200010).raw(Side::peer, false, {0x73});  // UA, F = 1
+    script.at(300000).us(m::setup, 9, false, {bearerSpeech()});
+    EXPECT_NE(patternsIn(script).find("mass-clear\n"), std::string::npos) << patternsIn(script);
+}
+
+}  // namespace calls
