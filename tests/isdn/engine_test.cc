@@ -168,4 +168,24 @@ TEST(Values, AgreeWithTheFieldsOfTheTables) {
     }
 }
 
+// A row may cite a standard of its own.
+TEST(Fields, CiteTheirClauses) {
+    const auto octets = hex("08 02 82 91");
+    Fields fields;
+    fieldsOf(*Elements(octets).begin(), Variant::net5, fields);
+    ASSERT_NE(fields.find("location"), nullptr);
+    EXPECT_EQ(fields.find("location")->clause, "Q.850 2.2");
+    EXPECT_EQ(fields.find("cause value")->clause, "Q.850 table 1");
+    for (const char* text : elements) {
+        const auto whole = hex(text);
+        Fields all;
+        fieldsOf(*Elements(whole).begin(), Variant::ni2, all);
+        for (const Field& field : all) {
+            EXPECT_FALSE(field.clause.empty()) << text << " " << field.name;
+            EXPECT_FALSE(field.octet.empty()) << text << " " << field.name;
+            EXPECT_FALSE(field.name.empty()) << text << " " << field.octet;
+        }
+    }
+}
+
 }  // namespace
