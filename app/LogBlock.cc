@@ -3,11 +3,13 @@
 #include <algorithm>
 #include <iterator>
 
+#include "decoder/log_lines.h"
+
 namespace app {
 
 namespace {
 
-std::string gapLine(unsigned long frames) { return "Frames Lost: " + std::to_string(frames) + " \n"; }
+std::string gapLine(unsigned long frames) { return decoder::framesLost + std::to_string(frames) + " \n"; }
 
 }  // namespace
 

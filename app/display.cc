@@ -12,6 +12,7 @@
 #include "decoder/cursor.h"
 #include "decoder/frame.h"
 #include "decoder/lines.h"
+#include "decoder/log_lines.h"
 #include "decoder/time_lines.h"
 
 namespace app {
@@ -49,7 +50,7 @@ std::unique_ptr<Record> takeRecord() {
         return nullptr;
     Record* taken = nullptr;
     if (!event_queue.dequeue(&taken)) {
-        decoder::text("Get iemsg failed \n");
+        decoder::text(decoder::getFailed);
         decoder::flushLines();
     }
     return std::unique_ptr<Record>(taken);
@@ -111,7 +112,7 @@ void HANDLE_L2Trace_events(vela::CCS*, unsigned int, Record* rec) {
             static_cast<void>(held.release());  // the queue's entry's now
             sema.post();
         } else {
-            decoder::text("Enqueue Failed \n");
+            decoder::text(decoder::enqueueFailed);
             decoder::flushLines();
         }
     });

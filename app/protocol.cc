@@ -3,18 +3,20 @@
 #include <algorithm>
 #include <array>
 
+#include "decoder/log_lines.h"
+
 namespace app {
 
 namespace {
 
 // clang-format off
 constexpr std::array Protocols{
-    Protocol{ 1,  1, "4ESS Switch ",  "4ESS Switch \n"},
-    Protocol{ 2,  2, "5ESS Switch ",  "5ESS Switch \n"},
-    Protocol{ 3,  3, "DMS100 Switch", "DMS100 Switch \n"},
-    Protocol{ 4,  4, "NTT Switch",    "NTT Switch \n"},
-    Protocol{ 7,  7, "NET5 Switch",   "NET5 Switch \n"},
-    Protocol{12, 10, "NI2 Switch",    "NI2 Switch \n"},
+    Protocol{ 1,  1, "4ESS Switch ",  decoder::variantLine(1)},
+    Protocol{ 2,  2, "5ESS Switch ",  decoder::variantLine(2)},
+    Protocol{ 3,  3, "DMS100 Switch", decoder::variantLine(3)},
+    Protocol{ 4,  4, "NTT Switch",    decoder::variantLine(4)},
+    Protocol{ 7,  7, "NET5 Switch",   decoder::variantLine(7)},
+    Protocol{12, 10, "NI2 Switch",    decoder::variantLine(10)},
 };
 // clang-format on
 

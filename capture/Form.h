@@ -13,7 +13,7 @@ namespace capture {
 
 struct ReadOptions {
     bool follow = false;
-    std::string trunk;                   // the D channel's name, in place of what the input says
+    std::string trunk{};                 // the D channel's name, in place of what the input says
     Variant variant = Variant::unknown;  // in place of what the input says
 };
 

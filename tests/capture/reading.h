@@ -3,6 +3,7 @@
 #define TESTS_CAPTURE_READING_H
 
 #include <stdlib.h>
+#include <sys/mman.h>
 #include <unistd.h>
 
 #include <gtest/gtest.h>
@@ -39,6 +40,22 @@ class Folder {
 
   private:
     std::string path_;
+};
+
+// A file that exists in memory alone.
+class MemoryFile {
+  public:
+    explicit MemoryFile(std::string_view content) : file_(memfd_create("test", MFD_CLOEXEC)) {
+        EXPECT_EQ(::write(file_, content.data(), content.size()), static_cast<ssize_t>(content.size()));
+    }
+    ~MemoryFile() { ::close(file_); }
+    MemoryFile(const MemoryFile&) = delete;
+    MemoryFile& operator=(const MemoryFile&) = delete;
+
+    std::string path() const { return "/proc/self/fd/" + std::to_string(file_); }
+
+  private:
+    int file_;
 };
 
 inline std::string hexOf(std::span<const std::uint8_t> octets) {
@@ -89,7 +106,7 @@ inline std::string itemsOf(Reader& reader) {
 }
 
 // Also what it throws: "! ...", with the path left out.
-inline std::string itemsIn(const std::string& path, ReadOptions options = {},
+inline std::string itemsIn(const std::string& path, const ReadOptions& options = {},
                            std::span<const Form> known = forms()) {
     try {
         return itemsOf(*openReader(path, options, known));

@@ -1,0 +1,43 @@
+// Finds the frame that a text of the log shows, and proves it.
+#ifndef LAPDLOG_PROVER_H
+#define LAPDLOG_PROVER_H
+
+#include <cstdint>
+#include <span>
+#include <string_view>
+#include <vector>
+
+#include "capture/Frame.h"
+#include "lapdlog/headers.h"
+
+namespace lapdlog {
+
+// A frame is proved when decoding its dump gives the text, octet by octet. Display texts may hold anything,
+// also another dump; so the dump is the first one that proves. Uses the decoder's words of its thread.
+class Prover {
+  public:
+    struct Proof {
+        Reading reading = Reading::bad;  // cut: more text could still prove
+        bool isOversized = false;
+        bool isDoubtful = false;  // the text ends where the dump could have another line
+        bool sawDump = false;     // a whole one
+        std::size_t size = 0;     // of the text, when good
+        // Valid until the next call. Of a text that is not proved: those of a dump in which it ends.
+        std::span<const std::uint8_t> octets;
+    };
+
+    // `text` begins behind the time lines. `isAll`: no more of it will come.
+    Proof prove(std::string_view text, bool transmitted, capture::Variant variant, bool isAll);
+
+  private:
+    enum class Dump : std::uint8_t { whole, wholeSoFar, cut, bad };
+
+    Dump readDump(std::string_view text, std::size_t& at, bool transmitted);
+    std::string_view decode(bool transmitted, capture::Variant variant);
+
+    std::vector<std::uint8_t> octets_;
+};
+
+}  // namespace lapdlog
+
+#endif
