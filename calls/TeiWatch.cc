@@ -10,7 +10,7 @@ namespace calls {
 namespace {
 
 // Message types of Q.921 table 8.
-constexpr std::uint8_t assigned = 2, denied = 3, checkResponse = 5, removed = 6;
+constexpr std::uint8_t assigned = 2, denied = 3, checkRequest = 4, checkResponse = 5, removed = 6;
 
 }  // namespace
 
@@ -38,6 +38,12 @@ void TeiWatch::take(const Sample& sample, std::int64_t longest, std::vector<Obse
                 assigned_ = Observation{&findings::teiAssigned, findings::teiAssigned.severity, sample.number,
                                         sample.at, "the network assigned TEI " + tei + " on a primary rate"};
             break;
+        case checkRequest:
+            if (message.action == isdn::groupTei)
+                answers_ = {};
+            else
+                answers_[message.action] = {};
+            break;
         case checkResponse:
             answers(sample, message, longest, found);
             break;
@@ -46,7 +52,8 @@ void TeiWatch::take(const Sample& sample, std::int64_t longest, std::vector<Obse
     }
 }
 
-// Terminals choose Ri at random: two values for one TEI are two terminals.
+// A terminal chooses Ri at random for each answer: two values for one TEI in answers to one check are two
+// terminals.
 void TeiWatch::answers(const Sample& sample, const isdn::TeiMessage& message, std::int64_t longest,
                        std::vector<Observation>& found) {
     Answer& answer = answers_[message.action];

@@ -14,8 +14,8 @@ namespace calls {
 
 class TeiWatch {
   public:
-    // Takes a UI frame of management and appends what it shows. `longest` (T201) is how far apart the answers
-    // to one check may be.
+    // Takes a UI frame of management and appends what it shows. `longest` (T201) is how long after a check
+    // its answers may come.
     void take(const Sample& sample, std::int64_t longest, std::vector<Observation>& found);
     // The D channel is one of a primary rate: TEIs need not be assigned there. Gives the first that was.
     std::optional<Observation> isPrimary();

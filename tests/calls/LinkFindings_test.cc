@@ -384,6 +384,7 @@ TEST(Tei, IsDoubledWhenTwoTerminalsAnswerForIt) {
     const std::string check = "0 < sapi 63 UI = 0F 00 00 04 81\n0.1 > sapi 63 UI = 0F 11 11 05 81\n";
     EXPECT_EQ(found(check + "0.2 > sapi 63 UI = 0F 22 22 05 81\n"), "warning tei-doubled 3\n");
     EXPECT_EQ(found(check + "0.2 > sapi 63 UI = 0F 22 22 05 83\n"), "");
+    EXPECT_EQ(found(check + "0.5 < sapi 63 UI = 0F 00 00 04 FF\n0.6 > sapi 63 UI = 0F 22 22 05 81\n"), "");
     EXPECT_EQ(found(check + "1.5 < sapi 63 UI = 0F 00 00 04 81\n1.6 > sapi 63 UI = 0F 22 22 05 81\n"), "");
 }
 
