@@ -54,7 +54,7 @@ class DChannel {
     capture::Role role() const;
 
   private:
-    static constexpr std::size_t places = 64 * 128;  // SAPI and TEI
+    static constexpr std::size_t places = std::size_t{64} * 128;  // SAPI and TEI
 
     Link& linkOf(const isdn::Layer2& frame);
 

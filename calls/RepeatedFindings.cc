@@ -11,7 +11,7 @@ constexpr std::int64_t quiet = 600 * second;
 }  // namespace
 
 void RepeatedFindings::report(Finding finding, std::uint8_t tei, std::int64_t at) {
-    const auto [place, isFirst] = repeats_.try_emplace({finding.kind, finding.severity, tei}, Repeats{at});
+    const auto [place, isFirst] = repeats_.try_emplace(Key(finding.kind, finding.severity, tei), Repeats{at});
     Repeats& repeats = place->second;
     if (!isFirst && at - repeats.reported < quiet) {
         finding.count = repeats.last ? repeats.last->count + 1 : 1;

@@ -2,10 +2,10 @@
 #ifndef CALLS_REPEATEDFINDINGS_H
 #define CALLS_REPEATEDFINDINGS_H
 
-#include <compare>
 #include <cstdint>
 #include <map>
 #include <optional>
+#include <tuple>
 
 #include "calls/Finding.h"
 #include "calls/FindingSink.h"
@@ -24,12 +24,7 @@ class RepeatedFindings {
     void finish();
 
   private:
-    struct Key {
-        const FindingKind* kind;
-        Severity severity;
-        std::uint8_t tei;
-        auto operator<=>(const Key&) const = default;
-    };
+    using Key = std::tuple<const FindingKind*, Severity, std::uint8_t>;  // with the TEI
     struct Repeats {
         std::int64_t reported = 0;
         std::optional<Finding> last{};  // its count says how many it stands for
