@@ -2,6 +2,10 @@
 
 #include <gtest/gtest.h>
 
+#include <iomanip>
+#include <sstream>
+#include <string>
+
 #include "tests/isdn/hex.h"
 
 namespace {
@@ -11,15 +15,15 @@ using isdn::testing::hex;
 
 // "codeset/identifier+contents" of each element, with its problem.
 std::string outline(const Elements& elements) {
-    std::string text;
+    std::ostringstream text;
     for (const Element& element : elements) {
-        char item[40];
-        std::snprintf(item, sizeof item, "%u/%02x+%zu%s%s ", element.codeset, element.id,
-                      element.contents.size(), element.problem == Problem::none ? "" : " ",
-                      std::string(nameOf(element.problem)).c_str());
-        text += item;
+        text << unsigned{element.codeset} << "/" << std::hex << std::setw(2) << std::setfill('0')
+             << unsigned{element.id} << std::dec << "+" << element.contents.size();
+        if (element.problem != Problem::none)
+            text << " " << nameOf(element.problem);
+        text << " ";
     }
-    return text;
+    return text.str();
 }
 
 TEST(Layer3, TakesTheHeaderApart) {
@@ -34,6 +38,39 @@ TEST(Layer3, TakesTheHeaderApart) {
     EXPECT_EQ(outline(message.elements), "0/04+3 0/18+3 ");
     EXPECT_EQ(message.problem, Problem::none);
     EXPECT_EQ(message.header.size(), 5U);
+}
+
+// The flag is bit 8 of the first octet; everything else is the value (Q.931 4.3).
+TEST(Layer3, TakesAReferenceOfAnyLength) {
+    const struct {
+        const char* text;
+        unsigned length;
+        bool flag;
+        std::uint64_t value;
+    } rows[] = {
+        {"08 01 7f 05", 1, false, 0x7F},
+        {"08 01 ff 05", 1, true, 0x7F},
+        {"08 02 7f fe 05", 2, false, 0x7FFE},
+        {"08 03 c0 00 01 05", 3, true, 0x400001},
+        {"08 09 ff 01 02 03 04 05 06 07 08 05", 9, true, 0x0102030405060708},
+    };
+    for (const auto& row : rows) {
+        const auto octets = hex(row.text);
+        const Layer3 message = parseLayer3(octets);
+        EXPECT_EQ(message.callReference.length, row.length) << row.text;
+        EXPECT_EQ(message.callReference.flag, row.flag) << row.text;
+        EXPECT_EQ(message.callReference.value, row.value) << row.text;
+        EXPECT_EQ(message.type, message::setup) << row.text;
+    }
+}
+
+TEST(Layer3, FindsAnElementByIdentifierAndCodeset) {
+    const auto octets = hex("08 01 01 7b 70 02 81 31 70 02 81 32 96 70 01 80");
+    const Elements elements = parseLayer3(octets).elements;
+    EXPECT_EQ(elements.find(0x70).contents[1], '1');
+    EXPECT_EQ(elements.find(0x70, 6).contents.size(), 1U);
+    EXPECT_TRUE(elements.find(0x70, 5).octets.empty());
+    EXPECT_TRUE(elements.find(0x71).octets.empty());
 }
 
 TEST(Layer3, KnowsTheDummyAndTheGlobalReference) {

@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
+#include <iomanip>
 #include <iterator>
 #include <map>
 #include <set>
@@ -72,13 +73,10 @@ std::vector<Case> casesOf(const std::filesystem::path& path) {
 }
 
 std::string hexOf(Octets octets) {
-    std::string text;
-    char two[3];
-    for (const std::uint8_t octet : octets) {
-        std::snprintf(two, sizeof two, "%02x", octet);
-        text += two;
-    }
-    return text;
+    std::ostringstream text;
+    for (const std::uint8_t octet : octets)
+        text << std::hex << std::setw(2) << std::setfill('0') << unsigned{octet};
+    return text.str();
 }
 
 // Extension and spare bits, identifier and length are left out: other tests see that they are there.

@@ -72,4 +72,12 @@ TEST(Words, OfFrameRejects) {
     EXPECT_EQ(line, "rejected control 0b0c of a command, V(S) 0, V(R) 0 (too short)");
 }
 
+// Invoke 5 of the operation 34, charge in units during the call (EN 300 182-1), without an argument.
+TEST(Words, OfAFacilityAreThoseOfItsComponents) {
+    const auto octets = hex("1c 09 91 a1 06 02 01 05 02 01 22");
+    std::string line;
+    appendWords(line, *Elements(octets).begin(), Variant::net5);
+    EXPECT_TRUE(line.starts_with("facility invoke 5 ")) << line;
+}
+
 }  // namespace
