@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cstdint>
+#include <span>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -44,6 +45,13 @@ inline bool appendOctets(std::string_view digits, std::vector<std::uint8_t>& oct
         octets.push_back(static_cast<std::uint8_t>(high << 4 | low));
     }
     return true;
+}
+
+// Appends two lower-case digits an octet.
+inline void appendDigits(std::span<const std::uint8_t> octets, std::string& text) {
+    constexpr std::string_view digits = "0123456789abcdef";
+    for (const std::uint8_t octet : octets)
+        text += {digits[octet >> 4U], digits[octet & 15U]};
 }
 
 }  // namespace capture

@@ -301,6 +301,7 @@ void PcapngParser::readPacket(Described& on, const Packet& packet, std::string_v
     if (isOversized) {
         item.kind = Item::Kind::oversized;
         item.frame.octets = {};
+        item.count = 0;
         item.text = {};
     }
 }
