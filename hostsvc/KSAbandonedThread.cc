@@ -6,7 +6,8 @@
 
 namespace {
 
-// Stands on the creator's stack until the new thread has copied it.
+// What the new thread needs. It is on the creator's stack, and the creator waits until the new thread has
+// copied it.
 struct StartBlock {
     const KSBody& body;
     void* argument;
@@ -26,8 +27,8 @@ void create(const KSBody& body, void* arg, unsigned stackSize) {
     StartBlock block{body, arg};
     if (!ks_startDetached(KSThread_abandonRun, &block, stackSize))
         throw KSThread::CreationError();
-    // Sleeps a millisecond at a time, less when the thread is quicker. Yielding instead would cost a busy
-    // machine's whole time slices, and an idle one's processor.
+    // Sleeps a millisecond at a time; the new thread's post ends the sleep early. Yielding instead would cost
+    // whole time slices on a busy machine, and the processor on an idle one.
     while (!block.copied.tryWait(1, 1)) {
     }
 }

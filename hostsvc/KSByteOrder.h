@@ -1,9 +1,10 @@
-// Host order (little-endian) to network order and back, for runs of 32-bit words.
+// Converts 32-bit words from host order (little-endian) to network order and back.
 #ifndef HOSTSVC_KSBYTEORDER_H
 #define HOSTSVC_KSBYTEORDER_H
 
-// Both reverse each whole 32-bit word in the first nbytes octets of src into the same place of dst, which may
-// be src; octets beyond the last whole word are not touched. No alignment is needed.
+// Both functions reverse the octets of each whole 32-bit word in the first nbytes octets of src and write
+// them to the same place of dst, which may be src. Octets after the last whole word are left unchanged. The
+// pointers need no alignment.
 void KS_htonU32(void* dst, void* src, int nbytes);
 void KS_ntohU32(void* dst, void* src, int nbytes);
 

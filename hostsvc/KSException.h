@@ -1,5 +1,5 @@
-// The roots of the layer's errors. All are empty: callers tell them apart by type, and every one of them is
-// caught as a KSException.
+// The base classes of the layer's exceptions. Most hold no data: callers tell them apart by type. Every one
+// of them can be caught as a KSException.
 #ifndef HOSTSVC_KSEXCEPTION_H
 #define HOSTSVC_KSEXCEPTION_H
 

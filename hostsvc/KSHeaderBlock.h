@@ -1,4 +1,4 @@
-// A message's header as the relay protocol carries it.
+// The header of a message in the form of the relay protocol.
 #ifndef HOSTSVC_KSHEADERBLOCK_H
 #define HOSTSVC_KSHEADERBLOCK_H
 
@@ -11,11 +11,11 @@
 // processor of source and target; instance and component of source and target; body size.
 using KSHeaderBlock = std::array<std::uint32_t, 14>;
 
-// Words that go over the wire as they are.
+// Makes the block from the header of msg. Its words are already big-endian.
 KSHeaderBlock ks_headerBlock(const NvMsg32Bit& msg);
 
-// Fills msg's header, but for its size, which is its buffer's. A block of fewer octets than fourteen words
-// leaves the rest 0.
+// Sets the header of msg from a block of nbytes octets, except for the size, which is that of the buffer. If
+// the block has fewer than fourteen words, the missing ones count as 0.
 void ks_fillHeader(NvMsg32Bit& msg, const char* block, int nbytes);
 
 #endif

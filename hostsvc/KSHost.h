@@ -4,10 +4,10 @@
 
 #include <cstdint>
 
-// Once, before any queue is made. Returns the transport library's status, 0 for success.
+// Call it once, before any queue is made. Returns the transport library's status, 0 for success.
 std::uint32_t KSHostInit();
 
-// Once, at the end.
+// Call it once, at the end.
 void KSHostCleanup();
 
 #endif

@@ -10,7 +10,7 @@
 
 namespace {
 
-// The transport keeps a descriptor for each queue. Goes no further than the hard limit.
+// The transport library may keep a descriptor for each queue. The limit is not raised beyond the hard limit.
 void allowMoreOpenFiles() {
     constexpr rlim_t more = 60;
     rlimit limit{};
@@ -20,7 +20,7 @@ void allowMoreOpenFiles() {
     setrlimit(RLIMIT_NOFILE, &limit);
 }
 
-// Twice, with more open files allowed the second time.
+// Calls `attempt`, and if that fails, once more with a higher limit of open files.
 template <typename Attempt>
 std::uint32_t persistently(Attempt attempt) {
     std::uint32_t result = attempt();

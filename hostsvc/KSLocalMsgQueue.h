@@ -1,4 +1,4 @@
-// A queue of the transport library on this machine.
+// A queue of the transport library in this machine.
 #ifndef HOSTSVC_KSLOCALMSGQUEUE_H
 #define HOSTSVC_KSLOCALMSGQUEUE_H
 
@@ -6,17 +6,18 @@
 
 class KSLocalMsgQueue : public KSAbstractMsgQueue {
   public:
-    // The library gives the address; the arguments serve queues in other machines. Opening and binding are
-    // tried once more with 60 more open files allowed. Throws KSResource_CreationError, and leaves nothing
-    // open.
+    // Opens and binds a queue; the library chooses its address. The arguments are for queues in other
+    // machines and are ignored. If opening or binding fails, raises the limit of open files by 60 and tries
+    // once more. Throws KSResource_CreationError, and then leaves nothing open.
     KSLocalMsgQueue(NvCompDesc desc, unsigned a, unsigned b);
     ~KSLocalMsgQueue() override;
 
     std::uint32_t msgRead(NvMsg32Bit** out) override;
     std::uint32_t msgWrite(NvMsg32Bit* msg) override;
-    // With an empty message to the queue itself, once. Without memory for one the closing itself has to do.
+    // Sends an empty message to the queue itself, the first time it is called. If there is no memory for the
+    // message, only close() wakes the reader.
     void wakeReader() override;
-    // Fails an assertion when the library does not give the queue back.
+    // Ends the process through a failed assertion when the library does not unbind or close the queue.
     void close() override;
 
   private:

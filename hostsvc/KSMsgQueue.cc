@@ -36,9 +36,10 @@ KSMsgQueue::KSMsgQueue(NvCompDesc desc, unsigned a, unsigned b, const char* host
     reader_.start(nullptr);
 }
 
-// The reader is woken and seen off before the transport's queue goes, so that it is never about to read a
-// queue that is gone. One that stays away (no memory to wake it, or busy in a callback) is waited for after
-// that: closing the queue wakes it too, and a cancelled reader reads no more.
+// Wakes the cancelled reader thread and waits for its end before the transport's queue is closed, so that the
+// reader does not read a queue that is gone. If the reader does not end in time (no memory to wake it, or it
+// is busy in a callback), the queue is closed first: closing wakes the reader too, and a cancelled reader
+// does not read again.
 KSMsgQueue::~KSMsgQueue() {
     reader_.cancel();
     transport_->wakeReader();
@@ -64,8 +65,10 @@ void KSMsgQueue::registerAsyncCallback(AsyncCallback callback) {
         next.deliver(parked);
 }
 
-// Lets the reader know the receivers, unless a message is parked: that one is returned for them, and the
-// reader does not know them yet, so that it cannot call them at the same time or with a later message first.
+// If no message is parked, sets the receivers for the reader thread and returns null. Otherwise returns the
+// parked message, which the caller gives to the receivers before it calls install() again. Until then the
+// reader thread does not know the receivers, so it cannot call them at the same time or with a later message
+// first.
 NvMsg32Bit* KSMsgQueue::install(const Receivers& next) {
     const std::lock_guard lock(guard_);
     if (next.none() || !messageAvailable_.tryLock()) {
@@ -92,7 +95,7 @@ KSMsgRef KSMsgQueue::request(KSMsgRef& msg, unsigned timeoutMs, unsigned replyTy
 void KSMsgQueue::expect(const Expected& reply) {
     const std::lock_guard lock(guard_);
     expected_ = reply;
-    replyLock_.tryLock();  // held now, whatever an earlier request left
+    replyLock_.tryLock();  // an earlier request may have left it locked or unlocked; now it is locked
     waiting_ = true;
     if (lost_)
         replyLock_.unlock();
@@ -104,28 +107,30 @@ KSMsgRef KSMsgQueue::takeReply() {
     return KSMsgRef(std::exchange(reply_, nullptr));
 }
 
-// A reply that came since the last look stays: the reader hands it on when it meets it.
+// A reply that arrived between the last try and this call stays in reply_. The reader thread hands it on when
+// a message arrives during the next request.
 KSMsgRef KSMsgQueue::giveUp() {
     const std::lock_guard lock(guard_);
     waiting_ = false;
     return {};
 }
 
-// A connection that is lost ends the reader, not the program: what was received stays good. Every failure has
-// been reported.
+// A lost connection ends the reader thread but not the program, because what has been received is still good.
+// msgRead has reported every failure.
 void* KSMsgQueue::readerBody(void* control, void* arg) {
     try {
         readNroute(static_cast<KSThread::control*>(control), static_cast<char*>(arg));
     } catch (const KSRemoteService_ComFailure& lost) {
         std::cerr << "The connection to the remote message queue on " + std::string(lost.hostName()) +
                          " is lost\n"
-                  << std::flush;  // in one piece: other queues may say the same
+                  << std::flush;  // written in one piece, because other queues may report at the same time
         lose();
     }
     return nullptr;
 }
 
-// Whoever waits for a reply, waits no longer.
+// Notes that the connection is lost, wakes the request that waits for a reply, and calls the registered
+// function.
 void KSMsgQueue::lose() {
     void (*callback)(void*) = nullptr;
     {
@@ -162,7 +167,7 @@ void KSMsgQueue::readNroute(KSThread::control* control, char* /*arg*/) {
         if (!failed)
             route(*control, current);
         else if (wasFailing)
-            ks_sleep_ms(PollMs);  // a transport that is gone must not take the processor with it
+            ks_sleep_ms(PollMs);  // otherwise a transport that always fails would use up the processor
         control->testCancel();
     }
 }
@@ -171,7 +176,7 @@ std::uint32_t KSMsgQueue::read(KSThread::control& control, NvMsg32Bit*& current)
     try {
         return transport_->msgRead(&current);
     } catch (const KSRemoteService_ComFailure&) {
-        control.popCleanup(1);  // while there still is what it cleans up
+        control.popCleanup(1);  // `current` is about to go out of scope
         throw;
     }
 }
@@ -185,14 +190,15 @@ void KSMsgQueue::route(KSThread::control& control, NvMsg32Bit*& msg) {
         control.pushCleanup(KSMsgQueueThread_Cleanup, static_cast<void*>(&late));
         handOn(control, late);
         control.popCleanup(0);
-        accepted = acceptReply(msg, late);  // the slot is empty now: nobody else fills it
+        accepted = acceptReply(msg, late);  // reply_ is empty now, and only this thread fills it
     }
     if (!accepted)
         handOn(control, msg);
 }
 
-// While a request waits, a reply in the slot is one that an earlier request gave up on: it is taken out into
-// `late` and goes first, and msg is not looked at yet.
+// Gives msg to the request that waits, if it is the expected reply. If reply_ still holds the late reply to
+// an earlier request, moves that to `late`, does not look at msg and returns false; the caller hands `late`
+// on and calls again.
 bool KSMsgQueue::acceptReply(NvMsg32Bit*& msg, NvMsg32Bit*& late) {
     const std::lock_guard lock(guard_);
     if (!waiting_)
@@ -202,7 +208,8 @@ bool KSMsgQueue::acceptReply(NvMsg32Bit*& msg, NvMsg32Bit*& late) {
         return false;
     reply_ = std::exchange(msg, nullptr);
     waiting_ = false;
-    replyLock_.unlock();  // still guarded, or a request that begins just now would take it for its own
+    replyLock_
+        .unlock();  // under guard_: otherwise a request that begins now could take this signal for its own
     return true;
 }
 
@@ -212,8 +219,8 @@ bool KSMsgQueue::Expected::matches(const KSMsgRef& msg) const {
            (anySource || descComp(msg.getSrcAddr(), source));
 }
 
-// Takes over msg. Waits while there is no receiver and the slot is taken; a receiver that is registered
-// meanwhile gets the message.
+// Gives msg to the receivers, or parks it when there are none. Waits while there is no receiver and another
+// message is parked. Takes msg over.
 void KSMsgQueue::handOn(KSThread::control& control, NvMsg32Bit*& msg) {
     Receivers to = receivers();
     while (to.none()) {
@@ -225,7 +232,8 @@ void KSMsgQueue::handOn(KSThread::control& control, NvMsg32Bit*& msg) {
     to.deliver(std::exchange(msg, nullptr));
 }
 
-// Fills the slot, which is the caller's; with a receiver there, gives it back and leaves msg alone.
+// Parks msg. The caller has locked slotFree_. If a receiver has been registered meanwhile, unlocks slotFree_,
+// leaves msg with the caller and returns false.
 bool KSMsgQueue::park(NvMsg32Bit*& msg) {
     const std::lock_guard lock(guard_);
     if (!receivers_.none()) {

@@ -1,4 +1,4 @@
-// The host's mailbox on the board's message network.
+// A host queue: where a host sends commands from and receives replies and events.
 #ifndef HOSTSVC_KSMSGQUEUE_H
 #define HOSTSVC_KSMSGQUEUE_H
 
@@ -13,61 +13,67 @@
 #include "hostsvc/KSRunnable.h"
 #include "hostsvc/KSThread.h"
 
-// A clean-up routine: frees the message that *slot, an NvMsg32Bit*, points at, and forgets it.
+// A clean-up routine. `slot` points to an NvMsg32Bit*; the routine frees the message, if there is one, and
+// sets the pointer to null.
 void* KSMsgQueueThread_Cleanup(void* slot);
 
-// A reader thread takes every message off the transport's queue and gives it to the request that waits for
-// exactly this reply, else to the asynchronous receiver, else parks it for a synchronous reader. Messages
-// have one owner throughout, who frees them. One request with a time-out may be outstanding at a time.
+// The queue's reader thread reads every message from the transport. It gives the message to the request that
+// waits for this reply; otherwise to the registered receiver; and if there is no receiver, it parks the
+// message for a synchronous reader. A message has one owner at any time, who frees it. One request with a
+// time-out may wait at a time.
 class KSMsgQueue : private KSRunnable {
   public:
     class CreationError : public KSResource_CreationError {};
     using AsyncCallback = int (*)(KSMsgRef&);
     using AsyncMember = int (KSAsyncMsgReceiver::*)(KSMsgRef&);
 
-    // Replies of this type answer any request of their transaction.
+    // A reply of this type answers a request of its transaction whatever reply type the request expects.
     static constexpr unsigned GeneralReply = 0x800001;
 
-    // Opens the transport's queue and starts the reader. hostName is the machine to reach the board through;
-    // null leaves the choice to the environment. desc, a and b matter to a queue in another machine alone.
-    // Throws KSResource_CreationError.
+    // Opens the transport's queue and starts the reader thread. hostName is the machine with the board's
+    // relay; null leaves the choice to the environment (KSTransportChoice.h). desc, a and b are only used for
+    // a queue in another machine. Throws KSResource_CreationError.
     KSMsgQueue(NvCompDesc desc, unsigned a, unsigned b, const char* hostName);
     KSMsgQueue(const KSMsgQueue&) = delete;
     KSMsgQueue& operator=(const KSMsgQueue&) = delete;
-    // Ends the reader, closes the transport's queue and frees what nobody has taken. Not from a callback.
+    // Ends the reader thread, closes the transport's queue and frees the messages that nobody has taken. A
+    // callback must not destroy its queue.
     virtual ~KSMsgQueue();
 
     NvCompDesc getHostDesc() const { return hostDesc_; }
 
-    // Whoever gets a message on the reader thread from now on. The receiver owns the message; the result is
-    // ignored. The member replaces the plain callback and any receiver before it. A message that was parked
-    // goes to the receiver first, before this returns and on the thread that calls. One thread registers at a
+    // Registers the receiver: from now on the reader thread calls its member for each message that is no
+    // awaited reply. The receiver owns the message; the result of the member is ignored. Replaces the
+    // receiver and the plain callback that were registered before. If a message is parked, this function
+    // gives it to the receiver before it returns, on the calling thread. Only one thread may register at a
     // time.
     void registerAsyncCallback(void* receiver, AsyncMember callback);
-    // Beside a receiver, a plain callback is called first and must leave the message alone.
+    // Registers a plain callback. If there is also a receiver, the callback is called first and must neither
+    // keep nor free the message; otherwise it owns the message.
     void registerAsyncCallback(AsyncCallback callback);
 
-    // Called once, on the reader thread, when the connection to another machine is lost: nothing will arrive
-    // any more, and requests are not waited for. At once and on the thread that calls when it is lost
-    // already.
+    // Registers a function that is called once when the connection to another machine is lost, on the reader
+    // thread. From then on nothing arrives, and requests do not wait. If the connection is lost already, the
+    // function is called at once, on the calling thread.
     void registerLost(void (*callback)(void*), void* argument);
 
-    // Sends msg, which is taken over (the handle becomes empty), with this queue as its source. With a
-    // time-out, waits for the reply of its transaction and of replyType (or 0, or GeneralReply), from msg's
-    // target unless anySource is not 0: an empty handle when none came in time. Without one, returns a new
-    // message with an empty body at once. The caller frees what is returned. Throws
-    // KSMsgRef::AllocationError.
+    // Sends msg with this queue as its source. Takes the message over: the handle becomes empty. If timeoutMs
+    // is not 0, waits for a reply with the same transaction and with replyType, type 0 or GeneralReply. The
+    // reply must come from msg's target, unless anySource is not 0. Returns an empty handle when no reply
+    // came in time. If timeoutMs is 0, returns a new message with an empty body at once. The caller frees the
+    // returned message. Throws KSMsgRef::AllocationError.
     KSMsgRef request(KSMsgRef& msg, unsigned timeoutMs, unsigned replyType, int anySource);
 
-    // The reader thread's body. Does not return; ends the thread when it is cancelled. Throws
-    // KSRemoteService_ComFailure when the connection to another machine is lost.
+    // The body of the reader thread. It does not return: it ends the thread when the thread is cancelled, or
+    // throws KSRemoteService_ComFailure when the connection to another machine is lost.
     void readNroute(KSThread::control* control, char* arg);
 
   protected:
-    // For a synchronous reader: lock messageAvailable_, take unclaimed_, unlock slotFree_.
+    // The parked message. A synchronous reader locks messageAvailable_, takes unclaimed_, and unlocks
+    // slotFree_.
     NvMsg32Bit* unclaimed_ = nullptr;
-    KSMutex messageAvailable_;  // held while unclaimed_ is empty
-    KSMutex slotFree_;          // held while it is not
+    KSMutex messageAvailable_;  // locked while no message is parked
+    KSMutex slotFree_;          // locked while a message is parked
 
   private:
     friend struct KSMsgQueueProbe;  // for tests: moments of a request that cannot be timed
@@ -90,12 +96,12 @@ class KSMsgQueue : private KSRunnable {
         void deliver(NvMsg32Bit* msg) const;
     };
 
-    // The requester's half.
+    // Called on the thread that makes the request.
     void expect(const Expected& reply);
     KSMsgRef takeReply();
     KSMsgRef giveUp();
 
-    // The reader's half, on its thread alone.
+    // Called on the reader thread only; install() and receivers() also on the thread that registers.
     void* readerBody(void* control, void* arg);
     std::uint32_t read(KSThread::control& control, NvMsg32Bit*& current);
     void route(KSThread::control& control, NvMsg32Bit*& msg);
@@ -112,7 +118,7 @@ class KSMsgQueue : private KSRunnable {
     std::unique_ptr<KSAbstractMsgQueue> transport_;
     NvCompDesc hostDesc_;
 
-    mutable std::mutex guard_;  // over all that follows, but not the reply lock
+    mutable std::mutex guard_;  // guards all members below except replyLock_
     Receivers receivers_;
     Expected expected_{};
     bool waiting_ = false;
@@ -120,7 +126,8 @@ class KSMsgQueue : private KSRunnable {
     bool lost_ = false;
     void (*lostCallback_)(void*) = nullptr;
     void* lostArgument_ = nullptr;
-    KSMutex replyLock_;  // held while there is no reply; the reader unlocks it
+    KSMutex replyLock_;  // a signal: locked by the request that waits, unlocked by the reader thread with the
+                         // reply
 };
 
 #endif

@@ -33,7 +33,7 @@ void KSMsgRef::realloc(unsigned size) {
         *this = KSMsgRef(size);
         return;
     }
-    NvMsg32Bit* resized = msg_;  // whatever a call that fails leaves in it, the buffer stays
+    NvMsg32Bit* resized = msg_;  // a copy: a call that fails may change it, and msg_ must stay
     if (nvMsgReallocate(size, &resized) != 0)
         throw AllocationError(size);
     msg_ = resized;

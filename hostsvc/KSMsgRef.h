@@ -1,4 +1,4 @@
-// A handle over one message buffer of the transport library.
+// A handle: refers to one message buffer of the transport library.
 #ifndef HOSTSVC_KSMSGREF_H
 #define HOSTSVC_KSMSGREF_H
 
@@ -7,15 +7,15 @@
 #include "hostsvc/KSException.h"
 #include "norv/norv.h"
 
-// Owns nothing and counts nothing: copies share the buffer, and whoever ends the message's life calls free()
-// once. Every access to an empty handle except getMsgRef, assignment and realloc ends the process through a
-// failed assertion.
+// A handle does not own the buffer and does not count references. Copies refer to the same buffer, and the
+// owner of the message calls free() once. Using an empty handle, except for getMsgRef, assignment and
+// realloc, ends the process through a failed assertion.
 class KSMsgRef {
   public:
     class AllocationError : public virtual KSException {
       public:
         explicit AllocationError(unsigned size) : size_(size) {}
-        unsigned size() const { return size_; }  // octets of body that could not be had
+        unsigned size() const { return size_; }  // octets of body that were asked for
 
       private:
         unsigned size_;
@@ -31,13 +31,14 @@ class KSMsgRef {
     NvMsg32Bit* getMsgRef() const { return msg_; }  // null when empty
     void checkValid() const;
 
-    // A buffer of its own with the same header, body and the library's octets after it. Throws
-    // AllocationError.
+    // Makes a new buffer with the same header, body and library's octets after the body. The caller owns it.
+    // Throws AllocationError.
     KSMsgRef clone() const;
-    // Back to the library, whose status it returns; this handle alone becomes empty.
+    // Gives the buffer back to the library and returns its status. Only this handle becomes empty; copies
+    // must not be used any more.
     std::uint32_t free();
-    // Changes the body's size, or makes a buffer where the handle is empty. Throws AllocationError, and then
-    // keeps what it had.
+    // Changes the size of the body, or makes a buffer if the handle is empty. Throws AllocationError, and
+    // then leaves the handle as it was.
     void realloc(unsigned size);
 
     unsigned getMsgType() const;
@@ -47,11 +48,11 @@ class KSMsgRef {
     NvCompDesc getTgtAddr() const;
 
     void setMsgType(unsigned type);
-    void setTrans(unsigned trans);  // its low 24 bits; the header's low octet is the library's
+    void setTrans(unsigned trans);  // the low 24 bits; keeps the octet for the library's own use
     void setSrcAddr(NvCompDesc address);
     void setTgtAddr(NvCompDesc address);
 
-    // One fixed field, by index; the library's status.
+    // Reads or writes one fixed field, which is named by its index. Returns the library's status.
     std::uint32_t fieldGet(unsigned index, void* out) const;
     std::uint32_t fieldPut(unsigned index, void* in);
 

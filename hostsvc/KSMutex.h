@@ -1,5 +1,5 @@
-// A mutex without owner checking, so that it serves as a signal as well: one thread locks it and waits,
-// another unlocks it.
+// A mutex without owner checking. It can therefore be used as a signal: one thread locks it and waits for it,
+// another thread unlocks it.
 #ifndef HOSTSVC_KSMUTEX_H
 #define HOSTSVC_KSMUTEX_H
 
@@ -7,7 +7,8 @@
 
 #include "hostsvc/KSException.h"
 
-// What a thread did before its unlock is seen by the thread that locks next, whoever had locked it before.
+// The thread that locks the mutex sees everything that the thread that unlocked it did before, whichever
+// thread had locked it.
 class KSMutex {
   public:
     class CreationError : public virtual KSException {};
@@ -18,11 +19,12 @@ class KSMutex {
     virtual ~KSMutex();
 
     void lock();
-    // From any thread, locked or not. Once it lets another thread in, it touches the mutex no more.
+    // Any thread may call it, whether the mutex is locked or not. Once another thread can lock the mutex,
+    // this function does not touch it any more, so that the other thread may destroy it.
     void unlock();
     bool tryLock();
-    // timeoutMs / intervalMs tries with intervalMs of sleep after each, and a last one. An unlock ends the
-    // sleep early, and with it the wait. intervalMs is not 0.
+    // Tries timeoutMs / intervalMs times with a sleep of intervalMs after each try, and then once more. An
+    // unlock during a sleep ends the wait with success. intervalMs must not be 0.
     bool tryLock(unsigned timeoutMs, unsigned intervalMs);
 
   private:

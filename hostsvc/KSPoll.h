@@ -1,4 +1,4 @@
-// Trying again and again for a bounded time.
+// Tries something again and again for a limited time.
 #ifndef HOSTSVC_KSPOLL_H
 #define HOSTSVC_KSPOLL_H
 
@@ -6,9 +6,9 @@
 
 #include "hostsvc/KSSleep.h"
 
-// timeoutMs / intervalMs rounds of one try and one pause of intervalMs, then a last try. intervalMs must not
-// be 0; if it is, there is the last try alone. `pause` takes the time as a timeval. What is tried for may
-// come meanwhile: then it takes it and returns 0 at once; otherwise it returns an error number.
+// Makes timeoutMs / intervalMs rounds of one try and one pause of intervalMs, then a last try. If intervalMs
+// is 0, makes only the last try. `pause` gets the time as a timeval. If what is tried for becomes available
+// during the pause, `pause` takes it and returns 0 at once; otherwise it returns an error number.
 template <typename Try, typename Pause>
 bool ks_poll(unsigned timeoutMs, unsigned intervalMs, Try once, Pause pause) {
     const unsigned rounds = intervalMs == 0 ? 0 : timeoutMs / intervalMs;

@@ -1,4 +1,5 @@
-// The system's mutex calls as KSMutex makes them: from any thread, by design.
+// The system's mutex calls that KSMutex makes. On purpose, another thread may unlock than the one that
+// locked.
 #ifndef HOSTSVC_KSPOSIXMUTEX_H
 #define HOSTSVC_KSPOSIXMUTEX_H
 
@@ -9,9 +10,10 @@
 #include <dlfcn.h>
 #include <sanitizer/tsan_interface.h>
 
-// The thread sanitizer takes a mutex to belong to the thread that locked it: an unlock from elsewhere orders
-// nothing for it, and the mutex counts as held for ever. So the C library is called past it, and it is told
-// of the order that there is: what came before an unlock is seen after the next lock.
+// The thread sanitizer takes a mutex to belong to the thread that locked it. It ignores an unlock by another
+// thread, and then takes the mutex to be locked for ever. So these functions call the C library directly,
+// without the sanitizer, and tell the sanitizer the order that holds: everything before an unlock is seen
+// after the next lock.
 namespace ks_posix {
 
 using MutexCall = int (*)(pthread_mutex_t*);

@@ -23,7 +23,7 @@ constexpr std::uint32_t OpenFrame = 1003;
 constexpr std::uint32_t CloseFrame = 2000;
 constexpr std::uint32_t ClosedFrame = 2001;
 
-constexpr unsigned AnswerMs = 5000;  // for the relay to open or close a queue
+constexpr unsigned AnswerMs = 5000;  // how long the relay may take to open or close a queue
 constexpr unsigned PollMs = 10;
 constexpr unsigned PauseSeconds = 6;
 
@@ -32,7 +32,8 @@ msg_t frameOf(std::uint32_t type, std::array<std::uint32_t, N>& words) {
     return {type, 0, sizeof words, 0, reinterpret_cast<char*>(words.data()), nullptr};
 }
 
-// Ends a connection whose relay does not answer in time, so that whoever reads it wakes.
+// Ends the connection when the relay does not answer in time, so that the thread that reads it wakes. A
+// thread of its own watches the time.
 class Patience {
   public:
     explicit Patience(const sock& connection)
@@ -66,7 +67,8 @@ class KSRemoteMsgQueue::ReceivedFrame {
 
     bool good() const { return result_ == 0 && frame_.type != CloseFrame; }
     bool is(std::uint32_t type) const { return result_ == 0 && frame_.type == type; }
-    // Its header has come, and the rest has not. A frame that is merely too large has come whole.
+    // Whether the header has come and the rest has not. (A frame that is too large but whole is not broken
+    // off.)
     bool brokenOff() const { return result_ != 0 && ended_ && frame_.data != nullptr; }
     const msg_t& operator*() const { return frame_; }
 
@@ -90,7 +92,8 @@ KSRemoteMsgQueue::~KSRemoteMsgQueue() {
     const std::lock_guard readerHasLeft(reading_);
 }
 
-// Frames are small and waited for; a relay's machine that has gone, or reads no more, is noticed.
+// Sends small frames at once, because somebody waits for them, and notices a relay's machine that has
+// disappeared or does not read any more.
 void KSRemoteMsgQueue::keepAlive() const {
     const struct {
         int level, option, value;
@@ -115,7 +118,7 @@ void KSRemoteMsgQueue::open(NvCompDesc desc, unsigned a, unsigned b) try {
     KS_ntohU32(address.data(), (*reply).data, sizeof address);
     const auto octet = [&](std::size_t word) { return static_cast<std::uint8_t>(address[word]); };
     hostDesc = {static_cast<std::uint16_t>(address[4]), octet(1), 0, octet(2), octet(3), octet(0), 0};
-} catch (const std::system_error&) {  // no thread
+} catch (const std::system_error&) {  // the system has no thread for Patience
     throw KSResource_CreationError();
 }
 
@@ -180,8 +183,8 @@ void KSRemoteMsgQueue::failed(bool withinFrame, NvMsg32Bit** out) {
         throw KSRemoteService_ComFailure(hostName_.c_str(), Port);
 }
 
-// The reader may have seen its cancellation and read no more: then the relay's word is looked for here. It
-// cannot come any more once the connection has ended.
+// Reads the connection until the relay's acknowledgement or the connection's end. The reader thread may have
+// been cancelled already and not read any more; then this function reads in its place.
 void KSRemoteMsgQueue::lookForClosed() {
     const std::lock_guard lock(reading_);
     while (!closed_) {
@@ -195,7 +198,7 @@ void KSRemoteMsgQueue::awaitClosed() {
     std::thread other;
     try {
         other = std::thread([this] { lookForClosed(); });
-    } catch (const std::system_error&) {  // the reader alone, then
+    } catch (const std::system_error&) {  // no thread: only the reader thread can see the acknowledgement
     }
     handshake_.tryLock(AnswerMs, PollMs);
     connection_.shutdown(SHUT_RDWR);
@@ -203,7 +206,7 @@ void KSRemoteMsgQueue::awaitClosed() {
         other.join();
 }
 
-// A relay that cannot even be asked is not waited for.
+// If the close request cannot be sent, there is nothing to wait for.
 void KSRemoteMsgQueue::wakeReader() {
     if (closing_.exchange(true))
         return;

@@ -1,4 +1,4 @@
-// A queue in another machine, behind a relay there.
+// A queue in another machine, which is reached through a relay on that machine.
 #ifndef HOSTSVC_KSREMOTEMSGQUEUE_H
 #define HOSTSVC_KSREMOTEMSGQUEUE_H
 
@@ -12,28 +12,31 @@
 #include "hostsvc/KSRemoteService_ComFailure.h"
 #include "hostsvc/sock.h"
 
-// Messages travel over one TCP connection to the relay, which has opened a queue of the transport library for
-// it. A connection that is lost stays lost.
+// Messages travel over one TCP connection to the relay. The relay opens a queue of its transport library for
+// the connection. A connection that is lost is not made again.
 class KSRemoteMsgQueue : public KSAbstractMsgQueue {
   public:
     static constexpr int Port = 6554;
     static constexpr int RetryBudget = 10;
 
-    // Connects to the relay on hostName (a port behind a colon comes before Port) and has a queue opened: a
-    // and b are the queue's own arguments, for the relay to use. Throws KSResource_CreationError when there
-    // is no relay, or it refuses, or it has not answered within five seconds.
+    // Connects to the relay on hostName and asks it to open a queue. hostName may end with a colon and a
+    // port; without one the port is Port. desc, a and b are passed to the relay. Throws
+    // KSResource_CreationError when there is no relay, when it refuses, or when it has not answered within
+    // five seconds.
     KSRemoteMsgQueue(NvCompDesc desc, unsigned a, unsigned b, const char* hostName);
-    // Waits until a reader has left msgRead.
+    // Waits until no thread is in msgRead any more.
     ~KSRemoteMsgQueue() override;
 
-    // Throws KSRemoteService_ComFailure when RetryBudget reads in a row have failed. Each one is reported on
-    // the standard error stream. A failure within a frame takes six seconds, so that a relay can recover.
+    // Reports each failure on the standard error stream. A failure in the middle of a frame pauses for six
+    // seconds, so that the relay can recover. Throws KSRemoteService_ComFailure when RetryBudget reads in a
+    // row have failed.
     std::uint32_t msgRead(NvMsg32Bit** out) override;
-    // A message that could not be sent stays the caller's.
+    // The caller keeps a message that could not be sent, and frees it with freeUnsent.
     std::uint32_t msgWrite(NvMsg32Bit* msg) override;
     void freeUnsent(NvMsg32Bit* msg) override;
-    // Asks the relay to close, waits up to five seconds for its word that it has (or for the end of the
-    // connection), and ends the connection, once. Messages that come meanwhile may be dropped.
+    // Both do the same, the first time one of them is called: ask the relay to close the queue, wait up to
+    // five seconds for its acknowledgement or the end of the connection, and end the connection. Messages
+    // that arrive meanwhile may be dropped.
     void wakeReader() override;
     void close() override;
 
@@ -51,12 +54,12 @@ class KSRemoteMsgQueue : public KSAbstractMsgQueue {
 
     std::string hostName_;
     sock connection_;
-    int retryBudget_ = RetryBudget;  // the reader's
-    KSMutex handshake_;              // held until the relay has closed
-    std::mutex reading_;             // who reads the connection
-    std::mutex writing_;
+    int retryBudget_ = RetryBudget;  // reads that may still fail; used by the reading thread only
+    KSMutex handshake_;              // a signal: locked until the relay has acknowledged the close
+    std::mutex reading_;             // held by the thread that reads the connection
+    std::mutex writing_;             // held by the thread that writes to the connection
     std::atomic<bool> closing_{false};
-    bool closed_ = false;  // with reading_
+    bool closed_ = false;  // guarded by reading_
 };
 
 #endif

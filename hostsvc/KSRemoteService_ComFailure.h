@@ -6,7 +6,7 @@
 
 #include "hostsvc/KSException.h"
 
-// The connection to the relay is lost: it was read too often in a row without a good frame.
+// The connection to the relay is lost: too many reads in a row have failed.
 class KSRemoteService_ComFailure : public virtual KSException {
   public:
     KSRemoteService_ComFailure(const char* hostName, int port) : port_(port) {

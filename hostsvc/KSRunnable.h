@@ -1,12 +1,13 @@
-// What a thread or a clean-up routine runs: a plain function, or a member function of any object.
+// Thread bodies and clean-up routines: a plain function, or a member function of an object.
 #ifndef HOSTSVC_KSRUNNABLE_H
 #define HOSTSVC_KSRUNNABLE_H
 
-// The class that the members of thread bodies and clean-up routines are cast to. Empty: a class whose members
-// are run may derive from it, and then hands over the KSRunnable part of its object.
+// The member functions of thread bodies and clean-up routines are cast to members of this class. It is empty.
+// A class whose members are run derives from it and passes a pointer to the KSRunnable part of its object.
 class KSRunnable {};
 
-// Only looks at the object and the function; both must outlive the last call.
+// Refers to the function, or to the object and its member, and owns neither. The object must outlive the last
+// call.
 template <typename... Args>
 class KSCallable {
   public:

@@ -11,17 +11,17 @@ class KSSemaphore {
     class CreationError : public virtual KSException {};
     class PostError : public virtual KSException {};
 
-    // maxCount bounds the initial count alone; posts may go beyond it. Throws CreationError.
+    // maxCount limits only the initial count; posts may raise the count above it. Throws CreationError.
     KSSemaphore(unsigned maxCount, unsigned initialCount);
     KSSemaphore(const KSSemaphore&) = delete;
     KSSemaphore& operator=(const KSSemaphore&) = delete;
     virtual ~KSSemaphore();
 
     void post();  // throws PostError
-    void wait();  // goes on waiting when a signal interrupts it
+    void wait();  // continues to wait when a signal interrupts it
     bool tryWait();
-    // timeoutMs / intervalMs tries with intervalMs of sleep after each, and a last one. A post ends the sleep
-    // early, and with it the wait. intervalMs is not 0.
+    // Tries timeoutMs / intervalMs times with a sleep of intervalMs after each try, and then once more. A
+    // post during a sleep ends the wait with success. intervalMs must not be 0.
     bool tryWait(unsigned timeoutMs, unsigned intervalMs);
 
   private:

@@ -6,14 +6,14 @@
 
 void ks_sleep(unsigned seconds);
 
-// Wraps at 4294968 ms and above: the time is reckoned in microseconds of 32 bits.
+// The time is computed in 32-bit microseconds, so 4294968 ms and more wrap around to a short sleep.
 void ks_sleep_ms(unsigned milliseconds);
 
-// A signal ends it early, and says so on the standard error stream.
+// A signal ends the sleep early, which is reported on the standard error stream.
 void ks_sleep_us(unsigned microseconds);
 
-// For those who wait for as long as a sleep would take: the time as the system's calls want it, and the line
-// about a signal.
+// For waits that last as long as such a sleep: the time in the form of the system's calls (with the same
+// wrap), and the report of a signal.
 timeval ks_timeout_ms(unsigned milliseconds);
 void ks_reportInterruptedSleep();
 

@@ -18,7 +18,7 @@ namespace {
 
 std::atomic<KSSystem*> standIn{nullptr};
 
-// On the clock that nobody sets.
+// The time in `timeout` from now, on the monotonic clock, which nobody sets.
 timespec after(timeval timeout) {
     constexpr long perSecond = 1000000000;
     timespec then{};
@@ -43,7 +43,7 @@ int KSSystem::waitForCount(sem_t& semaphore, timeval timeout) {
     if (::sem_clockwait(&semaphore, CLOCK_MONOTONIC, &end) != 0)
         return errno;
 #if defined(__SANITIZE_THREAD__)
-    __tsan_acquire(&semaphore);  // it knows of sem_post, but not of this call
+    __tsan_acquire(&semaphore);  // the thread sanitizer knows sem_post but not this call
 #endif
     return 0;
 }
@@ -61,7 +61,7 @@ int KSSystem::createThread(const pthread_attr_t* attributes, void* (*entry)(void
 int KSSystem::post(sem_t* semaphore) { return ::sem_post(semaphore); }
 
 KSSystem& ks_system() {
-    // Never destroyed: while the process exits there are threads that still sleep.
+    // Never destroyed, because threads may still sleep while the process exits.
     static KSSystem* const real = std::make_unique<KSSystem>().release();
     KSSystem* const other = standIn.load();
     return other != nullptr ? *other : *real;

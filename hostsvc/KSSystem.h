@@ -1,4 +1,4 @@
-// The system calls that the tests stand in for.
+// The system calls that tests can replace.
 #ifndef HOSTSVC_KSSYSTEM_H
 #define HOSTSVC_KSSYSTEM_H
 
@@ -6,7 +6,7 @@
 #include <semaphore.h>
 #include <sys/time.h>
 
-// The base class makes the calls. Any thread may use it.
+// This class makes the real calls; tests derive from it. Any thread may call it.
 class KSSystem {
   public:
     KSSystem() = default;
@@ -14,29 +14,29 @@ class KSSystem {
     KSSystem& operator=(const KSSystem&) = delete;
     virtual ~KSSystem() = default;
 
-    // The C library's sleep: what is left, in seconds.
+    // The C library's sleep. Returns the seconds that are left.
     virtual unsigned sleep(unsigned seconds);
 
-    // select on no descriptors: 0 when the time has passed, -1 when a signal came first.
+    // A select on no descriptors. Returns 0 when the time has passed, -1 when a signal interrupted it.
     virtual int waitFor(timeval timeout);
 
-    // Waits for a count of the semaphore, or for the mutex, and takes it: 0; ETIMEDOUT when the time has
-    // passed, EINTR when a signal came first.
+    // Waits until the semaphore can be decremented or the mutex be locked, does that, and returns 0. Returns
+    // ETIMEDOUT when the time has passed, and EINTR when a signal interrupted the wait.
     virtual int waitForCount(sem_t& semaphore, timeval timeout);
     virtual int waitForLock(pthread_mutex_t& mutex, timeval timeout);
 
-    // pthread_create: 0, or what was wrong.
+    // pthread_create. Returns 0 or an error number.
     virtual int createThread(const pthread_attr_t* attributes, void* (*entry)(void*), void* argument);
 
-    // sem_post: 0, or -1 when it is refused.
+    // sem_post. Returns 0, or -1 when the system refuses it.
     virtual int post(sem_t* semaphore);
 };
 
-// The one in use.
+// The object that is in use.
 KSSystem& ks_system();
 
-// Puts another in its place, or the system itself back with null. The caller keeps it alive as long as any
-// thread may call it.
+// Makes another object be used; null means the real calls again. The caller keeps the object alive as long as
+// any thread may call it.
 void ks_useSystem(KSSystem* other);
 
 #endif

@@ -5,7 +5,7 @@
 
 namespace {
 
-// The body ends by returning, by an exception or by the unwinding of a cancelled thread.
+// Sets the status to stopped however the body ends: by returning, by an exception or by being cancelled.
 class StoppedAtEnd {
   public:
     explicit StoppedAtEnd(std::atomic<KSThreadStatus>& status) : status_(status) {}
@@ -33,19 +33,19 @@ KSThread::~KSThread() {
     life_.fetch_and(~unsigned{Abandoned});
     if (status_.load() == ThreadStatus::Running)
         cancel();
-    join();  // also where it was cancelled before: it may not have noticed yet
+    join();  // also if the status says stopped: a cancelled body may still be running
 }
 
 void KSThread::start(void* arg) {
     if (status_.load() != ThreadStatus::Stopped)
         throw AlreadyActive();
-    lock_.lock();  // before the status says running, or a body that is to stop would go on
+    lock_.lock();  // first wait for a cancelled body: setting the status now would make it run on
     argument_ = arg;
     result_.store(nullptr);
     life_.fetch_and(~unsigned{Ended});
     status_.store(ThreadStatus::Running);
     if (ks_startDetached(KSThread_run, this, stackSize_))
-        return;  // an abandoned object may be gone by now
+        return;  // do not touch the object any more: an abandoned one may have deleted itself
     status_.store(ThreadStatus::Stopped);
     lock_.unlock();
     throw CreationError();
@@ -87,7 +87,8 @@ void* KSThread_run(void* thread) {
     return nullptr;
 }
 
-// The thread's last act. Unless the object is abandoned, somebody who joins may destroy it after the unlock.
+// The last thing that the thread does. After the unlock the object must not be touched, because a thread that
+// joins may destroy it. If the object is abandoned, nobody joins, and it is deleted here.
 void KSThread::finish(void* thread) {
     auto* const self = static_cast<KSThread*>(thread);
     const bool abandoned = (self->life_.fetch_or(Ended) & Abandoned) != 0;

@@ -9,12 +9,14 @@
 #include "hostsvc/KSRunnable.h"
 #include "hostsvc/KSThreadControl.h"
 
-// The entry function of every KSThread: runs the thread object that it is given on the new thread.
+// The entry function of every KSThread. `thread` is the KSThread object whose body it runs on the new thread.
 void* KSThread_run(void* thread);
 
-// Cancellation is cooperative: cancel() sets the status, and the body ends at its next control::testCancel().
-// The lock is held from start() until the started thread touches the object no more, whichever way its body
-// ends; then it is unlocked, once for each start, as the thread's very last act on the object.
+// Cancellation is cooperative: cancel() sets the status, and the body ends the next time it calls
+// control::testCancel().
+//
+// start() locks the thread's lock. The started thread unlocks it as the last thing it does with the object,
+// however its body ends. So whoever gets the lock, as join() does, may destroy the object.
 class KSThread {
   public:
     class Exception : public virtual KSException {};
@@ -24,37 +26,41 @@ class KSThread {
     using ThreadStatus = KSThreadStatus;
     using control = KSThreadControl;
 
-    // Stopped; start() starts it. A stack size of 0 is the system's default, one below that is raised to it.
-    // The body is called with the control (see setControl) and the start argument; its object must outlive
-    // it.
+    // Makes a stopped thread, which start() starts. A stack size of 0 means the system's default; a smaller
+    // size is raised to the default. The body is called with the control (see setControl) and the argument of
+    // start(). The body's object must outlive the thread.
     KSThread(void* (*body)(void*, void*), unsigned stackSize);
     KSThread(void* object, void* (KSRunnable::*body)(void*, void*), unsigned stackSize);
     KSThread(const KSThread&) = delete;
     KSThread& operator=(const KSThread&) = delete;
-    // Cancels and joins, then runs what is left on the clean-up stack.
+    // Cancels and joins the thread, then runs the routines that are left on the clean-up stack.
     virtual ~KSThread();
 
-    // Throws AlreadyActive unless stopped, CreationError when the system refuses. When the thread has been
-    // cancelled but has not noticed yet, waits until it has ended.
+    // Starts the thread. If it was cancelled but has not ended yet, waits for its end first. Throws
+    // AlreadyActive when it is running, CreationError when the system refuses the thread.
     void start(void* arg);
-    void run();  // the body runner, on the started thread
+    void run();  // runs the body; called on the started thread
     void cancel();
-    // Waits until the started thread touches the object no more; returns at once when none was started.
+    // Waits until the started thread does not touch the object any more. Returns at once if none was started.
     void join();
-    // The same for a bounded time, polled; false when the thread still runs.
+    // The same for a limited time. Returns false when the thread still runs then.
     bool tryJoin(unsigned timeoutMs, unsigned intervalMs);
-    // What the body returned; null after a start until then, and when it did not return normally.
+    // The result of the body. Null until the body has returned, and if it ended in another way.
     void* getResult() const;
-    // Gives the object away, which must have been made with new: it deletes itself when its body ends. Where
-    // the body of the last start has ended already and nobody has joined it, that is now.
+    // Makes the object delete itself when its body ends; it must have been made with new, and the caller must
+    // not use it any more. If the body of the last start has ended already and nobody has joined the thread,
+    // deletes the object now.
     void abandon();
 
-    // What the body gets as its first argument: the thread's own control unless another pointer is set.
+    // The first argument of the body is the thread's own control, unless setControl has set another pointer.
     control* getControl() { return &control_; }
     void setControl(void* handed) { handedControl_ = handed; }
 
   private:
-    enum Life : unsigned { Abandoned = 1, Ended = 2 };  // Ended: since the last start, and not yet joined
+    enum Life : unsigned {
+        Abandoned = 1,
+        Ended = 2
+    };  // Ended: the body has ended and nobody has joined it yet
 
     KSThread(const KSBody& body, unsigned stackSize);
     friend void* KSThread_run(void* thread);

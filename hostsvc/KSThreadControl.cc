@@ -11,7 +11,7 @@ KSThreadControl::~KSThreadControl() {
     while (!stack_.empty()) {
         try {
             popCleanup(1);
-        } catch (...) {  // reported; the routines below it still run
+        } catch (...) {  // popCleanup has reported it; the other routines must run as well
         }
     }
     lock_.unlock();
@@ -22,8 +22,9 @@ void KSThreadControl::testCancel() {
         return;
     while (popCleanup(1) != 0) {
     }
-    // Not here: the frames that pthread_exit unwinds may use what the one who waits for the lock destroys.
-    // A KSThread has arranged for it already.
+    // The lock must not be unlocked here: pthread_exit still unwinds frames that may use what a thread that
+    // waits for the lock then destroys. If a KSThread runs the body, it has already set an act for the
+    // thread's end, and this one is ignored.
     ks_atThreadEnd([](void* lock) { static_cast<KSMutex*>(lock)->unlock(); }, &lock_);
     pthread_exit(nullptr);
 }
@@ -44,7 +45,7 @@ int KSThreadControl::popCleanup(int execute) {
     if (execute != 0) {
         try {
             top.routine(top.argument);
-        } catch (abi::__forced_unwind&) {  // the routine ends the thread: no error
+        } catch (abi::__forced_unwind&) {  // the routine ends the thread, which is no error
             throw;
         } catch (...) {
             std::cerr << "ERROR: in ~KSThread::control::popCleanup, cleanup threw exception" << std::endl;

@@ -1,4 +1,5 @@
-// What a thread's body sees of its thread: the request to stop, and its stack of clean-up routines.
+// The control that a thread's body gets: it learns from it of a request to stop, and pushes clean-up
+// routines.
 #ifndef HOSTSVC_KSTHREADCONTROL_H
 #define HOSTSVC_KSTHREADCONTROL_H
 
@@ -9,29 +10,30 @@
 #include "hostsvc/KSMutex.h"
 #include "hostsvc/KSRunnable.h"
 
-// Stopped stands for both "does not run" and "has been asked to stop".
+// Stopped means that the thread does not run, or that it has been asked to stop.
 enum class KSThreadStatus : std::uint32_t { Running = 0, Stopped = 1 };
 
-// Known as KSThread::control. The clean-up stack, last in first out, belongs to the body, and to whoever
-// destroys the control once the body has ended.
+// Also named KSThread::control. The clean-up routines form a stack: the last one pushed is the first to run.
+// Only the body uses the stack, and the destructor after the body has ended.
 class KSThreadControl {
   public:
-    // Both outlive the control. The lock is the one that is held while the thread runs.
+    // The control refers to both, which must outlive it. The lock is the one that is locked while the thread
+    // runs.
     KSThreadControl(std::atomic<KSThreadStatus>& status, KSMutex& lock) : status_(status), lock_(lock) {}
     KSThreadControl(const KSThreadControl&) = delete;
     KSThreadControl& operator=(const KSThreadControl&) = delete;
-    // Runs what is still pushed, and unlocks the lock. What a routine throws ends here.
+    // Runs the routines that are still pushed, and unlocks the lock. Catches what a routine throws.
     ~KSThreadControl();
 
-    // Returns while the status is running. Once it is stopped: runs every clean-up routine and ends the
-    // calling thread with pthread_exit(NULL), which unwinds the body's frames, so a catch (...) on the way
-    // must rethrow. The lock is unlocked after the last frame.
+    // Returns if the status is running. If it is stopped, runs every clean-up routine and ends the calling
+    // thread with pthread_exit(NULL). That unwinds the body's frames, so a catch (...) in the body must throw
+    // again. The lock is unlocked after the last frame has been left.
     void testCancel();
 
     void pushCleanup(void* (*routine)(void*), void* arg);
     void pushCleanup(void* object, void* (KSRunnable::*routine)(void*), void* arg);
-    // Takes the newest routine off the stack, calls it when execute is not 0, and tells (not 0) whether there
-    // are more. What the routine throws is reported on the standard error stream and passed on.
+    // Takes the newest routine off the stack and calls it if execute is not 0. Returns 0 when the stack is
+    // empty afterwards. If the routine throws, that is reported on the standard error stream and thrown on.
     int popCleanup(int execute);
 
   private:

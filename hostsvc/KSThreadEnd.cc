@@ -2,8 +2,9 @@
 
 namespace {
 
-// A destructor of the thread, not of a frame: frames may still be unwinding when theirs run, and where
-// pthread_exit does not unwind they never do.
+// A thread_local object, whose destructor runs after all frames of the thread. The destructor of an object in
+// a frame would run too early, while other frames are still unwound, or never, where pthread_exit does not
+// unwind.
 class LastAct {
   public:
     LastAct() = default;

@@ -1,9 +1,9 @@
-// What a thread still owes at its very end.
+// One act that a thread does at its very end.
 #ifndef HOSTSVC_KSTHREADEND_H
 #define HOSTSVC_KSTHREADEND_H
 
-// Calls act(object) when the calling thread's last frame is gone: after the body has returned, or after
-// pthread_exit has unwound it. Each thread has one such act; a second one is not taken.
+// Makes the calling thread call act(object) after its last frame has been left: after its body has returned,
+// or after pthread_exit has unwound it. A thread has one such act; later calls of this function are ignored.
 void ks_atThreadEnd(void (*act)(void*), void* object);
 
 #endif

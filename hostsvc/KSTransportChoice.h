@@ -1,4 +1,4 @@
-// Which transport a host queue runs over: the one place that knows.
+// Decides whether a host queue is in this machine or behind a relay.
 #ifndef HOSTSVC_KSTRANSPORTCHOICE_H
 #define HOSTSVC_KSTRANSPORTCHOICE_H
 
@@ -6,12 +6,12 @@
 
 #include "hostsvc/KSAbstractMsgQueue.h"
 
-// The machine to reach the board through, or null for the transport library on this one. A host name (given,
-// or else REMOTE_NORV) that begins with this machine's own, HOST, is this machine: a prefix is enough. Any of
-// the three may be null.
+// Returns the relay's machine, or null for the transport library in this machine. The machine is hostName, or
+// if that is null, the value of REMOTE_NORV. If it begins with the value of HOST, the name of this machine,
+// the result is null. Each of the three may be null.
 const char* ks_chooseHost(const char* hostName, const char* remoteNorv, const char* host);
 
-// Opens the queue that hostName and the environment (REMOTE_NORV, HOST) ask for. Throws
+// Opens a queue in the machine that hostName and the environment (REMOTE_NORV, HOST) name. Throws
 // KSResource_CreationError.
 std::unique_ptr<KSAbstractMsgQueue> ks_openTransport(NvCompDesc desc, unsigned a, unsigned b,
                                                      const char* hostName);

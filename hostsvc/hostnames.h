@@ -1,15 +1,16 @@
-// Host names, addresses and numbers in text.
+// Reads host names, addresses and numbers.
 #ifndef HOSTSVC_HOSTNAMES_H
 #define HOSTSVC_HOSTNAMES_H
 
-// 1 when the text is a name rather than an address in digits and dots: some character comes after '9'.
-// Characters beyond ASCII do not count.
+// Returns 1 when the text is a name and not an address in digits and dots: it has an ASCII character above
+// '9'.
 int is_dn(const char* name);
 
-// The name's first IPv4 address, in digits and dots, into dst (16 octets); empty when there is none.
+// Looks the name up and writes its first IPv4 address, in digits and dots, into dst (16 octets). Writes an
+// empty text when it has none.
 void dntoip(char* dst, const char* name);
 
-// A decimal number, or a hexadecimal one behind "0x" or "-0x". With an 'X' it is 0.
+// Reads a decimal number, or a hexadecimal one after "0x" or "-0x". With a capital X the result is 0.
 int stn(const char* text);
 
 #endif

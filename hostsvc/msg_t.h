@@ -1,15 +1,15 @@
-// One frame of the relay protocol, in memory.
+// A frame of the relay protocol in memory.
 #ifndef HOSTSVC_MSG_T_H
 #define HOSTSVC_MSG_T_H
 
 #include <cstddef>
 #include <cstdint>
 
-// A frame that is sent points at its sender's own parts. One that sock::get_msg received owns both: heap
-// blocks with a zero octet behind the part, given back with free_msg.
+// The pointers of a frame that is sent refer to memory of the sender. A frame that sock::get_msg has received
+// owns its two parts: blocks on the heap, each with a zero octet after the part. free_msg frees them.
 struct msg_t {
     std::uint32_t type = 0;
-    std::uint32_t tran = 0;  // carried, not interpreted
+    std::uint32_t tran = 0;  // transaction; sock only passes it on
     std::int32_t size = 0;   // of the data part, octets
     std::int32_t ex_size = 0;
     char* data = nullptr;
@@ -19,14 +19,14 @@ struct msg_t {
     static constexpr int HeaderSize = 20;            // on the wire
 };
 
-// The header is converted in one piece.
+// The code that converts the header to network order relies on this layout.
 static_assert(offsetof(msg_t, data) == 16);
 
-// Frees the parts that are there; the pointers stay as they are.
+// Frees the parts that are not null. Leaves the pointers unchanged.
 void free_msg(msg_t& m);
 
-// Debugging aids: the frame's words in lines of their own, and octets in hexadecimal, each widened with its
-// sign, both on the standard output.
+// For debugging. Both write to the standard output: the words of a frame, a line each; and octets in
+// hexadecimal, each sign-extended.
 void print_msg(const char* title, const msg_t& m);
 void byte_print_msg(const char* buf, int n);
 

@@ -30,7 +30,8 @@ short eventsOf(char mode) {
     }
 }
 
-// A connection that has ended or failed can be read and written, which tells so.
+// The poll events that count as ready. A connection that has ended or failed counts as ready as well: reading
+// or writing it then shows the failure.
 short shownBy(short events) {
     return static_cast<short>(events == POLLPRI ? events | POLLNVAL : events | POLLNVAL | POLLERR | POLLHUP);
 }
@@ -111,8 +112,8 @@ int sock::connect() {
     return result;
 }
 
-// With ppoll, since select knows no descriptors beyond 1023; but what select leaves in its set when it cannot
-// wait counts as ready.
+// Uses ppoll, because select cannot wait for descriptors above 1023. When ppoll fails, the result is 1, as
+// select would leave the descriptor in its set.
 int sock::ready(char mode, long sec, long usec) const {
     const short events = eventsOf(mode);
     const bool forEver = sec == ForEver && usec == ForEver;
@@ -125,7 +126,7 @@ int sock::ready(char mode, long sec, long usec) const {
     return (waited.revents & shownBy(events)) != 0 ? 1 : 0;
 }
 
-// What recv or send has returned: an error or the peer's end sets the flag.
+// `count` is the result of recv or send. Sets the error flag for an error or when the peer has closed.
 long sock::transferred(long count) {
     if (count <= 0)
         error_ = 1;
@@ -151,7 +152,7 @@ long sock::writeblock(const void* buf, long len) {
     while (len > 0) {
         if (ready('w', ForEver, ForEver) == 0)
             continue;
-        // A peer that has gone must not end the process with a signal.
+        // MSG_NOSIGNAL: a peer that has closed must not end the process with a signal.
         const long count =
             transferred(::send(descriptor_, from, static_cast<std::size_t>(len), MSG_NOSIGNAL));
         if (count <= 0)

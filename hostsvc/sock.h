@@ -1,4 +1,4 @@
-// A TCP/IPv4 socket that reads and writes whole blocks and whole frames.
+// A TCP/IPv4 socket that reads and writes whole blocks and whole frames of the relay protocol.
 #ifndef HOSTSVC_SOCK_H
 #define HOSTSVC_SOCK_H
 
@@ -9,58 +9,60 @@
 
 #include "hostsvc/msg_t.h"
 
-// Nothing throws: what fails returns a negative result or sets the error flag, which stays set and makes
-// every later frame fail. One thread may read while another writes, and any thread may shut it down.
+// No function throws. A function that fails returns a negative result or sets the error flag. The flag stays
+// set, and then every later frame fails. One thread may read while another writes, and any thread may shut
+// the socket down.
 class sock {
   public:
     sock() = default;
-    explicit sock(int fd);  // takes fd over
-    sock(int fd, const sockaddr_in& addr);
-    sock(unsigned long addr, int port);  // sock_make
-    // A host name or an address in digits and dots, in front of a colon and a port if it is not `port`. With
-    // several colons the host ends at the first, and the last one gives the port. A name that cannot be
-    // looked up sets the error flag, and there is no socket.
+    explicit sock(int fd);                  // owns the descriptor
+    sock(int fd, const sockaddr_in& addr);  // owns the descriptor
+    sock(unsigned long addr, int port);     // calls sock_make
+    // host is a name or an address in digits and dots; a colon and a port may follow, which replaces `port`.
+    // If there are several colons, the host ends at the first, and the port follows the last. If the name
+    // cannot be looked up, sets the error flag and makes no socket.
     sock(const char* host, int port);
     sock(const sock&) = delete;
     sock& operator=(const sock&) = delete;
     ~sock();
 
-    // Makes the socket. addr in network order, port in host order.
+    // Makes the socket and stores the address. addr is in network order, port in host order.
     void sock_make(unsigned long addr, int port);
 
-    // Drops what was not sent and resets the connection.
+    // Resets the connection: data that has not been sent yet is dropped.
     int close();
     int shutdown(int how) const;
     int bind() const;  // to the stored address
     int listen(int backlog) const;
-    int accept(sockaddr_in& peer) const;  // the new descriptor, the caller's
+    int accept(sockaddr_in& peer) const;  // returns the new descriptor, which the caller owns
     int accept() const;
     int connect();  // to the stored address
 
-    // Waits for readability ('r'), writability ('w') or an exceptional condition ('e'); for ever when both
-    // times are -1. 1 when it is so, or when it could not be asked; 0 when the time is over. Another mode is
-    // 1 at once.
+    // Waits until the socket can be read ('r') or written ('w'), or has an exceptional condition ('e');
+    // without limit if both times are -1. Returns 1 when that is so, or when the system cannot tell, and 0
+    // when the time is over. For any other mode returns 1 at once.
     int ready(char mode, long sec, long usec) const;
     int ready(long sec, long usec) const { return ready('r', sec, usec); }
 
-    // 0 once everything is through. A length below 1 is returned. When the peer has closed, reading returns
-    // how much is missing, writing 0.
+    // Return 0 when all octets have been read or written. A length below 1 is returned as it is. If the peer
+    // has closed the connection, reading returns how many octets are missing, and writing returns 0.
     long readblock(void* buf, long len);
     long writeblock(const void* buf, long len);
 
-    // 0 once the frame is sent. One with a part below 0 or above msg_t::Largest is -1, and nothing is
-    // written.
+    // Returns 0 when the frame has been sent. Returns -1 and sends nothing if the size of a part is below 0
+    // or above msg_t::Largest.
     long snd_msg(const msg_t& m);
-    // 0 once a frame has been received: the parts are the caller's, to be given back with free_msg, whatever
-    // the result; where there are none the pointers are null. A part above msg_t::Largest is read all the
-    // same, so that the next frame is found, and the result is -1. A negative size, or no memory for a part,
-    // is said on the standard error stream, and the result is -1; the parts are not read, and the next call
-    // takes what follows for a frame. A part above ten times msg_t::Largest is treated likewise and sets the
-    // error flag too.
+    // Receives a frame. Returns 0 for a good frame and -1 otherwise. In both cases the caller owns the parts
+    // and frees them with free_msg; a part that is missing is a null pointer.
+    //
+    // A part above msg_t::Largest is read, so that the next frame is found, and the result is -1. If a size
+    // is negative or there is no memory for a part, this is reported on the standard error stream, and the
+    // result is -1; the parts are not read, so the next call takes them for a frame. A part above ten times
+    // msg_t::Largest is treated like that as well, and the error flag is set.
     long get_msg(msg_t& m);
 
     bool failed() const { return error_.load() != 0; }
-    int descriptor() const { return descriptor_; }  // 0: none
+    int descriptor() const { return descriptor_; }  // 0: no socket
     const sockaddr_in& address() const { return address_; }
 
   private:

@@ -1,5 +1,5 @@
-// sock's frames: a header of five big-endian words (type, transaction, the two sizes, and a word of the
-// sender's own), the data part, the extra part.
+// The frames of sock: a header of five big-endian words (type, transaction, the sizes of the two parts, and a
+// word for the sender's own use), then the data part, then the extra part.
 #include <algorithm>
 #include <array>
 #include <cstdlib>
@@ -10,11 +10,11 @@
 
 namespace {
 
-constexpr int ConvertedSize = 24;  // the header and a word that is not sent
+constexpr int ConvertedSize = 24;  // octets to convert: the header, and a word that is not sent
 using Header = std::array<char, ConvertedSize>;
 
-// A part above msg_t::Largest is still read, so that the next frame is found. One above this size is an
-// attack, or the connection is out of step already.
+// A part above msg_t::Largest is read, so that the next frame is found. A part above this size is not: it is
+// an attack, or the two ends have lost the boundary of frames.
 constexpr std::int32_t LargestRead = 10 * msg_t::Largest;
 
 bool beyondReason(const msg_t& m) { return m.size > LargestRead || m.ex_size > LargestRead; }
