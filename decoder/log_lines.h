@@ -28,7 +28,7 @@ constexpr std::string_view variantLine(int variant) {
         if (known.variant == variant)
             return known.line;
     }
-    return {};
+    return "";
 }
 
 // A record could not be queued; an entry of the queue could not be taken; and, with their number and " \n"
