@@ -3,31 +3,25 @@
 namespace reader {
 
 void Chunk::add(const Seen& seen) {
-    const capture::Item& item = *seen.item;
-    items_.push_back(item);
+    batch_.add(*seen.item);
     seen_.push_back(seen);
-    octetSpans_.push_back({octets_.size(), item.frame.octets.size()});
-    octets_.insert(octets_.end(), item.frame.octets.begin(), item.frame.octets.end());
-    textSpans_.push_back({texts_.size(), item.text.size()});
-    texts_ += item.text;
 }
 
 void Chunk::seal() {
-    for (std::size_t i = 0; i < items_.size(); ++i) {
-        capture::Item& item = items_[i];
-        item.frame.octets = {octets_.data() + octetSpans_[i].start, octetSpans_[i].size};
-        item.text = std::string_view(texts_).substr(textSpans_[i].start, textSpans_[i].size);
-        seen_[i].item = &item;
-    }
+    const std::span<const capture::Item> items = batch_.items();
+    for (std::size_t i = 0; i < items.size(); ++i)
+        seen_[i].item = &items[i];
+}
+
+void Chunk::split(std::size_t from, Chunk& other) {
+    for (std::size_t i = from; i < seen_.size(); ++i)
+        other.add(seen_[i]);
+    seen_.resize(from);
 }
 
 void Chunk::clear() {
-    items_.clear();
+    batch_.clear();
     seen_.clear();
-    octetSpans_.clear();
-    textSpans_.clear();
-    octets_.clear();
-    texts_.clear();
     text.clear();
     pieces.clear();
 }

@@ -7,7 +7,7 @@
 #include <string_view>
 #include <vector>
 
-#include "capture/Item.h"
+#include "capture/Batch.h"
 #include "reader/Seen.h"
 
 namespace reader {
@@ -29,6 +29,8 @@ class Chunk {
     void add(const Seen& seen);
     // No more is added: views of the items are valid from now on until clear().
     void seal();
+    // Moves all items from this one on to another chunk. This one is sealed, the other is not.
+    void split(std::size_t from, Chunk& other);
     void clear();
 
     bool empty() const { return seen_.empty(); }
@@ -39,17 +41,8 @@ class Chunk {
     std::vector<Piece> pieces;  // in the order of the items
 
   private:
-    struct Span {
-        std::size_t start;
-        std::size_t size;
-    };
-
-    std::vector<capture::Item> items_;
+    capture::Batch batch_;
     std::vector<Seen> seen_;
-    std::vector<Span> octetSpans_;
-    std::vector<Span> textSpans_;
-    std::vector<std::uint8_t> octets_;
-    std::string texts_;
 };
 
 }  // namespace reader

@@ -13,12 +13,19 @@ namespace {
 constexpr std::string_view bold = "\x1b[1m", green = "\x1b[32m", cyan = "\x1b[36m", yellow = "\x1b[33m",
                            plain = "\x1b[0m";
 
+// Puts text in a colour; nothing at all if there is no text.
 template <class Put>
 void inColor(Cell& cell, std::string_view color, Put put) {
-    if (cell.colors)
-        cell.line += color;
+    if (!cell.colors) {
+        put();
+        return;
+    }
+    const std::size_t start = cell.line.size();
+    cell.line += color;
     put();
-    if (cell.colors)
+    if (cell.line.size() == start + color.size())
+        cell.line.resize(start);
+    else
         cell.line += plain;
 }
 
@@ -28,10 +35,10 @@ void putNumber(Cell& cell) {
 }
 
 void putTime(Cell& cell) {
-    if (cell.relative && cell.seen.frame().clock != capture::Clock::none)
+    if (cell.relative && cell.seen.when.clock != capture::Clock::none)
         appendSeconds(cell.line, cell.seen.sinceFirst);
     else
-        cell.times.append(cell.line, cell.seen.instant());
+        cell.times.append(cell.line, cell.seen.when);
 }
 
 // Filled in by whoever puts the lines in order.
@@ -106,8 +113,10 @@ void putMessage(Cell& cell) {
 void putDetails(Cell& cell) { appendDetails(cell.line, cell.seen); }
 
 void putMarks(Cell& cell) {
-    if (!cell.seen.marks.empty())
-        inColor(cell, yellow, [&] { (cell.line += '[').append(cell.seen.marks) += ']'; });
+    std::string marks;
+    appendMarks(marks, cell.seen);
+    if (!marks.empty())
+        inColor(cell, yellow, [&] { ((cell.line += '[') += marks) += ']'; });
 }
 
 void putLength(Cell& cell) { appendNumber(cell.line, cell.seen.frame().octets.size()); }
@@ -168,11 +177,11 @@ isdn::Sender senderOf(const Seen& seen) {
 
 std::span<const Column> columns() { return table; }
 
-const Column* columnNamed(std::string_view name) {
+const Column& columnNamed(std::string_view name) {
     const auto* const found =
         std::find_if(std::begin(table), std::end(table), [&](const Column& c) { return c.name == name; });
     if (found != std::end(table))
-        return found;
+        return *found;
     std::string known;
     for (const Column& column : table)
         (known += known.empty() ? "" : ",") += column.name;

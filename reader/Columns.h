@@ -34,7 +34,7 @@ struct Column {
 std::span<const Column> columns();
 
 // Throws UsageError for a name that is none.
-const Column* columnNamed(std::string_view name);
+const Column& columnNamed(std::string_view name);
 
 // The column whose text is known only when the lines are put in order: the time since the line before.
 inline constexpr std::string_view deltaColumn = "delta";

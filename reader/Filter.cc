@@ -40,9 +40,9 @@ class OnTime : public Condition {
 
     void begin(Instant first) override { bound_ = point_.on(first); }
     bool holds(const Seen& seen) const override {
-        if (seen.frame().clock == capture::Clock::none || !bound_)
+        if (seen.when.clock == capture::Clock::none || !bound_)
             return false;
-        return from_ ? seen.frame().time >= *bound_ : seen.frame().time < *bound_;
+        return from_ ? seen.when.time >= *bound_ : seen.when.time < *bound_;
     }
     bool isAboutTime() const override { return true; }
 
@@ -123,12 +123,13 @@ std::unique_ptr<Condition> byNumber(const std::string& value) {
 }
 
 std::unique_ptr<Condition> byCause(const std::string& value) {
-    const unsigned cause = numberFor("cause", value, 127);
-    return onElements([cause](const isdn::Element& element) {
+    const bool any = value == "any";
+    const unsigned cause = any ? 0 : numberFor("cause", value, 127);
+    return onElements([any, cause](const isdn::Element& element) {
         if (element.codeset != 0 || element.id != isdn::element::cause)
             return false;
         const auto shown = isdn::cause(element);
-        return shown && shown->value == cause;
+        return shown && (any || shown->value == cause);
     });
 }
 
@@ -146,6 +147,24 @@ std::unique_ptr<Condition> byChannel(const std::string& value) {
         const auto shown = isdn::channelId(element);
         return shown && !shown->dChannel && shown->channels.test(channel) &&
                (!interface || shown->interface == interface);
+    });
+}
+
+std::unique_ptr<Condition> byFrameType(const std::string& value) {
+    const std::string name = plainName(value);
+    for (unsigned type = 0; type <= static_cast<unsigned>(isdn::FrameType::UNKNOWN); ++type) {
+        const auto wanted = static_cast<isdn::FrameType>(type);
+        if (plainName(isdn::nameOf(wanted)) == name)
+            return onFrame([wanted](const Seen& seen) { return seen.link.type == wanted; });
+    }
+    refuse("type", value, "a type of frame: I, RR, SABME, ...");
+}
+
+std::unique_ptr<Condition> byMark(const std::string& value) {
+    return onFrame([value](const Seen& seen) {
+        std::string marks;
+        appendMarks(marks, seen);
+        return value == "any" ? !marks.empty() : marks.find(value) != std::string::npos;
     });
 }
 
@@ -172,9 +191,11 @@ constexpr FilterRow rows[] = {
     {"callref", "REF",      "Frames of this call reference, as a line shows it: 0378, or 0378o for one direction", byCallReference},
     {"message", "NAME",     "Frames of this message: SETUP, release-complete, or its code 0x05", byMessage},
     {"number",  "DIGITS",   "Frames with a party number or keypad text that holds these digits", byNumber},
-    {"cause",   "N",        "Frames with this cause value", byCause},
+    {"cause",   "N",        "Frames with this cause value; any: with any cause", byCause},
     {"channel", "N",        "Frames that name this B channel; 0/30 names the interface as well", byChannel},
     {"tei",     "N",        "Frames of this terminal endpoint", byTei},
+    {"type",    "TYPE",     "Frames of this type: I, RR, SABME, UA, DISC, DM, FRMR, ...", byFrameType},
+    {"mark",    "WORDS",    "Frames with this mark, such as retransmitted; any: with any mark", byMark},
     {"layer",   "2|3",      "3: frames that carry a message; 2: all others", byLayer},
     {"no-keepalive", "",    "No polls, and answers to them, that only say that nothing has happened", noKeepAlive},
     {"since",   "TIME",     "From this time on: 2026-11-21T11:25:33+01:00, 2026-11-21, 11:25 or +12.5 (after the first frame)", since},
@@ -193,6 +214,7 @@ Filter::Filter(const std::vector<FilterWord>& words) {
         const auto sameKind = [&](const Group& group) {
             return group.name == word.name && group.negated == word.negated;
         };
+        hidesKeepAlives_ = hidesKeepAlives_ || row->make == noKeepAlive;
         auto group = std::find_if(groups_.begin(), groups_.end(), sameKind);
         if (group == groups_.end())
             group = groups_.insert(groups_.end(), Group{word.name, word.negated, {}});

@@ -43,6 +43,8 @@ class Filter {
     // Before the first item is asked about.
     void begin(Instant firstFrame);
     bool passes(const Seen& seen) const;
+    // Whether a condition asks for `keepAlive`, which is known only when a poll's answer is there.
+    bool hidesKeepAlives() const { return hidesKeepAlives_; }
 
   private:
     struct Group {
@@ -52,6 +54,7 @@ class Filter {
     };
 
     std::vector<Group> groups_;
+    bool hidesKeepAlives_ = false;
 };
 
 }  // namespace reader

@@ -12,11 +12,8 @@ void Names::keep(capture::Item& item) {
         if (frame.interface != lastGiven_ || !(*frame.interface == lastSeen_)) {
             lastGiven_ = frame.interface;
             lastSeen_ = *frame.interface;
-            capture::Interface wanted = lastSeen_;
-            if (!trunk_.empty())
-                wanted.name = trunk_;
-            const auto known = std::find(interfaces_.begin(), interfaces_.end(), wanted);
-            lastKept_ = known != interfaces_.end() ? &*known : &interfaces_.emplace_back(std::move(wanted));
+            const auto known = std::find(interfaces_.begin(), interfaces_.end(), lastSeen_);
+            lastKept_ = known != interfaces_.end() ? &*known : &interfaces_.emplace_back(lastSeen_);
         }
         frame.interface = lastKept_;
     }
@@ -24,9 +21,6 @@ void Names::keep(capture::Item& item) {
         lastFile_ = *files_.emplace(frame.place.file).first;
     frame.place.file = lastFile_;
 }
-
-Sequence::Sequence(std::vector<Opener> inputs, std::string trunk)
-    : inputs_(std::move(inputs)), names_(std::move(trunk)) {}
 
 capture::Reader::Next Sequence::next(capture::Item& item) {
     while (true) {
@@ -56,7 +50,7 @@ capture::Reader::Progress Sequence::progress() const {
     return inputs_.size() == 1 ? current_->progress() : Progress{current_->progress().octets, 0};
 }
 
-Merge::Merge(const std::vector<Opener>& inputs, std::string trunk) : names_(std::move(trunk)) {
+Merge::Merge(const std::vector<Opener>& inputs) {
     for (const Opener& open : inputs)
         inputs_.push_back({open(), {}});
 }

@@ -20,12 +20,9 @@ using Opener = std::function<std::unique_ptr<capture::Reader>()>;
 // Keeps the names that items refer to for longer than the reader they came from.
 class Names {
   public:
-    // A name that is not empty takes the place of the D channel's own.
-    explicit Names(std::string trunk) : trunk_(std::move(trunk)) {}
     void keep(capture::Item& item);
 
   private:
-    std::string trunk_;
     std::list<capture::Interface> interfaces_;
     std::set<std::string, std::less<>> files_;
     const capture::Interface* lastGiven_ = nullptr;
@@ -37,7 +34,7 @@ class Names {
 // One after another; an input that is followed never ends, and so must be the last.
 class Sequence : public capture::Reader {
   public:
-    Sequence(std::vector<Opener> inputs, std::string trunk);
+    explicit Sequence(std::vector<Opener> inputs) : inputs_(std::move(inputs)) {}
 
     Next next(capture::Item& item) override;
     void wait(std::chrono::milliseconds most) override;
@@ -54,7 +51,7 @@ class Sequence : public capture::Reader {
 // times come in the order of the inputs.
 class Merge : public capture::Reader {
   public:
-    Merge(const std::vector<Opener>& inputs, std::string trunk);
+    explicit Merge(const std::vector<Opener>& inputs);
 
     Next next(capture::Item& item) override;
     void wait(std::chrono::milliseconds most) override;

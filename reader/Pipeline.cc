@@ -5,6 +5,7 @@
 #include <vector>
 
 #include "reader/Crew.h"
+#include "reader/Polls.h"
 
 namespace reader {
 
@@ -21,7 +22,7 @@ void composeChunk(Chunk& chunk, const Filter& filter, Composer& composer) {
         readHeaders(seen);
         if (!filter.passes(seen))
             continue;
-        Piece piece{.item = i, .instant = seen.instant()};
+        Piece piece{.item = i, .instant = {seen.when.clock, seen.at}};
         composer.compose(seen, chunk.text, piece);
         piece.end = chunk.text.size();
         chunk.pieces.push_back(piece);
@@ -75,25 +76,39 @@ class Run {
 
     // Reads a chunk and hands it in. Returns why it holds no more.
     Next readChunk() {
-        std::unique_ptr<Chunk> chunk = freeChunk();
-        const std::size_t most = work_.eachAtOnce ? 1 : itemsInChunk;
+        std::unique_ptr<Chunk> chunk = heldBack_ != nullptr ? std::move(heldBack_) : freeChunk();
+        const std::size_t most = chunk->size() + (work_.eachAtOnce ? 1 : itemsInChunk);
         Next next = Next::item;
         while (chunk->size() < most && (next = reader_.next(item_)) == Next::item) {
-            begin();
-            chunk->add(tracker_.see(item_));
+            Seen seen = tracker_.see(item_);
+            begin(seen.when);
+            if (filter_.hidesKeepAlives())
+                polls_.take(*chunk, seen);
+            chunk->add(seen);
         }
         chunk->seal();
         begun_ = begun_ || !chunk->empty();
+        if (filter_.hidesKeepAlives())
+            holdBack(*chunk, next);
         crew_.handIn(std::move(chunk));
         return next;
     }
 
+    // Keeps the items from a poll on whose answer may still come: whether the poll is shown depends on that.
+    void holdBack(Chunk& chunk, Next next) {
+        const std::size_t from = polls_.open(chunk, next == Next::end);
+        if (from == chunk.size())
+            return;
+        heldBack_ = freeChunk();
+        chunk.split(from, *heldBack_);
+    }
+
     // Tells the filter what the first time of the stream is, while no other thread asks it. A stream whose
     // first chunk has no time is one without times.
-    void begin() {
-        if (begun_ || item_.frame.clock == capture::Clock::none)
+    void begin(Instant first) {
+        if (begun_ || first.clock == capture::Clock::none)
             return;
-        filter_.begin({item_.frame.clock, item_.frame.time});
+        filter_.begin(first);
         begun_ = true;
     }
 
@@ -133,6 +148,8 @@ class Run {
     std::uint64_t left_;
     bool begun_ = false;
     capture::Item item_;
+    Polls polls_;
+    std::unique_ptr<Chunk> heldBack_;
     std::vector<std::unique_ptr<Chunk>> free_;
     Crew crew_;
 };

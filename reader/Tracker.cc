@@ -2,19 +2,43 @@
 
 namespace reader {
 
+namespace {
+
+using Kind = capture::Item::Kind;
+
+calls::Side sideOf(const capture::Frame& frame) {
+    return frame.transmitted ? calls::Side::us : calls::Side::peer;
+}
+
+}  // namespace
+
 Seen Tracker::see(const capture::Item& item) {
-    using Kind = capture::Item::Kind;
     Seen seen;
     seen.item = &item;
     if (item.kind == Kind::frame || item.kind == Kind::oversized || item.kind == Kind::cut)
         seen.number = ++frames_;
-    if (first_.clock == capture::Clock::none)
-        first_ = seen.instant();
-    if (first_.clock == item.frame.clock)
-        seen.sinceFirst = item.frame.time - first_.time;
     seen.variant = standardVariant(variantOf(item));
-    seen.role = role_ == capture::Role::unknown ? item.frame.role : role_;
+    Channel& channel = channelOf(item.frame);
+    tellTime(channel, seen);
+    follow(channel, seen);
     return seen;
+}
+
+void Tracker::tellTime(Channel& channel, Seen& seen) {
+    const capture::Frame& frame = seen.frame();
+    seen.when = {frame.clock, frame.time};
+    if (!seen.isFrame() && frame.clock == capture::Clock::none && !frame.ticks)
+        return;
+    seen.at = channel.clock.at(frame);
+    if (frame.clock == capture::Clock::none && frame.ticks)
+        seen.when = {capture::Clock::relative, seen.at};
+    if (seen.when.clock == capture::Clock::none)
+        return;
+    if (!first_)
+        first_ = seen.at;
+    seen.sinceFirst = seen.at - *first_;
+    seen.timeGoesBack = seen.when.clock == channel.last.clock && seen.when.time < channel.last.time;
+    channel.last = seen.when;
 }
 
 capture::Variant Tracker::variantOf(const capture::Item& item) {
@@ -31,15 +55,56 @@ capture::Variant Tracker::variantOf(const capture::Item& item) {
     return capture::Variant::unknown;
 }
 
+Tracker::Channel& Tracker::channelOf(const capture::Frame& frame) {
+    if (lastChannel_ == nullptr || frame.interface != lastInterface_) {
+        const std::string name = frame.interface == nullptr ? "" : frame.interface->name;
+        const capture::Role role = role_ == capture::Role::unknown ? frame.role : role_;
+        lastChannel_ = &channels_.try_emplace(name, calls::Timers(), role).first->second;
+        lastInterface_ = frame.interface;
+    }
+    return *lastChannel_;
+}
+
+void Tracker::follow(Channel& channel, Seen& seen) {
+    const capture::Item& item = *seen.item;
+    switch (item.kind) {
+        case Kind::frame:
+            seen.marks = channel.links.take(item.frame, seen.number, seen.at);
+            seen.command = seen.marks.command;
+            seen.role = seen.marks.role;
+            break;
+        case Kind::oversized:
+        case Kind::cut:
+            channel.links.mayLack(sideOf(item.frame));
+            break;
+        case Kind::lost:
+            channel.links.mayMiss("Frames Lost");
+            break;
+        case Kind::notQueued:
+            channel.links.mayMiss("Enqueue Failed");
+            break;
+        case Kind::notTaken:
+        case Kind::dropped:
+        case Kind::unproved:
+        case Kind::damaged:
+            channel.links.mayMiss("the recorder lost frames");
+            break;
+        case Kind::run:
+        case Kind::restart:
+        case Kind::replaced:
+            channel.links.restarted();
+            break;
+        case Kind::mixed:
+        case Kind::comment:
+            break;
+    }
+}
+
 void readHeaders(Seen& seen) {
     seen.link = isdn::parseLayer2(seen.frame().octets);
     seen.hasMessage = seen.link.carriesMessage();
     if (seen.hasMessage)
         seen.message = isdn::parseLayer3(seen.link.information);
-    if (seen.role != capture::Role::unknown) {
-        const bool sentByNetwork = seen.frame().transmitted == (seen.role == capture::Role::network);
-        seen.command = isdn::isCommand(seen.link.cr, sentByNetwork);
-    }
 }
 
 }  // namespace reader

@@ -3,8 +3,13 @@
 #define READER_TRACKER_H
 
 #include <cstdint>
+#include <map>
+#include <optional>
+#include <string>
 #include <string_view>
 
+#include "calls/ChannelClock.h"
+#include "calls/DChannel.h"
 #include "capture/Item.h"
 #include "reader/Chatter.h"
 #include "reader/Options.h"
@@ -27,15 +32,26 @@ class Tracker {
     // The headers themselves are left to whoever looks at the frame, see readHeaders.
     Seen see(const capture::Item& item);
 
-    std::uint64_t frames() const { return frames_; }
-
   private:
+    struct Channel {
+        Channel(const calls::Timers& timers, capture::Role role) : links(timers, role) {}
+        calls::DChannel links;
+        calls::ChannelClock clock;
+        Instant last;
+    };
+
     capture::Variant variantOf(const capture::Item& item);
+    Channel& channelOf(const capture::Frame& frame);
+    void tellTime(Channel& channel, Seen& seen);
+    static void follow(Channel& channel, Seen& seen);
 
     capture::Role role_;
     capture::Variant variant_;
     std::uint64_t frames_ = 0;
-    Instant first_;
+    std::optional<std::int64_t> first_;                     // on the clocks of the D channels
+    std::map<std::string, Channel, std::less<>> channels_;  // by the name of the D channel
+    const capture::Interface* lastInterface_ = nullptr;
+    Channel* lastChannel_ = nullptr;
     Chatter* chatter_ = nullptr;  // null once the guess was told, or if it need not be
     std::string_view done_;
 };

@@ -1,7 +1,9 @@
 #include "reader/command_line.h"
 
+#include <CLI/CLI.hpp>
 #include <algorithm>
-#include <map>
+#include <functional>
+#include <memory>
 
 #include "reader/Filter.h"
 #include "reader/errors.h"
@@ -41,128 +43,108 @@ class Help : public CLI::Formatter {
     std::string make_positionals(const CLI::App* /*app*/) const override { return ""; }
 };
 
-template <class Value>
-CLI::Option* addChoice(CLI::App& app, const char* names, Value& value,
-                       const std::vector<std::pair<std::string, Value>>& choices, const char* help) {
-    std::string form;
-    for (const auto& [name, meant] : choices)
-        form += (form.empty() ? "" : "|") + name;
+// clang-format off
+constexpr OptionRow inputRows[] = {
+    {"-r,--read", "FILE", "Read FILE; the same as a word of its own. - is the standard input",
+     [](Options& to, const std::string& value) { to.input.files.push_back(value); }},
+    {"-i,--interface", "FILE", "Read FILE, a log or FIFO that is being written: the same as --follow FILE",
+     [](Options& to, const std::string& value) { to.input.files.push_back(value); to.input.follow = true; }},
+    {"-f,--follow", "", "Wait for more at the end, also when the file is replaced by a new one",
+     [](Options& to, const std::string&) { to.input.follow = true; }},
+    {"--merge", "", "Put the frames of several files in the order of their times",
+     [](Options& to, const std::string&) { to.input.merge = true; }},
+    {"--trunk", "NAME", "The name of the D channel, instead of the one that the file tells",
+     [](Options& to, const std::string& value) { to.input.trunk = value; }},
+    {"--role", "user|network", "Which side of the link ours is, instead of what the frames tell",
+     [](Options& to, const std::string& value) {
+         to.input.role = chosen<capture::Role>(value, {{"user", capture::Role::user}, {"network", capture::Role::network}});
+     }},
+    {"--variant", "4ess|5ess|dms100|ntt|net5|ni2", "The switch variant of the trunk, instead of the one that the file tells",
+     [](Options& to, const std::string& value) {
+         to.input.variant = chosen<capture::Variant>(value, {
+             {"4ess", capture::Variant::att4ess}, {"5ess", capture::Variant::ess5}, {"dms100", capture::Variant::dms100},
+             {"ntt", capture::Variant::ntt}, {"net5", capture::Variant::net5}, {"ni2", capture::Variant::ni2}});
+     }},
+    {"--tz", "ZONE", "The time zone that logs were written in and times are shown in",
+     [](Options& to, const std::string& value) { to.input.zone = value; }},
+};
+
+constexpr OptionRow generalRows[] = {
+    {"-o,-w,--output", "OUT", "Write to OUT instead of standard output",
+     [](Options& to, const std::string& value) { to.output.path = value; }},
+    {"-l,--line-buffered", "", "Write each frame at once",
+     [](Options& to, const std::string&) { to.output.lineBuffered = true; }},
+    {"--color", "auto|always|never", "Use colours; auto: on a terminal, unless NO_COLOR is set (default: auto)",
+     [](Options& to, const std::string& value) {
+         to.output.color = chosen<ColorMode>(value, {
+             {"auto", ColorMode::automatic}, {"always", ColorMode::always}, {"never", ColorMode::never}});
+     }},
+    {"--jobs", "N", "Work on N processors (default: all)",
+     [](Options& to, const std::string& value) { to.output.jobs = countIn(value, 256U); }},
+    {"-q,--quiet", "", "Say nothing but errors",
+     [](Options& to, const std::string&) { to.loudness = Loudness::quiet; }},
+    {"-v,--verbose", "", "Say more about the work",
+     [](Options& to, const std::string&) { to.loudness = Loudness::verbose; }},
+};
+
+constexpr OptionRow filterRowsBesides[] = {
+    {"--first", "N", "Only the first N frames that the other filters let through",
+     [](Options& to, const std::string& value) { to.first = countIn<std::uint64_t>(value, INT64_MAX); }},
+    {"--not", "", "In front of a filter: only frames that it would not let through",
+     [](Options&, const std::string&) {}},
+};
+
+constexpr OptionGroup common[] = {
+    {"Input", inputRows},
+    {"Filters", filterRowsBesides},
+    {"", generalRows},
+};
+// clang-format on
+
+// CLI11 knows options and their values; what they mean is called for each time one is given.
+CLI::Option* add(CLI::App& app, std::string_view names, std::string_view form, std::string_view help,
+                 const std::function<void(const std::string&)>& set) {
+    const std::string all(names);
+    if (form.empty())
+        return app.add_flag_function(
+            all, [set](std::int64_t) { set(""); }, std::string(help));
     return app
-        .add_option_function<std::string>(
-            names,
-            [&value, choices, form](const std::string& text) {
-                const auto found = std::find_if(choices.begin(), choices.end(),
-                                                [&](const auto& choice) { return choice.first == text; });
-                if (found == choices.end())
-                    throw CLI::ValidationError(text + " is none of " + form);
-                value = found->second;
+        .add_option_function<std::vector<std::string>>(
+            all,
+            [set, all](const std::vector<std::string>& values) {
+                try {
+                    for (const std::string& value : values)
+                        set(value);
+                } catch (const UsageError& error) {
+                    throw CLI::ValidationError(all, error.what());
+                }
             },
-            help)
-        ->type_name(form);
+            std::string(help))
+        ->type_name(std::string(form))
+        ->allow_extra_args(false)
+        ->take_all();
 }
 
-void addInputOptions(CLI::App& app, Options& to) {
-    InputOptions& input = to.input;
-    const std::string group = "Input";
-    app.add_option("-r,--read", input.files,
-                   "Read FILE; the same as a word of its own. - is the standard input")
-        ->type_name("FILE")
-        ->allow_extra_args(false)
-        ->take_all()
-        ->group(group);
-    app.add_option_function<std::vector<std::string>>(
-           "-i,--interface",
-           [&input](const std::vector<std::string>& files) {
-               input.files.insert(input.files.end(), files.begin(), files.end());
-               input.follow = true;
-           },
-           "Read FILE, a log or FIFO that is being written: the same as --follow FILE")
-        ->type_name("FILE")
-        ->allow_extra_args(false)
-        ->take_all()
-        ->group(group);
-    app.add_flag("-f,--follow", input.follow,
-                 "Wait for more at the end, also when the file is replaced by a new one")
-        ->group(group);
-    app.add_flag("--merge", input.merge, "Put the frames of several files in the order of their times")
-        ->group(group);
-    app.add_option("--trunk", input.trunk,
-                   "The name of the D channel, instead of the one that the file tells")
-        ->type_name("NAME")
-        ->group(group);
-    addChoice<capture::Role>(app, "--role", input.role,
-                             {{"user", capture::Role::user}, {"network", capture::Role::network}},
-                             "Which side of the link ours is, instead of what the frames tell")
-        ->group(group);
-    addChoice<capture::Variant>(app, "--variant", input.variant,
-                                {{"4ess", capture::Variant::att4ess},
-                                 {"5ess", capture::Variant::ess5},
-                                 {"dms100", capture::Variant::dms100},
-                                 {"ntt", capture::Variant::ntt},
-                                 {"net5", capture::Variant::net5},
-                                 {"ni2", capture::Variant::ni2}},
-                                "The switch variant of the trunk, instead of the one that the file tells")
-        ->group(group);
-    app.add_option("--tz", input.zone, "The time zone that logs were written in and times are shown in")
-        ->type_name("ZONE")
-        ->group(group);
-}
-
-void addFilterOptions(CLI::App& app, Options& to) {
-    const std::string group = "Filters";
-    for (const FilterRow& row : filterRows()) {
-        const std::string name(row.name);
-        const auto add = [&](const std::string& option, bool negated) {
-            CLI::Option* added = nullptr;
-            if (row.form.empty()) {
-                added = app.add_flag_function(
-                    option,
-                    [&to, name, negated](std::int64_t) {
-                        to.filters.push_back({name, "", negated});
-                    },
-                    std::string(row.help));
-            } else {
-                added = app.add_option_function<std::vector<std::string>>(
-                               option,
-                               [&to, name, negated](const std::vector<std::string>& values) {
-                                   for (const std::string& value : values)
-                                       to.filters.push_back({name, value, negated});
-                               },
-                               std::string(row.help))
-                            ->type_name(std::string(row.form))
-                            ->allow_extra_args(false)
-                            ->take_all();
-            }
-            return added;
-        };
-        add("--" + name, false)->group(group);
-        add("--not-" + name, true)->group("");  // how `--not --NAME` is handed to CLI11
+void addGroup(CLI::App& app, const OptionGroup& group, Options& options) {
+    for (const OptionRow& row : group.rows) {
+        CLI::Option* const option =
+            add(app, row.names, row.form, row.help,
+                [&options, &row](const std::string& value) { row.set(options, value); });
+        if (!group.title.empty())
+            option->group(std::string(group.title));
     }
-    app.add_option("--first", to.first, "Only the first N frames that the other filters let through")
-        ->type_name("N")
-        ->check(CLI::Validator(CLI::PositiveNumber).description(""))
-        ->group(group);
-    app.add_flag_callback(
-           "--not", [] {}, "In front of a filter: only frames that it would not let through")
-        ->group(group);
 }
 
-void addGeneralOptions(CLI::App& app, Options& to) {
-    OutputOptions& output = to.output;
-    app.add_option("-o,-w,--output", output.path, "Write to OUT instead of standard output")
-        ->type_name("OUT");
-    app.add_flag("-l,--line-buffered", output.lineBuffered, "Write each frame at once");
-    addChoice<ColorMode>(
-        app, "--color", output.color,
-        {{"auto", ColorMode::automatic}, {"always", ColorMode::always}, {"never", ColorMode::never}},
-        "Use colours; auto: on a terminal, unless NO_COLOR is set (default: auto)");
-    app.add_option("--jobs", output.jobs, "Work on N processors (default: all)")
-        ->type_name("N")
-        ->check(CLI::Range(1U, 256U).description(""));
-    app.add_flag_callback(
-        "-q,--quiet", [&to] { to.loudness = Loudness::quiet; }, "Say nothing but errors");
-    app.add_flag_callback(
-        "-v,--verbose", [&to] { to.loudness = Loudness::verbose; }, "Say more about the work");
+void addFilters(CLI::App& app, Options& options) {
+    for (const FilterRow& row : filterRows()) {
+        for (const bool negated : {false, true}) {
+            // How `--not --NAME` is handed to CLI11; --help does not show it.
+            const std::string name = (negated ? "--not-" : "--") + std::string(row.name);
+            add(app, name, row.form, row.help, [&options, &row, negated](const std::string& value) {
+                options.filters.push_back({std::string(row.name), value, negated});
+            })->group(negated ? "" : "Filters");
+        }
+    }
 }
 
 void addCommand(CLI::App& app, const Command& command, Options& options) {
@@ -172,11 +154,10 @@ void addCommand(CLI::App& app, const Command& command, Options& options) {
     sub->set_version_flag("-V,--version", "lapdread " LAPDREAD_VERSION, "Print the version and exit");
     sub->footer("\nExamples:\n" + std::string(command.examples));
     sub->add_option("words", options.words)->group("");
-    addInputOptions(*sub, options);
-    addFilterOptions(*sub, options);
-    if (command.declare != nullptr)
-        command.declare(*sub, options);
-    addGeneralOptions(*sub, options);
+    addGroup(*sub, command.options, options);
+    addFilters(*sub, options);
+    for (const OptionGroup& group : common)
+        addGroup(*sub, group, options);
 }
 
 // `--not` belongs to the filter behind it, whatever CLI11 thinks of their order.
@@ -220,29 +201,30 @@ std::vector<std::string> withCommand(std::vector<std::string> words) {
     return words;
 }
 
+void describe(CLI::App& app, Options& options) {
+    app.formatter(std::make_shared<Help>());
+    app.footer("\n" + std::string(moreOnAll));
+    app.set_help_flag("-h,--help", "Print this and exit");
+    app.set_version_flag("-V,--version", "lapdread " LAPDREAD_VERSION, "Print the version and exit");
+    app.require_subcommand(0, 1);
+    for (const Command& command : commands())
+        addCommand(app, command, options);
+}
+
 }  // namespace
 
-std::unique_ptr<CLI::App> describe(Options& options) {
-    auto app = std::make_unique<CLI::App>(about, "lapdread");
-    app->formatter(std::make_shared<Help>());
-    app->footer("\n" + std::string(moreOnAll));
-    app->set_help_flag("-h,--help", "Print this and exit");
-    app->set_version_flag("-V,--version", "lapdread " LAPDREAD_VERSION, "Print the version and exit");
-    app->require_subcommand(0, 1);
-    for (const Command& command : commands())
-        addCommand(*app, command, options);
-    return app;
-}
+std::span<const OptionGroup> commonOptions() { return common; }
 
 CommandLine parseCommandLine(std::vector<std::string> words) {
     words = joinNegations(withCommand(std::move(words)));
     std::reverse(words.begin(), words.end());  // as CLI11 takes them
     CommandLine line;
-    const std::unique_ptr<CLI::App> app = describe(line.options);
+    CLI::App app(about, "lapdread");
+    describe(app, line.options);
     try {
-        app->parse(std::move(words));
+        app.parse(std::move(words));
     } catch (const CLI::CallForHelp&) {
-        line.told = app->help();
+        line.told = app.help();
         return line;
     } catch (const CLI::CallForVersion&) {
         line.told = "lapdread " LAPDREAD_VERSION "\n";
@@ -250,7 +232,7 @@ CommandLine parseCommandLine(std::vector<std::string> words) {
     } catch (const CLI::ParseError& error) {
         throw UsageError(std::string(error.what()) + " (lapdread --help tells more)");
     }
-    line.command = commandNamed(app->get_subcommands().front()->get_name());
+    line.command = commandNamed(app.get_subcommands().front()->get_name());
     return line;
 }
 

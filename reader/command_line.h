@@ -1,20 +1,18 @@
-// The command line of lapdread. Each option is described once, in CLI11's App; --help, manual pages and
-// completion are made from that.
+// The command line of lapdread: what it says, and which options there are.
 #ifndef READER_COMMAND_LINE_H
 #define READER_COMMAND_LINE_H
 
-#include <CLI/CLI.hpp>
-#include <memory>
+#include <span>
 #include <string>
 #include <vector>
 
-#include "reader/Options.h"
+#include "reader/OptionRow.h"
 #include "reader/commands.h"
 
 namespace reader {
 
-// The description of all commands and options. Parsing it fills `options`, which must outlive it.
-std::unique_ptr<CLI::App> describe(Options& options);
+// The options that all commands have, besides the filters (Filter.h).
+std::span<const OptionGroup> commonOptions();
 
 struct CommandLine {
     std::string told;                  // --help or --version: what to print instead of running anything

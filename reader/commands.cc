@@ -7,6 +7,7 @@
 #include "reader/decode.h"
 #include "reader/explain.h"
 #include "reader/list.h"
+#include "reader/record.h"
 
 namespace reader {
 
@@ -44,16 +45,35 @@ constexpr char convertExamples[] = R"(  lapdread convert lapdmon.log day.pcapng
       the trunk as it runs
 )";
 
-constexpr std::array table{
-    Command{"list", "[FILE...]", "a line a frame; what lapdread does when no command is named", listExamples,
-            declareList, runList},
-    Command{"decode", "[FILE...]", "frames in the words of lapdmon's log", decodeExamples, nullptr,
+constexpr char recordExamples[] =
+    R"(  lapdread record --folder /var/log/trunks --time 1h --files 168 lapdmon.log
+      a week of files of an hour each, while lapdmon writes its log
+  mkfifo trace; lapdread record --trunk pri1 --size 100M trace & lapdmon -b1 -f trace
+      without a log beside them
+)";
+
+const std::array table{
+    Command{"list",
+            "[FILE...]",
+            "a line a frame; what lapdread does when no command is named",
+            listExamples,
+            {"Lines", listOptions()},
+            runList},
+    Command{"decode", "[FILE...]", "frames in the words of lapdmon's log", decodeExamples, OptionGroup(),
             runDecode},
-    Command{"explain", "[HEX|FILE...]",
-            "every octet of a frame or an element: its bits, its field, what it means", explainExamples,
-            declareExplain, runExplain},
-    Command{"convert", "IN [OUT]", "frames in files that other tools read", convertExamples, declareConvert,
-            runConvert},
+    Command{"explain",
+            "[HEX|FILE...]",
+            "every octet of a frame or an element: its bits, its field, what it means",
+            explainExamples,
+            {"Octets", explainOptions()},
+            runExplain},
+    Command{"convert", "IN [OUT]", "frames in files that other tools read", convertExamples, {"Form", convertOptions()}, runConvert},
+    Command{"record",
+            "[FILE...]",
+            "files that begin anew by size or time, of what is followed",
+            recordExamples,
+            {"Files", recordOptions()},
+            runRecord},
 };
 
 }  // namespace

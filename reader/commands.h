@@ -5,11 +5,7 @@
 #include <span>
 #include <string_view>
 
-#include "reader/Options.h"
-
-namespace CLI {
-class App;
-}
+#include "reader/OptionRow.h"
 
 namespace reader {
 
@@ -20,8 +16,7 @@ struct Command {
     std::string_view words;     // what follows the options: "[FILE...]"
     std::string_view summary;   // a line
     std::string_view examples;  // "  lapdread ...\n      what it does\n"
-    // Declares the options that only this command and those like it take.
-    void (*declare)(CLI::App&, Options&);
+    OptionGroup options;        // those that not every command has
     // Returns the exit status; throws UsageError, FileError or ReaderGone.
     int (*run)(const Options&, Chatter&);
 };

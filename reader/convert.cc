@@ -1,7 +1,5 @@
 #include "reader/convert.h"
 
-#include <CLI/CLI.hpp>
-
 #include "reader/TextConsumer.h"
 #include "reader/errors.h"
 #include "reader/forms.h"
@@ -46,16 +44,12 @@ void write(Session& session, const Form& form, Output& out) {
 
 }  // namespace
 
-void declareConvert(CLI::App& app, Options& options) {
-    std::string names;
-    for (const Form& form : forms())
-        (names += names.empty() ? "" : "|") += form.name;
-    app.add_option("--to", options.form, "The form to write; without it the end of OUT's name tells")
-        ->type_name(names)
-        ->check([](const std::string& name) {
-            formNamed(name);
-            return std::string();
-        });
+std::span<const OptionRow> convertOptions() {
+    static constexpr OptionRow rows[] = {
+        {"--to", "pcapng|pcap|jsonl|csv|hex|log", "The form to write; without it the end of OUT's name tells",
+         [](Options& to, const std::string& value) { to.form = formNamed(value).name; }},
+    };
+    return rows;
 }
 
 int runConvert(const Options& given, Chatter& chatter) {

@@ -2,15 +2,13 @@
 #ifndef READER_CONVERT_H
 #define READER_CONVERT_H
 
-#include "reader/Options.h"
+#include <span>
 
-namespace CLI {
-class App;
-}
+#include "reader/OptionRow.h"
 
 namespace reader {
 
-void declareConvert(CLI::App& app, Options& options);
+std::span<const OptionRow> convertOptions();
 int runConvert(const Options& options, Chatter& chatter);
 
 }  // namespace reader

@@ -74,10 +74,10 @@ void CsvComposer::compose(const Seen& seen, std::string& text, Piece& /*piece*/)
     putText(text, safe(frame.place.file));
     putText(text, frame.interface != nullptr ? safe(frame.interface->name) : "");
     text += ',';
-    if (frame.clock == capture::Clock::absolute)
-        times_.append(text, seen.instant());
+    if (seen.when.clock == capture::Clock::absolute)
+        times_.append(text, seen.when);
     text += ',';
-    if (frame.clock != capture::Clock::none)
+    if (seen.when.clock != capture::Clock::none)
         appendSeconds(text, seen.sinceFirst);
     putNumberIf(text, frame.ticks.has_value(), frame.ticks.value_or(0));
     putText(text, frame.transmitted ? "tx" : "rx");
@@ -94,7 +94,9 @@ void CsvComposer::compose(const Seen& seen, std::string& text, Piece& /*piece*/)
     putText(text, messageName(seen));
     putNumberIf(text, seen.hasMessage && seen.message.hasType, seen.message.type);
     putText(text, safeDetails(seen));
-    putText(text, seen.marks);
+    std::string marks;
+    appendMarks(marks, seen);
+    putText(text, marks);
     text += ',';
     appendHex(text, frame.octets);
     text += '\n';

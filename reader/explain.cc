@@ -1,6 +1,6 @@
 #include "reader/explain.h"
 
-#include <CLI/CLI.hpp>
+#include <algorithm>
 #include <filesystem>
 
 #include "reader/Columns.h"
@@ -162,7 +162,7 @@ void ExplainComposer::compose(const Seen& seen, std::string& text, Piece& /*piec
     text += "Frame ";
     appendNumber(text, seen.number);
     text += ", ";
-    times_.append(text, seen.instant());
+    times_.append(text, seen.when);
     text += seen.frame().transmitted ? ", TX " : ", RX ";
     (text += direction(seen)) += ", ";
     appendSafe(text, capture::toString(seen.frame().place));
@@ -199,16 +199,14 @@ bool looksLikeElement(std::span<const std::uint8_t> octets) {
     return octets.size() >= 2 && (octets[0] & 0x80U) == 0 && octets[1] == octets.size() - 2;
 }
 
-void declareExplain(CLI::App& app, Options& options) {
-    const std::string group = "Octets";
-    app.add_flag_callback(
-           "--frame", [&options] { options.explainAs = ExplainAs::frame; },
-           "The digits are a frame, address field first")
-        ->group(group);
-    app.add_flag_callback(
-           "--element", [&options] { options.explainAs = ExplainAs::element; },
-           "The digits are elements, identifier first")
-        ->group(group);
+std::span<const OptionRow> explainOptions() {
+    static constexpr OptionRow rows[] = {
+        {"--frame", "", "The digits are a frame, address field first",
+         [](Options& to, const std::string&) { to.explainAs = ExplainAs::frame; }},
+        {"--element", "", "The digits are elements, identifier first",
+         [](Options& to, const std::string&) { to.explainAs = ExplainAs::element; }},
+    };
+    return rows;
 }
 
 namespace {

@@ -10,11 +10,8 @@
 #include <vector>
 
 #include "isdn/Field.h"
+#include "reader/OptionRow.h"
 #include "reader/Pipeline.h"
-
-namespace CLI {
-class App;
-}
 
 namespace reader {
 
@@ -50,7 +47,7 @@ std::optional<std::vector<std::uint8_t>> readHex(std::string_view text);
 // Whether octets that came without further words are an element: the second one tells how many follow.
 bool looksLikeElement(std::span<const std::uint8_t> octets);
 
-void declareExplain(CLI::App& app, Options& options);
+std::span<const OptionRow> explainOptions();
 int runExplain(const Options& options, Chatter& chatter);
 
 }  // namespace reader

@@ -5,6 +5,7 @@
 #include <cerrno>
 #include <cstring>
 
+#include "capture/open.h"
 #include "reader/Joined.h"
 #include "reader/errors.h"
 
@@ -12,8 +13,12 @@ namespace reader {
 
 namespace {
 
-std::unique_ptr<capture::Reader> openOne(const std::string& file, const InputOptions& /*options*/) {
-    throw FileError(file + ": its form is not known");
+std::unique_ptr<capture::Reader> openOne(const std::string& file, const InputOptions& input) {
+    capture::ReadOptions options;
+    options.follow = input.follow;
+    options.trunk = input.trunk;
+    options.variant = input.variant;
+    return capture::openReader(file, options, capture::forms());
 }
 
 void checkReadable(const std::string& file) {
@@ -45,8 +50,8 @@ std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*c
         openers.emplace_back([file, &input] { return openOne(file, input); });
     }
     if (input.merge && files.size() > 1)
-        return std::make_unique<Merge>(openers, input.trunk);
-    return std::make_unique<Sequence>(std::move(openers), input.trunk);
+        return std::make_unique<Merge>(openers);
+    return std::make_unique<Sequence>(std::move(openers));
 }
 
 }  // namespace reader

@@ -107,15 +107,24 @@ bool isWorthAKey(const isdn::Field& field) {
     return field.kind != extension && field.kind != spare && field.kind != header;
 }
 
-void putMarks(std::string& to, std::string_view marks) {
+void putMarks(std::string& to, const Seen& seen) {
+    std::string marks;
+    appendMarks(marks, seen);
     putKey(to, "marks");
     to += '[';
     for (const std::string& mark : splitAtCommas(marks)) {
         if (to.back() != '[')
             to += ',';
-        appendJsonString(to, mark);
+        appendJsonString(to, std::string_view(mark).substr(mark.front() == ' ' ? 1 : 0));
     }
     to += ']';
+}
+
+void putTruthIf(std::string& to, std::string_view key, std::optional<bool> value) {
+    if (value)
+        putTruth(to, key, *value);
+    else
+        putNull(to, key);
 }
 
 }  // namespace
@@ -143,15 +152,15 @@ void JsonComposer::compose(const Seen& seen, std::string& text, Piece& /*piece*/
     putText(text, "file", frame.place.file);
     putText(text, "interface", frame.interface != nullptr ? std::string_view(frame.interface->name) : "");
     putKey(text, "time");
-    if (frame.clock == capture::Clock::absolute) {
+    if (seen.when.clock == capture::Clock::absolute) {
         text += '"';
-        times_.append(text, seen.instant());
+        times_.append(text, seen.when);
         text += '"';
     } else {
         text += "null";
     }
     putKey(text, "seconds");
-    if (frame.clock == capture::Clock::none)
+    if (seen.when.clock == capture::Clock::none)
         text += "null";
     else
         appendSeconds(text, seen.sinceFirst);
@@ -179,19 +188,18 @@ void JsonComposer::putFrame(std::string& text, const Seen& seen) {
     const isdn::Layer2& link = seen.link;
     putNumber(text, "sapi", link.sapi);
     putNumberIf(text, "tei", link.octets.size() > 1, link.tei);
-    if (seen.command)
-        putTruth(text, "command", *seen.command);
-    else
-        putNull(text, "command");
+    putTruthIf(text, "command", seen.command);
     putText(text, "frame", isdn::nameOf(link.type));
     putNumberIf(text, "ns", link.hasNs(), link.ns);
     putNumberIf(text, "nr", link.hasNr(), link.nr);
     putNumberIf(text, "pf", link.hasPf(), link.pf ? 1 : 0);
     if (link.problem != isdn::Problem::none)
         putText(text, "problem", isdn::nameOf(link.problem));
+    putTruth(text, "retransmission", seen.marks.retransmitted);
+    putTruthIf(text, "accepted", seen.marks.accepted);
     if (seen.hasMessage)
         putMessage(text, seen);
-    putMarks(text, seen.marks);
+    putMarks(text, seen);
     putHex(text, "hex", frame.octets);
 }
 

@@ -1,6 +1,5 @@
 #include "reader/list.h"
 
-#include <CLI/CLI.hpp>
 #include <string_view>
 
 #include "reader/TextConsumer.h"
@@ -18,17 +17,29 @@ constexpr std::string_view wide[] = {"n",      "time", "delta",   "trunk",   "pl
                                      "dir",    "link", "frame",   "ns",      "nr",    "pf",
                                      "length", "ref",  "message", "details", "marks", "hex"};
 
-std::vector<const Column*> chosenColumns(const ListOptions& options) {
-    std::vector<const Column*> chosen;
+constexpr unsigned secondsWidth = 10;
+
+// Seconds are shorter than dates, and stand to the right.
+Column placed(std::string_view name, TimeForm time) {
+    Column column = columnNamed(name);
+    if (column.name == "time" && time == TimeForm::relative) {
+        column.width = secondsWidth;
+        column.right = true;
+    }
+    return column;
+}
+
+std::vector<Column> chosenColumns(const ListOptions& options) {
+    std::vector<Column> chosen;
     if (!options.columns.empty()) {
         for (const std::string& name : options.columns)
-            chosen.push_back(columnNamed(name));
+            chosen.push_back(placed(name, options.time));
         return chosen;
     }
     for (const std::string_view name : options.wide ? std::span<const std::string_view>(wide) : usual) {
         // The time since the line before takes the place of the time, when that is what the time is.
         if (options.time != TimeForm::delta || name != "time")
-            chosen.push_back(columnNamed(name));
+            chosen.push_back(placed(name, options.time));
     }
     return chosen;
 }
@@ -46,50 +57,47 @@ LineComposer::LineComposer(const ListOptions& options, bool colors)
 void LineComposer::compose(const Seen& seen, std::string& text, Piece& piece) {
     const std::size_t lineStart = text.size();
     Cell cell{seen, text, times_, relative_, colors_};
-    bool first = true;
-    for (const Column* column : columns_) {
-        if (!first)
-            text += ' ';
-        first = false;
+    // One blank between columns; two behind a message and other texts that have blanks themselves.
+    std::string_view separator;
+    for (const Column& column : columns_) {
+        text += separator;
         const std::size_t start = text.size();
-        column->put(cell);
-        padTo(text, start, column->width, column->right);
-        if (column->name == deltaColumn) {
+        column.put(cell);
+        padTo(text, start, column.width, column.right);
+        if (column.name == deltaColumn) {
             piece.deltaAt = start;
             piece.deltaSize = deltaWidth;
         }
-        // An empty column at the end of the line takes no blank.
-        if (column->width == 0 && text.size() == start)
-            text.pop_back();
+        if (column.width != 0)
+            separator = " ";
+        else if (text.size() != start)
+            separator = "  ";
+        else
+            text.resize(start - separator.size());
     }
     trimBlanks(text, std::max(lineStart, piece.deltaAt + piece.deltaSize));
     text += '\n';
 }
 
-void declareList(CLI::App& app, Options& options) {
-    ListOptions& list = options.list;
-    const std::string group = "Lines";
-    app.add_flag_callback(
-           "--relative", [&list] { list.time = TimeForm::relative; },
-           "Seconds since the first frame instead of times")
-        ->group(group);
-    app.add_flag_callback(
-           "--delta", [&list] { list.time = TimeForm::delta; },
-           "Seconds since the line before instead of times")
-        ->group(group);
-    app.add_flag("--wide", list.wide, "All columns, the octets among them")->group(group);
-    app.add_option_function<std::string>(
-           "--columns",
-           [&list](const std::string& names) {
-               list.columns = splitAtCommas(names);
-               for (const std::string& name : list.columns)
-                   columnNamed(name);
-           },
-           "These columns, in this order: n, time, delta, trunk, place, ticks, dir, link, frame, ns, nr, pf, "
-           "length, "
-           "ref, message, details, marks, hex")
-        ->type_name("A,B,...")
-        ->group(group);
+std::span<const OptionRow> listOptions() {
+    static constexpr OptionRow rows[] = {
+        {"--relative", "", "Seconds since the first frame instead of times",
+         [](Options& to, const std::string&) { to.list.time = TimeForm::relative; }},
+        {"--delta", "", "Seconds since the line before instead of times",
+         [](Options& to, const std::string&) { to.list.time = TimeForm::delta; }},
+        {"--wide", "", "All columns, the octets among them",
+         [](Options& to, const std::string&) { to.list.wide = true; }},
+        {"--columns", "A,B,...",
+         "These columns, in this order: n, time, delta, trunk, place, ticks, dir, link, frame, ns, nr, pf, "
+         "length, "
+         "ref, message, details, marks, hex",
+         [](Options& to, const std::string& value) {
+             to.list.columns = splitAtCommas(value);
+             for (const std::string& name : to.list.columns)
+                 columnNamed(name);
+         }},
+    };
+    return rows;
 }
 
 int runList(const Options& options, Chatter& chatter) {

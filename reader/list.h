@@ -6,11 +6,8 @@
 #include <vector>
 
 #include "reader/Columns.h"
+#include "reader/OptionRow.h"
 #include "reader/Pipeline.h"
-
-namespace CLI {
-class App;
-}
 
 namespace reader {
 
@@ -23,14 +20,14 @@ class LineComposer : public Composer {
     void compose(const Seen& seen, std::string& text, Piece& piece) override;
 
   private:
-    std::vector<const Column*> columns_;
+    std::vector<Column> columns_;
     bool relative_;
     bool colors_;
     TimeText times_;
 };
 
 int runList(const Options& options, Chatter& chatter);
-void declareList(CLI::App& app, Options& options);
+std::span<const OptionRow> listOptions();
 
 }  // namespace reader
 

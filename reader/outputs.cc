@@ -39,12 +39,4 @@ void checkOutput(const std::string& path, std::span<const std::string> inputs, s
                         std::string(form));
 }
 
-bool looksLikeText(std::string_view beginning) {
-    constexpr std::string_view headOfLog = "\nOrvane KV9 ISDN Trace Utility\n";
-    const auto isText = [](char c) {
-        return (c >= ' ' && c != '\x7f') || c == '\n' || c == '\t' || c == '\x1b' || c < 0;
-    };
-    return !beginning.starts_with(headOfLog) && std::all_of(beginning.begin(), beginning.end(), isText);
-}
-
 }  // namespace reader

@@ -29,7 +29,7 @@ class Session {
     // Opened by the first call: standard output, or the file that the options name, created or emptied. A
     // file that is neither empty nor of the right form ("text") is refused with FileError, and so is one of
     // the inputs.
-    Output& output(std::string_view form = "text", bool (*looksRight)(std::string_view) = looksLikeText);
+    Output& output(std::string_view form = "", bool (*looksRight)(std::string_view) = looksLikeNothing);
     bool useColors() { return reader::useColors(options_.output, output()); }
 
     // Says so once if frames are `done` ("decoded") by the rules of a variant that nobody has named.

@@ -35,7 +35,7 @@ install_packages() {
 
 BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libpcap-dev libtomlplusplus-dev nlohmann-json3-dev)
 CHECK_PACKAGES=(clang-format clang-tidy cppcheck)
-TEST_PACKAGES=(libgtest-dev libgmock-dev libbenchmark-dev python3)
+TEST_PACKAGES=(libgtest-dev libgmock-dev libbenchmark-dev python3 python3-jsonschema tmux tshark)
 
 # build_preset PRESET [OPTION...]: configures and builds a preset. Shows the compiler's output only if that fails.
 build_preset() {

@@ -39,12 +39,12 @@ std::string all(capture::Reader& reader) {
 
 TEST(Sequence, GivesOneInputAfterAnother) {
     Sequence sequence(
-        {scripted("a", {{"x", 5 * second}, {"x", 6 * second}}), scripted("b", {{"y", 1 * second}})}, "");
+        {scripted("a", {{"x", 5 * second}, {"x", 6 * second}}), scripted("b", {{"y", 1 * second}})});
     EXPECT_EQ(all(sequence), "x@5 a:1, x@6 a:2, y@1 b:1");
 }
 
 TEST(Sequence, KeepsNamesForLongerThanTheInputsTheyCameFrom) {
-    Sequence sequence({scripted("a", {{"x", 0}}), scripted("b", {{"y", 0}})}, "");
+    Sequence sequence({scripted("a", {{"x", 0}}), scripted("b", {{"y", 0}})});
     capture::Item first;
     capture::Item other;
     sequence.next(first);
@@ -54,13 +54,8 @@ TEST(Sequence, KeepsNamesForLongerThanTheInputsTheyCameFrom) {
     EXPECT_EQ(other.frame.interface->name, "y");
 }
 
-TEST(Sequence, GivesTheNameThatTheUserWants) {
-    Sequence sequence({scripted("a", {{"x", 0}}), scripted("b", {{"y", 0}})}, "trunk7");
-    EXPECT_EQ(all(sequence), "trunk7@0 a:1, trunk7@0 b:1");
-}
-
 TEST(Sequence, GivesOneObjectForFramesOfOneDChannel) {
-    Sequence sequence({scripted("a", {{"x", 0}}), scripted("b", {{"y", 0}, {"x", 0}})}, "");
+    Sequence sequence({scripted("a", {{"x", 0}}), scripted("b", {{"y", 0}, {"x", 0}})});
     capture::Item first;
     capture::Item other;
     capture::Item again;
@@ -72,31 +67,29 @@ TEST(Sequence, GivesOneObjectForFramesOfOneDChannel) {
 }
 
 TEST(Sequence, PausesWhereItsInputDoes) {
-    Sequence sequence({scripted("a", {{"x", 0}, {"pause"}, {"x", second}})}, "");
+    Sequence sequence({scripted("a", {{"x", 0}, {"pause"}, {"x", second}})});
     EXPECT_EQ(all(sequence), "x@0 a:1, pause, x@1 a:2");
 }
 
 TEST(Merge, PutsItemsInTheOrderOfTheirTimes) {
     Merge merge({scripted("a", {{"x", 1 * second}, {"x", 4 * second}}),
-                 scripted("b", {{"y", 2 * second}, {"y", 3 * second}, {"y", 5 * second}})},
-                "");
+                 scripted("b", {{"y", 2 * second}, {"y", 3 * second}, {"y", 5 * second}})});
     EXPECT_EQ(all(merge), "x@1 a:1, y@2 b:1, y@3 b:2, x@4 a:2, y@5 b:3");
 }
 
 TEST(Merge, LeavesItemsOfOneTimeInTheOrderOfTheInputs) {
-    Merge merge({scripted("a", {{"x", second}}), scripted("b", {{"y", second}})}, "");
+    Merge merge({scripted("a", {{"x", second}}), scripted("b", {{"y", second}})});
     EXPECT_EQ(all(merge), "x@1 a:1, y@1 b:1");
 }
 
 TEST(Merge, WaitsForNobodyWhoHasNothingJustNow) {
-    Merge merge({scripted("a", {{"pause"}, {"x", 1 * second}}), scripted("b", {{"y", 2 * second}})}, "");
+    Merge merge({scripted("a", {{"pause"}, {"x", 1 * second}}), scripted("b", {{"y", 2 * second}})});
     EXPECT_EQ(all(merge), "y@2 b:1, x@1 a:1");
 }
 
 TEST(Merge, LetsItemsWithoutATimeThrough) {
     Merge merge({scripted("a", {{"x", 5 * second}}),
-                 scripted("b", {{"y", 0, {2, 1, 1, 1}, false, capture::Clock::none}})},
-                "");
+                 scripted("b", {{"y", 0, {2, 1, 1, 1}, false, capture::Clock::none}})});
     EXPECT_EQ(all(merge), "y@0 b:1, x@5 a:1");
 }
 

@@ -53,12 +53,5 @@ TEST_F(OutputsTest, MayNotBeAnInputByAnyName) {
     EXPECT_THROW(checkOutput(path("link"), inputs, "an A", beginsWithA), FileError);
 }
 
-TEST(LooksLikeText, IsNoLogAndNoCapture) {
-    EXPECT_TRUE(looksLikeText("    1 2026-11-21T11:25:33.300+00:00\n"));
-    EXPECT_FALSE(looksLikeText("\nOrvane KV9 ISDN Trace Utility\nRecords"));
-    EXPECT_FALSE(looksLikeText(std::string_view("\x0a\x0d\x0d\x0a\x1c\0\0\0", 8)));
-    EXPECT_FALSE(looksLikeText(std::string_view("\xd4\xc3\xb2\xa1\x02\0\x04\0", 8)));
-}
-
 }  // namespace
 }  // namespace reader

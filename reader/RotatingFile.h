@@ -1,0 +1,82 @@
+// The files that one D channel is recorded in, one after another.
+#ifndef READER_ROTATING_FILE_H
+#define READER_ROTATING_FILE_H
+
+#include <chrono>
+#include <cstdint>
+#include <memory>
+#include <string>
+
+#include "capture/Writer.h"
+#include "reader/Chatter.h"
+#include "reader/forms.h"
+
+namespace reader {
+
+struct RotationRules {
+    std::string folder;
+    const Form* form = nullptr;  // one with a writer
+    std::uint64_t size = 0;      // a file of so many octets is finished; 0: whatever its size
+    std::int64_t period = 0;     // seconds; a new file at each multiple of it in local time; 0: never
+    unsigned kept = 0;           // how many finished files stay; 0: all
+};
+
+// Writes TRUNK.START.FORM, which is named TRUNK.START.FORM.part until it is finished. START is the time of
+// its first item, in UTC: 20261121T112533Z. A record is never split between files. What cannot be written is
+// counted; once writing works again, the file says how many frames are missing.
+class RotatingFile {
+  public:
+    // References are kept.
+    RotatingFile(const RotationRules& rules, const std::string& trunk, Chatter& chatter);
+    // Finishes the file.
+    ~RotatingFile();
+
+    RotatingFile(const RotatingFile&) = delete;
+    RotatingFile& operator=(const RotatingFile&) = delete;
+
+    void write(const capture::Item& item);
+    // Everything goes to the disk, and a file whose time has passed or that has its size is finished.
+    void flush();
+    // The next item begins a new file.
+    void finish();
+
+    std::uint64_t lostInAll() const { return lostInAll_; }
+
+  private:
+    using HostClock = std::chrono::steady_clock;
+
+    bool begin(const capture::Item& item);
+    void writeLoss(const capture::Item& item);
+    void fail(const std::string& why);
+    void give(std::uint64_t frames) {
+        lost_ += frames;
+        lostInAll_ += frames;
+    }
+    void closeFile();
+    void nameFinished();
+    void removeOldest() const;
+    std::int64_t periodOf(std::int64_t second) const;
+    std::string pathOf(std::int64_t second) const;
+
+    const RotationRules& rules_;
+    Chatter& chatter_;
+    std::string trunk_;
+    std::string path_;  // of the finished file
+    int descriptor_ = -1;
+    std::unique_ptr<capture::Writer> writer_;
+    std::int64_t period_ = 0;    // the multiple of the period that the file belongs to
+    std::uint64_t size_ = 0;     // octets that are safely in the file
+    std::uint64_t pending_ = 0;  // octets of items since
+    std::uint64_t pendingFrames_ = 0;
+    std::uint64_t lost_ = 0;  // frames that the next file has to report
+    std::uint64_t lostInAll_ = 0;
+    bool failing_ = false;  // the failure was said
+    HostClock::time_point retryAt_;
+};
+
+// A name that is safe in a path: letters, digits and "-_+@=." stay, anything else becomes "_".
+std::string fileNameOf(const std::string& trunk);
+
+}  // namespace reader
+
+#endif

@@ -1,0 +1,22 @@
+// Records what is followed in files that begin anew by size or time.
+#ifndef READER_RECORD_H
+#define READER_RECORD_H
+
+#include <span>
+#include <string>
+
+#include "reader/OptionRow.h"
+
+namespace reader {
+
+// "500k", "100M", "2G": octets, in powers of 1000. Throws UsageError.
+std::uint64_t readSize(const std::string& text);
+// "90s", "15min", "1h", "1d", in seconds. Throws UsageError.
+std::int64_t readPeriod(const std::string& text);
+
+std::span<const OptionRow> recordOptions();
+int runRecord(const Options& options, Chatter& chatter);
+
+}  // namespace reader
+
+#endif
