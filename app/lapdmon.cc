@@ -122,8 +122,6 @@ int untilEnded() {
 
 // The exit status.
 int trace(int argc, char** argv) {
-    openStandardStreams();
-    outliveOutput();
     vela::MsgQueue::DefaultDepth = QueueDepth;
     parseArgs(argc, argv);
     openLog();

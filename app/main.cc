@@ -1,3 +1,9 @@
 #include "app/lapdmon.h"
+#include "app/standard_streams.h"
 
-int main(int argc, char** argv) { return app::runTrace(argc, argv); }
+int main(int argc, char** argv) {
+    app::openStandardStreams();
+    app::outliveOutput();
+    app::decoupleStandardStreams();
+    return app::runTrace(argc, argv);
+}

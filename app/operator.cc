@@ -10,6 +10,7 @@
 #include <csignal>
 
 #include "app/Log.h"
+#include "app/standard_streams.h"
 
 namespace app {
 
@@ -57,6 +58,7 @@ void exit_handle(int signal) {
         hurried = true;
         traceLog.giveUp();
     } else {
+        awaitStandardStreams();
         static_cast<void>(std::signal(signal, SIG_DFL));
         static_cast<void>(raise(signal));  // takes effect as the handler returns
     }
@@ -83,18 +85,6 @@ void watchSignals() {
         if (each != SIGHUP || before.sa_handler != SIG_IGN)
             sigaction(each, &action, nullptr);
     }
-}
-
-void openStandardStreams() {
-    for (const int each : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
-        if (fcntl(each, F_GETFD) < 0)
-            static_cast<void>(open("/dev/null", O_RDWR));  // the lowest number that is free: this one
-    }
-}
-
-void outliveOutput() {
-    static_cast<void>(std::signal(SIGPIPE, SIG_IGN));
-    static_cast<void>(std::signal(SIGXFSZ, SIG_IGN));
 }
 
 void boardLost() {

@@ -33,14 +33,6 @@ class WritingOut {
 // waits for it is to be counted and dropped. From any thread.
 bool shutdownHurried();
 
-// Standard streams that are closed lead nowhere from here on. Otherwise the next files that are opened would
-// take their numbers: reports would end up in the log, or wake whoever waits for a signal.
-void openStandardStreams();
-
-// A screen or a log that nobody reads any more, or that grows past the limit of its size, must not end the
-// process, least of all its shutdown.
-void outliveOutput();
-
 enum class Ending { Asked, BoardLost };
 
 // Returns once "q" was read from standard input, a signal came, or boardLost was called. Any other character

@@ -10,11 +10,11 @@
 #include <memory>
 #include <sstream>
 #include <string>
-#include <string_view>
 
 #include "app/Log.h"
 #include "app/display.h"
 #include "app/guarded.h"
+#include "app/standard_streams.h"
 #include "decoder/state.h"
 
 namespace app {
@@ -72,8 +72,7 @@ void sayWhatAndWhere() {
         std::cerr << "lapdmon: the trace ends, nobody handled " + whatIsWrong() + " " + place() + "\n"
                   << std::flush;
     } catch (...) {
-        constexpr std::string_view words = "lapdmon: the trace ends, nobody handled an exception\n";
-        static_cast<void>(!write(STDERR_FILENO, words.data(), words.size()));
+        std::cerr << "lapdmon: the trace ends, nobody handled an exception\n" << std::flush;
     }
 }
 
@@ -83,6 +82,7 @@ void sayWhatAndWhere() {
         closeInTime();
     } catch (...) {  // the words matter all the same
     }
+    endStandardStreams();  // from here on words need no memory and no other thread
     sayWhatAndWhere();
     _exit(EXIT_FAILURE);
 }

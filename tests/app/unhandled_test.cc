@@ -11,12 +11,14 @@
 
 #include "app/Log.h"
 #include "app/guarded.h"
+#include "app/standard_streams.h"
 #include "vela/Exception.h"
 
 namespace app {
 namespace {
 
 [[noreturn]] void endByAnException(const std::string& name) {
+    decoupleStandardStreams();
     closeLogWhenUnhandled();
     traceLog.open(name.c_str());
     traceLog.write("one entry\n");
@@ -40,6 +42,7 @@ struct Unspeakable : vela::Exception {
 };
 
 [[noreturn]] void endByAnExceptionThatCannotBeNamed(const std::string& name) {
+    decoupleStandardStreams();
     closeLogWhenUnhandled();
     traceLog.open(name.c_str());
     traceLog.write("one entry\n");

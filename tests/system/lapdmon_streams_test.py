@@ -6,7 +6,7 @@ import time
 import unittest
 from signal import SIGTERM
 
-from harness import BANNER, LAPDMON, MARK, RECEIVED, SystemTest, capture, wait_until_full
+from harness import BANNER, LAPDMON, MARK, RECEIVED, SystemTest, capture, time_of, wait_until_full
 from order import MOST_THREADS
 
 FRAMES = [(RECEIVED, bytes((2, 1, 1, i % 251))) for i in range(250)]
@@ -73,6 +73,65 @@ class StalledStandardError(SystemTest):
         program.ends()
         self.assertEqual(text.count("Unregisterd "), self.MANY)
         self.assertEqual(program.journal.lines()[-1], BALANCE)
+
+
+class UnreadStreams(SystemTest):
+    """A stream that nobody reads: the screen, while every frame is reported there, or standard error, while every event is
+    of a group that nobody registered for."""
+
+    SCENARIO = 'frames = "frames.pcap"\nrate = "max"\nloop = true\n'
+    #             (frames, scenario, what is said of each)
+    STREAMS = {
+        "1>stopped": (25000 * [MARK], SCENARIO, "Frame Error\n"),
+        "2>stopped": (20 * FRAMES, SCENARIO + "label = 3\n", "Unregisterd EventGroup 3\n"),
+    }
+    NOTICE = re.compile(r"^lapdmon: nobody read this stream, lines dropped here: [1-9]\d*$", re.M)
+
+    def unread(self, stream):
+        """A trace whose stream nobody reads, after it had more to say than may wait."""
+        path = self.folder / "stopped"
+        path.unlink(missing_ok=True)
+        os.mkfifo(path)
+        reader = os.open(path, os.O_RDONLY | os.O_NONBLOCK)
+        self.addCleanup(os.close, reader)
+        frames, scenario, _ = self.STREAMS[stream]
+        self.file("frames.pcap", capture(*frames, interval=0.004))
+        program = self.on_board("--scenario", self.file("scenario.toml", scenario),
+                                run=("sh", "-c", f'exec "$0" -b1 {stream}', LAPDMON))
+        program.journal.wait(" EvtDetected ", times=len(frames))
+        wait_until_full(reader)
+        return program, reader
+
+    def test_they_delay_neither_frames_nor_requests_nor_the_end(self):
+        for stream in self.STREAMS:
+            with self.subTest(stream):
+                program, _ = self.unread(stream)
+                program.types("q")
+                program.ends()
+                self.assertEqual(program.heard()[-2:], ["26 CancelEvt {Type 2}", "8 SetParm {Parm 10 Val 0}"])
+                self.assertEqual(program.journal.lines()[-1], BALANCE)
+                if stream == "1>stopped":
+                    times = re.findall(r"Time = (\S+)", program.log())
+                    self.assertEqual(times[:24000], [time_of(i) for i in range(24000)])
+
+    def test_what_is_dropped_is_counted_and_said_when_they_are_read_again(self):
+        for stream, (_, _, said) in self.STREAMS.items():
+            with self.subTest(stream):
+                program, reader = self.unread(stream)
+                os.set_blocking(reader, True)
+                text = ""
+                while not self.NOTICE.search(text):
+                    text += os.read(reader, 65536).decode()
+                self.assertGreater(text.index("lines dropped"), 1_000_000)
+                behind = text.index("lines dropped")
+                while said not in text[behind:]:
+                    text += os.read(reader, 65536).decode()
+                program.types("q")
+                while some := os.read(reader, 65536).decode():
+                    text += some
+                program.ends()
+                if stream == "1>stopped":
+                    self.assertTrue(text.endswith("general Exception caught in lapdmon(215)\n"))
 
 
 if __name__ == "__main__":
