@@ -1,4 +1,4 @@
-// Receives what a board-side object sends unasked.
+// The base class of objects that receive the unasked messages of one board-side object.
 #ifndef VELA_ASYNCMSGRECEIVER_H
 #define VELA_ASYNCMSGRECEIVER_H
 
@@ -20,20 +20,22 @@ class AsyncMsgReceiver : public virtualObject {
     AsyncMsgReceiver& operator=(const AsyncMsgReceiver&) = delete;
     ~AsyncMsgReceiver() override;
 
-    // Owns the message. Called on the queue's routing thread.
+    // Takes the message and owns it. Called on the queue's reader thread.
     virtual void receive(Msg* msg) = 0;
 
     Addressable* owner() const { return owner_; }
 
-    // Both do nothing when that is how things stand. enrol throws Exception when the address is taken.
+    // Register with the queue, and deregister. Each does nothing when that is so already. enrol throws
+    // Exception when another receiver is registered for the address.
     void enrol();
     void leave();
-    // Leaves the queue it is registered with for another; stays there when that throws, as enrol does.
+    // Deregisters from its queue and registers with another. If that throws, as enrol does, it stays with the
+    // old queue.
     void moveTo(MsgQueue* queue);
 
   private:
     Addressable* owner_;
-    MsgQueue* queue_ = nullptr;  // where it is registered
+    MsgQueue* queue_ = nullptr;  // the queue that it is registered with
     CompDesc_t source_;
 };
 

@@ -17,14 +17,15 @@ void Board::MsgQueueAttach(MsgQueue* queue) {
     resourceMgr_.reset();
     try {
         Addressable::MsgQueueAttach(queue);
-    } catch (...) {  // the board stays where it was
+    } catch (...) {  // the board stays on its old queue
         makeManagers();
         throw;
     }
     makeManagers();
 }
 
-// By the families' tables, not through the managers: it runs on other threads, while those may be made again.
+// Looks into the tables of the families and does not use the managers: this function runs on other threads,
+// while the managers may be made anew.
 MsgBody* Board::MsgBodyLookup(unsigned int msgType) {
     if (MsgBody* const body = ClusterMgr::Bodies::make(msgType); body != nullptr)
         return body;

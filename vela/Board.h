@@ -13,26 +13,28 @@ namespace vela {
 
 class Board : public Addressable {
   public:
-    // A null queue gives the board a private one, which what is found through it shares.
+    // If the queue is null, the board makes a private one. Objects that are found through the board share its
+    // queue.
     Board(unsigned int board, MsgQueue* queue);
     ~Board() override { endCallbacks(); }
 
-    // Makes the managers again on the new queue.
+    // Moves the board to another queue and makes its managers anew on that queue.
     void MsgQueueAttach(MsgQueue* queue) override;
-    // The cluster manager's bodies, then the resource manager's.
+    // Looks among the bodies of the cluster manager, then among those of the resource manager.
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
     MsgBody* EvtBodyLookup(unsigned int evtType) override;
 
-    // The first component of the type (0: any) on the processor, or the instance of that number. Throw
-    // Timeout when the board is silent, UnexpectedMsg when it refuses.
+    // Find the first component of the type (0: any) on the processor, or the instance with that number. Throw
+    // Timeout when the board does not answer, and UnexpectedMsg when it refuses, also because nothing was
+    // found.
     Component findComp(unsigned char compType, unsigned char processor);
     Instance findInst(unsigned char compType, unsigned char processor, unsigned short instance);
 
-    // The managers' time-outs too, and with them those of what is found from now on.
+    // Also sets the time-out of the managers, and so of the objects that are found from now on.
     void setResponseTimeout(unsigned int ms) override;
     void setErrorWaitTime(unsigned int ms) override;
 
-    // The board's own. A time-out that is set on a manager is that manager's alone.
+    // The board owns the managers. A time-out that is set on a manager is for that manager only.
     ResourceMgr& resourceMgr() { return *resourceMgr_; }
     ClusterMgr& clusterMgr() { return *clusterMgr_; }
 

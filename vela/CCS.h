@@ -1,4 +1,4 @@
-// The common-channel-signalling component: runs the D channel and reports its layer-2 frames.
+// The common-channel-signalling component, which runs a D channel and reports its layer-2 frames.
 #ifndef VELA_CCS_H
 #define VELA_CCS_H
 
@@ -12,7 +12,7 @@ struct EvtL2Trace {
     U32<"Label"> Label; U32<"Direction"> Direction; U32<"Timestamp"> Timestamp; U32<"Length"> Length;
     RestBytes<"List"> List;
 };
-// One information element: an identifier, and unless that is a single-octet element, a length and a value.
+// One information element: an identifier, and unless the element has a single octet, a length and a value.
 struct IEPubData {
     U8<"IEId"> IEId; Count8<"Length"> Length; Array<unsigned char, WireType::Unsigned8, "Value"> Value;
     std::size_t fieldsPresent() const;
@@ -27,12 +27,13 @@ struct ieMessage {
 }  // namespace rows
 
 struct CCSMessages {
-    // One layer-2 trace record. Label 2 is a frame; Direction 1 was transmitted by the board, anything else
-    // received; Timestamp in ticks of 4 ms; Length in octets, of which List may hold fewer.
+    // A trace record. Label 2 is a frame. Direction is 1 for a frame that the board transmitted, any other
+    // value for one that it received. Timestamp counts 4 ms. Length is in octets; List may hold fewer.
     // clang-format off
     struct EvtL2Trace_t : Body<2, rows::EvtL2Trace> { using Body::Body; };
-    // A call-control message: a call, and information elements that are private or public. A list of public
-    // ones that was read is as long as the octets it was read from.
+    // A call-control message: a call, and its private and public information elements. After reading, the
+    // list of public elements has as many entries as there were octets; those after the last element are
+    // empty.
     struct ieMessage_t : Body<5376, rows::ieMessage> { using Body::Body; };
     // clang-format on
 
@@ -51,7 +52,8 @@ class CCS : public Component, public CCSMessages {
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
     MsgBody* EvtBodyLookup(unsigned int evtType) override;
 
-    // Sends a call-control message, which has no reply: waits for an error only. Throw UnexpectedMsg.
+    // Sends a call-control message. It has no reply, so the function waits for an error only. Throws
+    // UnexpectedMsg.
     void SendIE(ieMessage_t& message) { command(message, Wait()); }
     void SendIE(unsigned short callRef, unsigned short callId, unsigned char messageId);
     void SendIE(unsigned short callRef, unsigned short callId, unsigned char messageId,
@@ -61,7 +63,7 @@ class CCS : public Component, public CCSMessages {
     void SendIE(unsigned short callRef, unsigned short callId, unsigned char messageId,
                 staticList<unsigned char>& privateData, staticList<ieMessage_t::IEPubData_t>& elements);
 
-    void* userData = nullptr;  // the owner's own
+    void* userData = nullptr;  // for the application; the layer does not use it
 };
 
 }  // namespace vela

@@ -38,16 +38,16 @@ class Cluster : public Addressable, public ClusterMessages {
     Cluster(const CompDesc_t& target, MsgQueue* queue) : Addressable(target, queue) {}
     explicit Cluster(const Addressable& found) : Addressable(found) {}
     Cluster(const Cluster& other) = default;
-    // What was found at the address through `finder`: on its queue and with its time-outs.
+    // An object that `finder` has found at the address. It uses the queue and the time-outs of `finder`.
     Cluster(const CompDesc_t& target, const Addressable& finder) : Addressable(target, finder) {}
     ~Cluster() override { endCallbacks(); }
 
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
 
-    // Commands; all throw Timeout, UnexpectedMsg. See StdResource for their forms; the field forms are about
-    // this cluster.
+    // Commands. All throw Timeout, UnexpectedMsg. StdResource.h describes their forms. The forms with fields
+    // name this cluster.
 
-    // Two members, each by a port of its own.
+    // Connects two members, each by one of its ports.
     void connect(ClusterConnect_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
@@ -86,7 +86,7 @@ class Cluster : public Addressable, public ClusterMessages {
     }
     void slots(unsigned int portId, ClusterSlotInfoResult_t* reply, Wait wait = {});
 
-    // The members.
+    // Reads the members of the cluster.
     void components(ClusterCompInfo_t& cmd, ClusterCompInfoResult_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }

@@ -19,7 +19,7 @@ struct ClusterMgrMessages : ManagerMessages {
     struct ClusterFind_t : Command<8388691, ClusterResult_t, rows::CompStartAttr> { using Command::Command; };
     // clang-format on
 
-    // ResultComplete_t stands below the first code of this family.
+    // ResultComplete_t is not in the table: its code is below the first code of this family.
     using Bodies =
         BodyTable<ComponentResult_t, ClusterByComp_t, ClusterCompByAttr_t, ClusterCreate_t, ClusterDestroy_t,
                   ClusterResult_t, ClusterAllocate_t, ClusterFree_t, ClusterFind_t>;
@@ -27,16 +27,17 @@ struct ClusterMgrMessages : ManagerMessages {
 
 class ClusterMgr : public Addressable, public ClusterMgrMessages {
   public:
-    // The manager of the board that the object stands on, on the object's queue and with its time-outs.
+    // The cluster manager of the object's board. It uses the object's queue and time-outs.
     explicit ClusterMgr(const Addressable* object);
     explicit ClusterMgr(const Addressable& object) : ClusterMgr(&object) {}
     ~ClusterMgr() override { endCallbacks(); }
 
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
 
-    // Commands; all throw Timeout, UnexpectedMsg (nothing found among them). See StdResource for their forms.
+    // Commands. All throw Timeout, and UnexpectedMsg, also when nothing is found. StdResource.h describes
+    // their forms.
 
-    // A cluster that has the attributes: one that is there, one for the caller, or a new one.
+    // Finds a cluster with the attributes, allocates one to the caller, or creates a new one.
     void find(ClusterFind_t& cmd, ClusterResult_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     Cluster find(CompDesc_t start, staticList<CompAttr_t>& attributes, Wait wait = {});
     void allocate(ClusterAllocate_t& cmd, ClusterResult_t* reply, Wait wait = {}) {
@@ -46,7 +47,7 @@ class ClusterMgr : public Addressable, public ClusterMgrMessages {
     void create(ClusterCreate_t& cmd, ClusterResult_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     Cluster create(CompDesc_t start, staticList<CompAttr_t>& attributes, Wait wait = {});
 
-    // The end of what allocate and create gave.
+    // free gives back what allocate gave; destroy ends what create made.
     void free(ClusterFree_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     void free(CompDesc_t cluster, Wait wait = {}) { command(ClusterFree_t(cluster), nullptr, wait); }
     void destroy(ClusterDestroy_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
@@ -54,12 +55,12 @@ class ClusterMgr : public Addressable, public ClusterMgrMessages {
     }
     void destroy(CompDesc_t cluster, Wait wait = {}) { command(ClusterDestroy_t(cluster), nullptr, wait); }
 
-    // The cluster that a component instance is a member of.
+    // Finds the cluster of which a component instance is a member.
     void byComponent(ClusterByComp_t& cmd, ClusterResult_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
     Cluster byComponent(CompDesc_t instance, Wait wait = {});
-    // The first member of a cluster that has the type and the attributes.
+    // Finds the first member of a cluster with this type and these attributes.
     void componentByAttr(ClusterCompByAttr_t& cmd, ComponentResult_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }

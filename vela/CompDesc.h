@@ -24,14 +24,14 @@ class CompDesc_t : public MsgBody {
     unsigned int writeMsg(Msg* msg, unsigned int offset) override;
     unsigned int readMsg(Msg* msg, unsigned int offset) override;
     unsigned int GetByteSize() const override { return 6; }
-    // "{Node 4 Board 1 Processor 2 Component 3 Instance 5}", numbers in the stream's base.
+    // Writes "{Node 4 Board 1 Processor 2 Component 3 Instance 5}", with numbers in the stream's base.
     void toStream(std::ostream* out) const override;
 
     unsigned short Instance = 0;  // within the component
     unsigned char Board = 0;
     unsigned char Processor = 0;
     unsigned char Component = 0;
-    unsigned char Node = 0;  // the host
+    unsigned char Node = 0;  // the host; boards have node 0
 };
 
 }  // namespace vela

@@ -34,7 +34,7 @@ Instance::~Instance() {
     try {
         Instance::unuse();
     } catch (const Exception& exception) {
-        report(exception);  // nobody is left to tell
+        report(exception);  // a destructor must not throw
     } catch (...) {
         report("an instance could not be given back");
     }

@@ -1,4 +1,4 @@
-// Handles on components and on component instances found on a board.
+// Components and component instances that were found on a board.
 #ifndef VELA_COMPONENT_H
 #define VELA_COMPONENT_H
 
@@ -19,18 +19,19 @@ class Component : public StdResource {
 
 class TmpInstance;
 
-// On destruction gives back what it reserved itself, and nothing else.
+// A component instance. The destructor gives back what this object itself has reserved in the board, and
+// nothing else.
 class Instance : public StdResource {
   public:
-    // With inUse not 0 reserves the instance at once. Throws Timeout, UnexpectedMsg.
+    // If inUse is not 0, reserves the instance. Throws Timeout, UnexpectedMsg.
     Instance(const CompDesc_t& target, MsgQueue* queue, int inUse);
     Instance(const CompDesc_t& target, MsgQueue* queue) : Instance(target, queue, 0) {}
     explicit Instance(const StdResource& found) : StdResource(found) {}
-    Instance(const Instance& other) : StdResource(other) {}  // reserves nothing of its own
-    Instance(const TmpInstance& other, int inUse);           // as a copy, and then as the first
+    Instance(const Instance& other) : StdResource(other) {}  // a copy has reserved nothing itself
+    Instance(const TmpInstance& other, int inUse);           // a copy; reserves as the first constructor does
     ~Instance() override;
 
-    // As StdResource's, and remembered.
+    // The functions of StdResource. The object also remembers what it has reserved.
     void use(unsigned int payload) override;
     void unuse() override;
     void free() override;
@@ -39,11 +40,11 @@ class Instance : public StdResource {
     void giveUpOwnership() { ownsUse_ = reserved_ = false; }
 
   private:
-    bool ownsUse_ = true;    // what was reserved is this handle's to give back
-    bool reserved_ = false;  // and something was
+    bool ownsUse_ = true;    // the destructor gives back what was reserved
+    bool reserved_ = false;  // something was reserved
 };
 
-// Gives nothing back: its end sends nothing to the board.
+// An instance whose destructor gives nothing back and sends nothing to the board.
 class TmpInstance : public Instance {
   public:
     TmpInstance(const CompDesc_t& target, MsgQueue* queue) : Instance(target, queue, 0) {}

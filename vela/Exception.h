@@ -1,4 +1,4 @@
-// The root of the layer's exceptions: thrown by value, printed with operator<<.
+// The base class of the layer's exceptions. They are thrown by value and printed with operator<<.
 #ifndef VELA_EXCEPTION_H
 #define VELA_EXCEPTION_H
 
@@ -8,10 +8,10 @@ namespace vela {
 
 class Exception : public virtualObject {
   public:
-    // `name` is a string literal: it is kept, never copied or freed.
+    // `name` must be a string literal: the exception keeps the pointer.
     explicit Exception(const char* name = "Exception") : name_(name) {}
 
-    void toStream(std::ostream* out) const override;  // the name
+    void toStream(std::ostream* out) const override;  // writes the name
 
   private:
     const char* name_;

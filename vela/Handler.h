@@ -1,5 +1,5 @@
-// What a user registers for messages or events: a function, or an object and a member function of it, taking
-// the decoded body or the message.
+// A callback for messages or events: a function, or an object with a member function. It takes the decoded
+// body or the message.
 #ifndef VELA_HANDLER_H
 #define VELA_HANDLER_H
 
@@ -12,18 +12,19 @@ namespace vela {
 
 class Addressable;
 
-// The base of objects whose member functions are callbacks.
+// The base class of objects whose member functions are callbacks.
 class CallbackBase {};
 
 class Handler {
   public:
-    // The callback owns the body, or the message, that it is given.
+    // The callback owns the body or the message that it gets, and must delete it.
     using BodyFunction = void (*)(Addressable*, unsigned int type, MsgBody*);
     using MsgFunction = void (*)(Addressable*, Msg*);
     using BodyMember = void (CallbackBase::*)(Addressable*, unsigned int type, MsgBody*);
     using MsgMember = void (CallbackBase::*)(Addressable*, Msg*);
 
-    // Implicit, so that a plain function, or a lambda without captures, can be registered as it is.
+    // These constructors are implicit, so that a plain function or a lambda without captures can be
+    // registered directly.
     Handler(BodyFunction function) : target_(function) {}
     Handler(MsgFunction function) : target_(function) {}
     template <std::convertible_to<BodyFunction> Lambda>
@@ -37,7 +38,7 @@ class Handler {
     Handler(T* object, void (Class::*member)(Addressable*, Msg*))
         : target_(Bound<MsgMember>{object, static_cast<MsgMember>(member)}) {}
 
-    // A function that names its own kinds of object and body:
+    // Makes a handler of a function that takes exactly the object and body types that it will get:
     //     Handler::of<onTrace>()   with   void onTrace(CCS*, unsigned int, CCS::EvtL2Trace_t*)
     template <auto function>
     static Handler of() {
@@ -53,7 +54,7 @@ class Handler {
         return std::holds_alternative<BodyFunction>(target_) ||
                std::holds_alternative<Bound<BodyMember>>(target_);
     }
-    // The object whose member is called; null for a plain function.
+    // The object whose member function is called; null for a plain function.
     const void* object() const {
         return std::visit([](const auto& target) { return objectOf(target); }, target_);
     }

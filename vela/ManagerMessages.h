@@ -1,5 +1,6 @@
-// The messages of a board's managers and of its clusters: rows of fields; their codes and names are with
-// their families. Widths: 32-bit unsigned unless the field says otherwise; addresses are CompDesc_t.
+// The rows of fields of the messages of a board's managers and of its clusters. Codes and names are in the
+// headers of the families. Numbers are 32 bits unsigned unless the field says otherwise; addresses are
+// CompDesc_t.
 #ifndef VELA_MANAGERMESSAGES_H
 #define VELA_MANAGERMESSAGES_H
 
@@ -77,7 +78,7 @@ struct ClusterUnlockCmplt {
 
 }  // namespace rows
 
-// What several families share, one code and one body each.
+// The bodies that several families share.
 struct ManagerMessages {
     // clang-format off
     struct ResultComplete_t : Body<8388608> {};

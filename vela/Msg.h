@@ -1,4 +1,4 @@
-// One transport message, with a body if it was given one.
+// A transport message, and the body that it was given, if any.
 #ifndef VELA_MSG_H
 #define VELA_MSG_H
 
@@ -11,15 +11,15 @@
 
 namespace vela {
 
-// Belongs to one thread at a time. Owns the transport message, its handle and the body: the destructor frees
-// the transport message if the handle still refers to one, which it no longer does once a queue took it.
+// An object belongs to one thread at a time. It owns the transport message, the handle to it, and the body.
+// The destructor frees the transport message unless a queue has taken it over; the handle is empty then.
 class Msg : public virtualObject {
   public:
-    // A fresh transport message of `size` octets of payload. Throws KSMsgRef::AllocationError.
+    // Makes a new transport message with `size` octets of payload. Throws KSMsgRef::AllocationError.
     explicit Msg(unsigned int size);
-    // Takes over the transport message of `ref`, which is left empty.
+    // Takes over the transport message of `ref`, which becomes empty.
     explicit Msg(KSMsgRef* ref);
-    // Copies header and payload into a transport message of its own; the body is not copied.
+    // Copies header and payload into a new transport message. Does not copy the body.
     Msg(const Msg& other);
     Msg& operator=(const Msg&) = delete;
     ~Msg() override;
@@ -40,18 +40,18 @@ class Msg : public virtualObject {
     NvMsg32Bit* getNvMsgRef() const;
     KSMsgRef* getMsgRef() const { return ref_.get(); }
 
-    // Both return the payload offset just past the body.
+    // Both return the offset in the payload after the body.
     unsigned int write(MsgBody* body, unsigned int offset) { return body->writeMsg(this, offset); }
     unsigned int read(MsgBody* body, unsigned int offset) { return body->readMsg(this, offset); }
-    // The message owns the body from now on.
+    // Gives the body to the message, which owns it from now on.
     void setBodyDef(MsgBody* body);
 
-    // Header and payload, decoded through the body; without one the payload's octets.
+    // Writes header and payload. The payload is shown through the body, or as octets if there is none.
     void toStream(std::ostream* out) const override;
 
   private:
     std::unique_ptr<KSMsgRef> ref_;
-    mutable std::unique_ptr<MsgBody> body_;  // made on demand for printing
+    mutable std::unique_ptr<MsgBody> body_;  // toStream makes one if there is none
 };
 
 }  // namespace vela

@@ -1,4 +1,4 @@
-// The body of a message that nobody knows better: its octets.
+// The body of a message of unknown type: its octets.
 #ifndef VELA_MSGDEFAULT_H
 #define VELA_MSGDEFAULT_H
 
@@ -10,7 +10,7 @@ namespace vela {
 class MsgDefault_t : public MsgBody {
   public:
     MsgDefault_t() = default;
-    // Reads into and writes from the caller's list.
+    // Binds the body to the caller's list, which it reads into and writes from.
     explicit MsgDefault_t(staticList<unsigned char>& bytes) : used_(&bytes) {}
     MsgDefault_t(const MsgDefault_t& other) : MsgBody(other), own_(*other.used_) {}
     MsgDefault_t& operator=(const MsgDefault_t& other) {
@@ -25,7 +25,7 @@ class MsgDefault_t : public MsgBody {
     unsigned int writeMsg(Msg* msg, unsigned int offset) override;
     unsigned int readMsg(Msg* msg, unsigned int offset) override;
     unsigned int GetByteSize() const override { return used_->length(); }
-    // "{ByteData {", each octet as a number in the stream's base and a blank, "}}".
+    // Writes "{ByteData {", each octet as a number in the stream's base followed by a blank, and "}}".
     void toStream(std::ostream* out) const override;
 
   private:

@@ -19,7 +19,8 @@ void reportUnregisteredSource(MsgQueue* queue, Msg* raw) {
            BannerEnd);
 }
 
-// The message of a handle, which is left empty; freed when there is no memory to hold it in.
+// Makes a Msg of the message of a handle, which becomes empty. If there is no memory for the Msg, frees the
+// message.
 std::unique_ptr<Msg> adopt(KSMsgRef& ref) {
     try {
         return std::make_unique<Msg>(&ref);
@@ -35,7 +36,7 @@ std::unique_ptr<Msg> adopt(KSMsgRef& ref) {
 MsgQueue::MsgQueue(const CompDesc_t& hostDesc, unsigned int maxRetMsgSize, unsigned int depth)
     : unregisteredSource_(reportUnregisteredSource),
       queue_(std::make_unique<KSMsgQueue>(hostDesc.getNvCompDesc(), maxRetMsgSize, depth, nullptr)) {
-    // The transport layer knows the receiver by this base alone.
+    // The host services know the receiver only as a KSAsyncMsgReceiver.
     queue_->registerAsyncCallback(static_cast<KSAsyncMsgReceiver*>(this),
                                   static_cast<int (KSAsyncMsgReceiver::*)(KSMsgRef&)>(&MsgQueue::MsgRouter));
 }
@@ -52,13 +53,13 @@ Msg* MsgQueue::request(Msg* cmd, unsigned int timeoutMs, unsigned int retMsgType
         std::unique_lock<Mutex> oneAtATime(requestMutex_, std::defer_lock);
         if (timeoutMs != 0)
             oneAtATime.lock();
-        *consumed->getMsgRef() = KSMsgRef();  // the transport's now
+        *consumed->getMsgRef() = KSMsgRef();  // the host services own the message now
         reply = queue_->request(sent, timeoutMs, retMsgType, flags);
     }
     std::unique_ptr<Msg> answer;
     if (reply.getMsgRef() != nullptr)
         answer = adopt(reply);
-    // Without a wait the transport layer returns an empty message of its own making, never a reply.
+    // With time-out 0 the host services return an empty message that they have made, and never a reply.
     if (answer == nullptr || timeoutMs == 0) {
         if (retMsgType != 0)
             throw Timeout(this, retMsgType, timeoutMs);
@@ -92,7 +93,7 @@ void MsgQueue::withdraw(const CompDesc_t& source, const AsyncMsgReceiver* receiv
     awaitIdle(guard, receiver);
 }
 
-// The routing thread does not wait for itself.
+// Waits until the reader thread does not use the receiver. On the reader thread itself it does not wait.
 void MsgQueue::awaitIdle(std::unique_lock<Receivers>& guard, const AsyncMsgReceiver* receiver) {
     if (routingThread_ != std::this_thread::get_id())
         receiverIdle_.wait(guard, [&] { return receiving_ != receiver; });
@@ -117,7 +118,7 @@ int MsgQueue::MsgRouter(KSMsgRef& ref) {
     try {
         route(adopt(ref));
     } catch (...) {
-        // Whoever received the message has reported it; the reading thread goes on.
+        // The receiver has reported the exception. The reader thread goes on with the next message.
     }
     return 1;
 }

@@ -1,5 +1,5 @@
-// The object layer's handle on one host message queue: requests with replies, and the routing of everything
-// else to the receiver registered for its source.
+// A host queue in the object layer. It sends requests and waits for their replies, and gives every other
+// message to the receiver that is registered for the message's source.
 #ifndef VELA_MSGQUEUE_H
 #define VELA_MSGQUEUE_H
 
@@ -21,11 +21,12 @@ namespace vela {
 
 class AsyncMsgReceiver;
 
-// Lives as long as an Addressable holds it. request() may be called from any thread.
+// The queue is deleted when the last Addressable that has attached it detaches it. Any thread may call
+// request().
 class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver {
   public:
     static constexpr unsigned int DefaultMaxRetMsgSize = 512;
-    static inline unsigned int DefaultDepth = 5;  // of queues made without a depth of their own
+    static inline unsigned int DefaultDepth = 5;  // for queues that an Addressable makes itself
 
     class Timeout : public Exception {
       public:
@@ -42,7 +43,7 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
         unsigned int timeoutMs_;
     };
 
-    // Owns the message that came; its copies share it.
+    // The reply was an error. The exception owns the message; its copies share it.
     class ErrorMsg : public Exception {
       public:
         ErrorMsg(MsgQueue* queue, std::unique_ptr<Msg> msg) : queue_(queue), msg_(std::move(msg)) {}
@@ -55,36 +56,37 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
         std::shared_ptr<Msg> msg_;
     };
 
-    // Owns the message from then on.
+    // The function owns the message.
     using UnregisteredSource = void (*)(MsgQueue*, Msg*);
 
-    // Opens the transport queue; a remote one asks for the address and the two sizes. Throws
+    // Opens the transport's queue. The arguments matter only for a queue in another machine. Throws
     // KSResource_CreationError.
     MsgQueue(const CompDesc_t& hostDesc, unsigned int maxRetMsgSize, unsigned int depth);
     ~MsgQueue() override;
 
     CompDesc_t getHostDesc() const;
 
-    // Sends cmd, which is consumed, and waits up to timeoutMs for the reply of its transaction; the caller
-    // owns what is returned. Null when no reply came and none was expected (retMsgType 0). Throws Timeout,
-    // ErrorMsg.
+    // Sends cmd, takes it over, and waits up to timeoutMs for the reply with its transaction. The caller owns
+    // the returned message. Returns null when no reply came and none was expected (retMsgType 0). Throws
+    // Timeout, ErrorMsg.
     Msg* request(Msg* cmd, unsigned int timeoutMs, unsigned int retMsgType, int flags = 0);
 
-    // One receiver for each source; a second one throws Exception. The receiver is only looked at.
+    // Registers the receiver for messages from this source. The queue does not own it. Throws Exception when
+    // the source has a receiver already.
     void RegisterAsyncMsgReceiver(const CompDesc_t& source, AsyncMsgReceiver* receiver);
-    // Returns once the receiver is no longer in use, except on the routing thread itself. Throws
-    // OutOfBoundsError when there is none.
+    // Deregisters the source's receiver, and waits until the reader thread does not use it any more; does not
+    // wait on the reader thread itself. Throws OutOfBoundsError when the source has no receiver.
     void DeregisterAsyncMsgReceiver(const CompDesc_t& source);
-    // The same for a receiver that may have been deregistered, or replaced, already.
+    // The same, but does nothing if this receiver is not registered any more.
     void withdraw(const CompDesc_t& source, const AsyncMsgReceiver* receiver);
 
-    // What becomes of messages from sources that nobody registered for; by default they are reported on the
-    // standard error stream and deleted, which is what null asks for again.
+    // Sets the function for messages from sources without a receiver. By default, and with null, they are
+    // reported on the standard error stream and deleted.
     void unregisteredSource(UnregisteredSource handler);
 
-    // What happens when the connection to a board in another machine is lost for good: nothing by default,
-    // which is what null asks for again. Called once, on the routing thread, or at once when it is lost
-    // already.
+    // Sets the function that is called once when the connection to a board in another machine is lost for
+    // good; with null none is called. It is called on the reader thread, or at once on the calling thread if
+    // the connection is lost already.
     using ConnectionLost = void (*)(MsgQueue*);
     void connectionLost(ConnectionLost handler);
 
@@ -93,7 +95,7 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
   private:
     using Receivers = sharedKeyedList<CompDesc_t, AsyncMsgReceiver*>;
 
-    // On the transport's reading thread, for every message that is no reply.
+    // Called on the reader thread for every message that is no awaited reply.
     int MsgRouter(KSMsgRef& ref);
     void route(std::unique_ptr<Msg> msg);
     void routeUnregistered(std::unique_ptr<Msg> msg);
@@ -107,12 +109,12 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
     std::atomic<ConnectionLost> connectionLost_ = nullptr;
     Mutex requestMutex_;  // one request with a wait at a time
 
-    Receivers receivers_;                    // its lock guards the next two as well
-    AsyncMsgReceiver* receiving_ = nullptr;  // in use by the routing thread
+    Receivers receivers_;                    // its lock also guards the next two members
+    AsyncMsgReceiver* receiving_ = nullptr;  // the receiver that the reader thread uses at the moment
     std::thread::id routingThread_;
     std::condition_variable_any receiverIdle_;
 
-    // Last: its thread uses everything above, and is gone first.
+    // The last member, so that it is destroyed first: its thread uses all the others.
     std::unique_ptr<KSMsgQueue> queue_;
 };
 

@@ -1,4 +1,5 @@
-// Locks and counting semaphores of the object layer: the host's, with the layer's own exceptions.
+// Locks and counting semaphores of the object layer. They wrap those of the host services and throw this
+// layer's exceptions.
 #ifndef VELA_MUTEX_H
 #define VELA_MUTEX_H
 
@@ -10,8 +11,8 @@
 
 namespace vela {
 
-// No owner is checked: one thread may take it and another release it, as a signal. Meets std::lock_guard's
-// needs, which is how it is used as a lock.
+// The mutex has no owner: one thread may lock it and another unlock it, as a signal. It can be used with
+// std::lock_guard.
 class Mutex : public virtualObject {
   public:
     Mutex() : mutex_(std::make_unique<KSMutex>()) {}
@@ -19,8 +20,8 @@ class Mutex : public virtualObject {
     void lock() { mutex_->lock(); }
     void unlock() { mutex_->unlock(); }
     bool tryLock() { return mutex_->tryLock(); }
-    // Tries totalMs / pollMs times with pollMs of sleep between, and once more. Throws Exception when pollMs
-    // is 0.
+    // Tries totalMs / pollMs times with a sleep of pollMs after each try, and then once more. Throws
+    // Exception when pollMs is 0.
     bool tryLock(unsigned int totalMs, unsigned int pollMs);
 
   private:
@@ -34,14 +35,14 @@ class Semaphore : public virtualObject {
         PostError() : Exception("vela::Seamphore::PostError") {}
     };
 
-    // Throws KSSemaphore::CreationError when initialValue exceeds maxValue, which is not looked at again.
+    // Throws KSSemaphore::CreationError when initialValue is above maxValue. maxValue does not limit posts.
     Semaphore(unsigned int maxValue, unsigned int initialValue)
         : semaphore_(std::make_unique<KSSemaphore>(maxValue, initialValue)) {}
 
     void post();  // throws PostError
     void wait() { semaphore_->wait(); }
     bool tryWait() { return semaphore_->tryWait(); }
-    bool tryWait(unsigned int totalMs, unsigned int pollMs);  // as Mutex::tryLock
+    bool tryWait(unsigned int totalMs, unsigned int pollMs);  // tries and sleeps as Mutex::tryLock does
 
   private:
     std::unique_ptr<KSSemaphore> semaphore_;

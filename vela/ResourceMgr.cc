@@ -9,7 +9,7 @@ namespace {
 
 CompDesc_t managerOf(const CompDesc_t& any) { return {0, any.Board, 0, 0, 0}; }
 
-// A search by type is one more attribute; 0 is any type.
+// Adds the type to the attributes of a search, unless it is 0, which stands for any type.
 void addType(staticList<CompAttr_t>& attributes, unsigned char compType) {
     if (compType == 0)
         return;
@@ -46,7 +46,8 @@ StdResource ResourceMgr::find(unsigned char compType, unsigned char processor, u
     return StdResource(found.desc, *this);
 }
 
-// The manager names the component to go on from; none, or one that it named before, is the end.
+// Each reply names the component from which to continue. The search ends when a reply names none, or one that
+// was named before.
 ResourceMgr::Found ResourceMgr::findAll(CompDesc_t start, CompDesc_t end, staticList<CompAttr_t> attributes,
                                         Wait wait) {
     Found all;

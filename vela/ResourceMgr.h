@@ -1,4 +1,5 @@
-// A board's resource manager: finds components and instances, hands them out and says who uses them.
+// A board's resource manager. It finds components and instances, allocates them, and keeps account of who
+// uses them.
 #ifndef VELA_RESOURCEMGR_H
 #define VELA_RESOURCEMGR_H
 
@@ -29,36 +30,38 @@ class ResourceMgr : public Addressable, public ResourceMgrMessages {
   public:
     using Found = staticList<CompMultipleResult_t::comps_t>;
 
-    // The manager of the board that the object stands on, on the object's queue and with its time-outs.
+    // The resource manager of the object's board. It uses the object's queue and time-outs.
     explicit ResourceMgr(const Addressable* object);
     explicit ResourceMgr(const Addressable& object) : ResourceMgr(&object) {}
     ~ResourceMgr() override { endCallbacks(); }
 
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
 
-    // Commands; all throw Timeout, UnexpectedMsg (nothing found among them). See StdResource for their forms.
+    // Commands. All throw Timeout, and UnexpectedMsg, also when nothing is found. StdResource.h describes
+    // their forms.
 
-    // The first component that has the type (0: any) and the attributes.
+    // Finds the first component with this type (0: any) and these attributes.
     void find(CompFind_t& cmd, ComponentResult_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     StdResource find(unsigned char compType, unsigned char processor, unsigned short instance,
                      staticList<CompAttr_t> attributes, Wait wait = {});
 
-    // All components between two addresses that have the attributes, as many replies as that takes.
+    // Finds all components between two addresses that have these attributes. Sends as many commands as it
+    // takes.
     void findAll(CompFindAll_t& cmd, CompMultipleResult_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
     Found findAll(CompDesc_t start, CompDesc_t end, staticList<CompAttr_t> attributes, Wait wait = {});
-    // All of the board's that have the type (0: any).
+    // Finds all components of the board that have this type (0: any).
     Found findAll(unsigned char compType = 0, Wait wait = {});
 
-    // `count` attributes of a component, from the one at `offset` on.
+    // Reads `count` attributes of a component, beginning with the one at `offset`.
     void attributes(CompAttrInfo_t& cmd, CompAttrInfoResult_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
     staticList<CompAttr_t> attributes(CompDesc_t component, unsigned int count, unsigned int offset,
                                       Wait wait = {});
 
-    // An instance of the caller's own, in a cluster.
+    // Allocates an instance, which belongs to the caller, in a cluster.
     void allocate(CompInstAllocate_t& cmd, ComponentResult_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
@@ -67,7 +70,7 @@ class ResourceMgr : public Addressable, public ResourceMgrMessages {
     void free(CompInstFree_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     void free(CompDesc_t instance, Wait wait = {}) { command(CompInstFree_t(instance), nullptr, wait); }
 
-    // Says that components are in use, each with a word of the user's own, or no longer.
+    // Marks components as in use, each with a word of the caller's choice, or as no longer in use.
     void use(CompUse_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     void use(staticList<CompUse_t::List_t>& uses, Wait wait = {}) { command(CompUse_t(uses), nullptr, wait); }
     void use(const CompDesc_t& component, unsigned int payload, Wait wait = {});

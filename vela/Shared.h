@@ -1,4 +1,4 @@
-// A count of holders; the last to detach deletes the object.
+// An object with a count of holders. The last holder to detach deletes the object.
 #ifndef VELA_SHARED_H
 #define VELA_SHARED_H
 

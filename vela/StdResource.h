@@ -1,4 +1,4 @@
-// The host's proxy of a component instance: the commands that every one of them understands.
+// A component instance of any kind, with the commands that all of them understand.
 #ifndef VELA_STDRESOURCE_H
 #define VELA_STDRESOURCE_H
 
@@ -12,11 +12,11 @@ namespace vela {
 class StdResource : public Addressable, public StdResourceMessages {
   public:
     StdResource(const CompDesc_t& target, MsgQueue* queue) : Addressable(target, queue) {}
-    // With inUse not 0 reserves the component at once. Throws Timeout, UnexpectedMsg.
+    // If inUse is not 0, marks the component as in use. Throws Timeout, UnexpectedMsg.
     StdResource(const CompDesc_t& target, MsgQueue* queue, int inUse);
     explicit StdResource(const Addressable& other) : Addressable(other) {}
     StdResource(const StdResource& other) = default;
-    // What was found at the address through `finder`: on its queue and with its time-outs.
+    // An object that `finder` has found at the address. It uses the queue and the time-outs of `finder`.
     StdResource(const CompDesc_t& target, const Addressable& finder) : Addressable(target, finder) {}
     ~StdResource() override { endCallbacks(); }
 
@@ -24,17 +24,17 @@ class StdResource : public Addressable, public StdResourceMessages {
 
     // NOLINTNEXTLINE(bugprone-virtual-near-miss): both names are prescribed
     void msgQueueAttach(MsgQueue* queue) { MsgQueueAttach(queue); }
-    // Marks the component as in use, with a word of the user's own, or as no longer in use, or gives an
-    // allocated instance back: requests to the board's resource manager. Throw Timeout, UnexpectedMsg.
-    // Virtual, so that an Instance remembers what was done through a reference to this base.
+    // Requests to the board's resource manager: mark the component as in use, with a word of the caller's
+    // choice; mark it as no longer in use; give an allocated instance back. Throw Timeout, UnexpectedMsg.
+    // They are virtual, so that an Instance remembers what was done through a reference to this base class.
     virtual void use(unsigned int payload);
     virtual void unuse();
     virtual void free();
 
-    // Commands. Each takes a prepared body, or its fields, and waits for the completion, which it reads into
-    // reply unless that is null; without a wait of its own as long as the object's response time-out says.
-    // Throw Timeout, UnexpectedMsg (the component's refusal among them). Commands that have no reply wait for
-    // an error only.
+    // Commands. Each has a form that takes a prepared body and one that takes the fields. It waits for the
+    // reply and reads it into `reply`, unless that is null. Without a `wait` it waits for the object's
+    // response time-out. A command that has no reply waits for an error only. All throw Timeout, and
+    // UnexpectedMsg, also when the component refuses.
     void Init(MsgInit_t& cmd, MsgInitCmplt_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     void Init(MsgInitCmplt_t* reply, Wait wait = {}) { command(MsgInit_t(), reply, wait); }
     void Exit(MsgExit_t& cmd, MsgExitCmplt_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
@@ -68,7 +68,7 @@ class StdResource : public Addressable, public StdResourceMessages {
     void GetxParms(staticList<MsgGetxParms_t::Parms_t>& parms, MsgGetxParmsCmplt_t* reply, Wait wait = {}) {
         command(MsgGetxParms_t(parms), reply, wait);
     }
-    // The field forms send the first `count` of the parameters, or all when there are fewer.
+    // The forms with fields send the first `count` parameters of the list, or all if there are fewer.
     void SetVParm(MsgSetVParm_t& cmd, MsgSetVParmCmplt_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
@@ -103,10 +103,10 @@ class StdResource : public Addressable, public StdResourceMessages {
         command(MsgSetAllParmsDef_t(), reply, wait);
     }
 
-    // Has the component send its events of the type. With null they go to the host address of this object's
-    // queue, where its callbacks are registered for them; after it has moved to another queue they still go
-    // to the old one. With an object they go to that object's target address, which stands on the board: not
-    // to its callbacks. Cancelling names the type alone, wherever its events went.
+    // Makes the component send its events of this type. If returnTo is null, the events go to the host
+    // address of this object's queue, where the object's callbacks get them; if the object later moves to
+    // another queue, they still go to the old one. If returnTo is an object, the events go to that object's
+    // target address on its board, and not to its callbacks. Cancelling names only the type.
     void DetectEvt(MsgDetectEvt_t& cmd, MsgDetectEvtCmplt_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }
@@ -131,7 +131,7 @@ class StdResource : public Addressable, public StdResourceMessages {
     void CancelAllEvts(MsgCancelAllEvts_t& cmd, Wait wait = {}) { command(cmd, wait); }
     void CancelAllEvts(Addressable* /*returnTo*/, Wait wait = {}) { command(MsgCancelAllEvts_t(), wait); }
 
-    // Run-time controls.
+    // Commands for run-time controls.
     void ArmRTC(MsgArmRTC_t& cmd, MsgArmRTCCmplt_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     void ArmRTC(unsigned int evtGroup, unsigned int action, MsgArmRTCCmplt_t* reply, Wait wait = {}) {
         command(MsgArmRTC_t(evtGroup, action), reply, wait);

@@ -1,5 +1,5 @@
-// The messages that every component instance understands: rows of fields, and the bodies made of them.
-// Widths: 32-bit unsigned unless the field says otherwise; addresses are CompDesc_t.
+// The messages that every component instance understands: rows of fields, and the bodies that are made of
+// them. Numbers are 32 bits unsigned unless the field says otherwise; addresses are CompDesc_t.
 #ifndef VELA_STDRESOURCEMESSAGES_H
 #define VELA_STDRESOURCEMESSAGES_H
 
@@ -21,8 +21,8 @@ struct TypeGroup  { U32<"EvtType"> EvtType; U32<"EvtGroup"> EvtGroup; };
 struct GroupOnly  { U32<"EvtGroup"> EvtGroup; };
 struct GroupAction { U32<"EvtGroup"> EvtGroup; U32<"Action"> Action; };
 
-// The code of the command that failed, the component's error number, and for the parameter commands the
-// parameter that was refused and its value.
+// An error: the code of the command that failed, the component's error number, and for parameter commands the
+// refused parameter and its value.
 struct Error {
     U32<"ErrorMsg"> ErrorMsg; U32<"ErrorCode"> ErrorCode; Nested<Body<NoCode, NumVal>, "Data"> Data;
     std::size_t fieldsPresent() const;
@@ -65,9 +65,9 @@ struct DisarmxRTCs {
 
 }  // namespace rows
 
-// Their codes and names, as StdResource's own.
+// The bodies. StdResource derives from this struct, so that they can be named as its own.
 struct StdResourceMessages {
-    // What the refused parameter of an error was; the same for every parameter command.
+    // The refused parameter of an error; it has this form for every parameter command.
     using Data_ErrorMsg_0x8_t = Body<NoCode, rows::NumVal>;
     using Data_ErrorMsg_0xa_t = Data_ErrorMsg_0x8_t;
     using Data_ErrorMsg_0x12_t = Data_ErrorMsg_0x8_t;

@@ -1,4 +1,4 @@
-// Gives a stream its format flags back at the end of a scope.
+// Restores the format flags of a stream at the end of a scope.
 #ifndef VELA_STREAMFLAGS_H
 #define VELA_STREAMFLAGS_H
 

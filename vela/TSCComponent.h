@@ -1,4 +1,4 @@
-// The telephony service component: owns a trunk's lines and channels.
+// The telephony service component, which manages the lines and channels of trunks.
 #ifndef VELA_TSCCOMPONENT_H
 #define VELA_TSCCOMPONENT_H
 
@@ -9,7 +9,7 @@ namespace vela {
 
 namespace rows {
 // clang-format off
-// A parameter whose value is as many elements, of the type, as its FieldDef says.
+// A parameter. Its FieldDef says how many elements its value has, and of which type.
 struct ParmFieldDefVal { U32<"Parm"> Parm; Descriptor32<"FieldDef"> FieldDef; Described<"Val"> Val; };
 struct Std_ParmValList {
     using Parms_t = Body<NoCode, ParmVal>;
@@ -56,7 +56,7 @@ struct TSCMessages {
                              MsgGetAlarmMaskCmplt_t, MsgTxRxSignalingGetAll_t, MsgTxRxSignalingGetAllCmplt_t>;
 };
 
-// Its own parameter lists take the place of the standard ones.
+// It has messages of its own for setting and getting several parameters, which replace the standard ones.
 class TSCComponent : public Component, public TSCMessages {
   public:
     using Bodies = TSCMessages::Bodies;
@@ -66,7 +66,7 @@ class TSCComponent : public Component, public TSCMessages {
 
     MsgBody* MsgBodyLookup(unsigned int msgType) override;
 
-    // Commands; all throw Timeout, UnexpectedMsg. See StdResource for their forms.
+    // Commands. All throw Timeout, UnexpectedMsg. StdResource.h describes their forms.
     void SetxParms(Std_MsgSetxParms_t& cmd, Std_MsgSetxParmsCmplt_t* reply, Wait wait = {}) {
         command(cmd, reply, wait);
     }

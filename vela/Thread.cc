@@ -8,8 +8,8 @@ namespace vela {
 
 namespace {
 
-// The body of every thread: gives the layer's control to what it is to run, in place of the primitive's. An
-// abandoned thread has none.
+// The body of every thread. Calls the errand with a control of this layer instead of the one of KSThread. A
+// thread that is created abandoned has no control.
 void* runErrand(void* primitiveControl, void* block) {
     const Thread::Errand errand = *std::unique_ptr<Thread::Errand>(static_cast<Thread::Errand*>(block));
     Thread::control own(static_cast<KSThread::control*>(primitiveControl));
@@ -27,7 +27,7 @@ auto translated(Create create) {
     }
 }
 
-// Hands the errand to the new thread, which frees it.
+// Starts a thread and gives it a copy of the errand, which the new thread frees.
 template <typename Start>
 void startWith(const Thread::Errand& errand, Start start) {
     auto block = std::make_unique<Thread::Errand>(errand);
@@ -89,7 +89,7 @@ void Thread::abandon() {
         letGo();
 }
 
-// The primitive deletes itself when its body ends.
+// Gives up thread_, which deletes itself when its body ends. Only the first call does something.
 void Thread::letGo() {
     if (!letGo_.exchange(true))
         thread_.release()->abandon();

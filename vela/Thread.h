@@ -1,6 +1,7 @@
-// Threads of the object layer: KSThread with the layer's own exceptions.
+// Threads of the object layer. They wrap KSThread and throw this layer's exceptions.
 //
-// Cancellation is cooperative: cancel() only raises a flag, which the body sees at its next testCancel.
+// Cancellation is cooperative: cancel() only sets a flag. It takes effect when the body next calls
+// testCancel.
 #ifndef VELA_THREAD_H
 #define VELA_THREAD_H
 
@@ -23,20 +24,22 @@ class Thread : public virtualObject {
         CreationError() : Exception("vela::Thread::CreationError") {}
     };
 
-    // The base of objects whose member functions run as threads.
+    // The base class of objects whose member functions are thread bodies.
     class Runnable : public KSRunnable {};
 
-    // Handed to the body; used on the body's own thread only.
+    // The control that the body gets. It must only be used on the body's own thread.
     class control {
       public:
         explicit control(KSThread::control* primitive) : primitive_(primitive) {}
 
-        // A pending cancel() takes effect here: clean-ups run and the thread ends.
+        // If cancel() has been called, runs the clean-up routines and ends the thread.
         void testCancel() { primitive_->testCancel(); }
-        // Runs if the thread is cancelled or exits while it is pushed.
+        // Pushes a clean-up routine, which runs if the thread is cancelled or ends while the routine is
+        // pushed.
         void pushCleanup(void* (*routine)(void*), void* arg) { primitive_->pushCleanup(routine, arg); }
         void pushCleanup(void* object, void* (Runnable::*routine)(void*), void* arg);
-        // Pops the latest clean-up, running it when execute is not 0; non-zero while more are pushed.
+        // Takes the newest clean-up routine off the stack and runs it if execute is not 0. Returns 0 when no
+        // more are pushed.
         int popCleanup(int execute) { return primitive_->popCleanup(execute); }
 
       private:
@@ -46,7 +49,7 @@ class Thread : public virtualObject {
     using Function = void* (*)(control*, void*);
     using Member = void* (Runnable::*)(control*, void*);
 
-    // What a thread runs, on its way to that thread.
+    // The body and its argument, while they are handed to the new thread.
     struct Errand {
         Function function;
         void* object;
@@ -56,21 +59,23 @@ class Thread : public virtualObject {
         void* run(control* ctl) const;
     };
 
-    // stackSize in octets, 0 for the system's default. The thread is not started. Throws CreationError.
+    // Makes a thread, which start() starts. stackSize is in octets; 0 means the system's default. Throws
+    // CreationError.
     Thread(Function body, unsigned int stackSize);
     Thread(void* object, Member body, unsigned int stackSize);
     Thread(const Thread&) = delete;
     Thread& operator=(const Thread&) = delete;
     ~Thread() override;
 
-    // Throws AlreadyActive while the thread runs, CreationError when the system refuses one.
+    // Throws AlreadyActive when the thread is running, and CreationError when the system refuses it.
     void start(void* arg);
     void cancel();
     void join();
     void* getResult();
-    // The thread that runs, or the next one started, is left to run and clean up by itself; this object may
-    // go before it and has nothing to say to it any more. May come from the body, while start() has not
-    // returned on its own thread; all else that is called here comes from one thread at a time.
+    // Lets the running thread, or the next one that is started, run by itself: it cleans up after itself,
+    // this object may be destroyed before the thread ends, and the object's other functions do not reach the
+    // thread any more. The body may call abandon(), even before start() has returned. All other functions are
+    // called by one thread at a time.
     void abandon();
 
   private:
@@ -78,13 +83,14 @@ class Thread : public virtualObject {
     void letGo();
 
     Errand errand_;
-    std::unique_ptr<KSThread> thread_;  // null once it is abandoned and runs
-    std::atomic<bool> started_{false};  // and not joined since
+    std::unique_ptr<KSThread> thread_;  // null once the thread is abandoned and runs
+    std::atomic<bool> started_{false};  // started, and not joined since
     std::atomic<bool> abandoned_{false};
-    std::atomic<bool> letGo_{false};  // by start() or by abandon(), whichever is first to know of the other
+    std::atomic<bool> letGo_{
+        false};  // the thread was let go, by start() or by abandon(), whichever came second
 };
 
-// Start a thread that nobody joins; its control is null. Throw Thread::CreationError.
+// Start a thread that nobody joins. Its body gets a null control. Throw Thread::CreationError.
 void AbandonedThread_create(Thread::Function body, void* arg, unsigned int stackSize);
 void AbandonedThread_create(void* object, Thread::Member body, void* arg, unsigned int stackSize);
 

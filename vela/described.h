@@ -1,4 +1,4 @@
-// A value whose element type and count stand in a descriptor word before it.
+// A value before which a descriptor word says how many elements it has, and of which type.
 #ifndef VELA_DESCRIBED_H
 #define VELA_DESCRIBED_H
 
@@ -8,15 +8,15 @@
 
 namespace vela {
 
-// The descriptor word: announces to the Described field behind it what that holds.
+// The descriptor word. The Described field after it reads from it what it holds.
 template <Label name>
 struct Descriptor32 : U32<name> {
     using U32<name>::operator=;
     static constexpr bool announces = true;
 };
 
-// As many elements, of the type, as the descriptor says. Elements narrower than 32 bits are numbers of 32
-// bits here. A list that is shorter than announced grows, with zeros; one that is longer keeps its length,
+// The elements that the descriptor announces. In memory each is a number of 32 bits, whatever its width on
+// the wire. If the list is shorter than announced, it grows with zeros. If it is longer, it keeps its length,
 // and only the announced elements are sent or read.
 template <Label name>
 class Described : public Field<staticList<unsigned int>, name> {
@@ -50,10 +50,10 @@ class Described : public Field<staticList<unsigned int>, name> {
         if (held >= count)
             return;
         numbers.realloc(count);
-        std::fill(numbers.begin() + held, numbers.end(), 0U);  // not what the list held before it shrank
+        std::fill(numbers.begin() + held, numbers.end(), 0U);  // the storage may hold older elements
     }
 
-    // In the width that the elements have on the wire.
+    // Moves the elements in the width that they have on the wire.
     template <typename Element, Move move>
     void moveAs(FieldMover<move>& mover, unsigned int count, WireType type) {
         unsigned int* const numbers = this->value().begin();

@@ -1,10 +1,12 @@
-// The fields that message bodies are declared of.
+// The fields of which message bodies are declared.
 //
-// A field holds its value and a pointer to the value in use: its own, or a variable of the caller's that it
-// was bound to. Everything goes through the pointer. A copy always has storage of its own.
+// A field has a value of its own and a pointer to the value that it uses: its own, or a variable of the
+// caller to which it is bound. Reading and writing use the pointer. A copy of a field always uses a value of
+// its own.
 //
-// Each kind says how it is moved, how many octets it takes and how it prints; a body only strings them
-// together. Labels are part of the type, so that a declaration reads `U32<"Parm"> Parm;`.
+// Each kind of field knows how it is moved, how many octets it takes and how it prints. A body only handles
+// its fields one after another. The label is part of the type, so that a declaration reads `U32<"Parm">
+// Parm;`.
 #ifndef VELA_FIELD_H
 #define VELA_FIELD_H
 
@@ -26,7 +28,7 @@ class Msg;
 template <std::size_t n>
 struct Label {
     char text[n];
-    constexpr Label(const char (&literal)[n]) { std::copy_n(literal, n, text); }  // implicit: U32<"Parm">
+    constexpr Label(const char (&literal)[n]) { std::copy_n(literal, n, text); }  // implicit, for U32<"Parm">
 };
 
 template <typename T, Label name>
@@ -47,7 +49,7 @@ class Field {
     }
     ~Field() = default;
 
-    // From now on reads into and writes from the caller's variable, which must outlive the field.
+    // From now on the field reads into and writes from the caller's variable, which must outlive the field.
     void bind(T& variable) { used_ = &variable; }
 
     T& value() { return *used_; }
@@ -64,7 +66,7 @@ class Field {
     T* used_ = &own_;
 };
 
-// A number. Consecutive ones share a transport call.
+// A number. Consecutive numbers are moved in one transport call.
 template <typename T, WireType type, Label name>
 class Scalar : public Field<T, name> {
   public:
@@ -86,13 +88,14 @@ using S32 = Scalar<int, WireType::Signed32, name>;
 template <Label name>
 using Value32 = Scalar<unsigned int, WireType::Value32, name>;
 
-// The number of elements of the next list in the body: written from the list's length.
+// The number of elements of the next list in the body. It is set from the list's length when the body is
+// written.
 template <typename Number>
 struct CountOf : Number {
     using Number::operator=;
     static constexpr bool announces = true;
 
-    // Throws Exception when there are more than the field can say.
+    // Throws Exception when the number is too large for the field.
     void count(unsigned int elements) {
         if (elements > std::numeric_limits<typename Number::Value>::max())
             throw Exception("a list is longer than its count can say");
@@ -121,12 +124,12 @@ concept CountField = ScalarField<T> && requires(T& field) {
     []<typename N>(CountOf<N>&) {}(field);
 };
 
-// A body within the body, an address for one.
+// A body within the body, for example an address.
 template <typename NestedBody, Label name>
 class Nested : public Field<NestedBody, name> {
   public:
     using Field<NestedBody, name>::operator=;
-    static constexpr const char* absent = "NULL";  // printed where the message has no such field
+    static constexpr const char* absent = "NULL";  // printed when the message does not have the field
 
     unsigned int byteSize() const { return this->value().GetByteSize(); }
     void print(std::ostream* out) const { *out << this->value(); }
@@ -137,7 +140,7 @@ class Nested : public Field<NestedBody, name> {
     }
 };
 
-// Numbers, as many as the count before them says.
+// A list of numbers. The count before it says how many there are.
 template <typename T, WireType type, Label name>
 class Array : public Field<staticList<T>, name> {
   public:
@@ -157,7 +160,7 @@ class Array : public Field<staticList<T>, name> {
     }
 };
 
-// Numbers without a count of their own: all that is left of the payload.
+// A list of numbers without a count: it is all that is left of the payload.
 template <typename T, WireType type, Label name>
 class Rest : public Array<T, type, name> {
   public:
@@ -172,7 +175,7 @@ class Rest : public Array<T, type, name> {
 template <Label name>
 using RestBytes = Rest<unsigned char, WireType::Unsigned8, name>;
 
-// Octets, always as many.
+// Always n octets.
 template <unsigned int n, Label name>
 class FixedOctets : public Field<std::array<unsigned char, n>, name> {
   public:
@@ -189,7 +192,7 @@ class FixedOctets : public Field<std::array<unsigned char, n>, name> {
     }
 };
 
-// Bodies one after another, as many as the count before them says.
+// A list of bodies. The count before it says how many there are.
 template <typename Element, Label name>
 class ListOf : public Field<staticList<Element>, name> {
   public:
@@ -218,14 +221,14 @@ class ListOf : public Field<staticList<Element>, name> {
         for (Element& element : this->value())
             mover.nested(msg, element);
     }
-    // What an entry held before does not stay.
+    // Reads one entry, and replaces what it held before.
     static void getOne(FieldMover<Move::Get>& mover, Msg* msg, Element& element) {
         element = Element();
         mover.nested(msg, element);
     }
 
   private:
-    // No entry is smaller than an empty one: what is left after the last whole entry is not read.
+    // No entry is smaller than an empty one. Octets after the last whole entry are not read.
     void get(FieldMover<Move::Get>& mover, Msg* msg, unsigned int announced) {
         staticList<Element>& elements = this->value();
         const unsigned int least = Element().GetByteSize();
@@ -237,8 +240,8 @@ class ListOf : public Field<staticList<Element>, name> {
     }
 };
 
-// Bodies one after another to the end of the payload. The list read is as long as the octets it was read
-// from; the entries behind the last one are empty.
+// A list of bodies to the end of the payload. After reading, the list has as many entries as there were
+// octets; those after the last body are empty.
 template <typename Element, Label name>
 class RestOf : public ListOf<Element, name> {
   public:

@@ -1,4 +1,5 @@
-// The fields of a row (a plain struct of fields) as a tuple of references, in the order they are declared.
+// Makes a tuple of references to the fields of a row, which is a plain struct of fields, in the order of
+// their declaration.
 #ifndef VELA_FIELDSOF_H
 #define VELA_FIELDSOF_H
 
@@ -59,7 +60,7 @@ constexpr auto fieldsOf(Row& row) {
 template <typename Row, std::size_t i>
 using FieldAt = std::remove_reference_t<std::tuple_element_t<i, decltype(fieldsOf(std::declval<Row&>()))>>;
 
-// How many of a row's first i fields are no counts; all of those.
+// How many of the first i fields of a row are not counts; and how many of all its fields.
 template <typename Row, std::size_t i>
 constexpr std::size_t valuesBefore() {
     if constexpr (i == 0)
@@ -70,7 +71,8 @@ constexpr std::size_t valuesBefore() {
 template <typename Row>
 inline constexpr std::size_t ValueCount = valuesBefore<Row, FieldCount<Row>>();
 
-// Variables that a body can be bound to: one for each field, or for each that is no count.
+// Whether a body can be bound to variables of these types: one for each field, or one for each field that is
+// no count.
 template <typename Row, typename... Variables>
 concept BindsTo = (sizeof...(Variables) > 0) &&
                   (sizeof...(Variables) == FieldCount<Row> ||

@@ -1,4 +1,4 @@
-// Doubly linked lists with a cursor, and the look-up by key built on them.
+// A doubly linked list with a cursor, and a list of keys and values.
 #ifndef VELA_LINKEDLIST_H
 #define VELA_LINKEDLIST_H
 
@@ -17,7 +17,8 @@ struct link {
     link* previous = nullptr;
 };
 
-// The cursor remembers the last link looked at, so that a sequential scan costs one step an element.
+// The cursor remembers the last link that was read, so that reading the elements in order costs one step
+// each.
 template <typename T>
 class linkedList : public list<T> {
   public:
@@ -35,7 +36,7 @@ class linkedList : public list<T> {
     }
     ~linkedList() override { clear(); }
 
-    // i = 0 puts it in front, i = length at the end. Throws OutOfBoundsError when i is beyond that.
+    // Inserts the value before element i; i = length appends it. Throws OutOfBoundsError when i is larger.
     void insert(unsigned int i, T value) {
         if (i > length_)
             throw OutOfBoundsError(i);
@@ -52,11 +53,11 @@ class linkedList : public list<T> {
     }
     void append(T value) { insert(length_, std::move(value)); }
 
-    // Moves the cursor to i. Throws OutOfBoundsError.
+    // Returns element i and moves the cursor to it. Throws OutOfBoundsError.
     T& element(unsigned int i) { return walkTo(checked(i))->value; }
     T& operator[](unsigned int i) { return element(i); }
 
-    // Reads without moving the cursor. Throws OutOfBoundsError.
+    // Returns element i without moving the cursor. Throws OutOfBoundsError.
     const T& value(unsigned int i) const {
         const link<T>* at = head_.get();
         for (unsigned int left = checked(i); left > 0; --left)
@@ -64,7 +65,7 @@ class linkedList : public list<T> {
         return at->value;
     }
 
-    // Unlinks the element and returns it. Throws OutOfBoundsError.
+    // Removes element i and returns it. Throws OutOfBoundsError.
     T remove(unsigned int i) {
         link<T>* const gone = walkTo(checked(i));
         std::unique_ptr<link<T>>& owner = gone->previous == nullptr ? head_ : gone->previous->next;
@@ -77,7 +78,7 @@ class linkedList : public list<T> {
         return std::move(held->value);
     }
 
-    // "{", the elements separated by one blank, "}".
+    // Writes "{", the elements with a blank between them, and "}".
     void toStream(std::ostream* out) const override {
         *out << "{";
         for (const link<T>* at = head_.get(); at != nullptr; at = at->next.get()) {
@@ -109,7 +110,7 @@ class linkedList : public list<T> {
         return cursor_;
     }
 
-    // One link at a time: letting the head go would recurse once a link.
+    // Deletes one link at a time, because deleting the head would delete the others recursively.
     void clear() {
         while (head_ != nullptr)
             head_ = std::move(head_->next);
@@ -144,7 +145,7 @@ std::ostream& operator<<(std::ostream& out, const keyLink<K, V>& entry) {
     return out << "}";
 }
 
-// The newest entry of a key hides the older ones until it is unset.
+// A list of keys and values. The newest entry of a key hides the older ones until it is removed.
 template <typename K, typename V>
 class keyedList : public virtualObject {
   public:
@@ -160,7 +161,7 @@ class keyedList : public virtualObject {
         return i == NoIndex ? nullptr : &entries_.element(i).value;
     }
 
-    // Both throw OutOfBoundsError with NoIndex when the key is not present.
+    // Both throw OutOfBoundsError, with NoIndex, when the key is not present.
     V& element(const K& key) { return entries_.element(indexOf(key)).value; }
     V& operator[](const K& key) { return element(key); }
     void unset(const K& key) { entries_.remove(indexOf(key)); }

@@ -1,6 +1,6 @@
-// The root of the containers, and the array whose size changes rarely.
+// The base class of the containers, and an array whose size changes rarely.
 //
-// None of the containers locks: a shared one is guarded by its owner.
+// The containers have no locks: the owner of a container that threads share must lock it.
 #ifndef VELA_LIST_H
 #define VELA_LIST_H
 
@@ -15,10 +15,10 @@
 
 namespace vela {
 
-// What is not in a container at all: the index that a missing key is reported under.
+// The index in an OutOfBoundsError about a key that is not in the container.
 inline constexpr unsigned int NoIndex = 0xFFFFFFFFU;
 
-// One element as its list prints it: objects through their own print form, anything else inserted as it is.
+// Prints one element of a list: an object by its toStream, anything else with <<.
 template <typename T>
 void printElement(std::ostream* out, const T& element) {
     if constexpr (std::is_pointer_v<T>)
@@ -27,7 +27,7 @@ void printElement(std::ostream* out, const T& element) {
         *out << element;
 }
 
-// "{", the elements separated by one blank, "}"; octets are inserted as characters.
+// Prints "{", the elements with a blank between them, and "}". Octets are printed as characters.
 template <typename Iterator>
 void printList(std::ostream* out, Iterator begin, Iterator end) {
     *out << "{";
@@ -72,7 +72,7 @@ class list : public virtualObject {
     unsigned int length_ = 0;
 };
 
-// An array that keeps its storage while the size stays between half its capacity and all of it.
+// An array. It keeps its storage as long as its length is between half its capacity and its capacity.
 template <typename T>
 class staticList : public list<T> {
   public:
@@ -107,8 +107,8 @@ class staticList : public list<T> {
 
     unsigned int capacity() const { return capacity_; }
 
-    // Changes the length. The array moves only when `size` lies outside capacity/2 .. capacity; elements
-    // that exist are kept. Throws AllocationError when there is no memory.
+    // Changes the length and keeps the elements that still fit. The elements move only when `size` is not
+    // between half the capacity and the capacity. Throws AllocationError when there is no memory.
     void realloc(unsigned int size) {
         const bool fits = array_ != nullptr && capacity_ / 2 <= size && size <= capacity_;
         if (size != capacity_ && !fits)
@@ -116,7 +116,7 @@ class staticList : public list<T> {
         length_ = size;
     }
 
-    // No bounds check.
+    // Does not check the index.
     T& operator[](unsigned int i) { return array_[i]; }
     const T& operator[](unsigned int i) const { return array_[i]; }
     T& element(unsigned int i) { return array_[i]; }

@@ -1,4 +1,4 @@
-// A keyed list that threads share.
+// A keyed list that several threads use.
 #ifndef VELA_SHAREDKEYEDLIST_H
 #define VELA_SHAREDKEYEDLIST_H
 
@@ -7,7 +7,7 @@
 
 namespace vela {
 
-// The list is its own lock: a std::lock_guard of it is held around each use, and around those that belong
+// The list is also a lock. Hold a std::lock_guard of it for each use, or for several uses that belong
 // together.
 template <typename K, typename V>
 class sharedKeyedList : public keyedList<K, V> {

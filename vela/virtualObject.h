@@ -1,4 +1,4 @@
-// The root of the object layer: everything in it can be printed.
+// The base class of everything in the object layer that can be printed.
 #ifndef VELA_VIRTUALOBJECT_H
 #define VELA_VIRTUALOBJECT_H
 
@@ -8,7 +8,7 @@ namespace vela {
 
 class virtualObject {
   public:
-    // Writes the object's print form; the root has none.
+    // Writes the object as text. This class writes nothing.
     virtual void toStream(std::ostream* out) const;
     virtual ~virtualObject() = default;
 

@@ -1,7 +1,7 @@
-// How fields lie in a message's payload, and the one place that moves them.
+// Moves fields into and out of a message's payload. This is the only place that does.
 //
-// A field is moved by the transport library, told by a descriptor word: bits 11 to 18 hold the element count
-// less one, bits 19 to 23 the element type, all other bits are 0.
+// The transport library moves a field as a descriptor word says: bits 11 to 18 are the number of elements
+// less one, bits 19 to 23 the element type, and all other bits are 0.
 #ifndef VELA_WIRE_H
 #define VELA_WIRE_H
 
@@ -52,18 +52,18 @@ constexpr unsigned int elementSize(WireType type) {
 
 enum class Move { Put, Get };
 
-// The running offset of one body on its way into or out of a payload. Reading never looks outside the
-// payload: what is not there becomes 0, and the offset goes on as if it were.
+// Moves the fields of one body and keeps the offset. Reading never goes outside the payload: a field that is
+// missing, in whole or in part, becomes 0, and the offset advances past it.
 template <Move move>
 class FieldMover {
   public:
     FieldMover(NvMsg32Bit* raw, unsigned int offset) : raw_(raw), offset_(offset) {}
 
     unsigned int offset() const { return offset_; }
-    // Octets of payload from here on.
+    // The octets of payload that are left.
     unsigned int rest() const { return raw_->size > offset_ ? raw_->size - offset_ : 0; }
 
-    // Several scalar fields in one transport call.
+    // Moves several numbers in one transport call.
     template <typename... Fields>
     void scalars(Fields&... fields) {
         constexpr unsigned int size = (elementSize(Fields::wire) + ...);
@@ -73,7 +73,8 @@ class FieldMover {
             (scalarIfThere(fields), ...);
     }
 
-    // An array in chunks of at most 255 elements, the odd one first. Reading takes no more than is there.
+    // Moves an array in chunks of at most 255 elements, the incomplete chunk first. Reading takes no more
+    // elements than the payload holds.
     template <typename T>
     void array(T* elements, unsigned int count, WireType type) {
         if (move == Move::Get)
@@ -86,7 +87,7 @@ class FieldMover {
         }
     }
 
-    // A body within this one moves itself.
+    // Moves a body within this one, by its own writeMsg or readMsg.
     template <typename Message, typename NestedBody>
     void nested(Message* msg, NestedBody& body) {
         offset_ = move == Move::Put ? body.writeMsg(msg, offset_) : body.readMsg(msg, offset_);
@@ -112,7 +113,8 @@ class FieldMover {
     template <typename Pairs>
     void call(unsigned int size, std::uint32_t count, Pairs pairs) {
         std::apply([&](auto... words) { transfer(raw_, count, &offset_, words...); }, pairs);
-        // Some releases of the library leave the offset at 0 after a body's first field.
+        // Some releases of the library leave the offset at 0 after the first field of a body. Then it is
+        // advanced here.
         if (first_ && offset_ == 0)
             offset_ = size;
         first_ = false;

@@ -41,7 +41,7 @@ class KSLocalMsgQueueTest : public testing::Test {
 
 using KSLocalMsgQueueDeathTest = KSLocalMsgQueueTest;
 
-TEST_F(KSLocalMsgQueueTest, ItLivesUnderTheAddressThatTheLibraryGives) {
+TEST_F(KSLocalMsgQueueTest, ItHasTheAddressThatTheLibraryGives) {
     fake_norv::nextHostAddress({77, 1, 0, 2, 3, 4, 0});
     {
         const KSLocalMsgQueue queue({1, 1, 0, 1, 1, 1, 0}, 512, 5);

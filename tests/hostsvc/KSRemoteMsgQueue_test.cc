@@ -341,7 +341,7 @@ TEST_F(KSRemoteMsgQueueTest, OneOctetAtATimeIsAFrameToo) {
     close(queue, relay);
 }
 
-TEST_F(KSRemoteMsgQueueTest, DestructionAsksTheRelayToCloseAndWaitsForItsWord) {
+TEST_F(KSRemoteMsgQueueTest, DestructionAsksTheRelayToCloseAndWaitsForItsAcknowledgement) {
     auto [queue, relay] = open();
     std::atomic<bool> gone{false};
     std::thread destroyer([&, doomed = std::move(queue)]() mutable {
@@ -364,7 +364,7 @@ TEST_F(KSRemoteMsgQueueTest, ARelayThatNeverAcknowledgesTheCloseDelaysItByFiveSe
     EXPECT_TRUE(relay.ends());
 }
 
-TEST_F(KSRemoteMsgQueueTest, WhatComesBeforeTheAcknowledgementIsDropped) {
+TEST_F(KSRemoteMsgQueueTest, MessagesBeforeTheAcknowledgementAreDropped) {
     auto [queue, relay] = open();
     relay.write(MessageFrame + CloseRequest + MessageFrame);
     close(queue, relay);

@@ -231,7 +231,7 @@ TEST(KSThread, JoinWaitsForTheFramesOfACancelledBody) {
     EXPECT_EQ(order, "frame caught ");
 }
 
-TEST(KSThread, WhatTheBodyUsesMayGoRightAfterJoin) {
+TEST(KSThread, ObjectsThatTheBodyUsesMayBeDestroyedRightAfterJoin) {
     struct Touch {
         int* count;
         ~Touch() { ++*count; }

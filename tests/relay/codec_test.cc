@@ -108,7 +108,7 @@ TEST_F(RelayMessage, AnAddressIsFiveWords) {
 }
 
 // A host whose machine has gone is not waited for as long as the system would, idle or not.
-TEST(RelayStream, AHostThatHasGoneWithoutAWordIsNoticed) {
+TEST(RelayStream, AHostThatDisappearsIsNoticed) {
     const auto option = [](Patience patience, int level, int name) {
         const int fd = ::socket(AF_INET, SOCK_STREAM, 0);
         const Stream stream(Descriptor(fd), patience);
@@ -179,7 +179,7 @@ TEST(RelayCommandLine, ByDefaultItListensForThisMachineAlone) {
     EXPECT_EQ(options.patience.write.count(), 10000);
 }
 
-TEST(RelayCommandLine, OptionsSayOtherwise) {
+TEST(RelayCommandLine, OptionsReplaceTheDefaults) {
     const Options options =
         parsed({"--listen", "0.0.0.0:7000", "--allow", "10.0.0.0/8", "--allow", "192.168.1.7",
                 "--max-clients", "3", "--frame-timeout", "0.25", "--write-timeout", "2"})
@@ -192,7 +192,7 @@ TEST(RelayCommandLine, OptionsSayOtherwise) {
     EXPECT_EQ(options.patience.write.count(), 2000);
 }
 
-TEST(RelayCommandLine, BeingOpenToTheWorldWithoutSayingToWhomIsRefused) {
+TEST(RelayCommandLine, AnAddressThatOthersReachIsRefusedWithoutAllow) {
     const std::string said = refusal({"--listen", "0.0.0.0"});
     EXPECT_THAT(said, HasSubstr("--listen 0.0.0.0:6554 would let everyone"));
     EXPECT_THAT(said, HasSubstr("say with --allow CIDR who may"));
@@ -200,7 +200,7 @@ TEST(RelayCommandLine, BeingOpenToTheWorldWithoutSayingToWhomIsRefused) {
     EXPECT_EQ(refusal({"--listen", "0.0.0.0", "--allow", "0.0.0.0/0"}), "taken");
 }
 
-TEST(RelayCommandLine, WhatIsWrongIsNamed) {
+TEST(RelayCommandLine, AMistakeIsNamed) {
     EXPECT_THAT(refusal({"--listen", "nowhere"}), HasSubstr("--listen nowhere: not an IPv4 address"));
     EXPECT_THAT(refusal({"--allow", "10.0.0.0/40"}), HasSubstr("--allow 10.0.0.0/40: not an IPv4 network"));
     EXPECT_THAT(refusal({"--max-clients", "0"}), HasSubstr("--max-clients"));
@@ -210,7 +210,7 @@ TEST(RelayCommandLine, WhatIsWrongIsNamed) {
     EXPECT_THAT(refusal({"more"}), HasSubstr("more"));
 }
 
-TEST(RelayCommandLine, HelpAndVersionAreTold) {
+TEST(RelayCommandLine, HelpAndVersionArePrinted) {
     EXPECT_THAT(parsed({"--help"}).told, HasSubstr("--allow CIDR"));
     EXPECT_THAT(parsed({"--help"}).told, HasSubstr("ssh -N -L 6554:127.0.0.1:6554"));
     EXPECT_THAT(parsed({"--version"}).told, testing::MatchesRegex("kv9relayd [0-9.]+\n"));

@@ -180,7 +180,7 @@ TEST_F(RelayTest, APeerThatClosesAfterAnyOctetGivesItsQueueBack) {
     expectService();
 }
 
-TEST_F(RelayTest, WhatIsNoOpenRequestEndsTheConnection) {
+TEST_F(RelayTest, AFirstFrameThatIsNoOpenRequestEndsTheConnection) {
     const struct {
         Octets octets;
         const char* why;
@@ -201,7 +201,7 @@ TEST_F(RelayTest, WhatIsNoOpenRequestEndsTheConnection) {
     }
 }
 
-TEST_F(RelayTest, WhatIsNoMessageEndsTheConnection) {
+TEST_F(RelayTest, AFrameThatIsNoMessageEndsTheConnection) {
     const struct {
         Octets octets;
         const char* why;
@@ -269,7 +269,7 @@ TEST_F(RelayTest, AHostThatTakesNothingIsEnded) {
     expectEnd(host, "ended: a frame was not taken within 50 ms");
 }
 
-TEST_F(RelayTest, AFloodFromAHostThatTakesNoAnswersStopsAtTheRelaysDoor) {
+TEST_F(RelayTest, AHostThatTakesNoRepliesIsReadNoFurther) {
     relay::Options options;
     options.patience.write = std::chrono::milliseconds(50);
     start(options);

@@ -73,7 +73,7 @@ TEST_F(BoardTest, WithoutAttributesTheFirstComponentIsFound) {
     EXPECT_EQ(host_.ask(8388669, managers, body).body, (Octets{0, 0, 1, 1, 0x12, 0}));
 }
 
-TEST_F(BoardTest, WhatIsNotThereIsAnsweredByAnErrorThatNamesTheCommand) {
+TEST_F(BoardTest, AMissingComponentIsAnsweredByAnErrorThatNamesTheCommand) {
     struct {
         const char* says;
         Octets body;
@@ -251,7 +251,7 @@ TEST_F(BoardTest, SomeCommandsHaveNoReply) {
     expectSilence();
 }
 
-TEST_F(BoardTest, WhatTheBoardDoesNotKnowIsAnError) {
+TEST_F(BoardTest, AnUnknownCommandIsAnsweredByAnError) {
     EXPECT_EQ(host_.ask(4616, ccs).body, (Octets{0x08, 0x12, 0, 0, 1, 0, 0, 0}));
     EXPECT_EQ(host_.ask(18, managers, {7, 0, 0, 0}).body, (Octets{18, 0, 0, 0, 1, 0, 0, 0}));
     EXPECT_EQ(host_.ask(18, {9, 1, 1, 0x15, 0}, {7, 0, 0, 0}).body, (Octets{18, 0, 0, 0, 5, 0, 0, 0}));
@@ -271,14 +271,14 @@ TEST_F(BoardTest, TraceEventsComeOnceTheSubscriptionStandsAndTheTraceIsOn) {
     EXPECT_EQ(host_.ask(26, ccs, group2).type, 27U);
 }
 
-TEST_F(BoardTest, TheOrderOfTheTwoDoesNotMatter) {
+TEST_F(BoardTest, TheOrderOfSubscriptionAndTraceDoesNotMatter) {
     EXPECT_EQ(host_.ask(22, ccs, detectBody(host_)).type, 23U);
     EXPECT_EQ(host_.ask(8, ccs, traceOn).type, 9U);
     EXPECT_EQ(host_.read().type, 32U);
     EXPECT_EQ(host_.read().type, 32U);
 }
 
-TEST_F(BoardTest, OneOfTheTwoAloneBringsNothing) {
+TEST_F(BoardTest, ASubscriptionOrTheTraceAloneSendsNothing) {
     EXPECT_EQ(host_.ask(8, ccs, traceOn).type, 9U);
     EXPECT_EQ(host_.ask(22, secondCcs, detectBody(host_)).type, 23U);
     const Octets anotherGroup = BodyWriter().address(host_.address()).u32(3).u32(2).take();
@@ -454,7 +454,7 @@ TEST_F(EndlessTest, TwoDChannelsPlaySideBySide) {
     }
 }
 
-TEST_F(EndlessTest, OtherBoardsMayComeWhileFramesPlay) {
+TEST_F(EndlessTest, BoardsMayBeReplacedWhileFramesPlay) {
     startTrace(ccs);
     host_.read();
     reset(oneChannel({}));

@@ -160,7 +160,7 @@ class ExampleTest : public testing::TestWithParam<const char*> {
     }
 };
 
-TEST_P(ExampleTest, LooksLikeATrunksDay) {
+TEST_P(ExampleTest, HasTheEventsOfATrunksDay) {
     EXPECT_TRUE(hasFrame(2, 0x7f)) << "the link is established";
     EXPECT_TRUE(hasFrame(2, 0x73)) << "and that is acknowledged";
     EXPECT_TRUE(hasFrame(1, 0xff)) << "TEI management";

@@ -89,7 +89,7 @@ TEST_F(LauncherTest, TheVersionIsTold) {
     EXPECT_EQ(ran.out, "softboard 1.0\n");
 }
 
-TEST_F(LauncherTest, WhatIsWrongIsSaidAndTheProgramIsNotStarted) {
+TEST_F(LauncherTest, AMistakeIsReportedAndTheProgramIsNotStarted) {
     const std::string toml = path("bad.toml");
     std::ofstream(toml) << "board = 1\nrate = \"fast\"\n";
     struct {
@@ -128,7 +128,7 @@ TEST_F(LauncherTest, WhatIsWrongIsSaidAndTheProgramIsNotStarted) {
     }
 }
 
-TEST_F(LauncherTest, AProgramThatIsNotThereGivesTheShellsStatus) {
+TEST_F(LauncherTest, AMissingProgramGivesTheStatusThatAShellGives) {
     Ran ran = run({"--", "no-such-program"});
     EXPECT_EQ(ran.status, 127);
     EXPECT_EQ(ran.err, "softboard: no-such-program: No such file or directory\n");

@@ -214,7 +214,7 @@ TEST(HandoverTest, AJournalsPathMayHoldOctetsThatAreNoUtf8) {
               "ch.txt");
 }
 
-TEST(HandoverTest, WhatIsNoScenarioIsRefused) {
+TEST(HandoverTest, ATextThatIsNoScenarioIsRefused) {
     for (const char* text :
          {"", "{}", "[]", "{\"journal\":\"\",\"captures\":[],\"channels\":[{}]}", "\x00\xff"}) {
         EXPECT_THROW(fromJson(text), std::exception) << text;

@@ -336,7 +336,7 @@ TEST_F(MisuseDeathTest, AQueueIsBoundTwice) {
         "softboard: nvQueueBind: queue [0-9]+ is bound already");
 }
 
-TEST_F(MisuseDeathTest, AnOffsetIsWild) {
+TEST_F(MisuseDeathTest, AnOffsetIsBeyondAnyMessage) {
     uint32_t value = 0;
     uint32_t offset = 5;
     EXPECT_DEATH(nvMsgVarFieldPut(allocate(4), 1, &offset, oneU32, &value),

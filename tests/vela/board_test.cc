@@ -84,7 +84,7 @@ TEST_F(BoardTest, ASearchKeepsTheCallersAttributesAsTheyAre) {
                                          0, 0xFF, 0xFF, 0xFF, 0xFF, 0, 0, 0, 0, 0x15, 0, 0, 0}));
 }
 
-TEST_F(BoardTest, WhatIsNotThereIsAnUnexpectedReply) {
+TEST_F(BoardTest, ASearchThatFindsNothingIsAnUnexpectedReply) {
     script_.answers(CompFind, 0, fake_norv::words({CompFind, 4}));
     EXPECT_THROW(board_.findComp(0x15, 1), vela::Addressable::UnexpectedMsg);
     EXPECT_THROW(board_.findInst(0x15, 1, 9), vela::Addressable::UnexpectedMsg);
@@ -106,7 +106,7 @@ TEST_F(BoardTest, MovesToAnotherQueueWithItsManagers) {
     EXPECT_EQ(board_.findComp(0x15, 1).getMsgQueue(), queue);
 }
 
-TEST_F(BoardTest, WhatItFoundKeepsTheQueueWhenTheBoardHasGone) {
+TEST_F(BoardTest, ObjectsThatWereFoundKeepTheQueueWhenTheBoardIsDestroyed) {
     auto board = std::make_unique<vela::Board>(3, nullptr);
     const vela::TSCComponent tsc(board->findComp(0x12, 1));
     board.reset();
