@@ -1,6 +1,7 @@
 #include "vela/Addressable.h"
 
 #include <ostream>
+#include <utility>
 
 #include "vela/StreamFlags.h"
 #include "vela/vela.h"
@@ -116,9 +117,9 @@ void Addressable::asyncRegisterMsgType(unsigned int type, const Handler& callbac
     dispatcher().registerMsgType(type, callback, threadParam);
 }
 
-void Addressable::asyncRegisterEvtGroup(unsigned int group, const Handler& callback,
-                                        unsigned int threadParam) {
-    dispatcher().registerEvtGroup(group, callback, threadParam);
+void Addressable::asyncRegisterEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam,
+                                        std::shared_ptr<Lane> lane) {
+    dispatcher().registerEvtGroup(group, callback, threadParam, std::move(lane));
 }
 
 void Addressable::asyncCancelMsgType(unsigned int type, const Handler& callback, unsigned int threadParam) {

@@ -115,7 +115,8 @@ class Addressable : public virtualObject {
 
     // Registrations, by message type and by event group; see EvtCallback.
     void asyncRegisterMsgType(unsigned int type, const Handler& callback, unsigned int threadParam);
-    void asyncRegisterEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam);
+    void asyncRegisterEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam,
+                               std::shared_ptr<Lane> lane = nullptr);
     void asyncCancelMsgType(unsigned int type, const Handler& callback, unsigned int threadParam);
     void asyncCancelMsgType(unsigned int type);
     void asyncCancelEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam);

@@ -75,6 +75,8 @@ class Body : public MsgBody, public Row {
         return size;
     }
 
+    std::size_t memorySize() const override { return sizeof(*this) + GetByteSize(); }
+
     // "{", each field's label and value, "}".
     void toStream(std::ostream* out) const override {
         *out << "{";

@@ -1,43 +1,52 @@
 #include "vela/Deliveries.h"
 
-#include <algorithm>
 #include <utility>
 
 namespace vela {
 
 namespace {
-thread_local const Deliveries::Entry* own = nullptr;
+thread_local const Deliveries::OnThisThread* innermost = nullptr;
 }
 
-Deliveries::Ticket Deliveries::begin(const void* object) {
+void Deliveries::begin(const void* object) {
     const std::lock_guard guard(mutex_);
-    return running_.insert(running_.end(), Entry{object});
+    ++begun_[object];
+    ++all_;
 }
 
-void Deliveries::end(Ticket ticket) {
+void Deliveries::end(const void* object) {
     const std::lock_guard guard(mutex_);
-    running_.erase(ticket);
+    const auto found = begun_.find(object);
+    if (--found->second == 0)
+        begun_.erase(found);
+    --all_;
     ended_.notify_all();
 }
 
-Deliveries::OnThisThread::OnThisThread(Ticket ticket) : outer_(std::exchange(own, &*ticket)) {}
-Deliveries::OnThisThread::~OnThisThread() { own = outer_; }
+Deliveries::OnThisThread::OnThisThread(const Deliveries& all, const void* object)
+    : all_(all), object_(object), outer_(std::exchange(innermost, this)) {}
+Deliveries::OnThisThread::~OnThisThread() { innermost = outer_; }
 
-template <typename Predicate>
-void Deliveries::awaitNone(Predicate concerns) {
+// Until no more of them are left than run on this thread itself.
+template <typename Count, typename Concerns>
+void Deliveries::awaitNone(Count count, Concerns concerns) {
+    std::size_t own = 0;
+    for (const OnThisThread* each = innermost; each != nullptr; each = each->outer_)
+        own += &each->all_ == this && concerns(each->object_) ? 1 : 0;
     std::unique_lock guard(mutex_);
-    ended_.wait(guard, [&] {
-        return std::none_of(running_.begin(), running_.end(),
-                            [&](const Entry& entry) { return &entry != own && concerns(entry); });
-    });
+    ended_.wait(guard, [&] { return count() <= own; });
 }
 
 void Deliveries::awaitAll() {
-    awaitNone([](const Entry&) { return true; });
+    awaitNone([this] { return all_; }, [](const void*) { return true; });
 }
 
 void Deliveries::awaitFor(const void* object) {
-    awaitNone([object](const Entry& entry) { return entry.object == object; });
+    const auto count = [&] {
+        const auto found = begun_.find(object);
+        return found == begun_.end() ? 0 : found->second;
+    };
+    awaitNone(count, [object](const void* each) { return each == object; });
 }
 
 }  // namespace vela

@@ -1,9 +1,10 @@
-// The deliveries of one dispatcher that have begun and not ended, so that what they use can outlive them.
+// The deliveries of one dispatcher that have not ended, so that what they use can outlive them.
 #ifndef VELA_DELIVERIES_H
 #define VELA_DELIVERIES_H
 
 #include <condition_variable>
-#include <list>
+#include <cstddef>
+#include <map>
 #include <mutex>
 
 namespace vela {
@@ -13,37 +14,37 @@ namespace vela {
 // goes on there when it returns.
 class Deliveries {
   public:
-    struct Entry {
-        const void* object;  // whose member is called; null for a plain function
-    };
-    using Ticket = std::list<Entry>::iterator;
-
-    // On the dispatching thread, before the delivery can run.
-    Ticket begin(const void* object);
-    void end(Ticket ticket);
+    // On the dispatching thread, for a callback of the object; null for a plain function. The delivery counts
+    // from now on, also while it waits for a thread.
+    void begin(const void* object);
+    void end(const void* object);
 
     // Names the delivery that runs on this thread, which never waits for itself.
     class OnThisThread {
       public:
-        explicit OnThisThread(Ticket ticket);
+        OnThisThread(const Deliveries& all, const void* object);
         ~OnThisThread();
         OnThisThread(const OnThisThread&) = delete;
         OnThisThread& operator=(const OnThisThread&) = delete;
 
       private:
-        const Entry* outer_;
+        friend class Deliveries;
+        const Deliveries& all_;
+        const void* object_;
+        const OnThisThread* outer_;
     };
 
     void awaitAll();
     void awaitFor(const void* object);
 
   private:
-    template <typename Predicate>
-    void awaitNone(Predicate concerns);
+    template <typename Count, typename Concerns>
+    void awaitNone(Count count, Concerns concerns);
 
     std::mutex mutex_;
     std::condition_variable ended_;
-    std::list<Entry> running_;
+    std::map<const void*, std::size_t> begun_;  // by object; none is 0
+    std::size_t all_ = 0;
 };
 
 }  // namespace vela

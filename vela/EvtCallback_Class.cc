@@ -1,5 +1,3 @@
-#include <cxxabi.h>
-
 #include <mutex>
 #include <utility>
 
@@ -12,9 +10,6 @@
 namespace vela {
 
 namespace {
-
-// The line numbers are part of the text.
-std::string diagnostic(int line, const char* what) { return joined("(EvtCallback_Class", line, ") ", what); }
 
 // The body that the owner knows for the message, else its octets.
 template <typename LookUp>
@@ -58,36 +53,6 @@ Handler checked(const Handler& handler, Handler::MsgFunction otherwise) {
 
 }  // namespace
 
-// One run of one callback. Until the callback has it, the payload is the delivery's.
-struct EvtCallback::Delivery {
-    Delivery(const Handler& callback, Addressable* object, unsigned int msgType,
-             const std::shared_ptr<Deliveries>& all)
-        : handler(callback),
-          owner(object),
-          type(msgType),
-          deliveries(all),
-          ticket(all->begin(handler.object())) {}
-    ~Delivery() { deliveries->end(ticket); }
-    Delivery(const Delivery&) = delete;
-    Delivery& operator=(const Delivery&) = delete;
-
-    void call() {
-        const Deliveries::OnThisThread here(ticket);
-        if (handler.takesBody())
-            handler.call(owner, type, body.release());
-        else
-            handler.call(owner, msg.release());
-    }
-
-    Handler handler;
-    Addressable* owner;
-    unsigned int type;
-    std::unique_ptr<MsgBody> body;
-    std::unique_ptr<Msg> msg;
-    std::shared_ptr<Deliveries> deliveries;
-    Deliveries::Ticket ticket;
-};
-
 EvtCallback::EvtCallback(Addressable* owner)
     : AsyncMsgReceiver(owner),
       defaultMsg_{&reportUnregisteredMsgType, 0},
@@ -97,25 +62,45 @@ EvtCallback::EvtCallback(Addressable* owner)
 
 void EvtCallback::end() {
     leave();
+    discardReports();
     deliveries_->awaitAll();
+}
+
+void EvtCallback::discardReports() {
+    std::uint64_t dropped = 0;
+    {
+        const std::lock_guard guard(mutex_);
+        dropped = defaultMsg_.lane->discardWaiting() + defaultEvt_.lane->discardWaiting();
+    }
+    if (dropped != 0)
+        report(joined("reports that still waited at the end, lost: ", dropped));
 }
 
 void EvtCallback::registerMsgType(unsigned int type, const Handler& callback, unsigned int threadParam) {
     add(msgTypes_, type, {callback, threadParam});
 }
 
-void EvtCallback::registerEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam) {
-    add(evtGroups_, group, {callback, threadParam});
+void EvtCallback::registerEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam,
+                                   std::shared_ptr<Lane> lane) {
+    add(evtGroups_, group, {callback, threadParam, std::move(lane)});
+}
+
+void EvtCallback::registerNextMsg(unsigned int type, const Handler& callback) {
+    add(msgTypes_, type, {callback, 0, nullptr, true});
+}
+
+void EvtCallback::registerNextEvt(unsigned int group, const Handler& callback) {
+    add(evtGroups_, group, {callback, 0, nullptr, true});
 }
 
 void EvtCallback::cancelMsgType(unsigned int type, const Handler& callback, unsigned int threadParam) {
-    remove(msgTypes_, type, {callback, threadParam});
+    remove(msgTypes_, type, callback, threadParam);
 }
 
 void EvtCallback::cancelMsgType(unsigned int type) { remove(msgTypes_, type); }
 
 void EvtCallback::cancelEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam) {
-    remove(evtGroups_, group, {callback, threadParam});
+    remove(evtGroups_, group, callback, threadParam);
 }
 
 void EvtCallback::cancelEvtGroup(unsigned int group) { remove(evtGroups_, group); }
@@ -139,11 +124,11 @@ void EvtCallback::add(Table& table, unsigned int key, const callbackInfo& callba
     table.element(key).append(callback);
 }
 
-void EvtCallback::remove(Table& table, unsigned int key, const callbackInfo& callback) {
+void EvtCallback::remove(Table& table, unsigned int key, const Handler& callback, unsigned int threadParam) {
     const std::lock_guard guard(mutex_);
     linkedList<callbackInfo>& callbacks = table.element(key);
     unsigned int i = 0;
-    while (i < callbacks.length() && !(callbacks.element(i) == callback))
+    while (i < callbacks.length() && !callbacks.element(i).is(callback, threadParam))
         ++i;
     callbacks.remove(i < callbacks.length() ? i : NoIndex);
 }
@@ -157,11 +142,8 @@ void EvtCallback::receive(Msg* msg) {
     try {
         const std::lock_guard guard(mutex_);
         dispatch(std::unique_ptr<Msg>(msg));
-    } catch (const Exception& exception) {
-        report(diagnostic(214, "vela internal error"), exception);
-        throw;
     } catch (...) {
-        report(diagnostic(219, "vela internal error"));
+        reportInternalError();
         throw;
     }
 }
@@ -185,20 +167,19 @@ void EvtCallback::dispatch(std::unique_ptr<Msg> msg) {
 // A single callback of message form gets the message itself, several get a copy each.
 void EvtCallback::dispatchTo(linkedList<callbackInfo>& callbacks, unsigned int key, bool isEvent,
                              std::unique_ptr<Msg> msg) {
-    const unsigned int type = msg->getMsgType();
     const bool single = callbacks.length() == 1;
-    for (unsigned int i = 0; i < callbacks.length(); ++i) {
+    for (unsigned int i = 0; i < callbacks.length();) {
         const callbackInfo& entry = callbacks.element(i);
-        if (entry.handler.isEmpty())
-            continue;
-        auto delivery = std::make_unique<Delivery>(entry.handler, owner(), type, deliveries_);
-        if (entry.handler.takesBody())
-            delivery->body = bodyOf(*msg, key, isEvent);
-        else if (single)
-            delivery->msg.swap(msg);
+        if (!entry.handler.isEmpty()) {
+            std::unique_ptr<Delivery> delivery = deliveryOf(entry, *msg, key, isEvent, single);
+            if (single && !entry.handler.takesBody())
+                delivery->msg = std::move(msg);
+            run(entry, std::move(delivery));
+        }
+        if (entry.once)
+            callbacks.remove(i);
         else
-            delivery->msg = std::make_unique<Msg>(*msg);
-        run(std::move(delivery), entry.threadParam);
+            ++i;
     }
 }
 
@@ -207,7 +188,23 @@ void EvtCallback::dispatchUnregistered(std::unique_ptr<Msg> msg) {
     const callbackInfo& handler = type == EvtDetected ? defaultEvt_ : defaultMsg_;
     auto delivery = std::make_unique<Delivery>(handler.handler, owner(), type, deliveries_);
     delivery->msg = std::move(msg);
-    run(std::move(delivery), handler.threadParam);
+    run(handler, std::move(delivery));
+}
+
+// With its payload, but for the received message itself. What cannot be made is lost to its lane.
+std::unique_ptr<Delivery> EvtCallback::deliveryOf(const callbackInfo& to, Msg& msg, unsigned int key,
+                                                  bool isEvent, bool single) {
+    try {
+        auto delivery = std::make_unique<Delivery>(to.handler, owner(), msg.getMsgType(), deliveries_);
+        if (to.handler.takesBody())
+            delivery->body = bodyOf(msg, key, isEvent);
+        else if (!single)
+            delivery->msg = std::make_unique<Msg>(msg);
+        return delivery;
+    } catch (...) {
+        to.lane->lose();
+        throw;
+    }
 }
 
 std::unique_ptr<MsgBody> EvtCallback::bodyOf(Msg& msg, unsigned int key, bool isEvent) {
@@ -216,27 +213,14 @@ std::unique_ptr<MsgBody> EvtCallback::bodyOf(Msg& msg, unsigned int key, bool is
     return body;
 }
 
-void EvtCallback::run(std::unique_ptr<Delivery> delivery, unsigned int threadParam) {
-    if (threadParam == OnDispatchingThread) {
-        start(nullptr, delivery.release());
+void EvtCallback::run(const callbackInfo& to, std::unique_ptr<Delivery> delivery) {
+    if (to.threadParam == OnDispatchingThread) {
+        to.lane->runHere(std::move(delivery));
         return;
     }
-    AbandonedThread_create(&EvtCallback::start, delivery.get(), threadParam);
-    static_cast<void>(delivery.release());  // the thread's now
-}
-
-void* EvtCallback::start(Thread::control*, void* arg) {
-    const std::unique_ptr<Delivery> delivery(static_cast<Delivery*>(arg));
-    try {
-        delivery->call();
-    } catch (const abi::__forced_unwind&) {  // the callback ends its thread: no error
-        throw;
-    } catch (const Exception& exception) {
-        report(diagnostic(283, "VELA Exception caught from callback handler thread"), exception);
-    } catch (...) {
-        report(diagnostic(287, "genreal Exception caught from callback handler thread"));
-    }
-    return nullptr;
+    delivery->lane = to.lane;
+    delivery->stackSize = to.threadParam;
+    to.lane->add(std::move(delivery));
 }
 
 }  // namespace vela

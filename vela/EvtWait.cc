@@ -8,12 +8,9 @@ void Waiter::Timeout::toStream(std::ostream* out) const {
     *out << std::hex << std::showbase << " Type: " << type_ << std::dec << " Timeout: " << timeoutMs_ << "ms";
 }
 
-Waiter::~Waiter() { delete msg_.load(); }
-
 void Waiter::enable(unsigned int type) {
-    disable();
+    end();
     lock();
-    delete msg_.exchange(nullptr);
     type_ = type;
     state_ = Enabled;
     add(type);
@@ -27,8 +24,19 @@ void Waiter::disable() {
     dispatcher_->awaitCallbacksOf(this);
 }
 
-// On a delivery thread. A second message, on its way before the first one cancelled the registration, is
-// nobody's.
+void Waiter::end() {
+    disable();
+    handOnLateOne();
+    awaited_.reset();
+}
+
+// It came, and whoever waited had given up: it goes the way of one that comes after the first.
+void Waiter::handOnLateOne() {
+    if (Msg* const late = msg_.exchange(nullptr); late != nullptr)
+        dispatcher_->receiveUnregistered(late);
+}
+
+// On a delivery thread, with what arrived first, unless it was given up meanwhile.
 void Waiter::trigger(Addressable*, Msg* msg) {
     if (State enabled = Enabled; !state_.compare_exchange_strong(enabled, Triggered)) {
         dispatcher_->receiveUnregistered(msg);
@@ -39,7 +47,8 @@ void Waiter::trigger(Addressable*, Msg* msg) {
     unlock();
 }
 
-// Somebody may have cancelled everything for the type, this waiter with it.
+// The message that came has ended the registration already, and somebody may have cancelled everything for
+// the type, this waiter with it.
 void Waiter::withdraw() {
     try {
         remove(type_);
@@ -47,12 +56,14 @@ void Waiter::withdraw() {
     }
 }
 
-Msg* Waiter::waitMsg(unsigned int timeoutMs) {
+std::unique_ptr<Msg> Waiter::await(unsigned int timeoutMs) {
+    if (awaited_ != nullptr)
+        return std::move(awaited_);
     if (timeoutMs == 0)
         lock();
     else if (!tryLock(timeoutMs, 10))
         throwTimeout(type_, timeoutMs);
-    Msg* const msg = msg_.exchange(nullptr);
+    std::unique_ptr<Msg> msg(msg_.exchange(nullptr));
     unlock();
     if (msg == nullptr)
         throwTimeout(type_, timeoutMs);
@@ -60,20 +71,26 @@ Msg* Waiter::waitMsg(unsigned int timeoutMs) {
     return msg;
 }
 
+void Waiter::enableAndAwait(unsigned int type, unsigned int timeoutMs) {
+    enable(type);
+    awaited_ = await(timeoutMs);
+}
+
+Msg* Waiter::waitMsg(unsigned int timeoutMs) { return await(timeoutMs).release(); }
+
 void Waiter::wait(MsgBody* body, unsigned int timeoutMs) {
-    const std::unique_ptr<Msg> msg(waitMsg(timeoutMs));
+    const std::unique_ptr<Msg> msg = await(timeoutMs);
     if (body != nullptr)
         msg->read(body, 0);
 }
 
 EvtCallback::MsgWait::MsgWait(EvtCallback* dispatcher, unsigned int type, unsigned int timeoutMs)
     : MsgWait(dispatcher) {
-    enable(type);
-    wait(nullptr, timeoutMs);
+    enableAndAwait(type, timeoutMs);
 }
 
 void EvtCallback::MsgWait::add(unsigned int type) {
-    dispatcher()->registerMsgType(type, Handler(this, &MsgWait::trigger), 0);
+    dispatcher()->registerNextMsg(type, Handler(this, &MsgWait::trigger));
 }
 
 void EvtCallback::MsgWait::remove(unsigned int type) {
@@ -82,12 +99,11 @@ void EvtCallback::MsgWait::remove(unsigned int type) {
 
 EvtCallback::EvtWait::EvtWait(EvtCallback* dispatcher, unsigned int group, unsigned int timeoutMs)
     : EvtWait(dispatcher) {
-    enable(group);
-    wait(nullptr, timeoutMs);
+    enableAndAwait(group, timeoutMs);
 }
 
 void EvtCallback::EvtWait::add(unsigned int group) {
-    dispatcher()->registerEvtGroup(group, Handler(this, &EvtWait::trigger), 0);
+    dispatcher()->registerNextEvt(group, Handler(this, &EvtWait::trigger));
 }
 
 void EvtCallback::EvtWait::remove(unsigned int group) {

@@ -31,26 +31,34 @@ class Waiter : public Mutex, public EvtCallback::Callback {
         unsigned int timeoutMs_;
     };
 
-    // Stands registered for the type or group from now on; what came earlier is deleted.
+    // Stands registered for the type or group from now on, for the message that arrives first. One that came
+    // before and that nobody waited for goes to the handler for what nobody registered for; so do those that
+    // come after the first, and one that comes too late for a wait when the waiter goes.
     void enable(unsigned int type);
     // Registered no more; a callback that is on its way has ended when this returns.
     void disable();
 
     // Waits for what was enabled, with timeoutMs 0 for ever, and reads it into body unless that is null.
-    // Throws Timeout.
+    // Throws Timeout; what comes after that can still be waited for.
     void wait(MsgBody* body, unsigned int timeoutMs);
     // The same, returning the message, which the caller owns.
     Msg* waitMsg(unsigned int timeoutMs);
 
   protected:
     explicit Waiter(EvtCallback* dispatcher) : dispatcher_(dispatcher) {}
-    ~Waiter() override;  // the derived destructors disable
+    ~Waiter() override = default;
 
     EvtCallback* dispatcher() const { return dispatcher_; }
     void trigger(Addressable* owner, Msg* msg);
+    // Enables for the type and waits for the message, which stays for a wait that follows. Throws Timeout.
+    void enableAndAwait(unsigned int type, unsigned int timeoutMs);
+    // For the derived destructors: as disable(), and nothing stays.
+    void end();
 
   private:
     void withdraw();
+    std::unique_ptr<Msg> await(unsigned int timeoutMs);
+    void handOnLateOne();
 
     virtual void add(unsigned int type) = 0;
     virtual void remove(unsigned int type) = 0;
@@ -60,7 +68,8 @@ class Waiter : public Mutex, public EvtCallback::Callback {
 
     EvtCallback* dispatcher_;
     unsigned int type_ = 0;
-    std::atomic<Msg*> msg_{nullptr};
+    std::atomic<Msg*> msg_{nullptr};  // what came, until somebody waits for it
+    std::unique_ptr<Msg> awaited_;    // the waiting thread's, for the wait that follows
     std::atomic<State> state_{Idle};
 };
 
@@ -73,9 +82,9 @@ class EvtCallback::MsgWait : public Waiter {
     };
 
     explicit MsgWait(EvtCallback* dispatcher) : Waiter(dispatcher) {}
-    // Enables for the type and waits at once.
+    // Enables for the type and waits at once; wait or waitMsg then hand out what came.
     MsgWait(EvtCallback* dispatcher, unsigned int type, unsigned int timeoutMs);
-    ~MsgWait() override { disable(); }
+    ~MsgWait() override { end(); }
 
   private:
     void add(unsigned int type) override;
@@ -95,7 +104,7 @@ class EvtCallback::EvtWait : public Waiter {
 
     explicit EvtWait(EvtCallback* dispatcher) : Waiter(dispatcher) {}
     EvtWait(EvtCallback* dispatcher, unsigned int group, unsigned int timeoutMs);
-    ~EvtWait() override { disable(); }
+    ~EvtWait() override { end(); }
 
   private:
     void add(unsigned int group) override;

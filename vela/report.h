@@ -4,6 +4,9 @@
 
 #include <iostream>
 #include <sstream>
+#include <string>
+
+#include "vela/Exception.h"
 
 namespace vela {
 
@@ -21,6 +24,22 @@ std::string joined(const Parts&... parts) {
     std::ostringstream text;
     (text << ... << parts);
     return text.str();
+}
+
+// What begins the dispatcher's diagnostics. The line numbers are part of the text.
+inline std::string diagnostic(int line, const char* what) {
+    return joined("(EvtCallback_Class", line, ") ", what);
+}
+
+// Reports the exception that is being handled as one that has kept the dispatcher from handing on a message.
+inline void reportInternalError() {
+    try {
+        throw;
+    } catch (const Exception& exception) {
+        report(diagnostic(214, "vela internal error"), exception);
+    } catch (...) {
+        report(diagnostic(219, "vela internal error"));
+    }
 }
 
 // The frame of the longer ones.

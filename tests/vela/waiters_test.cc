@@ -134,6 +134,66 @@ TEST_F(WaiterTest, MadeWithATimeItWaitsAtOnce) {
     EXPECT_NO_THROW(EvtCallback::MsgWait(&dispatcher, Reply, Long));
 }
 
+TEST_F(WaiterTest, MadeWithATimeItHandsOutWhatCame) {
+    EvtCallback dispatcher(ccs_.get());
+    whenAsleep([&] { EXPECT_TRUE(sendReply()); });
+    EvtCallback::MsgWait returned(&dispatcher, Reply, Long);
+    const std::unique_ptr<Msg> msg(returned.waitMsg(25));
+    EXPECT_EQ(msg->getMsgType(), Reply);
+    EXPECT_THROW(returned.waitMsg(25), EvtCallback::MsgWait::Timeout) << "once";
+    whenAsleep([&] { EXPECT_TRUE(sendTrace()); });
+    EvtCallback::EvtWait read(&dispatcher, 2, Long);
+    vela::CCS::EvtL2Trace_t trace;
+    read.wait(&trace, 25);
+    EXPECT_EQ(trace.Timestamp, 1003U);
+}
+
+TEST_F(WaiterTest, MadeWithATimeAndNotAskedAgainItDropsWhatCame) {
+    EvtCallback dispatcher(ccs_.get());
+    dispatcher.unregisteredMsgType(vela::Handler(&recorder_, &Recorder::onMsg), Inline);
+    whenAsleep([&] { EXPECT_TRUE(sendReply()); });
+    { const EvtCallback::MsgWait waiter(&dispatcher, Reply, Long); }
+    EXPECT_EQ(recorder_.entries(0).size(), 0U) << "somebody had waited for it";
+}
+
+TEST_F(WaiterTest, OfMessagesThatComeTogetherItTakesTheOneThatArrivedFirst) {
+    ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, Inline);
+    for (int i = 0; i < 200; ++i) {
+        const auto waiter = ccs_->getNewMsgWait(Reply);
+        for (const std::uint32_t value : {1U, 2U, 3U}) {
+            ASSERT_TRUE(fake_norv::deliver({1, Reply, ccs_->getTgtDesc().getNvCompDesc(),
+                                            host().getNvCompDesc(), fake_norv::words({7, value, 0})}));
+        }
+        ASSERT_TRUE(fake_norv::waitForIdleReader());
+        StdResource::MsgGetParmCmplt_t reply;
+        waiter->wait(&reply, 0);
+        ASSERT_EQ(reply.Val, 1U);
+        EXPECT_EQ(recorder_.entries(2).size(), 2U) << "the others are nobody's";
+        recorder_.clear();
+    }
+}
+
+TEST_F(WaiterTest, WhatComesAtTheTimeOutIsWaitedForAgainOrGoesToTheHandlerForUnregisteredOnes) {
+    ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, 0);
+    auto waiter = ccs_->getNewMsgWait(Reply);
+    EXPECT_THROW(waiter->wait(nullptr, 25), EvtCallback::MsgWait::Timeout);
+    ASSERT_TRUE(sendReply());
+    waiter->wait(nullptr, 0);
+    waiter->enable(Reply);
+    EXPECT_THROW(waiter->wait(nullptr, 25), EvtCallback::MsgWait::Timeout);
+    ASSERT_TRUE(sendReply());
+    waiter.reset();
+    EXPECT_THAT(recorder_.texts(1), testing::ElementsAre("message 19 12 octets"));
+}
+
+TEST_F(WaiterTest, OneThatIsEnabledAgainHandsOnWhatNobodyWaitedFor) {
+    ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, 0);
+    const auto waiter = ccs_->getNewMsgWait(Reply);
+    ASSERT_TRUE(sendReply());
+    waiter->enable(Reply);
+    EXPECT_THAT(recorder_.texts(1), testing::ElementsAre("message 19 12 octets"));
+}
+
 TEST_F(WaiterTest, ADisabledOneIsRegisteredNoMore) {
     const auto waiter = ccs_->getNewMsgWait(Reply);
     waiter->disable();

@@ -1,0 +1,426 @@
+// How deliveries get their threads: so many at a time, the others in order of arrival, and what is lost.
+#include <atomic>
+#include <functional>
+#include <set>
+#include <sstream>
+
+#include "tests/support/test_system.h"
+#include "tests/vela/events.h"
+#include "vela/Lane.h"
+
+namespace {
+
+using testing::ElementsAre;
+using vela::Addressable;
+using vela::CCS;
+using vela::Lane;
+using vela::Msg;
+using vela::MsgBody;
+
+constexpr unsigned int Group = 2;
+
+// A callback that lasts until it may end, and what it was given.
+class Slow : public vela::EvtCallback::Callback {
+  public:
+    struct Given {
+        unsigned int timestamp;
+        MsgBody::Arrival arrival;
+        std::thread::id thread;
+    };
+
+    void onTrace(Addressable*, unsigned int, MsgBody* raw) {
+        const std::unique_ptr<MsgBody> body(raw);
+        std::unique_lock guard(lock_);
+        given_.push_back(
+            {dynamic_cast<CCS::EvtL2Trace_t&>(*body).Timestamp, body->arrival(), std::this_thread::get_id()});
+        most_ = std::max(most_, ++running_);
+        changed_.notify_all();
+        changed_.wait(guard, [this] { return mayEnd_ > 0; });
+        --mayEnd_;
+        --running_;
+    }
+    void onMsg(Addressable* owner, Msg* raw) {
+        const std::unique_ptr<Msg> msg(raw);
+        onTrace(owner, 0, std::make_unique<CCS::EvtL2Trace_t>().release());
+    }
+
+    // So many of them end, those that run first.
+    void letEnd(unsigned int callbacks) {
+        const std::lock_guard guard(lock_);
+        mayEnd_ += callbacks;
+        changed_.notify_all();
+    }
+    // The first n, by their time stamps, when so many have begun.
+    std::vector<Given> given(std::size_t n) {
+        std::unique_lock guard(lock_);
+        EXPECT_TRUE(changed_.wait_for(guard, std::chrono::seconds(30), [&] { return given_.size() >= n; }));
+        std::vector<Given> all = given_;
+        std::sort(all.begin(), all.end(),
+                  [](const Given& a, const Given& b) { return a.timestamp < b.timestamp; });
+        return all;
+    }
+    unsigned int most() {
+        const std::lock_guard guard(lock_);
+        return most_;
+    }
+
+  private:
+    std::mutex lock_;
+    std::condition_variable changed_;
+    std::vector<Given> given_;
+    unsigned int mayEnd_ = 0;
+    unsigned int running_ = 0;
+    unsigned int most_ = 0;
+};
+
+constexpr unsigned int All = 1000000;
+
+class LaneTest : public EventTest {
+  protected:
+    ~LaneTest() override {
+        slow_.letEnd(All);
+        end();
+    }
+
+    // Trace records from here on are the slow callback's, in a lane with these bounds.
+    void traceInto(const Lane::Bounds& bounds) { traceInto(std::make_shared<Lane>(bounds)); }
+    void traceInto(std::shared_ptr<Lane> lane) {
+        lane_ = std::move(lane);
+        ccs_->asyncRegisterEvtGroup(Group, vela::Handler(&slow_, &Slow::onTrace), 0, lane_);
+    }
+    void sendTraces(unsigned int first, unsigned int count, unsigned int octets = 0) {
+        for (unsigned int i = first; i < first + count; ++i) {
+            Octets data = fake_norv::words({1, i, octets});
+            data.resize(data.size() + octets);
+            ASSERT_TRUE(sendEvent(Group, data));
+        }
+    }
+
+    Slow slow_;
+    std::shared_ptr<Lane> lane_;
+};
+
+TEST_F(LaneTest, SoManyAreAtWorkAndTheOthersFollowInOrderEachOnAThreadOfItsOwn) {
+    traceInto({.atWork = 3});
+    sendTraces(0, 10);
+    EXPECT_EQ(slow_.given(3).size(), 3U);
+    EXPECT_EQ(lane_->waiting(), 7U);
+    for (unsigned int ended = 1; ended <= 7; ++ended) {
+        slow_.letEnd(1);
+        const auto given = slow_.given(3 + ended);
+        EXPECT_EQ(given.back().timestamp, 2 + ended) << "the oldest that waited came next";
+        EXPECT_EQ(lane_->waiting(), 7U - ended);
+    }
+    EXPECT_EQ(slow_.most(), 3U);
+    std::set<std::thread::id> atOnce;
+    for (const Slow::Given& each : slow_.given(3))
+        atOnce.insert(each.thread);
+    EXPECT_GE(atOnce.size(), 3U);
+    EXPECT_EQ(atOnce.count(std::this_thread::get_id()), 0U);
+}
+
+TEST_F(LaneTest, AboutAHundredAreAtWorkUnlessSomebodySaysOtherwise) {
+    traceInto(Lane::Bounds());
+    sendTraces(0, 130);
+    EXPECT_EQ(slow_.given(100).size(), 100U);
+    EXPECT_EQ(lane_->waiting(), 30U);
+    EXPECT_EQ(Lane::Bounds().waiting, 1000000U);
+    EXPECT_EQ(Lane::Bounds().octets, 512U << 20);
+}
+
+TEST_F(LaneTest, WhatIsDeliveredIsNumberedInTheOrderOfArrival) {
+    traceInto({.atWork = 2});
+    sendTraces(0, 50);
+    slow_.letEnd(All);
+    unsigned int number = 0;
+    for (const Slow::Given& each : slow_.given(50)) {
+        EXPECT_EQ(each.arrival.number, ++number);
+        EXPECT_EQ(each.arrival.missing, 0U);
+    }
+    EXPECT_EQ(lane_->started(), 50U);
+}
+
+TEST_F(LaneTest, ABodyThatCameAnotherWayHasNoNumber) {
+    const CCS::EvtL2Trace_t own;
+    EXPECT_EQ(own.arrival().number, 0U);
+}
+
+TEST_F(LaneTest, CallbacksOnTheDispatchingThreadAreNumberedToo) {
+    ccs_->asyncRegisterEvtGroup(Group, vela::Handler(&slow_, &Slow::onTrace), Inline);
+    slow_.letEnd(2);
+    sendTraces(0, 2);
+    EXPECT_EQ(slow_.given(2)[0].arrival.number, 1U);
+    EXPECT_EQ(slow_.given(2)[1].arrival.number, 2U);
+}
+
+TEST_F(LaneTest, TheNewestAreLostWhenTooManyWaitAndTheNextOneSaysHowMany) {
+    traceInto({.atWork = 2, .waiting = 3});
+    sendTraces(0, 9);  // 0 and 1 at work, 2 to 4 wait, 5 to 8 are lost
+    EXPECT_EQ(lane_->losses().noRoom, 4U);
+    EXPECT_EQ(lane_->losses().noMeans, 0U);
+    EXPECT_EQ(lane_->missing(), 4U);
+    slow_.letEnd(1);
+    slow_.given(3);
+    sendTraces(9, 1);
+    EXPECT_EQ(lane_->missing(), 0U);
+    slow_.letEnd(All);
+    const auto given = slow_.given(6);
+    for (unsigned int i = 0; i < 6; ++i) {
+        EXPECT_EQ(given[i].timestamp, i < 5 ? i : 9);
+        EXPECT_EQ(given[i].arrival.number, i + 1);
+        EXPECT_EQ(given[i].arrival.missing, i < 5 ? 0U : 4U);
+    }
+    end();
+    EXPECT_EQ(errors_.text(), "too many deliveries waited, lost: 4\n");
+}
+
+TEST_F(LaneTest, TheyMayTakeSoMuchMemory) {
+    constexpr unsigned int octets = 1000;
+    traceInto({.atWork = 1, .octets = 5 * octets});
+    sendTraces(0, 9, octets);
+    EXPECT_EQ(lane_->waiting(), 3U) << "each takes its octets and some more";
+    EXPECT_EQ(lane_->losses().noRoom, 5U);
+    slow_.letEnd(All);
+    slow_.given(4);
+    sendTraces(9, 3, octets);
+    EXPECT_EQ(slow_.given(7).size(), 7U) << "the room was given back";
+}
+
+TEST_F(LaneTest, OneThatNeedNotWaitNeedsNoRoom) {
+    traceInto({.atWork = 1, .waiting = 0});
+    for (unsigned int i = 0; i < 5; ++i) {
+        sendTraces(i, 1);
+        slow_.letEnd(1);
+        slow_.given(i + 1);
+        ccs_->asyncCancelEvtGroup(Group);
+        traceInto({.atWork = 1, .waiting = 0});  // that one may not have ended yet
+    }
+    EXPECT_EQ(slow_.given(5).size(), 5U);
+}
+
+TEST_F(LaneTest, OneThatTheSystemRefusesAThreadIsLostAndTheNextOneSaysSo) {
+    traceInto({.atWork = 5});
+    sendTraces(0, 1);
+    {
+        const ThreadlessSystem none;
+        sendTraces(1, 3);
+    }
+    sendTraces(4, 1);
+    const auto given = slow_.given(2);
+    EXPECT_EQ(given[1].timestamp, 4U);
+    EXPECT_EQ(given[1].arrival.number, 2U);
+    EXPECT_EQ(given[1].arrival.missing, 3U);
+    EXPECT_EQ(lane_->losses().noMeans, 3U);
+}
+
+TEST_F(LaneTest, WhatWaitsIsNotLostWhileSomethingIsAtWorkAndThreadsAreRefused) {
+    traceInto({.atWork = 2});
+    sendTraces(0, 6);
+    slow_.given(2);
+    {
+        const ThreadlessSystem none;
+        slow_.letEnd(1);
+        while (lane_->losses().noMeans == 0)
+            std::this_thread::yield();
+    }
+    EXPECT_EQ(lane_->waiting(), 3U) << "one was refused, the others wait for the end of the next one";
+    slow_.letEnd(All);
+    const auto given = slow_.given(5);
+    EXPECT_EQ(given[2].timestamp, 3U);
+    EXPECT_EQ(given[2].arrival.number, 3U);
+    EXPECT_EQ(given[2].arrival.missing, 1U);
+    end();
+    EXPECT_EQ(errors_.text(), "(EvtCallback_Class214) vela internal error\nvela::Thread::CreationError\n");
+}
+
+TEST_F(LaneTest, NothingWaitsForEverWhenThreadsAreRefusedAndNothingIsAtWork) {
+    traceInto({.atWork = 1});
+    sendTraces(0, 4);
+    slow_.given(1);
+    const ThreadlessSystem none;
+    slow_.letEnd(1);
+    while (lane_->losses().noMeans < 3)
+        std::this_thread::yield();
+    EXPECT_EQ(lane_->waiting(), 0U);
+    EXPECT_EQ(lane_->missing(), 3U);
+}
+
+TEST_F(LaneTest, OneWhoseBodyCannotBeMadeIsLostAndTheNextOneSaysSo) {
+    class NoBodyFor7 : public CCS {
+      public:
+        using CCS::CCS;
+        ~NoBodyFor7() override { endCallbacks(); }
+        MsgBody* EvtBodyLookup(unsigned int evtType) override {
+            if (fails.exchange(false))
+                throw std::bad_alloc();
+            return CCS::EvtBodyLookup(evtType);
+        }
+        std::atomic<bool> fails{false};
+    };
+    auto failing = std::make_unique<NoBodyFor7>(ccs_->getTgtDesc(), nullptr);
+    NoBodyFor7& object = *failing;
+    ccs_ = std::move(failing);
+    traceInto({.atWork = 5});
+    sendTraces(0, 1);
+    object.fails = true;
+    sendTraces(1, 2);
+    const auto given = slow_.given(2);
+    EXPECT_EQ(given[1].timestamp, 2U);
+    EXPECT_EQ(given[1].arrival.missing, 1U);
+    EXPECT_EQ(lane_->losses().noMeans, 1U);
+    slow_.letEnd(All);
+    end();
+    EXPECT_EQ(errors_.text(), "(EvtCallback_Class219) vela internal error\n");
+}
+
+// ---- Who does not wait.
+
+TEST_F(LaneTest, RepliesRegistrationsAndOtherCallbacksDoNotWaitForASlowOne) {
+    board_.answers(8, 9);
+    traceInto({.atWork = 2});
+    sendTraces(0, 500);
+    slow_.given(2);
+    ccs_->SetParm(10, 1, nullptr);
+    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
+    ASSERT_TRUE(sendReply());
+    EXPECT_THAT(recorder_.texts(1), ElementsAre("message 19 12 octets"));
+    ccs_->asyncCancelMsgType(Reply);
+    ccs_->asyncCancelEvtGroup(Group);
+    EXPECT_EQ(lane_->waiting(), 498U) << "what arrived before the end of the registration is still delivered";
+    slow_.letEnd(All);
+    EXPECT_EQ(slow_.given(500).size(), 500U);
+}
+
+TEST_F(LaneTest, EachRegistrationHasItsOwn) {
+    traceInto({.atWork = 1});
+    ccs_->asyncRegisterEvtGroup(Group, &recorder_, &Recorder::onBody, 0);
+    sendTraces(0, 300);
+    EXPECT_EQ(recorder_.entries(300).size(), 300U);
+    EXPECT_EQ(lane_->waiting(), 299U);
+}
+
+TEST_F(LaneTest, AWaiterGetsItsMessageWhileDeliveriesWait) {
+    traceInto({.atWork = 1});
+    sendTraces(0, 300);
+    const auto waiter = ccs_->getNewEvtWait(Group);
+    sendTraces(300, 2);
+    const std::unique_ptr<Msg> msg(waiter->waitMsg(0));
+    CCS::EvtL2Trace_t trace;
+    msg->read(&trace, 0);
+    EXPECT_EQ(trace.Timestamp, 300U);
+}
+
+// ---- The end.
+
+TEST_F(LaneTest, TheObjectsEndWaitsForWhatWaits) {
+    traceInto({.atWork = 1});
+    sendTraces(0, 20);
+    slow_.given(1);
+    slow_.letEnd(All);
+    end();
+    EXPECT_EQ(slow_.given(20).size(), 20U);
+}
+
+TEST_F(LaneTest, AClosedOneDropsWhatComesWithoutCountingIt) {
+    traceInto({.atWork = 1});
+    sendTraces(0, 3);
+    lane_->close();
+    sendTraces(3, 3);
+    slow_.letEnd(All);
+    EXPECT_EQ(slow_.given(3).size(), 3U);
+    end();
+    EXPECT_EQ(slow_.given(3).size(), 3U);
+    EXPECT_EQ(lane_->losses().all(), 0U);
+}
+
+TEST_F(LaneTest, WhatWaitsCanBeGivenUp) {
+    traceInto({.atWork = 2});
+    sendTraces(0, 30);
+    slow_.given(2);
+    EXPECT_EQ(lane_->discardWaiting(), 28U);
+    EXPECT_EQ(lane_->waiting(), 0U);
+    slow_.letEnd(All);
+    end();
+    EXPECT_EQ(slow_.given(2).size(), 2U);
+}
+
+// ---- What its owner may say.
+
+class Gated : public Lane {
+  public:
+    Gated() : Lane({.atWork = 3, .waiting = 5}) {}
+    void hold(unsigned int count) {
+        held_ = count;
+        resume();
+    }
+    std::atomic<unsigned int> fullTimes{0};
+    std::atomic<std::uint64_t> lost{0};
+
+  private:
+    unsigned int alsoAtWork() const override { return held_; }
+    void full() override { ++fullTimes; }
+    void sayLost(std::uint64_t deliveries) override { lost += deliveries; }
+
+    std::atomic<unsigned int> held_{2};
+};
+
+TEST_F(LaneTest, WhatItsOwnerHoldsCountsAsAtWork) {
+    const auto gated = std::make_shared<Gated>();
+    traceInto(gated);
+    sendTraces(0, 4);
+    EXPECT_EQ(slow_.given(1).size(), 1U);
+    EXPECT_EQ(gated->waiting(), 3U);
+    gated->hold(1);
+    slow_.given(2);
+    EXPECT_EQ(gated->waiting(), 2U);
+    gated->hold(3);
+    slow_.letEnd(2);
+    gated->hold(0);
+    slow_.letEnd(All);
+    slow_.given(4);
+}
+
+TEST_F(LaneTest, ItsOwnerIsToldOnceThatItIsFullAndHowManyWereLostWhenNoneWaits) {
+    const auto gated = std::make_shared<Gated>();
+    traceInto(gated);
+    sendTraces(0, 9);  // one at work, five wait
+    EXPECT_EQ(gated->fullTimes, 1U);
+    EXPECT_EQ(gated->lost, 0U);
+    gated->hold(0);
+    slow_.letEnd(All);
+    slow_.given(6);
+    while (gated->lost == 0)
+        std::this_thread::yield();
+    EXPECT_EQ(gated->lost, 3U);
+}
+
+// ---- Reports of what nobody registered for.
+
+TEST_F(LaneTest, ReportsHaveALaneOfTheirOwnWhoseWaitingOnesAreDroppedAtTheEnd) {
+    ccs_->asyncUnregisteredEvtGroup(&slow_, &Slow::onMsg, 0);
+    for (int i = 0; i < 150; ++i)
+        ASSERT_TRUE(sendEvent(1001));
+    slow_.given(100);
+    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
+    ASSERT_TRUE(sendReply());
+    EXPECT_EQ(recorder_.entries(1).size(), 1U);
+    // The reports that are at work end when the others have been given up.
+    class EndsThem : public std::stringbuf {
+      public:
+        explicit EndsThem(Slow& slow) : slow_(slow) {}
+        std::streamsize xsputn(const char* text, std::streamsize size) override {
+            slow_.letEnd(All);
+            return std::stringbuf::xsputn(text, size);
+        }
+
+      private:
+        Slow& slow_;
+    } said(slow_);
+    std::streambuf* const before = std::cerr.rdbuf(&said);
+    end();
+    std::cerr.rdbuf(before);
+    EXPECT_EQ(said.str(), "reports that still waited at the end, lost: 50\n");
+    EXPECT_EQ(slow_.given(100).size(), 100U);
+}
+
+}  // namespace

@@ -1,0 +1,200 @@
+#include "vela/Lane.h"
+
+#include <utility>
+
+#include "vela/report.h"
+
+namespace vela {
+
+void Lane::add(std::unique_ptr<Delivery> delivery) {
+    const std::size_t octets = delivery->octets();
+    Lock lock(mutex_);
+    if (closed_)
+        return;
+    if ((!waiting_.empty() || !mayStart()) && !hasRoomFor(octets)) {
+        refuse(lock);
+        return;
+    }
+    try {
+        waiting_.push_back({std::move(delivery), octets});
+    } catch (...) {
+        ++losses_.noMeans;
+        ++missing_;
+        throw;
+    }
+    octets_ += octets;
+    waiting_.back().delivery->missing = std::exchange(missing_, 0);
+    // Behind others it is started when one of those that are at work has ended.
+    if (waiting_.size() == 1)
+        startWaiting(lock);
+}
+
+void Lane::refuse(Lock& lock) {
+    ++losses_.noRoom;
+    ++missing_;
+    const bool first = unsaid_++ == 0;
+    lock.unlock();
+    if (first)
+        full();
+}
+
+void Lane::runHere(std::unique_ptr<Delivery> delivery) {
+    {
+        const Lock lock(mutex_);
+        delivery->missing = std::exchange(missing_, 0);
+        number(*delivery);
+    }
+    delivery->run();
+}
+
+void Lane::lose() {
+    const Lock lock(mutex_);
+    ++losses_.noMeans;
+    ++missing_;
+}
+
+void Lane::number(Delivery& delivery) {
+    ++started_;
+    if (delivery.body != nullptr)
+        delivery.body->setArrival({started_, delivery.missing});
+}
+
+// Gives threads to those that wait, as long as there may be more at work. One thread at a time is about it,
+// so that numbers are in the order of arrival and a number whose thread was refused is used again; that one
+// looks again after each thread, and so sees what became possible meanwhile.
+void Lane::startWaiting(Lock& lock) {
+    if (starting_)
+        return;
+    starting_ = true;
+    while (!waiting_.empty() && mayStart()) {
+        std::unique_ptr<Delivery> next = takeFirst();
+        ++atWork_;
+        number(*next);
+        lock.unlock();
+        try {
+            AbandonedThread_create(&Lane::runOnThread, next.get(), next->stackSize);
+        } catch (...) {
+            lock.lock();
+            noThreadFor(*next);
+            starting_ = false;
+            throw;
+        }
+        static_cast<void>(next.release());  // the thread's now
+        lock.lock();
+    }
+    starting_ = false;
+}
+
+std::unique_ptr<Delivery> Lane::takeFirst() {
+    octets_ -= waiting_.front().octets;
+    std::unique_ptr<Delivery> first = std::move(waiting_.front().delivery);
+    waiting_.pop_front();
+    return first;
+}
+
+// It is missing before the next one, which gets its number.
+void Lane::noThreadFor(const Delivery& delivery) {
+    --atWork_;
+    --started_;
+    ++losses_.noMeans;
+    (waiting_.empty() ? missing_ : waiting_.front().delivery->missing) += delivery.missing + 1;
+}
+
+// The same where nobody handles a refusal: it is reported. What waits goes on waiting as long as something is
+// at work, whose end comes here again.
+void Lane::startMore(Lock& lock) {
+    bool refused = false;
+    do {
+        refused = false;
+        try {
+            startWaiting(lock);
+        } catch (...) {
+            refused = true;
+            lock.unlock();
+            reportInternalError();
+            lock.lock();
+        }
+    } while (refused && !waiting_.empty() && atWork_ + alsoAtWork() == 0);
+}
+
+void* Lane::runOnThread(Thread::control*, void* arg) {
+    std::unique_ptr<Delivery> delivery(static_cast<Delivery*>(arg));
+    const struct Finally {
+        std::shared_ptr<Lane> lane;
+        ~Finally() { lane->ended(); }
+    } finally{delivery->lane};
+    const std::unique_ptr<Delivery> running = std::move(delivery);  // gone before its lane is told
+    running->run();
+    return nullptr;
+}
+
+void Lane::ended() {
+    Lock lock(mutex_);
+    --atWork_;
+    startMore(lock);
+    sayWhatWasLost(lock);
+}
+
+void Lane::resume() {
+    Lock lock(mutex_);
+    startMore(lock);
+}
+
+void Lane::sayWhatWasLost(Lock& lock) {
+    if (unsaid_ == 0 || !waiting_.empty())
+        return;
+    const std::uint64_t lost = std::exchange(unsaid_, 0);
+    lock.unlock();
+    sayLost(lost);
+}
+
+void Lane::sayLost(std::uint64_t deliveries) {
+    report(joined("too many deliveries waited, lost: ", deliveries));
+}
+
+void Lane::close() {
+    const Lock lock(mutex_);
+    closed_ = true;
+}
+
+bool Lane::isClosed() const {
+    const Lock lock(mutex_);
+    return closed_;
+}
+
+std::uint64_t Lane::discardWaiting() {
+    std::deque<Waiting> gone;  // ends when the lock is free
+    const Lock lock(mutex_);
+    gone.swap(waiting_);
+    octets_ = 0;
+    for (const Waiting& each : gone)
+        missing_ += each.delivery->missing;
+    return gone.size();
+}
+
+std::uint64_t Lane::waiting() const {
+    const Lock lock(mutex_);
+    return waiting_.size();
+}
+
+std::uint64_t Lane::pending() const {
+    const Lock lock(mutex_);
+    return waiting_.size() + atWork_;
+}
+
+std::uint64_t Lane::started() const {
+    const Lock lock(mutex_);
+    return started_;
+}
+
+std::uint64_t Lane::missing() const {
+    const Lock lock(mutex_);
+    return missing_;
+}
+
+Lane::Losses Lane::losses() const {
+    const Lock lock(mutex_);
+    return losses_;
+}
+
+}  // namespace vela
