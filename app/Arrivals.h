@@ -1,115 +1,91 @@
-// Trace records from the moment they arrive to the moment they are gone: how many there may be, and in which
+// Trace records from their arrival to their end: how many of them are on their way at a time, and in which
 // order they are queued.
-//
-// Each event is delivered on a thread of its own, and threads overtake one another. A record therefore takes
-// a place when it is made, on the dispatching thread, in the order of arrival; its delivery waits for its
-// turn. There are as many places as the queue has room, so that no record is refused: when all are taken the
-// dispatching thread waits, and with it whatever else arrives stays with the transport.
 #ifndef APP_ARRIVALS_H
 #define APP_ARRIVALS_H
 
 #include <array>
 #include <atomic>
-#include <chrono>
-#include <condition_variable>
-#include <mutex>
-#include <optional>
+#include <cstdint>
+#include <memory>
+#include <utility>
 
 #include "vela/CCS.h"
+#include "vela/Lane.h"
 
 namespace app {
 
-class Arrivals {
+// Records that may be queued; and those that are queued, being shown or being delivered are together no more.
+inline constexpr int QueueCapacity = 100;
+
+// The lane of the trace events. Each is delivered on a thread of its own, and threads overtake one another: a
+// record that comes before its turn is kept until those before it have come. A record counts as at work until
+// it is destroyed, so that the queue has room for each one; the others wait in the lane.
+class Arrivals : public vela::Lane {
   public:
-    static constexpr unsigned int Most = 100;  // records at one time
+    using Record = vela::CCS::EvtL2Trace_t;
 
-    // Held by a record from arrival to destruction. One that is destroyed before its turn gives it away.
-    class Place {
-      public:
-        explicit Place(Arrivals& arrivals) : arrivals_(arrivals), number_(arrivals.arrive()) {}
-        ~Place() { arrivals_.leave(number_, delivered_); }
-        Place(const Place&) = delete;
-        Place& operator=(const Place&) = delete;
+    Arrivals() : Arrivals(Bounds()) {}
+    explicit Arrivals(Bounds bounds);
 
-        unsigned int number() const { return number_; }
-        // On the delivery's thread. A record that goes without it, found no thread or no memory, and is lost.
-        void delivered() const { delivered_ = true; }
+    // On the delivery's thread, under queueGuard: gives the record to `queue`, in its turn, and then those
+    // that have waited for it. One that no lane has numbered has its turn at once.
+    template <typename Queue>
+    void takeInTurn(std::unique_ptr<Record> rec, Queue queue) {
+        ++taken_;
+        if (const std::uint64_t number = rec->arrival().number; number != 0)
+            early_[number % early_.size()] = std::move(rec);
+        else
+            queue(std::move(rec));
+        while (std::unique_ptr<Record> due = std::move(early_[next_ % early_.size()])) {
+            ++next_;
+            queue(std::move(due));
+        }
+    }
 
-      private:
-        Arrivals& arrivals_;
-        unsigned int number_;
-        mutable bool delivered_ = false;
-    };
+    // A record that was taken is destroyed. Starts deliveries that have waited for its room, and so is called
+    // without queueGuard.
+    void gone();
+    // A record found no memory in the queue and is destroyed. Under queueGuard.
+    void refused();
 
-    void awaitTurn(unsigned int number);
-    // The next may go; nothing if the number has had its turn.
-    void endTurn(unsigned int number);
+    // Gives those that wait for their turn to `queue`, when no delivery runs any more: their turn will not
+    // come.
+    template <typename Queue>
+    void releaseEarly(Queue queue) {
+        for (std::unique_ptr<Record>& each : early_) {
+            if (each != nullptr)
+                queue(std::move(each));
+        }
+    }
 
-    // Until no record is there; false when `limit` has passed first.
-    bool awaitNone(std::chrono::milliseconds limit);
-
-    // Records that were lost before the end.
-    unsigned long lost() const;
-
-    // Nobody waits any more: places are unlimited and in no order. For the end of whoever shows records.
-    void close();
-    // The end of the trace: what arrives from now on, comes too late to be shown. Nobody waits any more.
-    void end();
-    bool ended() const { return traceEnded_; }
+    // Records that are waiting, being delivered, queued or being shown; 0 when all that arrived is written.
+    std::uint64_t unwritten() const { return pending() + alsoAtWork(); }
+    // Those that the system had no thread or no memory for.
+    std::uint64_t lostForWantOfMeans() const { return losses().noMeans + refused_; }
 
   private:
-    static constexpr unsigned int Slots = 128;  // a power of two not below Most
-    static_assert(Slots >= Most && (Slots & (Slots - 1)) == 0);
+    // Taken and not destroyed yet.
+    unsigned int alsoAtWork() const override { return static_cast<unsigned int>(taken_ - gone_); }
+    void full() override;
+    void sayLost(std::uint64_t) override {}  // the log says where they are missing
 
-    unsigned int arrive();
-    bool hasRoom() const { return present_ < Most && next_ - turn_ < Slots; }
-    void leave(unsigned int number, bool delivered);
-    void endTurnLocked(unsigned int number);
-
-    mutable std::mutex mutex_;
-    std::condition_variable room_;
-    std::condition_variable none_;
-    std::atomic<bool> traceEnded_ = false;
-    bool closed_ = false;
-    unsigned long lost_ = 0;
-    unsigned int present_ = 0;
-    unsigned int next_ = 0;                             // the number of the next to arrive; wraps
-    unsigned int turn_ = 0;                             // the number whose turn it is
-    std::array<bool, Slots> ended_{};                   // turns that ended before they came, by number
-    std::array<std::condition_variable, Slots> turns_;  // one each, or every turn would wake everybody
+    std::array<std::unique_ptr<Record>, QueueCapacity> early_;  // by number
+    std::uint64_t next_ = 1;                                    // the number whose turn it is
+    std::atomic<std::uint64_t> taken_ = 0;
+    std::atomic<std::uint64_t> gone_ = 0;
+    std::atomic<std::uint64_t> refused_ = 0;
+    std::atomic<bool> fullSaid_ = false;
 };
 
-extern Arrivals arrivals;
+// Those of the trace; there for the whole process.
+extern std::shared_ptr<Arrivals> arrivals;
 
-// A record with a place among the arrivals.
-class ArrivedRecord : public vela::CCS::EvtL2Trace_t {
-  public:
-    Arrivals::Place place{arrivals};
-};
-
-// The traced D channel: its trace records are made as arrivals. Its callbacks have to end before it can, so
-// that its end is the end of the arrivals as well.
+// The traced D channel. Its callbacks have to end before it can, so its end is the end of the arrivals: what
+// waits is dropped.
 class TracedCcs : public vela::CCS {
   public:
     using CCS::CCS;
     ~TracedCcs() override;
-
-    vela::MsgBody* EvtBodyLookup(unsigned int evtType) override;
-};
-
-// The turn of a record that arrived; any other record has its turn at once. It may outlive the record.
-class Turn {
-  public:
-    explicit Turn(const vela::CCS::EvtL2Trace_t* rec);
-    ~Turn();
-    Turn(const Turn&) = delete;
-    Turn& operator=(const Turn&) = delete;
-
-    // The record arrived, and the trace has ended meanwhile.
-    bool isLate() const { return number_ && arrivals.ended(); }
-
-  private:
-    std::optional<unsigned int> number_;
 };
 
 }  // namespace app

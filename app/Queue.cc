@@ -5,7 +5,7 @@
 
 namespace vela {
 
-// Deletes one node at a time, because deleting the head would delete the others recursively.
+// One node at a time: letting the head go would recurse once a node.
 Queue::~Queue() {
     while (head_ != nullptr)
         head_ = std::move(head_->next);

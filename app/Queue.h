@@ -1,4 +1,4 @@
-// The queue of records that wait to be written.
+// The records waiting to be shown.
 #ifndef APP_QUEUE_H
 #define APP_QUEUE_H
 
@@ -8,8 +8,7 @@
 
 namespace vela {
 
-// First in, first out, with a limit. It does not own the records: whoever enqueues a record gives it to the
-// thread that dequeues it. The class has no lock.
+// Bounded, first in first out. Never owns a record: that belongs to whoever holds its pointer. Not locked.
 class Queue {
   public:
     explicit Queue(int capacity) : capacity_(capacity) {}
@@ -17,9 +16,9 @@ class Queue {
     Queue& operator=(const Queue&) = delete;
     ~Queue();
 
-    // Returns false when the queue is full or there is no memory.
+    // False when the queue is full or there is no memory.
     bool enqueue(CCS::EvtL2Trace_t* rec);
-    // Sets *out to the oldest record. Returns false when the queue is empty.
+    // False when the queue is empty.
     bool dequeue(CCS::EvtL2Trace_t** out);
 
     bool isempty() const { return count_ == 0; }

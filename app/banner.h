@@ -1,4 +1,4 @@
-// The title lines, which every run writes to the screen and to the log.
+// What every run starts with, on the screen and in the log.
 #ifndef APP_BANNER_H
 #define APP_BANNER_H
 

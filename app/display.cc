@@ -1,6 +1,7 @@
 #include "app/display.h"
 
 #include <algorithm>
+#include <atomic>
 #include <ctime>
 #include <iostream>
 #include <memory>
@@ -9,6 +10,7 @@
 #include "app/Arrivals.h"
 #include "app/Log.h"
 #include "app/guarded.h"
+#include "app/operator.h"
 #include "decoder/cursor.h"
 #include "decoder/frame.h"
 #include "decoder/lines.h"
@@ -34,7 +36,13 @@ constexpr unsigned int Transmitted = 1;
 constexpr int CallbackPlace = 100;
 constexpr int DisplayThreadPlace = 215;
 
-static_assert(Arrivals::Most <= unsigned{QueueCapacity}, "a record that has a place finds room in the queue");
+constexpr unsigned int PollMs = 10;
+constexpr int EnoughToShow = QueueCapacity / 2;
+
+// The display thread lets frames gather until the count says that there are enough. At most one is counted
+// each time it does so.
+std::atomic<bool> gathering = false;
+vela::Semaphore enough(1, 0);
 
 // Under queueGuard.
 decoder::LocalTime localTime;
@@ -61,26 +69,70 @@ void flushLog() {
     traceLog.flush();
 }
 
+// A cancellation point, but not while what has arrived is to be written out.
+void testCancel(vela::Thread::control& ctl) {
+    if (!arrivals->isClosed() || arrivals->unwritten() == 0 || shutdownHurried())
+        ctl.testCancel();
+}
+
+// Frames that follow one another are shown together: waking this thread for each of them costs more than all
+// the rest of showing it. The first one after a pause is not waited for.
+void awaitRecord(vela::Thread::control& ctl) {
+    if (sema.tryWait())
+        return;
+    gathering = true;
+    enough.tryWait(PollMs, PollMs);
+    gathering = false;
+    if (sema.tryWait())
+        return;
+    do {
+        flushLog();
+        testCancel(ctl);
+    } while (!sema.tryWait(PollMs, PollMs));
+}
+
+// False when the queue is empty.
+bool showNext(vela::Thread::control& ctl, vela::staticList<unsigned char>& octets) {
+    const std::lock_guard guard(queueGuard);
+    testCancel(ctl);
+    const std::unique_ptr<Record> rec = takeRecord();
+    if (rec != nullptr)
+        showRecord(*rec, octets);
+    if (event_queue.isempty())
+        traceLog.flushIfDue();
+    return rec != nullptr;
+}
+
 void displayForEver(vela::Thread::control& ctl) {
     decoder::swit = trunkVariant;
     vela::staticList<unsigned char> octets;  // reused for every record
     while (true) {
-        while (!sema.tryWait(10, 10)) {
-            flushLog();
-            ctl.testCancel();
-        }
-        const std::lock_guard guard(queueGuard);
-        ctl.testCancel();
-        if (const std::unique_ptr<Record> rec = takeRecord(); rec != nullptr)
-            showRecord(*rec, octets);
-        if (event_queue.isempty())
-            traceLog.flushIfDue();
+        awaitRecord(ctl);
+        if (showNext(ctl, octets))
+            arrivals->gone();
     }
+}
+
+// Takes over rec, whose turn it is. Under queueGuard.
+void queueRecord(std::unique_ptr<Record> rec) {
+    if (!event_queue.enqueue(rec.get())) {
+        rec.reset();
+        arrivals->refused();
+        decoder::text(decoder::enqueueFailed);
+        decoder::flushLines();
+        return;
+    }
+    static_cast<void>(rec.release());  // the queue's entry's now
+    sema.post();
+    if (event_queue.queuecount() >= EnoughToShow && gathering.exchange(false))
+        enough.post();
 }
 
 }  // namespace
 
 void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
+    if (rec.arrival().missing != 0)
+        traceLog.framesMissing(rec.arrival().missing);
     if (rec.Label != FrameLabel) {
         std::cout << "ERROR - received unexpected rtc event" << std::endl;
         return;
@@ -104,33 +156,28 @@ void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
 void HANDLE_L2Trace_events(vela::CCS*, unsigned int, Record* rec) {
     std::unique_ptr<Record> held(rec);
     guarded(CallbackPlace, [&] {
-        const Turn turn(held.get());
-        if (turn.isLate())
-            return;
         const std::lock_guard guard(queueGuard);
-        if (event_queue.enqueue(held.get())) {
-            static_cast<void>(held.release());  // the queue's entry's now
-            sema.post();
-        } else {
-            decoder::text(decoder::enqueueFailed);
-            decoder::flushLines();
-        }
+        arrivals->takeInTurn(std::move(held), queueRecord);
     });
 }
 
 void* Process_L2_Trace(vela::Thread::control* ctl, void*) {
-    // Once nobody takes records any more, none must wait for a place.
-    struct NoMoreRoom {
-        ~NoMoreRoom() { arrivals.close(); }
-    } const whenItEnds;
     guarded(DisplayThreadPlace, [&] { displayForEver(*ctl); });
     return nullptr;
 }
 
-void discardQueued() {
+Discarded discardQueued() {
+    Discarded discarded;
+    const auto discard = [&](const std::unique_ptr<Record>& rec) {
+        ++discarded.records;
+        discarded.missing += rec->arrival().missing;
+        arrivals->gone();
+    };
     Record* rec = nullptr;
     while (event_queue.dequeue(&rec))
-        const std::unique_ptr<Record> gone(rec);
+        discard(std::unique_ptr<Record>(rec));
+    arrivals->releaseEarly(discard);
+    return discarded;
 }
 
 }  // namespace app

@@ -2,14 +2,15 @@
 #ifndef APP_DISPLAY_H
 #define APP_DISPLAY_H
 
+#include <cstdint>
+
+#include "app/Arrivals.h"
 #include "app/Queue.h"
 #include "vela/CCS.h"
 #include "vela/Mutex.h"
 #include "vela/Thread.h"
 
 namespace app {
-
-inline constexpr int QueueCapacity = 100;
 
 // There for the whole process.
 extern vela::Queue event_queue;
@@ -21,7 +22,9 @@ extern int trunkVariant;        // decoder::swit of the display thread; set befo
 // The callback for layer-2 trace events, on the delivery thread of one event. Takes over rec.
 void HANDLE_L2Trace_events(vela::CCS* ccs, unsigned int evtGroup, vela::CCS::EvtL2Trace_t* rec);
 
-// The display thread's body.
+// The display thread's body. It is woken for the first frame after a pause; frames that follow within 10 ms
+// are shown together, unless they fill half the queue before. When it is cancelled after the arrivals were
+// closed, it shows what has arrived first, unless the shutdown is hurried.
 void* Process_L2_Trace(vela::Thread::control* ctl, void* arg);
 
 // Writes one record to the log. Under queueGuard. `octets` is room for the frame's, kept from record to
@@ -29,7 +32,11 @@ void* Process_L2_Trace(vela::Thread::control* ctl, void* arg);
 void showRecord(vela::CCS::EvtL2Trace_t& rec, vela::staticList<unsigned char>& octets);
 
 // Destroys what is still queued at the end, when no thread uses the queue any more.
-void discardQueued();
+struct Discarded {
+    std::uint64_t records = 0;
+    std::uint64_t missing = 0;  // that were lost before one of them
+};
+Discarded discardQueued();
 
 }  // namespace app
 

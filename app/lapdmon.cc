@@ -1,11 +1,13 @@
 #include "app/lapdmon.h"
 
+#include <array>
 #include <cerrno>
-#include <chrono>
+#include <cstdint>
 #include <cstdlib>
 #include <cstring>
 #include <iostream>
 #include <memory>
+#include <mutex>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -39,8 +41,7 @@ constexpr unsigned int ProtocolTypeParm = 7;
 constexpr unsigned int L2TraceParm = 10;
 
 constexpr unsigned int QueueDepth = 50;
-// For what has arrived to be shown when nothing more can.
-constexpr std::chrono::seconds ShowingLimit{5};
+constexpr unsigned int PollMs = 10;
 constexpr int MainPlace = 749;  // what main's report of a foreign exception carries
 
 void openLog() {
@@ -58,6 +59,7 @@ void openLog() {
 
 void closeLog() {
     const WritingOut writingOut;
+    const std::lock_guard guard(queueGuard);
     decoder::ofp = nullptr;
     traceLog.close();
 }
@@ -90,19 +92,11 @@ bool setProtocol(unsigned int type) {
     return true;
 }
 
-// What nobody registered for is reported as ever, but on the reader thread: while nobody reads the standard
-// error stream, messages stay with the transport, and no threads pile up.
-void reportInTurn(vela::CCS& reporting) {
-    const vela::Handler asEver(vela::Handler::MsgFunction{nullptr});
-    reporting.asyncUnregisteredMsgType(asEver, vela::EvtCallback::OnDispatchingThread);
-    reporting.asyncUnregisteredEvtGroup(asEver, vela::EvtCallback::OnDispatchingThread);
-}
-
 // Once the board reports events, the instance is quit's to switch off and to destroy.
 void startTrace(std::unique_ptr<vela::CCS> opened) {
     opened->SetParm(L2TraceParm, 1, nullptr);
-    reportInTurn(*opened);
-    opened->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0);
+    opened->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0,
+                                  arrivals);
     opened->DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
     ccs = std::move(opened);
     static_cast<void>(std::atexit(quit));
@@ -116,7 +110,6 @@ int untilEnded() {
     if (awaitQuit() == Ending::Asked)
         return EXIT_SUCCESS;
     std::cerr << "lapdmon: the board cannot be reached any more, the trace ends\n" << std::flush;
-    arrivals.awaitNone(ShowingLimit);
     return EXIT_FAILURE;
 }
 
@@ -141,15 +134,30 @@ int trace(int argc, char** argv) {
     return untilEnded();
 }
 
-// Whether every frame is in the log. Says how many found no thread or no memory; the log says of itself what
-// it could not write.
-bool isWhole() {
-    const unsigned long lost = arrivals.lost();
-    if (lost != 0)
-        std::cerr << "lapdmon: frames lost for want of threads or memory: " + std::to_string(lost) + "\n"
+// Frames that arrived and that the end did not wait for.
+std::uint64_t givenUp = 0;
+
+// One line on the standard error stream for each reason that frames were lost for. False when there was one.
+// The log says of itself what it could not write.
+bool noneLost() {
+    const std::array reasons{
+        std::pair{arrivals->lostForWantOfMeans(), "for want of threads or memory"},
+        std::pair{arrivals->losses().noRoom, "because too many waited for the log"},
+        std::pair{givenUp, "because the end did not wait for the log"},
+    };
+    bool none = true;
+    for (const auto& [frames, why] : reasons) {
+        if (frames == 0)
+            continue;
+        std::cerr << "lapdmon: frames lost " + std::string(why) + ": " + std::to_string(frames) + "\n"
                   << std::flush;
-    return lost == 0 && traceLog.complete();
+        none = false;
+    }
+    return none;
 }
+
+// Whether every frame is in the log.
+bool isWhole() { return noneLost() && traceLog.complete(); }
 
 // One step of the shutdown, which goes on whatever happens.
 template <typename Step>
@@ -160,25 +168,41 @@ void attempt(Step step) {
     }
 }
 
+// What has arrived is written for as long as the log takes it, unless a signal gives that up: the display
+// thread ends only then.
+void writeOut() {
+    const WritingOut writingOut;
+    arrivals->close();
+    Process.cancel();
+    Process.join();
+}
+
+// What is left when nobody writes any more is missing at the end of the log, with what was lost last.
+void giveUpRest() {
+    givenUp = arrivals->discardWaiting();
+    while (arrivals->pending() != 0)  // deliveries that have begun end at once
+        vela::sleep_ms(PollMs);
+    const Discarded queued = discardQueued();
+    givenUp += queued.records + arrivals->unwritten();  // one may have gone with a display thread that failed
+    if (const std::uint64_t missing = givenUp + queued.missing + arrivals->missing(); missing != 0)
+        traceLog.framesMissing(missing);
+}
+
 }  // namespace
 
+// The board first, so that nothing more arrives; then the log, whole, before anything that a stream or a
+// board can hold up.
 void quit() {
     if (ccs == nullptr)
         return;
     shutdownBegins();
     std::cout << "One moment. Program Exiting" << std::endl;
-    // The board first, so that no callback waits for the queue when the display thread goes; the log last.
     attempt([] { ccs->CancelEvt(vela::CCS::L2TraceGroup, nullptr); });
     attempt([] { ccs->SetParm(L2TraceParm, 0, nullptr); });
-    attempt([] {
-        const WritingOut writingOut;
-        arrivals.end();
-        Process.cancel();
-        Process.join();
-    });
-    attempt([] { ccs.reset(); });
-    attempt(discardQueued);
+    attempt(writeOut);
+    attempt(giveUpRest);
     attempt(closeLog);
+    attempt([] { ccs.reset(); });
 }
 
 int runTrace(int argc, char** argv) {

@@ -1,4 +1,4 @@
-// The protocol types that a trunk can report, and the switch variant by which each is decoded.
+// The protocol types a trunk can report, and the switch variant that each is decoded as.
 #ifndef APP_PROTOCOL_H
 #define APP_PROTOCOL_H
 
@@ -13,7 +13,7 @@ struct Protocol {
     std::string_view logLine;
 };
 
-// Returns null for a type that cannot be decoded.
+// Null for a type that nobody knows how to decode.
 const Protocol* protocolOf(unsigned int type);
 
 }  // namespace app

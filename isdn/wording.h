@@ -24,7 +24,7 @@ struct WordingRow {
     std::uint8_t codeset;
     std::uint8_t id;
     Wording words;
-    std::string_view name = {};  // of the element, where one identifier has several
+    Variants variants = everywhere;
 };
 
 std::span<const WordingRow> bearerWordings();  // bearers, compatibility, channels

@@ -37,11 +37,10 @@ namespace {
 
 using namespace wording;
 
-const WordingRow* findWording(const Element& element, std::string_view name) {
+const WordingRow* findWording(const Element& element, Variant variant) {
     for (const auto& rows : {stateWordings(), bearerWordings(), partyWordings()}) {
         for (const WordingRow& row : rows) {
-            if (row.id == element.id && row.codeset == element.codeset &&
-                (row.name.empty() || row.name == name))
+            if (row.id == element.id && row.codeset == element.codeset && row.variants.has(variant))
                 return &row;
         }
     }
@@ -67,7 +66,7 @@ void appendWords(std::string& line, const Element& element, Variant variant, Sen
     if (element.octets.empty() || element.shift())
         return;
     const std::string_view name = elementName(element, variant);
-    const WordingRow* const row = findWording(element, name);
+    const WordingRow* const row = findWording(element, variant);
     if (name.empty())
         addUnknown(line, element);
     else if (row != nullptr)

@@ -24,6 +24,7 @@ class Display : public ::testing::Test {
         discardQueued();
         while (sema.tryWait()) {
         }
+        arrivals = std::make_shared<Arrivals>();
     }
 
     void arrives(Record* rec) { HANDLE_L2Trace_events(nullptr, 32, rec); }

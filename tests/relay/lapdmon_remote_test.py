@@ -1,5 +1,6 @@
 """lapdmon with its board in another machine."""
 
+import os
 import re
 import socket
 import struct
@@ -103,6 +104,34 @@ class Lost(RelayTest):
         node, board, processor, to_node, to_board, to_processor, instance, component, to_instance, to_component, _ = rest
         peer.send(message(kind, body, source=(to_node, to_board, to_processor, to_component, to_instance),
                           target=(node, board, processor, component, instance), transaction=transaction))
+
+
+class Stalled(RelayTest):
+    """Nobody reads the log for a while: 3000 events come all at once meanwhile."""
+
+    MANY = 3000
+
+    def test_a_log_that_stalls_delays_no_reply_and_costs_no_frame(self):
+        path = self.folder / "log"
+        os.mkfifo(path)
+        reader = os.open(path, os.O_RDONLY | os.O_NONBLOCK)
+        self.addCleanup(os.close, reader)
+        frames = [(RECEIVED, bytes((2, 1, 1, i % 251))) for i in range(self.MANY)]
+        relay = Relay(self, ("--rate", "max", "--fault", f"burst={self.MANY}", "--frames",
+                             self.capture("many.pcap", frames, 0.004)), ("--write-timeout", "1"))
+        lapdmon = Program(self, LAPDMON, "-b1", "-f", "log", REMOTE_NORV=f"127.0.0.1:{relay.port}")
+        relay.wait_for(" EvtDetected ", times=self.MANY)
+        lapdmon.types("q\n")
+        relay.wait_for(" SetParmCmplt", times=2)
+        os.set_blocking(reader, True)
+        text = ""
+        while some := os.read(reader, 65536):
+            text += some.decode()
+        self.assertEqual(lapdmon.ends(), "")
+        self.assertNotIn("Timeout", lapdmon.screen.text())
+        times = [f"{i // 250}.{i % 250 * 4}" for i in range(self.MANY)]
+        self.assertEqual(re.findall("Time = (\\S+)", text), times)
+        relay.stops()
 
 
 class OnThePeer(RelayTest):

@@ -11,6 +11,7 @@ import struct
 import subprocess
 import tempfile
 import threading
+import time
 import unittest
 
 LIMIT = 60  # seconds
@@ -194,9 +195,12 @@ class Program:
         self._test.assertEqual(code, status, said + self.screen.text())
         return said
 
-    def quits(self):
-        self.process.stdin.write(b"q\n")
+    def types(self, text):
+        self.process.stdin.write(text.encode())
         self.process.stdin.flush()
+
+    def quits(self):
+        self.types("q\n")
         return self.ends()
 
     def kill(self):
@@ -215,6 +219,14 @@ class Relay(Program):
         super().__init__(test, SOFTBOARD, "--journal", str(self.journal), *board, "--", RELAY,
                          "--listen", "127.0.0.1:0", *options, **variables)
         self.port = int(self.screen.wait("listening on").rsplit(":", 1)[1])
+
+    def wait_for(self, wanted, times=1):
+        """Until so many lines of the journal hold the text."""
+        end = time.monotonic() + LIMIT
+        while self.journal.read_text().count(wanted) < times:
+            if time.monotonic() > end:
+                raise AssertionError(f"{wanted!r} did not come {times} times")
+            time.sleep(0.02)
 
     def stops(self):
         """Ends in an orderly way, and has given back every queue and buffer."""
