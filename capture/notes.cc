@@ -37,6 +37,8 @@ constexpr std::string_view ticksWord = "ticks ";
 constexpr std::string_view writtenWord = "written ";
 constexpr std::string_view description = "KV9 D channel";
 constexpr std::string_view variantWord = ", variant ";
+// Seconds around 1970 whose nanoseconds fit into 64 bits; those of the year 2199 do.
+constexpr std::int64_t inReach = 7'258'118'399;
 constexpr std::string_view noVariant = "of no known variant";
 
 // Takes `words` off the front.
@@ -92,7 +94,7 @@ bool readFrame(std::string_view text, Note& note) {
         note.ticks = ticks;
     }
     if (takes(text, writtenWord)) {
-        if (!takesNumber(text, written))
+        if (!takesNumber(text, written) || written < -inReach || inReach < written)
             return false;
         note.written = written;
     }

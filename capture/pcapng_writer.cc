@@ -112,7 +112,8 @@ std::size_t originalSize(const Item& item) {
     const std::size_t held = item.frame.octets.size();
     if (item.kind == Item::Kind::oversized)
         return leastOversized;
-    return item.isFrame() ? held : std::max<std::size_t>(held + 1, item.count);
+    constexpr std::size_t most = 0xffffffff - pseudoHeaderSize;  // a packet's length has 32 bits
+    return item.isFrame() ? held : std::clamp<std::size_t>(item.count, held + 1, most);
 }
 
 void PcapngWriter::write(const Item& item) {

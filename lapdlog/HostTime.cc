@@ -64,7 +64,8 @@ std::optional<std::tm> minuteOf(std::string_view date) {
     time.tm_year = numberAt(date, yearAt, 4) - 1900;
     const bool isGood = hasBlanks(date) && time.tm_wday >= 0 && time.tm_mon >= 0 && time.tm_mday > 0 &&
                         (isOneDigit || time.tm_mday > 9) && 0 <= time.tm_hour && time.tm_hour < 24 &&
-                        0 <= time.tm_min && time.tm_min < 60 && time.tm_year > -901 && isDate(time);
+                        0 <= time.tm_min && time.tm_min < 60 && 0 <= time.tm_year && time.tm_year < 300 &&
+                        isDate(time);
     return isGood ? std::optional(time) : std::nullopt;
 }
 

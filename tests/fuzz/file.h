@@ -24,6 +24,11 @@ class File {
                              pwrite(descriptor_, data, size, 0) == static_cast<ssize_t>(size);
         require(written, "a file in memory");
     }
+    // For writing from its beginning.
+    void empty() const {
+        require(ftruncate(descriptor_, 0) == 0 && lseek(descriptor_, 0, SEEK_SET) == 0, "a file in memory");
+    }
+    int descriptor() const { return descriptor_; }
     std::string path() const { return "/proc/self/fd/" + std::to_string(descriptor_); }
 
   private:

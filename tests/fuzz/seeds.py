@@ -148,6 +148,32 @@ def captures():
     yield pcapng(some)[:-9]
 
 
+def inputs():
+    """Captures, and the other forms of input."""
+    yield from captures()
+    comments = b"".join(struct.pack("<HH", 1, len(text)) + text + bytes(-len(text) % 4)
+                        for text in (b"lapdmon: Frames Lost: 17", b"lapdmon: ticks 75 written 1795260333", b"lapdmon: head net5"))
+    packet = struct.pack("<IIIII", 0, 0, 7, 3, 3) + b"\x00\x01\x7f\x00" + struct.pack("<HHI", 2, 4, 2) + comments
+    yield (block(0x0A0D0D0A, struct.pack("<IHHq", 0x1A2B3C4D, 1, 0, -1)) +
+           block(1, struct.pack("<HHI", 203, 0, 0) + struct.pack("<HH4sHHB", 2, 4, b"day1", 9, 1, 9)) + block(6, packet) +
+           block(3, struct.pack("<I", 3) + b"\x00\x01\x73\x00") + block(5, struct.pack("<IQHHQ", 0, 0, 5, 8, 3)))
+    yield b"TX 2026-11-21T11:25:33.3Z 00 01 7f\nRX 12.5 000173\n0 1095 00019009 # note\n1 11:25:33 02\n"
+    yield b"[2026-11-21 11:25:33.250] x > [ 00 01 7f ]\n[Nov 21 23:59:59] < [ 00 01\n 73 ]\n> [ 00"
+    head = (b"\nOrvane KV9 ISDN Trace Utility\nRecords the D-channel signalling of one trunk, decoded.\n"
+            b"Version 1.00-Build-04 lapdmon\n")
+    indent = b" " * 33
+    received = (b"\nSat Nov 21 11:25:33 2026\nRX Frame: Time = 0.300\nResponse=0    SAPI=0x00\nTEI=0x00\n"
+                b"    0x73  Unnumbered Acknowledgment\nHex Dump: \n00 01 73 \n")
+    sent = b"\n" + b"".join(indent + line + b"\n" for line in (
+        b"Sat Nov 21 11:25:33 2026", b"TX Frame: Time = 0.304", b"Command=1   SAPI=0x00", b"TEI=0x00",
+        b"0x01 0x05  Receive Ready", b"Hex Dump: ", b"02 01 01 05 "))
+    oversized = (b"\nSat Nov 21 11:25:33 2026\nRX Frame: Time = 0.308\n"
+                 b"Oversized frame, frame will not be interpreted \nFrame Error \n")
+    yield head + b"NET5 Switch \n" + received + sent + b"Enqueue Failed \nFrames Lost: 17 \n" + oversized
+    yield head + b"Get iemsg failed \n" + received[:-9]
+    yield received[30:] + b"stray\n" + sent + received + head + b"NI2 Switch \n"
+
+
 def scenarios():
     yield (EXAMPLES / "two-dchannels.toml").read_bytes()
     for text in ('protocol = "ntt"\nboard = 2\nlabel = 3\njournal = "j"\n[[dchannel]]\nnumber = 4\nprotocol = 99\n',
@@ -188,7 +214,7 @@ def command_lines():
 
 
 SEEDS = {
-    "frame": frames, "isdn": elements, "event": events, "message": messages, "relay": connections, "capture": captures,
+    "frame": frames, "isdn": elements, "event": events, "message": messages, "relay": connections, "capture": captures, "input": inputs,
     "scenario": scenarios, "handover": handovers, "command_line": command_lines,
 }
 

@@ -43,7 +43,7 @@ TEST_F(HostTimeTest, AnythingElseIsNoTime) {
           "Sat Nov 32 12:25:33 2026", "Sat nov 21 12:25:33 2026", "Sat Nov 21 24:25:33 2026",
           "Sat Nov 21 12:60:33 2026", "Sat Nov 21 12:25:61 2026", "Sat Nov 21-12:25:33 2026",
           "Sat Nov 21 12:25:3x 2026", "Sat Feb 30 12:25:33 2026", "Sat Nov 21 12:25:33 20x6",
-          "Mon Jun 07 12:25:33 2027"})
+          "Mon Jun 07 12:25:33 2027", "Wed Jan  1 00:00:00 2200", "Sun Dec 31 00:00:00 1899"})
         EXPECT_EQ(time_.of(text, std::nullopt), std::nullopt) << text;
 }
 
