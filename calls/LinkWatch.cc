@@ -16,7 +16,7 @@ constexpr std::int64_t flapTime = 60 * second;
 constexpr std::size_t flapTimes = 3;
 constexpr std::int64_t notReadyTime = 10 * second;
 constexpr std::int64_t hour = 3600 * second;
-constexpr unsigned idlePeriods = 3;
+constexpr unsigned idlePeriods = 3, leastPeriods = 2;
 // Fewer repetitions than these are an accident, not a line that loses frames.
 constexpr std::uint64_t leastRepeated = 10, leastOccasions = 3;
 
@@ -103,7 +103,7 @@ void LinkWatch::setUps(const Sample& sample, const Marks& marks, const Circumsta
     if (sample.layer2.type == FrameType::DISC)
         released_ = true;
     if (sample.layer2.type == FrameType::DM)
-        lost_ = up_ && !released_;
+        lost_ = up_;
     flaps(sample, marks, around);
 }
 
@@ -156,7 +156,7 @@ void LinkWatch::windows(const Sample& sample, const Link& link, const Circumstan
 
 // I frames and polls demand an answer, whichever it is. A burst of them is one demand.
 void LinkWatch::demands(const Sample& sample, const Circumstances& around) {
-    if (tei_ == isdn::groupTei || (sample.layer2.type != FrameType::I && !isPoll(sample)))
+    if (sample.layer2.type != FrameType::I && !isPoll(sample))
         return;
     Asked& asked = demands_[indexOf(sample.from())];
     if (asked.count > 0 && sample.at - asked.last < around.timers->t200 * 9 / 10)
@@ -213,10 +213,6 @@ void LinkWatch::endHour(Repeated& repeated, Side side) {
     repeated = {};
 }
 
-bool LinkWatch::mayMissKeepAlives(const Circumstances& around) const {
-    return up_ && around.access != Access::basic && !keepAliveReported_ && lastFrame_ != 0;
-}
-
 void LinkWatch::schedule(const Circumstances& around) {
     due_ = never;
     const std::int64_t wait = around.timers->t200 + around.timers->slack;
@@ -226,10 +222,10 @@ void LinkWatch::schedule(const Circumstances& around) {
     };
     for (const std::size_t side : {std::size_t{0}, std::size_t{1}}) {
         for (const Asked* const asked : {&polls_[side], &setUps_[side], &demands_[side]})
-            by(asked->count > repetitions200 && !asked->reported, asked->last + wait);
+            due_ = std::min(due_, dueOf(*asked, around));
         by(full_[side].holds && !full_[side].reported, full_[side].at + wait);
         by(notReady_[side].holds && !notReady_[side].reported, notReady_[side].at + notReadyTime);
-        by(idle_[side].seen >= 2 && mayMissKeepAlives(around), lastAt_ + idlePeriods * idle_[side].period);
+        due_ = std::min(due_, dueOf(idle_[side], around));
     }
 }
 
@@ -243,21 +239,29 @@ void LinkWatch::expire(std::int64_t at, const Circumstances& around) {
     schedule(around);
 }
 
-bool LinkWatch::ranOut(const Asked& asked, std::int64_t at, const Circumstances& around) {
-    return asked.count > repetitions200 && !asked.reported &&
-           at > asked.last + around.timers->t200 + around.timers->slack;
+// When the last repetition's answer is overdue.
+std::int64_t LinkWatch::dueOf(const Asked& asked, const Circumstances& around) {
+    if (asked.count <= repetitions200 || asked.reported)
+        return never;
+    return asked.last + around.timers->t200 + around.timers->slack;
+}
+
+std::int64_t LinkWatch::dueOf(const Idle& idle, const Circumstances& around) const {
+    const bool expected = idle.seen >= leastPeriods && up_ && around.access != Access::basic &&
+                          !keepAliveReported_ && lastFrame_ != 0;
+    return expected ? lastAt_ + idlePeriods * idle.period : never;
 }
 
 void LinkWatch::expireDemands(Side side, std::int64_t at, const Circumstances& around) {
     Asked& demand = demands_[indexOf(side)];
-    if (around.bothHeard && ranOut(demand, at, around)) {
+    if (around.bothHeard && at > dueOf(demand, around)) {
         demand.reported = silent_[indexOf(other(side))] = true;
         observe(findings::oneDirectionSilent, demand.frame, demand.first,
                 nameOf(other(side)) + " sent nothing for " + secondsOf(at - demand.first) + ", although " +
                     nameOf(side) + " demanded an answer " + std::to_string(demand.count) + " times");
     }
     Asked& poll = polls_[indexOf(side)];
-    if (around.bothHeard && ranOut(poll, at, around)) {
+    if (around.bothHeard && at > dueOf(poll, around)) {
         poll.reported = true;
         if (poll.heard)
             observe(findings::pollUnanswered, poll.frame, poll.first,
@@ -268,7 +272,7 @@ void LinkWatch::expireDemands(Side side, std::int64_t at, const Circumstances& a
 // After a direction fell silent, SABMEs without an answer are what follows from it.
 void LinkWatch::expireSetUps(Side side, std::int64_t at, const Circumstances& around) {
     Asked& setUp = setUps_[indexOf(side)];
-    if (!ranOut(setUp, at, around))
+    if (at <= dueOf(setUp, around))
         return;
     setUp.reported = true;
     if (!silent_[indexOf(other(side))])
@@ -295,7 +299,7 @@ void LinkWatch::expireWindows(Side side, std::int64_t at, const Circumstances& a
 
 void LinkWatch::expireKeepAlives(Side side, std::int64_t at, const Circumstances& around) {
     const Idle& idle = idle_[indexOf(side)];
-    if (idle.seen < 2 || !mayMissKeepAlives(around) || at <= lastAt_ + idlePeriods * idle.period)
+    if (at <= dueOf(idle, around))
         return;
     keepAliveReported_ = true;
     observe(findings::keepAliveMissing, lastFrame_, lastAt_,

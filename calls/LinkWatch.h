@@ -105,13 +105,13 @@ class LinkWatch {
     void keepAlives(const Sample& sample, const Marks& marks);
     void repetitions(const Sample& sample, const Marks& marks);
     void endHour(Repeated& repeated, Side side);
-    static bool ranOut(const Asked& asked, std::int64_t at, const Circumstances& around);
+    static std::int64_t dueOf(const Asked& asked, const Circumstances& around);
+    std::int64_t dueOf(const Idle& idle, const Circumstances& around) const;
     void expireDemands(Side side, std::int64_t at, const Circumstances& around);
     void expireSetUps(Side side, std::int64_t at, const Circumstances& around);
     void expireWindows(Side side, std::int64_t at, const Circumstances& around);
     void expireKeepAlives(Side side, std::int64_t at, const Circumstances& around);
     void schedule(const Circumstances& around);
-    bool mayMissKeepAlives(const Circumstances& around) const;
     void observe(const FindingKind& kind, std::uint64_t frame, std::int64_t at, std::string sentence,
                  std::optional<Severity> severity = {});
     std::string linkWords() const;

@@ -19,6 +19,11 @@ std::size_t hashOf(const Sample& sample) {
     return std::hash<std::string_view>()({reinterpret_cast<const char*>(octets.data()), octets.size()});
 }
 
+// A poll and its answer are the same octets if both sides' N(R) are equal.
+bool mayAnswer(const Sample& sample) {
+    return sample.layer2.hasNr() && !sample.layer2.hasNs() && sample.layer2.pf;
+}
+
 }  // namespace
 
 bool Roles::wasSent(const Sample& sample) const {
@@ -43,18 +48,19 @@ std::optional<Observation> Roles::take(const Sample& sample, bool sameRole) {
         next_ = (next_ + 1) % sent_.size();
         return std::nullopt;
     }
-    if (others_ || !wasSent(sample)) {
-        others_ = true;
+    if (!wasSent(sample)) {
         looped_ = false;
         copies_ = 0;
         return suspected_ ? finish() : std::nullopt;
     }
+    if (mayAnswer(sample))
+        return std::nullopt;
     if (++copies_ < copiesOfALoop)
         return std::nullopt;
     looped_ = true;
-    return report(findings::lineLooped, sample.number, sample.at,
-                  "each of the first " + std::to_string(copies_) +
-                      " frames that came in is a copy of one sent less than 200 ms before");
+    return report(
+        findings::lineLooped, sample.number, sample.at,
+        std::to_string(copies_) + " frames that came in are copies of those sent less than 200 ms before");
 }
 
 std::optional<Observation> Roles::finish() {

@@ -40,8 +40,7 @@ class Roles {
 
     std::array<Sent, 16> sent_{};  // the last frames that went out, one behind the other
     std::size_t next_ = 0;
-    unsigned copies_ = 0;  // frames that came in as they went out
-    bool others_ = false;  // some frame came in that had not gone out
+    unsigned copies_ = 0;  // frames in a row that came in as they went out
     bool looped_ = false;
     bool reported_ = false;
     struct Suspicion {

@@ -370,6 +370,61 @@ TEST_F(DChannelTest, ForgetsTheLinksWhenTheRecorderIsStartedAgain) {
     EXPECT_EQ(told("0 > I 9 3\n0.1 < RR 10\n"), "4 user command accepted unknown\n5 user response up\n");
 }
 
+TEST_F(DChannelTest, PassesAWaitingFrameOnOnceThoughItWasRepeated) {
+    EXPECT_EQ(told("1 < I 0 0\n1.1 < I 2 0\n2.1 < I 2 0\n2.2 > RR 3\n"),
+              "1 user command accepted unknown\n"
+              "2 user command early unknown\n"
+              "3 user command again early unknown\n"
+              "4 late 2 user response up [hole at 2: 1 from 1 by recorder]\n");
+}
+
+TEST_F(DChannelTest, WaitsOnWhileTheReceiverHasAcknowledgedNothing) {
+    EXPECT_EQ(told("1 < I 0 0\n1.1 < I 2 0\n1.15 > RR 1\n1.2 > RR 3\n"),
+              "1 user command accepted unknown\n"
+              "2 user command early unknown\n"
+              "3 user response up\n"
+              "4 late 2 user response up [hole at 2: 1 from 1 by recorder]\n");
+}
+
+TEST_F(DChannelTest, TakesNoOldFrameForABeginning) {
+    EXPECT_EQ(told("1 > I 5 5\n1.1 < RR 6\n9 > I 0 5 = 08 01 02 05\n"),
+              "1 user command accepted unknown\n2 user response up\n3 user command refused again up\n");
+}
+
+TEST_F(DChannelTest, LearnsNothingFromPollsThatCrossNorFromThoseOfOneSide) {
+    EXPECT_EQ(told("0 > RR 0 P\n0.1 < RR 0 P\n"), "1 unknown\n2 up\n");
+    DChannel another;
+    EXPECT_EQ(Told(another)("0 < RR 5 P\n0.5 < RR 5 P\n"), "1 unknown\n2 unknown\n");
+}
+
+TEST_F(DChannelTest, HidesNoKeepAliveWithAFrameBetweenPollAndAnswer) {
+    EXPECT_EQ(told("0 > I 0 0\n0.1 < RR 1\n20 > RR 0 P\n20.01 < I 0 1\n20.02 < RR 1 F\n"),
+              "1 user command accepted unknown\n"
+              "2 user response up\n"
+              "3 user command keep-alive up\n"
+              "4 user command accepted up\n"
+              "5 user response up\n");
+}
+
+TEST_F(DChannelTest, WaitsForNoAnswerBehindDisconnectedMode) {
+    EXPECT_EQ(told("0 > I 0 0\n0.1 < RR 1\n20 > RR 0 P\n20.1 < DM\n30 > RR 0 P\n"),
+              "1 user command accepted unknown\n"
+              "2 user response up\n"
+              "3 user command keep-alive up\n"
+              "4 user response link-down down\n"
+              "5 user command down\n");
+}
+
+TEST_F(DChannelTest, TakesNumbersAsTheyComeOnALinkThatCameUpUnseen) {
+    EXPECT_EQ(told("0 > I 0 0\n0.1 < RR 1\n2 > DISC\n2.1 < UA\n5 > I 40 7\n5.1 < RR 41\n"),
+              "1 user command accepted unknown\n"
+              "2 user response up\n"
+              "3 user command releasing\n"
+              "4 user response link-down down\n"
+              "5 user command accepted up\n"
+              "6 user response up\n");
+}
+
 // Each excerpt on a D channel of its own: what is accepted, and what happens besides.
 std::string toldOf(std::string_view excerpt) {
     DChannel channel;

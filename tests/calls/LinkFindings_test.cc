@@ -113,8 +113,8 @@ TEST(LinkFindings, CountRepeatsWithinTenMinutes) {
     for (int at = 0; at < 5; ++at)
         story += std::to_string(at) + " > SABME\n" + std::to_string(at) + ".01 < DM F\n";
     EXPECT_EQ(found(story), "warning link-refused 2\nwarning link-refused 10 x4\n");
-    EXPECT_EQ(found("0 > SABME\n0.01 < DM F\n700 > SABME\n700.01 < DM F\n"),
-              "warning link-refused 2\nwarning link-refused 4\n");
+    EXPECT_EQ(found("0 > SABME\n0.01 < DM F\n700 > SABME\n700.01 < DM F\n701 > SABME\n701.01 < DM F\n"),
+              "warning link-refused 2\nwarning link-refused 4\nwarning link-refused 6\n");
 }
 
 TEST(SabmeUnanswered, IsFoundWhenTheLastRepetitionHasNoAnswer) {
@@ -165,12 +165,13 @@ TEST(LinkFlap, IsNotFoundOnBasicAccessNorOnAStandbyWithPollsOnly) {
 }
 
 TEST(LinkFlap, IsNotFoundWhenServiceHasTakenTheTrunkOut) {
-    EXPECT_EQ(
-        found("0 > SABME\n0.01 < UA\n1 > I 0 0 = 03 01 00 0F 01 01 82\n1.1 < RR 1\n5 > SABME\n5.01 < UA\n"),
-        "");
-    EXPECT_EQ(
-        found("0 > SABME\n0.01 < UA\n1 > I 0 0 = 03 01 00 0F 01 01 80\n1.1 < RR 1\n5 > SABME\n5.01 < UA\n"),
-        "error link-flap 5\n");
+    const auto afterService = [](const std::string& changeStatus) {
+        return found(std::string(up) + "1 > I 0 0 = 03 01 00 0F 01 01 " + changeStatus +
+                     "\n1.1 < RR 1\n5 > SABME\n5.01 < UA\n");
+    };
+    EXPECT_EQ(afterService("82"), "");
+    EXPECT_EQ(afterService("80"), "error link-flap 5\n");
+    EXPECT_EQ(afterService("C2"), "error link-flap 5\n");  // one channel is out of service
 }
 
 TEST(FrameRejected, IsFoundWithWhatTheFrameSays) {
@@ -233,7 +234,7 @@ TEST(BoardRestarted, ForgetsWhatWasOpen) {
 
 TEST(Retransmissions, AreFoundAboveOneInAHundredWithinAnHour) {
     std::string often(up), seldom(up);
-    for (int i = 0; i < 500; ++i) {
+    for (int i = 0; i < 1500; ++i) {
         const std::string time = std::to_string(10 + i), number = std::to_string(i % 128);
         const std::string frame = time + " > I " + number + " 0\n";
         const std::string again = time + ".2 > I " + number + " 0\n";
@@ -241,18 +242,18 @@ TEST(Retransmissions, AreFoundAboveOneInAHundredWithinAnHour) {
         often += frame + (i % 40 == 0 ? again : "") + ack;
         seldom += frame + (i % 120 == 0 ? again : "") + ack;
     }
-    EXPECT_EQ(found(often), "warning retransmissions 976\n");
+    EXPECT_EQ(found(often), "warning retransmissions 3001\n");
     EXPECT_EQ(found(seldom), "");
 }
 
 TEST(Retransmissions, AreNotFoundForOneRecovery) {
     std::string story(up);
-    for (int i = 0; i < 7; ++i)
-        story += "1.0" + std::to_string(i) + " > I " + std::to_string(i) + " 0\n";
-    story += "1.1 < REJ 0\n";
-    for (int i = 0; i < 7; ++i)
-        story += "1.2" + std::to_string(i) + " > I " + std::to_string(i) + " 0\n";
-    EXPECT_EQ(found(story + "1.3 < RR 7\n"), "");
+    for (int i = 0; i < 12; ++i)
+        story += "1." + std::to_string(10 + i) + " > I " + std::to_string(i) + " 0\n";
+    story += "1.3 < REJ 0\n";
+    for (int i = 0; i < 12; ++i)
+        story += "1." + std::to_string(40 + i) + " > I " + std::to_string(i) + " 0\n";
+    EXPECT_EQ(found(story + "1.6 < RR 12\n"), "");
 }
 
 TEST(KeepAliveMissing, IsFoundWhenPollsStop) {
@@ -263,6 +264,7 @@ TEST(KeepAliveMissing, IsFoundWhenPollsStop) {
 
 TEST(KeepAliveMissing, IsNotFoundWithinThreePeriodsOrWithoutPolls) {
     EXPECT_EQ(found(std::string(up) + idle(10, 60) + idle(90, 120)), "");
+    EXPECT_EQ(Trunk().tell(std::string(up) + idle(10, 20)).advance(1000).found(), "");
     EXPECT_EQ(found(std::string(up) + "1 > I 0 0\n1.1 < RR 1\n500 > I 1 0\n500.1 < RR 2\n"), "");
     EXPECT_EQ(found(std::string(up) + idle(10, 60) + "61 > DISC\n61.1 < UA\n500 > SABME\n500.1 < UA\n"), "");
 }
@@ -279,6 +281,14 @@ TEST(PollUnanswered, IsFoundAfterTheLastRepetition) {
     EXPECT_EQ(
         found(std::string(up) + "1 > RR 0 P\n2 > RR 0 P\n2.5 < I 0 0\n3 > RR 1 P\n4 > RR 1 P\n5.1 < I 1 0\n"),
         "warning poll-unanswered 3\n");
+}
+
+TEST(PollUnanswered, IsNotFoundBeforeTheLastRepetition) {
+    EXPECT_EQ(Trunk()
+                  .tell(std::string(up) + "1 > RR 0 P\n2 > RR 0 P\n2.5 < I 0 0\n3 > RR 1 P\n")
+                  .advance(9)
+                  .found(),
+              "");
 }
 
 TEST(PollUnanswered, IsANoteWhenALaterPollIsAnswered) {
@@ -359,7 +369,24 @@ TEST(LineLooped, IsFoundWhenWhatComesInWentOut) {
     // What the other side sends has the octets of what ours has sent.
     for (int at = 0; at < 4; ++at)
         trunk.tell(std::to_string(at) + " > SABME\n").tell(std::to_string(at) + ".02 < SABME\n", true);
+    // What the links show follows from that.
+    trunk.tell("5 > UA\n").tell("5.02 < UA\n", true).tell("6 > SABME\n").tell("6.02 < SABME\n", true);
     EXPECT_EQ(trunk.found(), "error line-looped 6\n");
+}
+
+TEST(LineLooped, IsFoundOnALinkThatWasHealthyBefore) {
+    Trunk trunk;
+    trunk.tell(std::string(up) + idle(10, 30));
+    for (int at = 40; at < 44; ++at)
+        trunk.tell(std::to_string(at) + " > SABME\n").tell(std::to_string(at) + ".02 < SABME\n", true);
+    EXPECT_NE(trunk.found().find("error line-looped 20\n"), std::string::npos);
+}
+
+TEST(LineLooped, IsNotFoundWherePollsAndAnswersAreTheSameOctets) {
+    std::string story;
+    for (int at = 10; at < 100; at += 10)
+        story += std::to_string(at) + " > RR 0 P\n" + std::to_string(at) + ".01 < RR 0 F\n";
+    EXPECT_EQ(found(story), "");
 }
 
 TEST(LineLooped, IsNotFoundWhenCopiesComeLate) {
@@ -384,6 +411,8 @@ TEST(Tei, IsDoubledWhenTwoTerminalsAnswerForIt) {
     const std::string check = "0 < sapi 63 UI = 0F 00 00 04 81\n0.1 > sapi 63 UI = 0F 11 11 05 81\n";
     EXPECT_EQ(found(check + "0.2 > sapi 63 UI = 0F 22 22 05 81\n"), "warning tei-doubled 3\n");
     EXPECT_EQ(found(check + "0.2 > sapi 63 UI = 0F 22 22 05 83\n"), "");
+    EXPECT_EQ(found(check + "0.2 > sapi 63 UI = 0F 11 11 05 81\n"), "");
+    EXPECT_EQ(found(check + "1.5 > sapi 63 UI = 0F 22 22 05 81\n"), "");
     EXPECT_EQ(found(check + "0.5 < sapi 63 UI = 0F 00 00 04 FF\n0.6 > sapi 63 UI = 0F 22 22 05 81\n"), "");
     EXPECT_EQ(found(check + "1.5 < sapi 63 UI = 0F 00 00 04 81\n1.6 > sapi 63 UI = 0F 22 22 05 81\n"), "");
 }
@@ -391,6 +420,7 @@ TEST(Tei, IsDoubledWhenTwoTerminalsAnswerForIt) {
 TEST(Tei, IsDoubledWhenAnAnswerComesUnasked) {
     EXPECT_EQ(found(std::string(up) + "1 < UA\n"), "warning tei-doubled 3\n");
     EXPECT_EQ(found("1 < UA\n"), "");
+    EXPECT_EQ(Trunk().tell(up).missing().tell("1 < UA\n").found(), "warning frames-lost 2\n");
 }
 
 TEST(Tei, IsNotedWhenAssignedOnAPrimaryRate) {
