@@ -58,6 +58,12 @@ std::string numberWords(Octets contents, std::span<const BerName> names) {
 
 std::string characters(Octets contents) { return {contents.begin(), contents.end()}; }
 
+// Octets that spell something: nobody can be told what a value is without a type, but a name shows.
+bool spell(Octets contents) {
+    return contents.size() >= 3 &&
+           std::ranges::all_of(contents, [](std::uint8_t octet) { return octet >= 0x20 && octet < 0x7F; });
+}
+
 // The kind of type that a universal tag names, for values of which nothing else is known.
 std::optional<Kind> kindOf(BerTag tag) {
     if (tag.tagClass != BerClass::universal)
@@ -147,7 +153,7 @@ std::string wordsOf(const BerTree& tree, const BerValue& value, const BerType* t
         return berObjectIdentifierOf(contents).value_or("");
     const std::optional<Kind> kind = type != nullptr ? type->kind : kindOf(value.tag);
     if (!kind)
-        return {};
+        return spell(contents) ? characters(contents) : std::string();
     switch (*kind) {
         case Kind::boolean:
             if (const std::optional<bool> set = berBooleanOf(contents))
@@ -165,8 +171,10 @@ std::string wordsOf(const BerTree& tree, const BerValue& value, const BerType* t
     }
 }
 
-bool isText(const BerValue& value, const BerType* type) {
+bool isText(const BerTree& tree, const BerValue& value, const BerType* type) {
     const std::optional<Kind> kind = type != nullptr ? type->kind : kindOf(value.tag);
+    if (!kind && value.tag != berObjectIdentifier)
+        return spell(tree.contentsOf(value));
     return kind == Kind::digits || kind == Kind::text || kind == Kind::name;
 }
 

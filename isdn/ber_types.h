@@ -93,8 +93,8 @@ class BerMeanings {
 // decides.
 std::string wordsOf(const BerTree& tree, const BerValue& value, const BerType* type);
 
-// Whether a primitive value holds characters.
-bool isText(const BerValue& value, const BerType* type);
+// Whether a primitive value holds characters; without a type, whether it looks as if it did.
+bool isText(const BerTree& tree, const BerValue& value, const BerType* type);
 
 // Whether a primitive value identifies a person. Where no type is known, each string and number may.
 bool isPersonal(const BerValue& value, const BerType* type);

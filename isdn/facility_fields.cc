@@ -96,7 +96,7 @@ void Facility::Fielder::contents(const BerValue& value, const BerMeaning& meanin
     if (!damaged)
         made.meaning =
             meaning.says.empty() ? fields.keep(wordsOf(facility.tree_, value, meaning.type)) : meaning.says;
-    if (!damaged && isText(value, meaning.type))
+    if (!damaged && isText(facility.tree_, value, meaning.type))
         made.kind = Field::Kind::text;
     else if (made.meaning.empty())
         made.kind = Field::Kind::raw;

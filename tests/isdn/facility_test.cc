@@ -243,6 +243,14 @@ TEST(FacilityFields, TakeEachStringAndNumberOfAnUnknownOperationForPersonal) {
         "34+2 8-1 0 header end of contents= X.690 8.1.5\n");
 }
 
+TEST(FacilityFields, ShowCharactersWhereverThereAreSome) {
+    const std::string text =
+        fieldsOf(hex("91 A1 16 02 01 01 02 01 63 30 0E 04 03 42 6F 62 80 03 41 6C 69 82 02 41 42"));
+    EXPECT_NE(text.find("16+3 8-1 2 text OCTET STRING=Bob personal"), std::string::npos) << text;
+    EXPECT_NE(text.find("21+3 8-1 2 text [0]=Ali personal"), std::string::npos) << text;
+    EXPECT_NE(text.find("26+2 8-1 2 raw [2]= personal"), std::string::npos) << text;
+}
+
 TEST(FacilityFields, ShowWhatIsDamagedWholeAndTakeItForPersonal) {
     EXPECT_EQ(fieldsOf(hex("91 A1 09 02 01 01 02 01 0F 30 05 0A")),
               "3 8-8 0 extension extension= Q.932 8.2.3\n"
