@@ -42,6 +42,8 @@ TEST(BerTree, ReadsEachFormOfIdentifierAndLength) {
          "0 SEQUENCE constructed 0 2+3\n1 INTEGER 2 4+1\n0 NULL 7 9+0\n"},
         {"indefinite in indefinite", "A1 80 30 80 00 00 05 00 00 00",
          "0 [1] constructed 0 2+6\n1 SEQUENCE constructed 2 4+0\n1 NULL 6 8+0\n"},
+        {"a value with the tag of end-of-contents", "30 80 00 01 AA 00 00",
+         "0 SEQUENCE constructed 0 2+3\n1 END OF CONTENTS 2 4+1\n"},
         {"context, application and private classes", "81 00 41 00 C3 00",
          "0 [1] 0 2+0\n0 [APPLICATION 1] 2 4+0\n0 [PRIVATE 3] 4 6+0\n"},
         {"a tag of two octets more", "9F 81 00 01 AA", "0 [128] 0 4+1\n"},
