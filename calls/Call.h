@@ -70,6 +70,7 @@ struct CauseGiven {
     std::uint8_t location = 0;
     std::uint8_t value = 0;
     std::vector<std::uint8_t> diagnostics;
+    std::string words;  // "cause 17 user busy, remote user"
 };
 
 // A party's number as it was signalled.
@@ -92,6 +93,7 @@ struct Call {
     std::uint64_t reference = 0;
     std::uint8_t referenceLength = 0;
     Side origin = Side::us;  // the side that chose the reference
+    capture::Role originRole = capture::Role::unknown;
     Kind kind = Kind::call;
     Phase phase = Phase::setUp;
 
@@ -102,6 +104,8 @@ struct Call {
     std::string bearer;  // in words: "speech", "64k unrestricted"
     std::optional<isdn::ChannelId> asked;
     std::optional<isdn::ChannelId> granted;  // of the first answer that names one
+    std::string askedWords;                  // the same in words: "30!", "any", "none", "0/30"
+    std::string grantedWords;
 
     // Nanoseconds since `begin`; empty if there was no such message.
     std::optional<std::int64_t> firstResponse;

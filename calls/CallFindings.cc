@@ -20,7 +20,7 @@ constexpr std::uint8_t numberIncomplete = 28;
 
 std::string wordsOf(const isdn::Element& found, const Message& message) {
     std::string words;
-    isdn::appendWords(words, found, message.variant);
+    isdn::appendWords(words, found, message.variant, message.sender());
     return words;
 }
 

@@ -142,6 +142,7 @@ Life& CallTable::begin(const Message& message, const CallKey& key) {
     call.reference = key.value;
     call.referenceLength = message.layer3.callReference.length;
     call.origin = key.origin;
+    call.originRole = key.origin == message.from() ? message.senderRole() : opposite(message.senderRole());
     const std::uint8_t messageType = message.layer3.type;
     call.beforeTrace = !initiates(message.layer3);
     call.kind = messageType == type::registration ? Kind::signalling : Kind::call;

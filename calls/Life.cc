@@ -59,6 +59,14 @@ void learnBearer(Call& call, const Message& message) {
         isdn::appendWords(call.bearer, bearer, message.variant);
 }
 
+// "30!", without the element's name in front.
+std::string wordsOf(const Element& channel, const Message& message) {
+    constexpr std::string_view name = "channel ";
+    std::string words;
+    isdn::appendWords(words, channel, message.variant, message.sender());
+    return words.starts_with(name) ? words.substr(name.size()) : words;
+}
+
 void learnChannel(Life& life, const Message& message) {
     const Element found = message.layer3.elements.find(element::channelIdentification);
     if (found.octets.empty())
@@ -68,10 +76,13 @@ void learnChannel(Life& life, const Message& message) {
         return;
     Call& call = life.call;
     if (message.from() == call.origin) {
-        if (message.layer3.type == type::setup && !call.asked)
+        if (message.layer3.type == type::setup && !call.asked) {
             call.asked = channel;
+            call.askedWords = wordsOf(found, message);
+        }
     } else if (!call.granted && !isClearing(message.layer3.type)) {
         call.granted = channel;
+        call.grantedWords = wordsOf(found, message);
     }
 }
 
@@ -104,13 +115,21 @@ void learnTimes(Life& life, const Message& message) {
 }
 
 std::optional<CauseGiven> causeOf(const Message& message) {
-    const auto cause = isdn::cause(message.layer3.elements.find(element::cause));
+    const Element found = message.layer3.elements.find(element::cause);
+    const auto cause = isdn::cause(found);
     if (!cause)
         return std::nullopt;
-    return CauseGiven{message.number,        message.layer3.type,
-                      message.from(),        message.senderRole(),
-                      cause->codingStandard, cause->location,
-                      cause->value,          {cause->diagnostics.begin(), cause->diagnostics.end()}};
+    CauseGiven given;
+    given.frame = message.number;
+    given.message = message.layer3.type;
+    given.from = message.from();
+    given.role = message.senderRole();
+    given.codingStandard = cause->codingStandard;
+    given.location = cause->location;
+    given.value = cause->value;
+    given.diagnostics.assign(cause->diagnostics.begin(), cause->diagnostics.end());
+    isdn::appendWords(given.words, found, message.variant, message.sender());
+    return given;
 }
 
 // N(R) of the message covers the frame that began the clearing (modulo 128).
@@ -247,10 +266,11 @@ void conclude(Life& life, EndedBy by, const Moment& end) {
         call.outcome = Outcome::open;
     else if (call.broadcast && !call.firstResponse)
         call.outcome = Outcome::noAnswer;
-    else if (call.clearingSeen && byOrigin && !call.beforeTrace)
-        call.outcome = Outcome::abandoned;
     else
         call.outcome = call.cause ? outcomeOf(*call.cause) : Outcome::other;
+    // A caller that gives a reason ("no answer" as a timer ran out) has not simply hung up.
+    if (call.outcome == Outcome::other && byOrigin && call.clearingSeen && !call.beforeTrace)
+        call.outcome = Outcome::abandoned;
 }
 
 }  // namespace calls

@@ -8,12 +8,18 @@
 #include "isdn/Layer2.h"
 #include "isdn/Layer3.h"
 #include "isdn/Variant.h"
+#include "isdn/words.h"
 
 namespace calls {
 
 // Which end of the link: ours, whose frames count as transmitted, or the other one.
 enum class Side : std::uint8_t { us, peer };
 constexpr Side other(Side side) { return side == Side::us ? Side::peer : Side::us; }
+
+constexpr capture::Role opposite(capture::Role role) {
+    using enum capture::Role;
+    return role == user ? network : role == network ? user : unknown;
+}
 
 inline constexpr std::int64_t millisecond = 1'000'000;
 inline constexpr std::int64_t second = 1'000 * millisecond;
@@ -33,10 +39,12 @@ struct Message {
 
     Side from() const { return frame->transmitted ? Side::us : Side::peer; }
     // Of the side that sent it.
-    capture::Role senderRole() const {
-        if (role == capture::Role::unknown || from() == Side::us)
-            return role;
-        return role == capture::Role::user ? capture::Role::network : capture::Role::user;
+    capture::Role senderRole() const { return from() == Side::us ? role : opposite(role); }
+    isdn::Sender sender() const {
+        const capture::Role sends = senderRole();
+        return sends == capture::Role::user      ? isdn::Sender::user
+               : sends == capture::Role::network ? isdn::Sender::network
+                                                 : isdn::Sender::unknown;
     }
 };
 

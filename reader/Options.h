@@ -3,9 +3,12 @@
 #define READER_OPTIONS_H
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <vector>
 
+#include "calls/Finding.h"
+#include "calls/Timers.h"
 #include "capture/Frame.h"
 #include "reader/Chatter.h"
 #include "reader/TimeText.h"
@@ -54,6 +57,20 @@ struct RecordOptions {
     unsigned files = 0;        // how many files are kept; 0: all
 };
 
+enum class CallForm { text, csv, jsonLines };
+
+// For the commands about calls.
+struct CallOptions {
+    calls::Timers timers;
+    std::vector<std::vector<std::string>> groups;  // names of D channels that share their calls
+    CallForm form = CallForm::text;
+    std::string sort;  // empty: in the order of their end
+    bool failed = false;
+    bool unanswered = false;
+    calls::Severity least = calls::Severity::note;         // milder findings are not shown
+    std::optional<calls::Severity> failOn = std::nullopt;  // exit status 3 for such a finding or a worse one
+};
+
 struct Options {
     std::vector<std::string> words;  // files, or the hexadecimal digits that `explain` takes
     InputOptions input;
@@ -65,6 +82,7 @@ struct Options {
     ExplainAs explainAs = ExplainAs::guess;
     std::string form;  // the form to convert to, or to record in
     RecordOptions record;
+    CallOptions calls;
 };
 
 }  // namespace reader

@@ -121,7 +121,7 @@ class Run {
                 wanted = std::min<std::uint64_t>(wanted, left_);
                 left_ -= wanted;
             }
-            if (wanted > 0)
+            if (wanted > 0 || consumer_.wantsAll())
                 consumer_.take(*chunk, wanted);
             free_.push_back(std::move(chunk));
             if (work_.first != 0 && left_ == 0)

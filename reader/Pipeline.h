@@ -31,6 +31,8 @@ class Consumer {
     virtual ~Consumer() = default;
     // Of the chunk's pieces the first `count` are wanted.
     virtual void take(Chunk& chunk, std::size_t count) = 0;
+    // Whether chunks are handed over in which nothing has passed the filters.
+    virtual bool wantsAll() const { return false; }
     // Nothing more is there just now, or the input has ended: what was taken goes out.
     virtual void flush() = 0;
 };

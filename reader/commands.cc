@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <array>
 
+#include "reader/calls.h"
+#include "reader/check.h"
 #include "reader/convert.h"
 #include "reader/decode.h"
 #include "reader/explain.h"
@@ -52,6 +54,22 @@ constexpr char recordExamples[] =
       without a log beside them
 )";
 
+constexpr char callsExamples[] = R"(  lapdread calls lapdmon.log
+      a line a call: who called whom, on which channel, how fast, who cleared it and why
+  lapdread calls --failed --sort cause day*.pcapng
+      what failed
+  lapdread calls --csv --number 0301 lapdmon.log > calls.csv
+      calls of one subscriber, for a spreadsheet
+)";
+
+constexpr char checkExamples[] = R"(  lapdread check lapdmon.log
+      what is wrong with the trunk: links, calls, channels
+  lapdread check --level warning --timer T305=4s day.pcapng
+      without notes, on a network that waits 4 s for RELEASE
+  lapdread check --fail-on error --quiet lapdmon.log || mail -s trunk me
+      exit status 3 if there is an error
+)";
+
 const std::array table{
     Command{"list",
             "[FILE...]",
@@ -67,7 +85,19 @@ const std::array table{
             explainExamples,
             {"Octets", explainOptions()},
             runExplain},
-    Command{"convert", "IN [OUT]", "frames in files that other tools read", convertExamples, {"Form", convertOptions()}, runConvert},
+    Command{"calls", "[FILE...]", "a line a call", callsExamples, {"Calls", callsOptions()}, runCalls},
+    Command{"check",
+            "[FILE...]",
+            "what is wrong, and what to look at next",
+            checkExamples,
+            {"Findings", checkOptions()},
+            runCheck},
+    Command{"convert",
+            "IN [OUT]",
+            "frames in files that other tools read",
+            convertExamples,
+            {"Form", convertOptions()},
+            runConvert},
     Command{"record",
             "[FILE...]",
             "files that begin anew by size or time, of what is followed",

@@ -9,20 +9,9 @@ namespace reader {
 
 namespace {
 
-// Quoted if it has to be. What a spreadsheet would take for a formula stays one: numbers like "+49" are data.
 void putText(std::string& to, std::string_view value) {
     to += ',';
-    if (value.find_first_of(",\"\n\r") == std::string_view::npos) {
-        to += value;
-        return;
-    }
-    to += '"';
-    for (const char character : value) {
-        if (character == '"')
-            to += '"';
-        to += character;
-    }
-    to += '"';
+    appendCsvValue(to, value);
 }
 
 template <std::integral Number>
@@ -58,6 +47,20 @@ void putCallReference(std::string& to, const Seen& seen) {
 }
 
 }  // namespace
+
+void appendCsvValue(std::string& to, std::string_view value) {
+    if (value.find_first_of(",\"\n\r") == std::string_view::npos) {
+        to += value;
+        return;
+    }
+    to += '"';
+    for (const char character : value) {
+        if (character == '"')
+            to += '"';
+        to += character;
+    }
+    to += '"';
+}
 
 std::string_view csvHeader() {
     return "n,file,interface,time,seconds,ticks,dir,role,sapi,tei,command,frame,ns,nr,pf,pd,callref,flag,"

@@ -2,6 +2,7 @@
 #ifndef READER_CSV_H
 #define READER_CSV_H
 
+#include <string>
 #include <string_view>
 
 #include "reader/Pipeline.h"
@@ -12,6 +13,11 @@ namespace reader {
 std::string_view csvHeader();
 
 // Only frames have rows; numbers are decimal, "callref" and "hex" hexadecimal.
+// Appends a value, quoted if it has to be. What a spreadsheet would take for a formula stays one: numbers
+// like
+// "+49" are data.
+void appendCsvValue(std::string& to, std::string_view value);
+
 class CsvComposer : public Composer {
   public:
     void compose(const Seen& seen, std::string& text, Piece& piece) override;

@@ -1,0 +1,307 @@
+#include "reader/CallFields.h"
+
+#include <array>
+#include <optional>
+
+#include "calls/causes.h"
+#include "isdn/values.h"
+#include "reader/csv.h"
+#include "reader/json.h"
+#include "reader/text.h"
+
+namespace reader {
+
+namespace {
+
+using calls::Call;
+
+void putMilliseconds(std::string& to, const std::optional<std::int64_t>& nanoseconds) {
+    if (nanoseconds)
+        appendNumber(to, *nanoseconds / 1'000'000);
+}
+
+void putReference(std::string& to, const Call& call) {
+    constexpr std::string_view digits = "0123456789abcdef";
+    const unsigned shown = call.referenceLength > 1 ? 4 : 2;
+    for (unsigned i = shown; i-- > 0;)
+        to += digits[(call.reference >> (4 * i)) & 15U];
+}
+
+// The direction of the call: from the side that began it.
+std::string_view directionOf(const Call& call) {
+    switch (call.originRole) {
+        case capture::Role::user:
+            return "U>N";
+        case capture::Role::network:
+            return "N>U";
+        case capture::Role::unknown:
+            break;
+    }
+    return "?>?";
+}
+
+void putCause(std::string& to, const std::optional<calls::CauseGiven>& cause) {
+    if (cause)
+        appendNumber(to, cause->value);
+}
+
+void putLocation(std::string& to, const Call& call) {
+    if (call.cause)
+        to += isdn::locationName(call.cause->location);
+}
+
+std::string_view originOf(const Call& call) { return call.origin == calls::Side::us ? "us" : "peer"; }
+
+void putInstant(std::string& to, const calls::Moment& moment, TimeText& times) {
+    if (moment.clock != capture::Clock::none)
+        times.append(to, {moment.clock, moment.time});
+}
+
+void putLaterCauses(std::string& to, const Call& call) {
+    bool first = true;
+    for (const calls::CauseGiven& cause : call.laterCauses) {
+        if (!first)
+            to += ' ';
+        first = false;
+        appendNumber(to, cause.value);
+    }
+}
+
+using enum CallField::Kind;
+constexpr std::array fields{
+    CallField{"call", number,
+              [](std::string& to, const Call& call, TimeText&) { appendNumber(to, call.number); }},
+    CallField{"file", text, [](std::string& to, const Call& call, TimeText&) { to += call.file; }},
+    CallField{"dchannel", text, [](std::string& to, const Call& call, TimeText&) { to += call.dChannel; }},
+    CallField{"start", text,
+              [](std::string& to, const Call& call, TimeText& times) { putInstant(to, call.begin, times); }},
+    CallField{"end", text,
+              [](std::string& to, const Call& call, TimeText& times) {
+                  if (call.endedBy != calls::EndedBy::open)
+                      putInstant(to, call.end, times);
+              }},
+    CallField{"tei", number,
+              [](std::string& to, const Call& call, TimeText&) { appendNumber(to, call.tei); }},
+    CallField{"callref", text, [](std::string& to, const Call& call, TimeText&) { putReference(to, call); }},
+    CallField{"origin", text, [](std::string& to, const Call& call, TimeText&) { to += originOf(call); }},
+    CallField{"dir", text, [](std::string& to, const Call& call, TimeText&) { to += directionOf(call); }},
+    CallField{"kind", text, [](std::string& to, const Call& call, TimeText&) { to += nameOf(call.kind); }},
+    CallField{"calling", text,
+              [](std::string& to, const Call& call, TimeText&) { to += call.calling.digits; }},
+    CallField{"called", text, [](std::string& to, const Call& call, TimeText&) { to += call.called.digits; }},
+    CallField{"redirecting", text,
+              [](std::string& to, const Call& call, TimeText&) { to += call.redirecting.digits; }},
+    CallField{"connected", text,
+              [](std::string& to, const Call& call, TimeText&) { to += call.connected.digits; }},
+    CallField{"bearer", text, [](std::string& to, const Call& call, TimeText&) { to += call.bearer; }},
+    CallField{"channel_asked", text,
+              [](std::string& to, const Call& call, TimeText&) { to += call.askedWords; }},
+    CallField{"exclusive", number,
+              [](std::string& to, const Call& call, TimeText&) {
+                  if (call.asked)
+                      to += call.asked->exclusive ? '1' : '0';
+              }},
+    CallField{"channel", text,
+              [](std::string& to, const Call& call, TimeText&) {
+                  to += call.granted ? call.grantedWords : call.askedWords;
+              }},
+    CallField{"first_response_ms", number,
+              [](std::string& to, const Call& call, TimeText&) { putMilliseconds(to, call.firstResponse); }},
+    CallField{"progress_ms", number,
+              [](std::string& to, const Call& call, TimeText&) { putMilliseconds(to, call.progress); }},
+    CallField{"alerting_ms", number,
+              [](std::string& to, const Call& call, TimeText&) { putMilliseconds(to, call.alerting); }},
+    CallField{"connect_ms", number,
+              [](std::string& to, const Call& call, TimeText&) { putMilliseconds(to, call.connect); }},
+    CallField{"duration_ms", number,
+              [](std::string& to, const Call& call, TimeText&) { putMilliseconds(to, call.duration); }},
+    CallField{"outcome", text,
+              [](std::string& to, const Call& call, TimeText&) { to += nameOf(call.outcome); }},
+    CallField{"ended_by", text,
+              [](std::string& to, const Call& call, TimeText&) { to += nameOf(call.endedBy); }},
+    CallField{"cleared_by", text,
+              [](std::string& to, const Call& call, TimeText&) { to += nameOf(call.clearedBy); }},
+    CallField{"cause", number,
+              [](std::string& to, const Call& call, TimeText&) { putCause(to, call.cause); }},
+    CallField{"location", text, [](std::string& to, const Call& call, TimeText&) { putLocation(to, call); }},
+    CallField{"made", text,
+              [](std::string& to, const Call& call, TimeText&) {
+                  if (call.cause)
+                      to += nameOf(madeBy(*call.cause));
+              }},
+    CallField{"cause_before", number,
+              [](std::string& to, const Call& call, TimeText&) { putCause(to, call.causeBefore); }},
+    CallField{"causes", text, [](std::string& to, const Call& call, TimeText&) { putLaterCauses(to, call); }},
+    CallField{"first_frame", number,
+              [](std::string& to, const Call& call, TimeText&) { appendNumber(to, call.begin.frame); }},
+    CallField{"last_frame", number,
+              [](std::string& to, const Call& call, TimeText&) { appendNumber(to, call.end.frame); }},
+    CallField{"flags", text, [](std::string& to, const Call& call, TimeText&) { to += flagsOf(call); }},
+};
+
+// Columns of the line for people: what they are called, how wide, and what stands in them.
+struct LineColumn {
+    std::string_view heading;
+    unsigned width;
+    bool right;
+    void (*put)(std::string& to, const Call& call, TimeText& times);
+};
+
+void putSeconds(std::string& to, const std::optional<std::int64_t>& nanoseconds) {
+    if (nanoseconds)
+        appendSeconds(to, *nanoseconds);
+}
+
+void putParties(std::string& to, const Call& call) {
+    appendSafe(to, call.calling.digits.empty() ? "-" : call.calling.digits);
+    to += " > ";
+    appendSafe(to, call.called.digits.empty() ? "-" : call.called.digits);
+}
+
+void putChannels(std::string& to, const Call& call) {
+    to += call.askedWords.empty() ? "-" : call.askedWords;
+    if (call.granted && call.grantedWords != call.askedWords)
+        to += " > " + call.grantedWords;
+}
+
+// "peer: cause 17 user busy, remote user; then 16".
+void putClearing(std::string& to, const Call& call) {
+    if (call.endedBy == calls::EndedBy::open)
+        return;
+    to += nameOf(call.clearedBy);
+    to += ": ";
+    std::string words =
+        call.cause ? call.cause->words : std::string(call.clearingSeen ? "no cause" : nameOf(call.endedBy));
+    appendSafe(to, words);
+    if (call.causeBefore) {
+        to += "; before: ";
+        appendSafe(to, call.causeBefore->words);
+    }
+    for (const calls::CauseGiven& cause : call.laterCauses) {
+        to += "; then ";
+        appendSafe(to, cause.words);
+    }
+}
+
+constexpr std::array columns{
+    LineColumn{"call", 5, true,
+               [](std::string& to, const Call& call, TimeText&) { appendNumber(to, call.number); }},
+    LineColumn{"start", 29, false,
+               [](std::string& to, const Call& call, TimeText& times) { putInstant(to, call.begin, times); }},
+    LineColumn{"dir", 8, false,
+               [](std::string& to, const Call& call, TimeText&) {
+                   to += call.origin == calls::Side::us ? "TX " : "RX ";
+                   to += directionOf(call);
+               }},
+    LineColumn{"ref", 4, false, [](std::string& to, const Call& call, TimeText&) { putReference(to, call); }},
+    LineColumn{"calling > called", 24, false,
+               [](std::string& to, const Call& call, TimeText&) { putParties(to, call); }},
+    LineColumn{"channel", 9, false,
+               [](std::string& to, const Call& call, TimeText&) { putChannels(to, call); }},
+    LineColumn{"respond", 8, true,
+               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.firstResponse); }},
+    LineColumn{"alert", 8, true,
+               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.alerting); }},
+    LineColumn{"connect", 8, true,
+               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.connect); }},
+    LineColumn{"duration", 9, true,
+               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.duration); }},
+    LineColumn{"outcome", 12, false,
+               [](std::string& to, const Call& call, TimeText&) {
+                   to += call.kind == calls::Kind::signalling ? nameOf(call.kind) : nameOf(call.outcome);
+               }},
+    LineColumn{"cleared by: cause", 0, false,
+               [](std::string& to, const Call& call, TimeText&) { putClearing(to, call); }},
+    LineColumn{"flags", 0, false,
+               [](std::string& to, const Call& call, TimeText&) {
+                   if (const std::string flags = flagsOf(call); !flags.empty())
+                       to += "[" + flags + "]";
+               }},
+};
+
+void trimEnd(std::string& to, std::size_t start) {
+    while (to.size() > start && to.back() == ' ')
+        to.pop_back();
+}
+
+}  // namespace
+
+std::span<const CallField> callFields() { return fields; }
+
+std::string callCsvHeader() {
+    std::string header;
+    for (const CallField& field : fields) {
+        if (!header.empty())
+            header += ',';
+        header += field.key;
+    }
+    return header + "\n";
+}
+
+void appendCallCsv(std::string& to, const Call& call, TimeText& times) {
+    bool first = true;
+    std::string value;
+    for (const CallField& field : fields) {
+        if (!first)
+            to += ',';
+        first = false;
+        value.clear();
+        field.put(value, call, times);
+        appendCsvValue(to, safe(value));
+    }
+    to += '\n';
+}
+
+void appendCallJson(std::string& to, const Call& call, TimeText& times) {
+    to += "{\"v\":";
+    appendNumber(to, jsonVersion);
+    std::string value;
+    for (const CallField& field : fields) {
+        value.clear();
+        field.put(value, call, times);
+        to += ',';
+        appendJsonString(to, field.key);
+        to += ':';
+        if (value.empty())
+            to += "null";
+        else if (field.kind == number)
+            to += value;
+        else
+            appendJsonString(to, value);
+    }
+    to += ",\"frames\":[";
+    for (std::size_t i = 0; i < call.frames.size(); ++i) {
+        if (i != 0)
+            to += ',';
+        appendNumber(to, call.frames[i]);
+    }
+    to += "]}\n";
+}
+
+std::string callHeading() {
+    std::string heading;
+    for (const LineColumn& column : columns) {
+        if (!heading.empty())
+            heading += ' ';
+        const std::size_t start = heading.size();
+        heading += column.heading;
+        padTo(heading, start, column.width, column.right);
+    }
+    return heading;
+}
+
+void appendCallLine(std::string& to, const Call& call, TimeText& times) {
+    const std::size_t lineStart = to.size();
+    bool first = true;
+    for (const LineColumn& column : columns) {
+        if (!first)
+            to += ' ';
+        first = false;
+        const std::size_t start = to.size();
+        column.put(to, call, times);
+        padTo(to, start, column.width, column.right);
+    }
+    trimEnd(to, lineStart);
+}
+
+}  // namespace reader

@@ -1,0 +1,166 @@
+#include "reader/calls.h"
+
+#include <algorithm>
+#include <functional>
+#include <vector>
+
+#include "reader/Analysed.h"
+#include "reader/CallFields.h"
+#include "reader/errors.h"
+#include "reader/forms.h"
+#include "reader/session.h"
+#include "reader/text.h"
+
+namespace reader {
+
+namespace {
+
+// What calls can be put in order by.
+struct SortKey {
+    std::string_view name;
+    std::int64_t (*value)(const calls::Call& call);
+};
+constexpr SortKey sortKeys[] = {
+    {"start", [](const calls::Call& call) { return static_cast<std::int64_t>(call.number); }},
+    {"duration", [](const calls::Call& call) { return -call.duration.value_or(-1); }},
+    {"connect", [](const calls::Call& call) { return -call.connect.value_or(-1); }},
+    {"response", [](const calls::Call& call) { return -call.firstResponse.value_or(-1); }},
+    {"cause",
+     [](const calls::Call& call) { return call.cause ? std::int64_t{call.cause->value} : std::int64_t{0}; }},
+    {"channel",
+     [](const calls::Call& call) {
+         const auto& channel = call.channel();
+         return channel && channel->channels.any()
+                    ? static_cast<std::int64_t>(channel->channels._Find_first())
+                    : std::int64_t{-1};
+     }},
+};
+
+const SortKey& sortKeyNamed(const std::string& name) {
+    const auto* const found = std::find_if(std::begin(sortKeys), std::end(sortKeys),
+                                           [&](const SortKey& key) { return key.name == name; });
+    if (found == std::end(sortKeys))
+        throw UsageError("calls cannot be sorted by " + name +
+                         "; start, duration, connect, response, cause, channel");
+    return *found;
+}
+
+class CallPrinter : public Analysed {
+  public:
+    CallPrinter(const Options& options, Output& out) : Analysed(options), options_(options), out_(out) {
+        if (options.calls.form == CallForm::csv)
+            out_.write(callCsvHeader());
+        else if (options.calls.form == CallForm::text)
+            out_.write(callHeading() + "\n");
+    }
+
+    void flush() override { out_.flush(); }
+
+    // After the end: the calls that were kept to be sorted.
+    void printSorted() {
+        if (options_.calls.sort.empty())
+            return;
+        const SortKey& key = sortKeyNamed(options_.calls.sort);
+        std::stable_sort(kept_.begin(), kept_.end(), [&](const calls::Call& a, const calls::Call& b) {
+            return std::pair(key.value(a), a.number) < std::pair(key.value(b), b.number);
+        });
+        for (const calls::Call& call : kept_)
+            print(call);
+    }
+
+  private:
+    void gone(const calls::Call& call) override {
+        const bool wanted = isWanted(call) && (!options_.calls.failed || hasFailed(call)) &&
+                            (!options_.calls.unanswered || isUnanswered(call));
+        Analysed::gone(call);
+        if (!wanted)
+            return;
+        if (options_.calls.sort.empty())
+            print(call);
+        else
+            kept_.push_back(call);
+    }
+
+    void print(const calls::Call& call) {
+        if (options_.first != 0 && printed_ == options_.first)
+            return;
+        ++printed_;
+        text_.clear();
+        switch (options_.calls.form) {
+            case CallForm::csv:
+                appendCallCsv(text_, call, times_);
+                break;
+            case CallForm::jsonLines:
+                appendCallJson(text_, call, times_);
+                break;
+            case CallForm::text:
+                appendCallLine(text_, call, times_);
+                text_ += '\n';
+                break;
+        }
+        out_.write(text_);
+    }
+
+    const Options& options_;
+    Output& out_;
+    TimeText times_;
+    std::string text_;
+    std::uint64_t printed_ = 0;
+    std::vector<calls::Call> kept_;
+};
+
+}  // namespace
+
+const OptionRow timerOption{"--timer", "NAME=TIME", "Another value of a timer: T305=4s, T316=500ms",
+                            [](Options& to, const std::string& value) {
+                                try {
+                                    calls::setTimer(to.calls.timers, value);
+                                } catch (const calls::BadTimer& error) {
+                                    throw UsageError(error.what());
+                                }
+                            }};
+
+const OptionRow groupOption{
+    "--nfas", "A,B", "D channels that share their calls (non-facility associated signalling)",
+    [](Options& to, const std::string& value) { to.calls.groups.push_back(splitAtCommas(value)); }};
+
+std::span<const OptionRow> callsOptions() {
+    static const OptionRow rows[] = {
+        {"--csv", "", "A row a call, for spreadsheets",
+         [](Options& to, const std::string&) { to.calls.form = CallForm::csv; }},
+        {"--jsonl", "", "A JSON object a call",
+         [](Options& to, const std::string&) { to.calls.form = CallForm::jsonLines; }},
+        {"--failed", "", "Only calls that failed, or ended in an unusual way",
+         [](Options& to, const std::string&) { to.calls.failed = true; }},
+        {"--unanswered", "", "Only calls that nobody answered",
+         [](Options& to, const std::string&) { to.calls.unanswered = true; }},
+        {"--sort", "KEY",
+         "Sort by start, duration, connect, response, cause or channel; without it, calls come in the order "
+         "of "
+         "their end",
+         [](Options& to, const std::string& value) {
+             sortKeyNamed(value);
+             to.calls.sort = value;
+         }},
+        timerOption,
+        groupOption,
+    };
+    return rows;
+}
+
+int runCalls(const Options& options, Chatter& chatter) {
+    Options all = options;
+    all.first = 0;  // it counts calls here
+    Session session(all, chatter);
+    CallPrinter printer(options, session.output());
+    session.run(printer, [] { return std::make_unique<NoComposer>(); });
+    printer.finish();
+    printer.printSorted();
+    printer.flush();
+    if (const std::uint64_t dropped = printer.analysis().dropped(); dropped != 0)
+        chatter.note("calls that were let go before their end, since too many were alive: " +
+                     std::to_string(dropped));
+    return good;
+}
+
+}  // namespace reader

@@ -1,0 +1,23 @@
+// A line a call.
+#ifndef READER_CALLS_H
+#define READER_CALLS_H
+
+#include <span>
+
+#include "reader/OptionRow.h"
+#include "reader/Options.h"
+
+namespace reader {
+
+class Chatter;
+
+std::span<const OptionRow> callsOptions();
+int runCalls(const Options& options, Chatter& chatter);
+
+// Options that every command about calls takes: timers, groups of D channels.
+extern const OptionRow timerOption;
+extern const OptionRow groupOption;
+
+}  // namespace reader
+
+#endif

@@ -1,0 +1,199 @@
+#include "reader/check.h"
+
+#include <array>
+#include <optional>
+
+#include "reader/Analysed.h"
+#include "reader/calls.h"
+#include "reader/errors.h"
+#include "reader/forms.h"
+#include "reader/json.h"
+#include "reader/session.h"
+#include "reader/text.h"
+
+namespace reader {
+
+namespace {
+
+calls::Severity severityNamed(const std::string& name) {
+    using enum calls::Severity;
+    return chosen<calls::Severity>(name, {{"note", note}, {"warning", warning}, {"error", error}});
+}
+
+constexpr std::string_view colorOf(calls::Severity severity) {
+    switch (severity) {
+        case calls::Severity::error:
+            return "\x1b[31m";
+        case calls::Severity::warning:
+            return "\x1b[33m";
+        case calls::Severity::note:
+            break;
+    }
+    return "\x1b[36m";
+}
+constexpr std::string_view colorOff = "\x1b[0m";
+
+class FindingPrinter : public Analysed {
+  public:
+    FindingPrinter(const Options& options, Output& out, bool colors)
+        : Analysed(options), options_(options), out_(out), colors_(colors) {}
+
+    void flush() override { out_.flush(); }
+
+    // How many findings of each severity there were, in words.
+    std::string summary() const {
+        std::string words;
+        for (const calls::Severity severity :
+             {calls::Severity::error, calls::Severity::warning, calls::Severity::note}) {
+            const std::uint64_t count = counts_[static_cast<std::size_t>(severity)];
+            words += (words.empty() ? "" : ", ") + std::to_string(count) + " " +
+                     std::string(nameOf(severity)) + (count == 1 ? "" : "s");
+        }
+        return words;
+    }
+    std::optional<calls::Severity> worst() const { return worst_; }
+
+  private:
+    void found(const calls::Finding& finding) override {
+        if (!isWanted(finding) || finding.severity < options_.calls.least)
+            return;
+        ++counts_[static_cast<std::size_t>(finding.severity)];
+        worst_ = std::max(worst_.value_or(finding.severity), finding.severity);
+        if (options_.first != 0 && printed_ == options_.first)
+            return;
+        ++printed_;
+        text_.clear();
+        if (options_.calls.form == CallForm::jsonLines)
+            putJson(finding);
+        else
+            putText(finding);
+        out_.write(text_);
+    }
+
+    // A line with what happened, and below it what that means and what to look at.
+    void putText(const calls::Finding& finding) {
+        if (colors_)
+            text_ += colorOf(finding.severity);
+        const std::size_t start = text_.size();
+        text_ += nameOf(finding.severity);
+        padTo(text_, start, 7);
+        if (colors_)
+            text_ += colorOff;
+        text_ += ' ';
+        putTime(finding);
+        text_ += " frame ";
+        appendNumber(text_, finding.frame);
+        if (finding.call) {
+            text_ += " call ";
+            appendNumber(text_, *finding.call);
+        }
+        text_ += ' ';
+        text_ += finding.kind->id;
+        text_ += ": ";
+        appendSafe(text_, finding.sentence);
+        if (finding.count > 1) {
+            text_ += " (";
+            appendNumber(text_, finding.count);
+            text_ += " times)";
+        }
+        text_ += "\n        ";
+        text_ += finding.kind->meaning;
+        text_ += "; look at: ";
+        text_ += finding.kind->lookAt;
+        if (!finding.kind->clause.empty()) {
+            text_ += " [";
+            text_ += finding.kind->clause;
+            text_ += ']';
+        }
+        text_ += '\n';
+    }
+
+    void putTime(const calls::Finding& finding) {
+        if (finding.clock == capture::Clock::none)
+            text_ += '-';
+        else
+            times_.append(text_, {finding.clock, finding.time});
+    }
+
+    void putKey(std::string_view key) {
+        text_ += ',';
+        appendJsonString(text_, key);
+        text_ += ':';
+    }
+    void putString(std::string_view key, std::string_view value) {
+        putKey(key);
+        appendJsonString(text_, value);
+    }
+
+    void putJson(const calls::Finding& finding) {
+        text_ += "{\"v\":";
+        appendNumber(text_, jsonVersion);
+        putString("finding", finding.kind->id);
+        putString("severity", nameOf(finding.severity));
+        putKey("time");
+        if (finding.clock == capture::Clock::none) {
+            text_ += "null";
+        } else {
+            std::string time;
+            times_.append(time, {finding.clock, finding.time});
+            appendJsonString(text_, time);
+        }
+        putString("dchannel", finding.dChannel);
+        putKey("frame");
+        appendNumber(text_, finding.frame);
+        putKey("call");
+        if (finding.call)
+            appendNumber(text_, *finding.call);
+        else
+            text_ += "null";
+        putKey("count");
+        appendNumber(text_, finding.count);
+        putString("sentence", finding.sentence);
+        putString("meaning", finding.kind->meaning);
+        putString("look_at", finding.kind->lookAt);
+        putString("clause", finding.kind->clause);
+        text_ += "}\n";
+    }
+
+    const Options& options_;
+    Output& out_;
+    bool colors_;
+    TimeText times_;
+    std::string text_;
+    std::uint64_t printed_ = 0;
+    std::array<std::uint64_t, 3> counts_{};
+    std::optional<calls::Severity> worst_;
+};
+
+}  // namespace
+
+std::span<const OptionRow> checkOptions() {
+    static const OptionRow rows[] = {
+        {"--jsonl", "", "A JSON object a finding",
+         [](Options& to, const std::string&) { to.calls.form = CallForm::jsonLines; }},
+        {"--level", "note|warning|error", "Show findings of this severity and worse ones (default: note)",
+         [](Options& to, const std::string& value) { to.calls.least = severityNamed(value); }},
+        {"--fail-on", "note|warning|error",
+         "Exit status 3 if there is a finding of this severity or a worse one",
+         [](Options& to, const std::string& value) { to.calls.failOn = severityNamed(value); }},
+        timerOption,
+        groupOption,
+    };
+    return rows;
+}
+
+int runCheck(const Options& options, Chatter& chatter) {
+    Options all = options;
+    all.first = 0;  // it counts findings here
+    Session session(all, chatter);
+    Output& out = session.output();
+    FindingPrinter printer(options, out, session.useColors());
+    session.run(printer, [] { return std::make_unique<NoComposer>(); });
+    printer.finish();
+    printer.flush();
+    chatter.note(printer.summary());
+    const CallOptions& calls = options.calls;
+    return calls.failOn && printer.worst() && *printer.worst() >= *calls.failOn ? found : good;
+}
+
+}  // namespace reader
