@@ -90,10 +90,9 @@ Problem fieldsOf(const Layer3& message, Fields& fields);
 
 // "CHANNEL IDENTIFICATION"; empty for an element that no table knows on this variant. In the words of the
 // standard, in capitals.
+std::string_view elementName(const Element& element, Variant variant);
+// The same of an identifier in a message of call control.
 std::string_view elementName(std::uint8_t codeset, std::uint8_t id, Variant variant);
-inline std::string_view elementName(const Element& element, Variant variant) {
-    return elementName(element.codeset, element.id, variant);
-}
 
 }  // namespace isdn
 

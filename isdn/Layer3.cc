@@ -117,7 +117,7 @@ bool parseType(Layer3& message, Octets& rest) {
 
 // What follows the first element of a SEGMENT is a piece of another message, not elements (Q.931 annex H).
 void parseElements(Layer3& message, Octets rest) {
-    message.elements = Elements(rest);
+    message.elements = Elements(rest, 0, isMaintenance(message.discriminator));
     const bool segment =
         message.discriminator == callControl && !message.national && message.type == message::segment;
     if (!segment)
@@ -137,6 +137,7 @@ void Elements::Iterator::take() {
         return;
     const std::uint8_t id = rest_[0];
     element_.id = id;
+    element_.ofService = ofService_;
     element_.codeset = next_;
     next_ = locked_;
     std::size_t size = 1;

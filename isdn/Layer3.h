@@ -36,6 +36,7 @@ struct Element {
     Octets contents;           // what follows the length octet; empty for a single-octet element
     std::uint8_t id = 0;       // the identifier octet as coded
     std::uint8_t codeset = 0;  // 0 to 7
+    bool ofService = false;    // of a SERVICE message, where some identifiers mean another thing
     Problem problem = Problem::none;
 
     // Elements of one octet carry their value in the identifier (Q.931 4.5.1). They exist in every codeset.
@@ -55,7 +56,8 @@ class Elements {
         using difference_type = std::ptrdiff_t;
         using iterator_concept = std::input_iterator_tag;
 
-        explicit Iterator(Octets rest, std::uint8_t codeset) : rest_(rest), locked_(codeset), next_(codeset) {
+        Iterator(Octets rest, std::uint8_t codeset, bool ofService)
+            : rest_(rest), locked_(codeset), next_(codeset), ofService_(ofService) {
             take();
         }
         const Element& operator*() const { return element_; }
@@ -74,12 +76,14 @@ class Elements {
         Octets rest_;
         std::uint8_t locked_;  // the codeset after the last locking shift
         std::uint8_t next_;    // the codeset of the next element
+        bool ofService_;
     };
 
     Elements() = default;
-    explicit Elements(Octets octets, std::uint8_t codeset = 0) : octets_(octets), codeset_(codeset) {}
+    explicit Elements(Octets octets, std::uint8_t codeset = 0, bool ofService = false)
+        : octets_(octets), codeset_(codeset), ofService_(ofService) {}
 
-    Iterator begin() const { return Iterator(octets_, codeset_); }
+    Iterator begin() const { return {octets_, codeset_, ofService_}; }
     std::default_sentinel_t end() const { return {}; }
     Octets octets() const { return octets_; }
 
@@ -89,6 +93,7 @@ class Elements {
   private:
     Octets octets_;
     std::uint8_t codeset_ = 0;
+    bool ofService_ = false;
 };
 
 // A message, of the call control of Q.931 or of maintenance. Of another protocol the discriminator alone is
@@ -119,7 +124,7 @@ inline std::string_view messageName(const Layer3& message) {
                                                 : std::string_view();
 }
 
-// "Q.931 call control", "maintenance", ...; empty for an unknown discriminator.
+// "call control", "maintenance"; empty for an unknown discriminator.
 std::string_view protocolName(std::uint8_t discriminator);
 
 namespace message {

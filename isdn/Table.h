@@ -175,8 +175,13 @@ struct ElementTable {
     Otherwise otherwise = Otherwise::unnamed;
 };
 
-// The table of an element on a variant, or null.
-const ElementTable* elementTable(std::uint8_t codeset, std::uint8_t id, Variant variant);
+// The table of an element on a variant, or null. Elements of SERVICE messages have tables of their own before
+// the others.
+const ElementTable* elementTable(std::uint8_t codeset, std::uint8_t id, Variant variant,
+                                 bool ofService = false);
+inline const ElementTable* elementTable(const Element& element, Variant variant) {
+    return elementTable(element.codeset, element.id, variant, element.ofService);
+}
 
 // Reads octets by a table and appends their fields.
 Problem readRows(const ElementTable& table, Octets octets, Variant variant, Fields& fields);

@@ -96,9 +96,13 @@ Problem unknownContents(Octets contents, Fields& fields) {
 
 }  // namespace
 
-const ElementTable* elementTable(std::uint8_t codeset, std::uint8_t id, Variant variant) {
+const ElementTable* elementTable(std::uint8_t codeset, std::uint8_t id, Variant variant, bool ofService) {
     if ((id & 0xF0U) == tables::shiftTable.id)
         return &tables::shiftTable;
+    for (const ElementTable& table : tables::serviceMessageTables) {
+        if (ofService && table.codeset == codeset && table.id == id)
+            return &table;
+    }
     const std::uint8_t first = tableIndex.first[codeset % codesets][identifierOf(id)];
     for (std::uint8_t number = first; number != 0; number = tableIndex.next[number]) {
         const ElementTable& table = *tableIndex.tables[number];
@@ -113,10 +117,15 @@ std::string_view elementName(std::uint8_t codeset, std::uint8_t id, Variant vari
     return table == nullptr ? std::string_view() : table->name;
 }
 
+std::string_view elementName(const Element& element, Variant variant) {
+    const ElementTable* const table = elementTable(element, variant);
+    return table == nullptr ? std::string_view() : table->name;
+}
+
 Problem fieldsOf(const Element& element, Variant variant, Fields& fields) {
     if (element.octets.empty())
         return Problem::none;
-    const ElementTable* const table = elementTable(element.codeset, element.id, variant);
+    const ElementTable* const table = elementTable(element, variant);
     Problem found = Problem::none;
     if (element.singleOctet()) {
         found = table != nullptr ? readRows(*table, element.octets, variant, fields) : Problem::unknown;

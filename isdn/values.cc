@@ -183,7 +183,7 @@ std::optional<std::uint8_t> restartClass(const Element& element) {
 
 std::optional<ChangeStatus> changeStatus(const Element& element) {
     const bool here = is(element, element::changeStatus) || is(element, element::changeStatus, 6);
-    if (!here || element.contents.empty())
+    if (!here || !element.ofService || element.contents.empty())
         return std::nullopt;
     return ChangeStatus{bitsOf(element.contents[0], 3, 1), bitsOf(element.contents[0], 7, 7) != 0};
 }

@@ -83,7 +83,7 @@ std::string_view callStateName(std::uint8_t value);
 // RESTART INDICATOR (Q.931 4.5.25): 0 the channels that are named, 6 one interface, 7 all interfaces.
 std::optional<std::uint8_t> restartClass(const Element& element);
 
-// CHANGE STATUS of SERVICE: 0 in service, 1 maintenance, 2 out of service.
+// CHANGE STATUS, of codeset 0 or 6 of a SERVICE message: 0 in service, 1 maintenance, 2 out of service.
 struct ChangeStatus {
     std::uint8_t status = 0;
     bool channel = false;  // the preference bit: the status is a channel's

@@ -24,7 +24,7 @@ struct WordingRow {
     std::uint8_t codeset;
     std::uint8_t id;
     Wording words;
-    Variants variants = everywhere;
+    std::string_view name = {};  // of the element, where one identifier has several
 };
 
 std::span<const WordingRow> bearerWordings();  // bearers, compatibility, channels

@@ -37,10 +37,11 @@ namespace {
 
 using namespace wording;
 
-const WordingRow* findWording(const Element& element, Variant variant) {
+const WordingRow* findWording(const Element& element, std::string_view name) {
     for (const auto& rows : {stateWordings(), bearerWordings(), partyWordings()}) {
         for (const WordingRow& row : rows) {
-            if (row.id == element.id && row.codeset == element.codeset && row.variants.has(variant))
+            if (row.id == element.id && row.codeset == element.codeset &&
+                (row.name.empty() || row.name == name))
                 return &row;
         }
     }
@@ -66,7 +67,7 @@ void appendWords(std::string& line, const Element& element, Variant variant, Sen
     if (element.octets.empty() || element.shift())
         return;
     const std::string_view name = elementName(element, variant);
-    const WordingRow* const row = findWording(element, variant);
+    const WordingRow* const row = findWording(element, name);
     if (name.empty())
         addUnknown(line, element);
     else if (row != nullptr)

@@ -44,6 +44,41 @@ void numberWords(std::string& line, const Element& element, const Context&) {
 constexpr char called[] = "called", calling[] = "calling", connected[] = "connected",
                redirecting[] = "redirecting", redirected[] = "redirection", original[] = "originally called";
 
+// "called subaddress 123", of characters, or of octets in hex.
+template <const auto& label>
+void subaddressWords(std::string& line, const Element& element, const Context& context) {
+    Fields fields;
+    fieldsOf(element, context.variant, fields);
+    line.append(label).append(" subaddress");
+    for (const Field& field : fields) {
+        if (field.name != "subaddress")
+            continue;
+        line.push_back(' ');
+        if (field.kind == Field::Kind::text)
+            line.append(field.meaning);
+        else
+            addHex(line, field.at);
+    }
+}
+
+// "network service toll-free 800", "network facility 5".
+void networkFacilityWords(std::string& line, const Element& element, const Context& context) {
+    Fields fields;
+    fieldsOf(element, context.variant, fields);
+    line.append("network");
+    for (const Field& field : fields) {
+        if (field.name == "network")
+            line.append(" ").append(field.meaning).append(",");
+        if (field.name != "service" && field.name != "feature" && field.name != "facility")
+            continue;
+        line.append(" ").append(field.name).append(" ");
+        if (field.meaning.empty())
+            add(line, static_cast<unsigned>(field.value));
+        else
+            line.append(field.meaning);
+    }
+}
+
 void keypadWords(std::string& line, const Element& element, const Context&) {
     line.append("keypad ").append(keypadDigits(element));
 }
@@ -92,6 +127,10 @@ constexpr WordingRow rows[] = {
     {0, element::originalCalledNumber, numberWords<original>},
     {0, element::redirectingNumber, numberWords<redirecting>},
     {0, element::redirectionNumber, numberWords<redirected>},
+    {0, element::calledSubaddress, subaddressWords<called>},
+    {0, element::callingSubaddress, subaddressWords<calling>},
+    {0, element::connectedSubaddress, subaddressWords<connected>},
+    {0, element::networkFacilities, networkFacilityWords},
     {0, element::transitNetwork, transitWords},
     {0, element::userUser, userWords},
     {5, 0x2A, displayWords},

@@ -97,12 +97,14 @@ void restartWords(std::string& line, const Element& element, const Context&) {
         addName(line, tables::restartClasses, *found);
 }
 
-void statusWords(std::string& line, const Element& element, const Context&) {
-    const auto found = changeStatus(element);
-    if (!found)
+void statusWords(std::string& line, const Element& element, const Context& /*context*/) {
+    if (element.contents.empty()) {
+        line.append("status missing");
         return;
-    line.append(found->channel ? "channel " : "");
-    addName(line, tables::serviceStates, found->status);
+    }
+    const std::uint8_t octet3 = element.contents[0];
+    line.append(bitsOf(octet3, 7, 7) != 0 ? "channel " : "status ");
+    addName(line, tables::serviceStates, bitsOf(octet3, 3, 1));
 }
 
 void notificationWords(std::string& line, const Element& element, const Context&) {
@@ -142,7 +144,7 @@ void dateWords(std::string& line, const Element& element, const Context&) {
 // clang-format off
 constexpr WordingRow rows[] = {
     {0, element::segmentedMessage, segmentWords},
-    {0, element::changeStatus, statusWords, tables::withChangeStatus},
+    {0, element::changeStatus, statusWords, "CHANGE STATUS"},
     {0, element::cause, causeWords},
     {0, element::callState, stateWords},
     {0, element::progressIndicator, progressWords},
@@ -150,7 +152,7 @@ constexpr WordingRow rows[] = {
     {0, element::dateTime, dateWords},
     {0, element::signal, signalWords},
     {0, element::restartIndicator, restartWords},
-    {6, element::changeStatus, statusWords, everywhereBut(Variant::ni2)},
+    {6, element::changeStatus, statusWords, "CHANGE STATUS"},
 };
 // clang-format on
 

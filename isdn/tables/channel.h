@@ -76,8 +76,12 @@ inline constexpr ElementTable channelTables[] = {
     {0, 0x03, "BLOCKING CHANNEL IDENTIFICATION", "national", blockingChannelRows},
     {0, element::restartIndicator, "RESTART INDICATOR", "Q.931 4.5.25", restartRows},
     {0, element::changeStatus, "CHANGE STATUS", "national (SERVICE)", changeStatusRows, withChangeStatus},
-    {6, element::changeStatus, "CHANGE STATUS", "national (SERVICE)", changeStatusRows,
-     only(Variant::ess4) | only(Variant::ess5) | only(Variant::dms100)},
+};
+
+// Elements of SERVICE and SERVICE ACKNOWLEDGE alone, on every variant. Switches send them in either codeset.
+inline constexpr ElementTable serviceMessageTables[] = {
+    {0, element::changeStatus, "CHANGE STATUS", "national (SERVICE)", changeStatusRows},
+    {6, element::changeStatus, "CHANGE STATUS", "national (SERVICE)", changeStatusRows},
 };
 
 // clang-format on

@@ -238,7 +238,7 @@ inline constexpr ElementTable serviceTables[] = {
     {5, 0x32, "PARTY CATEGORY", "ISO/IEC 11572", partyCategoryRows},
     {5, 0x75, "REDIRECTING SUBADDRESS", "national", subaddressRows, ni2Alone},
     {5, 0x7B, "CALL APPEARANCE", "national", appearanceRows, ni2Alone},
-    {6, 0x01, "ORIGINATING LINE INFORMATION", "national", lineInformationRows, ni2Alone},
+    {6, 0x01, "ORIGINATING LINE INFORMATION", "national", lineInformationRows, northAmerica},
     {6, 0x37, "GENERIC DIGITS", "national", genericDigitsRows, northAmerica},
 };
 

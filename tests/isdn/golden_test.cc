@@ -33,6 +33,7 @@ struct Case {
     Variant variant = Variant::net5;
     std::uint8_t codeset = 0;
     bool frame = false;
+    bool ofService = false;
 };
 
 void readHeadLine(Case& made, const std::string& line) {
@@ -49,6 +50,7 @@ void readHeadLine(Case& made, const std::string& line) {
     else if (key == "element" || key == "frame")
         made.octets = isdn::testing::hex(rest);
     made.frame = made.frame || key == "frame";
+    made.ofService = made.ofService || key == "service";
 }
 
 std::vector<Case> casesOf(const std::filesystem::path& path) {
@@ -96,7 +98,7 @@ std::string fieldLine(const Field& field) {
 }
 
 std::string elementText(const Case& given) {
-    const Element element = *Elements(given.octets, given.codeset).begin();
+    const Element element = *Elements(given.octets, given.codeset, given.ofService).begin();
     EXPECT_EQ(element.octets.size(), given.octets.size()) << given.head;
     Fields fields;
     const Problem problem = fieldsOf(element, given.variant, fields);
@@ -179,13 +181,14 @@ TEST(Golden, HasACaseForEachTable) {
     for (const auto& path : goldenFiles()) {
         for (const Case& given : casesOf(path)) {
             if (!given.frame)
-                seen.insert(elementTable(given.codeset, given.octets.at(0), given.variant));
+                seen.insert(elementTable(given.codeset, given.octets.at(0), given.variant, given.ofService));
         }
     }
     for (const auto& [name, variant] : variantNames) {
-        for (unsigned key = 0; key < 8U * 256U; ++key) {
-            const auto* const table = elementTable(static_cast<std::uint8_t>(key / 256),
-                                                   static_cast<std::uint8_t>(key % 256), variant);
+        for (unsigned key = 0; key < 2U * 8U * 256U; ++key) {
+            const auto* const table =
+                elementTable(static_cast<std::uint8_t>(key / 256 % 8), static_cast<std::uint8_t>(key % 256),
+                             variant, key >= 2048);
             if (table != nullptr) {
                 EXPECT_TRUE(seen.contains(table)) << table->name << " on " << name;
             }

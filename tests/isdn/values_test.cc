@@ -14,8 +14,8 @@ using isdn::testing::hex;
 
 // An element, and the octets it looks at.
 struct Given {
-    explicit Given(const char* text, std::uint8_t codeset = 0)
-        : octets(hex(text)), element(*Elements(octets, codeset).begin()) {}
+    explicit Given(const char* text, std::uint8_t codeset = 0, bool ofService = false)
+        : octets(hex(text)), element(*Elements(octets, codeset, ofService).begin()) {}
 
     std::vector<std::uint8_t> octets;
     Element element;
@@ -135,11 +135,11 @@ TEST(Values, OfElementsOfOneOctet) {
     EXPECT_EQ(state->codingStandard, 1);
     EXPECT_EQ(state->value, 10);
     EXPECT_EQ(restartClass(Given("79 01 86").element), 6);
-    const auto channel = changeStatus(Given("01 01 c2").element);
+    const auto channel = changeStatus(Given("01 01 c2", 0, true).element);
     ASSERT_TRUE(channel);
     EXPECT_TRUE(channel->channel);
     EXPECT_EQ(channel->status, 2);
-    const auto other = changeStatus(Given("01 01 81", 6).element);
+    const auto other = changeStatus(Given("01 01 81", 6, true).element);
     ASSERT_TRUE(other);
     EXPECT_FALSE(other->channel);
     EXPECT_EQ(other->status, 1);
@@ -212,12 +212,14 @@ TEST(Values, AreThoseOfTheirElementAlone) {
             default:
                 break;
         }
-        EXPECT_EQ(readers(*Elements(octets).begin()), expected) << id;
+        EXPECT_EQ(readers(*Elements(octets, 0, true).begin()), expected) << id;
         EXPECT_EQ(readers(*Elements(octets, 5).begin()), "") << id;
         octets.resize(1);
         EXPECT_EQ(readers(*Elements(octets).begin()), "") << id;
     }
     EXPECT_EQ(readers(Element()), "");
+    EXPECT_EQ(readers(Given("01 01 c2").element), "") << "it is no SERVICE message";
+    EXPECT_EQ(readers(Given("01 01 c2", 6, true).element), "status ");
 }
 
 TEST(Values, NeedTheOctetThatHoldsThem) {

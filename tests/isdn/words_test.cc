@@ -32,7 +32,15 @@ TEST(Words, OfAMessageStandApartByTwoBlanks) {
     const auto octets = hex("08 01 05 05 a1 04 03 80 90 a3 96 18 01 89 9e 01 01 c2");
     std::string line = "SETUP ";
     appendWords(line, parseLayer3(octets), Variant::ess4);
-    EXPECT_EQ(line, "SETUP SENDING COMPLETE  speech  element 6/18 89  channel out of service");
+    EXPECT_EQ(line, "SETUP SENDING COMPLETE  speech  element 6/18 89  ORIGINATING LINE INFORMATION");
+}
+
+// Identifier 01 of codeset 6, in a message of the discriminator 03.
+TEST(Words, OfServiceTellTheNewStatus) {
+    const auto octets = hex("03 02 00 00 0f 18 03 a9 83 81 96 01 01 c2");
+    std::string line;
+    appendWords(line, parseLayer3(octets), Variant::ni2);
+    EXPECT_EQ(line, "channel 1!  channel out of service");
 }
 
 TEST(Words, MarkTheElementThatIsCut) {
