@@ -158,7 +158,7 @@ class Engine {
             wanted = place.count;
         }
         const std::size_t there = std::min(wanted, rest_.size());
-        if (there < wanted && (there != 0 || row.when.presence != When::Presence::optional))
+        if (there < wanted)
             note(Problem::tooShort);
         const Octets taken = rest_.first(there);
         rest_ = rest_.subspan(there);

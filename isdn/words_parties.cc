@@ -66,12 +66,15 @@ void networkFacilityWords(std::string& line, const Element& element, const Conte
     Fields fields;
     fieldsOf(element, context.variant, fields);
     line.append("network");
+    const char* separator = " ";
     for (const Field& field : fields) {
-        if (field.name == "network")
-            line.append(" ").append(field.meaning).append(",");
+        if (field.name == "network") {
+            line.append(" ").append(field.meaning);
+            separator = ", ";
+        }
         if (field.name != "service" && field.name != "feature" && field.name != "facility")
             continue;
-        line.append(" ").append(field.name).append(" ");
+        line.append(separator).append(field.name).append(" ");
         if (field.meaning.empty())
             add(line, static_cast<unsigned>(field.value));
         else
