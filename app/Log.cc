@@ -29,7 +29,8 @@ void Log::write(std::string_view text) {
 
 void Log::framesMissing(unsigned long frames) { block_.addGap(frames); }
 
-// The rest of an entry alone waits until there is more: the file has just refused it.
+// Whether there is text to write. If there is only the rest of an entry, it waits until more text comes,
+// because the file has just refused it.
 bool Log::holdsSomethingNew() const { return !block_.entries().empty() && !block_.holdsOnlyARest(); }
 
 void Log::flush() {
@@ -67,7 +68,7 @@ void Log::complain(int reason) {
 void Log::close() {
     if (!file_.isOpen())
         return;
-    block_.endEntry(std::exchange(writesOfFrame_, 0) != 0);  // a frame whose writes do not come any more
+    block_.endEntry(std::exchange(writesOfFrame_, 0) != 0);  // the announced writes of a frame may be missing
     if (!block_.entries().empty())
         writeOut();
     if (block_.holdsOnlyARest() && block_.entries().front().isFrame)

@@ -1,5 +1,5 @@
-// The log file. Text comes as entries, the block of a frame or some lines of the head each, and reaches the
-// file in whole entries: what is in the file can be read, whatever becomes of a write.
+// The log. It takes text in entries: an entry is the text of a frame, or some lines of the head. The file
+// holds only whole entries, whatever happens to a write.
 #ifndef APP_LOG_H
 #define APP_LOG_H
 
@@ -13,42 +13,45 @@
 
 namespace app {
 
-// A write that fails is reported on the standard error stream, the first one of a run. What it did not bring
-// into the file is dropped, its frames are counted, and later text is tried again; then a line in the log
-// says how many frames are missing there. Not locked: whoever writes holds off the others.
+// The first write that fails in a run is reported on the standard error stream. Entries that could not be
+// written are dropped, and their frames are counted. Later text is tried again; a line in the log then says
+// how many frames are missing there.
+//
+// The class has no lock. Callers must see to it that only one thread at a time uses it, except for giveUp.
 class Log {
   public:
-    static constexpr std::size_t BlockSize = 4096;            // octets; text is written when so much is held
-    static constexpr std::chrono::milliseconds DueAfter{10};  // of the last write
+    static constexpr std::size_t BlockSize = 4096;            // text is written when so many octets are held
+    static constexpr std::chrono::milliseconds DueAfter{10};  // least time between writes of flushIfDue
 
     Log() = default;
     Log(const Log&) = delete;
     Log& operator=(const Log&) = delete;
     ~Log();
 
-    // Opens the file as LogFile does: null, with errno, when it cannot be opened, EWOULDBLOCK when another
-    // trace writes to it. The stream is the log's own and writes nothing itself.
+    // Opens the file as LogFile::open does. Returns null, with errno set, when it cannot be opened; errno is
+    // EWOULDBLOCK when another trace writes to it. The log owns the stream, which writes nothing itself.
     std::FILE* open(const char* name);
-    // The next entry is a frame, which comes in so many writes.
+    // Announces that the next entry is a frame, which comes in so many calls of write.
     void frameFollows(unsigned int writes = 1) { writesOfFrame_ = writes; }
-    void write(std::string_view text);  // while it is open
-    // Says in the log, behind what was written so far, that this many frames are missing here because they
-    // were lost before they came to the log. The caller counts them: lost() and complete() do not change.
-    // Call it while the log is open, and not between the writes of one frame.
+    void write(std::string_view text);  // call it only while the log is open
+    // Says in the log that this many frames are missing at this place because they were lost before they came
+    // to the log. The caller counts them: lost() and complete() do not change. Call it while the log is open,
+    // and not between the writes of one frame.
     void framesMissing(unsigned long frames);
 
-    // Both write what is held, for the time when no frame waits to be shown. `flushIfDue` does so only when
-    // the last write is longer ago than DueAfter, so that it may be called after each frame; whoever calls it
-    // calls `flush` when nothing has come for a while.
+    // Both write the text that is held; call them when no frame waits to be shown. flushIfDue writes only if
+    // the last write was more than DueAfter ago, so that it may be called after each frame. Its caller must
+    // call flush when nothing has come for a while.
     void flush();
     void flushIfDue();
 
-    // Writes what is held. After a write that failed, says how many frames are missing. Nothing the second
-    // time.
+    // Writes the text that is held and closes the file. If frames are missing, reports on the standard error
+    // stream how many. A second call does nothing.
     void close();
 
-    // From here on nothing waits until the file takes more; a write that waits returns. What the file does
-    // not take at once is lost and counted. From any thread, and from a signal handler.
+    // From now on no write waits until the file takes more text, and a write that waits returns. Text that
+    // the file does not take at once is lost, and its frames are counted. Any thread and a signal handler may
+    // call it.
     void giveUp() { file_.giveUp(); }
 
     // False once a write has failed.
@@ -63,14 +66,14 @@ class Log {
     std::string name_;
     LogFile file_;
     LogBlock block_;
-    unsigned int writesOfFrame_ = 0;  // still to come
+    unsigned int writesOfFrame_ = 0;  // writes of the announced frame that are still to come
     std::chrono::steady_clock::time_point lastWrite_;
     bool complete_ = true;
     unsigned long lost_ = 0;
     unsigned long gap_ = 0;  // frames missing since the last text that was written
 };
 
-// There for the whole process.
+// The log of the trace. The object exists as long as the process.
 extern Log traceLog;
 
 }  // namespace app

@@ -52,7 +52,7 @@ void LogBlock::keepRest(std::size_t begin, std::size_t end, bool isFrame) {
 }
 
 LogLoss repair(const LogFile& file, LogBlock& block, std::size_t written, bool behindGap) {
-    // 1. Behind a gap, what is in the file of the block goes, if the file can be shortened.
+    // 1. After a gap, remove from the file what was written of the block, if the file can be shortened.
     if (behindGap && file.takeBack(written))
         written = 0;
 
@@ -62,11 +62,12 @@ LogLoss repair(const LogFile& file, LogBlock& block, std::size_t written, bool b
                                   [written](const LogEntry& entry) { return written < entry.end; });
     const std::size_t begin = cut == entries.begin() ? 0 : std::prev(cut)->end;
 
-    // 3. Remove what is in the file of that entry. Where that cannot be done, its rest will be written first.
+    // 3. Remove from the file what was written of that entry. If that is not possible, its rest is written
+    // first later.
     const bool nothingOfIt = !cut->isBegun && (written == begin || file.takeBack(written - begin));
     const auto firstLost = nothingOfIt ? cut : std::next(cut);
 
-    // 4. Everything behind is lost.
+    // 4. All entries after it are lost.
     LogLoss loss;
     for (auto lost = firstLost; lost != entries.end(); ++lost) {
         loss.frames += lost->isFrame ? 1 : 0;

@@ -55,7 +55,7 @@ std::FILE* LogFile::open(const char* name) {
     return stream_;
 }
 
-// False, with errno, when the file belongs to somebody else or cannot be emptied.
+// Returns false, with errno set, when another process has locked the file or it cannot be emptied.
 bool LogFile::lockAndEmpty(const char* name) const {
     const int file = fileno(stream_);
     if (!isRegular(file))
@@ -86,7 +86,7 @@ std::size_t LogFile::append(std::string_view text) const {
     return written;
 }
 
-// False, with errno, when nobody waits any more.
+// Waits until the file takes text. Returns false, with errno set, when giveUp was called or waiting fails.
 bool LogFile::awaitRoom() const {
     std::array<pollfd, 2> waited{pollfd{fileno(stream_), POLLOUT, 0}, pollfd{wakeUp_, POLLIN, 0}};
     if (!givenUp_)

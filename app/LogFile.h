@@ -1,4 +1,4 @@
-// The file that the log is written to: opened, locked, appended to, shortened. Nothing is held back here.
+// The file of the log: opens, locks, appends, shortens. It keeps no text back.
 #ifndef APP_LOGFILE_H
 #define APP_LOGFILE_H
 
@@ -9,8 +9,8 @@
 
 namespace app {
 
-// May be a regular file, a FIFO or a device. One thread at a time uses it; giveUp alone may come from any
-// thread, and from a signal handler.
+// The file may be a regular file, a FIFO or a device. Only one thread at a time may use the object, except
+// for giveUp, which any thread and a signal handler may call.
 class LogFile {
   public:
     LogFile() = default;
@@ -18,24 +18,25 @@ class LogFile {
     LogFile& operator=(const LogFile&) = delete;
     ~LogFile();
 
-    // Creates the file, or locks the one that exists and only then empties it. Waits for the reader of a
-    // FIFO. FIFOs and devices are not locked; a file system that cannot lock is reported on the standard
-    // error stream, and the file is used unlocked. Null, with errno, when the file cannot be opened:
-    // EWOULDBLOCK when another process has locked it. The stream belongs to the LogFile and writes nothing
+    // Creates the file, or locks the existing file and then empties it. Waits until a FIFO has a reader. Does
+    // not lock FIFOs and devices. If the file system cannot lock, reports that on the standard error stream
+    // and uses the file without a lock. Returns null, with errno set, when the file cannot be opened; errno
+    // is EWOULDBLOCK when another process has locked it. The LogFile owns the stream, which writes nothing
     // itself.
     std::FILE* open(const char* name);
     bool isOpen() const { return stream_ != nullptr; }
 
-    // Waits for as long as the file takes nothing. Returns how many octets were written: fewer than there
-    // are, with errno, when a write failed; ECANCELED after giveUp, when the file takes nothing at the
-    // moment.
+    // Writes the text, and waits as long as the file takes nothing. Returns how many octets were written.
+    // They are fewer, with errno set, when a write has failed; errno is ECANCELED when the file takes nothing
+    // at the moment and giveUp was called.
     std::size_t append(std::string_view text) const;
-    // Removes the octets that were written last. False where that cannot be done, as in a FIFO.
+    // Removes so many octets from the end of the file. Returns false when that is not possible, for example
+    // in a FIFO.
     bool takeBack(std::size_t octets) const;
-    // False, with errno, when the system reports that something was not written after all.
+    // Returns false, with errno set, when the system reports that something was not written after all.
     bool close();
 
-    // From here on append waits no more, and the one that waits returns.
+    // From now on append does not wait, and an append that waits returns.
     void giveUp();
 
   private:
@@ -43,7 +44,7 @@ class LogFile {
     bool awaitRoom() const;
 
     std::FILE* stream_ = nullptr;
-    std::atomic<int> wakeUp_ = -1;  // an eventfd
+    std::atomic<int> wakeUp_ = -1;  // an eventfd that wakes append
     std::atomic<bool> givenUp_ = false;
 };
 

@@ -27,7 +27,7 @@ using Clock = std::chrono::steady_clock;
 using std::chrono::milliseconds;
 
 constexpr int ForEver = -1;
-// A pipe that can be written to takes so many octets at once, so that the write does not block.
+// A pipe that is ready for writing takes this many octets without blocking.
 constexpr std::size_t LargestWrite = PIPE_BUF;
 
 unsigned long linesIn(std::string_view text) {
@@ -54,22 +54,22 @@ bool mayWorkLater(ssize_t written) { return written < 0 && (errno == EAGAIN || e
 
 struct Text {
     std::string text;
-    unsigned long lines;   // that are missing when it is not written
+    unsigned long lines;   // how many lines are missing if it is not written
     unsigned long number;  // its place among the texts of all streams
 };
 
 struct Stream {
     int descriptor;
     std::deque<Text> waiting = {};
-    std::size_t octets = 0;     // of the texts that wait
-    std::size_t written = 0;    // of them, of the first text
-    bool isFull = false;        // takes no text until all that waits is written
-    unsigned long dropped = 0;  // lines that no notice has told of yet
+    std::size_t octets = 0;     // size of the texts that wait
+    std::size_t written = 0;    // octets of the first text that are written already
+    bool isFull = false;        // takes no text until all texts that wait are written
+    unsigned long dropped = 0;  // lines that are missing and of which no notice has told yet
 };
 
 }  // namespace
 
-// All but awaitWritten is guarded by `lock`, which is not held during a write of the thread's.
+// All functions but awaitWritten take `lock`. The thread does not hold it while it writes.
 class StreamWriter::State {
   public:
     State(const std::vector<int>& descriptors, std::size_t bound)
@@ -104,12 +104,12 @@ class StreamWriter::State {
     const std::size_t bound_;
     const int wakeUp_ = eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK);
     std::vector<Stream> streams_;
-    std::vector<pollfd> polled_;  // the thread's own: wakeUp_, then each stream
+    std::vector<pollfd> polled_;  // used by the thread only: wakeUp_, then each stream
     unsigned long next_ = 0;
-    std::atomic<std::size_t> waiting_ = 0;    // texts
-    std::optional<Clock::time_point> limit_;  // once the end has begun
-    std::atomic<bool> ended_ = false;         // whoever has a text writes it
-    bool left_ = false;                       // the thread has
+    std::atomic<std::size_t> waiting_ = 0;    // number of texts that wait
+    std::optional<Clock::time_point> limit_;  // set when the end begins
+    std::atomic<bool> ended_ = false;         // from now on the thread that has a text writes it
+    bool left_ = false;                       // the thread has ended
     std::condition_variable leaves_;
 };
 
@@ -126,7 +126,7 @@ void StreamWriter::State::take(std::size_t stream, std::string_view text) {
             addNotice(to);
             return add(to, std::string(text), linesIn(text));
         }
-    } catch (const std::bad_alloc&) {  // as if there were no room
+    } catch (const std::bad_alloc&) {  // no memory counts as no room
     }
     to.dropped += linesIn(text);
 }
@@ -170,7 +170,8 @@ void StreamWriter::State::run() {
     leaves_.notify_all();
 }
 
-// Of the streams that have room, the one whose text came first; null when the time is over or there is news.
+// Waits for a stream that takes text. Returns, of the streams that do, the one whose text came first; null
+// when the time is over or the state has changed.
 Stream* StreamWriter::State::awaitRoom(std::unique_lock<std::mutex>& held) {
     polled_[0] = {wakeUp_, POLLIN, 0};
     for (std::size_t i = 0; i < streams_.size(); ++i)
@@ -193,7 +194,7 @@ Stream* StreamWriter::State::awaitRoom(std::unique_lock<std::mutex>& held) {
 }
 
 void StreamWriter::State::writeFirst(Stream& stream, std::unique_lock<std::mutex>& held) {
-    const Text& first = stream.waiting.front();  // stays there: only this thread removes texts
+    const Text& first = stream.waiting.front();  // stays valid, because only this thread removes texts
     const std::string_view rest = std::string_view(first.text).substr(stream.written);
     held.unlock();
     const ssize_t written = writeSomeOf(stream.descriptor, rest);
@@ -207,7 +208,7 @@ void StreamWriter::State::writeFirst(Stream& stream, std::unique_lock<std::mutex
         removeFirst(stream);
 }
 
-// Under the lock, and no longer than the limit of the end allows.
+// Writes text on the calling thread, under the lock, and not longer than the limit of the end allows.
 void StreamWriter::State::writeHere(int descriptor, std::string_view text) {
     while (!text.empty()) {
         pollfd room{descriptor, POLLOUT, 0};

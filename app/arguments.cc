@@ -23,7 +23,7 @@ void readNumber(const char* text, int& setting) {
         setting = static_cast<int>(std::clamp<long>(value, INT_MIN, INT_MAX));
 }
 
-// The first word of the text; a text without one leaves the name as it is.
+// Sets the name of the log to the first word of the text. If there is no word, leaves the name unchanged.
 void readFileName(std::string_view text) {
     text.remove_prefix(std::min(text.find_first_not_of(Blanks), text.size()));
     const std::string_view name = text.substr(0, text.find_first_of(Blanks));
@@ -68,8 +68,8 @@ bool readArgs(int argc, char** argv) {
                 readNumber(word + 2, INST_NUM);
                 break;
             case 'f':
-                // The name starts one character past the letter: in "-f name" that is the next word, which
-                // then ends the options unless it looks like one; "-fxname" passes over the x.
+                // The name begins one character after the letter. In "-f name" that is the next word, which
+                // ends the options unless it begins with "-". In "-fxname" the x is skipped.
                 if (word[2] != '\0')
                     readFileName(word + 3);
                 else if (i + 1 < argc)

@@ -1,4 +1,4 @@
-// What every run starts with, on the screen and in the log.
+// The title lines, which every run writes to the screen and to the log.
 #ifndef APP_BANNER_H
 #define APP_BANNER_H
 

@@ -1,4 +1,4 @@
-// One trace from start to stop.
+// Runs one trace, from start to stop.
 #ifndef APP_LAPDMON_H
 #define APP_LAPDMON_H
 
@@ -8,15 +8,15 @@
 
 namespace app {
 
-// The CCS instance of the traced D channel, from when the board reports its frames until quit.
+// The CCS instance of the traced D channel. It is set while the board reports frames, and quit() destroys it.
 extern std::unique_ptr<vela::CCS> ccs;
 
 // Runs a trace until the operator ends it; returns the process's exit status.
 int runTrace(int argc, char** argv);
 
-// The orderly shutdown of a trace that is on, else nothing. Run by runTrace, and at process exit for whoever
-// leaves another way. Never throws: what fails is reported, and the next step goes on, so that the log is
-// always closed.
+// Shuts a running trace down in order; does nothing if there is none. runTrace calls it, and the process's
+// exit does if it is left another way. It never throws: a step that fails is reported, and the next one goes
+// on, so that the log is always closed.
 void quit();
 
 }  // namespace app

@@ -20,7 +20,7 @@ constexpr std::array Signals{SIGINT, SIGTERM, SIGHUP};
 constexpr int PauseMs = 10000;
 constexpr int ForEver = -1;
 
-// The pipe that ends the wait: the waiter's end, the handler's end.
+// The pipe that ends the wait: the end that awaitQuit reads, and the end that the signal handler writes.
 std::array<int, 2> signalled{-1, -1};
 
 std::atomic<bool> lost = false;
@@ -30,7 +30,7 @@ std::atomic<State> state = State::Tracing;
 std::atomic<bool> hurried = false;
 static_assert(std::atomic<State>::is_always_lock_free, "a signal handler uses it");
 
-// True when the state was `from`.
+// Changes the state from `from` to `to`. Returns false when it was another one.
 bool moveOn(State from, State to) { return state.compare_exchange_strong(from, to); }
 
 void wakeWaiter() {
@@ -38,8 +38,8 @@ void wakeWaiter() {
     static_cast<void>(!write(signalled[1], &mark, 1));
 }
 
-// True when a signal came or the board was lost; otherwise the time is over or, if it is watched, the input
-// can be read.
+// Waits until a signal comes or the board is lost, until the input can be read, or until the time is over.
+// Returns true in the first two cases. With input -1 it does not watch the input.
 bool awaitSignal(int timeoutMs, int input) {
     std::array<pollfd, 2> waited{pollfd{signalled[0], POLLIN, 0}, pollfd{input, POLLIN, 0}};
     while (poll(waited.data(), waited.size(), timeoutMs) < 0 && errno == EINTR) {
@@ -53,14 +53,14 @@ void exit_handle(int signal) {
     const int saved = errno;
     if (moveOn(State::Tracing, State::ShuttingDown)) {
         wakeWaiter();
-    } else if (signal == SIGHUP) {  // the shutdown runs already
+    } else if (signal == SIGHUP) {  // the shutdown runs already, and this signal must not end it
     } else if (moveOn(State::WritingOut, State::ShuttingDown)) {
         hurried = true;
         traceLog.giveUp();
     } else {
         awaitStandardStreams();
         static_cast<void>(std::signal(signal, SIG_DFL));
-        static_cast<void>(raise(signal));  // takes effect as the handler returns
+        static_cast<void>(raise(signal));  // takes effect when the handler returns
     }
     errno = saved;
 }
@@ -75,7 +75,7 @@ bool shutdownHurried() { return hurried; }
 
 void watchSignals() {
     if (pipe2(signalled.data(), O_CLOEXEC | O_NONBLOCK) != 0)
-        return;  // without it the signals keep their default: they end the process
+        return;  // the signals keep their default and end the process
     struct sigaction action = {};
     action.sa_handler = exit_handle;
     action.sa_flags = SA_RESTART;
@@ -94,7 +94,7 @@ void boardLost() {
 
 namespace {
 
-// Until an octet is a "q", or the pipe is written to.
+// Waits until a "q" is read or the pipe is written to.
 void awaitEnd() {
     constexpr int NoInput = -1;
     int input = STDIN_FILENO;

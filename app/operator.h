@@ -1,10 +1,10 @@
-// What ends a trace: the operator's "q", a signal, or a board that is lost.
+// Waits for what ends a trace: the operator's "q", a signal, or the loss of the board.
 #ifndef APP_OPERATOR_H
 #define APP_OPERATOR_H
 
 namespace app {
 
-// From here on a signal does what the trace's state calls for:
+// Installs the signal handler. From now on a signal has an effect that depends on the state of the trace:
 //
 //                                SIGINT, SIGTERM                     SIGHUP
 //     the trace runs             ends the trace (awaitQuit returns)  ends the trace
@@ -12,15 +12,15 @@ namespace app {
 //     the shutdown writes out    gives up writing                    nothing
 //     and has given that up      ends the process as signals do      nothing
 //
-// A terminal that closes sends SIGHUP twice, which must not end the shutdown. A SIGHUP that was ignored from
-// the start, under nohup, stays ignored. Without a pipe to wake awaitQuit, all three keep what they did
-// before.
+// A terminal that closes sends SIGHUP twice, and that must not end the shutdown. A SIGHUP that was ignored
+// when the program started, as nohup does, stays ignored. If the pipe that wakes awaitQuit cannot be made,
+// the signals keep their old effect.
 void watchSignals();
 
-// The shutdown runs from here on, also when no signal began it.
+// Call it when the shutdown begins, whatever has caused it.
 void shutdownBegins();
 
-// While one lives, the shutdown writes out what waits.
+// While an object of this class exists, the shutdown writes the records that wait.
 class WritingOut {
   public:
     WritingOut();
@@ -29,17 +29,18 @@ class WritingOut {
     WritingOut& operator=(const WritingOut&) = delete;
 };
 
-// True once a signal has given up writing: the log takes only what its file has room for, and what still
-// waits for it is to be counted and dropped. From any thread.
+// True once a signal has given up that writing. The log then takes only text for which its file has room at
+// once, and records that still wait must be counted and dropped. Any thread may call it.
 bool shutdownHurried();
 
 enum class Ending { Asked, BoardLost };
 
-// Returns once "q" was read from standard input, a signal came, or boardLost was called. Any other character
-// is followed by a pause of 10 seconds before the next is read; at the end of input only the others are left.
+// Waits until "q" is read from the standard input, a signal comes, or boardLost is called. After any other
+// character it does not read for 10 seconds. After the end of the input only a signal or boardLost ends the
+// wait.
 Ending awaitQuit();
 
-// The board cannot be reached any more. From any thread, once watchSignals has returned.
+// Call it when the board cannot be reached any more. Any thread may call it after watchSignals has returned.
 void boardLost();
 
 // The signal handler.

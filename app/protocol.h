@@ -1,4 +1,4 @@
-// The protocol types a trunk can report, and the switch variant that each is decoded as.
+// The protocol types that a trunk can report, and the switch variant by which each is decoded.
 #ifndef APP_PROTOCOL_H
 #define APP_PROTOCOL_H
 
@@ -13,7 +13,7 @@ struct Protocol {
     std::string_view logLine;
 };
 
-// Null for a type that nobody knows how to decode.
+// Returns null for a type that cannot be decoded.
 const Protocol* protocolOf(unsigned int type);
 
 }  // namespace app

@@ -25,12 +25,12 @@ namespace {
 
 constexpr std::chrono::seconds Patience{1};
 
-// What a C++ stream writes, handed to the writer in texts. Each thread has a text of its own.
+// The buffer of a C++ stream, which hands the text to the StreamWriter. Each thread has a text of its own.
 class TextBuffer : public std::streambuf {
   public:
     TextBuffer(StreamWriter& writer, std::size_t stream) : writer_(writer), stream_(stream) {}
 
-    // Around a fork.
+    // Held around a fork.
     std::mutex lock;
 
   protected:
@@ -81,7 +81,7 @@ struct StandardStreams {
     TextBuffer err{writer, 1};
 };
 
-// Lives as long as the process: the streams are used to its very end.
+// Never deleted: the streams are used until the process ends.
 StandardStreams* streams = nullptr;
 
 void beforeFork() {
@@ -112,7 +112,7 @@ void beforeAbort(int) { awaitStandardStreams(); }
 void openStandardStreams() {
     for (const int each : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
         if (fcntl(each, F_GETFD) < 0)
-            static_cast<void>(open("/dev/null", O_RDWR));  // the lowest number that is free: this one
+            static_cast<void>(open("/dev/null", O_RDWR));  // open() takes the lowest free number: `each`
     }
 }
 
@@ -125,11 +125,11 @@ void decoupleStandardStreams() try {
     streams = std::make_unique<StandardStreams>().release();
     std::cout.rdbuf(&streams->out);
     std::cerr.rdbuf(&streams->err);
-    std::cerr << std::nounitbuf;  // a line of several pieces is one text
+    std::cerr << std::nounitbuf;  // so that a line that is written in several pieces is one text
     static_cast<void>(std::atexit(endStandardStreams));
     static_cast<void>(std::signal(SIGABRT, beforeAbort));
     pthread_atfork(beforeFork, afterForkInParent, afterForkInChild);
-} catch (const std::system_error&) {  // no thread
+} catch (const std::system_error&) {  // the system has refused the thread
 }
 
 void awaitStandardStreams() {

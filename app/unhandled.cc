@@ -44,7 +44,7 @@ std::string whatIsWrong() {
         text << ": " << exception;
     } catch (const std::exception& exception) {
         text << ": " << exception.what();
-    } catch (...) {  // the type says it
+    } catch (...) {  // the name of its type is reported
     }
     return text.str();
 }
@@ -54,7 +54,7 @@ std::string place() {
                              : "in lapdmon(" + std::to_string(guardedPlace) + ")";
 }
 
-// A log that another thread is stuck in stays as it is.
+// Closes the log, unless another thread holds it for too long.
 void closeInTime() {
     if (!queueGuard.tryLock(PatienceMs, PollMs))
         return;
@@ -63,7 +63,7 @@ void closeInTime() {
     queueGuard.unlock();
 }
 
-// Given back for the last words: that there is no memory may be what ends the process.
+// Memory that is freed before the last report, because the process may end for want of memory.
 constexpr std::size_t ReserveSize = 65536;
 std::atomic<char*> reserve = nullptr;
 
@@ -80,7 +80,7 @@ void sayWhatAndWhere() {
     std::unique_ptr<char[]>(reserve.exchange(nullptr)).reset();
     try {
         closeInTime();
-    } catch (...) {  // the words matter all the same
+    } catch (...) {  // the report is more important
     }
     endStandardStreams();  // from here on words need no memory and no other thread
     sayWhatAndWhere();

@@ -19,7 +19,7 @@ import make_captures  # noqa: E402
 
 LIMIT = 120  # seconds
 PAGES = ROOT / "docs" / "user"
-BLOCK = re.compile(r"<!-- log: (\S+)(?: (\S+))? -->\n\n((?:    .*\n)+)")
+BLOCK = re.compile(r"<!-- log: (\S+)(?: (\S+))? -->\n\n((?:    .*\n|\n(?=    ))+)")
 FUNCTION = re.compile(r"^    (frames\(\) \{\n(?:    .*\n)+?    \}\n)", re.M)
 
 # The last frame is one that is reported on the screen: then all others are decoded.
@@ -38,6 +38,11 @@ def session(shown):
     """A block's commands, each with the output shown below it."""
     parts = re.split(r"^\$ (.*)\n", shown, flags=re.M)[1:]
     return list(zip(parts[::2], parts[1::2]))
+
+
+def without_trailing_blanks(text):
+    """Pages have no blanks at the end of lines, although the log has."""
+    return re.sub(r"[ \t]+$", "", text, flags=re.M)
 
 
 class Commands(unittest.TestCase):
@@ -77,7 +82,7 @@ class Commands(unittest.TestCase):
             self.make_log(name, protocol)
             for command, output in session(text):
                 with self.subTest(page=page, log=name, command=command):
-                    self.assertEqual(self.run_command(command), output)
+                    self.assertEqual(without_trailing_blanks(self.run_command(command)), output)
 
 
 if __name__ == "__main__":
