@@ -1,7 +1,6 @@
 #include "capture/pcapng.h"
 
 #include <algorithm>
-#include <limits>
 #include <optional>
 #include <utility>
 #include <vector>
@@ -10,6 +9,8 @@
 #include "capture/notes.h"
 #include "capture/octets.h"
 #include "capture/pcapng_blocks.h"
+#include "capture/pcapng_framing.h"
+#include "capture/pcapng_interface.h"
 
 namespace capture {
 
@@ -17,20 +18,7 @@ namespace {
 
 using namespace pcapng;
 
-constexpr std::size_t longestBlock = std::size_t{1} << 24;  // more is no block but damage
-constexpr std::size_t mostInterfaces = 4096;                // of one section
-constexpr std::int64_t perSecond = 1'000'000'000;
-
-// An interface of the section.
-struct Described {
-    const Interface* interface;
-    std::optional<Link> link;  // none: not LAPD
-    Resolution resolution;
-    std::int64_t offset = 0;  // seconds
-    std::uint32_t snapLength = 0;
-    std::uint64_t dropped = 0;  // said so far
-    bool isRelative = false;
-};
+constexpr std::size_t mostInterfaces = 4096;  // of one section
 
 struct Packet {
     std::string_view octets;  // those in the block
@@ -43,13 +31,13 @@ class PcapngParser final : public Parser {
   public:
     explicit PcapngParser(const Context& context)
         : source_(context.source),
+          blocks_(context.source),
           options_(context.options),
           interfaces_(context.interfaces),
           unnamed_(context.unnamed) {}
 
     Reader::Next next(Item& item) override {
         while (shown_ == items_.size()) {
-            source_.consume(std::exchange(toConsume_, 0));
             items_.clear();
             shown_ = 0;
             if (const Reader::Next read = readBlock(); read != Reader::Next::item)
@@ -68,91 +56,54 @@ class PcapngParser final : public Parser {
 
     // Item when it was read, which may have brought items or not.
     Reader::Next readBlock();
-    Reader::Next endWith(std::string text);
-    bool readOrder(std::string_view held);
     void readBody(std::uint32_t type);
     void describeInterface();
     void readStamped(bool isOld);
     void readSimple();
     void readStatistics();
-    void readPacket(Described& on, const Packet& packet, std::string_view optionOctets);
-    void setFrame(Item& item, Described& on, const Packet& packet, std::optional<bool> told);
+    void readPacket(DescribedInterface& on, const Packet& packet, std::string_view optionOctets);
+    void setFrame(Item& item, DescribedInterface& on, const Packet& packet, std::optional<bool> told);
     std::string_view packetOctets(std::size_t at, std::size_t captured) const;
-    Described* interfaceAt(std::size_t index);
+    DescribedInterface* interfaceAt(std::size_t index);
     Item& add(Item::Kind kind, const Interface* interface);
     void say(Item::Kind kind, std::string text);
-    std::uint64_t addNote(const Note& note, const Described& on);
-    void addDropped(Described& on, std::uint64_t count, std::uint64_t accounted);
+    std::uint64_t addNote(const Note& note, const DescribedInterface& on);
+    void addDropped(DescribedInterface& on, std::uint64_t count, std::uint64_t accounted);
 
     Source& source_;
+    Framing blocks_;
     const ReadOptions& options_;
     Interfaces& interfaces_;
     const Interface* unnamed_;
     Order order_ = Order::little;
-    std::vector<Described> section_;
-    std::string_view body_;    // of the block being read, in the source's window
+    std::vector<DescribedInterface> section_;
+    std::string_view body_;    // of the block being read
     std::vector<Item> items_;  // of the block read last
     std::size_t shown_ = 0;
     std::string text_;
     std::uint64_t packets_ = 0;
-    std::size_t toConsume_ = 0;
     bool foundLapd_ = false;
-    bool isOver_ = false;
     std::string strangeLink_;
 };
 
 Reader::Next PcapngParser::readBlock() {
-    if (isOver_)
-        return Reader::Next::end;
-    constexpr std::size_t beginning = 8;
-    const bool mayBeSection = source_.held().size() >= 4 && source_.held().substr(0, 4) == "\n\r\r\n";
-    const Source::State header = source_.want(mayBeSection ? beginning + 4 : beginning);
-    if (header == Source::State::pause)
-        return Reader::Next::pause;
-    const std::string_view held = source_.held();
-    if (header == Source::State::end && held.empty()) {
-        if (!foundLapd_ && !strangeLink_.empty() && !source_.replaced())
-            throw BadInput(source_.name() + ": " + strangeLink_);
-        return Reader::Next::end;
+    switch (blocks_.next()) {
+        case Framing::Next::pause:
+            return Reader::Next::pause;
+        case Framing::Next::end:
+            if (!foundLapd_ && !strangeLink_.empty() && !source_.replaced())
+                throw BadInput(source_.name() + ": " + strangeLink_);
+            return Reader::Next::end;
+        case Framing::Next::damaged:
+            say(Item::Kind::damaged, blocks_.damage());
+            break;
+        case Framing::Next::block:
+            body_ = blocks_.body();
+            order_ = blocks_.order();
+            readBody(blocks_.type());
+            break;
     }
-    if (header == Source::State::end)
-        return endWith("truncated dump file: it ends within a block's header");
-    std::uint32_t type = numberAt<std::uint32_t>(held, 0, order_);
-    if (type == sectionHeader) {
-        if (held.size() < beginning + 4)
-            return Reader::Next::item;  // now with what tells the order
-        if (!readOrder(held))
-            return endWith("bad section header: no order of octets; nothing is read from here on");
-    }
-    const std::size_t size = numberAt<std::uint32_t>(held, 4, order_);
-    if (size < blockOverhead || size > longestBlock || size % 4 != 0)
-        return endWith("bad block of " + std::to_string(size) + " octets; nothing is read from here on");
-    const Source::State block = source_.want(size);
-    if (block == Source::State::pause)
-        return Reader::Next::pause;
-    if (block == Source::State::end)
-        return endWith("truncated dump file: it ends within a block");
-    body_ = source_.held().substr(beginning, size - blockOverhead);
-    toConsume_ = size;
-    readBody(type);
     return Reader::Next::item;
-}
-
-Reader::Next PcapngParser::endWith(std::string text) {
-    isOver_ = true;
-    if (!source_.replaced() || !source_.held().empty())
-        say(Item::Kind::damaged, std::move(text));
-    return Reader::Next::item;
-}
-
-bool PcapngParser::readOrder(std::string_view held) {
-    for (const Order order : {Order::little, Order::big}) {
-        if (numberAt<std::uint32_t>(held, 8, order) == orderMagic) {
-            order_ = order;
-            return true;
-        }
-    }
-    return false;
 }
 
 void PcapngParser::readBody(std::uint32_t type) {
@@ -181,45 +132,23 @@ void PcapngParser::readBody(std::uint32_t type) {
 }
 
 void PcapngParser::describeInterface() {
-    constexpr std::size_t fields = 8;
-    if (body_.size() < fields || section_.size() == mostInterfaces) {
+    if (body_.size() < DescribedInterface::fields || section_.size() == mostInterfaces) {
         say(Item::Kind::damaged, "bad interface description; it is passed over");
         return;
     }
-    const std::uint32_t type = field<std::uint16_t>(0);
-    Described described{};
-    described.snapLength = field<std::uint32_t>(4);
-    Interface told = *unnamed_;
-    std::size_t checkSequence = 0;
-    Options options(body_.substr(fields), order_);
-    std::uint16_t code = 0;
-    for (std::string_view value; options.next(code, value);) {
-        if (code == interfaceName && options_.trunk.empty() && !value.empty())
-            told.name = value;
-        else if (code == interfaceText && told.variant == Variant::unknown)
-            told.variant = variantIn(value);
-        else if (code == timeResolution && !value.empty())
-            described.resolution = Resolution::of(value[0]);
-        else if (code == timeOffset && value.size() == 8)
-            described.offset = static_cast<std::int64_t>(numberAt<std::uint64_t>(value, 0, order_));
-        else if (code == checkSequenceSize && !value.empty())
-            checkSequence = static_cast<unsigned char>(value[0]) / 8U;
-        else if (code == comment && value == relativeTimes)
-            described.isRelative = true;
-    }
-    if (const std::string complaint = complaintAbout(type); complaint.empty()) {
-        described.link.emplace(type, checkSequence);
+    DescribedInterface described(body_, order_);
+    if (const std::string complaint = complaintAbout(described.linkType()); complaint.empty()) {
         foundLapd_ = true;
     } else {
         strangeLink_ = complaint;
         say(Item::Kind::damaged,
             "packets of interface " + std::to_string(section_.size()) + " are passed over: " + complaint);
     }
-    described.interface = interfaces_.of(told);
+    described.interface = interfaces_.of(described.named(*unnamed_, options_));
     section_.push_back(std::move(described));
 }
 
-Described* PcapngParser::interfaceAt(std::size_t index) {
+DescribedInterface* PcapngParser::interfaceAt(std::size_t index) {
     if (index < section_.size())
         return &section_[index];
     say(Item::Kind::damaged,
@@ -240,7 +169,7 @@ void PcapngParser::readStamped(bool isOld) {
         say(Item::Kind::damaged, "bad packet block; it is passed over");
         return;
     }
-    Described* const on = interfaceAt(isOld ? field<std::uint16_t>(0) : field<std::uint32_t>(0));
+    DescribedInterface* const on = interfaceAt(isOld ? field<std::uint16_t>(0) : field<std::uint32_t>(0));
     if (on == nullptr || !on->link)
         return;
     constexpr std::uint16_t unknownDrops = 0xffff;
@@ -260,16 +189,16 @@ void PcapngParser::readSimple() {
         say(Item::Kind::damaged, "bad packet block; it is passed over");
         return;
     }
-    Described* const on = interfaceAt(0);
+    DescribedInterface* const on = interfaceAt(0);
     if (on == nullptr || !on->link)
         return;
     const std::uint32_t original = field<std::uint32_t>(0);
-    const std::uint32_t captured = on->snapLength == 0 ? original : std::min(original, on->snapLength);
+    const std::uint32_t captured = on->snapLength() == 0 ? original : std::min(original, on->snapLength());
     readPacket(*on, {packetOctets(fields, captured), original, std::nullopt, 0}, {});
 }
 
 // What stands in comments comes before the frame.
-void PcapngParser::readPacket(Described& on, const Packet& packet, std::string_view optionOctets) {
+void PcapngParser::readPacket(DescribedInterface& on, const Packet& packet, std::string_view optionOctets) {
     std::optional<bool> told;
     Note ofFrame;
     bool isOversized = false;
@@ -306,12 +235,11 @@ void PcapngParser::readPacket(Described& on, const Packet& packet, std::string_v
     }
 }
 
-void PcapngParser::setFrame(Item& item, Described& on, const Packet& packet, std::optional<bool> told) {
+void PcapngParser::setFrame(Item& item, DescribedInterface& on, const Packet& packet,
+                            std::optional<bool> told) {
     if (packet.units) {
-        constexpr std::int64_t furthest = std::numeric_limits<std::int64_t>::max() / perSecond / 4;
-        item.frame.clock = on.isRelative ? Clock::relative : Clock::absolute;
-        item.frame.time = std::min(on.resolution.nanoseconds(*packet.units), furthest * 2 * perSecond) +
-                          std::clamp(on.offset, -furthest, furthest) * perSecond;
+        item.frame.clock = on.isRelative() ? Clock::relative : Clock::absolute;
+        item.frame.time = on.time(*packet.units);
     }
     const std::size_t captured = packet.octets.size();
     if (!on.link->take(octetsOf(packet.octets), told, item.frame)) {
@@ -331,7 +259,7 @@ void PcapngParser::readStatistics() {
     constexpr std::size_t fields = 12;
     if (body_.size() < fields || field<std::uint32_t>(0) >= section_.size())
         return;
-    Described& on = section_[field<std::uint32_t>(0)];
+    DescribedInterface& on = section_[field<std::uint32_t>(0)];
     std::uint64_t drops = on.dropped;
     std::uint64_t accounted = 0;
     Options options(body_.substr(fields), order_);
@@ -346,7 +274,7 @@ void PcapngParser::readStatistics() {
 }
 
 // Returns how many lost frames the note accounts for.
-std::uint64_t PcapngParser::addNote(const Note& note, const Described& on) {
+std::uint64_t PcapngParser::addNote(const Note& note, const DescribedInterface& on) {
     const bool isRun = note.item.kind == Item::Kind::run;
     Item& item =
         add(note.item.kind, isRun ? interfaces_.of({on.interface->name, note.variant}) : on.interface);
@@ -355,7 +283,7 @@ std::uint64_t PcapngParser::addNote(const Note& note, const Described& on) {
     return item.kind == Item::Kind::lost ? item.count : item.kind == Item::Kind::notQueued ? 1 : 0;
 }
 
-void PcapngParser::addDropped(Described& on, std::uint64_t count, std::uint64_t accounted) {
+void PcapngParser::addDropped(DescribedInterface& on, std::uint64_t count, std::uint64_t accounted) {
     on.dropped += count;
     if (count > accounted)
         add(Item::Kind::dropped, on.interface).count = count - accounted;

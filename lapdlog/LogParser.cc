@@ -242,8 +242,7 @@ Reader::Next LogParser::deliver(Item& item) {
 }
 
 void LogParser::consume(std::size_t octets) {
-    const std::string_view text = source_.held().substr(0, octets);
-    line_ += static_cast<std::uint64_t>(std::count(text.begin(), text.end(), '\n'));
+    line_ += lineEndsIn(source_.held().substr(0, octets));
     source_.consume(octets);
 }
 

@@ -28,6 +28,9 @@ Reading readHeader(std::string_view text, Header& header);
 // Whether `text` begins with these pieces, one behind another; then sets `size` to their size.
 Reading readPieces(std::string_view text, std::initializer_list<std::string_view> pieces, std::size_t& size);
 
+// How many lines end in `text`.
+std::uint64_t lineEndsIn(std::string_view text);
+
 inline constexpr std::size_t dateSize = 24;
 
 }  // namespace lapdlog

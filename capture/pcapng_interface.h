@@ -1,0 +1,48 @@
+// An interface of a pcapng section, as its description says.
+#ifndef CAPTURE_PCAPNG_INTERFACE_H
+#define CAPTURE_PCAPNG_INTERFACE_H
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "capture/Form.h"
+#include "capture/link.h"
+#include "capture/pcapng_blocks.h"
+
+namespace capture::pcapng {
+
+class DescribedInterface {
+  public:
+    static constexpr std::size_t fields = 8;  // octets in front of the options
+
+    // Of a description's body, which has those octets at least.
+    DescribedInterface(std::string_view body, Order order);
+
+    std::uint32_t linkType() const { return linkType_; }
+    std::uint32_t snapLength() const { return snapLength_; }
+    bool isRelative() const { return isRelative_; }
+    // Nanoseconds; times that 64 bits cannot hold are moved within reach.
+    std::int64_t time(std::uint64_t units) const;
+    // What it tells over `unnamed`, and what was chosen over that.
+    Interface named(const Interface& unnamed, const ReadOptions& options) const;
+
+    std::optional<Link> link;  // none: not LAPD
+    const Interface* interface = nullptr;
+    std::uint64_t dropped = 0;  // packets that the capture has said so far
+
+  private:
+    void take(std::uint16_t code, std::string_view value, Order order);
+
+    std::uint32_t linkType_;
+    std::uint32_t snapLength_;
+    Interface told_;
+    Resolution resolution_;
+    std::int64_t offset_ = 0;  // seconds
+    std::size_t checkSequence_ = 0;
+    bool isRelative_ = false;
+};
+
+}  // namespace capture::pcapng
+
+#endif
