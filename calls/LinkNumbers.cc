@@ -58,7 +58,7 @@ void Link::information(const Sample& sample, Marks& marks, std::vector<LinkEvent
     // What the receiver has acknowledged was sent, and is missing in the trace.
     const std::optional<PendingNr>& pending = beyond_[indexOf(other(from))];
     if (pending && recorded.empty() && stream.isFirm() && isAhead(sample.layer2.ns, stream.next()) &&
-        !isAhead(sample.layer2.ns, pending->nr))
+        !isAhead(pending->nr, sample.layer2.ns))
         recorded = "the receiver has acknowledged it";
     const Stream::Taken taken = stream.take(sample, recorded);
     marks.retransmitted = taken.again;
