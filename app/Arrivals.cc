@@ -22,7 +22,8 @@ void Arrivals::gone() {
     resume();
 }
 
-// Its delivery, which is about to end, starts what has waited for the room.
+// Does not call resume(): the record's delivery is about to end, and its end starts those that have waited
+// for the room.
 void Arrivals::refused() {
     ++refused_;
     ++gone_;
@@ -33,7 +34,7 @@ void Arrivals::full() {
         std::cerr << "lapdmon: too many frames wait for the log, the next ones are lost\n" << std::flush;
 }
 
-// What a board sends on after its trace was switched off is nobody's, and no news.
+// Messages that the board sends after its trace was switched off are dropped without a report.
 TracedCcs::~TracedCcs() {
     getMsgQueue()->unregisteredSource(
         [](vela::MsgQueue*, vela::Msg* msg) { const std::unique_ptr<vela::Msg> dropped(msg); });

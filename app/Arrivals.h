@@ -1,5 +1,4 @@
-// Trace records from their arrival to their end: how many of them are on their way at a time, and in which
-// order they are queued.
+// Keeps the trace records in their order, and limits how many are at work at a time.
 #ifndef APP_ARRIVALS_H
 #define APP_ARRIVALS_H
 
@@ -14,12 +13,13 @@
 
 namespace app {
 
-// Records that may be queued; and those that are queued, being shown or being delivered are together no more.
+// How many records the queue holds. Those that are delivered, queued and written at the same time are not
+// more either.
 inline constexpr int QueueCapacity = 100;
 
-// The lane of the trace events. Each is delivered on a thread of its own, and threads overtake one another: a
-// record that comes before its turn is kept until those before it have come. A record counts as at work until
-// it is destroyed, so that the queue has room for each one; the others wait in the lane.
+// The lane of the trace events. Each event is delivered on a thread of its own, and threads overtake one
+// another. So a record whose turn has not come is kept until those before it have come. A record counts as at
+// work until it is destroyed; the others wait in the lane. So the queue always has room for the next record.
 class Arrivals : public vela::Lane {
   public:
     using Record = vela::CCS::EvtL2Trace_t;
@@ -27,8 +27,8 @@ class Arrivals : public vela::Lane {
     Arrivals() : Arrivals(Bounds()) {}
     explicit Arrivals(Bounds bounds);
 
-    // On the delivery's thread, under queueGuard: gives the record to `queue`, in its turn, and then those
-    // that have waited for it. One that no lane has numbered has its turn at once.
+    // Calls queue(record) when it is the record's turn, and then for the records that have waited for this
+    // one. A record without a number has its turn at once. Called on delivery threads, under queueGuard.
     template <typename Queue>
     void takeInTurn(std::unique_ptr<Record> rec, Queue queue) {
         ++taken_;
@@ -42,14 +42,14 @@ class Arrivals : public vela::Lane {
         }
     }
 
-    // A record that was taken is destroyed. Starts deliveries that have waited for its room, and so is called
-    // without queueGuard.
+    // Call it when a record that was taken has been destroyed. It starts deliveries that have waited for the
+    // room, so the caller must not hold queueGuard.
     void gone();
-    // A record found no memory in the queue and is destroyed. Under queueGuard.
+    // Call it when the queue had no memory for a record, which is destroyed. Called under queueGuard.
     void refused();
 
-    // Gives those that wait for their turn to `queue`, when no delivery runs any more: their turn will not
-    // come.
+    // Calls queue(record) for the records that still wait for their turn. Call it when no delivery runs any
+    // more, because then their turn does not come.
     template <typename Queue>
     void releaseEarly(Queue queue) {
         for (std::unique_ptr<Record>& each : early_) {
@@ -58,18 +58,19 @@ class Arrivals : public vela::Lane {
         }
     }
 
-    // Records that are waiting, being delivered, queued or being shown; 0 when all that arrived is written.
+    // How many records wait, are delivered, are queued or are being written; 0 when all that have arrived are
+    // written.
     std::uint64_t unwritten() const { return pending() + alsoAtWork(); }
-    // Those that the system had no thread or no memory for.
+    // How many records were lost because the system had no thread or no memory.
     std::uint64_t lostForWantOfMeans() const { return losses().noMeans + refused_; }
 
   private:
-    // Taken and not destroyed yet.
+    // The records that were taken and are not destroyed yet.
     unsigned int alsoAtWork() const override { return static_cast<unsigned int>(taken_ - gone_); }
     void full() override;
-    void sayLost(std::uint64_t) override {}  // the log says where they are missing
+    void sayLost(std::uint64_t) override {}  // the log itself says where records are missing
 
-    std::array<std::unique_ptr<Record>, QueueCapacity> early_;  // by number
+    std::array<std::unique_ptr<Record>, QueueCapacity> early_;  // records before their turn, by number
     std::uint64_t next_ = 1;                                    // the number whose turn it is
     std::atomic<std::uint64_t> taken_ = 0;
     std::atomic<std::uint64_t> gone_ = 0;
@@ -77,11 +78,11 @@ class Arrivals : public vela::Lane {
     std::atomic<bool> fullSaid_ = false;
 };
 
-// Those of the trace; there for the whole process.
+// The arrivals of the trace. The object exists as long as the process.
 extern std::shared_ptr<Arrivals> arrivals;
 
-// The traced D channel. Its callbacks have to end before it can, so its end is the end of the arrivals: what
-// waits is dropped.
+// The traced D channel. Its callbacks must end before it can be destroyed, so its destructor closes the
+// arrivals and drops the records that wait.
 class TracedCcs : public vela::CCS {
   public:
     using CCS::CCS;

@@ -32,22 +32,23 @@ using Record = vela::CCS::EvtL2Trace_t;
 constexpr unsigned int FrameLabel = 2;
 constexpr unsigned int Transmitted = 1;
 
-// What the reports of foreign exceptions carry.
+// The numbers in the reports of foreign exceptions.
 constexpr int CallbackPlace = 100;
 constexpr int DisplayThreadPlace = 215;
 
 constexpr unsigned int PollMs = 10;
 constexpr int EnoughToShow = QueueCapacity / 2;
 
-// The display thread lets frames gather until the count says that there are enough. At most one is counted
-// each time it does so.
+// True while the display thread waits for records to gather. The callback that makes them enough sets it to
+// false and posts `enough`, once for each such wait.
 std::atomic<bool> gathering = false;
 vela::Semaphore enough(1, 0);
 
-// Under queueGuard.
+// Guarded by queueGuard.
 decoder::LocalTime localTime;
 
-// The announced length; no more than the list holds unless it is too much anyway.
+// The length of the frame: the announced one, but not more than the list holds. A length that makes the frame
+// oversized is kept as it is.
 int frameLength(unsigned int announced, unsigned int held) {
     const int length = std::max(static_cast<int>(announced), 0);
     return length > decoder::maximumFrame ? length : std::min(length, static_cast<int>(held));
@@ -69,14 +70,14 @@ void flushLog() {
     traceLog.flush();
 }
 
-// A cancellation point, but not while what has arrived is to be written out.
+// Ends the display thread if it is cancelled, but not while records that have arrived must still be written.
 void testCancel(vela::Thread::control& ctl) {
     if (!arrivals->isClosed() || arrivals->unwritten() == 0 || shutdownHurried())
         ctl.testCancel();
 }
 
-// Frames that follow one another are shown together: waking this thread for each of them costs more than all
-// the rest of showing it. The first one after a pause is not waited for.
+// Waits for a record. Records that follow one another are written together, because waking this thread for
+// each of them costs more than writing it. The first record after a pause wakes it at once.
 void awaitRecord(vela::Thread::control& ctl) {
     if (sema.tryWait())
         return;
@@ -91,7 +92,7 @@ void awaitRecord(vela::Thread::control& ctl) {
     } while (!sema.tryWait(PollMs, PollMs));
 }
 
-// False when the queue is empty.
+// Writes the next record. Returns false when the queue is empty.
 bool showNext(vela::Thread::control& ctl, vela::staticList<unsigned char>& octets) {
     const std::lock_guard guard(queueGuard);
     testCancel(ctl);
@@ -105,7 +106,7 @@ bool showNext(vela::Thread::control& ctl, vela::staticList<unsigned char>& octet
 
 void displayForEver(vela::Thread::control& ctl) {
     decoder::swit = trunkVariant;
-    vela::staticList<unsigned char> octets;  // reused for every record
+    vela::staticList<unsigned char> octets;  // working memory for all records
     while (true) {
         awaitRecord(ctl);
         if (showNext(ctl, octets))
@@ -113,7 +114,7 @@ void displayForEver(vela::Thread::control& ctl) {
     }
 }
 
-// Takes over rec, whose turn it is. Under queueGuard.
+// Puts rec into the queue, in its turn. Called under queueGuard.
 void queueRecord(std::unique_ptr<Record> rec) {
     if (!event_queue.enqueue(rec.get())) {
         rec.reset();
@@ -122,7 +123,7 @@ void queueRecord(std::unique_ptr<Record> rec) {
         decoder::flushLines();
         return;
     }
-    static_cast<void>(rec.release());  // the queue's entry's now
+    static_cast<void>(rec.release());  // now the thread that dequeues it owns it
     sema.post();
     if (event_queue.queuecount() >= EnoughToShow && gathering.exchange(false))
         enough.post();
@@ -139,7 +140,8 @@ void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
     }
     octets = rec.List.value();
     decoder::msglen = frameLength(rec.Length, octets.length());
-    // A refusal reaches the log before the screen, and so in two parts.
+    // An oversized frame comes to the log in two writes, because its first line is in the log before the
+    // screen shows it.
     traceLog.frameFollows(decoder::msglen > decoder::maximumFrame ? 2 : 1);
     decoder::timeLines(rec.Direction == Transmitted, rec.Timestamp, localTime.of(std::time(nullptr)));
     decoder::RingBuffer frame;

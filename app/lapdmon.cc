@@ -32,7 +32,7 @@ std::unique_ptr<vela::CCS> ccs;
 
 namespace {
 
-// The board's codes.
+// Numbers that the board knows.
 constexpr unsigned char TscType = 0x12;
 constexpr unsigned char TscProcessor = 1;
 constexpr unsigned char CcsType = 0x15;
@@ -42,7 +42,7 @@ constexpr unsigned int L2TraceParm = 10;
 
 constexpr unsigned int QueueDepth = 50;
 constexpr unsigned int PollMs = 10;
-constexpr int MainPlace = 749;  // what main's report of a foreign exception carries
+constexpr int MainPlace = 749;  // the number in main's report of a foreign exception
 
 void openLog() {
     if (!decoder::file_output)
@@ -76,7 +76,7 @@ std::unique_ptr<vela::CCS> openCcs(const vela::Instance& instance) {
     return opened;
 }
 
-// Sets the variant that frames are decoded by; false for a type that nobody knows how to decode.
+// Sets the variant by which frames are decoded. Returns false for a type that cannot be decoded.
 bool setProtocol(unsigned int type) {
     std::cout << "CCS protocol type is " << type << std::endl;
     const Protocol* const protocol = protocolOf(type);
@@ -92,7 +92,8 @@ bool setProtocol(unsigned int type) {
     return true;
 }
 
-// Once the board reports events, the instance is quit's to switch off and to destroy.
+// Switches the trace on. Once the board reports events, quit() switches the trace off and destroys the
+// instance.
 void startTrace(std::unique_ptr<vela::CCS> opened) {
     opened->SetParm(L2TraceParm, 1, nullptr);
     opened->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0,
@@ -105,7 +106,7 @@ void startTrace(std::unique_ptr<vela::CCS> opened) {
     ccs->getMsgQueue()->connectionLost([](vela::MsgQueue*) { boardLost(); });
 }
 
-// The exit status.
+// Waits until the trace is to end. Returns the exit status.
 int untilEnded() {
     if (awaitQuit() == Ending::Asked)
         return EXIT_SUCCESS;
@@ -113,7 +114,7 @@ int untilEnded() {
     return EXIT_FAILURE;
 }
 
-// The exit status.
+// Starts the trace and waits until it is to end. Returns the exit status.
 int trace(int argc, char** argv) {
     vela::MsgQueue::DefaultDepth = QueueDepth;
     parseArgs(argc, argv);
@@ -134,11 +135,11 @@ int trace(int argc, char** argv) {
     return untilEnded();
 }
 
-// Frames that arrived and that the end did not wait for.
+// How many frames arrived and were not written because the shutdown was hurried.
 std::uint64_t givenUp = 0;
 
-// One line on the standard error stream for each reason that frames were lost for. False when there was one.
-// The log says of itself what it could not write.
+// Writes a line to the standard error stream for each reason for which frames were lost. Returns false when
+// there was one. The log itself reports the frames that it could not write.
 bool noneLost() {
     const std::array reasons{
         std::pair{arrivals->lostForWantOfMeans(), "for want of threads or memory"},
@@ -159,7 +160,7 @@ bool noneLost() {
 // Whether every frame is in the log.
 bool isWhole() { return noneLost() && traceLog.complete(); }
 
-// One step of the shutdown, which goes on whatever happens.
+// Runs one step of the shutdown. The next step runs whatever happens in this one.
 template <typename Step>
 void attempt(Step step) {
     try {
@@ -168,8 +169,8 @@ void attempt(Step step) {
     }
 }
 
-// What has arrived is written for as long as the log takes it, unless a signal gives that up: the display
-// thread ends only then.
+// Lets the display thread write every frame that has arrived, as long as the log takes them, and then ends
+// that thread. A signal can end the writing before.
 void writeOut() {
     const WritingOut writingOut;
     arrivals->close();
@@ -177,7 +178,8 @@ void writeOut() {
     Process.join();
 }
 
-// What is left when nobody writes any more is missing at the end of the log, with what was lost last.
+// Counts the frames that are left when nobody writes any more, and says at the end of the log how many are
+// missing, together with those that were lost last.
 void giveUpRest() {
     givenUp = arrivals->discardWaiting();
     while (arrivals->pending() != 0)  // deliveries that have begun end at once
@@ -190,8 +192,8 @@ void giveUpRest() {
 
 }  // namespace
 
-// The board first, so that nothing more arrives; then the log, whole, before anything that a stream or a
-// board can hold up.
+// First the board stops sending, so that nothing more arrives. Then the log is completed and closed, before
+// anything that a stream or the board can delay.
 void quit() {
     if (ccs == nullptr)
         return;
@@ -213,8 +215,8 @@ int runTrace(int argc, char** argv) {
     } catch (...) {  // reported
         status = EXIT_FAILURE;
     }
-    quit();           // now, while the status can still say what became of the log
-    discardQueued();  // of a start that failed
+    quit();           // now, because its outcome decides the exit status
+    discardQueued();  // in case the start has failed
     closeLog();
     return isWhole() ? status : EXIT_FAILURE;
 }

@@ -1,4 +1,5 @@
-// The two lines that begin a frame's text: when it was written down, and when it passed on the board's clock.
+// The two lines with which a frame's text begins: the local time at which it is written, and the board's
+// time.
 #ifndef DECODER_TIME_LINES_H
 #define DECODER_TIME_LINES_H
 
@@ -8,16 +9,17 @@
 
 namespace decoder {
 
-// Composes the empty line and both time lines, and sets `flag` for the lines that follow. `localTime` is a
-// LocalTime's text; the time stamp counts 4 ms. Milliseconds have no leading zeros.
+// Composes the empty line and both time lines, and sets `flag` for the lines that follow. `localTime` is the
+// text of a LocalTime. The time stamp counts 4 ms. Milliseconds are written without leading zeros, on
+// purpose.
 void timeLines(bool transmitted, unsigned int timestamp, std::string_view localTime);
 
-// Seconds since 1970 as local time. Frames of one second share the text, whose making takes as long as the
-// decoding of a frame. Used by one thread at a time.
+// Makes the text of a local time. Frames of the same second share the text, because making it takes as long
+// as decoding a frame. Only one thread at a time may use an object.
 class LocalTime {
   public:
-    // The C library's form of 24 characters and a line end; a line end alone for a year beyond its reach.
-    // Valid until the next call.
+    // `second` counts from 1970. The text has the C library's form of 24 characters, and a line end. It is
+    // only a line end for a year that the C library cannot show. It is valid until the next call.
     std::string_view of(std::time_t second);
 
   private:

@@ -57,10 +57,8 @@ class KSThread {
     void setControl(void* handed) { handedControl_ = handed; }
 
   private:
-    enum Life : unsigned {
-        Abandoned = 1,
-        Ended = 2
-    };  // Ended: the body has ended and nobody has joined it yet
+    // Ended: the body has ended, and no thread has joined it yet.
+    enum Life : unsigned { Abandoned = 1, Ended = 2 };
 
     KSThread(const KSBody& body, unsigned stackSize);
     friend void* KSThread_run(void* thread);

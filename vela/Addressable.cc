@@ -38,7 +38,7 @@ Addressable::~Addressable() {
     queue_->detach();
 }
 
-// A callback that still runs may use the object's dispatcher, which therefore stays until it has ended.
+// Callbacks that still run may use the dispatcher, so it is destroyed only after they have ended.
 void Addressable::endCallbacks() {
     EvtCallback* ending = nullptr;
     {
@@ -58,7 +58,7 @@ void Addressable::MsgQueueAttach(MsgQueue* queue) {
     try {
         if (callback_ != nullptr)
             callback_->moveTo(queue);
-    } catch (...) {  // the object stays where it was
+    } catch (...) {  // the object stays on its old queue
         queue->detach();
         throw;
     }

@@ -1,4 +1,4 @@
-// The base of every board-side object that the host talks to.
+// The base class of every board-side object that the host talks to.
 #ifndef VELA_ADDRESSABLE_H
 #define VELA_ADDRESSABLE_H
 
@@ -21,17 +21,18 @@ class Addressable : public virtualObject {
     static constexpr unsigned int DefaultResponseTimeout = 5000;  // ms
     static constexpr unsigned int DefaultErrorWaitTime = 1000;    // ms
 
-    // How long a command waits, in ms; without a value as long as the object's own time-outs say.
+    // How long a command waits for its reply, in ms. Without a value it waits for the object's own time-out.
     using Wait = std::optional<unsigned int>;
 
-    // The print form of an object at the time something was thrown: the object may be gone when it prints.
+    // A copy of the object's addresses for an exception, because the object may be gone when the exception is
+    // printed.
     struct Identity {
         explicit Identity(const Addressable& object);
         CompDesc_t target;
         CompDesc_t host;
     };
 
-    // No reply within the response time-out.
+    // There was no reply within the response time-out.
     class Timeout : public Exception {
       public:
         Timeout(const Addressable& object, unsigned int cmdMsgType, unsigned int retMsgType,
@@ -47,7 +48,8 @@ class Addressable : public virtualObject {
         unsigned int cmdMsgType_, retMsgType_, trans_, timeoutMs_;
     };
 
-    // Another reply than the expected one, an error body for one. Its copies share the message.
+    // The reply was not the expected one; most often it is an error. Copies of the exception share the
+    // message.
     class UnexpectedMsg : public Exception {
       public:
         UnexpectedMsg(const Addressable& object, unsigned int cmdMsgType, std::shared_ptr<Msg> msg);
@@ -61,7 +63,7 @@ class Addressable : public virtualObject {
         std::shared_ptr<Msg> msg_;
     };
 
-    // No body class for a message type, or for an event group.
+    // There is no body class for a message type; for an event group.
     class UndefinedMsgBody : public Exception {
       public:
         explicit UndefinedMsgBody(unsigned int type)
@@ -81,18 +83,19 @@ class Addressable : public virtualObject {
         unsigned int type_;
     };
 
-    // A null queue gives the object a private one.
+    // If the queue is null, the object makes a private one.
     Addressable(const CompDesc_t& target, MsgQueue* queue);
-    // A copy has the same address, the same queue and the two time-outs as they are now. No callbacks.
+    // A copy has the same address and queue, and the two time-outs as they are now. It has no callbacks.
     Addressable(const Addressable& other);
     explicit Addressable(const Addressable* other) : Addressable(*other) {}
     Addressable& operator=(const Addressable&) = delete;
-    // Waits for callbacks that run. Not from a callback on the dispatching thread.
+    // Waits until the object's callbacks have ended. A callback on the dispatching thread must not destroy
+    // the object.
     ~Addressable() override;
 
-    // Leaves the queue held so far for this one, or for a private one. Registrations move along.
+    // Moves the object and its registrations to this queue, or if it is null, to a private one.
     virtual void MsgQueueAttach(MsgQueue* queue);
-    // A new empty body, which the caller owns. Throw UndefinedMsgBody, UndefinedEvtBody.
+    // Return a new empty body, which the caller owns. Throw UndefinedMsgBody, UndefinedEvtBody.
     virtual MsgBody* MsgBodyLookup(unsigned int msgType);
     virtual MsgBody* EvtBodyLookup(unsigned int evtType);
 
@@ -101,19 +104,22 @@ class Addressable : public virtualObject {
     unsigned int getObjId() const { return objId_; }
     unsigned int getResponseTimeout() const { return responseTimeout_; }
     unsigned int getErrorWaitTime() const { return errorWaitTime_; }
-    // In ms. For this object's requests from now on, and for objects that are copied from it or found through
-    // it afterwards. Those that exist keep theirs.
+    // Set the time-outs in ms: for this object's requests from now on, and for objects that are copied from
+    // it or found through it afterwards. Objects that exist keep theirs.
     virtual void setResponseTimeout(unsigned int ms) { responseTimeout_ = ms; }
     virtual void setErrorWaitTime(unsigned int ms) { errorWaitTime_ = ms; }
 
-    // Sends cmd and reads the reply into ret unless that is null; trans 0 takes a number of its own. Throws
-    // Timeout, UnexpectedMsg, and the transport's KSMsgRef::AllocationError.
+    // Sends cmd, waits for the reply, and reads it into ret unless that is null. If trans is 0, uses a new
+    // transaction number. Throws Timeout, UnexpectedMsg, and KSMsgRef::AllocationError when the transport has
+    // no memory.
     void request(unsigned int msgType, MsgBody* cmd, unsigned int retMsgType, MsgBody* ret,
                  unsigned int trans = 0, int flags = 0);
-    // Sends cmd and lingers for the error wait time: silence is success, any reply is UnexpectedMsg.
+    // Sends cmd, which has no reply, and waits for the error wait time. Throws UnexpectedMsg if any reply
+    // comes.
     void request(unsigned int msgType, MsgBody* cmd, unsigned int trans = 0, int flags = 0);
 
-    // Registrations, by message type and by event group; see EvtCallback.
+    // Register callbacks by message type or by event group, and cancel registrations. EvtCallback.h describes
+    // them.
     void asyncRegisterMsgType(unsigned int type, const Handler& callback, unsigned int threadParam);
     void asyncRegisterEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam,
                                std::shared_ptr<Lane> lane = nullptr);
@@ -124,7 +130,7 @@ class Addressable : public virtualObject {
     void asyncUnregisteredMsgType(const Handler& handler, unsigned int threadParam);
     void asyncUnregisteredEvtGroup(const Handler& handler, unsigned int threadParam);
 
-    // The same with an object and a member function of it, of either form.
+    // The same with an object and its member function, which takes the body or the message.
     template <typename T, typename Member>
     void asyncRegisterMsgType(unsigned int type, T* object, Member member, unsigned int threadParam) {
         asyncRegisterMsgType(type, Handler(object, member), threadParam);
@@ -150,25 +156,26 @@ class Addressable : public virtualObject {
         asyncUnregisteredEvtGroup(Handler(object, member), threadParam);
     }
 
-    // Wait for one message or event, with timeoutMs 0 for ever: read into body unless it is null, or
-    // returned to the caller, who owns it. Throw the waiter's Timeout.
+    // Wait for one message or event, without limit if timeoutMs is 0. It is read into body unless that is
+    // null, or returned to the caller, who owns it. Throw the waiter's Timeout.
     void asyncWaitMsg(unsigned int msgType, MsgBody* body, unsigned int timeoutMs);
     Msg* asyncWaitMsgMsg(unsigned int msgType, unsigned int timeoutMs);
     void asyncWaitEvtGroup(unsigned int group, MsgBody* body, unsigned int timeoutMs);
     Msg* asyncWaitEvtGroupMsg(unsigned int group, unsigned int timeoutMs);
-    // A waiter, already enabled; it must not outlive the object.
+    // Return a waiter that is already enabled. Destroy it before the object.
     std::unique_ptr<EvtCallback::MsgWait> getNewMsgWait(unsigned int msgType);
     std::unique_ptr<EvtCallback::EvtWait> getNewEvtWait(unsigned int group);
 
-    // "{TgtDesc: " address " HostDesc: " address: the closing brace is left to who prints more.
+    // Writes "{TgtDesc: " address " HostDesc: " address, without a closing brace, because exceptions add
+    // more.
     void toStream(std::ostream* out) const override;
 
   protected:
-    // An object at another address, on the queue of the one that leads to it and with its two time-outs as
-    // they are now.
+    // An object at another address, with the queue of `origin` and the time-outs that `origin` has now.
     Addressable(const CompDesc_t& target, const Addressable& origin);
 
-    // A command and the reply that its type names, or without reply. Throw Timeout, UnexpectedMsg.
+    // Send a command and wait for the reply that its type names, or for an error if it has none. Throw
+    // Timeout, UnexpectedMsg.
     template <typename Cmd>
     void command(Cmd&& cmd, typename std::remove_reference_t<Cmd>::Reply* reply, Wait wait) {
         using Type = std::remove_reference_t<Cmd>;
@@ -187,13 +194,13 @@ class Addressable : public virtualObject {
     void endCallbacks();
 
   private:
-    EvtCallback& dispatcher();  // made on first use
+    EvtCallback& dispatcher();  // makes the dispatcher when it is first called
     void requestWithin(unsigned int timeoutMs, unsigned int msgType, MsgBody* cmd, unsigned int retMsgType,
                        MsgBody* ret, unsigned int trans = 0, int flags = 0);
     Msg* exchange(unsigned int msgType, MsgBody* cmd, unsigned int retMsgType, unsigned int timeoutMs,
                   unsigned int trans, int flags);
 
-    MsgQueue* queue_ = nullptr;  // shared, attached while held
+    MsgQueue* queue_ = nullptr;  // shared; this object has attached it
     CompDesc_t target_;
     unsigned int objId_;
     std::unique_ptr<EvtCallback> callback_;

@@ -1,4 +1,4 @@
-// A message body, made of its code and a row of fields; a command also names the body that answers it:
+// A message body is declared by its code and a row of fields. A command also names the body of its reply:
 //
 //     struct ParmVal { U32<"Parm"> Parm; U32<"Val"> Val; };
 //     struct MsgSetParmCmplt_t : Body<9> {};
@@ -7,12 +7,13 @@
 //     MsgSetParm_t own;                 // its own storage; own.Parm = 10;
 //     MsgSetParm_t bound{parm, val};    // reads into and writes from the caller's two variables
 //
-// Where the first fields of a row decide whether the others are there, the row says how many of its fields
-// the message has:
+// If the first fields of a row decide whether the message has the others, the row says how many fields the
+// message has:
 //
 //     struct IEPubData { U8<"IEId"> IEId; ...; std::size_t fieldsPresent() const { return ...; } };
 //
-// A family lists its bodies in a BodyTable, which makes them by code and refuses two of one code.
+// A family lists its bodies in a BodyTable, which makes them by code. Two bodies with the same code do not
+// compile.
 #ifndef VELA_BODY_H
 #define VELA_BODY_H
 
@@ -29,7 +30,7 @@
 
 namespace vela {
 
-// The code of a body that is no message of its own but stands inside one.
+// The code of a body that is only part of another body.
 inline constexpr unsigned int NoCode = 0xFFFFFFFFU;
 
 struct NoFields {};
@@ -41,8 +42,8 @@ class Body : public MsgBody, public Row {
 
     Body() = default;
 
-    // One variable for each field, in order, each of the field's own type. Counts, which follow from their
-    // lists, may be left out together.
+    // Binds the body to variables: one for each field, in order, each of the field's own type. The variables
+    // of all counts may be left out, because counts follow from their lists.
     template <typename... Variables>
     explicit Body(Variables&... variables) requires BindsTo<Row, Variables...> {
         if constexpr (sizeof...(Variables) == n)
@@ -51,11 +52,11 @@ class Body : public MsgBody, public Row {
             bindValues(std::tie(variables...), std::make_index_sequence<n>{});
     }
 
-    // The fields, in order: a tuple of references.
+    // A tuple of references to the fields, in order.
     auto fields() { return fieldsOf(static_cast<Row&>(*this)); }
     auto fields() const { return fieldsOf(static_cast<const Row&>(*this)); }
 
-    // Throws Exception when a list is longer than its count can say.
+    // Throws Exception when a list is longer than its count can express.
     unsigned int writeMsg(Msg* msg, unsigned int offset) override {
         setCounts(std::make_index_sequence<n>{});
         return move<Move::Put>(msg, offset);
@@ -77,7 +78,7 @@ class Body : public MsgBody, public Row {
 
     std::size_t memorySize() const override { return sizeof(*this) + GetByteSize(); }
 
-    // "{", each field's label and value, "}".
+    // Writes "{", the label and value of each field, and "}".
     void toStream(std::ostream* out) const override {
         *out << "{";
         const char* separator = "";
@@ -98,7 +99,8 @@ class Body : public MsgBody, public Row {
     static constexpr std::size_t n = FieldCount<Row>;
     static constexpr bool hasOptionalFields = requires(const Row& row) { row.fieldsPresent(); };
 
-    // Whether the message has the field. For one that is read: once the fields before it have been read.
+    // Whether the message has the field. When a message is read, call it after the fields before that one
+    // have been read.
     bool isPresent(std::size_t field) const {
         if constexpr (hasOptionalFields)
             return field < Row::fieldsPresent();
@@ -135,8 +137,8 @@ class Body : public MsgBody, public Row {
             std::get<i>(fields()).bind(std::get<valuesBefore<Row, i>()>(variables));
     }
 
-    // How many scalars in a row from field i on go into one transport call: the body's first field goes
-    // alone.
+    // How many consecutive numbers, beginning with field i, are moved in one transport call. The first field
+    // of a body is always moved alone.
     template <std::size_t i>
     static constexpr std::size_t runLength() {
         if constexpr (i < n) {
@@ -176,7 +178,7 @@ class Body : public MsgBody, public Row {
         (note(std::get<start + i>(fields()), announced), ...);
     }
 
-    // A message without them was read.
+    // Called when a message was read that does not have these fields.
     template <std::size_t i>
     void emptyListsFrom() {
         if constexpr (i < n) {
@@ -210,7 +212,7 @@ class Body : public MsgBody, public Row {
     }
 };
 
-// A body that is answered by another one.
+// The body of a command, with the body of its reply.
 template <unsigned int messageCode, typename ReplyBody, typename Row = NoFields>
 class Command : public Body<messageCode, Row> {
   public:
@@ -218,18 +220,18 @@ class Command : public Body<messageCode, Row> {
     using Reply = ReplyBody;
 };
 
-// A body of a family by its code.
+// The bodies of a family, by code.
 template <typename... Bodies>
 class BodyTable {
   public:
-    // A new empty body, which the caller owns; null when the code is none of the family's.
+    // Returns a new empty body, which the caller owns; null when no body of the family has the code.
     static MsgBody* make(unsigned int code) {
         MsgBody* made = nullptr;
         static_cast<void>(((code == Bodies::code && (made = std::make_unique<Bodies>().release())) || ...));
         return made;
     }
 
-    // Calls visit.template operator()<Body>() for each of them, in the table's order.
+    // Calls visit.template operator()<Body>() for each body, in the order of the table.
     template <typename Visit>
     static void forEach(Visit visit) {
         (visit.template operator()<Bodies>(), ...);

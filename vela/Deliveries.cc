@@ -27,7 +27,7 @@ Deliveries::OnThisThread::OnThisThread(const Deliveries& all, const void* object
     : all_(all), object_(object), outer_(std::exchange(innermost, this)) {}
 Deliveries::OnThisThread::~OnThisThread() { innermost = outer_; }
 
-// Until no more of them are left than run on this thread itself.
+// Waits until the only deliveries left are those that run on this thread.
 template <typename Count, typename Concerns>
 void Deliveries::awaitNone(Count count, Concerns concerns) {
     std::size_t own = 0;

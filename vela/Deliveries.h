@@ -1,4 +1,4 @@
-// The deliveries of one dispatcher that have not ended, so that what they use can outlive them.
+// Counts the deliveries of one dispatcher that have not ended, so that what they use can be kept until then.
 #ifndef VELA_DELIVERIES_H
 #define VELA_DELIVERIES_H
 
@@ -9,17 +9,18 @@
 
 namespace vela {
 
-// From any thread. Shared by the dispatcher and its deliveries: a callback on a thread of its own may destroy
-// the dispatcher, and its delivery ends after that. One on the dispatching thread may not: the dispatcher
-// goes on there when it returns.
+// Any thread may call any function. The dispatcher and its deliveries share the object, because a callback on
+// a thread of its own may destroy the dispatcher, and its delivery ends after that. A callback on the
+// dispatching thread must not do so: the dispatcher continues there when the callback returns.
 class Deliveries {
   public:
-    // On the dispatching thread, for a callback of the object; null for a plain function. The delivery counts
-    // from now on, also while it waits for a thread.
+    // Counts a delivery from now on, also while it waits for a thread. `object` is the object of its
+    // callback; null for a plain function. Called on the dispatching thread.
     void begin(const void* object);
     void end(const void* object);
 
-    // Names the delivery that runs on this thread, which never waits for itself.
+    // Notes for its lifetime that a delivery runs on this thread. A thread does not wait for its own
+    // delivery.
     class OnThisThread {
       public:
         OnThisThread(const Deliveries& all, const void* object);
@@ -43,7 +44,7 @@ class Deliveries {
 
     std::mutex mutex_;
     std::condition_variable ended_;
-    std::map<const void*, std::size_t> begun_;  // by object; none is 0
+    std::map<const void*, std::size_t> begun_;  // deliveries by object; no entry is 0
     std::size_t all_ = 0;
 };
 

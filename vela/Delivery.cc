@@ -20,7 +20,7 @@ Delivery::~Delivery() { all_->end(handler_.object()); }
 void Delivery::run() {
     try {
         call();
-    } catch (const abi::__forced_unwind&) {  // the callback ends its thread: no error
+    } catch (const abi::__forced_unwind&) {  // the callback ends its thread, which is no error
         throw;
     } catch (const Exception& exception) {
         report(diagnostic(283, "VELA Exception caught from callback handler thread"), exception);
@@ -37,8 +37,8 @@ void Delivery::call() {
         handler_.call(owner_, msg.release());
 }
 
-// The delivery with its place in a lane, its payload, and what the allocator keeps beside each piece: the
-// delivery, the body or handle, and the list or transport message.
+// Adds up the delivery with its place in a lane, the body or message, and what the allocator needs for each
+// block: the delivery, the body or handle, and the list or transport message.
 std::size_t Delivery::octets() const {
     constexpr std::size_t besideEach = 16;
     std::size_t payload = 0;

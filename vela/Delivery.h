@@ -1,4 +1,4 @@
-// One run of one callback: what it is called with, and what must not go before it.
+// A delivery: one event or message on its way to one callback.
 #ifndef VELA_DELIVERY_H
 #define VELA_DELIVERY_H
 
@@ -13,26 +13,28 @@ namespace vela {
 
 class Lane;
 
-// Belongs to one thread at a time: to the dispatching one, then to its lane, then to the thread that runs it.
+// It holds the arguments of the callback, and keeps alive what the callback needs. First the dispatching
+// thread owns it, then its lane, then the thread that runs it.
 class Delivery {
   public:
-    // Counts among `all` from now on.
+    // Registers itself with `all`, until its destructor.
     Delivery(const Handler& handler, Addressable* owner, unsigned int type, std::shared_ptr<Deliveries> all);
     ~Delivery();
     Delivery(const Delivery&) = delete;
     Delivery& operator=(const Delivery&) = delete;
 
-    // Calls the callback, which owns the payload from then on. What escapes from it is reported; the
-    // unwinding of a callback that ends its thread goes on.
+    // Calls the callback and gives it the body or message. Reports an exception that leaves the callback. If
+    // the callback ends its thread, lets the unwinding go on.
     void run();
 
-    // Octets of memory that it takes.
+    // The memory that it takes, in octets.
     std::size_t octets() const;
 
-    // The payload: one of the two, by the handler's form.
+    // One of the two is set, according to the form of the handler.
     std::unique_ptr<MsgBody> body;
     std::unique_ptr<Msg> msg;
-    // Its lane, which it keeps alive, the stack that its thread gets, and how many were lost right before it.
+    // The lane, which the delivery keeps alive; the stack size of the thread; how many deliveries were lost
+    // directly before.
     std::shared_ptr<Lane> lane;
     unsigned int stackSize = 0;
     std::uint64_t missing = 0;

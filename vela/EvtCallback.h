@@ -1,4 +1,5 @@
-// The dispatcher of one Addressable: hands what the object sends unasked to whoever registered for it.
+// The dispatcher of one Addressable. It hands the events and messages that the board-side object sends
+// unasked to the registered callbacks.
 #ifndef VELA_EVTCALLBACK_H
 #define VELA_EVTCALLBACK_H
 
@@ -20,27 +21,28 @@ class EvtCallback : public AsyncMsgReceiver {
     class MsgWait;
     class EvtWait;
 
-    // A thread parameter: run on the dispatching thread, which holds the dispatcher's lock meanwhile and
-    // reads no further message: such a callback must not register, cancel, wait for a reply or destroy the
-    // object. Any other value is the stack size, 0 for the default, of a thread of the delivery's own, which
-    // it gets in its registration's lane.
+    // The thread parameter of a callback that runs on the dispatching thread. That thread holds the
+    // dispatcher's lock meanwhile and reads no further message, so the callback must not register, cancel,
+    // wait for a reply or destroy the object. Any other thread parameter is the stack size, 0 for the
+    // default, of the delivery's own thread, which it gets from the lane of its registration.
     static constexpr unsigned int OnDispatchingThread = 0xFFFFFFFFU;
 
     explicit EvtCallback(Addressable* owner);
-    // As end(). Not from a callback on the dispatching thread, which goes on in the dispatcher afterwards.
+    // Calls end(). A callback on the dispatching thread must not destroy the dispatcher, because that thread
+    // continues in the dispatcher afterwards.
     ~EvtCallback() override { end(); }
 
-    // Receives no more; returns when every delivery has ended, those that wait in their lanes too, but for
-    // one on this thread itself. Those that it waits for may still register and cancel. Reports that wait are
-    // dropped, and the standard error stream says how many.
+    // Stops receiving, and returns when every delivery has ended, also those that wait in their lanes, but
+    // not one that runs on this thread. The callbacks that it waits for may still register and cancel.
+    // Reports that wait are dropped, and the standard error stream says how many.
     void end();
 
-    // From any thread; waits for no callback. The same callback may be registered twice and then runs twice.
-    // Each registration has a lane, by default one of its own with the usual bounds.
+    // Any thread may register; it waits for no callback. A callback that is registered twice runs twice. Each
+    // registration has a lane, by default one of its own with the default bounds.
     void registerMsgType(unsigned int type, const Handler& callback, unsigned int threadParam);
     void registerEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam,
                           std::shared_ptr<Lane> lane = nullptr);
-    // For the next message alone, the one that arrives first: with it the registration ends.
+    // Register for the first message that arrives. The registration ends with that message.
     void registerNextMsg(unsigned int type, const Handler& callback);
     void registerNextEvt(unsigned int group, const Handler& callback);
 
@@ -50,17 +52,17 @@ class EvtCallback : public AsyncMsgReceiver {
     void cancelEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam);
     void cancelEvtGroup(unsigned int group);
 
-    // What becomes of messages and events that nobody registered for; by default they are reported on the
-    // standard error stream and deleted; an empty handler brings that back. Message form only: throw
-    // Exception for a handler that takes a body.
+    // Set the handler for messages and events without a registered callback. By default, and with an empty
+    // handler, they are reported on the standard error stream and deleted. The handler must take the message:
+    // throw Exception for one that takes a body.
     void unregisteredMsgType(const Handler& handler, unsigned int threadParam);
     void unregisteredEvtGroup(const Handler& handler, unsigned int threadParam);
 
     void receive(Msg* msg) override;
 
-    // Gives a message to the handler for what nobody registered for.
+    // Gives a message to the handler for messages without a registered callback.
     void receiveUnregistered(Msg* msg);
-    // Returns when no callback of the object runs any more, but for one on this thread.
+    // Waits until no callback of this object runs any more, except one on this thread.
     void awaitCallbacksOf(const Callback* object) { deliveries_->awaitFor(object); }
 
   private:

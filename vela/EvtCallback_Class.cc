@@ -11,7 +11,7 @@ namespace vela {
 
 namespace {
 
-// The body that the owner knows for the message, else its octets.
+// Gives the message a body: the one that the owner's look-up finds, or its octets.
 template <typename LookUp>
 void giveBody(Msg& msg, LookUp lookUp) {
     try {
@@ -44,7 +44,7 @@ void reportUnregisteredEvtGroup(Addressable* owner, Msg* raw) {
                        "Addressable::asyncUnregisteredEvtGroup");
 }
 
-// A handler for what nobody registered for: the default in place of an empty one.
+// The handler for messages without a registered callback: the default in place of an empty one.
 Handler checked(const Handler& handler, Handler::MsgFunction otherwise) {
     if (handler.takesBody() && !handler.isEmpty())
         throw Exception("what nobody registered for has no body: the handler must take the message");
@@ -164,7 +164,8 @@ void EvtCallback::dispatch(std::unique_ptr<Msg> msg) {
         dispatchTo(*callbacks, key, isEvent, std::move(msg));
 }
 
-// A single callback of message form gets the message itself, several get a copy each.
+// If there is a single callback, and it takes messages, it gets the received message itself. Several
+// callbacks get a copy each.
 void EvtCallback::dispatchTo(linkedList<callbackInfo>& callbacks, unsigned int key, bool isEvent,
                              std::unique_ptr<Msg> msg) {
     const bool single = callbacks.length() == 1;
@@ -191,7 +192,8 @@ void EvtCallback::dispatchUnregistered(std::unique_ptr<Msg> msg) {
     run(handler, std::move(delivery));
 }
 
-// With its payload, but for the received message itself. What cannot be made is lost to its lane.
+// Makes the delivery to one callback, with its body or a copy of the message. If it cannot be made, its lane
+// counts it as lost.
 std::unique_ptr<Delivery> EvtCallback::deliveryOf(const callbackInfo& to, Msg& msg, unsigned int key,
                                                   bool isEvent, bool single) {
     try {

@@ -30,13 +30,14 @@ void Waiter::end() {
     awaited_.reset();
 }
 
-// It came, and whoever waited had given up: it goes the way of one that comes after the first.
+// If a message has arrived after the wait was given up, passes it on as one that comes after the first.
 void Waiter::handOnLateOne() {
     if (Msg* const late = msg_.exchange(nullptr); late != nullptr)
         dispatcher_->receiveUnregistered(late);
 }
 
-// On a delivery thread, with what arrived first, unless it was given up meanwhile.
+// The callback. It runs on a delivery thread with the first message, unless the waiter was disabled
+// meanwhile.
 void Waiter::trigger(Addressable*, Msg* msg) {
     if (State enabled = Enabled; !state_.compare_exchange_strong(enabled, Triggered)) {
         dispatcher_->receiveUnregistered(msg);
@@ -47,8 +48,8 @@ void Waiter::trigger(Addressable*, Msg* msg) {
     unlock();
 }
 
-// The message that came has ended the registration already, and somebody may have cancelled everything for
-// the type, this waiter with it.
+// Ends the registration. It may have ended already: with the message that arrived, or because somebody has
+// cancelled all registrations of the type.
 void Waiter::withdraw() {
     try {
         remove(type_);

@@ -1,7 +1,7 @@
-// One-shot waiters for a message type or an event group.
+// Waiters, each of which waits for one message of a type or one event of a group.
 //
-// A waiter is a mutex used as a signal: taken when the waiter is enabled, released by the delivery that
-// brings what it waits for.
+// A waiter is a mutex that is used as a signal: it is locked when the waiter is enabled, and the delivery
+// that brings the message unlocks it.
 #ifndef VELA_EVTWAIT_H
 #define VELA_EVTWAIT_H
 
@@ -14,7 +14,8 @@
 
 namespace vela {
 
-// What the two kinds of waiter share; they differ in the table they stand in.
+// The base class of the two kinds of waiter. They differ in whether they are registered by message type or by
+// event group.
 class Waiter : public Mutex, public EvtCallback::Callback {
   public:
     class Timeout : public Exception {
@@ -23,7 +24,7 @@ class Waiter : public Mutex, public EvtCallback::Callback {
             : Exception(name), type_(type), timeoutMs_(timeoutMs) {}
         unsigned int type() const { return type_; }
         unsigned int timeoutMs() const { return timeoutMs_; }
-        // The name, " Type: " in hexadecimal, " Timeout: " in milliseconds.
+        // Writes the name, " Type: " in hexadecimal, and " Timeout: " in milliseconds.
         void toStream(std::ostream* out) const override;
 
       private:
@@ -31,17 +32,17 @@ class Waiter : public Mutex, public EvtCallback::Callback {
         unsigned int timeoutMs_;
     };
 
-    // Stands registered for the type or group from now on, for the message that arrives first. One that came
-    // before and that nobody waited for goes to the handler for what nobody registered for; so do those that
-    // come after the first, and one that comes too late for a wait when the waiter goes.
+    // Registers for the first message of the type or group that arrives from now on. These messages go to the
+    // handler for messages without a registered callback: one that arrived before and that nobody waited for;
+    // all after the first one; and the first one, if nobody has waited for it when the waiter is destroyed.
     void enable(unsigned int type);
-    // Registered no more; a callback that is on its way has ended when this returns.
+    // Ends the registration. A callback that is running has ended when this returns.
     void disable();
 
-    // Waits for what was enabled, with timeoutMs 0 for ever, and reads it into body unless that is null.
-    // Throws Timeout; what comes after that can still be waited for.
+    // Waits for the message, without limit if timeoutMs is 0, and reads it into body unless that is null.
+    // Throws Timeout; a message that arrives after that can still be waited for.
     void wait(MsgBody* body, unsigned int timeoutMs);
-    // The same, returning the message, which the caller owns.
+    // The same, but returns the message, which the caller owns.
     Msg* waitMsg(unsigned int timeoutMs);
 
   protected:
@@ -50,9 +51,9 @@ class Waiter : public Mutex, public EvtCallback::Callback {
 
     EvtCallback* dispatcher() const { return dispatcher_; }
     void trigger(Addressable* owner, Msg* msg);
-    // Enables for the type and waits for the message, which stays for a wait that follows. Throws Timeout.
+    // Enables the waiter and waits for the message, which it keeps for the next wait. Throws Timeout.
     void enableAndAwait(unsigned int type, unsigned int timeoutMs);
-    // For the derived destructors: as disable(), and nothing stays.
+    // Called by the destructors of derived classes: disables the waiter and drops the messages that it keeps.
     void end();
 
   private:
@@ -68,8 +69,8 @@ class Waiter : public Mutex, public EvtCallback::Callback {
 
     EvtCallback* dispatcher_;
     unsigned int type_ = 0;
-    std::atomic<Msg*> msg_{nullptr};  // what came, until somebody waits for it
-    std::unique_ptr<Msg> awaited_;    // the waiting thread's, for the wait that follows
+    std::atomic<Msg*> msg_{nullptr};  // the message that arrived, until a wait takes it
+    std::unique_ptr<Msg> awaited_;    // the message that enableAndAwait keeps for the next wait
     std::atomic<State> state_{Idle};
 };
 
@@ -82,7 +83,7 @@ class EvtCallback::MsgWait : public Waiter {
     };
 
     explicit MsgWait(EvtCallback* dispatcher) : Waiter(dispatcher) {}
-    // Enables for the type and waits at once; wait or waitMsg then hand out what came.
+    // Enables the waiter and waits at once. Then wait or waitMsg returns the message. Throws Timeout.
     MsgWait(EvtCallback* dispatcher, unsigned int type, unsigned int timeoutMs);
     ~MsgWait() override { end(); }
 

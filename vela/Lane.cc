@@ -24,7 +24,7 @@ void Lane::add(std::unique_ptr<Delivery> delivery) {
     }
     octets_ += octets;
     waiting_.back().delivery->missing = std::exchange(missing_, 0);
-    // Behind others it is started when one of those that are at work has ended.
+    // If others wait already, it gets its thread when a delivery that is at work ends.
     if (waiting_.size() == 1)
         startWaiting(lock);
 }
@@ -59,9 +59,9 @@ void Lane::number(Delivery& delivery) {
         delivery.body->setArrival({started_, delivery.missing});
 }
 
-// Gives threads to those that wait, as long as there may be more at work. One thread at a time is about it,
-// so that numbers are in the order of arrival and a number whose thread was refused is used again; that one
-// looks again after each thread, and so sees what became possible meanwhile.
+// Gives threads to deliveries that wait, as long as more may be at work. Only one thread at a time does so,
+// so that numbers are in the order of arrival, and the number of a delivery whose thread was refused is used
+// again. After each new thread it looks again, so that it notices what has become possible meanwhile.
 void Lane::startWaiting(Lock& lock) {
     if (starting_)
         return;
@@ -79,7 +79,7 @@ void Lane::startWaiting(Lock& lock) {
             starting_ = false;
             throw;
         }
-        static_cast<void>(next.release());  // the thread's now
+        static_cast<void>(next.release());  // the thread owns it now
         lock.lock();
     }
     starting_ = false;
@@ -92,7 +92,8 @@ std::unique_ptr<Delivery> Lane::takeFirst() {
     return first;
 }
 
-// It is missing before the next one, which gets its number.
+// The system has refused the delivery's thread. The next delivery gets its number, and tells that it is
+// missing.
 void Lane::noThreadFor(const Delivery& delivery) {
     --atWork_;
     --started_;
@@ -100,8 +101,8 @@ void Lane::noThreadFor(const Delivery& delivery) {
     (waiting_.empty() ? missing_ : waiting_.front().delivery->missing) += delivery.missing + 1;
 }
 
-// The same where nobody handles a refusal: it is reported. What waits goes on waiting as long as something is
-// at work, whose end comes here again.
+// Does what startWaiting does, and reports a refusal, because no caller handles it. The deliveries that wait
+// go on waiting while others are at work: this function is called when one of those ends.
 void Lane::startMore(Lock& lock) {
     bool refused = false;
     do {
@@ -123,7 +124,7 @@ void* Lane::runOnThread(Thread::control*, void* arg) {
         std::shared_ptr<Lane> lane;
         ~Finally() { lane->ended(); }
     } finally{delivery->lane};
-    const std::unique_ptr<Delivery> running = std::move(delivery);  // gone before its lane is told
+    const std::unique_ptr<Delivery> running = std::move(delivery);  // destroyed before the lane is told
     running->run();
     return nullptr;
 }
@@ -163,7 +164,7 @@ bool Lane::isClosed() const {
 }
 
 std::uint64_t Lane::discardWaiting() {
-    std::deque<Waiting> gone;  // ends when the lock is free
+    std::deque<Waiting> gone;  // destroyed after the lock has been given back
     const Lock lock(mutex_);
     gone.swap(waiting_);
     octets_ = 0;

@@ -1,4 +1,4 @@
-// The deliveries of one registration on their way to threads of their own.
+// A lane: gives the deliveries of one registration their threads.
 #ifndef VELA_LANE_H
 #define VELA_LANE_H
 
@@ -13,21 +13,22 @@
 
 namespace vela {
 
-// So many deliveries are at work at a time, each on a thread of its own. The others wait in memory, in the
-// order of arrival, and get their threads one by one as those before them end. Whoever dispatches never waits
-// for a callback: a delivery that finds no room to wait is lost, and counted.
+// A limited number of deliveries is at work at a time, each on a thread of its own. The others wait in memory
+// in the order of arrival and get their threads one by one as others end. The dispatching thread never waits
+// for a callback: if there is no room for another delivery to wait, that delivery is lost and counted.
 //
-// Deliveries that run are numbered from 1 on, without gaps, in the order of arrival; the number, and how many
-// were lost right before, stand in the body (MsgBody::arrival).
+// The deliveries that get a thread are numbered from 1 on, without gaps, in the order of arrival. The body of
+// each holds its number and how many deliveries were lost directly before it (MsgBody::arrival).
 //
-// Any thread may call it; its lock is held for a few statements and never while a callback or a stream is
-// waited for. Deliveries share it: it may outlive whoever registered.
+// Any thread may call any function. The lane's lock is held for a few statements, and never while a callback
+// or a stream is waited for. The deliveries share the ownership of the lane, so it may outlive the
+// registration.
 class Lane {
   public:
     struct Bounds {
-        unsigned int atWork = 100;                    // deliveries that have a thread
-        std::size_t waiting = 1000000;                // deliveries that have none yet,
-        std::size_t octets = std::size_t{512} << 20;  // and the memory that they take
+        unsigned int atWork = 100;                    // most deliveries that have a thread
+        std::size_t waiting = 1000000;                // most deliveries that wait for one
+        std::size_t octets = std::size_t{512} << 20;  // most memory that those which wait take
     };
 
     Lane() : Lane(Bounds()) {}
@@ -36,27 +37,28 @@ class Lane {
     Lane& operator=(const Lane&) = delete;
     virtual ~Lane() = default;
 
-    // Takes over a delivery, the next one that arrived. One thread at a time does so. Throws what making a
-    // thread throws: then the delivery that was to have it is lost.
+    // These three are called in the order of arrival, by one thread at a time. add takes a delivery over,
+    // which then gets a thread or waits. Throws when a thread cannot be made; the delivery that was to get
+    // the thread is lost.
     void add(std::unique_ptr<Delivery> delivery);
-    // The next one that arrived runs on this very thread, and never waits.
+    // Runs the delivery on the calling thread at once.
     void runHere(std::unique_ptr<Delivery> delivery);
-    // The next one that arrived could not even be made.
+    // Counts a delivery that could not be made as lost.
     void lose();
 
-    // From now on what is added is dropped without being counted.
+    // From now on deliveries that are added are dropped and not counted.
     void close();
     bool isClosed() const;
-    // Drops what waits; returns how many that were. They are not counted as lost, but what was lost between
-    // them is missing() afterwards.
+    // Drops the deliveries that wait and returns how many there were. They do not count as lost. Those that
+    // were lost between them count in missing() afterwards.
     std::uint64_t discardWaiting();
 
     std::uint64_t waiting() const;
-    // Deliveries that wait or are at work.
+    // How many deliveries wait or are at work.
     std::uint64_t pending() const;
-    // Deliveries that got a thread so far: the number of the latest.
+    // How many deliveries have got a thread so far, which is also the number of the latest.
     std::uint64_t started() const;
-    // Lost after the last one that waits or has started: no body says so yet.
+    // How many deliveries were lost after the last one that waits or has started. No body tells of them yet.
     std::uint64_t missing() const;
 
     struct Losses {
@@ -67,17 +69,19 @@ class Lane {
     Losses losses() const;
 
   protected:
-    // Gives threads to as many as may have one. For a lane whose alsoAtWork() has become less.
+    // Gives threads to as many deliveries as the bounds allow. A derived class calls it when its alsoAtWork()
+    // has become less.
     void resume();
 
   private:
-    // What counts as at work besides the deliveries; read under the lane's lock, so it may take none that is
-    // held while a lane is called.
+    // How many more count as at work, besides the deliveries. It is called under the lane's lock, so it must
+    // not take a lock that is held while a function of the lane is called.
     virtual unsigned int alsoAtWork() const { return 0; }
-    // The first of a run of deliveries is lost for want of room. On the dispatching thread.
+    // Called on the dispatching thread when a delivery is lost because there is no room, but not again for
+    // those that are lost directly after it.
     virtual void full() {}
-    // So many were lost for want of room since it was said last. Called when none waits any more, on a
-    // delivery's thread; by default the standard error stream says it.
+    // Called on a delivery's thread when no delivery waits any more: so many were lost since the last call
+    // because there was no room. By default it writes that to the standard error stream.
     virtual void sayLost(std::uint64_t deliveries);
 
     struct Waiting {
@@ -103,13 +107,13 @@ class Lane {
     const Bounds bounds_;
     mutable std::mutex mutex_;
     std::deque<Waiting> waiting_;
-    std::size_t octets_ = 0;  // of all that wait
+    std::size_t octets_ = 0;  // memory of the deliveries that wait
     unsigned int atWork_ = 0;
     std::uint64_t started_ = 0;
     std::uint64_t missing_ = 0;
-    std::uint64_t unsaid_ = 0;  // lost for want of room
+    std::uint64_t unsaid_ = 0;  // lost because there was no room, and not told to sayLost yet
     Losses losses_;
-    bool starting_ = false;  // a thread is about it
+    bool starting_ = false;  // a thread is in startWaiting
     bool closed_ = false;
 };
 

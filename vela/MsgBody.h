@@ -1,4 +1,5 @@
-// What a message carries: an object that writes itself into a payload and reads itself out of one.
+// A message body: the fields of a message as an object, which writes itself into a payload and reads itself
+// from one.
 #ifndef VELA_MSGBODY_H
 #define VELA_MSGBODY_H
 
@@ -13,16 +14,17 @@ class Msg;
 
 class MsgBody : public virtualObject {
   public:
-    // Both return the payload offset just past the body.
+    // Both return the offset in the payload after the body.
     virtual unsigned int writeMsg(Msg* msg, unsigned int offset) = 0;
     virtual unsigned int readMsg(Msg* msg, unsigned int offset) = 0;
-    // The encoded size in octets.
+    // The size in octets when it is written.
     virtual unsigned int GetByteSize() const = 0;
-    // Octets of memory that it takes, its lists included.
+    // The memory that it takes, in octets, with its lists.
     virtual std::size_t memorySize() const { return sizeof(MsgBody) + GetByteSize(); }
 
-    // Which one it was of all that one registration was given, from 1 on, and how many were lost right before
-    // it. Set by the dispatcher, 0 for a body that came another way; no part of what the body says.
+    // The number of the delivery among those of its registration, from 1 on, and how many deliveries were
+    // lost directly before it. The dispatcher sets both; they are 0 in a body that did not come with a
+    // delivery. They are not part of the message.
     struct Arrival {
         std::uint64_t number = 0;
         std::uint64_t missing = 0;

@@ -1,4 +1,4 @@
-// Diagnostics on the standard error stream.
+// Reports on the standard error stream.
 #ifndef VELA_REPORT_H
 #define VELA_REPORT_H
 
@@ -10,7 +10,7 @@
 
 namespace vela {
 
-// Each item and an end of line, all in one piece: reports of several threads do not mix.
+// Writes the items and a line end in one piece, so that reports of several threads do not mix.
 template <typename... Items>
 void report(const Items&... items) {
     std::ostringstream text;
@@ -18,7 +18,7 @@ void report(const Items&... items) {
     std::cerr << text.str() << std::flush;
 }
 
-// "{label}{number}" and the like, as one item.
+// Makes one item of several parts, for example a label and a number.
 template <typename... Parts>
 std::string joined(const Parts&... parts) {
     std::ostringstream text;
@@ -26,12 +26,12 @@ std::string joined(const Parts&... parts) {
     return text.str();
 }
 
-// What begins the dispatcher's diagnostics. The line numbers are part of the text.
+// The beginning of the dispatcher's reports. The line numbers are part of the text.
 inline std::string diagnostic(int line, const char* what) {
     return joined("(EvtCallback_Class", line, ") ", what);
 }
 
-// Reports the exception that is being handled as one that has kept the dispatcher from handing on a message.
+// Called in a catch block. Reports that the exception has prevented the dispatcher from handing on a message.
 inline void reportInternalError() {
     try {
         throw;
@@ -42,7 +42,7 @@ inline void reportInternalError() {
     }
 }
 
-// The frame of the longer ones.
+// The asterisks before and after longer reports.
 inline constexpr const char* BannerBegin = "\n********************************************";
 inline constexpr const char* BannerEnd = "********************************************\n";
 
