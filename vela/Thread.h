@@ -86,8 +86,7 @@ class Thread : public virtualObject {
     std::unique_ptr<KSThread> thread_;  // null once the thread is abandoned and runs
     std::atomic<bool> started_{false};  // started, and not joined since
     std::atomic<bool> abandoned_{false};
-    std::atomic<bool> letGo_{
-        false};  // the thread was let go, by start() or by abandon(), whichever came second
+    std::atomic<bool> letGo_{false};  // set by start() or by abandon(), whichever comes second
 };
 
 // Start a thread that nobody joins. Its body gets a null control. Throw Thread::CreationError.
