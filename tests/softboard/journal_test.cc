@@ -52,6 +52,58 @@ TEST(JournalTest, AFileThatCannotBeWrittenIsRefused) {
     EXPECT_EQ(errno, ENOENT);
 }
 
+TEST(JournalTest, AFileThatTakesNothingMoreLosesLinesAndStopsNobody) {
+    Journal journal;
+    ASSERT_TRUE(journal.writeTo("/dev/full"));
+    journal.note("first");
+    journal.note("second");
+    EXPECT_EQ(journal.text(), "first\nsecond\n") << "what is in memory stays";
+}
+
+TEST(MessageTextTest, EveryMessageHasItsName) {
+    struct {
+        uint32_t type;
+        const char* name;
+    } const cases[] = {
+        {1, "Ack"},
+        {2, "Comtest"},
+        {3, "ComtestCmplt"},
+        {4, "Init"},
+        {5, "InitCmplt"},
+        {6, "Exit"},
+        {7, "ExitCmplt"},
+        {8, "SetParm"},
+        {9, "SetParmCmplt"},
+        {18, "GetParm"},
+        {19, "GetParmCmplt"},
+        {22, "DetectEvt"},
+        {23, "DetectEvtCmplt"},
+        {24, "DetectxEvts"},
+        {25, "DetectxEvtsCmplt"},
+        {26, "CancelEvt"},
+        {27, "CancelEvtCmplt"},
+        {28, "CancelxEvts"},
+        {29, "CancelxEvtsCmplt"},
+        {30, "CancelAllEvts"},
+        {32, "EvtDetected"},
+        {5376, "ieMessage"},
+        {8388608, "ResultComplete"},
+        {8388614, "CompAttrInfoResult"},
+        {8388615, "ComponentResult"},
+        {8388666, "CompAttrInfo"},
+        {8388669, "CompFind"},
+        {8388670, "CompInstAllocate"},
+        {8388673, "CompInstFree"},
+        {8388697, "CompUse"},
+        {8388698, "CompUnuse"},
+        {8388706, "CompFindAll"},
+        {8388707, "CompMultipleResult"},
+    };
+    for (const auto& c : cases) {
+        EXPECT_EQ(messageName({0, c.type, {}, {}, {}}), c.name) << c.type;
+    }
+}
+
 TEST(MessageTextTest, BodiesAreShownFieldByField) {
     struct {
         const char* says;

@@ -35,6 +35,7 @@ void reset() {
     s.script = nullptr;
     s.mostOctets = SIZE_MAX;
     s.firstOffsetStaysZero = false;
+    s.offsetsStayZero = false;
     s.nextQueue = FirstQueue;
     s.nextHost = FirstHost;
 }
@@ -69,6 +70,12 @@ std::vector<Message> written() {
 void fail(Op op, unsigned times, unsigned after) {
     const Lock lock(state().lock);
     state().faults[op] = {after, times};
+}
+
+void leaveOffsetsAtZero() {
+    State& s = state();
+    const Lock lock(s.lock);
+    s.offsetsStayZero = true;
 }
 
 void leaveFirstOffsetAtZero(bool on) {

@@ -87,6 +87,8 @@ std::vector<Message> written();
 void fail(Op op, unsigned times = 1, unsigned after = 0);
 // From now on the first VarField call on a body moves the data but leaves the offset at 0.
 void leaveFirstOffsetAtZero(bool on = true);
+// From now on every VarField call moves the data and ends with an offset of 0.
+void leaveOffsetsAtZero();
 // From now on the bodies of messages that reach a queue are cut to this many octets.
 void truncateBodies(std::size_t octets);
 

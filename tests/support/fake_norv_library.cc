@@ -62,7 +62,9 @@ std::uint32_t moveFields(State& s, Op op, NvMsg32Bit* msg, std::uint32_t* offset
         move(octets(msg) + NVMSG_HEADER_SIZE + at, field);
         at += field.size();
     }
-    if (!(s.firstOffsetStaysZero && *offset == 0))
+    if (s.offsetsStayZero)
+        *offset = 0;
+    else if (!(s.firstOffsetStaysZero && *offset == 0))
         *offset = static_cast<std::uint32_t>(at);
     return record(s, std::move(call));
 }

@@ -52,6 +52,7 @@ struct State {
     std::function<void(const Message&)> script;
     std::size_t mostOctets = SIZE_MAX;
     bool firstOffsetStaysZero = false;
+    bool offsetsStayZero = false;
     std::uint32_t nextQueue = FirstQueue;
     NvCompDesc nextHost = FirstHost;
 };

@@ -106,6 +106,15 @@ TEST_F(BoardTest, MovesToAnotherQueueWithItsManagers) {
     EXPECT_EQ(board_.findComp(0x15, 1).getMsgQueue(), queue);
 }
 
+TEST_F(BoardTest, ABoardThatCannotMoveToAQueueStaysWhereItWasWithItsManagers) {
+    vela::MsgQueue* const own = board_.getMsgQueue();
+    fake_norv::fail(fake_norv::Op::Open, 2);
+    EXPECT_THROW(board_.MsgQueueAttach(nullptr), KSResource_CreationError);
+    EXPECT_EQ(board_.getMsgQueue(), own);
+    EXPECT_EQ(board_.findComp(0x15, 1).getMsgQueue(), own);
+    EXPECT_EQ(board_.clusterMgr().getMsgQueue(), own);
+}
+
 TEST_F(BoardTest, ObjectsThatWereFoundKeepTheQueueWhenTheBoardIsDestroyed) {
     auto board = std::make_unique<vela::Board>(3, nullptr);
     const vela::TSCComponent tsc(board->findComp(0x12, 1));

@@ -1,5 +1,8 @@
 #include <gtest/gtest.h>
 
+#include <cstdlib>
+#include <cstring>
+#include <new>
 #include <sstream>
 #include <string>
 
@@ -33,7 +36,9 @@ TEST(StaticList, KeepsItsArrayDownToHalfItsCapacity) {
 TEST(StaticList, MakesANewArrayBelowHalfItsCapacityAndKeepsWhatExists) {
     staticList<int> list(100);
     list[39] = 39;
+    const int* const array = list.begin();
     list.realloc(40);
+    EXPECT_NE(list.begin(), array);
     EXPECT_EQ(list.length(), 40U);
     EXPECT_EQ(list.capacity(), 40U);
     EXPECT_EQ(list[39], 39);
@@ -68,6 +73,31 @@ TEST(StaticList, GrowsWithItsElements) {
     EXPECT_EQ(list[2], 3);
     list[4] = 5;
     EXPECT_EQ(list.length(), 5U);
+}
+
+// Its memory comes full of something else.
+struct Used {
+    int value;
+
+    static void* operator new[](std::size_t size, const std::nothrow_t&) noexcept {
+        void* const memory = std::malloc(size);
+        if (memory != nullptr)
+            std::memset(memory, 0xA5, size);
+        return memory;
+    }
+    static void operator delete[](void* memory) { std::free(memory); }
+    static void operator delete[](void* memory, const std::nothrow_t&) { std::free(memory); }
+};
+std::ostream& operator<<(std::ostream& out, const Used& used) { return out << used.value; }
+
+TEST(StaticList, NewElementsAreZero) {
+    staticList<Used> list(2);
+    EXPECT_EQ(printed(list), "{0 0}");
+    list[1].value = 7;
+    list.realloc(4);
+    EXPECT_EQ(printed(list), "{0 7 0 0}");
+    list.realloc(1);
+    EXPECT_EQ(printed(list), "{0}");
 }
 
 // So large that no machine has room for 4294967295 of it.
@@ -176,6 +206,25 @@ TEST(LinkedList, OfAHundredThousandElementsGoesWithoutRecursion) {
     for (int i = 0; i < 100000; ++i)
         list.append(i);
     EXPECT_EQ(list.length(), 100000U);
+}
+
+// From the front or the end each time, it would be a walk of 30,000,000,000 links, which no time limit
+// allows.
+TEST(LinkedList, TheCursorWalksFromWhereItStandsForwardsAndBackwards) {
+    constexpr unsigned int n = 250000;
+    linkedList<unsigned int> list;
+    for (unsigned int i = 0; i < n; ++i)
+        list.append(i);
+    unsigned int wrong = 0;
+    for (unsigned int i = 0; i < n; ++i)
+        wrong += list[i] != i ? 1 : 0;
+    for (unsigned int i = n; i > 0; --i)
+        wrong += list[i - 1] != i - 1 ? 1 : 0;
+    for (unsigned int i = 0; i < n; ++i)  // one behind the other, from the middle on
+        list.insert(n / 2 + i, n + i);
+    for (unsigned int i = 0; i < n; ++i)
+        wrong += list[n / 2 + i] != n + i ? 1 : 0;
+    EXPECT_EQ(wrong, 0U);
 }
 
 TEST(KeyedList, TheNewestOfEqualKeysWinsUntilItIsUnset) {

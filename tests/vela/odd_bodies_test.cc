@@ -190,6 +190,14 @@ TEST_F(OddBodyTest, AValueListThatIsTooShortGrowsAndOneThatIsTooLongIsNotSentWho
     EXPECT_EQ(parm.Val->length(), 3U);
 }
 
+TEST_F(OddBodyTest, AValueListGrowsWithZerosAndNotWithWhatItHeldBeforeItShrank) {
+    Parm parm;
+    parm.FieldDef = 0x381000;  // three numbers
+    parm.Val = staticList<unsigned int>{1, 2, 3};
+    parm.Val->realloc(2);
+    EXPECT_EQ(encoded(parm), words({0, 0x381000, 1, 2, 0}));
+}
+
 TEST_F(OddBodyTest, AValueListGrowsWhenItIsReadAndNeverShrinks) {
     unsigned int number = 0, fieldDef = 0;
     staticList<unsigned int> value{11, 12, 13, 14};

@@ -119,6 +119,24 @@ TEST_F(ReceiverTest, NullAsksForTheReportOfUnregisteredSourcesAgain) {
     EXPECT_NE(errors.text().find("Unregisterd Source sent to MsgQueue"), std::string::npos);
 }
 
+TEST_F(ReceiverTest, WhatADispatcherCannotDeliverIsPassedOnToItsCaller) {
+    CapturedErrors errors;
+    vela::EvtCallback dispatcher(&object_);
+    const vela::Handler ignoreBody([](Addressable*, unsigned int, vela::MsgBody* body) { delete body; });
+    const vela::Handler ignore([](Addressable*, Msg* msg) { delete msg; });
+    dispatcher.registerMsgType(0, ignoreBody, vela::EvtCallback::OnDispatchingThread);
+    EXPECT_THROW(dispatcher.receive(messageOf({}).release()), Addressable::UndefinedMsgBody);
+    dispatcher.cancelMsgType(0);
+    dispatcher.registerMsgType(0, ignore, vela::EvtCallback::OnDispatchingThread);
+    dispatcher.registerMsgType(0, ignore, vela::EvtCallback::OnDispatchingThread);
+    Msg* const twice = messageOf({}).release();
+    fake_norv::fail(fake_norv::Op::Allocate);
+    EXPECT_THROW(dispatcher.receive(twice), KSMsgRef::AllocationError);
+    EXPECT_EQ(errors.text(),
+              "(EvtCallback_Class214) vela internal error\nvela::Addressable::UndefinedMsgBody\n"
+              "(EvtCallback_Class219) vela internal error\n");
+}
+
 TEST_F(ReceiverTest, TheQueueGoesOnAfterAReceiverOrAHandlerThatThrows) {
     CapturedErrors errors;
     object_.getMsgQueue()->unregisteredSource([](MsgQueue*, Msg* msg) {

@@ -223,6 +223,17 @@ TEST_F(RequestTest, ACommandWithoutReplyThatIsAnsweredLaterHasSucceeded) {
     EXPECT_THAT(errors_.text(), testing::HasSubstr("MsgType 0\n"));
 }
 
+TEST_F(RequestTest, TheFlagsOfACommandWithoutReplySayWhetherAnotherSourceMayRefuse) {
+    board_.script(30, [](const Message& m) {
+        Message other = replyTo(m, 0);
+        other.source.instance = 2;
+        fake_norv::deliver(other);
+    });
+    EXPECT_NO_THROW(ccs_.request(30, &cmd_));
+    ccs_.setErrorWaitTime(Addressable::DefaultErrorWaitTime);
+    EXPECT_THROW(ccs_.request(30, &cmd_, 0, 1), Addressable::UnexpectedMsg);
+}
+
 TEST_F(RequestTest, WithoutAWaitNothingIsWaitedFor) {
     board_.answers(30, 0);
     ccs_.setErrorWaitTime(0);
@@ -317,6 +328,29 @@ TEST_F(RequestTest, AttachingToAnotherQueueLeavesTheOneBefore) {
     EXPECT_EQ(fake_norv::openQueues(), 2U);
     object.MsgQueueAttach(object.getMsgQueue());
     EXPECT_EQ(fake_norv::openQueues(), 2U);
+}
+
+// What a failed attachment leaves: the object where it was, and nobody attached to the other queue.
+TEST_F(RequestTest, AnObjectThatCannotMoveToAQueueStaysWhereItWas) {
+    MsgQueue* const own = ccs_.getMsgQueue();
+    const auto ignore = [](Addressable*, Msg* msg) { delete msg; };
+    ccs_.asyncRegisterMsgType(19, ignore, vela::EvtCallback::OnDispatchingThread);
+    {
+        StdResource same(Ccs, nullptr);  // whose address is taken on its queue
+        same.asyncRegisterMsgType(19, ignore, vela::EvtCallback::OnDispatchingThread);
+        EXPECT_EQ(fake_norv::openQueues(), 2U);
+        EXPECT_THROW(ccs_.MsgQueueAttach(same.getMsgQueue()), vela::Exception);
+        EXPECT_EQ(ccs_.getMsgQueue(), own);
+    }
+    EXPECT_EQ(fake_norv::openQueues(), 1U) << "the other queue went with its only holder";
+    fake_norv::fail(fake_norv::Op::Open, 2);
+    EXPECT_THROW(ccs_.MsgQueueAttach(nullptr), KSResource_CreationError);
+    EXPECT_EQ(ccs_.getMsgQueue(), own);
+    board_.answers(8, 9);
+    EXPECT_NO_THROW(ccs_.request(8, &cmd_, 9, nullptr));
+    ASSERT_TRUE(fake_norv::deliver({1001, 19, Ccs.getNvCompDesc(), own->getHostDesc().getNvCompDesc(), {}}));
+    ASSERT_TRUE(fake_norv::waitForIdleReader());
+    EXPECT_EQ(errors_.text(), "") << "its callbacks are registered as before";
 }
 
 class QueueTest : public TransportTest {

@@ -123,6 +123,27 @@ TEST_F(WireTest, AnAddressThatBeginsABodyIsCorrectedByItsOwnFirstField) {
               "@0 0x280000\n@2 0x200000 0x200000 0x200000 0x200000\n@6 0x380000 0x380000\n");
 }
 
+TEST_F(WireTest, OnlyTheFirstCallOfABodyIsCorrected) {
+    using Both = std::pair<unsigned int, unsigned int>;
+    const auto ends = [](vela::MsgBody& body) {
+        vela::Msg msg(body.GetByteSize());
+        const unsigned int written = msg.write(&body, 0);
+        return Both(written, msg.read(&body, 0));
+    };
+    fake_norv::leaveOffsetsAtZero();
+    StdResource::MsgGetParm_t one;
+    EXPECT_EQ(ends(one), Both(4, 4)) << "one call";
+    StdResource::MsgSetParm_t two;
+    EXPECT_EQ(ends(two), Both(0, 0)) << "a second call";
+    vela::CompDesc_t address;
+    EXPECT_EQ(ends(address), Both(0, 0)) << "a second call";
+    StdResource::MsgDetectEvt_t nested;
+    EXPECT_EQ(ends(nested), Both(0, 0)) << "a field behind a body";
+    staticList<unsigned char> octets = listOf(counted(256));
+    vela::MsgDefault_t chunks(octets);
+    EXPECT_EQ(ends(chunks), Both(0, 0)) << "a second chunk";
+}
+
 TEST_F(WireTest, ABodyWithinAPayloadStartsAtItsOffsetAndNeedsNoCorrection) {
     for (const bool stuck : {false, true}) {
         fake_norv::reset();
