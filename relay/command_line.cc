@@ -2,6 +2,7 @@
 
 #include <CLI/CLI.hpp>
 #include <cmath>
+#include <cstdlib>
 #include <vector>
 
 namespace relay {
@@ -27,6 +28,11 @@ struct Given {
     double writeTimeout = 10;
 };
 
+// "nan" is a number to the library, and within every range.
+std::string refuseNan(const std::string& text) {
+    return std::isnan(std::strtod(text.c_str(), nullptr)) ? "Value " + text + " is no number of seconds" : "";
+}
+
 void addOptions(CLI::App& app, Given& given, Options& options) {
     app.add_option("--listen", given.listen,
                    "IPv4 address to listen on; with port 0 the system chooses one (default: 127.0.0.1:6554)")
@@ -42,11 +48,13 @@ void addOptions(CLI::App& app, Given& given, Options& options) {
     app.add_option("--frame-timeout", given.frameTimeout,
                    "How long a host may take to finish a frame that it has begun (default: 10)")
         ->type_name("SECONDS")
-        ->check(CLI::Range(0.001, 3600.0));
+        ->check(CLI::Range(0.001, 3600.0))
+        ->check(refuseNan);
     app.add_option("--write-timeout", given.writeTimeout,
                    "How long a host may take to accept a frame (default: 10)")
         ->type_name("SECONDS")
-        ->check(CLI::Range(0.001, 3600.0));
+        ->check(CLI::Range(0.001, 3600.0))
+        ->check(refuseNan);
     app.set_help_flag("--help,-h", "Print this and exit");
     app.set_version_flag("--version", "kv9relayd " RELAY_VERSION, "Print the version and exit");
 }

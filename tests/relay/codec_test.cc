@@ -210,6 +210,17 @@ TEST(RelayCommandLine, AMistakeIsNamed) {
     EXPECT_THAT(refusal({"more"}), HasSubstr("more"));
 }
 
+TEST(RelayCommandLine, TimeoutsAreBetweenAMillisecondAndAnHour) {
+    for (const std::string option : {"--frame-timeout", "--write-timeout"}) {
+        for (const char* bad : {"0", "0.0009", "-1", "3600.1", "1e9", "inf", "nan", "soon", ""})
+            EXPECT_THAT(refusal({option.c_str(), bad}), HasSubstr(option)) << bad;
+        for (const char* good : {"0.001", "3600"})
+            EXPECT_EQ(refusal({option.c_str(), good}), "taken") << good;
+    }
+    EXPECT_EQ(parsed({"--frame-timeout", "0.001"}).options.patience.frame.count(), 1);
+    EXPECT_EQ(parsed({"--write-timeout", "3600"}).options.patience.write.count(), 3600000);
+}
+
 TEST(RelayCommandLine, HelpAndVersionArePrinted) {
     EXPECT_THAT(parsed({"--help"}).told, HasSubstr("--allow CIDR"));
     EXPECT_THAT(parsed({"--help"}).told, HasSubstr("ssh -N -L 6554:127.0.0.1:6554"));
