@@ -6,6 +6,7 @@
 #include <cstring>
 #include <fstream>
 #include <iostream>
+#include <mutex>
 #include <sstream>
 
 #include "softboard/handover.h"
@@ -54,6 +55,17 @@ __attribute__((destructor)) void tearDown() {
 }
 
 }  // namespace
+
+void sayThatBoardsAreSimulated() {
+    static std::once_flag said;
+    if (std::getenv(scenarioVariable) != nullptr) {
+        return;
+    }
+    std::call_once(said, [] {
+        std::cerr << "softboard: this libnorv.so is the software board's: boards are simulated\n"
+                  << std::flush;
+    });
+}
 
 Network& network() {
     static Network& theNetwork = *make();

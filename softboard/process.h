@@ -11,6 +11,10 @@ namespace softboard {
 // program may wait in a queue until the process ends.
 Network& network();
 
+// Says so on the standard error stream, once, unless the launcher has started the program: a program that
+// finds this library by itself may be meant for real boards. Any thread.
+void sayThatBoardsAreSimulated();
+
 }  // namespace softboard
 
 #endif

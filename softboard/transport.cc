@@ -140,7 +140,10 @@ uint32_t nvMsgVarFieldPut(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...
     return status;
 }
 
-uint32_t nvQueueOpen(void) { return network().openQueue(); }
+uint32_t nvQueueOpen(void) {
+    softboard::sayThatBoardsAreSimulated();
+    return network().openQueue();
+}
 
 uint32_t nvQueueBind(uint32_t queue, NvCompDesc* host) {
     checkStorage("nvQueueBind", host);

@@ -39,6 +39,13 @@ class Library(SystemTest):
         sanitizers = {name for name in needed if "san.so" in name}
         self.assertEqual(needed - system - sanitizers, {"libnorv.so"})
 
+    def test_the_library_says_that_boards_are_simulated_when_the_program_finds_it_by_itself(self):
+        self.file("lapdmon.log", "")
+        program = self.start([LAPDMON, "-b1"])
+        program.screen.wait("NET5 Switch")
+        program.types("q")
+        program.ends(errors="softboard: this libnorv.so is the software board's: boards are simulated\n")
+
     def test_LD_LIBRARY_PATH_puts_another_library_in_its_place(self):
         folder = os.path.dirname(OTHER_LIBRARY)
         self.assertTrue(os.path.samefile(self.library_of(LAPDMON, LD_LIBRARY_PATH=folder), OTHER_LIBRARY))
