@@ -76,6 +76,19 @@ std::unique_ptr<vela::CCS> openCcs(const vela::Instance& instance) {
     return opened;
 }
 
+// Finds the CCS instance of the D channel. The screen shows only the board's reply when there is none, so the
+// standard error stream says what that means.
+vela::Instance findDChannel(vela::Board& board) {
+    try {
+        return board.findInst(CcsType, AnyProcessor, static_cast<unsigned short>(INST_NUM));
+    } catch (const vela::Addressable::UnexpectedMsg&) {
+        std::cerr << "lapdmon: board " + std::to_string(boardnumber) + " has no D channel " +
+                         std::to_string(INST_NUM) + "\n"
+                  << std::flush;
+        throw;
+    }
+}
+
 // Sets the variant by which frames are decoded. Returns false for a type that cannot be decoded.
 bool setProtocol(unsigned int type) {
     std::cout << "CCS protocol type is " << type << std::endl;
@@ -124,8 +137,7 @@ int trace(int argc, char** argv) {
 
     vela::Board board(static_cast<unsigned int>(boardnumber), nullptr);
     const vela::TSCComponent tsc = findTsc(board);
-    const vela::Instance instance =
-        board.findInst(CcsType, AnyProcessor, static_cast<unsigned short>(INST_NUM));
+    const vela::Instance instance = findDChannel(board);
     std::unique_ptr<vela::CCS> opened = openCcs(instance);
     vela::StdResource::MsgGetParmCmplt_t reply;
     opened->GetParm(ProtocolTypeParm, &reply);

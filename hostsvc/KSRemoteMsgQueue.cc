@@ -4,6 +4,8 @@
 #include <sys/socket.h>
 
 #include <array>
+#include <atomic>
+#include <cerrno>
 #include <cstring>
 #include <iostream>
 #include <system_error>
@@ -32,14 +34,22 @@ msg_t frameOf(std::uint32_t type, std::array<std::uint32_t, N>& words) {
     return {type, 0, sizeof words, 0, reinterpret_cast<char*>(words.data()), nullptr};
 }
 
+// The exception does not tell the reason, so the standard error stream does.
+[[noreturn]] void cannotOpen(const std::string& hostName, const std::string& reason) {
+    std::cerr << "Cannot open a remote message queue on " + hostName + ": " + reason + "\n" << std::flush;
+    throw KSResource_CreationError();
+}
+
 // Ends the connection when the relay does not answer in time, so that the thread that reads it wakes. A
 // thread of its own watches the time.
 class Patience {
   public:
     explicit Patience(const sock& connection)
         : watcher_([this, &connection] {
-              if (!answered_.tryLock(AnswerMs, PollMs))
-                  connection.shutdown(SHUT_RDWR);
+              if (answered_.tryLock(AnswerMs, PollMs))
+                  return;
+              isOver_ = true;
+              connection.shutdown(SHUT_RDWR);
           }) {}
     Patience(const Patience&) = delete;
     Patience& operator=(const Patience&) = delete;
@@ -48,10 +58,14 @@ class Patience {
         watcher_.join();
     }
 
+    // Whether the relay did not answer in time.
+    bool isOver() const { return isOver_; }
+
   private:
     struct HeldMutex : KSMutex {
         HeldMutex() { lock(); }
     } answered_;
+    std::atomic<bool> isOver_ = false;
     std::thread watcher_;
 };
 
@@ -80,8 +94,10 @@ class KSRemoteMsgQueue::ReceivedFrame {
 
 KSRemoteMsgQueue::KSRemoteMsgQueue(NvCompDesc desc, unsigned a, unsigned b, const char* hostName)
     : hostName_(hostName), connection_(hostName, Port) {
-    if (connection_.failed() || connection_.connect() < 0)
-        throw KSResource_CreationError();
+    if (connection_.failed())
+        cannotOpen(hostName_, connection_.descriptor() < 0 ? std::strerror(errno) : "the name is unknown");
+    if (connection_.connect() < 0)
+        cannotOpen(hostName_, std::strerror(errno));
     keepAlive();
     handshake_.lock();
     open(desc, a, b);
@@ -109,17 +125,16 @@ void KSRemoteMsgQueue::open(NvCompDesc desc, unsigned a, unsigned b) try {
                                          a,         b};
     KS_htonU32(request.data(), request.data(), sizeof request);
     const Patience patience(connection_);
-    if (sendFrame(frameOf(OpenFrame, request)) != 0)
-        throw KSResource_CreationError();
+    const bool sent = sendFrame(frameOf(OpenFrame, request)) == 0;
     const ReceivedFrame reply(connection_);
     std::array<std::uint32_t, 5> address{};
-    if (!reply.is(OpenedFrame) || (*reply).size < static_cast<int>(sizeof address))
-        throw KSResource_CreationError();
+    if (!sent || !reply.is(OpenedFrame) || (*reply).size < static_cast<int>(sizeof address))
+        cannotOpen(hostName_, patience.isOver() ? "the relay does not answer" : "refused by the relay");
     KS_ntohU32(address.data(), (*reply).data, sizeof address);
     const auto octet = [&](std::size_t word) { return static_cast<std::uint8_t>(address[word]); };
     hostDesc = {static_cast<std::uint16_t>(address[4]), octet(1), 0, octet(2), octet(3), octet(0), 0};
-} catch (const std::system_error&) {  // the system has no thread for Patience
-    throw KSResource_CreationError();
+} catch (const std::system_error& error) {  // the system has no thread for Patience
+    cannotOpen(hostName_, error.what());
 }
 
 long KSRemoteMsgQueue::sendFrame(const msg_t& frame) {

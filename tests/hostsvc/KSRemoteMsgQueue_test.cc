@@ -123,22 +123,30 @@ TEST_F(KSRemoteMsgQueueTest, ANameWithAPortLeadsToTheRelayToo) {
     close(queue, relay);
 }
 
-TEST_F(KSRemoteMsgQueueTest, WithoutARelayOpeningThrows) {
+TEST_F(KSRemoteMsgQueueTest, WithoutARelayOpeningThrowsAndSaysWhy) {
+    CaptureStderr();
     EXPECT_THROW(KSRemoteMsgQueue(Asked, 0, 0, "127.0.0.1:1"), KSResource_CreationError);
     EXPECT_THROW(KSRemoteMsgQueue(Asked, 0, 0, "no such name"), KSResource_CreationError);
+    EXPECT_EQ(GetCapturedStderr(),
+              "Cannot open a remote message queue on 127.0.0.1:1: Connection refused\n"
+              "Cannot open a remote message queue on no such name: the name is unknown\n");
 }
 
-TEST_F(KSRemoteMsgQueueTest, ARelayThatRefusesMakesOpeningThrow) {
+TEST_F(KSRemoteMsgQueueTest, ARelayThatRefusesMakesOpeningThrowAndIsNamed) {
+    const std::string refused =
+        "Cannot open a remote message queue on " + listener_.host() + ": refused by the relay\n";
     for (const Octets& answer : {words({1001, 0, 20, 0, 0}) + words({11, 12, 13, 14, 15}), CloseRequest,
                                  Closed, words({1002, 0, 16, 0, 0}) + words({11, 12, 13, 14}),
                                  words({1002, 0, 102401, 0, 0}) + Octets(102401), words({0, 0, 0, 0, 0}),
                                  words({1002, 0, 0xFFFFFFFF, 0, 0})}) {
+        CaptureStderr();
         auto making = std::async(std::launch::async, [this] { return make(); });
         Connection relay = listener_.accept();
         relay.read(OpenRequestSize);
         relay.write(answer);
         EXPECT_THROW(making.get(), KSResource_CreationError);
         EXPECT_TRUE(relay.ends());
+        EXPECT_TRUE(GetCapturedStderr().ends_with(refused));
     }
 }
 
@@ -154,6 +162,7 @@ TEST_F(KSRemoteMsgQueueTest, ARelayThatClosesAfterAnyOctetOfItsAnswerMakesOpenin
 }
 
 TEST_F(KSRemoteMsgQueueTest, ARelayThatDoesNotAnswerIsGivenUpAfterFiveSeconds) {
+    CaptureStderr();
     SleeplessSystem system;
     std::promise<void> read;
     system.insteadOfNapping = [&, wait = read.get_future().share()] { wait.wait(); };
@@ -164,6 +173,8 @@ TEST_F(KSRemoteMsgQueueTest, ARelayThatDoesNotAnswerIsGivenUpAfterFiveSeconds) {
     read.set_value();
     EXPECT_THROW(making.get(), KSResource_CreationError);
     EXPECT_EQ(system.naps(), std::vector<long>(500, 10000));
+    EXPECT_TRUE(GetCapturedStderr().ends_with("Cannot open a remote message queue on " + listener_.host() +
+                                              ": the relay does not answer\n"));
 }
 
 TEST_F(KSRemoteMsgQueueTest, AMessageIsWrittenAsItsHeaderBlockAndItsBody) {

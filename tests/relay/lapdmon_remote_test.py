@@ -134,6 +134,21 @@ class Stalled(RelayTest):
         relay.stops()
 
 
+class NotThere(RelayTest):
+    def expect(self, host, reason):
+        lapdmon = Program(self, LAPDMON, "-b1", REMOTE_NORV=host)
+        self.assertEqual(lapdmon.ends(status=1), f"Cannot open a remote message queue on {host}: {reason}\n")
+        self.assertIn("general Exception caught in lapdmon(749)", lapdmon.screen.text())
+
+    def test_a_machine_without_a_relay_is_told(self):
+        with socket.create_server(("127.0.0.1", 0)) as listener:
+            port = listener.getsockname()[1]
+        self.expect(f"127.0.0.1:{port}", "Connection refused")
+
+    def test_a_name_that_nobody_knows_is_told(self):
+        self.expect("nobody.invalid", "the name is unknown")
+
+
 class OnThePeer(RelayTest):
     """The relay is this test."""
 
@@ -180,7 +195,8 @@ class OnThePeer(RelayTest):
         self.expect_open_request(peer)
         peer.send(answer)
         peer.close()
-        self.lapdmon.ends(status=1)
+        said = self.lapdmon.ends(status=1)
+        self.assertTrue(said.endswith(f"Cannot open a remote message queue on {self.where}: refused by the relay\n"), said)
         self.assertIn("general Exception caught in lapdmon(749)", self.lapdmon.screen.text())
 
     def test_a_relay_that_closes_at_once(self):

@@ -57,7 +57,8 @@ class Lifecycle(SystemTest):
         self.assertEqual(program.journal.lines()[-1], "buffers outstanding 0, queues open 0")
 
     def test_a_D_channel_that_is_not_there_is_reported(self):
-        program = self.on_board(run=("lapdmon", "-b1", "-d9")).ends(status=1)
+        program = self.on_board(run=("lapdmon", "-b1", "-d9")).ends(
+            status=1, errors="lapdmon: board 1 has no D channel 9\n")
         screen = program.screen.lines()
         self.assertEqual(screen[5], "TSC Component Information{Node 0 Board 1 Processor 1 Component 18 Instance 0}")
         self.assertEqual(screen[6], "vela Exception caught")
