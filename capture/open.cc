@@ -104,11 +104,8 @@ bool isStart(std::string_view name) {
 }  // namespace
 
 const Interface* Interfaces::of(const Interface& wanted) {
-    for (const Interface& known : interfaces_) {
-        if (known == wanted)
-            return &known;
-    }
-    return &interfaces_.emplace_back(wanted);
+    const auto found = std::find(interfaces_.begin(), interfaces_.end(), wanted);
+    return found == interfaces_.end() ? &interfaces_.emplace_back(wanted) : &*found;
 }
 
 std::span<const Form> forms() { return allForms; }

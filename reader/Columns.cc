@@ -45,6 +45,8 @@ void putTime(Cell& cell) {
 void putDelta(Cell& /*cell*/) {}
 
 void putDirection(Cell& cell) {
+    if (cell.seen.number == 0)
+        return;
     const bool transmitted = cell.seen.frame().transmitted;
     inColor(cell, transmitted ? green : cyan, [&] {
         cell.line += transmitted ? "TX " : "RX ";

@@ -56,8 +56,19 @@ Output::~Output() {
 }
 
 void Output::flush() {
-    const int error = writeAll(descriptor_, buffer_);
+    if (buffer_.empty())
+        return;
+    try {
+        writeThrough(buffer_);
+    } catch (...) {
+        buffer_.clear();  // what cannot be written is not tried again
+        throw;
+    }
     buffer_.clear();
+}
+
+void Output::writeThrough(std::string_view text) {
+    const int error = writeAll(descriptor_, text);
     if (error == EPIPE)
         throw ReaderGone();
     if (error != 0)

@@ -29,6 +29,11 @@ class Output {
     // Both throw ReaderGone when a pipe has no reader any more, and FileError when the text cannot be
     // written.
     void write(std::string_view text) {
+        if (text.size() >= large_) {
+            flush();
+            writeThrough(text);
+            return;
+        }
         buffer_.append(text);
         if (buffer_.size() >= most_)
             flush();
@@ -41,6 +46,9 @@ class Output {
 
   private:
     static constexpr std::size_t most_ = 256 * 1024;
+    static constexpr std::size_t large_ = 64 * 1024;  // worth a write of its own, to save a copy
+
+    void writeThrough(std::string_view text);
 
     int descriptor_;
     bool ours_;

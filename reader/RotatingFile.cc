@@ -19,7 +19,6 @@ namespace {
 
 using Kind = capture::Item::Kind;
 
-constexpr std::chrono::seconds betweenAttempts{1};
 constexpr std::uint64_t mostPending = 64 * 1024;
 constexpr char unfinished[] = ".part";
 
@@ -128,7 +127,7 @@ void RotatingFile::write(const capture::Item& item) {
     if (writer_ != nullptr && periodOf(secondOf(item)) != period_)
         finish();
     if (writer_ == nullptr && !begin(item)) {
-        give(frames);
+        lose(frames);
         return;
     }
     pendingFrames_ += frames;
@@ -178,13 +177,13 @@ void RotatingFile::finish() {
 
 // The file keeps what it safely has; the rest is counted. Another file is tried after a while.
 void RotatingFile::fail(const std::string& why) {
-    give(pendingFrames_);
+    lose(pendingFrames_);
     pending_ = 0;
     pendingFrames_ = 0;
     if (!failing_)
         chatter_.error(why + "; recording goes on when that works again");
     failing_ = true;
-    retryAt_ = HostClock::now() + betweenAttempts;
+    retryAt_ = HostClock::now() + betweenAttempts_;
     if (descriptor_ < 0)
         return;
     const bool isCut = ftruncate(descriptor_, static_cast<off_t>(size_)) == 0;

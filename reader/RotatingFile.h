@@ -26,6 +26,8 @@ struct RotationRules {
 // counted; once writing works again, the file says how many frames are missing.
 class RotatingFile {
   public:
+    using HostClock = std::chrono::steady_clock;
+
     // References are kept.
     RotatingFile(const RotationRules& rules, const std::string& trunk, Chatter& chatter);
     // Finishes the file.
@@ -42,13 +44,14 @@ class RotatingFile {
 
     std::uint64_t lostInAll() const { return lostInAll_; }
 
-  private:
-    using HostClock = std::chrono::steady_clock;
+    // How long after a failure another file is tried; a second, unless a test wants it otherwise.
+    void retryEvery(HostClock::duration time) { betweenAttempts_ = time; }
 
+  private:
     bool begin(const capture::Item& item);
     void writeLoss(const capture::Item& item);
     void fail(const std::string& why);
-    void give(std::uint64_t frames) {
+    void lose(std::uint64_t frames) {
         lost_ += frames;
         lostInAll_ += frames;
     }
@@ -72,6 +75,7 @@ class RotatingFile {
     std::uint64_t lostInAll_ = 0;
     bool failing_ = false;  // the failure was said
     HostClock::time_point retryAt_;
+    HostClock::duration betweenAttempts_ = std::chrono::seconds(1);
 };
 
 // A name that is safe in a path: letters, digits and "-_+@=." stay, anything else becomes "_".

@@ -32,7 +32,10 @@ constexpr struct {
 } markRows[] = {
     {"retransmitted",        [](const Seen& seen) { return seen.marks.retransmitted; }},
     {"out of sequence",      [](const Seen& seen) { return seen.marks.outOfSequence; }},
-    {"not accepted",         [](const Seen& seen) { return seen.marks.accepted == false && !seen.marks.outOfSequence; }},
+    {"not accepted",
+     [](const Seen& seen) {
+         return seen.marks.accepted == false && !seen.marks.outOfSequence && !seen.marks.retransmitted;
+     }},
     {"REJ",                  [](const Seen& seen) { return seen.link.type == isdn::FrameType::REJ; }},
     {"poll unanswered",      [](const Seen& seen) { return seen.marks.pollUnanswered; }},
     {"link up",              [](const Seen& seen) { return seen.marks.linkUp; }},

@@ -7,10 +7,8 @@
 namespace reader {
 
 void TextConsumer::take(Chunk& chunk, std::size_t count) {
-    if (chunk.pieces.front().deltaSize != 0) {
-        takeWithTimes(chunk, count);
-        return;
-    }
+    if (chunk.pieces.front().deltaSize != 0)
+        fillInTimes(chunk, count);
     const std::string_view text = std::string_view(chunk.text).substr(0, chunk.pieces[count - 1].end);
     if (!harmless_) {
         out_.write(text);
@@ -21,23 +19,30 @@ void TextConsumer::take(Chunk& chunk, std::size_t count) {
     out_.write(shown);
 }
 
-void TextConsumer::takeWithTimes(const Chunk& chunk, std::size_t count) {
-    const std::string_view text = chunk.text;
-    std::size_t start = 0;
+void TextConsumer::fillInTimes(Chunk& chunk, std::size_t count) {
+    std::string delta;
     for (std::size_t i = 0; i < count; ++i) {
-        const Piece& piece = chunk.pieces[i];
-        out_.write(text.substr(start, piece.deltaAt - start));
-        std::string delta;
-        if (piece.instant.clock != capture::Clock::none) {
-            const bool comparable = before_.clock == piece.instant.clock;
-            appendSeconds(delta, comparable ? piece.instant.time - before_.time : 0);
-            before_ = piece.instant;
-        }
-        padTo(delta, 0, piece.deltaSize, true);
-        out_.write(delta);
-        start = piece.deltaAt + piece.deltaSize;
-        out_.write(text.substr(start, piece.end - start));
-        start = piece.end;
+        Piece& piece = chunk.pieces[i];
+        if (piece.instant.clock == capture::Clock::none)
+            continue;
+        const bool comparable = before_.clock == piece.instant.clock;
+        delta.clear();
+        appendSeconds(delta, comparable ? piece.instant.time - before_.time : 0);
+        before_ = piece.instant;
+        if (delta.size() > piece.deltaSize)
+            widen(chunk, i, delta.size() - piece.deltaSize);
+        delta.copy(chunk.text.data() + piece.deltaAt + piece.deltaSize - delta.size(), delta.size());
+    }
+}
+
+// More than a day between two lines needs more room than there is.
+void TextConsumer::widen(Chunk& chunk, std::size_t first, std::size_t more) {
+    chunk.text.insert(chunk.pieces[first].deltaAt, more, ' ');
+    chunk.pieces[first].deltaSize += more;
+    for (std::size_t i = first; i < chunk.pieces.size(); ++i) {
+        chunk.pieces[i].end += more;
+        if (i > first)
+            chunk.pieces[i].deltaAt += more;
     }
 }
 

@@ -19,7 +19,8 @@ class TextConsumer : public Consumer {
     void flush() override { out_.flush(); }
 
   private:
-    void takeWithTimes(const Chunk& chunk, std::size_t count);
+    void fillInTimes(Chunk& chunk, std::size_t count);
+    static void widen(Chunk& chunk, std::size_t first, std::size_t more);
 
     Output& out_;
     bool harmless_;

@@ -29,7 +29,7 @@ const Form& formOf(const Options& options) {
     throw UsageError("convert needs --to FORM, or an OUT whose name ends in one");
 }
 
-void write(Session& session, const Form& form, Output& out) {
+void write(Session& session, const Form& form, Output& out, Chatter& chatter) {
     if (form.makeComposer != nullptr) {
         TextConsumer consumer(out);
         out.write(form.header);
@@ -37,7 +37,7 @@ void write(Session& session, const Form& form, Output& out) {
         return;
     }
     const auto writer = form.makeWriter(out.descriptor(), out.name());
-    WriterConsumer consumer(*writer);
+    WriterConsumer consumer(*writer, chatter);
     session.run(consumer, [] { return std::make_unique<NoComposer>(); });
     consumer.finish();
 }
@@ -60,7 +60,7 @@ int runConvert(const Options& given, Chatter& chatter) {
     if (form.binary && out.isTerminal())
         throw UsageError(std::string(form.name) +
                          " is not for a terminal: name a file, or send it through a pipe");
-    write(session, form, out);
+    write(session, form, out, chatter);
     return good;
 }
 

@@ -3,6 +3,10 @@
 #include <algorithm>
 #include <cerrno>
 
+#include "capture/text_forms.h"
+#include "capture/writers.h"
+#include "lapdlog/LogWriter.h"
+#include "lapdlog/log.h"
 #include "reader/csv.h"
 #include "reader/errors.h"
 #include "reader/json.h"
@@ -16,13 +20,37 @@ std::unique_ptr<Composer> make() {
     return std::make_unique<ComposerOfForm>();
 }
 
+bool looksLikePcapng(std::string_view beginning) { return beginning.starts_with("\x0a\x0d\x0d\x0a"); }
+
+bool looksLikePcap(std::string_view beginning) {
+    constexpr std::string_view marks[] = {"\xd4\xc3\xb2\xa1", "\xa1\xb2\xc3\xd4", "\x4d\x3c\xb2\xa1",
+                                          "\xa1\xb2\x3c\x4d"};
+    return std::any_of(std::begin(marks), std::end(marks),
+                       [&](std::string_view mark) { return beginning.starts_with(mark); });
+}
+
+bool looksLikeHex(std::string_view beginning) {
+    return capture::isHexLines(beginning, true) == capture::Form::Match::yes;
+}
+bool looksLikeLog(std::string_view beginning) {
+    return lapdlog::isLog(beginning, true) == capture::Form::Match::yes;
+}
+
+std::unique_ptr<capture::Writer> makeLogWriter(int descriptor, const std::string& name) {
+    return lapdlog::makeLogWriter(descriptor, name);
+}
+
 bool looksLikeJson(std::string_view beginning) { return beginning.starts_with("{\"v\":"); }
 bool looksLikeCsv(std::string_view beginning) { return beginning.starts_with("n,file,"); }
 
 // clang-format off
 const Form table[] = {
-    {"jsonl", "JSON Lines of lapdread", false, looksLikeJson, "",          make<JsonComposer>, nullptr},
-    {"csv",   "a CSV file of lapdread", false, looksLikeCsv,  csvHeader(), make<CsvComposer>,  nullptr},
+    {"pcapng", "a pcapng capture",      true,  looksLikePcapng, "", nullptr, capture::makePcapngWriter},
+    {"pcap",   "a pcap capture",        true,  looksLikePcap,   "", nullptr, capture::makePcapWriter},
+    {"jsonl",  "JSON Lines of lapdread", false, looksLikeJson, "",          make<JsonComposer>, nullptr},
+    {"csv",    "a CSV file of lapdread", false, looksLikeCsv,   csvHeader(), make<CsvComposer>, nullptr},
+    {"hex",    "lines of hexadecimal digits", false, looksLikeHex, "", nullptr, capture::makeHexWriter},
+    {"log",    "a log of lapdmon",      true,  looksLikeLog,    "", nullptr, makeLogWriter},
 };
 // clang-format on
 
@@ -68,7 +96,8 @@ const Form* formOfFile(std::string_view path) {
 void WriterConsumer::take(Chunk& chunk, std::size_t count) {
     reporting([&] {
         for (std::size_t i = 0; i < count; ++i)
-            writer_.write(*chunk.seen()[chunk.pieces[i].item].item);
+            roles_.take(chunk.seen()[chunk.pieces[i].item],
+                        [&](const capture::Item& item) { writer_.write(item); });
     });
 }
 
@@ -77,7 +106,10 @@ void WriterConsumer::flush() {
 }
 
 void WriterConsumer::finish() {
-    reporting([&] { writer_.finish(); });
+    reporting([&] {
+        roles_.giveUp([&](const capture::Item& item) { writer_.write(item); });
+        writer_.finish();
+    });
 }
 
 }  // namespace reader

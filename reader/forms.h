@@ -11,14 +11,15 @@
 #include "capture/Writer.h"
 #include "reader/Output.h"
 #include "reader/Pipeline.h"
+#include "reader/Roles.h"
 
 namespace reader {
 
 // A form is either text that composers make, a line an item, or what a writer makes of the items.
 struct Form {
-    std::string_view name;  // as --to and the end of a file's name have it
-    std::string_view what;  // "a pcapng capture"
-    bool binary;
+    std::string_view name;                           // as --to and the end of a file's name have it
+    std::string_view what;                           // "a pcapng capture"
+    bool binary;                                     // holds octets as they are, and so is not for a terminal
     bool (*looksRight)(std::string_view beginning);  // of a file of this form
     std::string_view header;                         // of text
     std::unique_ptr<Composer> (*makeComposer)();     // null if there is a writer
@@ -37,7 +38,7 @@ const Form* formOfFile(std::string_view path);
 // pipe has gone as ReaderGone, and what else cannot be written as FileError.
 class WriterConsumer : public Consumer {
   public:
-    explicit WriterConsumer(capture::Writer& writer) : writer_(writer) {}
+    WriterConsumer(capture::Writer& writer, Chatter& chatter) : writer_(writer), roles_(chatter) {}
 
     void take(Chunk& chunk, std::size_t count) override;
     void flush() override;
@@ -46,6 +47,7 @@ class WriterConsumer : public Consumer {
 
   private:
     capture::Writer& writer_;
+    Roles roles_;
 };
 
 // Composes nothing: the items themselves are wanted.

@@ -6,6 +6,7 @@
 #include <cstring>
 
 #include "capture/open.h"
+#include "lapdlog/log.h"
 #include "reader/Joined.h"
 #include "reader/errors.h"
 
@@ -18,7 +19,12 @@ std::unique_ptr<capture::Reader> openOne(const std::string& file, const InputOpt
     options.follow = input.follow;
     options.trunk = input.trunk;
     options.variant = input.variant;
-    return capture::openReader(file, options, capture::forms());
+    static const std::vector<capture::Form> known = [] {
+        std::vector<capture::Form> all{lapdlog::logForm};
+        all.insert(all.end(), capture::forms().begin(), capture::forms().end());
+        return all;
+    }();
+    return capture::openReader(file, options, known);
 }
 
 void checkReadable(const std::string& file) {

@@ -26,12 +26,13 @@ void beginAnewOnHangup() {
 // A file for each D channel.
 class Recorder : public Consumer {
   public:
-    Recorder(const RotationRules& rules, Chatter& chatter) : rules_(rules), chatter_(chatter) {}
+    Recorder(const RotationRules& rules, Chatter& chatter)
+        : rules_(rules), chatter_(chatter), roles_(chatter) {}
 
     void take(Chunk& chunk, std::size_t count) override {
         for (std::size_t i = 0; i < count; ++i) {
-            const capture::Item& item = *chunk.seen()[chunk.pieces[i].item].item;
-            fileOf(item).write(item);
+            roles_.take(chunk.seen()[chunk.pieces[i].item],
+                        [&](const capture::Item& item) { fileOf(item).write(item); });
         }
     }
 
@@ -45,6 +46,7 @@ class Recorder : public Consumer {
     }
 
     std::uint64_t finish() {
+        roles_.giveUp([&](const capture::Item& item) { fileOf(item).write(item); });
         std::uint64_t lost = 0;
         for (auto& [trunk, file] : files_) {
             file.finish();
@@ -61,6 +63,7 @@ class Recorder : public Consumer {
 
     const RotationRules& rules_;
     Chatter& chatter_;
+    Roles roles_;
     std::map<std::string, RotatingFile> files_;
 };
 

@@ -84,6 +84,12 @@ TEST(Pipeline, CountsTheTimeFromTheLineThatWasShownBefore) {
     EXPECT_EQ(run(6, {{"since", "+2", false}}, 0, 1), "  0.000 3\n  5.000 4\n  7.000 5\n  9.000 6\n");
 }
 
+TEST(Pipeline, MakesRoomForLongTimes) {
+    // The place of the time has 7 characters.
+    const std::string text = run(520, {}, 0, 1);
+    EXPECT_NE(text.find("\n997.000 500\n999.000 501\n1001.000 502\n1003.000 503\n"), std::string::npos);
+}
+
 TEST(Pipeline, EndsWhenEnoughFramesHavePassed) { EXPECT_EQ(run(600, {}, 2, 1), "  0.000 1\n  1.000 2\n"); }
 
 TEST(Pipeline, GivesTheSameTextWhateverTheNumberOfThreads) {
