@@ -126,7 +126,8 @@ void Maintenance::countRestart(const Message& message, const Target& target) {
             continue;
         storm = true;
         which = key.number >= wholeInterface ? "the interface" : "channel " + toString(key);
-        times.erase(times.begin(), times.end() - 1);  // said once, then counted anew
+        while (times.size() > 1)  // said once, then counted anew
+            times.pop_front();
     }
     if (storm)
         sink_.report(findingOf(findings::restartStorm, message, nullptr,
