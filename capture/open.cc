@@ -104,8 +104,11 @@ bool isStart(std::string_view name) {
 }  // namespace
 
 const Interface* Interfaces::of(const Interface& wanted) {
-    const auto found = std::find(interfaces_.begin(), interfaces_.end(), wanted);
-    return found == interfaces_.end() ? &interfaces_.emplace_back(wanted) : &*found;
+    for (const Interface& known : interfaces_) {
+        if (known == wanted)
+            return &known;
+    }
+    return &interfaces_.emplace_back(wanted);
 }
 
 std::span<const Form> forms() { return allForms; }

@@ -172,7 +172,8 @@ TEST(PcapngTest, PacketsOfOtherLinksAreSaidAndPassedOver) {
               "(LINUX_LAPD) or 203 (LAPD)\"\nframe 2 TX user 0ms 00017f\n");
     Octets alone = section();
     alone.block(1, interface(alone, 1, alone.body()));
-    EXPECT_EQ(itemsOf(alone), "!: link type 1 (EN10MB); a D-channel capture has 177 (LINUX_LAPD) or 203 (LAPD)\n");
+    EXPECT_EQ(itemsOf(alone),
+              "!: link type 1 (EN10MB); a D-channel capture has 177 (LINUX_LAPD) or 203 (LAPD)\n");
 }
 
 TEST(PcapngTest, DamageIsSaidWithItsPlace) {
