@@ -2,6 +2,8 @@
 #ifndef VELA_ASYNCMSGRECEIVER_H
 #define VELA_ASYNCMSGRECEIVER_H
 
+#include <utility>
+
 #include "vela/CompDesc.h"
 #include "vela/Msg.h"
 #include "vela/virtualObject.h"
@@ -12,7 +14,8 @@ class Addressable;
 class MsgQueue;
 
 // Registered with its owner's queue under the owner's target address, from the end of the most derived
-// constructor (a message may come at once) to the beginning of its destructor.
+// constructor (a message may come at once) to the beginning of its destructor. The base class cannot do that,
+// so a class derived from this one is abstract until it is made as an Enrolled (see below).
 class AsyncMsgReceiver : public virtualObject {
   public:
     explicit AsyncMsgReceiver(Addressable* owner) : owner_(owner) {}
@@ -34,9 +37,26 @@ class AsyncMsgReceiver : public virtualObject {
     void moveTo(MsgQueue* queue);
 
   private:
+    // Overridden by a class whose constructor ends with enrol() and whose destructor begins with leave().
+    virtual void enrolsItself() const = 0;
+
     Addressable* owner_;
     MsgQueue* queue_ = nullptr;  // the queue that it is registered with
     CompDesc_t source_;
+};
+
+// A receiver of the class, which is registered while it is whole:  Enrolled<Listener> listener(&object);
+template <typename Receiver>
+class Enrolled final : public Receiver {
+  public:
+    template <typename... Args>
+    explicit Enrolled(Args&&... args) : Receiver(std::forward<Args>(args)...) {
+        this->enrol();
+    }
+    ~Enrolled() override { this->leave(); }
+
+  private:
+    void enrolsItself() const override {}
 };
 
 }  // namespace vela

@@ -66,6 +66,8 @@ class EvtCallback : public AsyncMsgReceiver {
     void awaitCallbacksOf(const Callback* object) { deliveries_->awaitFor(object); }
 
   private:
+    void enrolsItself() const override {}
+
     struct callbackInfo : virtualObject {
         callbackInfo(const Handler& callback, unsigned int parameter, std::shared_ptr<Lane> itsLane = nullptr,
                      bool forNextAlone = false)

@@ -27,4 +27,10 @@ StdResource::MsgSetParm_t bound(parm, tooNarrow);
 void wrongReply(StdResource& resource, StdResource::MsgGetParmCmplt_t& reply) {
     resource.SetParm(10, 1, &reply);
 }
+#elif CASE == 6
+struct Listener : AsyncMsgReceiver {
+    using AsyncMsgReceiver::AsyncMsgReceiver;
+    void receive(Msg*) override {}
+};
+Listener neverRegistered(nullptr);
 #endif

@@ -12,10 +12,9 @@ using vela::MsgQueue;
 
 const CompDesc_t Ccs(1, 1, 1, 0x15, 0);
 
-class Receiver : public vela::AsyncMsgReceiver {
+class Listener : public vela::AsyncMsgReceiver {
   public:
-    explicit Receiver(Addressable* owner) : AsyncMsgReceiver(owner) { enrol(); }
-    ~Receiver() override { leave(); }
+    using AsyncMsgReceiver::AsyncMsgReceiver;
 
     void receive(Msg* msg) override {
         const std::unique_ptr<Msg> owned(msg);
@@ -27,6 +26,7 @@ class Receiver : public vela::AsyncMsgReceiver {
     std::atomic<unsigned int> type{0};
     bool fails = false;
 };
+using Receiver = vela::Enrolled<Listener>;
 
 class ReceiverTest : public TransportTest {
   protected:
