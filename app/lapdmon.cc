@@ -230,6 +230,7 @@ int runTrace(int argc, char** argv) {
     quit();           // now, because its outcome decides the exit status
     discardQueued();  // in case the start has failed
     closeLog();
+    vela::velaCleanup();
     return isWhole() ? status : EXIT_FAILURE;
 }
 

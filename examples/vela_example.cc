@@ -33,6 +33,7 @@ int main() try {
         frames.wait();
     ccs.CancelEvt(2, nullptr);
     ccs.SetParm(10, 0, nullptr);
+    vela::velaCleanup();
 } catch (const vela::Exception& exception) {
     std::cerr << exception << "\n";
     return 1;

@@ -107,6 +107,19 @@ TEST(DisplayEdge, AThrownMessageIsReportedAndEndsTheThread) {
     queueGuard.unlock();
 }
 
+}  // namespace
+}  // namespace app
+
+namespace {
+int hostCleanups = 0;
+}
+
+// Takes the place of KSHostCleanup, by the linker's --wrap.  NOLINTNEXTLINE(bugprone-reserved-identifier)
+extern "C" void __wrap__Z13KSHostCleanupv() { ++hostCleanups; }
+
+namespace app {
+namespace {
+
 // main, in its first request: there is no such board.
 class MainEdge : public ::testing::Test {
   protected:
@@ -144,6 +157,12 @@ class MainEdge : public ::testing::Test {
 TEST_F(MainEdge, AThrownMessageIsReportedAndTheStatusIs0) {
     EXPECT_EQ(traceThatMeets(throwMessage), 0);
     EXPECT_EQ(report(), messageCaught);
+}
+
+TEST_F(MainEdge, TheHostServicesAreCleanedUpOnce) {
+    hostCleanups = 0;
+    traceThatMeets(throwMessage);
+    EXPECT_EQ(hostCleanups, 1);
 }
 
 TEST_F(MainEdge, ALayersExceptionIsReportedAndTheStatusIs1) {
