@@ -96,6 +96,15 @@ class LaneTest : public EventTest {
         }
     }
 
+    // What the program said once every delivery's thread has ended: a thread says what was lost after its
+    // delivery is gone.
+    std::string said() {
+        end();
+        while (lane_.use_count() > 1)
+            std::this_thread::yield();
+        return errors_.text();
+    }
+
     Slow slow_;
     std::shared_ptr<Lane> lane_;
 };
@@ -170,8 +179,7 @@ TEST_F(LaneTest, TheNewestAreLostWhenTooManyWaitAndTheNextOneSaysHowMany) {
         EXPECT_EQ(given[i].arrival.number, i + 1);
         EXPECT_EQ(given[i].arrival.missing, i < 5 ? 0U : 4U);
     }
-    end();
-    EXPECT_EQ(errors_.text(), "too many deliveries waited, lost: 4\n");
+    EXPECT_EQ(said(), "too many deliveries waited, lost: 4\n");
 }
 
 TEST_F(LaneTest, TheyMayTakeSoMuchMemory) {
@@ -229,8 +237,7 @@ TEST_F(LaneTest, WhatWaitsIsNotLostWhileSomethingIsAtWorkAndThreadsAreRefused) {
     EXPECT_EQ(given[2].timestamp, 3U);
     EXPECT_EQ(given[2].arrival.number, 3U);
     EXPECT_EQ(given[2].arrival.missing, 1U);
-    end();
-    EXPECT_EQ(errors_.text(), "(EvtCallback_Class214) vela internal error\nvela::Thread::CreationError\n");
+    EXPECT_EQ(said(), "(EvtCallback_Class214) vela internal error\nvela::Thread::CreationError\n");
 }
 
 TEST_F(LaneTest, NothingWaitsForEverWhenThreadsAreRefusedAndNothingIsAtWork) {
@@ -269,8 +276,7 @@ TEST_F(LaneTest, OneWhoseBodyCannotBeMadeIsLostAndTheNextOneSaysSo) {
     EXPECT_EQ(given[1].arrival.missing, 1U);
     EXPECT_EQ(lane_->losses().noMeans, 1U);
     slow_.letEnd(All);
-    end();
-    EXPECT_EQ(errors_.text(), "(EvtCallback_Class219) vela internal error\n");
+    EXPECT_EQ(said(), "(EvtCallback_Class219) vela internal error\n");
 }
 
 // ---- Who does not wait.
