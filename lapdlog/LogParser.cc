@@ -50,7 +50,8 @@ class LogParser final : public capture::Parser {
     Found findFrame(std::string_view text, const Header& header, bool isAll, Item& item);
     Found findBetween(std::string_view text, bool isAll, Item& item);
     Found guess(std::string_view text, bool isAll);
-    Prover::Proof prove(std::string_view text, bool transmitted, bool isAll);
+    Prover::Proof prove(std::string_view text, const Header& header, bool isAll);
+    std::size_t untitledFrom(std::size_t at) const;
     void setFrame(const Prover::Proof& proof, const Header& header, std::int64_t host, Item& item);
 
     Item itemOf(Kind kind, std::string_view text = {}) const;
@@ -67,7 +68,9 @@ class LogParser final : public capture::Parser {
     HostTime hostTime_;
     BoardClock clock_;
     Prover prover_;
-    std::uint64_t line_ = 1;  // of the window's beginning
+    std::uint64_t line_ = 1;      // of the window's beginning
+    std::uint64_t position_ = 0;  // of the window's beginning, in octets
+    std::uint64_t untitled_ = 0;  // no title of a dump begins between the window's beginning and this place
     std::size_t found_ = 0;
     std::size_t toConsume_ = 0;
     bool isDoubtful_ = false;   // the frame found last would be another one if its dump went on
@@ -159,7 +162,8 @@ LogParser::Found LogParser::findFrame(std::string_view text, const Header& heade
             guessed == Found::more)
             return guessed;
     }
-    const Prover::Proof proof = prove(text, header.transmitted, isAll);
+    const Prover::Proof proof = prove(text, header, isAll);
+    untitled_ = position_ + header.size + proof.untitled;
     isDoubtful_ = proof.isDoubtful && !isAll;
     if (proof.reading == Reading::cut || isDoubtful_)
         return Found::more;
@@ -174,25 +178,33 @@ LogParser::Found LogParser::findFrame(std::string_view text, const Header& heade
 
 // A frame that is proved by another variant than the last ones tells that the variant is another one from
 // here on.
-Prover::Proof LogParser::prove(std::string_view text, bool transmitted, bool isAll) {
-    const Prover::Proof proof = prover_.prove(text, transmitted, interface_->variant, isAll);
+Prover::Proof LogParser::prove(std::string_view text, const Header& header, bool isAll) {
+    const auto proveBy = [&](Variant variant) {
+        return prover_.prove(text, header.transmitted, variant, isAll, untitledFrom(header.size));
+    };
+    const Prover::Proof proof = proveBy(interface_->variant);
     if (proof.reading == Reading::good || !proof.sawDump || isChosen_)
         return proof;
     for (const Variant variant : allVariants) {
-        if (prover_.prove(text, transmitted, variant, isAll).reading != Reading::good)
+        if (proveBy(variant).reading != Reading::good)
             continue;
         use(variant);
         text_ = "from here on the text is that of a trunk of variant " + std::string(variantName(variant));
         before_.push_back(itemOf(Kind::comment, text_));
         break;
     }
-    return prover_.prove(text, transmitted, interface_->variant, isAll);
+    return proveBy(interface_->variant);
+}
+
+// How far behind this place of the window it is known that no title of a dump begins.
+std::size_t LogParser::untitledFrom(std::size_t at) const {
+    return untitled_ > position_ + at ? static_cast<std::size_t>(untitled_ - position_ - at) : 0;
 }
 
 // The text begins with a frame.
 LogParser::Found LogParser::guess(std::string_view text, bool isAll) {
     bool mayCome = false;
-    const std::vector<Variant> fitting = variantsThatFit(text, prover_, isAll, mayCome);
+    const std::vector<Variant> fitting = variantsThatFit(text, prover_, isAll, untitledFrom(0), mayCome);
     if (fitting.empty())
         return mayCome ? Found::more : Found::nothing;
     use(likeliestOf(fitting));
@@ -243,6 +255,7 @@ Reader::Next LogParser::deliver(Item& item) {
 
 void LogParser::consume(std::size_t octets) {
     line_ += lineEndsIn(source_.held().substr(0, octets));
+    position_ += octets;
     source_.consume(octets);
 }
 

@@ -1,5 +1,6 @@
 #include "lapdlog/Prover.h"
 
+#include <algorithm>
 #include <cstring>
 
 #include "capture/hex_digits.h"
@@ -88,13 +89,16 @@ std::string_view Prover::decode(bool transmitted, capture::Variant variant) {
     return text;
 }
 
-Prover::Proof Prover::prove(std::string_view text, bool transmitted, capture::Variant variant, bool isAll) {
+Prover::Proof Prover::prove(std::string_view text, bool transmitted, capture::Variant variant, bool isAll,
+                            std::size_t untitled) {
     Proof proof;
     proof.reading = readOversized(text, transmitted, proof.size);
     proof.isOversized = proof.reading == Reading::good;
     if (proof.reading == Reading::good)
         return proof;
-    std::size_t at = findDump(text, 0);
+    std::size_t at = findDump(text, std::min(untitled, text.size()));
+    proof.untitled =
+        at != std::string_view::npos ? at : text.size() - std::min(text.size(), dumpTitle.size() - 1);
     int dumps = 0;
     for (; at != std::string_view::npos && dumps < mostDumps; at = findDump(text, at + 1), ++dumps) {
         std::size_t end = at + dumpTitle.size();
@@ -107,7 +111,7 @@ Prover::Proof Prover::prove(std::string_view text, bool transmitted, capture::Va
             continue;
         const std::string_view decoded = decode(transmitted, variant);
         if (decoded.size() == end && decoded == text.substr(0, end))
-            return {Reading::good, false, dump == Dump::wholeSoFar, true, end, octets_};
+            return {Reading::good, false, dump == Dump::wholeSoFar, true, end, proof.untitled, octets_};
     }
     const bool canCome = dumps < mostDumps && text.size() < longestText;
     proof.reading = canCome && !isAll ? Reading::cut : Reading::bad;

@@ -19,15 +19,18 @@ class Prover {
     struct Proof {
         Reading reading = Reading::bad;  // cut: more text could still prove
         bool isOversized = false;
-        bool isDoubtful = false;  // the text ends where the dump could have another line
-        bool sawDump = false;     // a whole one
-        std::size_t size = 0;     // of the text, when good
+        bool isDoubtful = false;   // the text ends where the dump could have another line
+        bool sawDump = false;      // a whole one
+        std::size_t size = 0;      // of the text, when good
+        std::size_t untitled = 0;  // no title of a dump begins before this place
         // Valid until the next call. Of a text that is not proved: those of a dump in which it ends.
         std::span<const std::uint8_t> octets;
     };
 
-    // `text` begins behind the time lines. `isAll`: no more of it will come.
-    Proof prove(std::string_view text, bool transmitted, capture::Variant variant, bool isAll);
+    // `text` begins behind the time lines. `isAll`: no more of it will come. `untitled`: no title of a dump
+    // begins before this place, as an earlier proof has found.
+    Proof prove(std::string_view text, bool transmitted, capture::Variant variant, bool isAll,
+                std::size_t untitled = 0);
 
   private:
     enum class Dump : std::uint8_t { whole, wholeSoFar, cut, bad };

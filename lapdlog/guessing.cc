@@ -14,7 +14,8 @@ constexpr int mostFrames = 1000;
 
 }  // namespace
 
-std::vector<Variant> variantsThatFit(std::string_view text, Prover& prover, bool isAll, bool& mayCome) {
+std::vector<Variant> variantsThatFit(std::string_view text, Prover& prover, bool isAll, std::size_t untitled,
+                                     bool& mayCome) {
     std::vector<Variant> fitting(allVariants.begin(), allVariants.end());
     mayCome = false;
     for (int frames = 0; frames < mostFrames; ++frames) {
@@ -24,7 +25,8 @@ std::vector<Variant> variantsThatFit(std::string_view text, Prover& prover, bool
         std::size_t size = 0;
         for (const Variant variant : read == Reading::good ? fitting : std::vector<Variant>()) {
             const Prover::Proof proof =
-                prover.prove(text.substr(header.size), header.transmitted, variant, isAll);
+                prover.prove(text.substr(header.size), header.transmitted, variant, isAll,
+                             frames == 0 ? untitled - std::min(untitled, header.size) : 0);
             mayCome = mayCome || (frames == 0 && proof.reading == Reading::cut);
             if (proof.reading == Reading::good) {
                 stillFitting.push_back(variant);

@@ -206,6 +206,14 @@ TEST_F(LogTest, ATextOfAnotherVariantIsSaid) {
         << items;
 }
 
+TEST_F(LogTest, TimeLinesWithoutEndAreReadInTheirTime) {
+    std::string text = net5Head;
+    for (int i = 0; i < 50'000; ++i)
+        text += "\nSat Nov 21 11:25:33 2026\nRX Frame: Time = 0.300\n";
+    const std::string items = itemsIn(text);
+    EXPECT_EQ(std::count(items.begin(), items.end(), '\n'), 50'001);
+}
+
 TEST_F(LogTest, TicksThatFallAreARestart) {
     EXPECT_EQ(itemsIn(net5Head + textOf(false, 500, ua) + textOf(false, 498, ua) + textOf(false, 100, ua)),
               "run 1 net5\n"
