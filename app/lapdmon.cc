@@ -8,6 +8,7 @@
 #include <iostream>
 #include <memory>
 #include <mutex>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -89,22 +90,6 @@ vela::Instance findDChannel(vela::Board& board) {
     }
 }
 
-// Sets the variant by which frames are decoded. Returns false for a type that cannot be decoded.
-bool setProtocol(unsigned int type) {
-    std::cout << "CCS protocol type is " << type << std::endl;
-    const Protocol* const protocol = protocolOf(type);
-    if (protocol == nullptr) {
-        std::cerr << "Unknow Protocol -- I don't know how to interprete. "
-                  << "Program is terminating!" << std::endl;
-        return false;
-    }
-    trunkVariant = protocol->variant;
-    std::cout << protocol->screenLine << std::endl;
-    decoder::text(protocol->logLine);
-    decoder::flushLines();
-    return true;
-}
-
 // Switches the trace on. Once the board reports events, quit() switches the trace off and destroys the
 // instance.
 void startTrace(std::unique_ptr<vela::CCS> opened) {
@@ -141,8 +126,10 @@ int trace(int argc, char** argv) {
     std::unique_ptr<vela::CCS> opened = openCcs(instance);
     vela::StdResource::MsgGetParmCmplt_t reply;
     opened->GetParm(ProtocolTypeParm, &reply);
-    if (!setProtocol(reply.Val))
+    const std::optional<int> variant = reportProtocol(reply.Val);
+    if (!variant)
         return EXIT_FAILURE;  // nothing has been switched on yet
+    trunkVariant = *variant;
     startTrace(std::move(opened));
     return untilEnded();
 }

@@ -1,7 +1,6 @@
 #include "app/operator.h"
 
 #include <fcntl.h>
-#include <poll.h>
 #include <unistd.h>
 
 #include <array>
@@ -40,9 +39,9 @@ void wakeWaiter() {
 
 // Waits until a signal comes or the board is lost, until the input can be read, or until the time is over.
 // Returns true in the first two cases. With input -1 it does not watch the input.
-bool awaitSignal(int timeoutMs, int input) {
+bool awaitSignal(Poll wait, int timeoutMs, int input) {
     std::array<pollfd, 2> waited{pollfd{signalled[0], POLLIN, 0}, pollfd{input, POLLIN, 0}};
-    while (poll(waited.data(), waited.size(), timeoutMs) < 0 && errno == EINTR) {
+    while (wait(waited.data(), waited.size(), timeoutMs) < 0 && errno == EINTR) {
     }
     return waited[0].revents != 0;
 }
@@ -95,25 +94,25 @@ void boardLost() {
 namespace {
 
 // Waits until a "q" is read or the pipe is written to.
-void awaitEnd() {
+void awaitEnd(Poll wait) {
     constexpr int NoInput = -1;
     int input = STDIN_FILENO;
-    while (!awaitSignal(ForEver, input)) {
+    while (!awaitSignal(wait, ForEver, input)) {
         char typed = 0;
         const ssize_t got = read(STDIN_FILENO, &typed, 1);
         if (got == 1 && typed == 'q')
             return;
         if (got == 0 || (got < 0 && errno != EINTR && errno != EAGAIN))
             input = NoInput;
-        if (awaitSignal(PauseMs, NoInput))
+        if (awaitSignal(wait, PauseMs, NoInput))
             return;
     }
 }
 
 }  // namespace
 
-Ending awaitQuit() {
-    awaitEnd();
+Ending awaitQuit(Poll wait) {
+    awaitEnd(wait);
     return lost ? Ending::BoardLost : Ending::Asked;
 }
 

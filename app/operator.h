@@ -2,6 +2,8 @@
 #ifndef APP_OPERATOR_H
 #define APP_OPERATOR_H
 
+#include <poll.h>
+
 namespace app {
 
 // Installs the signal handler. From now on a signal has an effect that depends on the state of the trace:
@@ -38,7 +40,9 @@ enum class Ending { Asked, BoardLost };
 // Waits until "q" is read from the standard input, a signal comes, or boardLost is called. After any other
 // character it does not read for 10 seconds. After the end of the input only a signal or boardLost ends the
 // wait.
-Ending awaitQuit();
+// `wait` waits for descriptors as poll does.
+using Poll = int (*)(pollfd* waited, nfds_t count, int timeoutMs);
+Ending awaitQuit(Poll wait = ::poll);
 
 // Call it when the board cannot be reached any more. Any thread may call it after watchSignals has returned.
 void boardLost();

@@ -2,6 +2,9 @@
 
 #include <algorithm>
 #include <array>
+#include <iostream>
+
+#include "decoder/lines.h"
 
 #include "decoder/log_lines.h"
 
@@ -26,6 +29,20 @@ const Protocol* protocolOf(unsigned int type) {
     const auto* const found = std::find_if(Protocols.begin(), Protocols.end(),
                                            [type](const Protocol& p) { return p.type == type; });
     return found == Protocols.end() ? nullptr : found;
+}
+
+std::optional<int> reportProtocol(unsigned int type) {
+    std::cout << "CCS protocol type is " << type << std::endl;
+    const Protocol* const protocol = protocolOf(type);
+    if (protocol == nullptr) {
+        std::cerr << "Unknow Protocol -- I don't know how to interprete. "
+                  << "Program is terminating!" << std::endl;
+        return std::nullopt;
+    }
+    std::cout << protocol->screenLine << std::endl;
+    decoder::text(protocol->logLine);
+    decoder::flushLines();
+    return protocol->variant;
 }
 
 }  // namespace app

@@ -2,6 +2,7 @@
 #ifndef APP_PROTOCOL_H
 #define APP_PROTOCOL_H
 
+#include <optional>
 #include <string_view>
 
 namespace app {
@@ -15,6 +16,10 @@ struct Protocol {
 
 // Returns null for a type that cannot be decoded.
 const Protocol* protocolOf(unsigned int type);
+
+// Says on the screen and in the log what the trunk reports. Returns the variant by which its frames are
+// decoded; nothing, and a line on the standard error stream, for a type that cannot be decoded.
+std::optional<int> reportProtocol(unsigned int type);
 
 }  // namespace app
 

@@ -3,10 +3,14 @@
 #include <gtest/gtest.h>
 
 #include <atomic>
+#include <iostream>
+#include <streambuf>
 #include <string>
+#include <utility>
 
 #include "tests/app/channels.h"
 #include "tests/app/records.h"
+#include "tests/support/test_system.h"
 
 namespace app {
 namespace {
@@ -152,6 +156,73 @@ TEST_F(Display, DiscardsWhatWasStillQueued) {
     discardQueued();
     EXPECT_EQ(destroyed_, 50);
     EXPECT_TRUE(event_queue.isempty());
+}
+
+TEST_F(Display, LooksForARecordEvery10Milliseconds) {
+    SleeplessSystem system;
+    std::atomic<int> naps = 0;
+    system.insteadOfNapping = [&] {
+        ++naps;
+        naps.notify_all();
+    };
+    Process.start(nullptr);
+    for (int seen = naps; seen < 5; seen = naps)
+        naps.wait(seen);
+    Process.cancel();
+    Process.join();
+    for (const long nap : system.naps())
+        EXPECT_EQ(nap, 10000);
+}
+
+TEST_F(Display, EndsBeforeTheRecordThatItFindsWhenItIsCancelled) {
+    SleeplessSystem system;
+    system.insteadOfNapping = [this, first = true]() mutable {
+        if (!std::exchange(first, false))
+            return;
+        arrives(CountedRecord::make(destroyed_));
+        Process.cancel();
+    };
+    Process.start(nullptr);
+    Process.join();
+    EXPECT_EQ(event_queue.queuecount(), 1);
+    EXPECT_EQ(destroyed_, 0);
+    EXPECT_EQ(log_.text(), "");
+}
+
+// Notes, when something is written to it, whether the queue is locked.
+class LockObserver : public std::streambuf {
+  public:
+    LockObserver() : before_(std::cout.rdbuf(this)) {}
+    ~LockObserver() override { std::cout.rdbuf(before_); }
+    LockObserver(const LockObserver&) = delete;
+    LockObserver& operator=(const LockObserver&) = delete;
+
+    std::atomic<bool> wasLocked = false;
+
+  protected:
+    int_type overflow(int_type character) override { return character; }
+    std::streamsize xsputn(const char*, std::streamsize size) override {
+        wasLocked = !queueGuard.tryLock();
+        if (!wasLocked)
+            queueGuard.unlock();
+        return size;
+    }
+
+  private:
+    std::streambuf* before_;
+};
+
+TEST_F(Display, HoldsTheQueueLockedWhileItShowsARecord) {
+    Record* const rec = CountedRecord::make(destroyed_);
+    rec->Label = 3;  // is reported on the screen
+    arrives(rec);
+    const LockObserver screen;
+    Process.start(nullptr);
+    for (int gone = destroyed_; gone < 1; gone = destroyed_)
+        destroyed_.wait(gone);
+    EXPECT_TRUE(screen.wasLocked);
+    Process.cancel();
+    Process.join();
 }
 
 }  // namespace

@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include "tests/app/channels.h"
+
 #include "decoder/trunks.h"
 
 namespace app {
@@ -26,6 +28,25 @@ TEST(Protocol, HasAVariantAndALineForTheScreenAndForTheLog) {
 TEST(Protocol, OfAnyOtherTypeIsUnknown) {
     for (const unsigned int type : {0U, 5U, 6U, 8U, 9U, 10U, 11U, 13U, 0x10007U, 0xFFFFFFFFU})
         EXPECT_EQ(protocolOf(type), nullptr) << type;
+}
+
+TEST(Protocol, OfType12IsReportedAsNI2AndDecodedAsVariant10) {
+    const testing::Screen screen;
+    const testing::Log log;
+    EXPECT_EQ(reportProtocol(12), 10);
+    EXPECT_EQ(screen.text(), "CCS protocol type is 12\nNI2 Switch\n");
+    EXPECT_EQ(log.text(), "NI2 Switch \n");
+}
+
+TEST(Protocol, ThatCannotBeDecodedIsReportedAndNotLogged) {
+    const testing::Screen screen;
+    const testing::Log log;
+    ::testing::internal::CaptureStderr();
+    EXPECT_EQ(reportProtocol(10), std::nullopt);
+    EXPECT_EQ(::testing::internal::GetCapturedStderr(),
+              "Unknow Protocol -- I don't know how to interprete. Program is terminating!\n");
+    EXPECT_EQ(screen.text(), "CCS protocol type is 10\n");
+    EXPECT_EQ(log.text(), "");
 }
 
 }  // namespace

@@ -1,6 +1,7 @@
 """What passes between program and board from start to stop, and what happens when the board does not play along."""
 
 import re
+import signal
 import unittest
 
 from harness import SystemTest
@@ -86,6 +87,16 @@ class Lifecycle(SystemTest):
         self.assertRegex(program.screen.text(),
                          r"One moment. Program Exiting\n" + refusal(26) +
                          r"general Exception caught in lapdmon\(215\)\n\Z")
+        self.assertEqual(program.talk.lines()[-2:], ["heard 26", "heard 8"])
+        self.assertTrue(program.log().endswith("Frame Error \n"))
+
+    def test_whoever_leaves_by_exit_switches_the_trace_off_too(self):
+        program = self.on_other_library("exits")
+        program.screen.wait("Frame Error")
+        program.gets(signal.SIGUSR1)
+        program.ends(status=5)
+        self.assertEqual(program.screen.lines()[-2:],
+                         ["One moment. Program Exiting", "general Exception caught in lapdmon(215)"])
         self.assertEqual(program.talk.lines()[-2:], ["heard 26", "heard 8"])
         self.assertTrue(program.log().endswith("Frame Error \n"))
 

@@ -6,12 +6,14 @@
 //     no-memory    there are no message buffers       silent=26    message type 26 is not answered
 //     no-queue     there are no queues                error=26     message type 26 is answered with an error
 //     short        before the frame come events that end within their fields
+//     exits        SIGUSR1 makes a thread of the library's leave the process with exit(5)
 //     flood        300 events come before the answer to a subscription
 #include <fcntl.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <condition_variable>
+#include <csignal>
 #include <cstdarg>
 #include <cstdlib>
 #include <cstring>
@@ -20,6 +22,7 @@
 #include <memory>
 #include <mutex>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "norv/norv.h"
@@ -55,6 +58,21 @@ void talk(const std::string& line) {
         static_cast<void>(!write(file, text.data(), text.size()));
 }
 
+// Before the program has any other thread, so that all of them leave the signal to this one.
+__attribute__((constructor)) void waitForTheSignalToExit() {
+    if (!told("exits"))
+        return;
+    sigset_t signals{};
+    sigemptyset(&signals);
+    sigaddset(&signals, SIGUSR1);
+    pthread_sigmask(SIG_BLOCK, &signals, nullptr);
+    std::thread([signals] {
+        int number = 0;
+        sigwait(&signals, &number);
+        std::exit(5);
+    }).detach();
+}
+
 NvMsg32Bit* allocate(std::size_t size) {
     auto* const msg = static_cast<NvMsg32Bit*>(std::calloc(1, size + NVMSG_OVERHEAD));
     if (msg != nullptr)
@@ -69,10 +87,16 @@ struct Queue {
     bool open = true;
 };
 
-std::mutex lock;
-std::condition_variable changed;
-std::map<std::uint32_t, std::shared_ptr<Queue>>
-    queues;  // by handle, which is also the host's instance number
+// Never destroyed, because threads may still wait for a message when the process exits.
+template <typename Shared>
+Shared& forEver() {
+    return *std::make_unique<Shared>().release();
+}
+
+std::mutex& lock = forEver<std::mutex>();
+std::condition_variable& changed = forEver<std::condition_variable>();
+using Queues = std::map<std::uint32_t, std::shared_ptr<Queue>>;
+Queues& queues = forEver<Queues>();  // by handle, which is also the host's instance number
 
 void deliver(std::uint32_t handle, NvMsg32Bit* msg) {
     const auto found = queues.find(handle);
