@@ -45,8 +45,8 @@ class Output {
     const std::string& name() const { return name_; }
 
   private:
-    static constexpr std::size_t most_ = 256 * 1024;
-    static constexpr std::size_t large_ = 64 * 1024;  // worth a write of its own, to save a copy
+    static constexpr std::size_t most_ = 256UL * 1024;
+    static constexpr std::size_t large_ = 64UL * 1024;  // worth a write of its own, to save a copy
 
     void writeThrough(std::string_view text);
 

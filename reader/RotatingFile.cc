@@ -19,7 +19,7 @@ namespace {
 
 using Kind = capture::Item::Kind;
 
-constexpr std::uint64_t mostPending = 64 * 1024;
+constexpr std::uint64_t mostPending = 64UL * 1024;
 constexpr char unfinished[] = ".part";
 
 std::int64_t secondOf(const capture::Item& item) {
@@ -74,12 +74,14 @@ std::string RotatingFile::pathOf(std::int64_t second) const {
     std::tm utc{};
     gmtime_r(&time, &utc);
     char start[40];
-    std::strftime(start, sizeof start, "%Y%m%dT%H%M%SZ", &utc);
+    start[std::strftime(start, sizeof start, "%Y%m%dT%H%M%SZ", &utc)] = '\0';
     const std::string beginning = rules_.folder + "/" + trunk_ + "." + start;
     const std::string end = "." + std::string(rules_.form->name);
     std::string path = beginning + end;
-    for (int i = 2; std::filesystem::exists(path) || std::filesystem::exists(path + unfinished); ++i)
-        path = beginning + "." + std::to_string(i) + end;
+    for (int i = 2; std::filesystem::exists(path) || std::filesystem::exists(path + unfinished); ++i) {
+        path = beginning;
+        ((path += '.') += std::to_string(i)) += end;
+    }
     return path;
 }
 

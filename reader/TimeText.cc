@@ -131,7 +131,7 @@ std::int64_t absoluteIn(const std::smatch& part) {
     } else {
         seconds = timegm(&fields);
         if (part[9].matched) {
-            const int minutes = numberIn(part[10]) * 60 + numberIn(part[11]);
+            const std::int64_t minutes = std::int64_t{numberIn(part[10])} * 60 + numberIn(part[11]);
             seconds -= (part[9].str() == "-" ? -60 : 60) * minutes;
         }
     }

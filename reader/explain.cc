@@ -84,7 +84,7 @@ void ExplainComposer::putRow(std::string& text, const isdn::Field& field) {
     }
     appendPadded(text, hex, hexWidth);
     appendPadded(text, bits, bitsWidth);
-    appendPadded(text, std::string(2U * field.depth, ' ') + std::string(field.name), nameWidth);
+    appendPadded(text, std::string(std::size_t{2} * field.depth, ' ') + std::string(field.name), nameWidth);
     const bool isNumber = field.kind != isdn::Field::Kind::text && field.at.size() <= sizeof field.value;
     appendPadded(text, isNumber ? number(field.value) : "", valueWidth, true);
     appendSafe(text, field.meaning);

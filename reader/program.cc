@@ -34,7 +34,7 @@ int fail(ExitStatus status, const std::string& why) {
 }  // namespace
 
 int runProgram(const std::vector<std::string>& words) {
-    std::signal(SIGPIPE, SIG_IGN);
+    static_cast<void>(std::signal(SIGPIPE, SIG_IGN));
     try {
         return run(words);
     } catch (const ReaderGone&) {

@@ -52,9 +52,10 @@ class Terminal(Folder):
         display = b"\x1b[2J\x1b]0;evil\x07\x1b[31mred\x9b1m\n"
         setup = bytes([0x02, 0x01, 0, 0, 8, 1, 1, 5, 0x28, len(display)]) + display
         (self.folder / "evil.hex").write_text(f"RX 2026-11-21T11:25:33Z {setup.hex()}\n")
-        for command in ("list", "decode", "explain", "convert --to csv", "convert --to jsonl"):
-            self.type(f"clear; {LAPDREAD} {command} --quiet --color never evil.hex; echo end")
-            screen = self.shows("\nend", "-e", "-J")
+        commands = ("list", "decode", "explain", "convert --to csv", "convert --to jsonl")
+        for number, command in enumerate(commands):
+            self.type(f"clear; {LAPDREAD} {command} --quiet --color never evil.hex; echo end{number}")
+            screen = self.shows(f"\nend{number}", "-e", "-J")
             self.assertNotIn("\x1b[31m", screen, command)
             self.assertTrue("x1b[31mred" in screen or "u001b[31mred" in screen, screen)
             self.assertNotEqual(self.tmux("display-message", "-p", "#{pane_title}").strip(), "evil", command)
