@@ -16,10 +16,12 @@ constexpr std::size_t itemsInChunk = 256;
 constexpr std::size_t chunksForEachThread = 3;
 constexpr std::chrono::milliseconds longestWait{500};
 
-void composeChunk(Chunk& chunk, const Filter& filter, Composer& composer) {
+// Where links are left alone nobody asks for headers either.
+void composeChunk(Chunk& chunk, const Filter& filter, Composer& composer, bool readsHeaders) {
     for (std::size_t i = 0; i < chunk.size(); ++i) {
         Seen& seen = chunk.seen()[i];
-        readHeaders(seen);
+        if (readsHeaders)
+            readHeaders(seen);
         if (!filter.passes(seen))
             continue;
         Piece piece{.item = i, .instant = {seen.when.clock, seen.at}};
@@ -66,8 +68,10 @@ class Run {
     std::vector<Crew::Job> jobs() {
         std::vector<Crew::Job> jobs;
         for (unsigned i = 0; i < work_.jobs; ++i) {
-            jobs.emplace_back([this, composer = std::shared_ptr<Composer>(work_.makeComposer())](
-                                  Chunk& chunk) { composeChunk(chunk, filter_, *composer); });
+            jobs.emplace_back(
+                [this, composer = std::shared_ptr<Composer>(work_.makeComposer())](Chunk& chunk) {
+                    composeChunk(chunk, filter_, *composer, tracker_.followsLinks());
+                });
         }
         return jobs;
     }

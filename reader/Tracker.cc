@@ -20,7 +20,8 @@ Seen Tracker::see(const capture::Item& item) {
     seen.variant = standardVariant(variantOf(item));
     Channel& channel = channelOf(item.frame);
     tellTime(channel, seen);
-    follow(channel, seen);
+    if (followsLinks_)
+        follow(channel, seen);
     return seen;
 }
 

@@ -29,6 +29,10 @@ class Tracker {
         done_ = done;
     }
 
+    // From now on frames are numbered and nothing else: links take time, and not every command asks for them.
+    void leaveLinksAlone() { followsLinks_ = false; }
+    bool followsLinks() const { return followsLinks_; }
+
     // The headers themselves are left to whoever looks at the frame, see readHeaders.
     Seen see(const capture::Item& item);
 
@@ -47,6 +51,7 @@ class Tracker {
 
     capture::Role role_;
     capture::Variant variant_;
+    bool followsLinks_ = true;
     std::uint64_t frames_ = 0;
     std::optional<std::int64_t> first_;                     // on the clocks of the D channels
     std::map<std::string, Channel, std::less<>> channels_;  // by the name of the D channel

@@ -98,6 +98,7 @@ void LogTextComposer::compose(const Seen& seen, std::string& text, Piece& /*piec
 int runDecode(const Options& options, Chatter& chatter) {
     Session session(options, chatter);
     session.tellGuessedVariant("decoded");
+    session.needOnlyOctets();
     TextConsumer consumer(session.output(), TextConsumer::Raw::yes);
     session.run(consumer, [] { return std::make_unique<LogTextComposer>(); });
     return good;

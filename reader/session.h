@@ -35,6 +35,12 @@ class Session {
     // Says so once if frames are `done` ("decoded") by the rules of a variant that nobody has named.
     void tellGuessedVariant(std::string_view done) { tracker_.tellGuessedVariant(chatter_, done); }
 
+    // The command looks at octets and times alone: without filters nothing else has to be found out.
+    void needOnlyOctets() {
+        if (options_.filters.empty())
+            tracker_.leaveLinksAlone();
+    }
+
     // Hands all that passes the filters on to the consumer. Throws FileError for an input that cannot be
     // read.
     void run(Consumer& consumer, const std::function<std::unique_ptr<Composer>()>& makeComposer);
