@@ -22,7 +22,7 @@ def refreshed(text):
         result.append(line)
         if line.startswith(INDENT + "$ "):
             output = told(line[len(INDENT) + 2:])
-            result.extend((INDENT + out).rstrip() for out in output.splitlines())
+            result.extend((INDENT + out).rstrip() for out in output.rstrip("\n").splitlines())
             skipping = True
     return "\n".join(result) + "\n"
 
