@@ -83,7 +83,7 @@ vela::Instance findDChannel(vela::Board& board) {
     try {
         return board.findInst(CcsType, AnyProcessor, static_cast<unsigned short>(INST_NUM));
     } catch (const vela::Addressable::UnexpectedMsg&) {
-        std::cerr << "lapdmon: board " + std::to_string(boardnumber) + " has no D channel " +
+        std::cerr << "lapdmon: board " + std::to_string(boardnumber) + " found no D channel " +
                          std::to_string(INST_NUM) + "\n"
                   << std::flush;
         throw;

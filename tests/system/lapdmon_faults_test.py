@@ -88,7 +88,9 @@ def reply_row(fault, number):
         screen = timeout(number)
     source, kind = BANNER.format("Source sent to MsgQueue"), BANNER.format(f"MsgType {reply}\n")
     errors = ""
-    if fault == "reply-other-source":
+    if fault in REFUSED and number == 2:
+        errors = "lapdmon: board 1 found no D channel 1\n"
+    elif fault == "reply-other-source":
         errors = source
     elif fault in ("reply-wrong-transaction", "reply-twice"):
         errors = source if number < 4 else f"(?:{source}|{kind})"

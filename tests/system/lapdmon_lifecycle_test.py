@@ -59,7 +59,7 @@ class Lifecycle(SystemTest):
 
     def test_a_D_channel_that_is_not_there_is_reported(self):
         program = self.on_board(run=("lapdmon", "-b1", "-d9")).ends(
-            status=1, errors="lapdmon: board 1 has no D channel 9\n")
+            status=1, errors="lapdmon: board 1 found no D channel 9\n")
         screen = program.screen.lines()
         self.assertEqual(screen[5], "TSC Component Information{Node 0 Board 1 Processor 1 Component 18 Instance 0}")
         self.assertEqual(screen[6], "vela Exception caught")
