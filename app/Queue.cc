@@ -5,18 +5,23 @@
 
 namespace vela {
 
-// One node at a time: letting the head go would recurse once a node.
+// Deletes one node at a time, because deleting the head would delete the others recursively.
 Queue::~Queue() {
-    while (head_ != nullptr)
-        head_ = std::move(head_->next);
+    for (std::unique_ptr<Node>* list : {&head_, &spares_}) {
+        while (*list != nullptr)
+            *list = std::move((*list)->next);
+    }
 }
 
 bool Queue::enqueue(CCS::EvtL2Trace_t* rec) {
     if (isfull())
         return false;
-    std::unique_ptr<Node> node(new (std::nothrow) Node{rec, nullptr});
-    if (node == nullptr)
+    std::unique_ptr<Node> node = std::move(spares_);
+    if (node != nullptr)
+        spares_ = std::move(node->next);
+    else if (node.reset(new (std::nothrow) Node{}); node == nullptr)
         return false;
+    node->record = rec;
     ++count_;
     Node* const newest = node.get();
     (head_ == nullptr ? head_ : tail_->next) = std::move(node);
@@ -29,9 +34,12 @@ bool Queue::dequeue(CCS::EvtL2Trace_t** out) {
         return false;
     *out = head_->record;
     --count_;
-    head_ = std::move(head_->next);
+    std::unique_ptr<Node> emptied = std::move(head_);
+    head_ = std::move(emptied->next);
     if (count_ == 0)
         tail_ = nullptr;
+    emptied->next = std::move(spares_);
+    spares_ = std::move(emptied);
     return true;
 }
 

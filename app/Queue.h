@@ -1,4 +1,4 @@
-// The records waiting to be shown.
+// The queue of records that wait to be written.
 #ifndef APP_QUEUE_H
 #define APP_QUEUE_H
 
@@ -8,7 +8,9 @@
 
 namespace vela {
 
-// Bounded, first in first out. Never owns a record: that belongs to whoever holds its pointer. Not locked.
+// First in, first out, with a limit. It does not own the records: whoever enqueues a record gives it to the
+// thread that dequeues it. The class has no lock. It uses its nodes again, so it allocates memory only while
+// more records wait than ever before.
 class Queue {
   public:
     explicit Queue(int capacity) : capacity_(capacity) {}
@@ -16,9 +18,9 @@ class Queue {
     Queue& operator=(const Queue&) = delete;
     ~Queue();
 
-    // False when the queue is full or there is no memory.
+    // Returns false when the queue is full or there is no memory.
     bool enqueue(CCS::EvtL2Trace_t* rec);
-    // False when the queue is empty.
+    // Sets *out to the oldest record. Returns false when the queue is empty.
     bool dequeue(CCS::EvtL2Trace_t** out);
 
     bool isempty() const { return count_ == 0; }
@@ -32,6 +34,7 @@ class Queue {
     };
 
     std::unique_ptr<Node> head_;  // the oldest
+    std::unique_ptr<Node> spares_;
     Node* tail_ = nullptr;
     int count_ = 0;
     int capacity_;

@@ -10,14 +10,14 @@ thread_local const Deliveries::OnThisThread* innermost = nullptr;
 
 void Deliveries::begin(const void* object) {
     const std::lock_guard guard(mutex_);
-    ++begun_[object];
+    if (object != nullptr)
+        ++begun_[object];
     ++all_;
 }
 
 void Deliveries::end(const void* object) {
     const std::lock_guard guard(mutex_);
-    const auto found = begun_.find(object);
-    if (--found->second == 0)
+    if (const auto found = begun_.find(object); found != begun_.end() && --found->second == 0)
         begun_.erase(found);
     --all_;
     ended_.notify_all();

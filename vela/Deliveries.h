@@ -44,7 +44,8 @@ class Deliveries {
 
     std::mutex mutex_;
     std::condition_variable ended_;
-    std::map<const void*, std::size_t> begun_;  // deliveries by object; no entry is 0
+    // Deliveries by object; no entry is 0. Those of plain functions count in all_ alone.
+    std::map<const void*, std::size_t> begun_;
     std::size_t all_ = 0;
 };
 

@@ -9,13 +9,24 @@
 
 namespace vela {
 
-Delivery::Delivery(const Handler& handler, Addressable* owner, unsigned int type,
-                   std::shared_ptr<Deliveries> all)
-    : handler_(handler), owner_(owner), type_(type), all_(std::move(all)) {
-    all_->begin(handler_.object());
+void Delivery::begin(const Handler& handler, Addressable* owner, unsigned int type,
+                     const std::shared_ptr<Deliveries>& all) {
+    all->begin(handler.object());
+    all_ = all;
+    handler_ = handler;
+    owner_ = owner;
+    type_ = type;
 }
 
-Delivery::~Delivery() { all_->end(handler_.object()); }
+void Delivery::end() {
+    if (all_ == nullptr)
+        return;
+    body.reset();
+    msg.reset();
+    missing = 0;
+    lane.reset();
+    std::exchange(all_, nullptr)->end(handler_.object());
+}
 
 void Delivery::run() {
     try {

@@ -8,20 +8,27 @@
 
 #include "vela/Deliveries.h"
 #include "vela/Handler.h"
+#include "vela/Thread.h"
 
 namespace vela {
 
 class Lane;
 
 // It holds the arguments of the callback, and keeps alive what the callback needs. First the dispatching
-// thread owns it, then its lane, then the thread that runs it.
+// thread owns it, then its lane, then the thread that runs it. After its end it can begin again for another
+// message.
 class Delivery {
   public:
-    // Registers itself with `all`, until its destructor.
-    Delivery(const Handler& handler, Addressable* owner, unsigned int type, std::shared_ptr<Deliveries> all);
-    ~Delivery();
+    Delivery() = default;
+    ~Delivery() { end(); }
     Delivery(const Delivery&) = delete;
     Delivery& operator=(const Delivery&) = delete;
+
+    // Registers itself with `all`, until its end.
+    void begin(const Handler& handler, Addressable* owner, unsigned int type,
+               const std::shared_ptr<Deliveries>& all);
+    // Lets go of the lane, and of the body or message if the callback did not get it.
+    void end();
 
     // Calls the callback and gives it the body or message. Reports an exception that leaves the callback. If
     // the callback ends its thread, lets the unwinding go on.
@@ -38,14 +45,17 @@ class Delivery {
     std::shared_ptr<Lane> lane;
     unsigned int stackSize = 0;
     std::uint64_t missing = 0;
+    // For the lane: what the thread is to run, and the next one in its list of deliveries that have ended.
+    Thread::Errand errand{};
+    std::unique_ptr<Delivery> next;
 
   private:
     void call();
 
-    Handler handler_;
-    Addressable* owner_;
-    unsigned int type_;
-    std::shared_ptr<Deliveries> all_;
+    Handler handler_{Handler::MsgFunction(nullptr)};
+    Addressable* owner_ = nullptr;
+    unsigned int type_ = 0;
+    std::shared_ptr<Deliveries> all_;  // null before begin and after end
 };
 
 }  // namespace vela

@@ -187,7 +187,8 @@ void EvtCallback::dispatchTo(linkedList<callbackInfo>& callbacks, unsigned int k
 void EvtCallback::dispatchUnregistered(std::unique_ptr<Msg> msg) {
     const unsigned int type = msg->getMsgType();
     const callbackInfo& handler = type == EvtDetected ? defaultEvt_ : defaultMsg_;
-    auto delivery = std::make_unique<Delivery>(handler.handler, owner(), type, deliveries_);
+    std::unique_ptr<Delivery> delivery = handler.lane->spare();
+    delivery->begin(handler.handler, owner(), type, deliveries_);
     delivery->msg = std::move(msg);
     run(handler, std::move(delivery));
 }
@@ -197,7 +198,8 @@ void EvtCallback::dispatchUnregistered(std::unique_ptr<Msg> msg) {
 std::unique_ptr<Delivery> EvtCallback::deliveryOf(const callbackInfo& to, Msg& msg, unsigned int key,
                                                   bool isEvent, bool single) {
     try {
-        auto delivery = std::make_unique<Delivery>(to.handler, owner(), msg.getMsgType(), deliveries_);
+        std::unique_ptr<Delivery> delivery = to.lane->spare();
+        delivery->begin(to.handler, owner(), msg.getMsgType(), deliveries_);
         if (to.handler.takesBody())
             delivery->body = bodyOf(msg, key, isEvent);
         else if (!single)

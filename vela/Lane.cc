@@ -6,6 +6,24 @@
 
 namespace vela {
 
+std::unique_ptr<Delivery> Lane::spare() {
+    const Lock lock(mutex_);
+    if (spares_ == nullptr)
+        return std::make_unique<Delivery>();
+    std::unique_ptr<Delivery> taken = std::move(spares_);
+    spares_ = std::move(taken->next);
+    --spareCount_;
+    return taken;
+}
+
+void Lane::keep(std::unique_ptr<Delivery> delivery) {
+    if (spareCount_ == bounds_.atWork)
+        return;
+    ++spareCount_;
+    delivery->next = std::move(spares_);
+    spares_ = std::move(delivery);
+}
+
 void Lane::add(std::unique_ptr<Delivery> delivery) {
     const std::size_t octets = delivery->octets();
     Lock lock(mutex_);
@@ -72,7 +90,8 @@ void Lane::startWaiting(Lock& lock) {
         number(*next);
         lock.unlock();
         try {
-            AbandonedThread_create(&Lane::runOnThread, next.get(), next->stackSize);
+            next->errand = {&Lane::runOnThread, nullptr, nullptr, next.get()};
+            AbandonedThread_create(next->errand, next->stackSize);
         } catch (...) {
             lock.lock();
             noThreadFor(*next);
@@ -119,19 +138,23 @@ void Lane::startMore(Lock& lock) {
 }
 
 void* Lane::runOnThread(Thread::control*, void* arg) {
-    std::unique_ptr<Delivery> delivery(static_cast<Delivery*>(arg));
-    const struct Finally {
-        std::shared_ptr<Lane> lane;
-        ~Finally() { lane->ended(); }
-    } finally{delivery->lane};
-    const std::unique_ptr<Delivery> running = std::move(delivery);  // destroyed before the lane is told
-    running->run();
+    const struct Running {
+        Delivery* delivery;
+        std::shared_ptr<Lane> lane = delivery->lane;
+
+        ~Running() {
+            delivery->end();
+            lane->ended(std::unique_ptr<Delivery>(delivery));
+        }
+    } running{static_cast<Delivery*>(arg)};
+    running.delivery->run();
     return nullptr;
 }
 
-void Lane::ended() {
+void Lane::ended(std::unique_ptr<Delivery> delivery) {
     Lock lock(mutex_);
     --atWork_;
+    keep(std::move(delivery));
     startMore(lock);
     sayWhatWasLost(lock);
 }

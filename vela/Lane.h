@@ -37,6 +37,10 @@ class Lane {
     Lane& operator=(const Lane&) = delete;
     virtual ~Lane() = default;
 
+    // Returns a delivery that has ended and can begin again, or a new one. So a thread that runs a delivery
+    // neither allocates nor frees memory, which would cost such a short thread more than all its other work.
+    std::unique_ptr<Delivery> spare();
+
     // These three are called in the order of arrival, by one thread at a time. add takes a delivery over,
     // which then gets a thread or waits. Throws when a thread cannot be made; the delivery that was to get
     // the thread is lost.
@@ -101,13 +105,16 @@ class Lane {
     void startMore(Lock& lock);
     std::unique_ptr<Delivery> takeFirst();
     void noThreadFor(const Delivery& delivery);
-    void ended();
+    void ended(std::unique_ptr<Delivery> delivery);
+    void keep(std::unique_ptr<Delivery> delivery);
     void sayWhatWasLost(Lock& lock);
 
     const Bounds bounds_;
     mutable std::mutex mutex_;
     std::deque<Waiting> waiting_;
     std::size_t octets_ = 0;  // memory of the deliveries that wait
+    std::unique_ptr<Delivery> spares_;
+    unsigned int spareCount_ = 0;
     unsigned int atWork_ = 0;
     std::uint64_t started_ = 0;
     std::uint64_t missing_ = 0;

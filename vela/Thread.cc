@@ -16,6 +16,12 @@ void* runErrand(void* primitiveControl, void* block) {
     return errand.run(primitiveControl == nullptr ? nullptr : &own);
 }
 
+// The body of an abandoned thread whose errand is its creator's.
+void* runErrandInPlace(void*, void* block) {
+    const Thread::Errand errand = *static_cast<Thread::Errand*>(block);
+    return errand.run(nullptr);
+}
+
 template <typename Create>
 auto translated(Create create) {
     try {
@@ -103,6 +109,10 @@ void AbandonedThread_create(Thread::Function body, void* arg, unsigned int stack
 void AbandonedThread_create(void* object, Thread::Member body, void* arg, unsigned int stackSize) {
     startWith({nullptr, object, body, arg},
               [&](Thread::Errand* errand) { KSAbandonedThread_create(&runErrand, errand, stackSize); });
+}
+
+void AbandonedThread_create(Thread::Errand& errand, unsigned int stackSize) {
+    translated([&] { KSAbandonedThread_create(&runErrandInPlace, &errand, stackSize); });
 }
 
 }  // namespace vela

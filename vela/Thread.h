@@ -92,6 +92,8 @@ class Thread : public virtualObject {
 // Start a thread that nobody joins. Its body gets a null control. Throw Thread::CreationError.
 void AbandonedThread_create(Thread::Function body, void* arg, unsigned int stackSize);
 void AbandonedThread_create(void* object, Thread::Member body, void* arg, unsigned int stackSize);
+// The same without memory of its own: the errand has to live until the body has begun.
+void AbandonedThread_create(Thread::Errand& errand, unsigned int stackSize);
 
 }  // namespace vela
 
