@@ -2,12 +2,13 @@
 // with its built-in capture. This process reads the log from a pipe, checks each frame, and measures the time
 // from the event to its line in the log.
 //
-//     bench-road [FRAMES [SECONDS]]
+//     bench-road [FRAMES [SECONDS [ROUNDS]]]
 //
-// The first run is as fast as the board can, until FRAMES (200000) frames are in the log. The second run
-// lasts SECONDS (5) at line rate, which is a D channel that is full in both directions. The time of the
-// processor includes that of the software board. To show how much of it is spent before lapdmon has done
-// anything, two more programs only read the events.
+// First as fast as the board can, until FRAMES are in the log (200000); then for SECONDS (5) frames that come
+// alone, 20 a second; then ROUNDS (5) times for SECONDS at the rate of a D channel that is full in both
+// directions. A time ends when the header line can be read from the log. The processor's time includes the
+// software board's. How much of it is spent before lapdmon has done anything is shown, in each round, by
+// programs that read the events alone.
 #include <algorithm>
 #include <cstdlib>
 #include <exception>
@@ -26,6 +27,7 @@ namespace {
 // Line rate in frames a second: 64 kbit/s in both directions, filled with the shortest frames (4 octets,
 // check sequence and flag).
 constexpr unsigned lineRate = 2 * 1142;
+constexpr unsigned lonelyRate = 20;
 
 double percentile(std::vector<double>& values, double share) {
     const auto at =
@@ -52,17 +54,27 @@ bool show(const std::string& what, bench::Run run) {
     return run.status == 0 && run.checked.lost + run.checked.refused + run.checked.outOfOrder == 0;
 }
 
-// Prints what it costs at line rate only to read the events, and, if threadForEach is set, to start a thread
-// that does nothing for each. Returns false when the program failed.
-bool showLeast(const std::string& what, double seconds, bool threadForEach) {
-    const double used = bench::runReading(std::to_string(lineRate), seconds, threadForEach);
-    if (!(used > 0)) {
-        std::cout << what << ": could not be run" << std::endl;
-        return false;
+double median(std::vector<double> values) { return percentile(values, 0.5); }
+
+// What a frame costs at line rate, of the processor, in microseconds: medians of several rounds, in each of
+// which all three are measured. False when one was not what it should have been.
+bool showCost(double seconds, std::uint64_t rounds) {
+    std::vector<double> lapdmon, board, threads;
+    bool good = true;
+    for (std::uint64_t round = 0; round < rounds; ++round) {
+        const auto frames = static_cast<std::uint64_t>(seconds * lineRate);
+        const bench::Run run = bench::runRoad(std::to_string(lineRate), frames);
+        good = show("at line rate", run) && good;
+        lapdmon.push_back(1e6 * run.cpuSeconds / static_cast<double>(std::max<std::uint64_t>(run.frames, 1)));
+        board.push_back(bench::runReading(std::to_string(lineRate), seconds, false));
+        threads.push_back(bench::runReading(std::to_string(lineRate), seconds, true));
+        good = good && board.back() > 0 && threads.back() > 0;
     }
-    std::cout << what << ": " << std::setprecision(1) << used << " us of CPU a frame ("
-              << used * lineRate / 1e4 << " % of a core)" << std::endl;
-    return true;
+    std::cout << std::setprecision(1) << "at line rate, us of CPU a frame, median of " << rounds
+              << ": lapdmon " << median(lapdmon) << ", the board and the reading " << median(board)
+              << ", these and an idle thread an event " << median(threads) << "; lapdmon takes "
+              << std::setprecision(2) << median(lapdmon) / median(threads) << " times the last" << std::endl;
+    return good;
 }
 
 // The least number of frames. If there are fewer, all of them may be in the first piece of the log that is
@@ -73,17 +85,17 @@ constexpr double shortest = 0.1;
 int measure(int argc, char** argv) {
     const auto frames = argc > 1 ? bench::numberIn<std::uint64_t>(argv[1], fewest, 100000000) : 200000;
     const auto seconds = argc > 2 ? bench::numberIn<double>(argv[2], shortest, 3600) : 5;
-    if (!frames || !seconds || argc > 3) {
-        std::cerr << "syntax: bench-road [FRAMES [SECONDS]], at least " << fewest << " and " << shortest
-                  << std::endl;
+    const auto rounds = argc > 3 ? bench::numberIn<std::uint64_t>(argv[3], 1, 1000) : 5;
+    if (!frames || !seconds || !rounds || argc > 4) {
+        std::cerr << "syntax: bench-road [FRAMES [SECONDS [ROUNDS]]], at least " << fewest << ", " << shortest
+                  << " and 1" << std::endl;
         return EXIT_FAILURE;
     }
     const bool fast = show("as fast as it goes", bench::runRoad("max", *frames));
-    const bool paced = show("at line rate", bench::runRoad(std::to_string(lineRate),
-                                                           static_cast<std::uint64_t>(*seconds * lineRate)));
-    const bool board = showLeast("  of which the board and the reading", *seconds, false);
-    const bool threads = showLeast("  the same and an idle thread an event", *seconds, true);
-    return fast && paced && board && threads ? EXIT_SUCCESS : EXIT_FAILURE;
+    const auto alone = static_cast<std::uint64_t>(*seconds * lonelyRate);
+    const bool lonely = show("frames that come alone", bench::runRoad(std::to_string(lonelyRate), alone + 2));
+    const bool paced = showCost(*seconds, *rounds);
+    return fast && lonely && paced ? EXIT_SUCCESS : EXIT_FAILURE;
 }
 
 }  // namespace

@@ -82,20 +82,21 @@ class SharedStamps {
   public:
     SharedStamps() : memory_(memfd_create("stamps", 0), "memfd_create") {
         checked(ftruncate(memory_.get(), sizeof(Stamps)), "ftruncate");
-        void* const shared = mmap(nullptr, sizeof(Stamps), PROT_READ, MAP_SHARED, memory_.get(), 0);
+        void* const shared =
+            mmap(nullptr, sizeof(Stamps), PROT_READ | PROT_WRITE, MAP_SHARED, memory_.get(), 0);
         checked(shared == MAP_FAILED ? -1 : 0, "mmap");
-        stamps_ = static_cast<const Stamps*>(shared);
+        stamps_ = static_cast<Stamps*>(shared);
     }
     SharedStamps(const SharedStamps&) = delete;
     SharedStamps& operator=(const SharedStamps&) = delete;
-    ~SharedStamps() { munmap(const_cast<Stamps*>(stamps_), sizeof(Stamps)); }
+    ~SharedStamps() { munmap(stamps_, sizeof(Stamps)); }
 
     int descriptor() const { return memory_.get(); }
-    const Stamps& get() const { return *stamps_; }
+    Stamps& get() const { return *stamps_; }
 
   private:
     Descriptor memory_;
-    const Stamps* stamps_ = nullptr;
+    Stamps* stamps_ = nullptr;
 };
 
 std::string thisProgram() { return fs::read_symlink("/proc/self/exe"); }
@@ -206,6 +207,7 @@ class Measurement {
     }
 
     void account(std::uint64_t headers, std::int64_t now) {
+        stamps_.get().seen += headers;
         for (; headers > 0 && logged_ < wanted_; --headers, ++logged_)
             run_.latencies.push_back(static_cast<double>(now - stamps_.get().of(logged_)) / 1e3);
         if (logged_ == 0 || finished_)

@@ -2,6 +2,7 @@
 
 #include <dlfcn.h>
 #include <sys/mman.h>
+#include <unistd.h>
 
 #include <array>
 #include <cstdlib>
@@ -22,8 +23,11 @@ bench::Stamps* stamps = nullptr;
 uint32_t nvMsgRead(uint32_t queue, uint32_t zero, NvMsg32Bit** msg) {
     static const auto real = reinterpret_cast<decltype(&nvMsgRead)>(dlsym(RTLD_NEXT, "nvMsgRead"));
     const uint32_t status = real(queue, zero, msg);
-    if (status == NVSTATUS_OK && stamps != nullptr && (*msg)->type == EvtDetected)
+    if (status == NVSTATUS_OK && stamps != nullptr && (*msg)->type == EvtDetected) {
+        while (stamps->tooFarAhead())
+            usleep(100);
         stamps->add(bench::nowNs());
+    }
     return status;
 }
 
