@@ -4,13 +4,18 @@
 //
 //     faults event-label=3 silent    from now on these and no others: "ok"
 //     held                           message buffers not freed, those that wait in a queue among them
+//     taken                          trace events of the first D channel that the program has read
 //     settle                         the board forgets its journal, free memory goes back to the system: "ok"
 //     used                           kB of allocated memory
+#include <dlfcn.h>
 #include <malloc.h>
 #include <unistd.h>
 
+#include <atomic>
+#include <csignal>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <memory>
 #include <sstream>
 #include <string>
@@ -18,10 +23,24 @@
 #include <utility>
 #include <vector>
 
+#include "norv/norv.h"
 #include "softboard/faults.h"
 #include "softboard/softboard.h"
 
 namespace {
+
+std::atomic<unsigned long> taken = 0;
+
+bool isTraceEvent(const NvMsg32Bit& msg) {
+    constexpr std::uint32_t EvtDetected = 32;
+    constexpr std::uint32_t TraceGroup = 2;
+    constexpr std::uint8_t Ccs = 0x15;
+    std::uint32_t group = 0;
+    if (msg.type != EvtDetected || msg.size < sizeof group)
+        return false;
+    std::memcpy(&group, &msg + 1, sizeof group);
+    return group == TraceGroup && msg.sourceInstance == 1 && msg.sourceComponent == Ccs;
+}
 
 std::string answerTo(const std::string& line) {
     std::istringstream words(line);
@@ -29,6 +48,8 @@ std::string answerTo(const std::string& line) {
     words >> word;
     if (word == "held")
         return std::to_string(softboard::outstanding());
+    if (word == "taken")
+        return std::to_string(taken);
     if (word == "settle") {
         softboard::clearJournal();
         malloc_trim(0);
@@ -60,11 +81,31 @@ void serve(int descriptor) {
     }
 }
 
+// Takes no signals: they are the program's.
+void startToServe(int descriptor) {
+    sigset_t all{};
+    sigset_t before{};
+    sigfillset(&all);
+    pthread_sigmask(SIG_SETMASK, &all, &before);
+    std::thread(serve, descriptor).detach();
+    pthread_sigmask(SIG_SETMASK, &before, nullptr);
+}
+
 const struct Switch {
     Switch() {
         if (const char* const descriptor = std::getenv("FAULT_SWITCH"); descriptor != nullptr)
-            std::thread(serve, static_cast<int>(std::strtol(descriptor, nullptr, 10))).detach();
+            startToServe(static_cast<int>(std::strtol(descriptor, nullptr, 10)));
     }
 } theSwitch;
 
 }  // namespace
+
+// Stands before the library's.
+extern "C" __attribute__((visibility("default"))) uint32_t nvMsgRead(uint32_t queue, uint32_t zero,
+                                                                     NvMsg32Bit** msg) {
+    static const auto real = reinterpret_cast<decltype(&nvMsgRead)>(dlsym(RTLD_NEXT, "nvMsgRead"));
+    const uint32_t status = real(queue, zero, msg);
+    if (status == NVSTATUS_OK && *msg != nullptr && isTraceEvent(**msg))
+        ++taken;
+    return status;
+}

@@ -21,11 +21,18 @@ def block(direction, ticks, octets):
 
 
 class Soak(unittest.TestCase):
-    def test_nothing_grows_is_lost_or_out_of_order_while_faults_come_and_go(self):
+    def soak(self, *more):
         with contextlib.redirect_stdout(io.StringIO()) as said:
-            status = soak.main(["--frames", "10000", "--phase", "500", "--stall", "0.5", "--seed", "1"])
+            status = soak.main(["--frames", "10000", "--phase", "500", "--stall", "0.5", "--seed", "1",
+                                *more])
         self.assertEqual(status, 0, said.getvalue())
         self.assertNotIn("not judged", said.getvalue())
+
+    def test_nothing_grows_is_lost_or_out_of_order_while_faults_come_and_go(self):
+        self.soak("--long-stall", "10")
+
+    def test_so_it_is_with_a_board_in_another_machine(self):
+        self.soak("--long-stall", "10", "--relay")
 
     def test_what_is_lost_repeated_or_out_of_order_is_told_apart(self):
         self.assertEqual(checked([0, 1, 2, 3]), (4, 0, 0, 0))

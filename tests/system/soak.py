@@ -1,11 +1,14 @@
 """Runs the trace at line rate while faults are switched on and off at random, and says what came of it.
 
     scripts/soak --minutes 30            scripts/soak --frames 10000 --seed 7
+    scripts/soak --minutes 30 --long-stall 60            scripts/soak --minutes 30 --long-stall 60 --relay
+    scripts/soak --bound
 
 The board plays numbered frames in both directions; the log is read through a FIFO as it is written, and kept
 nowhere. Troubled times and calm ones take turns. The exit status is 1 when a frame is lost, damaged or out of order,
 when memory, threads, descriptors or waiting messages grow from the first calm times to the last, or when the program
-does not end in order.
+does not end in order. With --bound the log is not read until more records wait than the program keeps: then exactly those
+that it says it lost must be missing.
 """
 
 import argparse
@@ -28,6 +31,8 @@ from order import LINE_RATE, MOST_THREADS, PAUSE, number_of
 ROUND = 20000        # frames in the capture, which is played again and again
 LIMIT = 120          # seconds without a frame, after which none is waited for
 QUEUE = 64 + 8       # messages that wait for the program before the board waits, and those on their way through it
+ON_THE_WAY = 500     # frames that were read from the board and are not seen in the log: 10 ms of them, and the FIFO's
+LONG_STALL_EVERY = 10  # troubled times
 GROWTH = 512         # kB of allocated memory that are no growth: messages that are on their way
 
 # Wrong events come beside the right ones, one for each hundred frames (docs/user/softboard.md): name, least and most number.
@@ -113,7 +118,7 @@ class Sample:
 
 
 class Program:
-    """The trace on the software board, its log and its faults."""
+    """The trace on the software board, its log and its faults. The board may be behind a relay."""
 
     def __init__(self, options, folder):
         write_capture(folder / "numbered.pcap")
@@ -121,23 +126,37 @@ class Program:
         os.mkfifo(log)
         self._log = os.open(log, os.O_RDONLY | os.O_NONBLOCK)
         self._held_open = os.open(log, os.O_WRONLY)
-        self._switch = FaultSwitch(LIMIT, options.fault_switch)
-        asan = os.environ.get("ASAN_OPTIONS", "") + ":verify_asan_link_order=0"
-        self._process = subprocess.Popen(
-            [options.softboard, "--rate", str(options.rate), "--loop", "--frames", str(folder / "numbered.pcap"), "--",
-             *self._switch.words, options.lapdmon, "-b1", "-f", str(log)],
-            stdin=subprocess.PIPE, stdout=subprocess.DEVNULL, stderr=subprocess.PIPE, pass_fds=[self._switch.descriptor],
-            env={**os.environ, **self._switch.variables, "ASAN_OPTIONS": asan})
-        self._switch.given()
-        self.pid = self._process.pid
         self.said = []
-        self._listener = threading.Thread(target=self._listen, daemon=True)
-        self._listener.start()
+        self._host = FaultSwitch(LIMIT, options.fault_switch)
+        board = [options.softboard, "--rate", str(options.rate), "--loop", "--frames", str(folder / "numbered.pcap"), "--"]
+        trace = [options.lapdmon, "-b1", "-f", str(log)]
+        if options.relay:
+            self._board = FaultSwitch(LIMIT, options.fault_switch)
+            self._relay = self._start(self._board, board, [options.relay, "--listen", "127.0.0.1:0"], stdout=subprocess.PIPE)
+            port = self._relay.stdout.readline().decode().strip().rsplit(":", 1)[1]
+            self._process = self._start(self._host, [], trace, REMOTE_NORV=f"127.0.0.1:{port}")
+        else:
+            self._board, self._relay = self._host, None
+            self._process = self._start(self._host, board, trace)
+        self.pid = self._process.pid
+        self._listeners = [threading.Thread(target=self._listen, args=[each.stderr], daemon=True)
+                           for each in (self._process, self._relay) if each]
+        for each in self._listeners:
+            each.start()
 
-    def _listen(self):
-        """Keeps what a sanitizer says; the rest is reports of wrong events."""
-        for line in self._process.stderr:
-            if self.said or re.search(rb"Sanitizer|runtime error|softboard:", line):
+    @staticmethod
+    def _start(switch, before, words, stdout=subprocess.DEVNULL, **variables):
+        asan = os.environ.get("ASAN_OPTIONS", "") + ":verify_asan_link_order=0"
+        process = subprocess.Popen([*before, *switch.words, *words], stdin=subprocess.PIPE, stdout=stdout,
+                                   stderr=subprocess.PIPE, pass_fds=[switch.descriptor],
+                                   env={**os.environ, **switch.variables, **variables, "ASAN_OPTIONS": asan})
+        switch.given()
+        return process
+
+    def _listen(self, errors):
+        """Keeps what is no report of a wrong event."""
+        for line in errors:
+            if self.said or re.search(rb"Sanitizer|runtime error:|softboard:|lapdmon:|internal error|communicating|is lost", line):
                 self.said.append(line.decode("latin-1"))
 
     def read(self):
@@ -151,15 +170,19 @@ class Program:
         return some
 
     def set_faults(self, faults):
-        self._switch.ask("faults " + " ".join(faults))
+        self._board.ask("faults " + " ".join(faults))
+
+    def taken(self):
+        """Trace events that were read from the board so far."""
+        return int(self._board.ask("taken"))
 
     def calm_sample(self):
         """The board's journal, which grows at first, is none of the program's memory."""
-        self._switch.ask("settle")
+        self._host.ask("settle")
         return self.sample()
 
     def sample(self):
-        return Sample(self.pid, self._switch.held(), int(self._switch.ask("used")))
+        return Sample(self.pid, self._board.held(), int(self._host.ask("used")))
 
     def pause(self, seconds):
         os.kill(self.pid, signal.SIGSTOP)
@@ -172,19 +195,30 @@ class Program:
 
     def status(self):
         status = self._process.wait(LIMIT)
-        self._listener.join(LIMIT)
+        if self._relay:
+            self._relay.terminate()
+            status = status or self._relay.wait(LIMIT)
+        for each in self._listeners:
+            each.join(LIMIT)
         return status
 
     def end(self):
-        self._process.kill()
-        self._process.wait()
-        self._process.stdin.close()
-        self._listener.join(LIMIT)
+        for each in (self._process, self._relay):
+            if each:
+                each.kill()
+                each.wait()
+                each.stdin.close()
+        for each in self._listeners:
+            each.join(LIMIT)
         self._process.stderr.close()
+        if self._relay:
+            self._relay.stderr.close()
+            self._relay.stdout.close()
+            self._board.close()
         os.close(self._log)
         if self._held_open is not None:
             os.close(self._held_open)
-        self._switch.close()
+        self._host.close()
 
 
 class Soak:
@@ -198,13 +232,17 @@ class Soak:
         self.samples = []
         self.calm = []
         self.times = {}
+        self.stalls = []
         self._last_sample = 0
 
     def run(self):
         start = time.monotonic()
         self._follow(self._options.phase)
+        self._catch_up()
         self.calm.append(self._program.calm_sample())
         while self._goes_on(start):
+            if self._options.long_stall and len(self.calm) % LONG_STALL_EVERY == 1:
+                self._long_stall()
             self._trouble()
             self._calm()
         self.seconds = time.monotonic() - start
@@ -217,7 +255,7 @@ class Soak:
     def _goes_on(self, start):
         if self._options.minutes:
             return time.monotonic() - start < 60 * self._options.minutes
-        return self.checker.frames < self._options.frames
+        return self.checker.frames < self._options.frames or not self._judges_memory()
 
     def _follow(self, frames):
         """Reads the log until so many more frames have come."""
@@ -231,6 +269,20 @@ class Soak:
                 self._last_sample = time.monotonic()
                 self.samples.append(self._program.sample())
 
+    def _catch_up(self):
+        """Until the log has what was read from the board, but for what is just on its way."""
+        end = time.monotonic() + LIMIT
+        while self._program.taken() - self.checker.frames - self.checker.wrong > ON_THE_WAY and time.monotonic() < end:
+            self._follow(100)
+
+    def _long_stall(self):
+        self._count("a long stall")
+        taken = self._program.taken()
+        time.sleep(self._options.long_stall)
+        self.stalls.append(self._program.taken() - taken)
+        self.samples.append(self._program.sample())
+        self._catch_up()
+
     def _trouble(self):
         chance = self._random
         faults, wrong_events = [], 0
@@ -239,7 +291,7 @@ class Soak:
             wrong_events += name.startswith("event-")
             self._count(name)
         silent = any(fault.startswith("silent") for fault in faults)
-        before = self.checker.frames
+        before = self._program.taken()
         self._program.set_faults(faults)
         outside = chance.choice(OUTSIDE)
         self._count(outside)
@@ -249,7 +301,7 @@ class Soak:
         self._follow(chance.randint(self._options.phase // 2, 2 * self._options.phase))
         self._program.set_faults([])
         # A fault sends its event before the first frame, too, and those that wait were sent while it stood.
-        sent = self.checker.frames - before + self._program.sample().held + MOST_THREADS
+        sent = self._program.taken() - before + self._program.sample().held
         self._most_wrong += wrong_events * (2 + sent // 50)
 
     def _count(self, name):
@@ -271,6 +323,7 @@ class Soak:
         end = time.monotonic() + LIMIT
         while self._program.sample().held > QUEUE and time.monotonic() < end:
             self._follow(100)
+        self._catch_up()
         self.calm.append(self._program.calm_sample())
 
     def idle(self):
@@ -320,32 +373,89 @@ class Soak:
                    f"at most {max(values)}{unit}")
         if not self._judges_memory():
             yield "memory is not judged by so few calm times"
+        if self.stalls:
+            yield (f"long stalls  {len(self.stalls)} of {self._options.long_stall:g} seconds, with at most "
+                   f"{max(self.stalls)} frames")
         yield "faults       " + ", ".join(f"{name} {times}" for name, times in sorted(self.times.items()))
+
+
+class Bound:
+    """The log is not read until the program says that it loses frames."""
+
+    def __init__(self, program):
+        self._program = program
+        self._checker = Checker()
+        self._said_lost = 0
+        self._rest = b""
+
+    def run(self):
+        end = time.monotonic() + 20 * LIMIT
+        while not any("too many frames wait" in line for line in self._program.said):
+            if time.monotonic() > end:
+                raise TimeoutError("it never says that too many frames wait")
+            time.sleep(0.1)
+        self._full = self._program.sample()
+        waited = self._program.taken()
+        while self._program.taken() < waited + 1000:
+            time.sleep(0.1)
+        self._program.types_q()
+        while some := self._program.read():
+            self._feed(some)
+        self._checker.end()
+        return self._program.status()
+
+    def idle(self):
+        """There is nothing else to end."""
+
+    def _feed(self, some):
+        self._checker.feed(some)
+        *lines, self._rest = (self._rest + some).split(b"\n")
+        self._said_lost += sum(int(line.split()[-1]) for line in lines if line.startswith(b"Frames Lost: "))
+
+    def complaints(self, status):
+        said = [line for line in self._program.said if "because too many waited for the log: " in line]
+        counted = int(said[0].split()[-1]) if said else 0
+        if status != 1:
+            yield f"it ended with status {status}"
+        if counted == 0 or self._said_lost != counted:
+            yield f"standard error says that {counted} frames were lost, the log {self._said_lost}"
+        if self._checker.lost > counted or self._checker.disordered or self._checker.wrong:
+            yield f"{self._checker.lost} frames were lost, {self._checker.disordered} out of order"
+
+    def report(self):
+        yield (f"frames       {self._checker.frames}, lost as it says {self._said_lost}; when too many waited, "
+               f"{self._full.used} kB in use, {self._full.resident} kB resident, {self._full.threads} threads")
 
 
 def main(arguments):
     parser = argparse.ArgumentParser(description=__doc__, formatter_class=argparse.RawDescriptionHelpFormatter)
     parser.add_argument("--minutes", type=float, help="how long")
-    parser.add_argument("--frames", type=int, default=100_000, help="how many frames, where no time is given")
+    parser.add_argument("--frames", type=int, default=100_000, help="how many frames at least, where no time is given")
     parser.add_argument("--seed", type=int, default=int(time.time()), help="of what is switched when")
     parser.add_argument("--rate", default=LINE_RATE, help="frames a second")
     parser.add_argument("--phase", type=int, default=4000, help="frames of a calm time, about")
     parser.add_argument("--stall", type=float, default=3, help="seconds for which the log is not read, at most")
+    parser.add_argument("--long-stall", type=float, default=0,
+                        help="seconds for which the log is not read now and then, 0 for never")
+    parser.add_argument("--bound", action="store_true", help="see what becomes of more records than are kept")
+    parser.add_argument("--relay", nargs="?", const=os.environ.get("RELAY"), help="have the board behind a relay")
     parser.add_argument("--lapdmon", default=os.environ.get("LAPDMON"))
     parser.add_argument("--softboard", default=os.environ.get("SOFTBOARD"))
     parser.add_argument("--fault-switch", default=LIBRARY)
     options = parser.parse_args(arguments)
+    options.rate = "max" if options.bound else options.rate
     print(f"seed {options.seed}", flush=True)
     with tempfile.TemporaryDirectory(prefix="soak-") as folder:
         program = Program(options, pathlib.Path(folder))
-        soak = Soak(options, program)
+        soak = Bound(program) if options.bound else Soak(options, program)
         try:
             complaints = list(soak.complaints(soak.run()))
         finally:
             soak.idle()
             program.end()
     print("\n".join(soak.report()))
-    print("\n".join(complaints) if complaints else "nothing was lost, nothing out of order, nothing grew")
+    good = "what was lost is said" if options.bound else "nothing was lost, nothing out of order, nothing grew"
+    print("\n".join(complaints) if complaints else good)
     return 1 if complaints else 0
 
 
