@@ -15,7 +15,7 @@ vela::Lane::Bounds forTheQueue(vela::Lane::Bounds bounds) {
 
 }  // namespace
 
-Arrivals::Arrivals(Bounds bounds) : Lane(forTheQueue(bounds)) {}
+Arrivals::Arrivals(const Bounds& bounds) : Lane(forTheQueue(bounds)) {}
 
 void Arrivals::gone() {
     ++gone_;

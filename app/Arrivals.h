@@ -25,7 +25,7 @@ class Arrivals : public vela::Lane {
     using Record = vela::CCS::EvtL2Trace_t;
 
     Arrivals() : Arrivals(Bounds()) {}
-    explicit Arrivals(Bounds bounds);
+    explicit Arrivals(const Bounds& bounds);
 
     // Calls queue(record) when it is the record's turn, and then for the records that have waited for this
     // one. A record without a number has its turn at once. Called on delivery threads, under queueGuard.

@@ -29,7 +29,7 @@ void hexDump(const RingBuffer& rb) {
 
 }  // namespace
 
-void composeFrame(RingBuffer rb) {
+void composeFrame(RingBuffer& rb) {
     layer_2(&rb);
     if (rb.count > 0)
         layer_3(&rb);

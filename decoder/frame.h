@@ -7,8 +7,8 @@
 namespace decoder {
 
 // Composes the layer-2 lines (Q.921), the layer-3 lines (Q.931) when there is a message, and the hexadecimal
-// dump of the first `msglen` octets, ten to a line.
-void composeFrame(RingBuffer rb);
+// dump of the first `msglen` octets, ten to a line. The cursor has handed out its octets afterwards.
+void composeFrame(RingBuffer& rb);
 // The same; then hands all text composed so far to the log.
 void parse_isdn_frame(RingBuffer rb);
 

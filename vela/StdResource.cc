@@ -6,7 +6,7 @@ namespace vela {
 
 StdResource::StdResource(const CompDesc_t& target, MsgQueue* queue, int inUse) : StdResource(target, queue) {
     if (inUse != 0)
-        use(0);
+        StdResource::use(0);  // no derived object is there yet
 }
 
 MsgBody* StdResource::MsgBodyLookup(unsigned int msgType) {
