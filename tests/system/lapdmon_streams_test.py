@@ -2,10 +2,11 @@
 
 import os
 import re
+import time
 import unittest
 from signal import SIGTERM
 
-from harness import BANNER, LAPDMON, MARK, RECEIVED, SystemTest, capture, time_of, wait_until_full
+from harness import BANNER, LAPDMON, LIMIT, MARK, MARK_IN_LOG, RECEIVED, SystemTest, capture, time_of, wait_until_full
 from order import MOST_THREADS
 
 FRAMES = [(RECEIVED, bytes((2, 1, 1, i % 251))) for i in range(250)]
@@ -110,7 +111,7 @@ class UnreadStreams(SystemTest):
     #             (frames, scenario, what is said of each)
     STREAMS = {
         "1>stopped": (25000 * [MARK], SCENARIO, "Frame Error\n"),
-        "2>stopped": (20 * FRAMES, SCENARIO + "label = 3\n", "Unregisterd EventGroup 3\n"),
+        "2>stopped": (60 * FRAMES, SCENARIO + "label = 3\n", "Unregisterd EventGroup 3\n"),
     }
     NOTICE = re.compile(r"^lapdmon: nobody read this stream, lines dropped here: [1-9]\d*$", re.M)
 
@@ -127,7 +128,16 @@ class UnreadStreams(SystemTest):
                                 run=("sh", "-c", f'exec "$0" -b1 {stream}', LAPDMON))
         program.journal.wait(" EvtDetected ", times=len(frames))
         wait_until_full(reader)
+        if stream == "1>stopped":
+            self.wait_until_logged(len(frames))
         return program, reader
+
+    def wait_until_logged(self, marks):
+        """What has arrived may still wait to be shown: the log says how far the program is."""
+        end = time.monotonic() + LIMIT
+        while (self.folder / "lapdmon.log").stat().st_size < marks * len(MARK_IN_LOG):
+            self.assertLess(time.monotonic(), end)
+            time.sleep(0.01)
 
     def test_they_delay_neither_frames_nor_requests_nor_the_end(self):
         for stream in self.STREAMS:
