@@ -174,7 +174,7 @@ void EvtCallback::dispatchTo(linkedList<callbackInfo>& callbacks, unsigned int k
         if (!entry.handler.isEmpty()) {
             std::unique_ptr<Delivery> delivery = deliveryOf(entry, *msg, key, isEvent, single);
             if (single && !entry.handler.takesBody())
-                delivery->msg = std::move(msg);
+                delivery->msg.swap(msg);
             run(entry, std::move(delivery));
         }
         if (entry.once)
