@@ -16,13 +16,8 @@ std::FILE* Log::open(const char* name) {
     return file_.open(name);
 }
 
-void Log::write(std::string_view text) {
-    block_.append(text);
-    if (writesOfFrame_ > 1) {
-        --writesOfFrame_;
-        return;
-    }
-    block_.endEntry(std::exchange(writesOfFrame_, 0) != 0);
+void Log::write(std::string_view entry) {
+    block_.add(entry, std::exchange(isFrame_, false));
     if (block_.text().size() >= BlockSize)
         writeOut();
 }
@@ -68,7 +63,6 @@ void Log::complain(int reason) {
 void Log::close() {
     if (!file_.isOpen())
         return;
-    block_.endEntry(std::exchange(writesOfFrame_, 0) != 0);  // the announced writes of a frame may be missing
     if (!block_.entries().empty())
         writeOut();
     if (block_.holdsOnlyARest() && block_.entries().front().isFrame)

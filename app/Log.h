@@ -31,12 +31,11 @@ class Log {
     // Opens the file as LogFile::open does. Returns null, with errno set, when it cannot be opened; errno is
     // EWOULDBLOCK when another trace writes to it. The log owns the stream, which writes nothing itself.
     std::FILE* open(const char* name);
-    // Announces that the next entry is a frame, which comes in so many calls of write.
-    void frameFollows(unsigned int writes = 1) { writesOfFrame_ = writes; }
-    void write(std::string_view text);  // call it only while the log is open
+    // Announces that the next entry is a frame.
+    void frameFollows() { isFrame_ = true; }
+    void write(std::string_view entry);  // call it only while the log is open
     // Says in the log that this many frames are missing at this place because they were lost before they came
-    // to the log. The caller counts them: lost() and complete() do not change. Call it while the log is open,
-    // and not between the writes of one frame.
+    // to the log. The caller counts them: lost() and complete() do not change. Call it while the log is open.
     void framesMissing(unsigned long frames);
 
     // Both write the text that is held; call them when no frame waits to be shown. flushIfDue writes only if
@@ -66,7 +65,7 @@ class Log {
     std::string name_;
     LogFile file_;
     LogBlock block_;
-    unsigned int writesOfFrame_ = 0;  // writes of the announced frame that are still to come
+    bool isFrame_ = false;  // whether the next entry is a frame
     std::chrono::steady_clock::time_point lastWrite_;
     bool complete_ = true;
     unsigned long lost_ = 0;

@@ -13,9 +13,9 @@ std::string gapLine(unsigned long frames) { return decoder::framesLost + std::to
 
 }  // namespace
 
-void LogBlock::endEntry(bool isFrame) {
-    if (text_.size() > (entries_.empty() ? 0 : entries_.back().end))
-        entries_.push_back({.end = text_.size(), .isFrame = isFrame});
+void LogBlock::add(std::string_view entry, bool isFrame) {
+    text_ += entry;
+    entries_.push_back({.end = text_.size(), .isFrame = isFrame});
 }
 
 void LogBlock::addGap(unsigned long frames) {

@@ -23,10 +23,7 @@ class LogBlock {
     const std::string& text() const { return text_; }
     const std::vector<LogEntry>& entries() const { return entries_; }
 
-    // Adds text to the entry that is being made.
-    void append(std::string_view text) { text_ += text; }
-    // Completes the entry. Does nothing when no text was added since the last entry.
-    void endEntry(bool isFrame);
+    void add(std::string_view entry, bool isFrame);
     // Adds the line of a gap. If the last entry is such a line, the two become one.
     void addGap(unsigned long frames);
     // Puts the line of a gap first, or after the rest of an entry whose beginning is in the file.

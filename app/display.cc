@@ -140,18 +140,16 @@ void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
     }
     octets = rec.List.value();
     decoder::msglen = frameLength(rec.Length, octets.length());
-    // An oversized frame comes to the log in two writes, because its first line is in the log before the
-    // screen shows it.
-    traceLog.frameFollows(decoder::msglen > decoder::maximumFrame ? 2 : 1);
     decoder::timeLines(rec.Direction == Transmitted, rec.Timestamp, localTime.of(std::time(nullptr)));
     decoder::RingBuffer frame;
     if (decoder::getBlock(&frame, octets, decoder::msglen)) {
         decoder::parse_isdn_frame(frame);
-        return;
+    } else {
+        decoder::output(decoder::flag);
+        std::cout << decoder::frameError << std::endl;
+        decoder::text(decoder::frameError, " \n");
     }
-    decoder::output(decoder::flag);
-    std::cout << decoder::frameError << std::endl;
-    decoder::text(decoder::frameError, " \n");
+    traceLog.frameFollows();
     decoder::flushLines();
 }
 

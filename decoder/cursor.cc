@@ -24,7 +24,6 @@ bool getBlock(RingBuffer* rb, std::span<const unsigned char> octets, int len) {
         output(flag);
         writeScreen(oversizedFrame);
         text(oversizedFrame, " \n");
-        flushLines();
         return false;
     }
     const std::size_t held = std::min(static_cast<std::size_t>(std::max(len, 0)), octets.size());

@@ -34,8 +34,8 @@ struct RingBuffer {
 };
 
 // Empties the cursor and fills it with the first `len` octets, or with all of them if there are fewer. If
-// `len` is above maximumFrame, writes oversizedFrame to the screen and the log, leaves the cursor empty and
-// returns false.
+// `len` is above maximumFrame, writes oversizedFrame to the screen, composes it for the log, leaves the
+// cursor empty and returns false.
 bool getBlock(RingBuffer* rb, vela::staticList<unsigned char>& octets, int len);
 bool getBlock(RingBuffer* rb, std::span<const unsigned char> octets, int len);
 

@@ -36,9 +36,6 @@ void composeFrame(RingBuffer& rb) {
     hexDump(rb);
 }
 
-void parse_isdn_frame(RingBuffer rb) {
-    composeFrame(rb);
-    flushLines();
-}
+void parse_isdn_frame(RingBuffer rb) { composeFrame(rb); }
 
 }  // namespace decoder

@@ -138,17 +138,12 @@ TEST_F(LogTest, WritesABlockBehindAGapWholeOrNotAtAll) {
     EXPECT_EQ(saidAtTheEnd(), path_ + ": File too large\n" + path_ + ": frames lost: 3\n");
 }
 
-TEST_F(LogTest, WritesAFrameThatComesInPiecesWholeOrNotAtAll) {
+TEST_F(LogTest, WritesAFrameWholeOrNotAtAll) {
     ASSERT_NE(log_.open(path_.c_str()), nullptr);
-    log_.frameFollows(2);
-    log_.write(std::string(5000, 'a'));
-    EXPECT_EQ(contents(path_), "");
-    log_.write(std::string(10, 'a'));
+    frame('a', 5010);
     EXPECT_EQ(contents(path_), std::string(5010, 'a'));
     limitFileSize(10000);
-    log_.frameFollows(2);
-    log_.write(std::string(4985, 'b'));
-    log_.write(std::string(10, 'b'));
+    frame('b', 4995);
     EXPECT_EQ(contents(path_), std::string(5010, 'a'));
     EXPECT_EQ(saidAtTheEnd(), path_ + ": File too large\n" + path_ + ": frames lost: 1\n");
 }
@@ -296,10 +291,10 @@ TEST_F(LogTest, GivesUpAWriteThatWaitsForAReader) {
     close(reader);
 }
 
-TEST_F(LogTest, CountsAFrameWhoseLastPiecesNeverCame) {
+TEST_F(LogTest, TakesOnlyTheNextEntryForTheFrameThatWasAnnounced) {
     ASSERT_NE(log_.open("/dev/full"), nullptr);
-    log_.frameFollows(2);
-    log_.write("the first of two pieces\n");
+    frame('a', 10);
+    log_.write("a line that is no frame\n");
     EXPECT_EQ(saidAtTheEnd(), "/dev/full: No space left on device\n/dev/full: frames lost: 1\n");
 }
 

@@ -3,8 +3,11 @@
 #include <cstdlib>
 #include <ctime>
 #include <string>
+#include <string_view>
+#include <vector>
 
 #include "app/display.h"
+#include "decoder/lines.h"
 #include "decoder/state.h"
 #include "tests/app/channels.h"
 #include "tests/app/records.h"
@@ -62,6 +65,20 @@ TEST_F(ShowRecord, WritesAReceivedFrameFlushLeft) {
               "Hex Dump: \n"
               "02 01 01 05 \n");
     EXPECT_EQ(screen(), "");
+}
+
+TEST_F(ShowRecord, HandsTheTextOfARecordToTheLogInOnePieceEvenWhenItRefusesTheFrame) {
+    static std::vector<std::string> pieces;
+    pieces.clear();
+    decoder::writeLog = [](std::string_view piece) { pieces.push_back(dated(std::string(piece))); };
+    show(received, 250, {0x02, 0x01, 0x01, 0x05});
+    show(received, 250, Octets(300, 0x00));
+    decoder::writeLog = decoder::writeToStream;
+    EXPECT_EQ(pieces,
+              (std::vector<std::string>{"\nDATE\nRX Frame: Time = 1.0\nCommand=1   SAPI=0x00\nTEI=0x00\n"
+                                        "0x01 0x05  Receive Ready\nHex Dump: \n02 01 01 05 \n",
+                                        "\nDATE\nRX Frame: Time = 1.0\n"
+                                        "Oversized frame, frame will not be interpreted \nFrame Error \n"}));
 }
 
 TEST_F(ShowRecord, TakesAnyOtherDirectionForReceived) {

@@ -44,6 +44,7 @@ std::size_t decodeAll(std::vector<vela::staticList<unsigned char>>& frames) {
             decoder::msglen = static_cast<int>(octets.length());
             if (decoder::getBlock(&frame, octets, decoder::msglen)) {
                 decoder::parse_isdn_frame(frame);
+                decoder::flushLines();
                 ++decoded;
             }
         }

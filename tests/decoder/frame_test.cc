@@ -57,12 +57,13 @@ TEST(Frame, IsDumpedNoFurtherThanItsLength) {
     EXPECT_EQ(text.substr(text.find("Hex")), "Hex Dump: \n02 01 \n");
 }
 
-TEST(Frame, IsHandedOverWhole) {
+TEST(Frame, IsComposedBehindWhatWasComposedBeforeAndLeftToBeHandedOver) {
     Capture log;
     text("RX Frame\n");
     parse_isdn_frame(cursorOver({0x02}));
-    EXPECT_TRUE(lineBuffer.composed().empty());
-    EXPECT_EQ(log.text(), "RX Frame\nCommand=1   SAPI=0x00\n0x02 0x02  Information\nHex Dump: \n\n");
+    const std::string whole = "RX Frame\nCommand=1   SAPI=0x00\n0x02 0x02  Information\nHex Dump: \n\n";
+    EXPECT_EQ(lineBuffer.composed(), whole);
+    EXPECT_EQ(log.text(), whole);
 }
 
 }  // namespace

@@ -143,9 +143,11 @@ TEST(Lines, AreShownNowhereWithoutALog) {
     ::testing::internal::CaptureStderr();
     file_output = false;
     parse_isdn_frame(cursorOver({0x02, 0x01, 0x7F}));
+    flushLines();
     file_output = true;
     ofp = nullptr;
     parse_isdn_frame(cursorOver({0x02, 0x01, 0x7F}));
+    flushLines();
     ofp = file;
     EXPECT_EQ(::testing::internal::GetCapturedStdout(), "");
     EXPECT_EQ(::testing::internal::GetCapturedStderr(), "");
