@@ -90,16 +90,37 @@ vela::Instance findDChannel(vela::Board& board) {
     }
 }
 
+// Tells the board to trace and to report what it traces.
+void switchOn(vela::CCS& opened) {
+    opened.SetParm(L2TraceParm, 1, nullptr);
+    opened.asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0,
+                                 arrivals);
+    opened.DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
+}
+
+template <typename Step>
+void withoutReport(Step step) {
+    try {
+        step();
+    } catch (...) {  // the caller has a failure to report that matters more
+    }
+}
+
 // Switches the trace on. Once the board reports events, quit() switches the trace off and destroys the
-// instance.
+// instance. If the board does not get that far, startTrace switches off what may be on, because a request
+// that fails may have taken effect. Signals are watched from the start, so that none of them leaves the trace
+// on.
 void startTrace(std::unique_ptr<vela::CCS> opened) {
-    opened->SetParm(L2TraceParm, 1, nullptr);
-    opened->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0,
-                                  arrivals);
-    opened->DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
+    watchSignals();
+    try {
+        switchOn(*opened);
+    } catch (...) {
+        withoutReport([&] { opened->CancelEvt(vela::CCS::L2TraceGroup, nullptr); });
+        withoutReport([&] { opened->SetParm(L2TraceParm, 0, nullptr); });
+        throw;
+    }
     ccs = std::move(opened);
     static_cast<void>(std::atexit(quit));
-    watchSignals();
     Process.start(nullptr);
     ccs->getMsgQueue()->connectionLost([](vela::MsgQueue*) { boardLost(); });
 }

@@ -96,6 +96,8 @@ def reply_row(fault, number):
         errors = source if number < 4 else f"(?:{source}|{kind})"
     elif fault == "reply-late" and number == START + 1:
         errors = kind
+    elif fault == "reply-late" and number in (START - 1, START):
+        errors = source if number < START else kind  # it comes while the start is undone
     if number in (4, len(COMMANDS)) and fault == "reply-twice":
         errors = f"(?:{errors})?"
     starts = number > START or fault == "reply-twice"

@@ -75,6 +75,14 @@ class Lifecycle(SystemTest):
                 self.assertRegex(program.screen.text(), refusal(command) + r"\Z")
                 self.assertNotIn("One moment", program.screen.text())
 
+    def test_a_start_that_fails_switches_off_what_may_be_on(self):
+        for script in ("error=8", "error=22", "silent=22"):
+            with self.subTest(script):
+                program = self.on_other_library(script).ends(status=1)
+                talk = program.talk.lines()
+                self.assertEqual(talk[talk.index("heard 8"):],
+                                 ["heard 8", *(["heard 22"] if "22" in script else []), "heard 26", "heard 8"])
+
     def test_a_start_that_fails_while_events_come_ends_the_program(self):
         program = self.on_other_library("flood error=22")
         program.ends(status=1, errors=re.compile(r"\A(\n\*{44}\nUnregisterd |\Z)"))

@@ -40,6 +40,14 @@ class Operator(SystemTest):
                 program.gets(number)
                 self.assert_orderly(program.ends())
 
+    def test_a_signal_while_the_trace_is_being_switched_on_switches_it_off_again(self):
+        for command in (8, 22):
+            with self.subTest(f"message type {command}"):
+                program = self.on_other_library(f"interrupt={command}").ends()
+                self.assertEqual(program.talk.lines()[-4:], ["heard 8", "heard 22", "heard 26", "heard 8"])
+                self.assertIn("One moment. Program Exiting", program.screen.lines())
+                self.assertIn("DMS100 Switch \n", program.log())
+
     def test_a_signal_ends_the_pause_after_another_character(self):
         program = self.traces()
         program.types("xq")

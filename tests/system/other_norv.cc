@@ -8,6 +8,7 @@
 //     short        before the frame come events that end within their fields
 //     exits        SIGUSR1 makes a thread of the library's leave the process with exit(5)
 //     flood        300 events come before the answer to a subscription
+//     interrupt=8  the process gets SIGINT when message type 8 is heard for the first time
 #include <fcntl.h>
 #include <unistd.h>
 
@@ -143,6 +144,10 @@ void sendEvents(const NvMsg32Bit& subscriber) {
 
 void answer(NvMsg32Bit& command) {
     talk("heard " + std::to_string(command.type));
+    if (static bool interrupted = false; told("interrupt=" + std::to_string(command.type)) && !interrupted) {
+        interrupted = true;
+        kill(getpid(), SIGINT);
+    }
     if (told("silent=" + std::to_string(command.type)))
         return;
     if (command.type == DetectEvt && told("flood")) {
