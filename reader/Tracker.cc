@@ -56,14 +56,15 @@ capture::Variant Tracker::variantOf(const capture::Item& item) {
     return capture::Variant::unknown;
 }
 
+// Channels are told apart by name: readers come and go, and an address may lead to another interface later.
 Tracker::Channel& Tracker::channelOf(const capture::Frame& frame) {
-    if (lastChannel_ == nullptr || frame.interface != lastInterface_) {
-        const std::string name = frame.interface == nullptr ? "" : frame.interface->name;
+    const std::string_view name =
+        frame.interface == nullptr ? std::string_view() : std::string_view(frame.interface->name);
+    if (last_ == nullptr || last_->first != name) {
         const capture::Role role = role_ == capture::Role::unknown ? frame.role : role_;
-        lastChannel_ = &channels_.try_emplace(name, calls::Timers(), role).first->second;
-        lastInterface_ = frame.interface;
+        last_ = &*channels_.try_emplace(std::string(name), calls::Timers(), role).first;
     }
-    return *lastChannel_;
+    return last_->second;
 }
 
 void Tracker::follow(Channel& channel, Seen& seen) {

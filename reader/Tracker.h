@@ -53,11 +53,11 @@ class Tracker {
     capture::Variant variant_;
     bool followsLinks_ = true;
     std::uint64_t frames_ = 0;
-    std::optional<std::int64_t> first_;                     // on the clocks of the D channels
-    std::map<std::string, Channel, std::less<>> channels_;  // by the name of the D channel
-    const capture::Interface* lastInterface_ = nullptr;
-    Channel* lastChannel_ = nullptr;
-    Chatter* chatter_ = nullptr;  // null once the guess was told, or if it need not be
+    std::optional<std::int64_t> first_;  // on the clocks of the D channels
+    using Channels = std::map<std::string, Channel, std::less<>>;
+    Channels channels_;                     // by the name of the D channel
+    Channels::value_type* last_ = nullptr;  // that of the last item
+    Chatter* chatter_ = nullptr;            // null once the guess was told, or if it need not be
     std::string_view done_;
 };
 

@@ -19,6 +19,9 @@ class FileError : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
+// A signal ended the program before it had anything to write: what the output held stays. Exit status 0.
+class StoppedEarly {};
+
 // Whoever read the output is gone. The program ends without a word, exit status 0.
 class ReaderGone {};
 

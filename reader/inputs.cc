@@ -4,6 +4,7 @@
 
 #include <cerrno>
 #include <cstring>
+#include <filesystem>
 
 #include "capture/open.h"
 #include "lapdlog/log.h"
@@ -58,6 +59,17 @@ std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*c
     if (input.merge && files.size() > 1)
         return std::make_unique<Merge>(openers);
     return std::make_unique<Sequence>(std::move(openers));
+}
+
+void checkForms(const Options& options) {
+    if (options.input.follow)
+        return;
+    for (const std::string& file : inputFiles(options)) {
+        std::error_code ignored;
+        capture::Item item;
+        if (file != "-" && std::filesystem::is_regular_file(file, ignored))
+            openOne(file, options.input)->next(item);
+    }
 }
 
 }  // namespace reader

@@ -20,6 +20,10 @@ std::vector<std::string> inputFiles(const Options& options);
 // known form, before anything is read.
 std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& chatter);
 
+// Throws capture::BadInput for a regular file among them that is of no known form. Inputs that are followed
+// may be empty as yet, and are not looked at; nor are pipes, which can be read only once.
+void checkForms(const Options& options);
+
 }  // namespace reader
 
 #endif

@@ -39,6 +39,8 @@ int runProgram(const std::vector<std::string>& words) {
         return run(words);
     } catch (const ReaderGone&) {
         return good;
+    } catch (const StoppedEarly&) {
+        return good;
     } catch (const UsageError& error) {
         return fail(badUsage, error.what());
     } catch (const std::exception& error) {

@@ -43,13 +43,24 @@ Session::Session(const Options& options, Chatter& chatter)
       chatter_(chatter),
       filter_(options.filters),
       tracker_(options.input),
-      reader_(openInputs(options, chatter)) {}
+      reader_(openInputs(options, chatter)) {
+    stopOnSignals();
+}
+
+void Session::awaitInputs() {
+    checkForms(options_);
+    if (!reader_.awaitFirst(stopped))
+        throw StoppedEarly();
+}
 
 Output& Session::output(std::string_view form, bool (*looksRight)(std::string_view)) {
     if (output_ == nullptr && isStandard(options_.output.path)) {
         output_ = std::make_unique<Output>();
+        checkNoInput(output_->descriptor(), output_->name(), inputFiles(options_));
     } else if (output_ == nullptr) {
-        checkOutput(options_.output.path, inputFiles(options_), form, looksRight);
+        const bool isEmptied = checkOutput(options_.output.path, inputFiles(options_), form, looksRight);
+        if (isEmptied)
+            awaitInputs();
         output_ = std::make_unique<Output>(options_.output.path);
     }
     if (output_->isTerminal())
@@ -58,7 +69,6 @@ Output& Session::output(std::string_view form, bool (*looksRight)(std::string_vi
 }
 
 void Session::run(Consumer& consumer, const std::function<std::unique_ptr<Composer>()>& makeComposer) {
-    stopOnSignals();
     Work work;
     work.makeComposer = makeComposer;
     work.first = options_.first;
@@ -66,7 +76,7 @@ void Session::run(Consumer& consumer, const std::function<std::unique_ptr<Compos
         options_.output.jobs != 0 ? options_.output.jobs : std::max(1U, std::thread::hardware_concurrency());
     work.eachAtOnce = options_.output.lineBuffered;
     work.stopped = &stopped;
-    runPipeline(*reader_, tracker_, filter_, consumer, chatter_, work);
+    runPipeline(reader_, tracker_, filter_, consumer, chatter_, work);
 }
 
 }  // namespace reader

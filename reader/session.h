@@ -11,6 +11,7 @@
 #include "reader/Options.h"
 #include "reader/Output.h"
 #include "reader/Pipeline.h"
+#include "reader/Primed.h"
 #include "reader/Tracker.h"
 #include "reader/outputs.h"
 
@@ -23,12 +24,13 @@ bool useColors(const OutputOptions& options, const Output& out);
 // order.
 class Session {
   public:
-    // Opens the inputs. Throws UsageError or FileError.
+    // Opens the inputs. Throws UsageError or FileError. From now on SIGINT and SIGTERM end the work in order.
     Session(const Options& options, Chatter& chatter);
 
-    // Opened by the first call: standard output, or the file that the options name, created or emptied. A
-    // file that is neither empty nor of the right form ("text") is refused with FileError, and so is one of
-    // the inputs.
+    // Opened by the first call: standard output, or the file that the options name, created or emptied. That
+    // happens only once all inputs are known to have a form that can be read, so an input that cannot be read
+    // leaves the file as it was; so does a signal before the first item (StoppedEarly). A file that is
+    // neither empty nor of the right form ("text") is refused with FileError, and so is one of the inputs.
     Output& output(std::string_view form = "", bool (*looksRight)(std::string_view) = looksLikeNothing);
     bool useColors() { return reader::useColors(options_.output, output()); }
 
@@ -46,11 +48,13 @@ class Session {
     void run(Consumer& consumer, const std::function<std::unique_ptr<Composer>()>& makeComposer);
 
   private:
+    void awaitInputs();
+
     const Options& options_;
     Chatter& chatter_;
     Filter filter_;
     Tracker tracker_;
-    std::unique_ptr<capture::Reader> reader_;
+    Primed reader_;
     std::unique_ptr<Output> output_;
 };
 

@@ -6,6 +6,7 @@ import re
 import shutil
 import subprocess
 import tempfile
+import time
 import unittest
 
 LIMIT = 120  # seconds; only ends a test that would wait for ever
@@ -42,6 +43,15 @@ def output(*words, **more):
     if status != 0:
         raise AssertionError(f"lapdread {' '.join(map(str, words))}: status {status}\n{error}")
     return out.decode(errors="surrogateescape")
+
+
+def until(true, what):
+    """Waits until it is so."""
+    end = time.monotonic() + LIMIT
+    while not true():
+        if time.monotonic() > end:
+            raise AssertionError(f"never: {what}")
+        time.sleep(0.01)
 
 
 class Folder(unittest.TestCase):

@@ -7,23 +7,13 @@ import pathlib
 import shutil
 import signal
 import subprocess
-import time
 import unittest
 
-from lapdread_harness import EXAMPLES, LAPDREAD, LIMIT, SOURCE, Folder, environment, output, run
+from lapdread_harness import EXAMPLES, LAPDREAD, LIMIT, SOURCE, Folder, environment, output, run, until
 
 EXTCAP = SOURCE / "reader/extcap"
 LINES = ["TX 2026-11-21T11:25:33.000Z 00017f", "RX 2026-11-21T11:25:33.008Z 000173",
          "TX 2026-11-21T11:25:34.000Z 00010101", "RX 2026-11-21T11:25:34.008Z 00010101"]
-
-
-def until(true, what):
-    """Waits until it is so."""
-    end = time.monotonic() + LIMIT
-    while not true():
-        if time.monotonic() > end:
-            raise AssertionError(f"never: {what}")
-        time.sleep(0.01)
 
 
 class Running(Folder):
