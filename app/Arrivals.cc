@@ -1,6 +1,7 @@
 #include "app/Arrivals.h"
 
 #include <iostream>
+#include <utility>
 
 namespace app {
 
@@ -24,9 +25,15 @@ void Arrivals::gone() {
 
 // Does not call resume(): the record's delivery is about to end, and its end starts those that have waited
 // for the room.
-void Arrivals::refused() {
+void Arrivals::refused(const Record& rec) {
+    untold_ += rec.arrival().missing;
     ++refused_;
     ++gone_;
+}
+
+void Arrivals::tellOf(Record& rec) {
+    const vela::MsgBody::Arrival arrival = rec.arrival();
+    rec.setArrival({arrival.number, arrival.missing + std::exchange(untold_, 0)});
 }
 
 void Arrivals::full() {

@@ -38,6 +38,7 @@ class Arrivals : public vela::Lane {
             queue(std::move(rec));
         while (std::unique_ptr<Record> due = std::move(early_[next_ % early_.size()])) {
             ++next_;
+            tellOf(*due);
             queue(std::move(due));
         }
     }
@@ -45,8 +46,8 @@ class Arrivals : public vela::Lane {
     // Call it when a record that was taken has been destroyed. It starts deliveries that have waited for the
     // room, so the caller must not hold queueGuard.
     void gone();
-    // Call it when the queue had no memory for a record, which is destroyed. Called under queueGuard.
-    void refused();
+    // Call it when the queue had no memory for a record, which the caller destroys. Called under queueGuard.
+    void refused(const Record& rec);
 
     // Calls queue(record) for the records that still wait for their turn. Call it when no delivery runs any
     // more, because then their turn does not come.
@@ -61,6 +62,9 @@ class Arrivals : public vela::Lane {
     // How many records wait, are delivered, are queued or are being written; 0 when all that have arrived are
     // written.
     std::uint64_t unwritten() const { return pending() + alsoAtWork(); }
+    // How many records were lost of which no record tells (MsgBody::arrival). Those that the queue has
+    // refused are not among them. Call it when no delivery runs any more.
+    std::uint64_t untold() const { return missing() + untold_; }
     // How many records were lost because the system had no thread or no memory.
     std::uint64_t lostForWantOfMeans() const { return losses().noMeans + refused_; }
 
@@ -69,9 +73,11 @@ class Arrivals : public vela::Lane {
     unsigned int alsoAtWork() const override { return static_cast<unsigned int>(taken_ - gone_); }
     void full() override;
     void sayLost(std::uint64_t) override {}  // the log itself says where records are missing
+    void tellOf(Record& rec);
 
     std::array<std::unique_ptr<Record>, QueueCapacity> early_;  // records before their turn, by number
     std::uint64_t next_ = 1;                                    // the number whose turn it is
+    std::uint64_t untold_ = 0;  // lost before a refused record: the next record that is queued tells of them
     std::atomic<std::uint64_t> taken_ = 0;
     std::atomic<std::uint64_t> gone_ = 0;
     std::atomic<std::uint64_t> refused_ = 0;

@@ -117,8 +117,7 @@ void displayForEver(vela::Thread::control& ctl) {
 // Puts rec into the queue, in its turn. Called under queueGuard.
 void queueRecord(std::unique_ptr<Record> rec) {
     if (!event_queue.enqueue(rec.get())) {
-        rec.reset();
-        arrivals->refused();
+        arrivals->refused(*rec);
         decoder::text(decoder::enqueueFailed);
         decoder::flushLines();
         return;

@@ -206,7 +206,7 @@ void giveUpRest() {
         vela::sleep_ms(PollMs);
     const Discarded queued = discardQueued();
     givenUp += queued.records + arrivals->unwritten();  // one may have gone with a display thread that failed
-    if (const std::uint64_t missing = givenUp + queued.missing + arrivals->missing(); missing != 0)
+    if (const std::uint64_t missing = givenUp + queued.missing + arrivals->untold(); missing != 0)
         traceLog.framesMissing(missing);
 }
 

@@ -12,9 +12,9 @@ namespace {
 
 using testing::Record;
 
-std::unique_ptr<Record> numbered(std::uint64_t number) {
+std::unique_ptr<Record> numbered(std::uint64_t number, std::uint64_t missing = 0) {
     auto rec = std::make_unique<Record>();
-    rec->setArrival({number, 0});
+    rec->setArrival({number, missing});
     return rec;
 }
 
@@ -61,6 +61,21 @@ TEST(Arrivals, AsManyAsTheQueueHoldsMayComeBeforeTheirTurn) {
     }
 }
 
+// A record that the queue refuses may be the one that tells how many were lost before it.
+TEST(Arrivals, TheNextRecordTellsWhatARefusedOneWasToTell) {
+    Arrivals arrivals;
+    const auto refuse = [&](std::unique_ptr<Record> rec) { arrivals.refused(*rec); };
+    std::vector<std::uint64_t> missing;
+    const auto take = [&](std::unique_ptr<Record> rec) { missing.push_back(rec->arrival().missing); };
+    arrivals.takeInTurn(numbered(1, 7), refuse);
+    arrivals.takeInTurn(numbered(2, 5), refuse);
+    EXPECT_EQ(arrivals.untold(), 12U);
+    arrivals.takeInTurn(numbered(3, 2), take);
+    arrivals.takeInTurn(numbered(4), take);
+    EXPECT_EQ(missing, (std::vector<std::uint64_t>{14, 0}));
+    EXPECT_EQ(arrivals.untold(), 0U);
+}
+
 TEST(Arrivals, CountAsUnwrittenUntilTheyAreGone) {
     Arrivals arrivals;
     std::vector<std::unique_ptr<Record>> queue;
@@ -71,7 +86,7 @@ TEST(Arrivals, CountAsUnwrittenUntilTheyAreGone) {
     EXPECT_EQ(arrivals.unwritten(), 3U);
     arrivals.gone();
     EXPECT_EQ(arrivals.unwritten(), 2U);
-    arrivals.refused();
+    arrivals.refused(*queue.back());
     EXPECT_EQ(arrivals.unwritten(), 1U);
     EXPECT_EQ(arrivals.lostForWantOfMeans(), 1U);
     int early = 0;

@@ -2,11 +2,14 @@
 #include <gtest/gtest.h>
 #include <unistd.h>
 
+#include <atomic>
+#include <cstddef>
 #include <cstdio>
 #include <fstream>
 #include <iterator>
 #include <memory>
 #include <mutex>
+#include <new>
 #include <string>
 #include <string_view>
 #include <thread>
@@ -18,6 +21,25 @@
 #include "decoder/lines.h"
 #include "tests/app/channels.h"
 #include "tests/support/fake_norv.h"
+
+namespace {
+
+// So many of the next allocations that may fail without an exception do fail: those of the queue's nodes.
+std::atomic<int> refusedNodes = 0;
+
+}  // namespace
+
+void* operator new(std::size_t size, const std::nothrow_t&) noexcept {
+    if (refusedNodes > 0) {
+        --refusedNodes;
+        return nullptr;
+    }
+    try {
+        return operator new(size);
+    } catch (...) {
+        return nullptr;
+    }
+}
 
 namespace app {
 namespace {
@@ -144,6 +166,20 @@ TEST_F(Road, TheQueueHasRoomForEachRecordThatIsDelivered) {
     showAll();
     EXPECT_EQ(shown(), upTo(500));
     EXPECT_EQ(log_.text().find("Enqueue Failed"), std::string::npos);
+}
+
+// The queue has kept no nodes of earlier records, so each of the first ones needs memory.
+TEST_F(Road, AFrameForWhichTheQueueHasNoMemoryIsCountedAndTheLogSaysSo) {
+    std::destroy_at(&event_queue);
+    std::construct_at(&event_queue, QueueCapacity);
+    refusedNodes = 2;
+    send(0, 5);
+    showAll();
+    EXPECT_EQ(refusedNodes, 0);
+    EXPECT_EQ(shown(), (std::vector<unsigned int>{2, 3, 4}));
+    EXPECT_EQ(log_.text().substr(0, 32), "Enqueue Failed \nEnqueue Failed \n");
+    EXPECT_EQ(arrivals->lostForWantOfMeans(), 2U);
+    EXPECT_TRUE(traceLog.complete());
 }
 
 TEST_F(Road, ACancelledDisplayShowsWhatHasArrivedWhenTheArrivalsAreClosed) {

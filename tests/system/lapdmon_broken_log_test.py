@@ -53,7 +53,7 @@ class BrokenLog(SystemTest):
                                       f"/dev/full: frames lost: {FRAMES + 1}\n")
         self.traced_whole(program)
 
-    def test_a_disk_that_is_full_only_at_the_end_is_said_then(self):
+    def test_a_disk_that_is_full_is_said_of_a_frame_that_comes_alone(self):
         program = self.on_board(run=("lapdmon", "-b1", "-f", "/dev/full"), frames=capture(MARK))
         program.screen.wait("Frame Error")
         program.types("q")
@@ -143,7 +143,18 @@ class BrokenLog(SystemTest):
         self.assertGreater(len(parts), 10)
 
 
-class FewThreads(SystemTest):
+class FewMeans(SystemTest):
+    def test_frames_for_which_the_queue_has_no_memory_are_counted_and_the_status_is_1(self):
+        program = self.on_board("--rate", "max", frames=DAY, run=(
+            "env", "LD_PRELOAD=" + os.environ["FEW_THREADS_LIBRARY"], "FEW_NODES_FROM=1", "FEW_NODES_TO=3", LAPDMON, "-b1"))
+        program.screen.wait("Frame Error")
+        program.types("q")
+        program.ends(status=1, errors="lapdmon: frames lost for want of threads or memory: 3\n")
+        log = program.log()
+        self.assertEqual(log.count("Enqueue Failed \n"), 3)
+        self.assertEqual(len(re.findall(r"Frame: Time", log)), FRAMES + 1 - 3)
+        self.assertEqual(program.journal.lines()[-1], BALANCE)
+
     def test_frames_for_which_the_system_has_no_thread_are_counted_and_the_status_is_1(self):
         program = self.on_board("--rate", "max", frames=DAY, run=(
             "env", "LD_PRELOAD=" + os.environ["FEW_THREADS_LIBRARY"], "FEW_FROM=100", "FEW_TO=109", LAPDMON, "-b1"))
@@ -178,7 +189,7 @@ class StalledLog(SystemTest):
         wait_until_full(self.reader)
         end = time.monotonic() + LIMIT
         while switch.held() > 0:
-            self.assertLess(time.monotonic(), end, "events stay with the transport")
+            self.assertLess(time.monotonic(), end, "the program does not take the events")
             time.sleep(0.005)
         return program
 
