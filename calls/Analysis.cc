@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <array>
+#include <optional>
 #include <utility>
 
 #include "calls/CallFindings.h"
@@ -16,30 +17,11 @@
 #include "calls/Waits.h"
 #include "calls/WitnessKeeper.h"
 #include "calls/findingOf.h"
+#include "calls/standardVariant.h"
 
 namespace calls {
 
 namespace {
-
-isdn::Variant variantOf(capture::Variant variant, isdn::Variant otherwise) {
-    switch (variant) {
-        case capture::Variant::att4ess:
-            return isdn::Variant::ess4;
-        case capture::Variant::ess5:
-            return isdn::Variant::ess5;
-        case capture::Variant::dms100:
-            return isdn::Variant::dms100;
-        case capture::Variant::ntt:
-            return isdn::Variant::ntt;
-        case capture::Variant::net5:
-            return isdn::Variant::net5;
-        case capture::Variant::ni2:
-            return isdn::Variant::ni2;
-        case capture::Variant::unknown:
-            break;
-    }
-    return otherwise;
-}
 
 bool isGrouped(const Options& options, const std::string& name) {
     return std::any_of(options.groups.begin(), options.groups.end(),
@@ -81,11 +63,20 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
         waits_.advance(at);
         maintenance_.advance(at);
         channels_.advance(at);
+        patterns_.advance(at);
         table_.advance(at);
+    }
+    void linkChanged(std::uint8_t tei, const Moment& moment, const std::string& dChannel, bool isUp) {
+        patterns_.linkChanged(moment, dChannel, isUp);
+        if (isUp)
+            table_.linkUp(tei);
+        else
+            table_.linkDown(tei, moment.at);
     }
     void finish() {
         channels_.finish();
         table_.finish();
+        patterns_.finish();
     }
     CallTable& table() { return table_; }
     const CallTable& table() const { return table_; }
@@ -100,6 +91,8 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
         findings_.ended(call, by);
         channels_.ended(call, by);
         patterns_.ended(call, by);
+        if (call.endedBy != EndedBy::open)
+            listener_.ended(call);
     }
     void gone(const Call& call) override {
         findings_.gone(call);
@@ -184,6 +177,7 @@ struct Analysis::Channel {
     DChannel links;
     LinkFindings linkFindings;
     ChannelClock clock;
+    std::optional<std::int64_t> begin;  // of the first frame
     Group& group;
     std::uint32_t groupNumber;
     isdn::Variant variant;
@@ -218,18 +212,20 @@ Analysis::Channel& Analysis::channelOf(const capture::Interface& interface) {
         found = channels_
                     .emplace(interface.name,
                              std::make_unique<Channel>(options_, interface.name, *groups_[group], group,
-                                                       variantOf(interface.variant, options_.variant)))
+                                                       standardVariant(interface.variant, options_.variant)))
                     .first;
     }
     last_ = found->second.get();
     if (interface.variant != capture::Variant::unknown)
-        last_->variant = variantOf(interface.variant, options_.variant);
+        last_->variant = standardVariant(interface.variant, options_.variant);
     return *last_;
 }
 
 const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
     Channel& channel = channelOf(*frame.interface);
     const std::int64_t at = channel.clock.at(frame);
+    if (!channel.begin)
+        channel.begin = at;
     if (channel.clock.hasRestarted())
         channel.restarted();
     channel.group.advance(at);
@@ -240,10 +236,9 @@ const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
         return marks;
     channel.keepers[layer2.tei].take(layer2, frame.transmitted ? Side::us : Side::peer, number, at, marks,
                                      channel.links.events());
-    if (marks.linkUp)
-        channel.group.table().linkUp(layer2.tei);
-    else if (marks.linkDown)
-        channel.group.table().linkDown(layer2.tei, at);
+    if (marks.linkUp || marks.linkDown)
+        channel.group.linkChanged(layer2.tei, {number, at, frame.clock, frame.time}, channel.name,
+                                  marks.linkUp);
     for (const KeptFrame& late : channel.links.late()) {
         capture::Frame kept = late.frame;
         kept.octets = late.octets;
@@ -302,6 +297,15 @@ std::uint64_t Analysis::dropped() const {
     for (const auto& group : groups_)
         sum += group->table().dropped();
     return sum;
+}
+
+std::vector<Span> Analysis::spans() const {
+    std::vector<Span> spans;
+    for (const auto& [name, channel] : channels_) {
+        if (channel->begin)
+            spans.push_back({name, channel->groupNumber, *channel->begin, channel->clock.now()});
+    }
+    return spans;
 }
 
 const DChannel* Analysis::dChannel(std::string_view name) const {

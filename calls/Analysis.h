@@ -30,9 +30,19 @@ class Listener {
     // A message that the receiver's layer 2 has accepted, put together if it came in segments. `call` is null
     // if it belongs to none. The number of the frame may be lower than that of the frame handed in last.
     virtual void heard(const Message& /*message*/, const Call* /*call*/) {}
+    // The call has ended; stragglers may still be heard. Nothing is said of a call that outlives the trace.
+    virtual void ended(const Call& /*call*/) {}
     // Nothing will change in the call any more. Calls that share a table come in the order of their end.
     virtual void gone(const Call& /*call*/) {}
     virtual void found(const Finding& /*finding*/) {}
+};
+
+// How long a D channel was heard, on its clock, in nanoseconds.
+struct Span {
+    std::string dChannel;
+    std::uint32_t group = 0;  // as in Call
+    std::int64_t from = 0;
+    std::int64_t until = 0;
 };
 
 struct Options {
@@ -69,6 +79,8 @@ class Analysis {
     std::vector<const Call*> open() const;
     // Calls that were let go before their end, since too many were alive.
     std::uint64_t dropped() const;
+    // Of each D channel from which a frame has come, by name.
+    std::vector<Span> spans() const;
     // What is known of the links of a D channel; null if nothing has come from it.
     const DChannel* dChannel(std::string_view name) const;
 

@@ -61,7 +61,7 @@ std::string flagsOf(const Call& call) {
         Flag{call.beforeTrace, "before-trace"}, Flag{call.endedBy == EndedBy::open, "open"},
         Flag{call.uncertain, "uncertain"},      Flag{call.setupRepeated, "setup-repeated"},
         Flag{call.overlap, "overlap"},          Flag{call.broadcast, "broadcast"},
-        Flag{call.resumes != 0, "resumed"},
+        Flag{call.resumes != 0, "resumed"},     Flag{call.gaveWay, "glare"},
     };
     std::string words;
     for (const Flag& flag : flags) {

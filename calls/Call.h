@@ -132,6 +132,7 @@ struct Call {
     bool setupRepeated = false;
     bool broadcast = false;
     bool overlap = false;
+    bool gaveWay = false;   // glare: the other side's call on the same channel went on instead
     bool released = false;  // RELEASE has passed
 
     static constexpr std::size_t mostFrames = 1000;

@@ -1,6 +1,7 @@
 #include "calls/Channels.h"
 
 #include <algorithm>
+#include <limits>
 #include <utility>
 
 #include "calls/FindingKinds.h"
@@ -169,8 +170,10 @@ void Channels::settleGlare(Call& call, Seizure& seizure, const Message* message)
     else if (message != nullptr)
         sink_.report(
             findingOf(findings::glare, *message, &call, which + "; one was moved to another channel"));
-    else
+    else {
+        call.gaveWay = !seizure.answered;
         sink_.report(findingOf(findings::glare, call.end, call, which + "; one gave way"));
+    }
 }
 
 void Channels::ended(Call& call, const Message*) {
@@ -213,11 +216,14 @@ void Channels::noteRefusal(const Call& call, const Seizure& seizure) {
     State& state = *stateOf(key);
     std::string sentence = "channel " + toString(key) + " was refused with cause " + std::to_string(value) +
                            " although the trace shows it idle";
-    if (aboutThisChannel && ++state.refusals == 2)
-        sink_.report(
-            findingOf(findings::stuckChannel, call.end, call, std::move(sentence) + ", for the second time"));
-    else
+    if (aboutThisChannel && ++state.refusals == 2) {
+        Finding stuck =
+            findingOf(findings::stuckChannel, call.end, call, std::move(sentence) + ", for the second time");
+        stuck.channels = {toString(key)};
+        sink_.report(std::move(stuck));
+    } else {
         sink_.report(findingOf(findings::channelRefused, call.end, call, std::move(sentence)));
+    }
 }
 
 // The call went without clearing: one end may still hold the channel.
@@ -226,10 +232,42 @@ void Channels::noteOrphan(const Call& call, const Seizure& seizure) {
     if (!lost || call.clearingSeen)
         return;
     for (const ChannelKey& key : seizure.held) {
-        orphans_[key] = {call.end.at, findingOf(findings::stuckChannel, call.end, call,
-                                                "channel " + toString(key) + " of " + callName(call.number) +
-                                                    " was neither cleared nor restarted")};
+        Finding stuck = findingOf(findings::stuckChannel, call.end, call,
+                                  "channel " + toString(key) + " of " + callName(call.number) +
+                                      " was neither cleared nor restarted");
+        stuck.channels = {toString(key)};
+        orphans_[key] = {call.end.at, call.number, call.endedBy == EndedBy::link, std::move(stuck)};
     }
+}
+
+// Reports the channels whose calls went before a moment. Those that went with a link have one cause, and so
+// one finding.
+void Channels::reportOrphans(std::int64_t before) {
+    std::vector<Orphan> lost;
+    for (auto orphan = orphans_.begin(); orphan != orphans_.end();) {
+        if (orphan->second.at >= before) {
+            ++orphan;
+            continue;
+        }
+        if (orphan->second.withLink)
+            lost.push_back(std::move(orphan->second));
+        else
+            sink_.report(std::move(orphan->second.finding));
+        orphan = orphans_.erase(orphan);
+    }
+    if (lost.empty())
+        return;
+    Finding all = std::move(lost.front().finding);
+    if (lost.size() > 1) {
+        std::vector<std::string> calls{std::to_string(lost.front().call)};
+        for (std::size_t i = 1; i < lost.size(); ++i) {
+            all.channels.push_back(lost[i].finding.channels.front());
+            calls.push_back(std::to_string(lost[i].call));
+        }
+        all.sentence = "channels " + listOf(all.channels) + " of calls " + listOf(calls) +
+                       " were neither cleared nor restarted after the link was lost";
+    }
+    sink_.report(std::move(all));
 }
 
 void Channels::restarted(const Message& acknowledge) {
@@ -270,21 +308,10 @@ void Channels::advance(std::int64_t at) {
         if (holds(conflict.first) && holds(conflict.second))
             sink_.report(std::move(conflict.finding));
     }
-    for (auto orphan = orphans_.begin(); orphan != orphans_.end();) {
-        if (at - orphan->second.first <= timers_.t316) {
-            ++orphan;
-            continue;
-        }
-        sink_.report(std::move(orphan->second.second));
-        orphan = orphans_.erase(orphan);
-    }
+    reportOrphans(at - timers_.t316);
 }
 
-void Channels::finish() {
-    for (auto& [key, orphan] : orphans_)
-        sink_.report(std::move(orphan.second));
-    orphans_.clear();
-}
+void Channels::finish() { reportOrphans(std::numeric_limits<std::int64_t>::max()); }
 
 std::map<ChannelKey, std::vector<std::uint64_t>> Channels::holders() const {
     std::map<ChannelKey, std::vector<std::uint64_t>> all;

@@ -60,6 +60,13 @@ class Channels : public CallObserver {
         std::int64_t deadline;
         Finding finding;
     };
+    // A channel whose call went without clearing: one end may still hold it.
+    struct Orphan {
+        std::int64_t at = 0;
+        std::uint64_t call = 0;
+        bool withLink = false;  // the call went with its link, like others perhaps
+        Finding finding;
+    };
     // In which order a side takes channels.
     struct Hunting {
         std::uint32_t last = 0;
@@ -75,6 +82,7 @@ class Channels : public CallObserver {
     void settleGlare(Call& call, Seizure& seizure, const Message* message);
     void noteRefusal(const Call& call, const Seizure& seizure);
     void noteOrphan(const Call& call, const Seizure& seizure);
+    void reportOrphans(std::int64_t before);
     bool isKnownIdle(const std::vector<ChannelKey>& channels) const;
     State* stateOf(const ChannelKey& key);
 
@@ -85,8 +93,7 @@ class Channels : public CallObserver {
     FindingSink& sink_;
     std::map<ChannelKey, State> states_;
     std::map<std::uint64_t, Seizure> seizures_;  // by number of the call
-    // Channels whose call went without clearing, and when: reported if nobody restarts or takes them.
-    std::map<ChannelKey, std::pair<std::int64_t, Finding>> orphans_;
+    std::map<ChannelKey, Orphan> orphans_;       // reported if nobody restarts or takes them
     std::vector<Conflict> conflicts_;
     std::array<Hunting, 2> hunting_;
     bool glareProneSaid_ = false;

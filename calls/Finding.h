@@ -7,6 +7,7 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "capture/Frame.h"
 
@@ -42,6 +43,7 @@ struct Finding {
     std::optional<std::uint64_t> call;  // its number, if the finding is about a call
     std::string sentence;               // what happened, with the values of this case; no full stop
     std::uint32_t count = 1;            // how often it has happened since
+    std::vector<std::string> channels;  // "7", "2/7": the B channels that it says are stuck
 };
 
 }  // namespace calls

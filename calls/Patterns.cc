@@ -35,22 +35,46 @@ bool isOrdinary(std::uint8_t cause) {
 void Patterns::ended(Call& call, const Message*) {
     if (call.endedBy == EndedBy::open)
         return;
-    findMassClear(call);
+    if (endsWithLink(call)) {
+        if (lost_.empty())
+            lostAt_ = call.end.at;
+        lost_.push_back(std::to_string(call.number));
+    }
     findSameDuration(call);
     findCauseBurst(call);
 }
 
-void Patterns::findMassClear(const Call& call) {
-    if (call.endedBy != EndedBy::link)
-        return;
-    while (!lost_.empty() && call.end.at - lost_.front() > second)
-        lost_.pop_front();
-    lost_.push_back(call.end.at);
-    if (lost_.size() != callsThatEndTogether)
-        return;
-    sink_.report(findingOf(findings::massClear, call.end, call,
-                           std::to_string(lost_.size()) + " calls or more ended with the link"));
+void Patterns::linkChanged(const Moment& moment, const std::string& dChannel, bool isUp) {
+    reportMassClear();
+    link_ = LinkChange{moment, dChannel, isUp};
 }
+
+// The link was down for too long, or one side cleared as the link went or came, for a reason that is not
+// everyday's.
+bool Patterns::endsWithLink(const Call& call) const {
+    if (!link_)
+        return false;
+    if (call.endedBy == EndedBy::link)
+        return true;
+    const bool soon = call.end.at - link_->moment.at <= second;
+    const bool ordinary = call.endedBy == EndedBy::release && call.cause && isOrdinary(call.cause->value);
+    return soon && !ordinary && call.endedBy != EndedBy::suspended && call.endedBy != EndedBy::replaced;
+}
+
+void Patterns::reportMassClear() {
+    if (lost_.size() >= callsThatEndTogether)
+        sink_.report(findingOf(findings::massClear, link_->moment, link_->dChannel,
+                               std::to_string(lost_.size()) + " calls ended with the link, which " +
+                                   (link_->isUp ? "was set up" : "went down") + " here: " + listOf(lost_)));
+    lost_.clear();
+}
+
+void Patterns::advance(std::int64_t at) {
+    if (!lost_.empty() && at - lostAt_ > second)
+        reportMassClear();
+}
+
+void Patterns::finish() { reportMassClear(); }
 
 void Patterns::findSameDuration(const Call& call) {
     if (!call.duration || *call.duration < shortestLength || call.endedBy != EndedBy::release)

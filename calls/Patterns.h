@@ -5,7 +5,9 @@
 #include <cstdint>
 #include <deque>
 #include <map>
+#include <optional>
 #include <string>
+#include <vector>
 
 #include "calls/CallTable.h"
 #include "calls/FindingSink.h"
@@ -18,6 +20,12 @@ class Patterns : public CallObserver {
   public:
     explicit Patterns(FindingSink& sink) : sink_(sink) {}
     void ended(Call& call, const Message* by) override;
+    // A link went down, or was set up (again), in this frame.
+    void linkChanged(const Moment& moment, const std::string& dChannel, bool isUp);
+    // The clock has come to `at`; to be called before what happened then is handed in.
+    void advance(std::int64_t at);
+    // The end of the trace.
+    void finish();
 
   private:
     struct Failure {
@@ -28,12 +36,21 @@ class Patterns : public CallObserver {
         std::string bearer;
     };
 
-    void findMassClear(const Call& call);
+    bool endsWithLink(const Call& call) const;
+    void reportMassClear();
     void findSameDuration(const Call& call);
     void findCauseBurst(const Call& call);
 
     FindingSink& sink_;
-    std::deque<std::int64_t> lost_;       // when calls ended with their link
+    struct LinkChange {
+        Moment moment;
+        std::string dChannel;
+        bool isUp = false;
+    };
+
+    std::optional<LinkChange> link_;      // the last one
+    std::vector<std::string> lost_;       // numbers of the calls that ended with it, within a second
+    std::int64_t lostAt_ = 0;             // when the first of them ended
     std::deque<std::int64_t> durations_;  // of the last answered calls
     std::deque<std::int64_t> lengthsSaid_;
     std::deque<Failure> failures_;

@@ -32,4 +32,14 @@ Finding findingOf(const FindingKind& kind, const Moment& moment, const Call& cal
     return finding;
 }
 
+std::string listOf(std::span<const std::string> words) {
+    constexpr std::size_t most = 32;
+    std::string list;
+    for (std::size_t i = 0; i < words.size() && i < most; ++i)
+        list += (i == 0 ? "" : ", ") + words[i];
+    if (words.size() > most)
+        list += " and " + std::to_string(words.size() - most) + " more";
+    return list;
+}
+
 }  // namespace calls

@@ -3,6 +3,8 @@
 #include <array>
 #include <string_view>
 
+#include "calls/standardVariant.h"
+
 namespace reader {
 
 namespace {
@@ -38,7 +40,7 @@ calls::Options analysisOptions(const Options& options) {
     to.role = options.input.role;
     to.groups = options.calls.groups;
     if (options.input.variant != capture::Variant::unknown)
-        to.variant = standardVariant(options.input.variant);
+        to.variant = calls::standardVariant(options.input.variant);
     return to;
 }
 

@@ -39,8 +39,6 @@ struct Seen {
     const capture::Frame& frame() const { return item->frame; }
 };
 
-isdn::Variant standardVariant(capture::Variant variant);
-
 // The side that sent the frame: "U>N", "N>U", or "?>?" while the role is unknown.
 std::string_view direction(const Seen& seen);
 

@@ -1,5 +1,7 @@
 #include "reader/Tracker.h"
 
+#include "calls/standardVariant.h"
+
 namespace reader {
 
 namespace {
@@ -17,7 +19,7 @@ Seen Tracker::see(const capture::Item& item) {
     seen.item = &item;
     if (item.kind == Kind::frame || item.kind == Kind::oversized || item.kind == Kind::cut)
         seen.number = ++frames_;
-    seen.variant = standardVariant(variantOf(item));
+    seen.variant = calls::standardVariant(variantOf(item));
     Channel& channel = channelOf(item.frame);
     tellTime(channel, seen);
     if (followsLinks_)

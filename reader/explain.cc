@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <filesystem>
 
+#include "calls/standardVariant.h"
 #include "reader/Columns.h"
 #include "reader/TextConsumer.h"
 #include "reader/errors.h"
@@ -238,7 +239,7 @@ int runExplain(const Options& options, Chatter& chatter) {
     }
     Output out;
     ExplainComposer composer(useColors(options.output, out));
-    const isdn::Variant variant = standardVariant(options.input.variant);
+    const isdn::Variant variant = calls::standardVariant(options.input.variant);
     const bool isElement = options.explainAs == ExplainAs::element ||
                            (options.explainAs == ExplainAs::guess && looksLikeElement(*octets));
     std::string text;
