@@ -104,4 +104,8 @@ bool Analysed::isWanted(const calls::Finding& finding) const {
     return !filtered_ || hasPassed(finding.frame) || (finding.call && wanted_.contains(*finding.call));
 }
 
+bool Analysed::isWanted(const calls::Message& message) const {
+    return !filtered_ || hasPassed(message.number);
+}
+
 }  // namespace reader

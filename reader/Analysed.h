@@ -27,6 +27,7 @@ class Analysed : public Consumer, protected calls::Listener {
   protected:
     bool isWanted(const calls::Call& call) const;
     bool isWanted(const calls::Finding& finding) const;
+    bool isWanted(const calls::Message& message) const;
     // Derived classes that need messages call this in their own.
     void heard(const calls::Message& message, const calls::Call* call) override;
     void gone(const calls::Call& call) override;

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "calls/Finding.h"
+#include "calls/Occupancy.h"
 #include "calls/Timers.h"
 #include "capture/Frame.h"
 #include "reader/Chatter.h"
@@ -67,6 +68,7 @@ struct CallOptions {
     std::string sort;  // empty: in the order of their end
     bool failed = false;
     bool unanswered = false;
+    calls::TrunkSize trunk = calls::TrunkSize::unknown;    // of the figures; unknown: learnt
     calls::Severity least = calls::Severity::note;         // milder findings are not shown
     std::optional<calls::Severity> failOn = std::nullopt;  // exit status 3 for such a finding or a worse one
 };

@@ -10,6 +10,7 @@
 #include "reader/explain.h"
 #include "reader/list.h"
 #include "reader/record.h"
+#include "reader/stats.h"
 
 namespace reader {
 
@@ -70,6 +71,12 @@ constexpr char checkExamples[] = R"(  lapdread check lapdmon.log
       exit status 3 if there is an error
 )";
 
+constexpr char statsExamples[] = R"(  lapdread stats lapdmon.log
+      messages, causes, times, calls by direction and hour, channels
+  lapdread stats --csv --e1 day*.pcapng > figures.csv
+      a row a figure, for a spreadsheet
+)";
+
 const std::array table{
     Command{"list",
             "[FILE...]",
@@ -92,6 +99,12 @@ const std::array table{
             checkExamples,
             {"Findings", checkOptions()},
             runCheck},
+    Command{"stats",
+            "[FILE...]",
+            "figures: messages, causes, times, calls by direction and hour, channels",
+            statsExamples,
+            {"Figures", statsOptions()},
+            runStats},
     Command{"convert",
             "IN [OUT]",
             "frames in files that other tools read",
