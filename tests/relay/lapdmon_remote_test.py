@@ -70,11 +70,11 @@ class Lost(RelayTest):
         self.assertTrue(log.endswith("Frame Error \n"))
         self.assertEqual(lapdmon.screen.text().count("Addressable::Timeout"), 2)
 
-    def test_what_arrived_before_the_relay_died_is_shown(self):
-        """The relay sends 90 frames and is gone at once."""
+    def dies_after(self, frames, log):
+        """A trace whose relay sends so many frames and is gone at once."""
         listener = socket.create_server(("127.0.0.1", 0))
         self.addCleanup(listener.close)
-        lapdmon = Program(self, LAPDMON, "-b1", "-f", "gone.log",
+        lapdmon = Program(self, LAPDMON, "-b1", "-f", log,
                           REMOTE_NORV=f"127.0.0.1:{listener.getsockname()[1]}")
         peers = []
         for instance in (1, 2):
@@ -89,14 +89,33 @@ class Lost(RelayTest):
         self.answer(peers[1], 9)
         self.answer(peers[1], 23)
         event = b"".join(message(32, struct.pack("<IIII", 2, 0, 25 * i, 3) + b"\0\1\x73", source=CCS, transaction=0,
-                                 target=(1, 0, 0, 0, 2)) for i in range(90))
+                                 target=(1, 0, 0, 0, 2)) for i in range(frames))
         peers[1].send(event)
         for peer in peers:
             peer.close()
+        return lapdmon
+
+    def assert_shown(self, log, frames):
+        self.assertEqual(re.findall("Time = (\\S+)", log), [f"{i // 10}.{i % 10 * 100}" for i in range(frames)])
+
+    def test_what_arrived_before_the_relay_died_is_shown(self):
+        lapdmon = self.dies_after(90, "gone.log")
         said = lapdmon.ends(status=1)
         self.assertIn("lapdmon: the board cannot be reached any more, the trace ends\n", said)
-        log = (self.folder / "gone.log").read_text("latin-1")
-        self.assertEqual(re.findall("Time = (\\S+)", log), [f"{i // 10}.{i % 10 * 100}" for i in range(90)])
+        self.assert_shown((self.folder / "gone.log").read_text("latin-1"), 90)
+
+    def test_what_arrived_before_the_relay_died_waits_for_a_log_that_stalls(self):
+        os.mkfifo(self.folder / "log")
+        reader = os.open(self.folder / "log", os.O_RDONLY | os.O_NONBLOCK)
+        self.addCleanup(os.close, reader)
+        lapdmon = self.dies_after(2000, "log")
+        lapdmon.screen.wait("Addressable::Timeout", times=2)  # both requests of the end have failed
+        os.set_blocking(reader, True)
+        text = ""
+        while some := os.read(reader, 65536):
+            text += some.decode()
+        lapdmon.ends(status=1)
+        self.assert_shown(text, 2000)
 
     def answer(self, peer, kind, body=b""):
         _, _, block, _ = peer.read_frame()
