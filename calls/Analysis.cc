@@ -9,6 +9,7 @@
 #include "calls/CallTable.h"
 #include "calls/ChannelClock.h"
 #include "calls/Channels.h"
+#include "calls/FindingKinds.h"
 #include "calls/FindingSink.h"
 #include "calls/LinkFindings.h"
 #include "calls/Maintenance.h"
@@ -57,6 +58,8 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
         }
         if (call == nullptr)
             findings_.heardWithoutCall(message);
+        else
+            noteChangeover(message);
         listener_.heard(message, call);
     }
     void advance(std::int64_t at) {
@@ -109,7 +112,23 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
     void report(Finding finding) override { listener_.found(finding); }
 
   private:
+    // The calls of a group are signalled on one of its D channels at a time.
+    void noteChangeover(const Message& message) {
+        const std::string& name = message.frame->interface->name;
+        if (name == active_)
+            return;
+        if (const std::string before = std::exchange(active_, name); !before.empty()) {
+            std::vector<std::string> alive;
+            for (const Call* const call : table_.open())
+                alive.push_back(std::to_string(call->number));
+            report(findingOf(findings::changeover, message, nullptr,
+                             "calls are signalled on " + name + " and not on " + before +
+                                 " any more; alive: " + (alive.empty() ? "none" : listOf(alive))));
+        }
+    }
+
     Listener& listener_;
+    std::string active_;                           // the D channel on which a call was heard last
     std::array<const LinkWitness*, 128> links_{};  // by TEI, of the D channel that was used last
     CallTable table_;
     Waits waits_;

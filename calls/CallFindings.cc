@@ -58,7 +58,9 @@ void CallFindings::heard(Call& call, const Message& message) {
         return;
     }
     Notes& notes = notes_[call.number];
-    const bool clearsFirst = isClearing(message.layer3.type) && !notes.cleared && !call.beforeTrace;
+    // A transaction (REGISTER) may end without a cause (Q.932 6.3.2.3).
+    const bool clearsFirst = isClearing(message.layer3.type) && !notes.cleared && !call.beforeTrace &&
+                             call.kind != Kind::signalling;
     checkElements(&call, message, clearsFirst);
     checkDigits(call, notes, message);
     checkCause(call, message);

@@ -9,6 +9,7 @@
 #include <initializer_list>
 #include <map>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "calls/Message.h"
@@ -72,10 +73,38 @@ class CallScript {
         return *this;
     }
 
+    // The D channel of the next frames.
+    CallScript& on(const std::string& dChannel) {
+        interface_ = &interfaces_.try_emplace(dChannel, capture::Interface{dChannel, capture::Variant::net5})
+                          .first->second;
+        return *this;
+    }
+
+    // The link is set up by our side; numbers begin at 0.
+    CallScript& linkUp() {
+        link() = {};
+        return raw(Side::us, true, {0x7F}).raw(Side::peer, false, {0x73});  // SABME, UA
+    }
+    // RR: everything has arrived.
+    CallScript& acknowledge(Side from) { return supervise(from, false, false); }
+    // A poll, and the answer of the other side.
+    CallScript& poll(Side from) { return supervise(from, true, true).supervise(other(from), false, true); }
+    // A frame that layer 2 sends again, octet for octet.
+    CallScript& again(std::size_t frame) {
+        const Sent& old = frames_.at(frame);
+        return add(old.frame.transmitted ? Side::us : Side::peer, old.octets);
+    }
+
+    // From now on references are one octet long.
+    CallScript& shortReferences() {
+        shortReferences_ = true;
+        return *this;
+    }
+
     // A message in an I frame. `originFlag` is 0 from the side that chose the reference, 1 to it.
     CallScript& message(Side from, std::uint8_t type, std::uint16_t reference, bool originFlag,
                         std::initializer_list<Bytes> elements = {}) {
-        Link& link = links_[tei_];
+        Link& link = this->link();
         Bytes octets = address(from, true);
         const std::size_t side = from == Side::us ? 0 : 1;
         octets.push_back(static_cast<std::uint8_t>(link.sent[side] << 1));
@@ -107,9 +136,9 @@ class CallScript {
         return add(from, std::move(octets));
     }
     // A frame of control octets alone, or any octets behind the address.
-    CallScript& raw(Side from, bool command, std::initializer_list<std::uint8_t> rest) {
+    CallScript& raw(Side from, bool command, const Bytes& rest) {
         Bytes octets = address(from, command);
-        octets.insert(octets.end(), rest);
+        octets.insert(octets.end(), rest.begin(), rest.end());
         return add(from, std::move(octets));
     }
 
@@ -143,16 +172,29 @@ class CallScript {
         std::array<unsigned, 2> seen{};  // V(R) of us and of the peer
     };
 
+    Link& link() { return links_[{interface_->name, tei_}]; }
+
+    CallScript& supervise(Side from, bool command, bool pf) {
+        Link& link = this->link();
+        const std::size_t side = from == Side::us ? 0 : 1;
+        link.seen[side] = link.sent[1 - side];
+        return raw(from, command, {0x01, static_cast<std::uint8_t>(link.seen[side] << 1 | (pf ? 1 : 0))});
+    }
+
     Bytes address(Side from, bool command) const {
         const bool fromNetwork = (from == Side::us) == (role_ == capture::Role::network);
         const bool cr = command == fromNetwork;  // commands of the network and responses of the user
         return {static_cast<std::uint8_t>(cr ? 0x02 : 0x00), static_cast<std::uint8_t>(tei_ << 1 | 1)};
     }
-    static void append(Bytes& octets, std::uint8_t type, std::uint16_t reference, bool flag,
-                       std::initializer_list<Bytes> elements) {
-        octets.insert(octets.end(),
-                      {0x08, 0x02, static_cast<std::uint8_t>((flag ? 0x80 : 0) | reference >> 8),
-                       static_cast<std::uint8_t>(reference), type});
+    void append(Bytes& octets, std::uint8_t type, std::uint16_t reference, bool flag,
+                std::initializer_list<Bytes> elements) const {
+        if (shortReferences_)
+            octets.insert(octets.end(),
+                          {0x08, 0x01, static_cast<std::uint8_t>((flag ? 0x80 : 0) | reference), type});
+        else
+            octets.insert(octets.end(),
+                          {0x08, 0x02, static_cast<std::uint8_t>((flag ? 0x80 : 0) | reference >> 8),
+                           static_cast<std::uint8_t>(reference), type});
         for (const Bytes& element : elements)
             octets.insert(octets.end(), element.begin(), element.end());
     }
@@ -167,18 +209,20 @@ class CallScript {
         sent.frame.clock = capture::Clock::relative;
         sent.frame.time = now_;
         sent.frame.ticks = static_cast<std::uint32_t>(now_ / capture::nanosecondsPerTick);
-        sent.frame.interface = &interface_;
+        sent.frame.interface = interface_;
         sent.frame.place = {"script", sent.number, capture::Place::Unit::packet};
         return *this;
     }
 
     capture::Role role_;
-    capture::Interface interface_{"trunk", capture::Variant::net5};
+    std::map<std::string, capture::Interface> interfaces_{{"trunk", {"trunk", capture::Variant::net5}}};
+    capture::Interface* interface_ = &interfaces_.at("trunk");
     std::deque<Sent> frames_;  // a deque leaves them where they are
-    std::map<std::uint8_t, Link> links_;
+    std::map<std::pair<std::string, std::uint8_t>, Link> links_;
     std::int64_t now_ = 0;
     std::uint8_t tei_ = 0;
     int crossing_ = 0;
+    bool shortReferences_ = false;
 };
 
 }  // namespace calls::test
