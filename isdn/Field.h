@@ -41,6 +41,7 @@ struct Field {
     std::uint8_t low = 1;  // of the last octet
     Kind kind = Kind::value;
     bool personal = false;   // identifies a person: a number, a name, user data
+    bool doubtful = false;   // no table says what it holds, or the octets contradict the table
     std::uint8_t depth = 0;  // 0, or how deep it stands in nested contents (facility)
 
     // "8-1", "7-6", "4".

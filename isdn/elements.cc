@@ -87,6 +87,7 @@ Problem unknownContents(Octets contents, Fields& fields) {
         field.at = contents;
         field.kind = Field::Kind::raw;
         field.personal = true;
+        field.doubtful = true;
         for (const std::uint8_t octet : contents)
             field.value = field.value << 8 | octet;
         fields.add(field);

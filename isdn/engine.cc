@@ -78,6 +78,7 @@ class Engine {
             return;
         const auto count = static_cast<std::size_t>(last - near.begin()) + 1;
         addRaw(rest_.first(count), "extension", true, fields_.keep(std::string(fields_.back().octet) + "*"));
+        fields_.back().doubtful = true;
         rest_ = rest_.subspan(count);
     }
 
@@ -166,6 +167,7 @@ class Engine {
             return;
         if (!understood_ || place.reader == nullptr) {
             addRaw(taken, row.name, row.isPersonal || !understood_, row.octet, row.clause);
+            fields_.back().doubtful = !understood_;
             return;
         }
         const std::string_view clause = row.clause.empty() ? table_.clause : row.clause;
@@ -182,6 +184,7 @@ class Engine {
             std::from_chars(last.data(), last.data() + last.size(), number);
         }
         addRaw(rest_, "contents", isPersonal, fields_.keep(std::to_string(number + 1)));
+        fields_.back().doubtful = true;
         rest_ = {};
         return problem_;
     }

@@ -150,6 +150,7 @@ void Facility::appendFields(Fields& fields) const {
         fielder.clause = ofElement;
         Field rest = fielder.field(valuesAt_, contents_.size(), "contents", Field::Kind::raw);
         rest.personal = true;
+        rest.doubtful = true;
         fields.add(rest);
     }
 }

@@ -108,6 +108,7 @@ void addRaw(Octets octets, std::string_view label, std::string_view name, std::s
     field.at = octets;
     field.kind = Field::Kind::raw;
     field.personal = true;
+    field.doubtful = true;
     for (const std::uint8_t octet : octets)
         field.value = field.value << 8 | octet;
     fields.add(field);

@@ -47,6 +47,13 @@ void addRaw(const Contents& contents, std::size_t from, Fields& fields) {
     fields.add(field);
 }
 
+void addDoubtful(const Contents& contents, std::size_t from, Fields& fields) {
+    if (from >= contents.octets.size())
+        return;
+    addRaw(contents, from, fields);
+    fields.back().doubtful = true;
+}
+
 // clang-format off
 
 constexpr Name providers[] = {{0, "provider"}, {1, "user"}};
@@ -101,7 +108,7 @@ Problem readAs(const Contents& contents, Fields& fields) {
 Problem readPersonal(const Contents& contents, Fields& fields) {
     Contents all = contents;
     all.personal = true;
-    addRaw(all, 0, fields);
+    addDoubtful(all, 0, fields);
     return Problem::none;
 }
 
@@ -236,7 +243,7 @@ Problem readDiagnostics(const Contents& contents, Fields& fields) {
         if (value != nullptr && row.cause == bitsOf(*value, 7, 1))
             return row.read(contents, fields);
     }
-    addRaw(contents, 0, fields);
+    addDoubtful(contents, 0, fields);
     return Problem::none;
 }
 
@@ -269,7 +276,7 @@ Problem readDisplayFields(const Contents& contents, Fields& fields) {
     while (at < octets.size()) {
         const std::size_t left = octets.size() - at;
         if (left < 2 || octets[at + 1] > left - 2) {
-            addRaw(contents, at, fields);
+            addDoubtful(contents, at, fields);
             return Problem::tooShort;
         }
         Field tag = fieldAt(contents, at, 1, fields);
