@@ -33,7 +33,7 @@ install_packages() {
     rm -f "$log"
 }
 
-BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libpcap-dev libtomlplusplus-dev nlohmann-json3-dev)
+BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libpcap-dev libssl-dev libtomlplusplus-dev nlohmann-json3-dev)
 CHECK_PACKAGES=(clang-format clang-tidy cppcheck)
 TEST_PACKAGES=(libgtest-dev libgmock-dev libbenchmark-dev python3 python3-jsonschema tmux tshark)
 

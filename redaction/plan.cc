@@ -1,0 +1,228 @@
+#include "redaction/plan.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "isdn/Field.h"
+#include "isdn/facility.h"
+#include "isdn/values.h"
+
+namespace redaction {
+
+namespace {
+
+using isdn::Element;
+using isdn::Field;
+using isdn::Octets;
+using isdn::Variant;
+namespace element = isdn::element;
+
+constexpr std::uint8_t extensionBit = 0x80;
+
+class Planner {
+  public:
+    Planner(Octets whole, Variant variant) : whole_(whole), variant_(variant) {}
+
+    Plan run() && { return std::move(plan_); }
+
+    void planLink() {
+        const isdn::Layer2 link = isdn::parseLayer2(whole_);
+        if (link.problem != isdn::Problem::none)
+            add(link.information, Treatment::blank);
+        else if (link.carriesMessage())
+            planMessage(link.information);
+        else if (link.carriesTeiMessage())
+            planTeiMessage(link.information);
+        else if (link.type == isdn::FrameType::FRMR)
+            add(behind(link.information, frameRejectSize), Treatment::blank);
+        else if (link.type == isdn::FrameType::XID)
+            planIdentification(link.information);
+        else
+            add(link.information, Treatment::blank);
+    }
+
+    void planMessage(Octets octets) {
+        const isdn::Layer3 message = isdn::parseLayer3(octets);
+        const Element dialled = dialledIn(message);
+        for (const Element& each : message.elements)
+            planElement(each, message, dialled);
+        // A call reference whose length is wrong keeps its length octet, which says so.
+        const bool wrongLength = message.problem == isdn::Problem::invalid;
+        add(behind(message.raw, wrongLength ? 1 : 0), Treatment::blank);
+    }
+
+  private:
+    static constexpr std::size_t frameRejectSize = 5;
+
+    static Octets behind(Octets octets, std::size_t count) {
+        return octets.subspan(std::min(octets.size(), count));
+    }
+
+    void add(Octets octets, Treatment treatment, std::uint8_t keptBits = 0) {
+        if (!octets.empty())
+            plan_.push_back({static_cast<std::size_t>(octets.data() - whole_.data()), octets.size(),
+                             treatment, keptBits});
+    }
+
+    // Octets behind the last action indicator belong to nothing.
+    void planTeiMessage(Octets information) {
+        constexpr std::uint8_t teiManagement = 0x0F;
+        constexpr std::size_t header = 4;
+        const isdn::TeiMessage message = isdn::parseTeiMessage(information);
+        if (message.entity != teiManagement)
+            add(behind(information, 1), Treatment::blank);
+        else if (information.size() > header)
+            add(behind(information, header + message.actions.size()), Treatment::blank);
+    }
+
+    // Groups of ISO/IEC 8885: the parameters of the link stay; user data (FF) has no length.
+    void planIdentification(Octets information) {
+        constexpr std::uint8_t generalPurpose = 0x82, linkParameters = 0x80;
+        constexpr std::size_t header = 3;
+        if (information.empty() || information[0] != generalPurpose) {
+            add(information, Treatment::blank);
+            return;
+        }
+        Octets rest = information.subspan(1);
+        while (rest.size() >= header && rest[0] == linkParameters) {
+            const std::size_t size = rest[1] * std::size_t{256} + rest[2];
+            if (size > rest.size() - header)
+                break;
+            rest = rest.subspan(header + size);
+        }
+        add(behind(rest, 1), Treatment::blank);
+    }
+
+    // The element that holds digits as the caller dials them: the called number if it has any, else the
+    // keypad.
+    static Element dialledIn(const isdn::Layer3& message) {
+        const bool dials =
+            message.discriminator == isdn::callControl && !message.national &&
+            (message.type == isdn::message::setup || message.type == isdn::message::information);
+        if (!message.hasType || !dials)
+            return {};
+        const Element called = message.elements.find(element::calledNumber);
+        const auto number = isdn::partyNumber(called);
+        const bool hasDigits = number && !number->digits.empty() && called.problem == isdn::Problem::none;
+        return hasDigits ? called : message.elements.find(element::keypad);
+    }
+
+    void planElement(const Element& each, const isdn::Layer3& message, const Element& dialled) {
+        if (each.singleOctet())
+            return;
+        if (each.problem != isdn::Problem::none) {
+            add(each.contents, Treatment::blank);
+            return;
+        }
+        if (each.codeset == 0 && (each.id == element::facility || each.id == element::extendedFacility)) {
+            planFacility(each.contents);
+            return;
+        }
+        fields_.clear();
+        isdn::fieldsOf(each, variant_, fields_);
+        const bool isDialled = each.octets.data() == dialled.octets.data();
+        const bool ofInformation = message.type == isdn::message::information;
+        bool isOpen = false;  // an octet before says that its group goes on
+        for (const Field& field : fields_) {
+            if (field.kind == Field::Kind::extension)
+                isOpen = field.value == 0;
+            Treatment treatment = treatmentOf(field, each, isOpen);
+            if (treatment == Treatment::number && mayBeDialled(each))
+                treatment = isDialled       ? Treatment::dialled
+                            : ofInformation ? Treatment::blank
+                                            : Treatment::number;
+            if (names(field, each))
+                add(field.at, treatment, keptBitsOf(field, each));
+        }
+    }
+
+    static bool isDisplay(const Element& each) {
+        constexpr std::uint8_t displayOfNational = 0x2A;  // in codeset 5
+        return each.id == element::display || (each.codeset == 5 && each.id == displayOfNational);
+    }
+    static bool mayBeDialled(const Element& each) {
+        return each.codeset == 0 && (each.id == element::calledNumber || each.id == element::keypad);
+    }
+
+    // Raw octets that no table marks are nobody's but those of charges, and of what stands beside a display.
+    static bool names(const Field& field, const Element& each) {
+        const bool isOpaque =
+            field.kind == Field::Kind::raw && each.id != element::changeStatus && !isDisplay(each);
+        return field.personal || field.doubtful || isOpaque;
+    }
+
+    static Treatment treatmentOf(const Field& field, const Element& each, bool isOpen) {
+        if (field.doubtful || !field.personal)
+            return Treatment::blank;
+        if (field.kind == Field::Kind::text) {
+            const bool isNumber =
+                isdn::partyNumber(each) || (each.codeset == 0 && each.id == element::keypad);
+            return isNumber ? Treatment::number : Treatment::text;
+        }
+        // Bit 8 of a pseudonym would end the group elsewhere.
+        return isOpen ? Treatment::blank : Treatment::octets;
+    }
+
+    // Bit 8 says where an extension ends, and in a display what is a tag.
+    static std::uint8_t keptBitsOf(const Field& field, const Element& each) {
+        const bool tells = field.name == "extension" || isDisplay(each);
+        return tells && field.doubtful ? extensionBit : 0;
+    }
+
+    // Whether a value spells something must not matter, so its type alone decides.
+    void planFacility(Octets contents) {
+        const isdn::Facility facility(contents, variant_);
+        const isdn::BerTree& tree = facility.tree();
+        // The profile has one octet. More of them are known to nobody, but their end has to stay.
+        const auto last =
+            std::ranges::find_if(contents, [](std::uint8_t octet) { return (octet & extensionBit) != 0; });
+        const auto profile = std::min(contents.size(), static_cast<std::size_t>(last - contents.begin()) + 1);
+        add(behind(contents.first(profile), 1), Treatment::blank, extensionBit);
+        if (tree.octets().empty())
+            add(behind(contents, profile), Treatment::blank);
+        const std::vector<isdn::BerValue>& values = tree.values();
+        for (std::size_t i = 0; i < values.size(); ++i) {
+            const isdn::BerType* const type = facility.meanings()[i].type;
+            if (values[i].problem == isdn::BerProblem::noEnd || !isdn::isPersonal(values[i], type))
+                continue;
+            const bool isWhole = values[i].problem == isdn::BerProblem::none;
+            add(tree.contentsOf(values[i]), isWhole ? treatmentOf(values[i], type) : Treatment::blank);
+        }
+    }
+
+    static Treatment treatmentOf(const isdn::BerValue& value, const isdn::BerType* type) {
+        using Kind = isdn::BerType::Kind;
+        constexpr std::uint32_t utf8 = 12, firstString = 18, lastString = 27;
+        if (type != nullptr)
+            return type->kind == Kind::digits                             ? Treatment::number
+                   : type->kind == Kind::text || type->kind == Kind::name ? Treatment::text
+                                                                          : Treatment::octets;
+        if (value.tag == isdn::berNumericString)
+            return Treatment::number;
+        const bool isString =
+            value.tag.tagClass == isdn::BerClass::universal &&
+            (value.tag.number == utf8 || (value.tag.number >= firstString && value.tag.number <= lastString));
+        return isString ? Treatment::text : Treatment::octets;
+    }
+
+    Octets whole_;
+    Variant variant_;
+    Plan plan_;
+    isdn::Fields fields_;
+};
+
+}  // namespace
+
+Plan planOfFrame(Octets frame, Variant variant) {
+    Planner planner(frame, variant);
+    planner.planLink();
+    return std::move(planner).run();
+}
+
+Plan planOfMessage(Octets message, Variant variant) {
+    Planner planner(message, variant);
+    planner.planMessage(message);
+    return std::move(planner).run();
+}
+
+}  // namespace redaction
