@@ -34,6 +34,8 @@ std::string_view reasonOf(capture::Item::Kind kind) {
     }
 }
 
+}  // namespace
+
 calls::Options analysisOptions(const Options& options) {
     calls::Options to;
     to.timers = options.calls.timers;
@@ -44,7 +46,16 @@ calls::Options analysisOptions(const Options& options) {
     return to;
 }
 
-}  // namespace
+void tell(calls::Analysis& analysis, const capture::Item& item) {
+    const capture::Interface& interface = *item.frame.interface;
+    if (item.kind == capture::Item::Kind::oversized)
+        analysis.mayLack(interface, item.frame.transmitted ? calls::Side::us : calls::Side::peer);
+    else if (item.kind == capture::Item::Kind::restart || item.kind == capture::Item::Kind::run ||
+             item.kind == capture::Item::Kind::replaced)
+        analysis.restarted(interface);
+    else if (const std::string_view reason = reasonOf(item.kind); !reason.empty())
+        analysis.mayMiss(interface, reason);
+}
 
 Analysed::Analysed(const Options& options)
     : analysis_(analysisOptions(options), *this), filtered_(!options.filters.empty()) {}
@@ -59,7 +70,6 @@ void Analysed::take(Chunk& chunk, std::size_t count) {
 }
 
 void Analysed::look(const Seen& seen, bool passes) {
-    const capture::Item& item = *seen.item;
     if (filtered_) {
         while (newest_ + 1 < seen.number) {
             passed_.push_back(false);
@@ -72,18 +82,10 @@ void Analysed::look(const Seen& seen, bool passes) {
         while (passed_.size() > framesRemembered)
             passed_.pop_front();
     }
-    if (item.isFrame()) {
-        analysis_.take(item.frame, seen.number);
-        return;
-    }
-    const capture::Interface& interface = *item.frame.interface;
-    if (item.kind == capture::Item::Kind::oversized)
-        analysis_.mayLack(interface, item.frame.transmitted ? calls::Side::us : calls::Side::peer);
-    else if (item.kind == capture::Item::Kind::restart || item.kind == capture::Item::Kind::run ||
-             item.kind == capture::Item::Kind::replaced)
-        analysis_.restarted(interface);
-    else if (const std::string_view reason = reasonOf(item.kind); !reason.empty())
-        analysis_.mayMiss(interface, reason);
+    if (seen.isFrame())
+        analysis_.take(seen.frame(), seen.number);
+    else
+        tell(analysis_, *seen.item);
 }
 
 bool Analysed::hasPassed(std::uint64_t frame) const {

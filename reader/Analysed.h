@@ -12,6 +12,11 @@
 
 namespace reader {
 
+// What the command line asks of an analysis.
+calls::Options analysisOptions(const Options& options);
+// Tells the analysis what the recorder had to say between frames.
+void tell(calls::Analysis& analysis, const capture::Item& item);
+
 // The analysis sees every item, whatever the filters say. A call is wanted if one of its frames passes them,
 // a finding if its frame or its call does.
 class Analysed : public Consumer, protected calls::Listener {

@@ -73,6 +73,13 @@ struct CallOptions {
     std::optional<calls::Severity> failOn = std::nullopt;  // exit status 3 for such a finding or a worse one
 };
 
+struct RedactOptions {
+    std::string key;  // the key's file; empty: a key that nobody keeps
+    bool undo = false;
+    std::optional<unsigned> keepPrefix = std::nullopt;
+    bool blankShort = false;
+};
+
 struct Options {
     std::vector<std::string> words;  // files, or the hexadecimal digits that `explain` takes
     InputOptions input;
@@ -85,6 +92,7 @@ struct Options {
     std::string form;  // the form to convert to, or to record in
     RecordOptions record;
     CallOptions calls;
+    RedactOptions redact;
 };
 
 }  // namespace reader

@@ -10,6 +10,7 @@
 #include "reader/explain.h"
 #include "reader/list.h"
 #include "reader/record.h"
+#include "reader/redact.h"
 #include "reader/stats.h"
 
 namespace reader {
@@ -77,6 +78,14 @@ constexpr char statsExamples[] = R"(  lapdread stats lapdmon.log
       a row a figure, for a spreadsheet
 )";
 
+constexpr char redactExamples[] = R"(  lapdread redact lapdmon.log -o for-the-carrier.log
+      numbers, names and user data are replaced; nobody can undo it
+  lapdread redact --key trunk.key --callref 0378 --to pcapng lapdmon.log -o call.pcapng
+      one call, as a capture; the key gives the same pseudonyms next time
+  lapdread redact --key trunk.key --undo answer.pcapng -o answer-with-numbers.pcapng
+      the numbers again, for whoever has the key
+)";
+
 const std::array table{
     Command{"list",
             "[FILE...]",
@@ -117,6 +126,12 @@ const std::array table{
             recordExamples,
             {"Files", recordOptions()},
             runRecord},
+    Command{"redact",
+            "[FILE...]",
+            "frames without what names a person, in files that may be sent to others",
+            redactExamples,
+            {"Redaction", redactOptions()},
+            runRedact},
 };
 
 }  // namespace

@@ -14,6 +14,8 @@ namespace {
 
 constexpr std::size_t beginningSize = 4096;
 
+}  // namespace
+
 std::string beginningOf(const std::string& path) {
     std::ifstream file(path, std::ios::binary);
     std::string beginning(beginningSize, '\0');
@@ -21,6 +23,8 @@ std::string beginningOf(const std::string& path) {
     beginning.resize(static_cast<std::size_t>(file.gcount()));
     return beginning;
 }
+
+namespace {
 
 void refuseInput(const struct stat& out, const std::string& name, std::span<const std::string> inputs) {
     for (const std::string& input : inputs) {

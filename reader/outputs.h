@@ -18,6 +18,9 @@ bool checkOutput(const std::string& path, std::span<const std::string> inputs, s
 // what is read would grow as it is written.
 void checkNoInput(int descriptor, const std::string& name, std::span<const std::string> inputs);
 
+// The first octets of a file, as far as they tell its form; nothing of one that cannot be read.
+std::string beginningOf(const std::string& path);
+
 // For outputs whose form nobody can tell from their beginning: such a file must be empty.
 inline bool looksLikeNothing(std::string_view /*beginning*/) { return false; }
 

@@ -1,0 +1,158 @@
+#include "reader/Redacting.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "reader/Analysed.h"
+
+namespace reader {
+
+namespace {
+
+using Kind = capture::Item::Kind;
+
+// What an item says, without the words of its input.
+std::string_view textOf(Kind kind) {
+    switch (kind) {
+        case Kind::cut:
+            return "a frame that is cut off";
+        case Kind::mixed:
+            return "two traces in one file";
+        case Kind::unproved:
+            return "lines that are no recorder's";
+        case Kind::damaged:
+            return "damage of the file";
+        default:
+            return {};
+    }
+}
+
+// "trunk1" for the first name, "trunk2" for the second.
+const std::string& numbered(std::map<std::string, std::string, std::less<>>& known, std::string_view name,
+                            std::string_view word) {
+    auto found = known.find(name);
+    if (found == known.end())
+        found = known.emplace(name, std::string(word) + std::to_string(known.size() + 1)).first;
+    return found->second;
+}
+
+}  // namespace
+
+Redacting::Redacting(const Options& options, redaction::Redactor& redactor, Names names,
+                     std::unique_ptr<Composer> composer, Consumer& next)
+    : redactor_(redactor),
+      analysis_(analysisOptions(options), redactor),
+      names_(names),
+      composer_(std::move(composer)),
+      next_(next) {}
+
+void Redacting::take(Chunk& chunk, std::size_t count) {
+    std::size_t piece = 0;
+    for (std::size_t i = 0; i < chunk.size(); ++i) {
+        const bool passes = piece < count && chunk.pieces[piece].item == i;
+        piece += passes ? 1 : 0;
+        look(chunk.seen()[i], passes);
+    }
+    handOn();
+}
+
+void Redacting::finish() {
+    std::vector<redaction::Rebuilt> done;
+    redactor_.giveUpSegments(done);
+    settle(done);
+    handOn();
+}
+
+void Redacting::look(const Seen& seen, bool passes) {
+    if (seen.item->kind == Kind::comment && names_ == Names::replaced)
+        return;
+    Waiting& waiting = waiting_.emplace_back();
+    waiting.seen = seen;
+    waiting.item = *seen.item;
+    waiting.passes = passes;
+    redact(waiting);
+    if (names_ == Names::replaced)
+        replaceNames(waiting.item);
+    if (isTooLong()) {
+        std::vector<redaction::Rebuilt> done;
+        redactor_.giveUpSegments(done);
+        settle(done);
+    }
+    while (!waiting_.empty() && waiting_.front().isReady) {
+        Waiting& ready = waiting_.front();
+        ready.item.frame.octets = ready.octets;
+        ready.seen.item = &ready.item;
+        out_.add(ready.seen);
+        passes_.push_back(ready.passes);
+        waiting_.pop_front();
+    }
+}
+
+void Redacting::redact(Waiting& waiting) {
+    const Seen& seen = waiting.seen;
+    if (!seen.isFrame()) {
+        if (seen.item->kind == Kind::cut)
+            waiting.octets = redactor_.cut(seen.frame().octets, seen.variant);
+        waiting.isReady = true;
+        tell(analysis_, *seen.item);
+        redactor_.mayMiss();
+        return;
+    }
+    redactor_.expect(seen.number);
+    const calls::Marks& marks = analysis_.take(seen.frame(), seen.number);
+    std::vector<redaction::Rebuilt> done;
+    redactor_.take(seen.frame(), marks, seen.variant, done);
+    settle(done);
+}
+
+// Frames that are done stand near the end, most of them at the end.
+void Redacting::settle(std::vector<redaction::Rebuilt>& done) {
+    for (redaction::Rebuilt& rebuilt : done) {
+        const auto found = std::find_if(waiting_.rbegin(), waiting_.rend(), [&](const Waiting& each) {
+            return each.seen.isFrame() && each.seen.number == rebuilt.number;
+        });
+        if (found == waiting_.rend())
+            continue;
+        found->octets = std::move(rebuilt.octets);
+        found->isReady = true;
+    }
+}
+
+void Redacting::replaceNames(capture::Item& item) {
+    item.text = textOf(item.kind);
+    item.frame.place.file = numbered(files_, item.frame.place.file, "input");
+    if (item.frame.interface == nullptr)
+        return;
+    const capture::Interface wanted{numbered(channels_, item.frame.interface->name, "trunk"),
+                                    item.frame.interface->variant};
+    auto found = std::find(interfaces_.begin(), interfaces_.end(), wanted);
+    if (found == interfaces_.end())
+        found = interfaces_.insert(interfaces_.end(), wanted);
+    item.frame.interface = &*found;
+}
+
+bool Redacting::isTooLong() const {
+    return waiting_.size() > mostWaiting_ ||
+           waiting_.back().seen.at - waiting_.front().seen.at > longestWait_;
+}
+
+void Redacting::handOn() {
+    out_.seal();
+    for (std::size_t i = 0; i < out_.size(); ++i) {
+        if (!passes_[i])
+            continue;
+        Seen& seen = out_.seen()[i];
+        readHeaders(seen);
+        Piece piece{.item = i, .instant = {seen.when.clock, seen.at}};
+        if (composer_ != nullptr)
+            composer_->compose(seen, out_.text, piece);
+        piece.end = out_.text.size();
+        out_.pieces.push_back(piece);
+    }
+    if (!out_.pieces.empty())
+        next_.take(out_, out_.pieces.size());
+    out_.clear();
+    passes_.clear();
+}
+
+}  // namespace reader

@@ -1,0 +1,75 @@
+// Puts pseudonyms into the items of a run before they are written.
+#ifndef READER_REDACTING_H
+#define READER_REDACTING_H
+
+#include <cstdint>
+#include <deque>
+#include <list>
+#include <map>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "calls/Analysis.h"
+#include "reader/Pipeline.h"
+#include "redaction/Redactor.h"
+
+namespace reader {
+
+// Stands between a run and the consumer that writes. It looks at every item, filters or not, since a number
+// may have begun in another frame; items that pass the filters go on. Names of files and D channels are
+// replaced, comments are left out, and messages are put in words of our own. While pseudonyms are undone all
+// these stay as they are.
+class Redacting : public Consumer {
+  public:
+    enum class Names { replaced, kept };
+
+    // `composer` may be null if the next consumer wants no text. All references outlive this.
+    Redacting(const Options& options, redaction::Redactor& redactor, Names names,
+              std::unique_ptr<Composer> composer, Consumer& next);
+
+    void take(Chunk& chunk, std::size_t count) override;
+    bool wantsAll() const override { return true; }
+    void flush() override { next_.flush(); }
+    // The input has ended.
+    void finish();
+
+  private:
+    // A frame that waits for the end of its message, or an item behind one.
+    struct Waiting {
+        Seen seen;
+        capture::Item item;
+        std::vector<std::uint8_t> octets;
+        bool isReady = false;
+        bool passes = false;
+    };
+
+    // Items that wait for the end of a message at most, and how long, in nanoseconds of the frames' clock.
+    // The next segment has to follow within T314, 4 s.
+    static constexpr std::size_t mostWaiting_ = 4096;
+    static constexpr std::int64_t longestWait_ = 10'000'000'000;
+
+    void look(const Seen& seen, bool passes);
+    void redact(Waiting& waiting);
+    void settle(std::vector<redaction::Rebuilt>& done);
+    void replaceNames(capture::Item& item);
+    void handOn();
+    bool isTooLong() const;
+
+    redaction::Redactor& redactor_;
+    calls::Analysis analysis_;
+    Names names_;
+    std::unique_ptr<Composer> composer_;
+    Consumer& next_;
+    std::deque<Waiting> waiting_;
+    Chunk out_;
+    std::vector<bool> passes_;  // of the items of out_
+    std::map<std::string, std::string, std::less<>>
+        channels_;  // D channels by name, and how they are called now
+    std::map<std::string, std::string, std::less<>> files_;
+    std::list<capture::Interface> interfaces_;
+};
+
+}  // namespace reader
+
+#endif
