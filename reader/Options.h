@@ -56,6 +56,13 @@ struct RecordOptions {
     std::uint64_t size = 0;    // octets of a file; 0: no limit
     std::int64_t seconds = 0;  // clock-aligned; 0: no limit
     unsigned files = 0;        // how many files are kept; 0: all
+    std::int64_t span = 0;     // seconds that are kept; 0: all
+    // Triggers: the mildest finding, and frames that pass one of these filters.
+    std::optional<calls::Severity> onCheck = std::nullopt;
+    std::vector<FilterWord> onFrames;
+    std::int64_t before = 300;  // seconds that are kept in front of a trigger
+    std::int64_t after = 60;    // and behind it
+    unsigned keptFiles = 0;     // how many files are kept of what surrounds triggers; 0: all
 };
 
 enum class CallForm { text, csv, jsonLines };

@@ -1,7 +1,9 @@
 #include "reader/RotatingFile.h"
 
 #include <fcntl.h>
+#include <sys/file.h>
 #include <sys/stat.h>
+#include <sys/statvfs.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -9,8 +11,6 @@
 #include <cstring>
 #include <ctime>
 #include <filesystem>
-#include <optional>
-#include <regex>
 #include <vector>
 
 namespace reader {
@@ -20,7 +20,8 @@ namespace {
 using Kind = capture::Item::Kind;
 
 constexpr std::uint64_t mostPending = 64UL * 1024;
-constexpr char unfinished[] = ".part";
+constexpr std::uint64_t leastRoom = 64UL * 1024;  // octets that a full disk must have again
+constexpr std::int64_t lateness = 2;              // seconds by which frames may come late
 
 std::int64_t secondOf(const capture::Item& item) {
     if (item.frame.clock == capture::Clock::absolute)
@@ -39,20 +40,6 @@ std::uint64_t sizeOf(int descriptor) {
 
 }  // namespace
 
-std::string fileNameOf(const std::string& trunk) {
-    std::string name = trunk.empty() ? "trunk" : trunk;
-    for (char& character : name) {
-        const bool isSafe =
-            (character >= '0' && character <= '9') || (character >= 'a' && character <= 'z') ||
-            (character >= 'A' && character <= 'Z') || std::strchr("-_+@=.", character) != nullptr;
-        if (!isSafe || character == '\0')
-            character = '_';
-    }
-    if (name.front() == '.')
-        name.front() = '_';
-    return name;
-}
-
 RotatingFile::RotatingFile(const RotationRules& rules, const std::string& trunk, Chatter& chatter)
     : rules_(rules), chatter_(chatter), trunk_(fileNameOf(trunk)) {}
 
@@ -68,34 +55,36 @@ std::int64_t RotatingFile::periodOf(std::int64_t second) const {
     return (second + local.tm_gmtoff) / rules_.period;
 }
 
-// Files that begin within one second are told apart by a number.
-std::string RotatingFile::pathOf(std::int64_t second) const {
-    const std::time_t time = second;
-    std::tm utc{};
-    gmtime_r(&time, &utc);
-    char start[40];
-    start[std::strftime(start, sizeof start, "%Y%m%dT%H%M%SZ", &utc)] = '\0';
-    const std::string beginning = rules_.folder + "/" + trunk_ + "." + start;
-    const std::string end = "." + std::string(rules_.form->name);
-    std::string path = beginning + end;
-    for (int i = 2; std::filesystem::exists(path) || std::filesystem::exists(path + unfinished); ++i) {
-        path = beginning;
-        ((path += '.') += std::to_string(i)) += end;
-    }
-    return path;
+// Frames of two directions may come in the wrong order: one that is a little late begins no file.
+bool RotatingFile::isAnotherPeriod(std::int64_t second) const {
+    return periodOf(second) > period_ || periodOf(second + lateness) < period_;
+}
+
+RecordingKind RotatingFile::kind() const {
+    return {rules_.folder, trunk_, rules_.mark, std::string(rules_.form->name)};
+}
+
+// After a failure: so much that an attempt is worth while, and no file is made that holds nothing but its
+// head.
+bool RotatingFile::hasRoom() const {
+    struct statvfs disk {};
+    return statvfs(rules_.folder.c_str(), &disk) != 0 || disk.f_bavail * disk.f_frsize >= leastRoom;
 }
 
 bool RotatingFile::begin(const capture::Item& item) {
-    if (failing_ && HostClock::now() < retryAt_)
+    if (failing_ && (HostClock::now() < retryAt_ || !hasRoom()))
         return false;
     const std::int64_t second = secondOf(item);
-    path_ = pathOf(second);
-    const std::string part = path_ + unfinished;
+    path_ = newRecording(kind(), second);
+    const std::string part = path_ + std::string(unfinishedEnding);
     descriptor_ = open(part.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
     if (descriptor_ < 0) {
         fail("cannot write " + part + ": " + std::strerror(errno));
         return false;
     }
+    flock(descriptor_, LOCK_EX | LOCK_NB);
+    newest_ = path_.substr(rules_.folder.size() + 1);
+    ++begun_;
     period_ = periodOf(second);
     size_ = 0;
     try {
@@ -120,13 +109,20 @@ void RotatingFile::writeLoss(const capture::Item& item) {
     writer_->write(loss);
     writer_->flush();
     size_ = sizeOf(descriptor_);
-    chatter_.error(trunk_ + ": writing works again; frames lost: " + std::to_string(lost_));
     lost_ = 0;
+}
+
+void RotatingFile::sayWritingWorks() {
+    if (failing_)
+        chatter_.error(trunk_ + ": writing works again; frames lost: " + std::to_string(unsaid_));
+    failing_ = false;
+    unsaid_ = 0;
 }
 
 void RotatingFile::write(const capture::Item& item) {
     const std::uint64_t frames = standsForAFrame(item) ? 1 : 0;
-    if (writer_ != nullptr && periodOf(secondOf(item)) != period_)
+    newestSecond_ = secondOf(item);
+    if (writer_ != nullptr && isAnotherPeriod(newestSecond_))
         finish();
     if (writer_ == nullptr && !begin(item)) {
         lose(frames);
@@ -156,7 +152,8 @@ void RotatingFile::flush() {
     size_ = sizeOf(descriptor_);
     pending_ = 0;
     pendingFrames_ = 0;
-    failing_ = false;
+    if (size_ > 0)
+        sayWritingWorks();
     const bool isFull = rules_.size != 0 && size_ >= rules_.size;
     if (isFull)
         finish();
@@ -167,6 +164,7 @@ void RotatingFile::finish() {
         return;
     try {
         writer_->finish();
+        synchronise();
     } catch (const capture::WriteError& error) {
         fail(error.what());
         return;
@@ -175,6 +173,19 @@ void RotatingFile::finish() {
     pendingFrames_ = 0;
     closeFile();
     nameFinished();
+    sayWritingWorks();
+}
+
+// What has its name is to survive a power failure as well.
+void RotatingFile::synchronise() const {
+    constexpr int cannot = EINVAL;  // of what is no disk
+    if (fdatasync(descriptor_) != 0 && errno != cannot)
+        throw capture::WriteError(path_ + ": " + std::strerror(errno), errno);
+}
+
+void RotatingFile::passTime(std::int64_t second) {
+    if (rules_.period != 0 && periodOf(second - lateness) > period_)
+        finish();
 }
 
 // The file keeps what it safely has; the rest is counted. Another file is tried after a while.
@@ -193,7 +204,7 @@ void RotatingFile::fail(const std::string& why) {
     if (size_ > 0 && isCut)
         nameFinished();
     else if (size_ == 0)
-        unlink((path_ + unfinished).c_str());
+        unlink((path_ + std::string(unfinishedEnding)).c_str());
 }
 
 void RotatingFile::closeFile() {
@@ -203,38 +214,28 @@ void RotatingFile::closeFile() {
 }
 
 void RotatingFile::nameFinished() {
-    const std::string part = path_ + unfinished;
+    const std::string part = path_ + std::string(unfinishedEnding);
     if (rename(part.c_str(), path_.c_str()) != 0) {
         chatter_.error("cannot rename " + part + ": " + std::strerror(errno));
         return;
     }
     chatter_.detail("finished " + path_);
-    if (rules_.kept != 0)
-        removeOldest();
+    removeOldest();
 }
 
+// A file holds what is older than the beginning of the next one.
 void RotatingFile::removeOldest() const {
-    struct Finished {
-        std::string start;
-        int number;
-        std::filesystem::path path;
-    };
-    std::vector<Finished> finished;
-    const std::regex rule(R"(\.(\d{8}T\d{6}Z)(?:\.(\d{1,9}))?\.)" + std::string(rules_.form->name));
-    std::error_code ignored;
-    for (const auto& entry : std::filesystem::directory_iterator(rules_.folder, ignored)) {
-        const std::string name = entry.path().filename();
-        std::smatch part;
-        const std::string rest = name.starts_with(trunk_) ? name.substr(trunk_.size()) : "";
-        if (std::regex_match(rest, part, rule))
-            finished.push_back({part[1], part[2].matched ? std::stoi(part[2]) : 1, entry.path()});
-    }
-    std::sort(finished.begin(), finished.end(), [](const Finished& a, const Finished& b) {
-        return a.start != b.start ? a.start < b.start : a.number < b.number;
-    });
-    for (std::size_t i = 0; i + rules_.kept < finished.size(); ++i) {
-        if (std::filesystem::remove(finished[i].path, ignored))
-            chatter_.detail("removed " + finished[i].path.string());
+    const std::vector<Recording> finished = finishedRecordings(kind());
+    for (std::size_t i = 0; i < finished.size(); ++i) {
+        const bool isBeyondNumber = rules_.kept != 0 && i + rules_.kept < finished.size();
+        const bool isBeyondSpan = rules_.span != 0 && i + 1 < finished.size() &&
+                                  finished[i + 1].start <= newestSecond_ - rules_.span;
+        if (!isBeyondNumber && !isBeyondSpan)
+            return;
+        std::error_code ignored;
+        const std::string path = rules_.folder + "/" + finished[i].name;
+        if (std::filesystem::remove(path, ignored))
+            chatter_.detail("removed " + path);
     }
 }
 

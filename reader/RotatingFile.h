@@ -10,6 +10,7 @@
 #include "capture/Writer.h"
 #include "reader/Chatter.h"
 #include "reader/forms.h"
+#include "reader/recordings.h"
 
 namespace reader {
 
@@ -19,11 +20,14 @@ struct RotationRules {
     std::uint64_t size = 0;      // a file of so many octets is finished; 0: whatever its size
     std::int64_t period = 0;     // seconds; a new file at each multiple of it in local time; 0: never
     unsigned kept = 0;           // how many finished files stay; 0: all
+    std::int64_t span = 0;       // seconds; files that hold only what is older than this are removed; 0: none
+    std::string mark{};          // stands in the names of the files, if it is not empty
 };
 
 // Writes TRUNK.START.FORM, which is named TRUNK.START.FORM.part until it is finished. START is the time of
 // its first item, in UTC: 20261121T112533Z. A record is never split between files. What cannot be written is
-// counted; once writing works again, the file says how many frames are missing.
+// counted; once writing works again, the file says how many frames are missing. A file is locked (flock) as
+// long as it is written, so that nobody takes it for one that was left behind.
 class RotatingFile {
   public:
     using HostClock = std::chrono::steady_clock;
@@ -37,12 +41,19 @@ class RotatingFile {
     RotatingFile& operator=(const RotatingFile&) = delete;
 
     void write(const capture::Item& item);
-    // Everything goes to the disk, and a file whose time has passed or that has its size is finished.
+    // Everything is handed to the system, and a file that has its size is finished.
     void flush();
+    // Nothing has come for a while, and the host's clock says `second`: a file whose period is over is
+    // finished.
+    void passTime(std::int64_t second);
     // The next item begins a new file.
     void finish();
 
     std::uint64_t lostInAll() const { return lostInAll_; }
+    // The finished name of the newest file, without its folder, and how many have been begun; empty before
+    // the first one.
+    const std::string& newest() const { return newest_; }
+    std::uint64_t begun() const { return begun_; }
 
     // How long after a failure another file is tried; a second, unless a test wants it otherwise.
     void retryEvery(HostClock::duration time) { betweenAttempts_ = time; }
@@ -54,17 +65,24 @@ class RotatingFile {
     void lose(std::uint64_t frames) {
         lost_ += frames;
         lostInAll_ += frames;
+        unsaid_ += frames;
     }
     void closeFile();
     void nameFinished();
     void removeOldest() const;
+    void sayWritingWorks();
+    bool hasRoom() const;
+    void synchronise() const;
+    RecordingKind kind() const;
+    bool isAnotherPeriod(std::int64_t second) const;
     std::int64_t periodOf(std::int64_t second) const;
-    std::string pathOf(std::int64_t second) const;
 
     const RotationRules& rules_;
     Chatter& chatter_;
     std::string trunk_;
-    std::string path_;  // of the finished file
+    std::string path_;    // of the finished file
+    std::string newest_;  // its name, also when it is closed
+    std::uint64_t begun_ = 0;
     int descriptor_ = -1;
     std::unique_ptr<capture::Writer> writer_;
     std::int64_t period_ = 0;    // the multiple of the period that the file belongs to
@@ -73,13 +91,12 @@ class RotatingFile {
     std::uint64_t pendingFrames_ = 0;
     std::uint64_t lost_ = 0;  // frames that the next file has to report
     std::uint64_t lostInAll_ = 0;
-    bool failing_ = false;  // the failure was said
+    std::uint64_t unsaid_ = 0;       // frames lost since the failure was said
+    std::int64_t newestSecond_ = 0;  // of the newest item
+    bool failing_ = false;           // the failure was said
     HostClock::time_point retryAt_;
     HostClock::duration betweenAttempts_ = std::chrono::seconds(1);
 };
-
-// A name that is safe in a path: letters, digits and "-_+@=." stay, anything else becomes "_".
-std::string fileNameOf(const std::string& trunk);
 
 }  // namespace reader
 

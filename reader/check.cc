@@ -15,11 +15,6 @@ namespace reader {
 
 namespace {
 
-calls::Severity severityNamed(const std::string& name) {
-    using enum calls::Severity;
-    return chosen<calls::Severity>(name, {{"note", note}, {"warning", warning}, {"error", error}});
-}
-
 constexpr std::string_view colorOf(calls::Severity severity) {
     switch (severity) {
         case calls::Severity::error:
@@ -166,6 +161,11 @@ class FindingPrinter : public Analysed {
 };
 
 }  // namespace
+
+calls::Severity severityNamed(const std::string& name) {
+    using enum calls::Severity;
+    return chosen<calls::Severity>(name, {{"note", note}, {"warning", warning}, {"error", error}});
+}
 
 std::span<const OptionRow> checkOptions() {
     static const OptionRow rows[] = {

@@ -9,6 +9,9 @@
 
 namespace reader {
 
+// "note", "warning", "error". Throws UsageError.
+calls::Severity severityNamed(const std::string& name);
+
 class Chatter;
 
 // Returns `found` if a finding is as severe as --fail-on says.

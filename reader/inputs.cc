@@ -15,7 +15,14 @@ namespace reader {
 
 namespace {
 
-std::unique_ptr<capture::Reader> openOne(const std::string& file, const InputOptions& input) {
+void checkReadable(const std::string& file) {
+    if (file != "-" && access(file.c_str(), R_OK) != 0)
+        throw FileError("cannot read " + file + ": " + std::strerror(errno));
+}
+
+}  // namespace
+
+std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOptions& input) {
     capture::ReadOptions options;
     options.follow = input.follow;
     options.trunk = input.trunk;
@@ -27,13 +34,6 @@ std::unique_ptr<capture::Reader> openOne(const std::string& file, const InputOpt
     }();
     return capture::openReader(file, options, known);
 }
-
-void checkReadable(const std::string& file) {
-    if (file != "-" && access(file.c_str(), R_OK) != 0)
-        throw FileError("cannot read " + file + ": " + std::strerror(errno));
-}
-
-}  // namespace
 
 std::vector<std::string> inputFiles(const Options& options) {
     std::vector<std::string> files = options.input.files;
@@ -54,7 +54,7 @@ std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*c
     std::vector<Opener> openers;
     for (const std::string& file : files) {
         checkReadable(file);
-        openers.emplace_back([file, &input] { return openOne(file, input); });
+        openers.emplace_back([file, &input] { return openFile(file, input); });
     }
     if (input.merge && files.size() > 1)
         return std::make_unique<Merge>(openers);
@@ -68,7 +68,7 @@ void checkForms(const Options& options) {
         std::error_code ignored;
         capture::Item item;
         if (file != "-" && std::filesystem::is_regular_file(file, ignored))
-            openOne(file, options.input)->next(item);
+            openFile(file, options.input)->next(item);
     }
 }
 

@@ -16,6 +16,9 @@ namespace reader {
 // there is nothing to read.
 std::vector<std::string> inputFiles(const Options& options);
 
+// One input of any form that this program reads.
+std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOptions& input);
+
 // One after another, or by time with --merge. Throws FileError for one that cannot be opened or is of no
 // known form, before anything is read.
 std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& chatter);

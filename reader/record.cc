@@ -2,11 +2,14 @@
 
 #include <algorithm>
 #include <atomic>
+#include <chrono>
 #include <csignal>
+#include <ctime>
 #include <filesystem>
 #include <map>
 
-#include "reader/RotatingFile.h"
+#include "reader/RecordedTrunk.h"
+#include "reader/Triggers.h"
 #include "reader/errors.h"
 #include "reader/session.h"
 #include "reader/text.h"
@@ -15,56 +18,108 @@ namespace reader {
 
 namespace {
 
+// What signals ask for: SIGHUP begins new files, SIGUSR1 keeps what surrounds this moment.
 std::atomic<bool> beginAnew = false;
+std::atomic<bool> keepNow = false;
 
-void beginAnewOnHangup() {
+void heedSignals() {
     struct sigaction action {};
-    action.sa_handler = [](int) { beginAnew = true; };
-    sigaction(SIGHUP, &action, nullptr);
+    action.sa_handler = [](int signal) { (signal == SIGHUP ? beginAnew : keepNow) = true; };
+    for (const int signal : {SIGHUP, SIGUSR1})
+        sigaction(signal, &action, nullptr);
 }
 
-// A file for each D channel.
+// Hands each item to its D channel.
 class Recorder : public Consumer {
   public:
-    Recorder(const RotationRules& rules, Chatter& chatter)
-        : rules_(rules), chatter_(chatter), roles_(chatter) {}
+    Recorder(const RecordRules& rules, const Options& options, Chatter& chatter)
+        : rules_(rules), chatter_(chatter), roles_(chatter), triggers_(options) {}
+
+    // Triggers see what the filters leave out, too.
+    bool wantsAll() const override { return triggers_.areThere(); }
 
     void take(Chunk& chunk, std::size_t count) override {
-        for (std::size_t i = 0; i < count; ++i) {
-            roles_.take(chunk.seen()[chunk.pieces[i].item],
-                        [&](const capture::Item& item) { fileOf(item).write(item); });
+        obeySignals();
+        isIdle_ = isIdle_ && chunk.size() == 0;
+        std::size_t piece = 0;
+        for (std::size_t i = 0; i < chunk.size(); ++i) {
+            const Seen& seen = chunk.seen()[i];
+            const bool passes = piece < count && chunk.pieces[piece].item == i;
+            piece += passes ? 1 : 0;
+            const auto fired = triggers_.look(seen);
+            if (passes)
+                roles_.take(seen, [&](const capture::Item& item) { record(item); });
+            fire(fired);
         }
     }
 
     void flush() override {
-        const bool anew = beginAnew.exchange(false);
-        for (auto& [trunk, file] : files_) {
-            file.flush();
-            if (anew)
-                file.finish();
+        obeySignals();
+        if (isIdle_) {
+            for (auto& [name, trunk] : trunks_)
+                trunk.idle(std::time(nullptr));
         }
+        const auto now = HostClock::now();
+        if (isIdle_)
+            fire(triggers_.advance((now - lastLook_).count()));
+        lastLook_ = now;
+        isIdle_ = true;
+        for (auto& [name, trunk] : trunks_)
+            trunk.flush();
     }
 
+    // Returns how many frames could not be written.
     std::uint64_t finish() {
-        roles_.giveUp([&](const capture::Item& item) { fileOf(item).write(item); });
+        roles_.giveUp([&](const capture::Item& item) { record(item); });
         std::uint64_t lost = 0;
-        for (auto& [trunk, file] : files_) {
-            file.finish();
-            lost += file.lostInAll();
+        for (auto& [name, trunk] : trunks_) {
+            trunk.finish();
+            lost += trunk.lostInAll();
         }
         return lost;
     }
 
   private:
-    RotatingFile& fileOf(const capture::Item& item) {
-        const std::string trunk = item.frame.interface == nullptr ? "" : item.frame.interface->name;
-        return files_.try_emplace(trunk, rules_, trunk, chatter_).first->second;
+    using HostClock = std::chrono::steady_clock;
+
+    void record(const capture::Item& item) {
+        if (item.kind == capture::Item::Kind::replaced) {
+            for (auto& [name, trunk] : trunks_) {
+                if (trunk.readsFrom(item.frame.place.file))
+                    trunk.logIsGone(item);
+            }
+            return;
+        }
+        const std::string& name = item.frame.interface->name;
+        trunks_.try_emplace(name, rules_, name, chatter_).first->second.take(item);
     }
 
-    const RotationRules& rules_;
+    void fire(std::span<const Triggers::Fired> fired) {
+        for (const Triggers::Fired& one : fired) {
+            const auto trunk = trunks_.find(one.dChannel);
+            if (trunk != trunks_.end() && !trunk->second.isBehind())
+                trunk->second.trigger(one.why);
+        }
+    }
+
+    void obeySignals() {
+        if (beginAnew.exchange(false)) {
+            for (auto& [name, trunk] : trunks_)
+                trunk.beginFile();
+        }
+        if (keepNow.exchange(false)) {
+            for (auto& [name, trunk] : trunks_)
+                trunk.trigger("SIGUSR1");
+        }
+    }
+
+    const RecordRules& rules_;
     Chatter& chatter_;
     Roles roles_;
-    std::map<std::string, RotatingFile> files_;
+    Triggers triggers_;
+    std::map<std::string, RecordedTrunk> trunks_;  // by the name of the D channel
+    bool isIdle_ = false;                          // nothing has come since the last flush
+    HostClock::time_point lastLook_ = HostClock::now();
 };
 
 struct Unit {
@@ -103,6 +158,19 @@ std::int64_t readPeriod(const std::string& text) {
     return static_cast<std::int64_t>(readWithUnit(text, units, "time: 90s, 15min, 1h, 1d"));
 }
 
+namespace {
+
+// What surrounds a trigger is held in memory.
+std::int64_t readSpan(const std::string& text) {
+    constexpr std::int64_t most = 86400;
+    const std::int64_t seconds = readPeriod(text);
+    if (seconds > most)
+        throw UsageError(text + " is more than a day");
+    return seconds;
+}
+
+}  // namespace
+
 std::span<const OptionRow> recordOptions() {
     static constexpr OptionRow rows[] = {
         {"--to", "pcapng|log|pcap|hex", "The form to record in (default: pcapng)",
@@ -115,23 +183,59 @@ std::span<const OptionRow> recordOptions() {
          [](Options& to, const std::string& value) { to.record.seconds = readPeriod(value); }},
         {"--files", "N", "Keep the newest N finished files of a D channel (default: all)",
          [](Options& to, const std::string& value) { to.record.files = countIn(value, 1'000'000'000U); }},
+        {"--keep", "TIME",
+         "Keep the last 90min, 24h, 7d; without --time and --size a tenth of it is the time of a file",
+         [](Options& to, const std::string& value) { to.record.span = readPeriod(value); }},
+        {"--on", "WHAT",
+         "Keep what surrounds this, in files of its own: check:LEVEL (a finding of this severity or a worse "
+         "one), "
+         "cause:34,38, or number, message, callref, channel, tei, type, mark with values, as filters have "
+         "them. SIGUSR1 "
+         "does the same at any time",
+         [](Options& to, const std::string& value) { readTrigger(value, to.record); }},
+        {"--before", "TIME", "How much is kept in front of it (default: 5min)",
+         [](Options& to, const std::string& value) { to.record.before = readSpan(value); }},
+        {"--after", "TIME", "How much is kept behind it (default: 1min)",
+         [](Options& to, const std::string& value) { to.record.after = readSpan(value); }},
+        {"--kept-files", "N", "Keep the newest N of these files of a D channel (default: all)",
+         [](Options& to, const std::string& value) { to.record.keptFiles = countIn(value, 1'000'000'000U); }},
     };
     return rows;
 }
 
+namespace {
+
+RecordRules rulesOf(const Options& options) {
+    constexpr std::int64_t filesInSpan = 10;
+    const RecordOptions& record = options.record;
+    RotationRules files{record.folder, &recordingForm(options), record.size, record.seconds, record.files,
+                        record.span};
+    if (files.span != 0 && files.period == 0 && files.size == 0)
+        files.period = std::max<std::int64_t>(files.span / filesInSpan, 1);
+    RotationRules kept{files.folder, files.form, files.size};
+    kept.kept = record.keptFiles;
+    kept.mark = "kept";
+    return {files, {record.before * 1'000'000'000, record.after * 1'000'000'000, kept}};
+}
+
+}  // namespace
+
 int runRecord(const Options& given, Chatter& chatter) {
     Options options = given;
     options.input.follow = true;
-    const RotationRules rules{options.record.folder, &recordingForm(options), options.record.size,
-                              options.record.seconds, options.record.files};
-    if (!std::filesystem::is_directory(rules.folder))
-        throw FileError("cannot write into " + rules.folder + ": no such folder");
+    const RecordRules rules = rulesOf(options);
+    if (!std::filesystem::is_directory(rules.files.folder))
+        throw FileError("cannot write into " + rules.files.folder + ": no such folder");
     Session session(options, chatter);
-    beginAnewOnHangup();
-    Recorder recorder(rules, chatter);
-    session.run(recorder, [] { return std::make_unique<NoComposer>(); });
-    const std::uint64_t lost = recorder.finish();
-    if (lost != 0)
+    heedSignals();
+    Recorder recorder(rules, options, chatter);
+    try {
+        session.run(recorder, [] { return std::make_unique<NoComposer>(); });
+    } catch (...) {
+        recorder.finish();
+        throw;
+    }
+    if (const std::uint64_t lost = recorder.finish(); lost != 0)
         throw FileError("frames lost because they could not be written: " + std::to_string(lost));
     return good;
 }

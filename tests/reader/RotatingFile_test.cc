@@ -142,6 +142,61 @@ TEST_F(RotatingFileTest, KeepsTheNewestOfItsOwn) {
                               "t2.20200101T000000Z.txt=other"}));
 }
 
+TEST_F(RotatingFileTest, BeginsNoFileForAFrameThatIsALittleLate) {
+    rules_.period = 60;
+    RotatingFile file(rules_, "t", chatter_);
+    file.write(frame(november + 27 * second));     // 11:26:00
+    file.write(frame(november + 26 * second, 5));  // 11:25:59
+    file.write(frame(november - 34 * second, 6));  // 11:24:59: the clock was set back
+    file.finish();
+    EXPECT_EQ(files(), (Files{"t.20261121T112600Z.txt=[4][5].", "t.20261121T112459Z.txt=[6]."}));
+}
+
+TEST_F(RotatingFileTest, EndsWithItsPeriodThoughNothingComes) {
+    rules_.period = 60;
+    RotatingFile file(rules_, "t", chatter_);
+    file.write(frame(november));  // 11:25:33
+    file.flush();
+    constexpr std::int64_t hostSecond = november / second;
+    file.passTime(hostSecond + 28);  // 11:26:01: frames of the minute before may still come
+    EXPECT_EQ(files(), Files{"t.20261121T112533Z.txt.part=[4]"});
+    file.passTime(hostSecond + 29);
+    EXPECT_EQ(files(), Files{"t.20261121T112533Z.txt=[4]."});
+}
+
+TEST_F(RotatingFileTest, KeepsWhatIsNotOlderThanTheSpan) {
+    rules_.span = 60;
+    RotatingFile file(rules_, "t", chatter_);
+    for (const int at : {0, 20, 40, 80}) {
+        file.write(frame(november + at * second));
+        file.finish();
+    }
+    // The first ended at 20, more than a minute before 81; the second has what came up to 40.
+    file.write(frame(november + 81 * second));
+    file.finish();
+    EXPECT_EQ(files(), (Files{"t.20261121T112553Z.txt=[4].", "t.20261121T112613Z.txt=[4].",
+                              "t.20261121T112653Z.txt=[4].", "t.20261121T112654Z.txt=[4]."}));
+}
+
+TEST_F(RotatingFileTest, WithAMarkIsLeftAloneByThoseWithout) {
+    RotationRules marked = rules_;
+    marked.mark = "kept";
+    {
+        RotatingFile kept(marked, "t", chatter_);
+        kept.write(frame(november));
+        kept.finish();
+        kept.write(frame(november, 5));
+    }
+    rules_.kept = 1;
+    RotatingFile file(rules_, "t", chatter_);
+    for (const std::size_t size : {6, 7}) {
+        file.write(frame(november, size));
+        file.finish();
+    }
+    EXPECT_EQ(files(), (Files{"t.20261121T112533Z.kept.txt=[4].", "t.20261121T112533Z.2.kept.txt=[5].",
+                              "t.20261121T112533Z.2.txt=[7]."}));
+}
+
 TEST_F(RotatingFileTest, KeepsWhatItHasWhenTheDiskIsFull) {
     RotatingFile file(rules_, "t", chatter_);
     file.write(frame(november));

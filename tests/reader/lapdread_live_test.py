@@ -121,7 +121,9 @@ class Record(Running):
                           stderr=subprocess.PIPE, text=True)
 
     def files(self):
-        return sorted(path.name for path in self.folder.iterdir() if path.name != "grows.hex")
+        """The recordings; beside them is the recorder's state."""
+        return sorted(path.name for path in self.folder.iterdir()
+                      if path.name != "grows.hex" and not path.name.endswith(".state.json"))
 
     def test_an_end_in_order_names_the_file_after_trunk_and_start(self):
         self.write("grows.hex", *LINES)

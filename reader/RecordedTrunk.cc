@@ -1,0 +1,253 @@
+#include "reader/RecordedTrunk.h"
+
+#include <fcntl.h>
+#include <sys/file.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <cstring>
+#include <filesystem>
+#include <utility>
+
+#include "reader/inputs.h"
+
+namespace reader {
+
+namespace {
+
+using Kind = capture::Item::Kind;
+
+constexpr std::size_t mostWaiting = 1000;
+
+// Frames that every form with a place for losses holds. A frame that was cut off has no number: a log that is
+// written anew does not hold it.
+bool isNumbered(const capture::Item& item) { return item.isFrame() || item.kind == Kind::oversized; }
+
+std::uint64_t framesIn(const std::string& path) {
+    const std::unique_ptr<capture::Reader> reader = openFile(path, {});
+    capture::Item item;
+    std::uint64_t frames = 0;
+    while (reader->next(item) == capture::Reader::Next::item)
+        frames += isNumbered(item) ? 1 : 0;
+    return frames;
+}
+
+// Whether another recorder is writing the file just now.
+bool isBeingWritten(const std::string& path) {
+    const int descriptor = open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    if (descriptor < 0)
+        return true;
+    const bool isFree = flock(descriptor, LOCK_EX | LOCK_NB) == 0;
+    close(descriptor);
+    return !isFree;
+}
+
+}  // namespace
+
+RecordedTrunk::RecordedTrunk(const RecordRules& rules, const std::string& trunk, Chatter& chatter)
+    : rules_(rules),
+      trunk_(fileNameOf(trunk)),
+      chatter_(chatter),
+      statePath_(statePath(rules.files.folder, trunk_)),
+      file_(rules.files, trunk, chatter),
+      surroundings_(rules.surroundings, trunk, chatter) {
+    try {
+        if (auto state = readState(statePath_))
+            state_ = *std::move(state);
+    } catch (const std::runtime_error& error) {
+        chatter_.error(std::string(error.what()) + "; numbers begin anew");
+    }
+    state_.trunk = trunk;
+    adoptUnfinished();
+    recordedNext_ = state_.next;
+    recordedBesides_ = state_.besides;
+}
+
+void RecordedTrunk::adoptUnfinished() {
+    const RotationRules& files = rules_.files;
+    const RecordingKind kind{files.folder, trunk_, "", std::string(files.form->name)};
+    RecordingKind kept = kind;
+    kept.mark = rules_.surroundings.files.mark;
+    std::vector<Recording> left = unfinishedRecordings(kind);
+    const std::vector<Recording> leftKept = unfinishedRecordings(kept);
+    left.insert(left.end(), leftKept.begin(), leftKept.end());
+    for (const Recording& recording : left) {
+        const std::string path = files.folder + "/" + recording.name;
+        const std::string part = path + std::string(unfinishedEnding);
+        if (isBeingWritten(part)) {
+            chatter_.error(part + " is being written by another recorder, or cannot be opened");
+            continue;
+        }
+        if (!state_.files.empty() && state_.files.back().name == recording.name)
+            continueBehind(state_.files.back(), part);
+        if (std::rename(part.c_str(), path.c_str()) == 0)
+            chatter_.note("finished " + path + ", which was left behind");
+        else
+            chatter_.error("cannot rename " + part + ": " + std::strerror(errno));
+    }
+}
+
+// The file itself knows better than the state how far a recorder came that was killed.
+void RecordedTrunk::continueBehind(const RecordedFile& file, const std::string& path) {
+    if (file.run != state_.run)
+        return;
+    try {
+        const std::uint64_t next = file.first + framesIn(path);
+        if (next != state_.next)
+            state_.besides = 0;
+        state_.next = next;
+    } catch (const std::exception& error) {
+        // Not even a head was written.
+        chatter_.detail(error.what());
+        state_.next = file.first;
+        state_.besides = 0;
+    }
+}
+
+void RecordedTrunk::take(const capture::Item& item) {
+    if (source_ != item.frame.place.file) {
+        if (isMet_)
+            state_.log.reset();  // a trunk of two logs at once: nobody can read the same again
+        source_ = item.frame.place.file;
+    }
+    if (!isMet_ && !isNumbered(item)) {
+        waiting_.add(item);
+        if (waiting_.items().size() < mostWaiting)
+            return;
+    }
+    if (!isMet_) {
+        meet(item);
+        for (const capture::Item& waiting : waiting_.items())
+            place(waiting);
+        const bool isAmongThem = !isNumbered(item);
+        waiting_.clear();
+        if (isAmongThem)
+            return;
+    }
+    place(item);
+}
+
+void RecordedTrunk::meet(const capture::Item& first) {
+    isMet_ = true;
+    frames_ = besides_ = 0;
+    const std::optional<RecordedLog> log = isNumbered(first) ? logOf(first.frame) : std::nullopt;
+    if (state_.run != 0 && log && state_.log && log->holdsTheSameAs(*state_.log)) {
+        recordedNext_ = state_.next;
+        recordedBesides_ = state_.besides;
+        return;
+    }
+    file_.finish();
+    beginRun(state_, log);
+    recordedNext_ = 1;
+    recordedBesides_ = 0;
+    isChanged_ = true;
+    isListed_ = false;
+}
+
+// Counts the item where it stands in the log, and records it unless that has been done.
+void RecordedTrunk::place(const capture::Item& item) {
+    const bool numbered = isNumbered(item);
+    if (numbered) {
+        ++frames_;
+        besides_ = 0;
+    } else {
+        ++besides_;
+    }
+    isBehind_ = isRecorded(numbered);
+    if (!isBehind_)
+        record(item, numbered);
+    surroundings_.take(item);
+}
+
+bool RecordedTrunk::isRecorded(bool numbered) const {
+    if (frames_ + 1 < recordedNext_)
+        return true;
+    return frames_ + 1 == recordedNext_ && (numbered || besides_ <= recordedBesides_);
+}
+
+void RecordedTrunk::record(const capture::Item& item, bool numbered) {
+    file_.write(item);
+    enlist();
+    if (numbered) {
+        ++state_.next;
+        state_.besides = 0;
+    } else {
+        ++state_.besides;
+    }
+    isChanged_ = true;
+}
+
+// A file that begins with an item that is no frame has the number of the frame that follows.
+void RecordedTrunk::enlist() {
+    if (std::exchange(enlisted_, file_.begun()) == file_.begun())
+        return;
+    std::vector<RecordedFile>& files = state_.files;
+    if (!files.empty() && files.back().name == file_.newest())
+        files.pop_back();  // it came to nothing, since the disk was full
+    files.push_back({file_.newest(), state_.run, state_.next});
+    const auto isGone = [&](const RecordedFile& file) {
+        const std::string path = rules_.files.folder + "/" + file.name;
+        return &file != &files.back() && !std::filesystem::exists(path);
+    };
+    files.erase(std::remove_if(files.begin(), files.end() - 1, isGone), files.end() - 1);
+    if (files.size() > RecordState::mostFiles)
+        files.erase(files.begin(), files.end() - RecordState::mostFiles);
+    isListed_ = false;
+}
+
+void RecordedTrunk::logIsGone(const capture::Item& item) {
+    if (!isMet_) {
+        waiting_.clear();  // a head of which no frame came
+        return;
+    }
+    place(item);
+    file_.finish();
+    saveState();
+    isMet_ = false;
+}
+
+void RecordedTrunk::trigger(const std::string& why) { surroundings_.trigger(why); }
+
+void RecordedTrunk::flush() {
+    file_.flush();
+    surroundings_.flush();
+    if (isChanged_ && (!isListed_ || std::chrono::steady_clock::now() >= nextState_))
+        saveState();
+}
+
+void RecordedTrunk::idle(std::int64_t second) {
+    file_.passTime(second);
+    surroundings_.idle();
+}
+
+void RecordedTrunk::beginFile() { file_.finish(); }
+
+void RecordedTrunk::finish() {
+    if (!isMet_ && !waiting_.empty()) {
+        beginRun(state_, std::nullopt);
+        isMet_ = true;
+        for (const capture::Item& waiting : waiting_.items())
+            place(waiting);
+        waiting_.clear();
+    }
+    file_.finish();
+    surroundings_.finish();
+    if (isChanged_)
+        saveState();
+}
+
+// What is written to the files is behind this, or no longer to be had: the state may be told.
+void RecordedTrunk::saveState() {
+    if (const auto wrong = writeState(state_, statePath_)) {
+        if (!std::exchange(stateFails_, true))
+            chatter_.error(*wrong);
+    } else {
+        stateFails_ = false;
+        isChanged_ = false;
+        isListed_ = true;
+    }
+    nextState_ = std::chrono::steady_clock::now() + betweenStates_;
+}
+
+}  // namespace reader
