@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <array>
+#include <limits>
 #include <optional>
 #include <utility>
 
@@ -45,9 +46,9 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
           channels_(timers, maintenance_, *this),
           patterns_(*this) {}
 
+    // The message's time is the group's.
     void take(const Message& message, const LinkWitness& link) {
         links_[message.layer2.tei] = &link;
-        advance(message.at);
         maintenance_.take(message);
         const Call* const call = table_.take(message);
         const isdn::Layer3& layer3 = message.layer3;
@@ -62,13 +63,17 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
             noteChangeover(message);
         listener_.heard(message, call);
     }
+    // The clock of one of its D channels has come to `at`. The clocks of several differ a little; the group's
+    // own is the latest of them, so that it never goes back.
     void advance(std::int64_t at) {
-        waits_.advance(at);
-        maintenance_.advance(at);
-        channels_.advance(at);
-        patterns_.advance(at);
-        table_.advance(at);
+        now_ = std::max(now_, at);
+        waits_.advance(now_);
+        maintenance_.advance(now_);
+        channels_.advance(now_);
+        patterns_.advance(now_);
+        table_.advance(now_);
     }
+    std::int64_t now() const { return now_; }
     void linkChanged(std::uint8_t tei, const Moment& moment, const std::string& dChannel, bool isUp) {
         patterns_.linkChanged(moment, dChannel, isUp);
         if (isUp)
@@ -128,6 +133,7 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
     }
 
     Listener& listener_;
+    std::int64_t now_ = std::numeric_limits<std::int64_t>::min();
     std::string active_;                           // the D channel on which a call was heard last
     std::array<const LinkWitness*, 128> links_{};  // by TEI, of the D channel that was used last
     CallTable table_;
@@ -180,6 +186,7 @@ struct Analysis::Channel {
         if (taken == Segments::Taken::outOfOrder)
             report(findings::segmentsUnfinished, message, message.number,
                    "a SEGMENT does not follow those before it");
+        message.at = group.now();
         group.take(message, keeper.witness());
     }
     void reportUnfinished(Segments& pieces, const Message& message, const Timers& timers) {
@@ -256,8 +263,8 @@ const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
     channel.keepers[layer2.tei].take(layer2, frame.transmitted ? Side::us : Side::peer, number, at, marks,
                                      channel.links.events());
     if (marks.linkUp || marks.linkDown)
-        channel.group.linkChanged(layer2.tei, {number, at, frame.clock, frame.time}, channel.name,
-                                  marks.linkUp);
+        channel.group.linkChanged(layer2.tei, {number, channel.group.now(), frame.clock, frame.time},
+                                  channel.name, marks.linkUp);
     for (const KeptFrame& late : channel.links.late()) {
         capture::Frame kept = late.frame;
         kept.octets = late.octets;
