@@ -21,6 +21,12 @@ class TheProgram(RelayTest):
         program = Program(self, RELAY, "--max-clients", "none")
         self.assertIn("--max-clients", program.ends(status=2))
 
+    def test_a_time_that_is_out_of_its_range(self):
+        for option in ("--frame-timeout", "--write-timeout"):
+            for seconds in ("0", "0.0009", "-1", "3600.1", "nan", "inf", "soon"):
+                with self.subTest(option, seconds=seconds):
+                    self.assertIn(option, Program(self, RELAY, f"{option}={seconds}").ends(status=2))
+
     def test_help_and_version(self):
         for option, said in (("--help", "--listen ADDR[:PORT]"), ("--version", "kv9relayd 1.0")):
             program = Program(self, RELAY, option)
