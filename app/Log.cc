@@ -13,6 +13,7 @@ Log::~Log() { close(); }
 
 std::FILE* Log::open(const char* name) {
     name_ = name;
+    lastWrite_ = {};
     return file_.open(name);
 }
 

@@ -4,7 +4,9 @@
 
 #include <atomic>
 #include <cstddef>
+#include <cstdint>
 #include <cstdio>
+#include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <memory>
@@ -21,6 +23,7 @@
 #include "decoder/lines.h"
 #include "tests/app/channels.h"
 #include "tests/support/fake_norv.h"
+#include "tests/support/test_system.h"
 
 namespace {
 
@@ -78,6 +81,8 @@ class RealLog {
         std::ifstream file(path_);
         return {std::istreambuf_iterator<char>(file), {}};
     }
+    // What was written to the file so far. Any thread may call it.
+    std::uintmax_t size() const { return std::filesystem::file_size(path_); }
 
   private:
     std::string path_ = ::testing::TempDir() + "road-" + std::to_string(getpid()) + ".log";
@@ -180,6 +185,23 @@ TEST_F(Road, AFrameForWhichTheQueueHasNoMemoryIsCountedAndTheLogSaysSo) {
     EXPECT_EQ(log_.text().substr(0, 32), "Enqueue Failed \nEnqueue Failed \n");
     EXPECT_EQ(arrivals->lostForWantOfMeans(), 2U);
     EXPECT_TRUE(traceLog.complete());
+}
+
+TEST_F(Road, AFrameAfterWhichNothingComesIsInTheFileBeforeTheDisplaySleepsAgain) {
+    send(0, 1);
+    constexpr std::uintmax_t unknown = ~std::uintmax_t{0};
+    std::atomic<std::uintmax_t> sizeThen = unknown;
+    SleeplessSystem system;
+    system.insteadOfNapping = [&] {
+        if (std::uintmax_t none = unknown; arrivals->unwritten() == 0)
+            sizeThen.compare_exchange_strong(none, log_.size());
+        sizeThen.notify_all();
+    };
+    Process.start(nullptr);
+    sizeThen.wait(unknown);
+    Process.cancel();
+    Process.join();
+    EXPECT_GT(sizeThen, 0U);
 }
 
 TEST_F(Road, ACancelledDisplayShowsWhatHasArrivedWhenTheArrivalsAreClosed) {
