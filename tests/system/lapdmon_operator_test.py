@@ -133,8 +133,19 @@ class Operator(SystemTest):
                 program.ends(status=1, errors=re.compile(
                     rf"\A{path.name}: given up, since nobody reads it\n{path.name}: frames lost: [1-9]\d*\n"
                     r"lapdmon: frames lost because the end did not wait for the log: [1-9]\d*\n\Z"))
+                self.assert_all_counted(program, reader)
                 self.assertEqual(program.heard()[-2:], OFF)
                 self.assertEqual(program.journal.lines()[-1], "buffers outstanding 0, queues open 0")
+
+    def assert_all_counted(self, program, reader):
+        """Each frame that the board sent is in the log, or among those that the program says are lost. The last one in the
+        log may be cut, and is lost then."""
+        text = b""
+        while some := os.read(reader, 65536):
+            text += some
+        lost = sum(int(line.split()[-1]) for line in program.errors.lines() if "frames lost" in line)
+        sent = sum(" EvtDetected " in line for line in program.journal.lines())
+        self.assertIn(text.count(b"Frame: Time") + lost - sent, (0, 1))
 
     def ignores_SIGHUP(self, program):
         return int(program.status("SigIgn"), 16) >> (signal.SIGHUP - 1) & 1 == 1
