@@ -14,12 +14,11 @@ namespace type = isdn::message;
 constexpr std::size_t fewDigits = 6;        // a number of fewer is short
 constexpr std::size_t longestNumber = 256;  // nobody dials more digits
 
-bool isDigit(unsigned char character) { return character >= '0' && character <= '9'; }
+// What a number may hold besides, it keeps: a blank number counts as many digits as it did before.
+bool countsAsDigit(std::uint8_t octet) { return octet != '*' && octet != '#'; }
 
 void blankNumber(std::span<std::uint8_t> octets) {
-    std::replace_if(
-        octets.begin(), octets.end(), [](std::uint8_t octet) { return octet != '*' && octet != '#'; },
-        std::uint8_t{'0'});
+    std::replace_if(octets.begin(), octets.end(), countsAsDigit, std::uint8_t{'0'});
 }
 
 bool isSegment(const isdn::Layer3& message) {
@@ -112,7 +111,7 @@ void Redactor::apply(const Plan& plan, std::span<std::uint8_t> octets, std::uint
         switch (part.treatment) {
             case Treatment::blank:
                 for (std::uint8_t& octet : at)
-                    octet &= part.keptBits;
+                    octet = static_cast<std::uint8_t>((octet & part.keptBits) | part.setBits);
                 break;
             case Treatment::number:
                 replaceNumber(at, before);
@@ -169,7 +168,8 @@ std::optional<std::string> Redactor::digitsBefore() {
 
 // False if the number was blanked.
 bool Redactor::replaceNumber(std::span<std::uint8_t> octets, std::string& before) {
-    const auto digits = std::ranges::count_if(before, isDigit) + std::ranges::count_if(octets, isDigit);
+    const auto digits =
+        std::ranges::count_if(before, countsAsDigit) + std::ranges::count_if(octets, countsAsDigit);
     if (blankShort_ && static_cast<std::size_t>(digits) < fewDigits) {
         blankNumber(octets);
         return false;

@@ -58,10 +58,17 @@ class Planner {
         return octets.subspan(std::min(octets.size(), count));
     }
 
-    void add(Octets octets, Treatment treatment, std::uint8_t keptBits = 0) {
+    void add(Octets octets, Treatment treatment, std::uint8_t keptBits = 0, std::uint8_t setBits = 0) {
         if (!octets.empty())
             plan_.push_back({static_cast<std::size_t>(octets.data() - whole_.data()), octets.size(),
-                             treatment, keptBits});
+                             treatment, keptBits, setBits});
+    }
+    // Blanks octets of an element so that those around them are read as before: bit 8 says where an extension
+    // ends, and in a display a length that is too long must stay so.
+    void addDoubtful(const Field& field, const Element& each) {
+        constexpr std::uint8_t tooLong = 0xFF;
+        add(field.at, Treatment::blank, field.name == "extension" ? extensionBit : std::uint8_t{0},
+            isDisplay(each) ? tooLong : std::uint8_t{0});
     }
 
     // Octets behind the last action indicator belong to nothing.
@@ -131,14 +138,17 @@ class Planner {
                 treatment = isDialled       ? Treatment::dialled
                             : ofInformation ? Treatment::blank
                                             : Treatment::number;
-            if (names(field, each))
-                add(field.at, treatment, keptBitsOf(field, each));
+            if (field.doubtful)
+                addDoubtful(field, each);
+            else if (names(field, each))
+                add(field.at, treatment);
         }
     }
 
     static bool isDisplay(const Element& each) {
         constexpr std::uint8_t displayOfNational = 0x2A;  // in codeset 5
-        return each.id == element::display || (each.codeset == 5 && each.id == displayOfNational);
+        return (each.codeset == 0 && each.id == element::display) ||
+               (each.codeset == 5 && each.id == displayOfNational);
     }
     static bool mayBeDialled(const Element& each) {
         return each.codeset == 0 && (each.id == element::calledNumber || each.id == element::keypad);
@@ -148,11 +158,11 @@ class Planner {
     static bool names(const Field& field, const Element& each) {
         const bool isOpaque =
             field.kind == Field::Kind::raw && each.id != element::changeStatus && !isDisplay(each);
-        return field.personal || field.doubtful || isOpaque;
+        return field.personal || isOpaque;
     }
 
     static Treatment treatmentOf(const Field& field, const Element& each, bool isOpen) {
-        if (field.doubtful || !field.personal)
+        if (!field.personal)
             return Treatment::blank;
         if (field.kind == Field::Kind::text) {
             const bool isNumber =
@@ -161,12 +171,6 @@ class Planner {
         }
         // Bit 8 of a pseudonym would end the group elsewhere.
         return isOpen ? Treatment::blank : Treatment::octets;
-    }
-
-    // Bit 8 says where an extension ends, and in a display what is a tag.
-    static std::uint8_t keptBitsOf(const Field& field, const Element& each) {
-        const bool tells = field.name == "extension" || isDisplay(each);
-        return tells && field.doubtful ? extensionBit : 0;
     }
 
     // Whether a value spells something must not matter, so its type alone decides.

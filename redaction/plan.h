@@ -12,7 +12,7 @@
 namespace redaction {
 
 enum class Treatment : std::uint8_t {
-    blank,    // nobody can say what they hold: they become 0
+    blank,    // nobody can say what they hold
     number,   // a party's number
     dialled,  // the called number, or a piece of it, as the caller dials it
     text,     // a name, or what a terminal shows
@@ -23,7 +23,10 @@ struct Part {
     std::size_t at = 0;  // counted from the first octet of the frame, or of the message
     std::size_t size = 0;
     Treatment treatment = Treatment::blank;
-    std::uint8_t keptBits = 0;  // of each octet that is blanked: bits that say how the element goes on
+    // Of octets that are blanked: the bits that stay, since they say how the element goes on, and those that
+    // are set besides.
+    std::uint8_t keptBits = 0;
+    std::uint8_t setBits = 0;
 
     bool operator==(const Part&) const = default;
 };

@@ -61,12 +61,24 @@ def elements():
     yield from frames()
     for path in sorted((TREE / "tests/isdn/golden").glob("*.golden")):
         for case in re.split(r"^== ", path.read_text("latin-1"), flags=re.M)[1:]:
-            head = dict(line.split(" ", 1) for line in case.split("\n--\n")[0].split("\n")[1:])
+            head = dict(line.partition(" ")[::2] for line in case.split("\n--\n")[0].split("\n")[1:])
             if "frame" in head:
                 yield bytes.fromhex(head["frame"])
             elif "element" in head:
                 shift = bytes([0x98 + int(head.get("codeset", 0))]) if "codeset" in head else b""
                 yield bytes.fromhex("00010000 0802008105") + shift + bytes.fromhex(head["element"])
+
+
+def trunks():
+    """A variant, and frames behind their directions and lengths."""
+    for number, name in enumerate(("net5", "ni2", "4ess", "5ess", "dms100", "ntt")):
+        some = list(packets(EXAMPLES / f"{name}.pcap"))
+        for first in range(0, len(some), 30):
+            yield bytes([number]) + b"".join(bytes([int(pseudo[1] == 4), len(octets)]) + octets
+                                             for *_, pseudo, octets in some[first:first + 30] if len(octets) < 256)
+    for number, octets in enumerate(elements()):
+        if len(octets) < 256:
+            yield bytes([number % 6, number % 2, len(octets)]) + octets
 
 
 def events():
@@ -214,7 +226,7 @@ def command_lines():
 
 
 SEEDS = {
-    "frame": frames, "isdn": elements, "event": events, "message": messages, "relay": connections, "capture": captures, "input": inputs,
+    "frame": frames, "isdn": elements, "redact": trunks, "event": events, "message": messages, "relay": connections, "capture": captures, "input": inputs,
     "scenario": scenarios, "handover": handovers, "command_line": command_lines,
 }
 

@@ -14,19 +14,9 @@ using isdn::Variant;
 using isdn::testing::hex;
 using test::Bytes;
 
-std::string textOf(const Bytes& octets) {
-    constexpr std::string_view digits = "0123456789abcdef";
-    std::string text;
-    for (const std::uint8_t octet : octets) {
-        text += text.empty() ? "" : " ";
-        text += {digits[octet >> 4U], digits[octet & 15U]};
-    }
-    return text;
-}
-
 std::string redactedFrame(const Bytes& octets, Variant variant) {
     test::ConstantPseudonyms pseudonyms;
-    return textOf(test::redacted({{octets, false}}, pseudonyms, variant)[0].octets);
+    return test::textOf(test::redacted({{octets, false}}, pseudonyms, variant)[0].octets);
 }
 
 struct ElementCase {
@@ -55,8 +45,8 @@ constexpr ElementCase elementCases[] = {
     {"display with its kind", Variant::ni2, "28 05 b1 4a 6f 68 6e", "28 05 b1 78 78 78 78"},
     {"display of fields: tags and lengths stay", Variant::dms100,
      "28 0b 80 8d 04 4a 6f 68 6e 9e 02 31 32", "28 0b 80 8d 04 78 78 78 78 9e 02 78 78"},
-    {"display of fields with a wrong length: bit 8 stays", Variant::dms100,
-     "28 06 80 8d 09 4a 6f 68", "28 06 80 80 00 00 00 00"},
+    {"display of fields with a wrong length, which stays wrong", Variant::dms100,
+     "28 06 80 8d 09 4a 6f 68", "28 06 80 ff ff ff ff ff"},
     {"user-user, characters", Variant::net5, "7e 05 04 54 65 73 74", "7e 05 04 78 78 78 78"},
     {"user-user, octets", Variant::net5, "7e 04 00 12 34 56", "7e 04 00 ee ee ee"},
     {"call identity", Variant::net5, "10 02 31 32", "10 02 ee ee"},

@@ -87,6 +87,16 @@ inline Key keyOf(std::uint8_t seed) {
     return key;
 }
 
+inline std::string textOf(const Bytes& octets) {
+    constexpr std::string_view digits = "0123456789abcdef";
+    std::string text;
+    for (const std::uint8_t octet : octets) {
+        text += text.empty() ? "" : " ";
+        text += {digits[octet >> 4U], digits[octet & 15U]};
+    }
+    return text;
+}
+
 inline bool holds(const Bytes& octets, std::string_view text) {
     return std::search(octets.begin(), octets.end(), text.begin(), text.end(), [](std::uint8_t a, char b) {
                return a == static_cast<std::uint8_t>(b);
