@@ -47,12 +47,12 @@ class Golden(unittest.TestCase):
         self.assertTrue(paths)
         for path in paths:
             with self.subTest(path.name):
-                before, blocks = commands(path.read_text())
+                before, blocks = commands(path.read_bytes().decode())
                 self.assertTrue(blocks)
                 now = before + "".join(f"$ {command}\n{told(command)}" for command, _ in blocks)
                 if os.environ.get("UPDATE_GOLDEN") == "1":
-                    path.write_text(now)
-                self.assertEqual(path.read_text(), now)
+                    path.write_bytes(now.encode())
+                self.assertEqual(path.read_bytes().decode(), now)
 
 
 if __name__ == "__main__":

@@ -1,0 +1,68 @@
+#!/usr/bin/env python3
+"""Whether lapdread's memory stays flat: the same commands on few frames and on very many.
+
+    bench/read_memory.py [--few 10000] [--many 10000000] [--lapdread build/release/bin/lapdread]
+
+Makes its inputs itself, in a folder under --folder (default: /dev/shm), one after the other; ten million frames take 0.5 GB as a
+capture and 6 GB as a log, so the log is made of a tenth. Prints the most memory that each command held, and fails if that is 50 MB or
+more, or more than a quarter above what few frames take.
+"""
+
+import argparse
+import os
+import pathlib
+import shutil
+import subprocess
+import sys
+import tempfile
+
+from read_speed import ROOT, repeated
+
+MOST = 50.0  # MB
+GROWTH = 1.25
+COMMANDS = [["list"], ["decode"], ["convert", "--to", "jsonl"], ["convert", "--to", "pcapng"], ["calls"], ["check"]]
+
+
+def memory(words):
+    """The most memory that the command held, in MB, and how long it took, in seconds of the processor."""
+    process = subprocess.Popen([str(word) for word in words], stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+    _, status, usage = os.wait4(process.pid, 0)
+    if status != 0:
+        sys.exit(f"{words} failed")
+    return usage.ru_maxrss / 1024, usage.ru_utime + usage.ru_stime
+
+
+def main():
+    parser = argparse.ArgumentParser()
+    parser.add_argument("--few", type=int, default=10_000)
+    parser.add_argument("--many", type=int, default=10_000_000)
+    parser.add_argument("--folder", default="/dev/shm")
+    parser.add_argument("--lapdread", default=ROOT / "build/release/bin/lapdread")
+    options = parser.parse_args()
+    folder = pathlib.Path(tempfile.mkdtemp(prefix="read-memory.", dir=options.folder))
+    held = {}
+    try:
+        for frames in (options.few, options.many):
+            capture, log = folder / "capture.pcap", folder / "capture.log"
+            repeated(capture, frames)
+            for words in COMMANDS:
+                held.setdefault(" ".join(words), []).append(memory([options.lapdread, *words, "--quiet", capture]))
+            subprocess.run([options.lapdread, "convert", "--quiet", "--first", str(max(frames // 10, 1)), capture, log],
+                           check=True)
+            capture.unlink()
+            held.setdefault("convert of a log", []).append(
+                memory([options.lapdread, "convert", "--quiet", "--to", "pcapng", log]))
+            log.unlink()
+    finally:
+        shutil.rmtree(folder)
+    bad = False
+    print(f"most memory in MB of {options.few} and {options.many} frames, and seconds of the processor for the latter")
+    for name, ((few, _), (many, seconds)) in held.items():
+        grows = many >= MOST or many > few * GROWTH
+        bad = bad or grows
+        print(f"{name:24} {few:7.1f} {many:7.1f} {seconds:8.1f} s{'   NOT FLAT' if grows else ''}", flush=True)
+    return 1 if bad else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())
