@@ -215,6 +215,13 @@ void describe(CLI::App& app, Options& options) {
 
 std::span<const OptionGroup> commonOptions() { return common; }
 
+void showDescription(const std::function<void(const CLI::App&)>& visit) {
+    Options unused;
+    CLI::App app(about, "lapdread");
+    describe(app, unused);
+    visit(app);
+}
+
 CommandLine parseCommandLine(std::vector<std::string> words) {
     words = joinNegations(withCommand(std::move(words)));
     std::reverse(words.begin(), words.end());  // as CLI11 takes them

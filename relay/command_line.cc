@@ -9,6 +9,8 @@ namespace relay {
 
 namespace {
 
+constexpr const char* about = "Lets lapdmon on other machines trace the KV9 boards of this one.";
+
 constexpr const char* footer =
     "A host reaches the boards of this machine with REMOTE_NORV=ADDR:PORT.\n"
     "\n"
@@ -33,7 +35,14 @@ std::string refuseNan(const std::string& text) {
     return std::isnan(std::strtod(text.c_str(), nullptr)) ? "Value " + text + " is no number of seconds" : "";
 }
 
-void addOptions(CLI::App& app, Given& given, Options& options) {
+// The option's help tells the range.
+template <class Number>
+CLI::Validator inRange(Number least, Number most) {
+    return CLI::Range(least, most).description("");
+}
+
+void describe(CLI::App& app, Given& given, Options& options) {
+    app.footer(footer);
     app.add_option("--listen", given.listen,
                    "IPv4 address to listen on; with port 0 the system chooses one (default: 127.0.0.1:6554)")
         ->type_name("ADDR[:PORT]");
@@ -42,18 +51,20 @@ void addOptions(CLI::App& app, Given& given, Options& options) {
                    "default (127.0.0.0/8)")
         ->type_name("CIDR")
         ->allow_extra_args(false);
-    app.add_option("--max-clients", options.maxClients, "Most connections at a time (default: 128)")
+    app.add_option("--max-clients", options.maxClients,
+                   "Most connections at a time, 1 to 10000 (default: 128)")
         ->type_name("N")
-        ->check(CLI::Range(1, 10000));
-    app.add_option("--frame-timeout", given.frameTimeout,
-                   "How long a host may take to finish a frame that it has begun (default: 10)")
+        ->check(inRange(1, 10000));
+    app.add_option(
+           "--frame-timeout", given.frameTimeout,
+           "How long a host may take to finish a frame that it has begun, 0.001 to 3600 (default: 10)")
         ->type_name("SECONDS")
-        ->check(CLI::Range(0.001, 3600.0))
+        ->check(inRange(0.001, 3600.0))
         ->check(refuseNan);
     app.add_option("--write-timeout", given.writeTimeout,
-                   "How long a host may take to accept a frame (default: 10)")
+                   "How long a host may take to accept a frame, 0.001 to 3600 (default: 10)")
         ->type_name("SECONDS")
-        ->check(CLI::Range(0.001, 3600.0))
+        ->check(inRange(0.001, 3600.0))
         ->check(refuseNan);
     app.set_help_flag("--help,-h", "Print this and exit");
     app.set_version_flag("--version", "kv9relayd " RELAY_VERSION, "Print the version and exit");
@@ -90,9 +101,8 @@ void use(const Given& given, Options& options) {
 CommandLine parseCommandLine(int argc, const char* const* argv) {
     CommandLine commandLine;
     Given given;
-    CLI::App app("Lets lapdmon on other machines trace the KV9 boards of this one.", "kv9relayd");
-    app.footer(footer);
-    addOptions(app, given, commandLine.options);
+    CLI::App app(about, "kv9relayd");
+    describe(app, given, commandLine.options);
     try {
         app.parse(argc, argv);
         use(given, commandLine.options);
@@ -104,6 +114,14 @@ CommandLine parseCommandLine(int argc, const char* const* argv) {
         throw BadCommandLine(std::string(error.what()) + " (--help tells more)");
     }
     return commandLine;
+}
+
+void showDescription(const std::function<void(const CLI::App&)>& visit) {
+    Given given;
+    Options options;
+    CLI::App app(about, "kv9relayd");
+    describe(app, given, options);
+    visit(app);
 }
 
 }  // namespace relay

@@ -2,10 +2,15 @@
 #ifndef RELAY_COMMAND_LINE_H
 #define RELAY_COMMAND_LINE_H
 
+#include <functional>
 #include <stdexcept>
 #include <string>
 
 #include "relay/server.h"
+
+namespace CLI {
+class App;
+}
 
 namespace relay {
 
@@ -22,6 +27,9 @@ struct CommandLine {
 
 // Throws BadCommandLine.
 CommandLine parseCommandLine(int argc, const char* const* argv);
+
+// Shows `visit` the description that parser and --help are made from; the manual page and completion are made from it.
+void showDescription(const std::function<void(const CLI::App&)>& visit);
 
 }  // namespace relay
 

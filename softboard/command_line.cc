@@ -8,6 +8,8 @@ namespace softboard {
 
 namespace {
 
+constexpr const char* about = "Runs PROGRAM on simulated KV9 boards, which play recorded D-channel frames.";
+
 const char* const examples =
     R"(softboard looks for PROGRAM in its own folder, then on PATH. Standard input, signals and exit status are those of
 PROGRAM. Without options, a built-in capture of calls plays on D channel 1 of board 1 again and again.
@@ -114,16 +116,20 @@ std::string faultList() {
     return list;
 }
 
+void describe(CLI::App& app, CommandLine& to) {
+    app.formatter(std::make_shared<Help>());
+    app.footer(faultList() + "\n" + examples);
+    addOptions(app, to);
+}
+
 std::string absolute(const std::string& path) { return std::filesystem::absolute(path).string(); }
 
 }  // namespace
 
 CommandLine parseCommandLine(const std::vector<std::string>& arguments) {
     CommandLine commandLine;
-    CLI::App app("Runs PROGRAM on simulated KV9 boards, which play recorded D-channel frames.", "softboard");
-    app.formatter(std::make_shared<Help>());
-    app.footer(faultList() + "\n" + examples);
-    addOptions(app, commandLine);
+    CLI::App app(about, "softboard");
+    describe(app, commandLine);
     const auto separator = std::find(arguments.begin(), arguments.end(), "--");
     std::vector<std::string> options(arguments.begin(), separator);
     std::reverse(options.begin(), options.end());  // CLI11 takes the last word first
@@ -143,6 +149,13 @@ CommandLine parseCommandLine(const std::vector<std::string>& arguments) {
         throw BadInput("no program to run: softboard [options] -- PROGRAM ARGS... (--help tells more)");
     }
     return commandLine;
+}
+
+void showDescription(const std::function<void(const CLI::App&)>& visit) {
+    CommandLine unused;
+    CLI::App app(about, "softboard");
+    describe(app, unused);
+    visit(app);
 }
 
 Scenario scenarioOf(const CommandLine& commandLine) {

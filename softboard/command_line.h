@@ -2,10 +2,15 @@
 #ifndef SOFTBOARD_COMMAND_LINE_H
 #define SOFTBOARD_COMMAND_LINE_H
 
+#include <functional>
 #include <string>
 #include <vector>
 
 #include "softboard/settings.h"
+
+namespace CLI {
+class App;
+}
 
 namespace softboard {
 
@@ -21,6 +26,9 @@ struct CommandLine {
 
 // `arguments` are those of the launcher, without argv[0]. Throws BadInput.
 CommandLine parseCommandLine(const std::vector<std::string>& arguments);
+
+// Shows `visit` the description that parser and --help are made from; the manual page and completion are made from it.
+void showDescription(const std::function<void(const CLI::App&)>& visit);
 
 // Makes the scenario that the command line asks for: reads the scenario file and the captures, and makes the
 // journal's path absolute. Throws BadInput.

@@ -28,7 +28,7 @@ class TheProgram(RelayTest):
                     self.assertIn(option, Program(self, RELAY, f"{option}={seconds}").ends(status=2))
 
     def test_help_and_version(self):
-        for option, said in (("--help", "--listen ADDR[:PORT]"), ("--version", "kv9relayd 1.0")):
+        for option, said in (("--help", "--listen ADDR[:PORT]"), ("--version", "kv9relayd " + os.environ["VERSION"])):
             program = Program(self, RELAY, option)
             program.ends()
             self.assertIn(said, program.screen.text())
