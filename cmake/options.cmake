@@ -8,6 +8,16 @@ set(LAPDMON_SANITIZE "" CACHE STRING "Comma-separated sanitizers, e.g. address,u
 
 # The software board's libnorv.so is in a folder of its own, in which the loader does not look by itself.
 set(LAPDMON_TRANSPORT_DIR lib/lapdmon)
+# The headers of the object layer, as they are included: vela/..., hostsvc/..., norv/...
+set(LAPDMON_INCLUDE_DIR ${CMAKE_INSTALL_INCLUDEDIR}/lapdmon)
+# Where the build makes manual pages and completion.
+set(LAPDMON_MANUAL_DIR ${CMAKE_BINARY_DIR}/manual/made)
+# Where zsh looks for completion: Debian's packages have a folder of their own.
+if(CMAKE_INSTALL_PREFIX STREQUAL "/usr")
+    set(LAPDMON_ZSH_DIR ${CMAKE_INSTALL_DATADIR}/zsh/vendor-completions)
+else()
+    set(LAPDMON_ZSH_DIR ${CMAKE_INSTALL_DATADIR}/zsh/site-functions)
+endif()
 
 add_library(lapdmon_options INTERFACE)
 add_library(lapdmon::options ALIAS lapdmon_options)
@@ -38,15 +48,26 @@ target_compile_options(lapdmon_options INTERFACE
     "$<${hardened}:-U_FORTIFY_SOURCE;-D_FORTIFY_SOURCE=2;-fstack-protector-strong>")
 target_link_options(lapdmon_options INTERFACE "$<${hardened}:LINKER:-z,relro,-z,now,-z,noexecstack>")
 
-# lapdmon_program(TARGET): a program that links the transport library. In the build tree its RUNPATH leads to the
-# software board's library. It is RUNPATH and not RPATH, so that LD_LIBRARY_PATH comes first. The installed program
-# has no RUNPATH. The linker gets the path directly, because CMake's own handling would leave an empty entry, which
-# means the current directory.
+# Reproducible: what is installed does not depend on the folder that it was built in, nor on the time.
+target_compile_options(lapdmon_options INTERFACE "$<${hardened}:-ffile-prefix-map=${PROJECT_SOURCE_DIR}=.>")
+set(CMAKE_CXX_ARCHIVE_CREATE "<CMAKE_AR> qcD <TARGET> <LINK_FLAGS> <OBJECTS>")
+set(CMAKE_CXX_ARCHIVE_APPEND "<CMAKE_AR> qD <TARGET> <LINK_FLAGS> <OBJECTS>")
+set(CMAKE_CXX_ARCHIVE_FINISH "<CMAKE_RANLIB> -D <TARGET>")
+
+# lapdmon_program(TARGET DESTINATION folder): a program that links the transport library. In the build tree its RUNPATH leads to the
+# software board's library. It is RUNPATH and not RPATH, so that LD_LIBRARY_PATH comes first. It is relative to the
+# program, because the build ID is made from it as well. The installed program has no RUNPATH. The linker gets the path
+# directly, because CMake's own handling would leave an empty entry, which means the current directory; and in a file,
+# because CMake and the shell both take "$" for their own.
+set(LAPDMON_RUNPATH_OPTION ${CMAKE_BINARY_DIR}/runpath.option)
+file(CONFIGURE OUTPUT ${LAPDMON_RUNPATH_OPTION} CONTENT "-Wl,-rpath,$ORIGIN/../${LAPDMON_TRANSPORT_DIR}\n" @ONLY)
 function(lapdmon_program target)
     target_link_libraries(${target} PRIVATE norv)
     target_link_options(${target} PRIVATE
-        -Wl,--enable-new-dtags -Wl,-rpath,${CMAKE_BINARY_DIR}/${LAPDMON_TRANSPORT_DIR})
+        -Wl,--enable-new-dtags @${LAPDMON_RUNPATH_OPTION})
     set_target_properties(${target} PROPERTIES SKIP_BUILD_RPATH TRUE)
-    install(TARGETS ${target})
-    install(CODE "file(RPATH_REMOVE FILE \"\$ENV{DESTDIR}\${CMAKE_INSTALL_PREFIX}/${CMAKE_INSTALL_BINDIR}/${target}\")")
+    cmake_parse_arguments(P "" "DESTINATION" "" ${ARGN})
+    install(TARGETS ${target} RUNTIME DESTINATION ${P_DESTINATION} COMPONENT lapdmon)
+    install(CODE "file(RPATH_REMOVE FILE \"\$ENV{DESTDIR}\${CMAKE_INSTALL_PREFIX}/${P_DESTINATION}/${target}\")"
+        COMPONENT lapdmon)
 endfunction()

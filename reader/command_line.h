@@ -28,7 +28,8 @@ struct CommandLine {
 // Without argv[0]. The first word may name a command; without one it is `list`. Throws UsageError.
 CommandLine parseCommandLine(std::vector<std::string> words);
 
-// Shows `visit` the description that parser and --help are made from; manual pages and completion are made from it.
+// Shows `visit` the description that parser and --help are made from; manual pages and completion are made
+// from it.
 void showDescription(const std::function<void(const CLI::App&)>& visit);
 
 }  // namespace reader

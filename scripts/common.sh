@@ -35,7 +35,9 @@ install_packages() {
 
 BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libpcap-dev libssl-dev libtomlplusplus-dev nlohmann-json3-dev)
 CHECK_PACKAGES=(clang-format clang-tidy cppcheck)
-TEST_PACKAGES=(libgtest-dev libgmock-dev libbenchmark-dev python3 python3-jsonschema tmux tshark)
+TEST_PACKAGES=(bash-completion groff-base libgtest-dev libgmock-dev libbenchmark-dev man-db mandoc python3 python3-jsonschema
+               tmux tshark zsh)
+PACKAGE_PACKAGES=(dpkg-dev gzip lintian)
 
 # build_preset PRESET [OPTION...]: configures and builds a preset. Shows the compiler's output only if that fails.
 build_preset() {

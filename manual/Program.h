@@ -1,0 +1,60 @@
+// A program as its manual pages and completion tell it: read from the description that also makes its parser
+// and --help.
+#ifndef MANUAL_PROGRAM_H
+#define MANUAL_PROGRAM_H
+
+#include <string>
+#include <vector>
+
+namespace CLI {
+class App;
+}
+
+namespace manual {
+
+// What the value of an option is, for completion.
+enum class ValueKind { none, free, choice, file, folder, callReference };
+
+struct Option {
+    std::vector<std::string> names;  // "-o", "--output"
+    std::string form;                // of its value: "FILE"; empty if it takes none
+    std::string help;
+    std::string group;  // the title above it in --help
+    ValueKind kind = ValueKind::none;
+    std::vector<std::string> choices;  // for ValueKind::choice
+};
+
+struct Command {
+    std::string name;  // empty for a program without commands
+    std::string summary;
+    std::string words;   // what follows the options
+    std::string footer;  // what --help shows behind the options
+    std::vector<Option> options;
+};
+
+struct Program {
+    std::string name;
+    std::vector<Command> commands;  // at least one
+    std::string footer;
+    bool runsAnother = false;  // behind "--" come another program and its words
+
+    bool hasCommands() const { return !commands.front().name.empty(); }
+};
+
+// The options and commands of a command line. Options that --help hides are left out.
+Program programOf(const CLI::App& app);
+
+// The options that each of the commands has.
+std::vector<Option> sharedOptions(const Program& program);
+
+// A word of --help: "--fault" takes one of these.
+void setChoices(Program& program, const std::string& option, std::vector<std::string> choices);
+
+// "Examples:" names the lines of a footer from that one to the next empty line, without their title.
+std::string sectionOf(const std::string& footer, const std::string& title);
+
+std::vector<std::string> linesOf(const std::string& text);
+
+}  // namespace manual
+
+#endif
