@@ -165,6 +165,10 @@ class Program:
         status = (pathlib.Path("/proc") / str(self.pid) / "status").read_text()
         return re.search(rf"^{name}:\s+(\S+)", status, re.M)[1]
 
+    def open_files(self):
+        folder = pathlib.Path("/proc") / str(self.pid) / "fd"
+        return [os.readlink(folder / name) for name in os.listdir(folder)]
+
     @property
     def threads(self):
         return int(self.status("Threads"))

@@ -169,6 +169,17 @@ class FewMeans(SystemTest):
         self.assertEqual(times, wanted[:at] + wanted[at + 10:])
         self.assertEqual(program.journal.lines()[-1], BALANCE)
 
+    def test_frames_that_are_lost_last_are_said_at_the_end_of_the_log(self):
+        program = self.on_board("--rate", "max", frames=DAY, run=(
+            "env", "LD_PRELOAD=" + os.environ["FEW_THREADS_LIBRARY"], "FEW_FROM=100", "FEW_TO=9999", LAPDMON, "-b1"))
+        program.journal.wait(" EvtDetected ", times=FRAMES + 1)
+        program.types("q")
+        program.ends(status=1, errors=re.compile(r"lapdmon: frames lost for want of threads or memory: \d+\n\Z"))
+        lost = int(program.errors.lines()[-1].split()[-1])
+        log = program.log()
+        self.assertTrue(log.endswith(f"\nFrames Lost: {lost} \n"), log[-300:])
+        self.assertEqual(re.findall(r"Time = (\S+)", log), [time_of(i) for i in range(FRAMES + 1 - lost)])
+
 
 class StalledLog(SystemTest):
     """Nobody reads the FIFO for a while: 3000 events come all at once meanwhile."""

@@ -108,6 +108,14 @@ class Lifecycle(SystemTest):
         self.assertEqual(program.talk.lines()[-2:], ["heard 26", "heard 8"])
         self.assertTrue(program.log().endswith("Frame Error \n"))
 
+    def test_the_log_is_closed_before_the_board_is_waited_for(self):
+        program = self.on_other_library("stuck-close")
+        program.screen.wait("Frame Error")
+        program.types("q")
+        program.talk.wait("the last queue")
+        self.assertTrue(program.log().endswith("Frame Error \n"))
+        self.assertNotIn(str(self.folder / "lapdmon.log"), program.open_files())
+
     def test_a_library_that_opens_no_queue_is_reported(self):
         program = self.on_other_library("no-queue").ends(status=1)
         self.assertEqual(program.screen.lines()[5:], ["general Exception caught in lapdmon(749)"])
