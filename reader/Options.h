@@ -12,6 +12,7 @@
 #include "calls/Timers.h"
 #include "capture/Frame.h"
 #include "reader/Chatter.h"
+#include "reader/Comparison.h"
 #include "reader/TimeText.h"
 
 namespace reader {
@@ -99,6 +100,8 @@ struct Options {
     std::string form;  // the form to convert to, or to record in
     RecordOptions record;
     CallOptions calls;
+    CompareAlso compareAlso;  // of two calls or traces
+    bool failOnDifference = false;
     RedactOptions redact;
 };
 

@@ -7,6 +7,7 @@
 #include "reader/check.h"
 #include "reader/convert.h"
 #include "reader/decode.h"
+#include "reader/diff.h"
 #include "reader/explain.h"
 #include "reader/list.h"
 #include "reader/record.h"
@@ -72,6 +73,12 @@ constexpr char checkExamples[] = R"(  lapdread check lapdmon.log
       exit status 3 if there is an error
 )";
 
+constexpr char diffExamples[] = R"(  lapdread diff lapdmon.log#3 lapdmon.log#7
+      two calls, by their numbers in `lapdread calls lapdmon.log`: what differs in their messages
+  lapdread diff --message SETUP yesterday.pcapng today.pcapng
+      two traces; of them one message
+)";
+
 constexpr char statsExamples[] = R"(  lapdread stats lapdmon.log
       messages, causes, times, calls by direction and hour, channels
   lapdread stats --csv --e1 day*.pcapng > figures.csv
@@ -108,6 +115,12 @@ const std::array table{
             checkExamples,
             {"Findings", checkOptions()},
             runCheck},
+    Command{"diff",
+            "A[#CALL] B[#CALL]",
+            "what differs between two calls, or two traces, down to the field",
+            diffExamples,
+            {"Comparison", diffOptions()},
+            runDiff},
     Command{"stats",
             "[FILE...]",
             "figures: messages, causes, times, calls by direction and hour, channels",

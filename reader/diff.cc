@@ -1,0 +1,206 @@
+#include "reader/diff.h"
+
+#include <algorithm>
+#include <filesystem>
+#include <optional>
+
+#include "reader/Analysed.h"
+#include "reader/Comparison.h"
+#include "reader/calls.h"
+#include "reader/errors.h"
+#include "reader/forms.h"
+#include "reader/inputs.h"
+#include "reader/json.h"
+#include "reader/session.h"
+#include "reader/text.h"
+
+namespace reader {
+
+namespace {
+
+constexpr std::size_t mostMessages = 50'000;
+
+// A file, or a call of it: "day.pcapng#3" is the call that `lapdread calls day.pcapng` numbers 3.
+struct Operand {
+    std::string file;
+    std::optional<std::uint64_t> call;
+};
+
+Operand operandOf(const std::string& word) {
+    const std::size_t mark = word.rfind('#');
+    std::uint64_t number = 0;
+    if (mark == std::string::npos || !readNumber(std::string_view(word).substr(mark + 1), number) ||
+        std::filesystem::exists(word))
+        return {word, std::nullopt};
+    return {word.substr(0, mark), number};
+}
+
+class MessageTaker : public Analysed {
+  public:
+    MessageTaker(const Options& options, const Operand& operand)
+        : Analysed(options), also_(options.compareAlso), operand_(operand) {}
+
+    void flush() override {}
+    const std::vector<ComparedMessage>& messages() const { return messages_; }
+
+  private:
+    void heard(const calls::Message& message, const calls::Call* call) override {
+        Analysed::heard(message, call);
+        if (!isWanted(message) || (operand_.call && (call == nullptr || call->number != *operand_.call)))
+            return;
+        if (messages_.size() >= mostMessages)
+            throw UsageError(operand_.file + " holds more than " + std::to_string(mostMessages) +
+                             " messages; filters choose some");
+        if (messages_.empty())
+            first_ = message.at;
+        messages_.push_back(comparedMessage(message, first_, also_));
+    }
+
+    const CompareAlso& also_;
+    const Operand& operand_;
+    std::vector<ComparedMessage> messages_;
+    std::int64_t first_ = 0;
+};
+
+std::vector<ComparedMessage> messagesOf(const Options& options, const Operand& operand, Chatter& chatter) {
+    Options own = options;
+    own.words.clear();
+    own.input.files = {operand.file};
+    Session session(own, chatter);
+    MessageTaker taker(own, operand);
+    session.run(taker, [] { return std::make_unique<NoComposer>(); });
+    taker.finish();
+    if (operand.call && taker.messages().empty())
+        throw UsageError(operand.file + " has no message of a call " + std::to_string(*operand.call));
+    return taker.messages();
+}
+
+std::string wordsOf(const Operand& operand, std::size_t messages) {
+    std::string words = safe(operand.file);
+    if (operand.call)
+        words += ", call " + std::to_string(*operand.call);
+    return words + ": " + std::to_string(messages) + (messages == 1 ? " message" : " messages");
+}
+
+std::string valueOr(const std::string& value) { return value.empty() ? "absent" : safe(value); }
+
+void appendText(std::string& to, const Difference& difference, const Difference* before) {
+    const bool isSame = before != nullptr && before->frameA == difference.frameA &&
+                        before->frameB == difference.frameB && before->kind != Difference::Kind::message;
+    const std::string name = safe(difference.message) + " " + difference.direction;
+    if (difference.kind == Difference::Kind::message) {
+        const bool isA = difference.frameA != 0;
+        to += std::string("only in ") + (isA ? "A" : "B") + ": " + name + " (frame " +
+              std::to_string(isA ? difference.frameA : difference.frameB) + ")\n";
+        return;
+    }
+    if (!isSame)
+        to += name + " (frame " + std::to_string(difference.frameA) + " in A, " +
+              std::to_string(difference.frameB) + " in B)\n";
+    to += "    ";
+    if (difference.kind == Difference::Kind::element) {
+        const bool isA = !difference.a.empty();
+        const std::string& words = isA ? difference.a : difference.b;
+        to += std::string("only in ") + (isA ? "A" : "B") + ": " + safe(difference.element) +
+              (words == difference.element ? "" : ": " + safe(words)) + "\n";
+        return;
+    }
+    if (difference.kind == Difference::Kind::time)
+        to += "time since the first message";
+    else if (difference.element.empty())
+        to += difference.field;
+    else
+        to += safe(difference.element) + ", " + difference.field;
+    to += ": " + valueOr(difference.a) + " in A, " + valueOr(difference.b) + " in B\n";
+}
+
+void appendJson(std::string& to, const Difference& difference) {
+    constexpr std::string_view kinds[] = {"message", "element", "field", "time"};
+    const auto put = [&](std::string_view key, std::string_view value) {
+        to += ',';
+        appendJsonString(to, key);
+        to += ':';
+        if (value.empty())
+            to += "null";
+        else
+            appendJsonString(to, value);
+    };
+    const auto putFrame = [&](std::string_view key, std::uint64_t frame) {
+        to += ',';
+        appendJsonString(to, key);
+        to += ':' + (frame == 0 ? std::string("null") : std::to_string(frame));
+    };
+    to += "{\"v\":";
+    appendNumber(to, jsonVersion);
+    put("difference", kinds[static_cast<std::size_t>(difference.kind)]);
+    put("message", difference.message);
+    put("dir", difference.direction);
+    putFrame("frame_a", difference.frameA);
+    putFrame("frame_b", difference.frameB);
+    put("element", difference.element);
+    put("field", difference.field);
+    put("a", difference.a);
+    put("b", difference.b);
+    to += "}\n";
+}
+
+std::string summaryOf(const Comparison& comparison) {
+    return std::to_string(comparison.alike) + " alike, " + std::to_string(comparison.differ) + " differ, " +
+           std::to_string(comparison.onlyA) + " only in A, " + std::to_string(comparison.onlyB) +
+           " only in B\n";
+}
+
+}  // namespace
+
+std::span<const OptionRow> diffOptions() {
+    static const OptionRow rows[] = {
+        {"--with", "reference,channel,time",
+         "Compare call references and TEIs, numbers of channels, or times as well",
+         [](Options& to, const std::string& value) {
+             for (const std::string& word : splitAtCommas(value))
+                 to.compareAlso.*chosen<bool CompareAlso::*>(word, {{"reference", &CompareAlso::references},
+                                                                    {"channel", &CompareAlso::channels},
+                                                                    {"time", &CompareAlso::times}}) = true;
+         }},
+        {"--jsonl", "", "A JSON object a difference",
+         [](Options& to, const std::string&) { to.calls.form = CallForm::jsonLines; }},
+        {"--fail-on-difference", "", "Exit status 3 if there is a difference",
+         [](Options& to, const std::string&) { to.failOnDifference = true; }},
+        timerOption,
+        groupOption,
+    };
+    return rows;
+}
+
+int runDiff(const Options& options, Chatter& chatter) {
+    const std::vector<std::string> files = inputFiles(options);
+    if (files.size() != 2 || options.input.follow || files[0] == "-")
+        throw UsageError("diff takes two files, or calls of files: lapdread diff A#3 B#7");
+    const Operand a = operandOf(files[0]), b = operandOf(files[1]);
+    const std::vector<ComparedMessage> messagesA = messagesOf(options, a, chatter);
+    const std::vector<ComparedMessage> messagesB = messagesOf(options, b, chatter);
+    const Comparison comparison = compare(messagesA, messagesB, options.compareAlso);
+    const bool isText = options.calls.form == CallForm::text;
+    std::string text;
+    if (isText)
+        text = "A  " + wordsOf(a, messagesA.size()) + "\nB  " + wordsOf(b, messagesB.size()) + "\n\n";
+    const Difference* before = nullptr;
+    for (const Difference& difference : comparison.differences) {
+        if (isText)
+            appendText(text, difference, before);
+        else
+            appendJson(text, difference);
+        before = &difference;
+    }
+    if (isText)
+        text += summaryOf(comparison);
+    Options outputs = options;
+    outputs.words.clear();
+    outputs.input.files = {a.file, b.file};
+    Session session(outputs, chatter);
+    session.output().write(text);
+    session.output().flush();
+    return options.failOnDifference && !comparison.same() ? found : good;
+}
+
+}  // namespace reader
