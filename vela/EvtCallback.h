@@ -15,11 +15,15 @@
 
 namespace vela {
 
+enum class Awaited { Message, Event };
+template <Awaited what>
+class Waiter;
+
 class EvtCallback : public AsyncMsgReceiver {
   public:
     using Callback = CallbackBase;
-    class MsgWait;
-    class EvtWait;
+    using MsgWait = Waiter<Awaited::Message>;
+    using EvtWait = Waiter<Awaited::Event>;
 
     // The thread parameter of a callback that runs on the dispatching thread. That thread holds the
     // dispatcher's lock meanwhile and reads no further message, so the callback must not register, cancel,
@@ -42,9 +46,9 @@ class EvtCallback : public AsyncMsgReceiver {
     void registerMsgType(unsigned int type, const Handler& callback, unsigned int threadParam);
     void registerEvtGroup(unsigned int group, const Handler& callback, unsigned int threadParam,
                           std::shared_ptr<Lane> lane = nullptr);
-    // Register for the first message that arrives. The registration ends with that message.
-    void registerNextMsg(unsigned int type, const Handler& callback);
-    void registerNextEvt(unsigned int group, const Handler& callback);
+    // Registers for the first message of a type, or event of a group, that arrives. The registration ends
+    // with that message.
+    void registerNext(Awaited what, unsigned int key, const Handler& callback);
 
     // Remove one registration, or the key with all of them. Throw OutOfBoundsError when there is none.
     void cancelMsgType(unsigned int type, const Handler& callback, unsigned int threadParam);

@@ -85,12 +85,8 @@ void EvtCallback::registerEvtGroup(unsigned int group, const Handler& callback, 
     add(evtGroups_, group, {callback, threadParam, std::move(lane)});
 }
 
-void EvtCallback::registerNextMsg(unsigned int type, const Handler& callback) {
-    add(msgTypes_, type, {callback, 0, nullptr, true});
-}
-
-void EvtCallback::registerNextEvt(unsigned int group, const Handler& callback) {
-    add(evtGroups_, group, {callback, 0, nullptr, true});
+void EvtCallback::registerNext(Awaited what, unsigned int key, const Handler& callback) {
+    add(what == Awaited::Message ? msgTypes_ : evtGroups_, key, {callback, 0, nullptr, true});
 }
 
 void EvtCallback::cancelMsgType(unsigned int type, const Handler& callback, unsigned int threadParam) {

@@ -1,22 +1,36 @@
 #include "vela/EvtWait.h"
 
+#include <ostream>
+
+#include "vela/StreamFlags.h"
+
 namespace vela {
 
-void Waiter::Timeout::toStream(std::ostream* out) const {
+template <Awaited what>
+void Waiter<what>::Timeout::toStream(std::ostream* out) const {
     const StreamFlags saved(*out);
     Exception::toStream(out);
     *out << std::hex << std::showbase << " Type: " << type_ << std::dec << " Timeout: " << timeoutMs_ << "ms";
 }
 
-void Waiter::enable(unsigned int type) {
+template <Awaited what>
+Waiter<what>::Waiter(EvtCallback* dispatcher, unsigned int type, unsigned int timeoutMs)
+    : Waiter(dispatcher) {
+    enable(type);
+    awaited_ = await(timeoutMs);
+}
+
+template <Awaited what>
+void Waiter<what>::enable(unsigned int type) {
     end();
     lock();
     type_ = type;
     state_ = Enabled;
-    add(type);
+    dispatcher_->registerNext(what, type, Handler(this, &Waiter::trigger));
 }
 
-void Waiter::disable() {
+template <Awaited what>
+void Waiter<what>::disable() {
     if (State enabled = Enabled; state_.compare_exchange_strong(enabled, Idle)) {
         withdraw();
         unlock();
@@ -24,21 +38,19 @@ void Waiter::disable() {
     dispatcher_->awaitCallbacksOf(this);
 }
 
-void Waiter::end() {
-    disable();
-    handOnLateOne();
-    awaited_.reset();
-}
-
 // If a message has arrived after the wait was given up, passes it on as one that comes after the first.
-void Waiter::handOnLateOne() {
+template <Awaited what>
+void Waiter<what>::end() {
+    disable();
     if (Msg* const late = msg_.exchange(nullptr); late != nullptr)
         dispatcher_->receiveUnregistered(late);
+    awaited_.reset();
 }
 
 // The callback. It runs on a delivery thread with the first message, unless the waiter was disabled
 // meanwhile.
-void Waiter::trigger(Addressable*, Msg* msg) {
+template <Awaited what>
+void Waiter<what>::trigger(Addressable*, Msg* msg) {
     if (State enabled = Enabled; !state_.compare_exchange_strong(enabled, Triggered)) {
         dispatcher_->receiveUnregistered(msg);
         return;
@@ -50,65 +62,45 @@ void Waiter::trigger(Addressable*, Msg* msg) {
 
 // Ends the registration. It may have ended already: with the message that arrived, or because somebody has
 // cancelled all registrations of the type.
-void Waiter::withdraw() {
+template <Awaited what>
+void Waiter<what>::withdraw() {
+    const Handler self(this, &Waiter::trigger);
     try {
-        remove(type_);
+        what == Awaited::Message ? dispatcher_->cancelMsgType(type_, self, 0)
+                                 : dispatcher_->cancelEvtGroup(type_, self, 0);
     } catch (const Exception&) {
     }
 }
 
-std::unique_ptr<Msg> Waiter::await(unsigned int timeoutMs) {
+template <Awaited what>
+std::unique_ptr<Msg> Waiter<what>::await(unsigned int timeoutMs) {
     if (awaited_ != nullptr)
         return std::move(awaited_);
     if (timeoutMs == 0)
         lock();
     else if (!tryLock(timeoutMs, 10))
-        throwTimeout(type_, timeoutMs);
+        throw Timeout(type_, timeoutMs);
     std::unique_ptr<Msg> msg(msg_.exchange(nullptr));
     unlock();
     if (msg == nullptr)
-        throwTimeout(type_, timeoutMs);
+        throw Timeout(type_, timeoutMs);
     state_ = Idle;
     return msg;
 }
 
-void Waiter::enableAndAwait(unsigned int type, unsigned int timeoutMs) {
-    enable(type);
-    awaited_ = await(timeoutMs);
+template <Awaited what>
+Msg* Waiter<what>::waitMsg(unsigned int timeoutMs) {
+    return await(timeoutMs).release();
 }
 
-Msg* Waiter::waitMsg(unsigned int timeoutMs) { return await(timeoutMs).release(); }
-
-void Waiter::wait(MsgBody* body, unsigned int timeoutMs) {
+template <Awaited what>
+void Waiter<what>::wait(MsgBody* body, unsigned int timeoutMs) {
     const std::unique_ptr<Msg> msg = await(timeoutMs);
     if (body != nullptr)
         msg->read(body, 0);
 }
 
-EvtCallback::MsgWait::MsgWait(EvtCallback* dispatcher, unsigned int type, unsigned int timeoutMs)
-    : MsgWait(dispatcher) {
-    enableAndAwait(type, timeoutMs);
-}
-
-void EvtCallback::MsgWait::add(unsigned int type) {
-    dispatcher()->registerNextMsg(type, Handler(this, &MsgWait::trigger));
-}
-
-void EvtCallback::MsgWait::remove(unsigned int type) {
-    dispatcher()->cancelMsgType(type, Handler(this, &MsgWait::trigger), 0);
-}
-
-EvtCallback::EvtWait::EvtWait(EvtCallback* dispatcher, unsigned int group, unsigned int timeoutMs)
-    : EvtWait(dispatcher) {
-    enableAndAwait(group, timeoutMs);
-}
-
-void EvtCallback::EvtWait::add(unsigned int group) {
-    dispatcher()->registerNextEvt(group, Handler(this, &EvtWait::trigger));
-}
-
-void EvtCallback::EvtWait::remove(unsigned int group) {
-    dispatcher()->cancelEvtGroup(group, Handler(this, &EvtWait::trigger), 0);
-}
+template class Waiter<Awaited::Message>;
+template class Waiter<Awaited::Event>;
 
 }  // namespace vela
