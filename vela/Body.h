@@ -12,8 +12,16 @@
 //
 //     struct IEPubData { U8<"IEId"> IEId; ...; std::size_t fieldsPresent() const { return ...; } };
 //
-// A family lists its bodies in a BodyTable, which makes them by code. Two bodies with the same code do not
-// compile.
+// A family declares its bodies in a struct that derives from Family, and lists them in a BodyTable, which
+// makes them by code. Two bodies of one code do not compile, nor does a program that makes a body that its
+// family does not list:
+//
+//     struct Messages : Family<Messages> {
+//         struct MsgSetParmCmplt_t : Body<9> {};
+//         ...
+//         using Bodies = BodyTable<MsgSetParmCmplt_t, ...>;   // by message type
+//         using Events = BodyTable<...>;                      // by event group; left out if there are none
+//     };
 #ifndef VELA_BODY_H
 #define VELA_BODY_H
 
@@ -35,7 +43,8 @@ inline constexpr unsigned int NoCode = 0xFFFFFFFFU;
 
 struct NoFields {};
 
-template <unsigned int messageCode, typename Row = NoFields>
+// Messages is the family; void for a body that is only part of another, or belongs to several families.
+template <unsigned int messageCode, typename Row = NoFields, typename Messages = void>
 class Body : public MsgBody, public Row {
   public:
     static constexpr unsigned int code = messageCode;
@@ -58,6 +67,7 @@ class Body : public MsgBody, public Row {
 
     // Throws Exception when a list is longer than its count can express.
     unsigned int writeMsg(Msg* msg, unsigned int offset) override {
+        static_assert(isListed(), "a body is missing from the table of its family");
         setCounts(std::make_index_sequence<n>{});
         return move<Move::Put>(msg, offset);
     }
@@ -97,6 +107,15 @@ class Body : public MsgBody, public Row {
 
   private:
     static constexpr std::size_t n = FieldCount<Row>;
+    // Called when the family is complete.
+    static constexpr bool isListed() {
+        if constexpr (std::is_void_v<Messages>)
+            return true;
+        else if constexpr (requires { typename Messages::Events; })
+            return Messages::Bodies::has(code) || Messages::Events::has(code);
+        else
+            return Messages::Bodies::has(code);
+    }
     static constexpr bool hasOptionalFields = requires(const Row& row) { row.fieldsPresent(); };
 
     // Whether the message has the field. When a message is read, call it after the fields before that one
@@ -213,11 +232,20 @@ class Body : public MsgBody, public Row {
 };
 
 // The body of a command, with the body of its reply.
-template <unsigned int messageCode, typename ReplyBody, typename Row = NoFields>
-class Command : public Body<messageCode, Row> {
+template <unsigned int messageCode, typename ReplyBody, typename Row = NoFields, typename Messages = void>
+class Command : public Body<messageCode, Row, Messages> {
   public:
-    using Body<messageCode, Row>::Body;
+    using Body<messageCode, Row, Messages>::Body;
     using Reply = ReplyBody;
+};
+
+// The base of a family: within it, Body and Command are bodies of this family.
+template <typename Messages>
+struct Family {
+    template <unsigned int messageCode, typename Row = NoFields>
+    using Body = vela::Body<messageCode, Row, Messages>;
+    template <unsigned int messageCode, typename Reply, typename Row = NoFields>
+    using Command = vela::Command<messageCode, Reply, Row, Messages>;
 };
 
 // The bodies of a family, by code.
@@ -239,6 +267,9 @@ class BodyTable {
 
     static constexpr std::size_t size = sizeof...(Bodies);
     static constexpr std::array<unsigned int, size> codes{Bodies::code...};
+    template <typename Body>
+    static constexpr bool lists = (std::is_same_v<Body, Bodies> || ...);
+    static constexpr bool has(unsigned int code) { return ((code == Bodies::code) || ...); }
 
   private:
     static constexpr bool distinct() {

@@ -14,16 +14,6 @@ std::size_t IEPubData::fieldsPresent() const {
 
 }  // namespace rows
 
-MsgBody* CCS::MsgBodyLookup(unsigned int msgType) {
-    MsgBody* const body = Bodies::make(msgType);
-    return body != nullptr ? body : Component::MsgBodyLookup(msgType);
-}
-
-MsgBody* CCS::EvtBodyLookup(unsigned int evtType) {
-    MsgBody* const body = Events::make(evtType);
-    return body != nullptr ? body : Component::EvtBodyLookup(evtType);
-}
-
 void CCS::SendIE(unsigned short callRef, unsigned short callId, unsigned char messageId) {
     staticList<unsigned char> none;
     SendIE(callRef, callId, messageId, none);

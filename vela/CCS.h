@@ -26,7 +26,7 @@ struct ieMessage {
 // clang-format on
 }  // namespace rows
 
-struct CCSMessages {
+struct CCSMessages : Family<CCSMessages> {
     // A trace record. Label 2 is a frame. Direction is 1 for a frame that the board transmitted, any other
     // value for one that it received. Timestamp counts 4 ms. Length is in octets; List may hold fewer.
     // clang-format off
@@ -41,16 +41,12 @@ struct CCSMessages {
     using Events = BodyTable<EvtL2Trace_t>;  // by event group
 };
 
-class CCS : public Component, public CCSMessages {
+class CCS : public WithBodies<Component, CCSMessages> {
   public:
-    using Bodies = CCSMessages::Bodies;
     static constexpr unsigned int L2TraceGroup = EvtL2Trace_t::code;
 
-    CCS(const CompDesc_t& target, MsgQueue* queue) : Component(target, queue) {}
+    CCS(const CompDesc_t& target, MsgQueue* queue) : WithBodies(target, queue) {}
     ~CCS() override { endCallbacks(); }
-
-    MsgBody* MsgBodyLookup(unsigned int msgType) override;
-    MsgBody* EvtBodyLookup(unsigned int evtType) override;
 
     // Sends a call-control message. It has no reply, so the function waits for an error only. Throws
     // UnexpectedMsg.

@@ -2,11 +2,6 @@
 
 namespace vela {
 
-MsgBody* Cluster::MsgBodyLookup(unsigned int msgType) {
-    MsgBody* const body = Bodies::make(msgType);
-    return body != nullptr ? body : superMsgBodyLookup(msgType);
-}
-
 void Cluster::activate(unsigned int portId, unsigned int options, CompDesc_t talker, Wait wait) {
     CompDesc_t own = getTgtDesc();
     command(ClusterActivate_t(own, portId, options, talker), nullptr, wait);

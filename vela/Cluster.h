@@ -4,10 +4,11 @@
 
 #include "vela/Addressable.h"
 #include "vela/ManagerMessages.h"
+#include "vela/WithBodies.h"
 
 namespace vela {
 
-struct ClusterMessages : ManagerMessages {
+struct ClusterMessages : Family<ClusterMessages>, ManagerMessages {
     // clang-format off
     struct ClusterActivate_t : Command<8388635, ResultComplete_t, rows::ClusterActivate> { using Command::Command; };
     struct ClusterConnect_t : Command<8388639, ResultComplete_t, rows::ClusterConnect> { using Command::Command; };
@@ -33,83 +34,47 @@ struct ClusterMessages : ManagerMessages {
                   ClusterAttrRemove_t, ClusterLock_t, ClusterUnlock_t, ClusterUnlockCmplt_t>;
 };
 
-class Cluster : public Addressable, public ClusterMessages {
+class Cluster : public WithBodies<Addressable, ClusterMessages> {
   public:
-    Cluster(const CompDesc_t& target, MsgQueue* queue) : Addressable(target, queue) {}
-    explicit Cluster(const Addressable& found) : Addressable(found) {}
+    Cluster(const CompDesc_t& target, MsgQueue* queue) : WithBodies(target, queue) {}
+    explicit Cluster(const Addressable& found) : WithBodies(found) {}
     Cluster(const Cluster& other) = default;
     // An object that `finder` has found at the address. It uses the queue and the time-outs of `finder`.
-    Cluster(const CompDesc_t& target, const Addressable& finder) : Addressable(target, finder) {}
+    Cluster(const CompDesc_t& target, const Addressable& finder) : WithBodies(target, finder) {}
     ~Cluster() override { endCallbacks(); }
 
-    MsgBody* MsgBodyLookup(unsigned int msgType) override;
-
-    // Commands. All throw Timeout, UnexpectedMsg. StdResource.h describes their forms. The forms with fields
-    // name this cluster.
+    // Commands, each with its fields; WithBodies::send sends a prepared one. They name this cluster. All
+    // throw Timeout, UnexpectedMsg. StdResource.h describes what they have in common.
 
     // Connects two members, each by one of its ports.
-    void connect(ClusterConnect_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     void connect(CompDesc_t first, unsigned int firstPort, CompDesc_t second, unsigned int secondPort,
                  Wait wait = {}) {
         command(ClusterConnect_t(first, firstPort, second, secondPort), nullptr, wait);
-    }
-    void disconnect(ClusterDisconnect_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
     }
     void disconnect(CompDesc_t first, unsigned int firstPort, CompDesc_t second, unsigned int secondPort,
                     Wait wait = {}) {
         command(ClusterDisconnect_t(first, firstPort, second, secondPort), nullptr, wait);
     }
 
-    void activate(ClusterActivate_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     void activate(unsigned int portId, unsigned int options, CompDesc_t talker, Wait wait = {});
-    void deactivate(ClusterDeactivate_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     void deactivate(unsigned int portId, Wait wait = {});
 
-    void assignSlots(ClusterSlotAssign_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     void assignSlots(unsigned int portId, unsigned int encoding, unsigned int idlePattern,
                      staticList<unsigned int>& slotIds, Wait wait = {});
-    void unassignSlots(ClusterSlotUnassign_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     void unassignSlots(unsigned int portId, Wait wait = {});
-    void slots(ClusterSlotInfo_t& cmd, ClusterSlotInfoResult_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     void slots(unsigned int portId, ClusterSlotInfoResult_t* reply, Wait wait = {});
 
     // Reads the members of the cluster.
-    void components(ClusterCompInfo_t& cmd, ClusterCompInfoResult_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     staticList<CompDesc_t> components(Wait wait = {});
 
-    void addAttributes(ClusterAttrAdd_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     void addAttributes(staticList<CompAttr_t>& attributes, Wait wait = {}) {
         command(ClusterAttrAdd_t(attributes), nullptr, wait);
-    }
-    void removeAttributes(ClusterAttrRemove_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
     }
     void removeAttributes(staticList<CompAttr_t>& attributes, Wait wait = {}) {
         command(ClusterAttrRemove_t(attributes), nullptr, wait);
     }
 
-    void lock(ClusterLock_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     void lock(Wait wait = {});
-    void unlock(ClusterUnlock_t& cmd, ClusterUnlockCmplt_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     void unlock(ClusterUnlockCmplt_t* reply, Wait wait = {});
 };
 

@@ -3,12 +3,7 @@
 namespace vela {
 
 ClusterMgr::ClusterMgr(const Addressable* object)
-    : Addressable(CompDesc_t(0, object->getTgtDesc().Board, 0, 0, 0), *object) {}
-
-MsgBody* ClusterMgr::MsgBodyLookup(unsigned int msgType) {
-    MsgBody* const body = Bodies::make(msgType);
-    return body != nullptr ? body : superMsgBodyLookup(msgType);
-}
+    : WithBodies(CompDesc_t(0, object->getTgtDesc().Board, 0, 0, 0), *object) {}
 
 template <typename Cmd>
 Cluster ClusterMgr::clusterFrom(Cmd&& cmd, Wait wait) {

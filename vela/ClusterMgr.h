@@ -8,7 +8,7 @@
 
 namespace vela {
 
-struct ClusterMgrMessages : ManagerMessages {
+struct ClusterMgrMessages : Family<ClusterMgrMessages>, ManagerMessages {
     // clang-format off
     struct ClusterByComp_t : Command<8388637, ClusterResult_t, rows::DescOnly> { using Command::Command; };
     struct ClusterCompByAttr_t : Command<8388638, ComponentResult_t, rows::ClusterCompByAttr> { using Command::Command; };
@@ -25,45 +25,28 @@ struct ClusterMgrMessages : ManagerMessages {
                   ClusterResult_t, ClusterAllocate_t, ClusterFree_t, ClusterFind_t>;
 };
 
-class ClusterMgr : public Addressable, public ClusterMgrMessages {
+class ClusterMgr : public WithBodies<Addressable, ClusterMgrMessages> {
   public:
     // The cluster manager of the object's board. It uses the object's queue and time-outs.
     explicit ClusterMgr(const Addressable* object);
     explicit ClusterMgr(const Addressable& object) : ClusterMgr(&object) {}
     ~ClusterMgr() override { endCallbacks(); }
 
-    MsgBody* MsgBodyLookup(unsigned int msgType) override;
-
-    // Commands. All throw Timeout, and UnexpectedMsg, also when nothing is found. StdResource.h describes
-    // their forms.
+    // Commands, each with its fields; WithBodies::send sends a prepared one. All throw Timeout, and
+    // UnexpectedMsg, also when nothing is found. StdResource.h describes what they have in common.
 
     // Finds a cluster with the attributes, allocates one to the caller, or creates a new one.
-    void find(ClusterFind_t& cmd, ClusterResult_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     Cluster find(CompDesc_t start, staticList<CompAttr_t>& attributes, Wait wait = {});
-    void allocate(ClusterAllocate_t& cmd, ClusterResult_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     Cluster allocate(CompDesc_t start, staticList<CompAttr_t>& attributes, Wait wait = {});
-    void create(ClusterCreate_t& cmd, ClusterResult_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     Cluster create(CompDesc_t start, staticList<CompAttr_t>& attributes, Wait wait = {});
 
     // free gives back what allocate gave; destroy ends what create made.
-    void free(ClusterFree_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     void free(CompDesc_t cluster, Wait wait = {}) { command(ClusterFree_t(cluster), nullptr, wait); }
-    void destroy(ClusterDestroy_t& cmd, ResultComplete_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     void destroy(CompDesc_t cluster, Wait wait = {}) { command(ClusterDestroy_t(cluster), nullptr, wait); }
 
     // Finds the cluster of which a component instance is a member.
-    void byComponent(ClusterByComp_t& cmd, ClusterResult_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     Cluster byComponent(CompDesc_t instance, Wait wait = {});
     // Finds the first member of a cluster with this type and these attributes.
-    void componentByAttr(ClusterCompByAttr_t& cmd, ComponentResult_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     StdResource componentByAttr(CompDesc_t cluster, unsigned int compType, staticList<CompAttr_t>& attributes,
                                 Wait wait = {});
 

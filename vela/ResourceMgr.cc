@@ -25,12 +25,7 @@ void append(ResourceMgr::Found& all, const ResourceMgr::Found& more) {
 
 }  // namespace
 
-ResourceMgr::ResourceMgr(const Addressable* object) : Addressable(managerOf(object->getTgtDesc()), *object) {}
-
-MsgBody* ResourceMgr::MsgBodyLookup(unsigned int msgType) {
-    MsgBody* const body = Bodies::make(msgType);
-    return body != nullptr ? body : superMsgBodyLookup(msgType);
-}
+ResourceMgr::ResourceMgr(const Addressable* object) : WithBodies(managerOf(object->getTgtDesc()), *object) {}
 
 CompDesc_t ResourceMgr::searchStart(unsigned char processor, unsigned short instance) const {
     const CompDesc_t own = getTgtDesc();

@@ -8,7 +8,7 @@
 
 namespace vela {
 
-struct ResourceMgrMessages : ManagerMessages {
+struct ResourceMgrMessages : Family<ResourceMgrMessages>, ManagerMessages {
     // clang-format off
     struct CompAttrInfoResult_t : Body<8388614, rows::CompAttrInfoResult> { using Body::Body; };
     struct CompAttrInfo_t : Command<8388666, CompAttrInfoResult_t, rows::CompAttrInfo> { using Command::Command; };
@@ -26,7 +26,7 @@ struct ResourceMgrMessages : ManagerMessages {
                              CompFindAll_t, CompMultipleResult_t>;
 };
 
-class ResourceMgr : public Addressable, public ResourceMgrMessages {
+class ResourceMgr : public WithBodies<Addressable, ResourceMgrMessages> {
   public:
     using Found = staticList<CompMultipleResult_t::comps_t>;
 
@@ -35,46 +35,31 @@ class ResourceMgr : public Addressable, public ResourceMgrMessages {
     explicit ResourceMgr(const Addressable& object) : ResourceMgr(&object) {}
     ~ResourceMgr() override { endCallbacks(); }
 
-    MsgBody* MsgBodyLookup(unsigned int msgType) override;
-
-    // Commands. All throw Timeout, and UnexpectedMsg, also when nothing is found. StdResource.h describes
-    // their forms.
+    // Commands, each with its fields; WithBodies::send sends a prepared one. All throw Timeout, and
+    // UnexpectedMsg, also when nothing is found. StdResource.h describes what they have in common.
 
     // Finds the first component with this type (0: any) and these attributes.
-    void find(CompFind_t& cmd, ComponentResult_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     StdResource find(unsigned char compType, unsigned char processor, unsigned short instance,
                      staticList<CompAttr_t> attributes, Wait wait = {});
 
     // Finds all components between two addresses that have these attributes. Sends as many commands as it
     // takes.
-    void findAll(CompFindAll_t& cmd, CompMultipleResult_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     Found findAll(CompDesc_t start, CompDesc_t end, staticList<CompAttr_t> attributes, Wait wait = {});
     // Finds all components of the board that have this type (0: any).
     Found findAll(unsigned char compType = 0, Wait wait = {});
 
     // Reads `count` attributes of a component, beginning with the one at `offset`.
-    void attributes(CompAttrInfo_t& cmd, CompAttrInfoResult_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     staticList<CompAttr_t> attributes(CompDesc_t component, unsigned int count, unsigned int offset,
                                       Wait wait = {});
 
     // Allocates an instance, which belongs to the caller, in a cluster.
-    void allocate(CompInstAllocate_t& cmd, ComponentResult_t* reply, Wait wait = {}) {
-        command(cmd, reply, wait);
-    }
     StdResource allocate(unsigned char compType, unsigned char processor, CompDesc_t cluster,
                          staticList<CompAttr_t> attributes, Wait wait = {});
-    void free(CompInstFree_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     void free(CompDesc_t instance, Wait wait = {}) { command(CompInstFree_t(instance), nullptr, wait); }
 
     // Marks components as in use, each with a word of the caller's choice, or as no longer in use.
-    void use(CompUse_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     void use(staticList<CompUse_t::List_t>& uses, Wait wait = {}) { command(CompUse_t(uses), nullptr, wait); }
     void use(const CompDesc_t& component, unsigned int payload, Wait wait = {});
-    void unuse(CompUnuse_t& cmd, ResultComplete_t* reply, Wait wait = {}) { command(cmd, reply, wait); }
     void unuse(staticList<CompUnuse_t::List_t>& uses, Wait wait = {}) {
         command(CompUnuse_t(uses), nullptr, wait);
     }

@@ -9,11 +9,6 @@ StdResource::StdResource(const CompDesc_t& target, MsgQueue* queue, int inUse) :
         StdResource::use(0);  // no derived object is there yet
 }
 
-MsgBody* StdResource::MsgBodyLookup(unsigned int msgType) {
-    MsgBody* const body = Bodies::make(msgType);
-    return body != nullptr ? body : superMsgBodyLookup(msgType);
-}
-
 void StdResource::use(unsigned int payload) { ResourceMgr(*this).use(getTgtDesc(), payload); }
 void StdResource::unuse() { ResourceMgr(*this).unuse(getTgtDesc()); }
 void StdResource::free() { ResourceMgr(*this).free(getTgtDesc()); }

@@ -6,21 +6,20 @@
 
 #include "vela/Addressable.h"
 #include "vela/StdResourceMessages.h"
+#include "vela/WithBodies.h"
 
 namespace vela {
 
-class StdResource : public Addressable, public StdResourceMessages {
+class StdResource : public WithBodies<Addressable, StdResourceMessages> {
   public:
-    StdResource(const CompDesc_t& target, MsgQueue* queue) : Addressable(target, queue) {}
+    StdResource(const CompDesc_t& target, MsgQueue* queue) : WithBodies(target, queue) {}
     // If inUse is not 0, marks the component as in use. Throws Timeout, UnexpectedMsg.
     StdResource(const CompDesc_t& target, MsgQueue* queue, int inUse);
-    explicit StdResource(const Addressable& other) : Addressable(other) {}
+    explicit StdResource(const Addressable& other) : WithBodies(other) {}
     StdResource(const StdResource& other) = default;
     // An object that `finder` has found at the address. It uses the queue and the time-outs of `finder`.
-    StdResource(const CompDesc_t& target, const Addressable& finder) : Addressable(target, finder) {}
+    StdResource(const CompDesc_t& target, const Addressable& finder) : WithBodies(target, finder) {}
     ~StdResource() override { endCallbacks(); }
-
-    MsgBody* MsgBodyLookup(unsigned int msgType) override;
 
     // NOLINTNEXTLINE(bugprone-virtual-near-miss): both names are prescribed
     void msgQueueAttach(MsgQueue* queue) { MsgQueueAttach(queue); }

@@ -66,9 +66,9 @@ struct DisarmxRTCs {
 }  // namespace rows
 
 // The bodies. StdResource derives from this struct, so that they can be named as its own.
-struct StdResourceMessages {
+struct StdResourceMessages : Family<StdResourceMessages> {
     // The refused parameter of an error; it has this form for every parameter command.
-    using Data_ErrorMsg_0x8_t = Body<NoCode, rows::NumVal>;
+    using Data_ErrorMsg_0x8_t = vela::Body<NoCode, rows::NumVal>;
     using Data_ErrorMsg_0xa_t = Data_ErrorMsg_0x8_t;
     using Data_ErrorMsg_0x12_t = Data_ErrorMsg_0x8_t;
     using Data_ErrorMsg_0x14_t = Data_ErrorMsg_0x8_t;

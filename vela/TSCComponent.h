@@ -34,7 +34,7 @@ struct PortSignalBits { U8<"port"> port; FixedOctets<32, "signalbits"> signalbit
 // clang-format on
 }  // namespace rows
 
-struct TSCMessages {
+struct TSCMessages : Family<TSCMessages> {
     // clang-format off
     struct Std_MsgSetxParmsCmplt_t : Body<11> {};
     struct Std_MsgSetxParms_t : Command<10, Std_MsgSetxParmsCmplt_t, rows::Std_ParmFieldDefValList> { using Command::Command; };
@@ -57,14 +57,10 @@ struct TSCMessages {
 };
 
 // It has messages of its own for setting and getting several parameters, which replace the standard ones.
-class TSCComponent : public Component, public TSCMessages {
+class TSCComponent : public WithBodies<Component, TSCMessages> {
   public:
-    using Bodies = TSCMessages::Bodies;
-
-    explicit TSCComponent(const Component& found) : Component(found) {}
+    explicit TSCComponent(const Component& found) : WithBodies(found) {}
     ~TSCComponent() override { endCallbacks(); }
-
-    MsgBody* MsgBodyLookup(unsigned int msgType) override;
 
     // Commands. All throw Timeout, UnexpectedMsg. StdResource.h describes their forms.
     void SetxParms(Std_MsgSetxParms_t& cmd, Std_MsgSetxParmsCmplt_t* reply, Wait wait = {}) {

@@ -46,6 +46,13 @@ class CommandTest : public TransportTest {
         EXPECT_EQ(printed(reply), printed(answer));
         call(cmd, static_cast<Reply*>(nullptr));
     }
+    template <typename Object>
+    void sendsEachPrepared(Object& object) {
+        Object::Bodies::forEach([&]<typename Body>() {
+            if constexpr (requires { typename Body::Reply; })
+                prepared<Body>([&](Body& cmd, auto* reply) { object.send(cmd, reply); });
+        });
+    }
     template <typename Cmd, typename Call>
     void preparedWithoutReply(Call call) {
         Cmd cmd;
@@ -260,14 +267,7 @@ TEST_F(CommandTest, ACcsLooksCallControlMessagesUp) {
 // ---- The resource manager.
 
 TEST_F(CommandTest, AResourceManagerCommandSendsItsPreparedBody) {
-    using R = ResourceMgr;
-    prepared<R::CompFind_t>([&](auto& c, auto* r) { resources_.find(c, r); });
-    prepared<R::CompFindAll_t>([&](auto& c, auto* r) { resources_.findAll(c, r); });
-    prepared<R::CompAttrInfo_t>([&](auto& c, auto* r) { resources_.attributes(c, r); });
-    prepared<R::CompInstAllocate_t>([&](auto& c, auto* r) { resources_.allocate(c, r); });
-    prepared<R::CompInstFree_t>([&](auto& c, auto* r) { resources_.free(c, r); });
-    prepared<R::CompUse_t>([&](auto& c, auto* r) { resources_.use(c, r); });
-    prepared<R::CompUnuse_t>([&](auto& c, auto* r) { resources_.unuse(c, r); });
+    sendsEachPrepared(resources_);
     EXPECT_EQ(CompDesc_t(fake_norv::written().back().target), CompDesc_t(0, 1, 0, 0, 0));
 }
 
@@ -332,14 +332,7 @@ TEST_F(CommandTest, FindingAllEndsWhereTheRepliesGoRoundInCircles) {
 // ---- Clusters.
 
 TEST_F(CommandTest, AClusterManagerCommandSendsItsPreparedBody) {
-    using C = ClusterMgr;
-    prepared<C::ClusterFind_t>([&](auto& c, auto* r) { clusters_.find(c, r); });
-    prepared<C::ClusterAllocate_t>([&](auto& c, auto* r) { clusters_.allocate(c, r); });
-    prepared<C::ClusterCreate_t>([&](auto& c, auto* r) { clusters_.create(c, r); });
-    prepared<C::ClusterFree_t>([&](auto& c, auto* r) { clusters_.free(c, r); });
-    prepared<C::ClusterDestroy_t>([&](auto& c, auto* r) { clusters_.destroy(c, r); });
-    prepared<C::ClusterByComp_t>([&](auto& c, auto* r) { clusters_.byComponent(c, r); });
-    prepared<C::ClusterCompByAttr_t>([&](auto& c, auto* r) { clusters_.componentByAttr(c, r); });
+    sendsEachPrepared(clusters_);
     EXPECT_EQ(CompDesc_t(fake_norv::written().back().target), CompDesc_t(0, 1, 0, 0, 0));
 }
 
@@ -364,19 +357,7 @@ TEST_F(CommandTest, AClusterIsAtTheAddressThatTheManagerNames) {
 }
 
 TEST_F(CommandTest, AClusterCommandSendsItsPreparedBody) {
-    using C = Cluster;
-    prepared<C::ClusterConnect_t>([&](auto& c, auto* r) { cluster_.connect(c, r); });
-    prepared<C::ClusterDisconnect_t>([&](auto& c, auto* r) { cluster_.disconnect(c, r); });
-    prepared<C::ClusterActivate_t>([&](auto& c, auto* r) { cluster_.activate(c, r); });
-    prepared<C::ClusterDeactivate_t>([&](auto& c, auto* r) { cluster_.deactivate(c, r); });
-    prepared<C::ClusterSlotAssign_t>([&](auto& c, auto* r) { cluster_.assignSlots(c, r); });
-    prepared<C::ClusterSlotUnassign_t>([&](auto& c, auto* r) { cluster_.unassignSlots(c, r); });
-    prepared<C::ClusterSlotInfo_t>([&](auto& c, auto* r) { cluster_.slots(c, r); });
-    prepared<C::ClusterCompInfo_t>([&](auto& c, auto* r) { cluster_.components(c, r); });
-    prepared<C::ClusterAttrAdd_t>([&](auto& c, auto* r) { cluster_.addAttributes(c, r); });
-    prepared<C::ClusterAttrRemove_t>([&](auto& c, auto* r) { cluster_.removeAttributes(c, r); });
-    prepared<C::ClusterLock_t>([&](auto& c, auto* r) { cluster_.lock(c, r); });
-    prepared<C::ClusterUnlock_t>([&](auto& c, auto* r) { cluster_.unlock(c, r); });
+    sendsEachPrepared(cluster_);
     EXPECT_EQ(CompDesc_t(fake_norv::written().back().target), cluster_.getTgtDesc());
 }
 
