@@ -1,8 +1,10 @@
 #include "vela/Addressable.h"
 
 #include <ostream>
+#include <string>
 #include <utility>
 
+#include "hostsvc/KSAssert.h"
 #include "vela/StreamFlags.h"
 #include "vela/vela.h"
 
@@ -29,20 +31,19 @@ Addressable::Addressable(const CompDesc_t& target, const Addressable& origin)
       objId_(getUniqueObjId()),
       responseTimeout_(origin.responseTimeout_),
       errorWaitTime_(origin.errorWaitTime_) {
-    Addressable::MsgQueueAttach(origin.queue_);
+    Addressable::MsgQueueAttach(origin.getMsgQueue());
 }
 
-Addressable::~Addressable() {
-    endCallbacks();
-    callback_.reset();
-    queue_->detach();
-}
+Addressable::~Addressable() { endCallbacks(); }
 
 // Callbacks that still run may use the dispatcher, so it is destroyed only after they have ended.
 void Addressable::endCallbacks() {
     EvtCallback* ending = nullptr;
     {
         const std::lock_guard guard(callbackMade_);
+        if (callback_ != nullptr && !callbacksEnded_ && typeid(*this) != *whole_)
+            ks_assertionFailed((whole_->name() + std::string("'s destructor calls endCallbacks()")).c_str(),
+                               "Addressable", __LINE__, __PRETTY_FUNCTION__);
         callbacksEnded_ = true;
         ending = callback_.get();
     }
@@ -54,17 +55,10 @@ void Addressable::MsgQueueAttach(MsgQueue* queue) {
     if (queue == nullptr)
         queue = std::make_unique<MsgQueue>(target_, MsgQueue::DefaultMaxRetMsgSize, MsgQueue::DefaultDepth)
                     .release();
-    queue->attach();
-    try {
-        if (callback_ != nullptr)
-            callback_->moveTo(queue);
-    } catch (...) {  // the object stays on its old queue
-        queue->detach();
-        throw;
-    }
-    if (queue_ != nullptr)
-        queue_->detach();
-    queue_ = queue;
+    Attached<MsgQueue> attached(queue);
+    if (callback_ != nullptr)
+        callback_->moveTo(queue);  // if this throws, the object stays on its old queue
+    queue_ = std::move(attached);
 }
 
 MsgBody* Addressable::MsgBodyLookup(unsigned int msgType) { throw UndefinedMsgBody(msgType); }
@@ -108,8 +102,10 @@ EvtCallback& Addressable::dispatcher() {
     const std::lock_guard guard(callbackMade_);
     if (callback_ == nullptr && callbacksEnded_)
         throw Exception("the object is being destroyed");
-    if (callback_ == nullptr)
+    if (callback_ == nullptr) {
+        whole_ = &typeid(*this);
         callback_ = std::make_unique<EvtCallback>(this);
+    }
     return *callback_;
 }
 

@@ -6,6 +6,7 @@
 #include <mutex>
 #include <optional>
 #include <type_traits>
+#include <typeinfo>
 
 #include "vela/CompDesc.h"
 #include "vela/EvtCallback.h"
@@ -99,7 +100,7 @@ class Addressable : public virtualObject {
     virtual MsgBody* MsgBodyLookup(unsigned int msgType);
     virtual MsgBody* EvtBodyLookup(unsigned int evtType);
 
-    MsgQueue* getMsgQueue() const { return queue_; }
+    MsgQueue* getMsgQueue() const { return queue_.get(); }
     CompDesc_t getTgtDesc() const { return target_; }
     unsigned int getObjId() const { return objId_; }
     unsigned int getResponseTimeout() const { return responseTimeout_; }
@@ -174,23 +175,27 @@ class Addressable : public virtualObject {
     // An object at another address, with the queue of `origin` and the time-outs that `origin` has now.
     Addressable(const CompDesc_t& target, const Addressable& origin);
 
-    // Send a command and wait for the reply that its type names, or for an error if it has none. Throw
-    // Timeout, UnexpectedMsg.
+    // Send a command and wait for the reply that its type names, or for an error if it has none. Read the
+    // reply into `reply`, unless that is null. Without a `wait` they wait for the object's response time-out,
+    // or its error wait time. Throw Timeout, UnexpectedMsg.
     template <typename Cmd>
-    void command(Cmd&& cmd, typename std::remove_reference_t<Cmd>::Reply* reply, Wait wait) {
+    void command(Cmd&& cmd, typename std::remove_reference_t<Cmd>::Reply* reply, Wait wait = {}) {
         using Type = std::remove_reference_t<Cmd>;
         requestWithin(wait.value_or(responseTimeout_), Type::code, &cmd, Type::Reply::code, reply);
     }
     template <typename Cmd>
-    void command(Cmd&& cmd, Wait wait) {
+    void command(Cmd&& cmd,
+                 Wait wait = {}) requires(!requires { typename std::remove_reference_t<Cmd>::Reply; }) {
         exchange(std::remove_reference_t<Cmd>::code, &cmd, 0, wait.value_or(errorWaitTime_), 0, 0);
     }
 
     MsgBody* superMsgBodyLookup(unsigned int msgType) { return Addressable::MsgBodyLookup(msgType); }
     MsgBody* superEvtBodyLookup(unsigned int evtType) { return Addressable::EvtBodyLookup(evtType); }
 
-    // Ends the dispatcher and waits for its callbacks; the object makes no other from then on. Every class
-    // that overrides a look-up calls it in its destructor: the dispatcher looks up on other threads.
+    // Ends the dispatcher and waits for its callbacks; the object makes no other from then on. The destructor
+    // of every derived class calls it, because the dispatcher calls virtual functions of the object on other
+    // threads, and callbacks use the whole object. If an object that has a dispatcher reaches the destructor
+    // of a base class without the call, the process ends through a failed assertion.
     void endCallbacks();
 
   private:
@@ -200,12 +205,13 @@ class Addressable : public virtualObject {
     Msg* exchange(unsigned int msgType, MsgBody* cmd, unsigned int retMsgType, unsigned int timeoutMs,
                   unsigned int trans, int flags);
 
-    MsgQueue* queue_ = nullptr;  // shared; this object has attached it
+    Attached<MsgQueue> queue_;  // destroyed after the dispatcher, which uses it
     CompDesc_t target_;
     unsigned int objId_;
-    std::unique_ptr<EvtCallback> callback_;
     std::mutex callbackMade_;
     bool callbacksEnded_ = false;
+    std::unique_ptr<EvtCallback> callback_;
+    const std::type_info* whole_ = nullptr;  // the object's class when it made the dispatcher
     unsigned int responseTimeout_ = DefaultResponseTimeout;
     unsigned int errorWaitTime_ = DefaultErrorWaitTime;
 };
