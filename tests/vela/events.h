@@ -70,6 +70,11 @@ class EventTest : public TransportTest {
   protected:
     static constexpr unsigned int Inline = vela::EvtCallback::OnDispatchingThread;
     static constexpr unsigned int Reply = 19;  // a message type that has a body
+    // What the callbacks are given of sendReply and sendTrace.
+    static constexpr const char* ReplyBody = "body 19 {Num 7 Val 1001 TextSize 0 Text {}}";
+    static constexpr const char* ReplyMessage = "message 19 12 octets";
+    static constexpr const char* TraceBody = "body 32 {Label 2 Direction 1 Timestamp 1003 Length 1 List {x}}";
+    static constexpr const char* TraceMessage = "message 32 17 octets";
 
     EventTest() { Recorder::functions().clear(); }
 
