@@ -2,49 +2,21 @@
 #include <algorithm>
 #include <cstdarg>
 #include <cstring>
+#include <functional>
 #include <utility>
 
+#include "tests/support/body_fields.h"
 #include "tests/support/fake_norv_state.h"
 
 using namespace fake_norv;  // NOLINT(google-build-using-namespace): the functions below are part of it
+using body_fields::Field;
+using body_fields::fieldsOf;
 
 namespace {
 
 // ---- Body fields.
 
-std::size_t elementSize(std::uint32_t descriptor) {
-    switch (descriptor >> 19 & 0x1F) {
-        case 0:
-        case 4:
-        case 10:
-            return 1;
-        case 1:
-        case 5:
-            return 2;
-        default:
-            return 4;
-    }
-}
-
-struct Field {
-    std::uint32_t descriptor;
-    void* storage;
-
-    std::size_t size() const { return elementSize(descriptor) * ((descriptor >> 11 & 0xFF) + 1); }
-};
-
-std::vector<Field> fieldsOf(std::uint32_t count, va_list list) {
-    std::vector<Field> fields;
-    for (std::uint32_t i = 0; i < count; ++i) {
-        // NOLINTNEXTLINE(clang-analyzer-valist.Uninitialized): the callers start it
-        const std::uint32_t descriptor = va_arg(list, std::uint32_t);
-        fields.push_back({descriptor, va_arg(list, void*)});
-    }
-    return fields;
-}
-
-// Moves fields until one is not wholly inside the body. The octets are moved unchanged, because both the host
-// and the wire are little-endian.
+// Moves fields until one is not wholly inside the body.
 template <typename Move>
 std::uint32_t moveFields(State& s, Op op, NvMsg32Bit* msg, std::uint32_t* offset,
                          const std::vector<Field>& fields, Move move) {
@@ -59,7 +31,7 @@ std::uint32_t moveFields(State& s, Op op, NvMsg32Bit* msg, std::uint32_t* offset
             call.status = Failed;
             continue;
         }
-        move(octets(msg) + NVMSG_HEADER_SIZE + at, field);
+        std::invoke(move, field, octets(msg) + NVMSG_HEADER_SIZE + at);
         at += field.size();
     }
     if (s.offsetsStayZero)
@@ -149,9 +121,7 @@ uint32_t nvMsgVarFieldGet(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...
     const std::vector<Field> fields = fieldsOf(count, list);
     va_end(list);
     const Lock lock(state().lock);
-    return moveFields(
-        state(), Op::VarFieldGet, msg, offset, fields,
-        [](const uint8_t* body, const Field& field) { std::memcpy(field.storage, body, field.size()); });
+    return moveFields(state(), Op::VarFieldGet, msg, offset, fields, &Field::get);
 }
 
 uint32_t nvMsgVarFieldPut(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...) {
@@ -160,9 +130,7 @@ uint32_t nvMsgVarFieldPut(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...
     const std::vector<Field> fields = fieldsOf(count, list);
     va_end(list);
     const Lock lock(state().lock);
-    return moveFields(state(), Op::VarFieldPut, msg, offset, fields, [](uint8_t* body, const Field& field) {
-        std::memcpy(body, field.storage, field.size());
-    });
+    return moveFields(state(), Op::VarFieldPut, msg, offset, fields, &Field::put);
 }
 
 uint32_t nvQueueOpen() {

@@ -20,6 +20,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <deque>
+#include <functional>
 #include <map>
 #include <memory>
 #include <mutex>
@@ -28,9 +29,11 @@
 #include <vector>
 
 #include "norv/norv.h"
+#include "tests/support/body_fields.h"
 
 namespace {
 
+using body_fields::Field;
 using Octets = std::vector<unsigned char>;
 
 enum : std::uint32_t {
@@ -180,29 +183,13 @@ void answer(NvMsg32Bit& command) {
     }
 }
 
-std::size_t elementSize(std::uint32_t type) {
-    switch (type) {
-        case 0:
-        case 4:
-        case 10:
-            return 1;
-        case 1:
-        case 5:
-            return 2;
-        default:
-            return 4;
-    }
-}
-
-template <typename Copy>
-std::uint32_t eachField(std::uint32_t count, std::uint32_t* offset, std::va_list fields, Copy copy) {
+template <typename Move>
+std::uint32_t moveFields(NvMsg32Bit* msg, std::uint32_t count, std::uint32_t* offset, std::va_list arguments,
+                         Move move) {
     std::uint32_t at = *offset;
-    for (; count > 0; --count) {
-        const std::uint32_t descriptor = va_arg(fields, std::uint32_t);
-        void* const storage = va_arg(fields, void*);
-        const std::size_t size = (((descriptor >> 11) & 0xFF) + 1) * elementSize((descriptor >> 19) & 0x1F);
-        copy(at, storage, size);
-        at += static_cast<std::uint32_t>(size);
+    for (const Field& field : body_fields::fieldsOf(count, arguments)) {
+        std::invoke(move, field, bodyOf(msg) + at);
+        at += static_cast<std::uint32_t>(field.size());
     }
     if (*offset != 0)
         *offset = at;
@@ -243,24 +230,18 @@ uint32_t nvMsgFieldGet(NvMsg32Bit*, uint32_t, void*) { return NVSTATUS_ERROR; }
 uint32_t nvMsgFieldPut(NvMsg32Bit*, uint32_t, void*) { return NVSTATUS_ERROR; }
 
 uint32_t nvMsgVarFieldGet(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...) {
-    std::va_list fields;
-    va_start(fields, offset);
-    const uint32_t status =
-        eachField(count, offset, fields, [msg](uint32_t at, void* storage, std::size_t size) {
-            std::memcpy(storage, bodyOf(msg) + at, size);
-        });
-    va_end(fields);
+    std::va_list arguments;
+    va_start(arguments, offset);
+    const uint32_t status = moveFields(msg, count, offset, arguments, &Field::get);
+    va_end(arguments);
     return status;
 }
 
 uint32_t nvMsgVarFieldPut(NvMsg32Bit* msg, uint32_t count, uint32_t* offset, ...) {
-    std::va_list fields;
-    va_start(fields, offset);
-    const uint32_t status =
-        eachField(count, offset, fields, [msg](uint32_t at, const void* storage, std::size_t size) {
-            std::memcpy(bodyOf(msg) + at, storage, size);
-        });
-    va_end(fields);
+    std::va_list arguments;
+    va_start(arguments, offset);
+    const uint32_t status = moveFields(msg, count, offset, arguments, &Field::put);
+    va_end(arguments);
     return status;
 }
 
