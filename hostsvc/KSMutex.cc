@@ -1,7 +1,6 @@
 #include "hostsvc/KSMutex.h"
 
 #include "hostsvc/KSPoll.h"
-#include "hostsvc/KSPosixMutex.h"
 #include "hostsvc/KSSystem.h"
 
 KSMutex::KSMutex() : mutex_() {
@@ -11,14 +10,14 @@ KSMutex::KSMutex() : mutex_() {
 
 KSMutex::~KSMutex() { pthread_mutex_destroy(&mutex_); }
 
-void KSMutex::lock() { ks_posix::lock(&mutex_); }
+void KSMutex::lock() { pthread_mutex_lock(&mutex_); }
 
 void KSMutex::unlock() {
-    while (ks_posix::unlock(&mutex_) != 0) {
+    while (pthread_mutex_unlock(&mutex_) != 0) {
     }
 }
 
-bool KSMutex::tryLock() { return ks_posix::tryLock(&mutex_) == 0; }
+bool KSMutex::tryLock() { return pthread_mutex_trylock(&mutex_) == 0; }
 
 bool KSMutex::tryLock(unsigned timeoutMs, unsigned intervalMs) {
     return ks_poll(

@@ -159,7 +159,7 @@ std::uint32_t KSRemoteMsgQueue::msgRead(NvMsg32Bit** out) {
     const std::lock_guard lock(reading_);
     const ReceivedFrame frame(connection_);
     if (frame.is(ClosedFrame)) {
-        closed();
+        acknowledged();
         return NVSTATUS_ERROR;
     }
     if (frame.good()) {
@@ -170,8 +170,8 @@ std::uint32_t KSRemoteMsgQueue::msgRead(NvMsg32Bit** out) {
     return NVSTATUS_ERROR;
 }
 
-void KSRemoteMsgQueue::closed() {
-    closed_ = true;
+void KSRemoteMsgQueue::acknowledged() {
+    closing_ |= Acknowledged;
     handshake_.unlock();
 }
 
@@ -191,7 +191,7 @@ void KSRemoteMsgQueue::failed(bool withinFrame, NvMsg32Bit** out) {
     std::cerr << "Error communicating with remote message queue on " + hostName_ + "\n" << std::flush;
     if (withinFrame) {
         *out = nullptr;
-        if (!closing_)
+        if ((closing_ & Asked) == 0)
             ks_sleep(PauseSeconds);
     }
     if (--retryBudget_ <= 0)
@@ -200,19 +200,19 @@ void KSRemoteMsgQueue::failed(bool withinFrame, NvMsg32Bit** out) {
 
 // Reads the connection until the relay's acknowledgement or the connection's end. The reader thread may have
 // been cancelled already and not read any more; then this function reads in its place.
-void KSRemoteMsgQueue::lookForClosed() {
+void KSRemoteMsgQueue::readToAcknowledgement() {
     const std::lock_guard lock(reading_);
-    while (!closed_) {
+    while ((closing_ & Acknowledged) == 0) {
         const ReceivedFrame frame(connection_);
         if (frame.is(ClosedFrame) || connection_.failed())
-            closed();
+            acknowledged();
     }
 }
 
-void KSRemoteMsgQueue::awaitClosed() {
+void KSRemoteMsgQueue::awaitAcknowledgement() {
     std::thread other;
     try {
-        other = std::thread([this] { lookForClosed(); });
+        other = std::thread([this] { readToAcknowledgement(); });
     } catch (const std::system_error&) {  // no thread: only the reader thread can see the acknowledgement
     }
     handshake_.tryLock(AnswerMs, PollMs);
@@ -223,12 +223,12 @@ void KSRemoteMsgQueue::awaitClosed() {
 
 // If the close request cannot be sent, there is nothing to wait for.
 void KSRemoteMsgQueue::wakeReader() {
-    if (closing_.exchange(true))
+    if ((closing_.fetch_or(Asked) & Asked) != 0)
         return;
     msg_t request;
     request.type = CloseFrame;
     if (sendFrame(request) == 0)
-        awaitClosed();
+        awaitAcknowledgement();
     else
         connection_.shutdown(SHUT_RDWR);
 }

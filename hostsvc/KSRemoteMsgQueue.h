@@ -43,14 +43,18 @@ class KSRemoteMsgQueue : public KSAbstractMsgQueue {
   private:
     class ReceivedFrame;
 
+    // Asked: this end has asked the relay to close. Acknowledged: the relay has closed, or the connection has
+    // ended. A relay may acknowledge what nobody has asked for.
+    enum Closing : unsigned { Asked = 1, Acknowledged = 2 };
+
     void open(NvCompDesc desc, unsigned a, unsigned b);
     void keepAlive() const;
     long sendFrame(const msg_t& frame);
-    void closed();
+    void acknowledged();
     std::uint32_t takeMessage(const msg_t& frame, NvMsg32Bit** out);
     void failed(bool withinFrame, NvMsg32Bit** out);
-    void awaitClosed();
-    void lookForClosed();
+    void awaitAcknowledgement();
+    void readToAcknowledgement();
 
     std::string hostName_;
     sock connection_;
@@ -58,8 +62,7 @@ class KSRemoteMsgQueue : public KSAbstractMsgQueue {
     KSMutex handshake_;              // a signal: locked until the relay has acknowledged the close
     std::mutex reading_;             // held by the thread that reads the connection
     std::mutex writing_;             // held by the thread that writes to the connection
-    std::atomic<bool> closing_{false};
-    bool closed_ = false;  // guarded by reading_
+    std::atomic<unsigned> closing_{0};
 };
 
 #endif

@@ -8,12 +8,6 @@
 #include <ctime>
 #include <memory>
 
-#include "hostsvc/KSPosixMutex.h"
-
-#if defined(__SANITIZE_THREAD__)
-#include <sanitizer/tsan_interface.h>
-#endif
-
 namespace {
 
 std::atomic<KSSystem*> standIn{nullptr};
@@ -40,17 +34,12 @@ int KSSystem::waitFor(timeval timeout) { return ::select(0, nullptr, nullptr, nu
 
 int KSSystem::waitForCount(sem_t& semaphore, timeval timeout) {
     const timespec end = after(timeout);
-    if (::sem_clockwait(&semaphore, CLOCK_MONOTONIC, &end) != 0)
-        return errno;
-#if defined(__SANITIZE_THREAD__)
-    __tsan_acquire(&semaphore);  // the thread sanitizer knows sem_post but not this call
-#endif
-    return 0;
+    return ::sem_clockwait(&semaphore, CLOCK_MONOTONIC, &end) == 0 ? 0 : errno;
 }
 
 int KSSystem::waitForLock(pthread_mutex_t& mutex, timeval timeout) {
     const timespec end = after(timeout);
-    return ks_posix::clockLock(&mutex, CLOCK_MONOTONIC, &end);
+    return ::pthread_mutex_clocklock(&mutex, CLOCK_MONOTONIC, &end);
 }
 
 int KSSystem::createThread(const pthread_attr_t* attributes, void* (*entry)(void*), void* argument) {

@@ -1,7 +1,6 @@
 #include "hostsvc/KSThread.h"
 
 #include "hostsvc/KSDetached.h"
-#include "hostsvc/KSThreadEnd.h"
 
 namespace {
 

@@ -5,7 +5,7 @@
 
 #include <iostream>
 
-#include "hostsvc/KSThreadEnd.h"
+#include "hostsvc/KSDetached.h"
 
 KSThreadControl::~KSThreadControl() {
     while (!stack_.empty()) {
