@@ -1,20 +1,16 @@
 #include "hostsvc/KSMsgQueue.h"
 
-#include <gmock/gmock.h>
 #include <sched.h>
 
 #include <atomic>
-#include <condition_variable>
-#include <cstdlib>
 #include <deque>
 #include <memory>
 #include <mutex>
-#include <optional>
 #include <thread>
 #include <vector>
 
 #include "hostsvc/descComp.h"
-#include "tests/support/fake_norv.h"
+#include "tests/hostsvc/msg_queue.h"
 #include "tests/support/test_system.h"
 
 // The two halves of a request by themselves: a requester that gives up at the last moment.
@@ -34,118 +30,6 @@ namespace {
 using fake_norv::Message;
 using fake_norv::Op;
 using testing::ElementsAre;
-
-constexpr NvCompDesc Board{2, 1, 0, 1, 0x15, 0, 0};
-constexpr NvCompDesc Elsewhere{3, 1, 0, 1, 0x15, 0, 0};
-constexpr unsigned Command = 8;
-constexpr unsigned Reply = 9;
-constexpr unsigned Soon = 10000;  // ms; what is waited for comes at once
-
-// Keeps the types of what it receives; frees the messages.
-class Receiver : public KSAsyncMsgReceiver {
-  public:
-    int receive(KSMsgRef& msg) {
-        const unsigned type = msg.getMsgType();
-        msg.free();
-        const std::lock_guard lock(lock_);
-        types_.push_back(type);
-        changed_.notify_all();
-        return 1;
-    }
-
-    std::vector<unsigned> types() const {
-        const std::lock_guard lock(lock_);
-        return types_;
-    }
-
-    bool waitFor(std::size_t count) {
-        std::unique_lock lock(lock_);
-        return changed_.wait_for(lock, std::chrono::seconds(30), [&] { return types_.size() >= count; });
-    }
-
-  private:
-    mutable std::mutex lock_;
-    std::condition_variable changed_;
-    std::vector<unsigned> types_;
-};
-
-constexpr auto ReceiverMember = static_cast<KSMsgQueue::AsyncMember>(&Receiver::receive);
-
-// Takes what is parked.
-class SynchronousQueue : public KSMsgQueue {
-  public:
-    using KSMsgQueue::KSMsgQueue;
-
-    unsigned read() {
-        messageAvailable_.lock();
-        KSMsgRef msg(std::exchange(unclaimed_, nullptr));
-        slotFree_.unlock();
-        const unsigned type = msg.getMsgType();
-        msg.free();
-        return type;
-    }
-};
-
-class KSMsgQueueTest : public testing::Test {
-  protected:
-    KSMsgQueueTest() {
-        fake_norv::reset();
-        unsetenv("HOST");
-        unsetenv("REMOTE_NORV");
-        queue_.emplace(NvCompDesc{}, 512, 5, nullptr);
-    }
-    ~KSMsgQueueTest() override {
-        queue_.reset();
-        EXPECT_EQ(fake_norv::openQueues(), 0U);
-        EXPECT_EQ(fake_norv::outstanding(), 0U);
-        EXPECT_THAT(fake_norv::misuses(), ElementsAre());
-        fake_norv::reset();
-    }
-
-    void receive() {
-        queue_->registerAsyncCallback(static_cast<KSAsyncMsgReceiver*>(&receiver_), ReceiverMember);
-    }
-
-    static KSMsgRef command(unsigned transaction = 10000) {
-        KSMsgRef msg(0U);
-        msg.setMsgType(Command);
-        msg.setTrans(transaction);
-        msg.setTgtAddr(Board);
-        return msg;
-    }
-
-    // What came back: its type, or nothing. The message is freed.
-    std::optional<unsigned> ask(unsigned timeoutMs, int anySource = 0, unsigned transaction = 10000) {
-        KSMsgRef msg = command(transaction);
-        KSMsgRef back = queue_->request(msg, timeoutMs, Reply, anySource);
-        EXPECT_EQ(msg.getMsgRef(), nullptr);
-        if (back.getMsgRef() == nullptr)
-            return std::nullopt;
-        const unsigned type = back.getMsgType();
-        back.free();
-        return type;
-    }
-
-    void event(unsigned type) const {
-        EXPECT_TRUE(fake_norv::deliver({0, type, Board, queue_->getHostDesc(), {}}));
-    }
-
-    // Each command is answered with these messages, all of its transaction unless they have one.
-    static void answers(std::vector<Message> with) {
-        fake_norv::onWrite([with](const Message& heard) {
-            if (heard.type != Command)
-                return;
-            for (Message message : with) {
-                message.transaction = message.transaction != 0 ? message.transaction : heard.transaction;
-                message.target = heard.source;
-                fake_norv::deliver(message);
-            }
-        });
-    }
-
-    Receiver receiver_;
-    std::optional<SynchronousQueue> queue_;
-};
 
 TEST_F(KSMsgQueueTest, ARequestIsSentUnderTheQueuesAddressAndReturnsItsReply) {
     answers({{0, Reply, Board, {}, {}}});
@@ -272,93 +156,6 @@ TEST_F(KSMsgQueueTest, ARequestWithoutTimeoutDoesNotDisturbOneThatWaits) {
     });
     EXPECT_EQ(ask(Soon), Reply);
     EXPECT_TRUE(nested);
-}
-
-TEST_F(KSMsgQueueTest, TheReceiverGetsWhatNobodyWaitsFor) {
-    receive();
-    event(1001);
-    event(1002);
-    ASSERT_TRUE(receiver_.waitFor(2));
-    EXPECT_THAT(receiver_.types(), ElementsAre(1001, 1002));
-}
-
-std::atomic<unsigned> plainCalls{0};
-
-int notePlain(KSMsgRef& msg) {
-    plainCalls += msg.getMsgType();
-    return 0;
-}
-
-int takePlain(KSMsgRef& msg) {
-    plainCalls += msg.getMsgType();
-    msg.free();
-    return 0;
-}
-
-TEST_F(KSMsgQueueTest, APlainCallbackIsCalledBesideTheReceiver) {
-    plainCalls = 0;
-    receive();
-    queue_->registerAsyncCallback(notePlain);
-    event(1001);
-    ASSERT_TRUE(receiver_.waitFor(1));
-    EXPECT_EQ(plainCalls, 1001U);
-}
-
-TEST_F(KSMsgQueueTest, APlainCallbackAloneOwnsTheMessage) {
-    plainCalls = 0;
-    queue_->registerAsyncCallback(takePlain);
-    event(1001);
-    while (plainCalls == 0)
-        std::this_thread::yield();
-    EXPECT_EQ(plainCalls, 1001U);
-}
-
-TEST_F(KSMsgQueueTest, AReceiverReplacesThePlainCallbackAndTheReceiverBefore) {
-    plainCalls = 0;
-    Receiver other;
-    queue_->registerAsyncCallback(static_cast<KSAsyncMsgReceiver*>(&other), ReceiverMember);
-    queue_->registerAsyncCallback(notePlain);
-    receive();
-    event(1001);
-    ASSERT_TRUE(receiver_.waitFor(1));
-    EXPECT_EQ(plainCalls, 0U);
-    EXPECT_THAT(other.types(), ElementsAre());
-}
-
-TEST_F(KSMsgQueueTest, WithoutReceiverMessagesAreParkedOneAtATime) {
-    event(1001);
-    event(1002);
-    event(1003);
-    EXPECT_EQ(queue_->read(), 1001U);
-    EXPECT_EQ(queue_->read(), 1002U);
-    EXPECT_EQ(queue_->read(), 1003U);
-}
-
-TEST_F(KSMsgQueueTest, AReceiverThatComesLaterGetsTheParkedMessageAndTheOneThatWaitsForItsPlace) {
-    event(1001);
-    event(1002);
-    ASSERT_TRUE(fake_norv::waitForCalls(Op::Read, 2));  // the first is parked, the second waits
-    receive();
-    ASSERT_TRUE(receiver_.waitFor(2));
-    EXPECT_THAT(receiver_.types(), ElementsAre(1001, 1002));
-}
-
-TEST_F(KSMsgQueueTest, AParkedMessageReachesTheReceiverBeforeTheRegistrationReturns) {
-    event(1001);
-    ASSERT_TRUE(fake_norv::waitForIdleReader());
-    receive();
-    EXPECT_THAT(receiver_.types(), ElementsAre(1001));
-    event(1002);
-    ASSERT_TRUE(receiver_.waitFor(2));
-    EXPECT_THAT(receiver_.types(), ElementsAre(1001, 1002));
-}
-
-TEST_F(KSMsgQueueTest, AParkedMessageReachesAPlainCallbackToo) {
-    plainCalls = 0;
-    event(1001);
-    ASSERT_TRUE(fake_norv::waitForIdleReader());
-    queue_->registerAsyncCallback(takePlain);
-    EXPECT_EQ(plainCalls, 1001U);
 }
 
 TEST_F(KSMsgQueueTest, DestructionFreesTheParkedMessageAndTheOneThatWaitsForItsPlace) {

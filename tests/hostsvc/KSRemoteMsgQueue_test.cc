@@ -1,105 +1,22 @@
 #include "hostsvc/KSRemoteMsgQueue.h"
 
-#include <gmock/gmock.h>
-
-#include <atomic>
-#include <condition_variable>
-#include <cstring>
-#include <future>
 #include <iostream>
 #include <memory>
-#include <mutex>
 #include <string>
 #include <thread>
 
 #include "hostsvc/KSException.h"
-#include "hostsvc/KSMsgQueue.h"
 #include "hostsvc/descComp.h"
-#include "tests/support/fake_norv.h"
-#include "tests/support/tcp.h"
+#include "tests/hostsvc/remote_msg_queue.h"
 #include "tests/support/test_system.h"
 
 namespace {
 
+using namespace remote;  // NOLINT(google-build-using-namespace): the words of these tests
 using fake_norv::Op;
-using tcp::Connection;
-using tcp::Octets;
-using tcp::operator+;
-using tcp::words;
 using testing::ElementsAre;
 using testing::internal::CaptureStderr;
 using testing::internal::GetCapturedStderr;
-
-constexpr NvCompDesc Asked{1005, 2, 0, 3, 4, 1, 0};
-constexpr NvCompDesc Given{0x1234, 12, 0, 13, 14, 11, 0};
-constexpr std::size_t OpenRequestSize = 20 + 28;
-constexpr std::size_t HeaderSize = 20;
-
-const Octets Opened = words({1002, 0, 20, 0, 0}) + words({11, 12, 13, 14, 0x1234});
-const Octets Closed = words({2001, 0, 0, 0, 0});
-const Octets CloseRequest = words({2000, 0, 0, 0, 0});
-
-// A message of type 9, transaction 10000 and low octet 0x5A, from 0.1.1.21.2 to Given, with a body of three.
-const Octets Block = words({0x5A, 10000, 9, 0, 1, 1, 11, 12, 13, 2, 21, 0x1234, 14, 3});
-const Octets Body{1, 2, 3};
-const Octets MessageFrame = words({1001, 0, 56, 3, 0}) + Block + Body;
-
-Octets withoutSendersWord(Octets frame) {
-    std::fill(frame.begin() + 16, frame.begin() + 20, 0);
-    return frame;
-}
-
-Octets octetsOf(const KSMsgRef& msg) {
-    Octets octets(NVMSG_HEADER_SIZE + msg.getSize());
-    std::memcpy(octets.data(), msg.getMsgRef(), octets.size());
-    return octets;
-}
-
-// The relay is what the test writes and reads at the other end.
-class KSRemoteMsgQueueTest : public testing::Test {
-  protected:
-    KSRemoteMsgQueueTest() { fake_norv::reset(); }
-    ~KSRemoteMsgQueueTest() override {
-        EXPECT_EQ(fake_norv::outstanding(), 0U);
-        EXPECT_THAT(fake_norv::misuses(), ElementsAre());
-    }
-
-    std::unique_ptr<KSRemoteMsgQueue> make() const {
-        return std::make_unique<KSRemoteMsgQueue>(Asked, 512, 50, listener_.host().c_str());
-    }
-
-    // A queue, and its relay's end of the connection.
-    std::pair<std::unique_ptr<KSRemoteMsgQueue>, Connection> open() const {
-        auto queue = std::async(std::launch::async, [this] { return make(); });
-        Connection relay = listener_.accept();
-        relay.read(OpenRequestSize);
-        relay.write(Opened);
-        return {queue.get(), std::move(relay)};
-    }
-
-    // The queue goes, and the relay closes as it should.
-    static void close(std::unique_ptr<KSRemoteMsgQueue>& queue, const Connection& relay) {
-        std::thread other([&] {
-            relay.read(HeaderSize);
-            relay.write(Closed);
-        });
-        queue.reset();
-        other.join();
-    }
-
-    std::string errorLine() const {
-        return "Error communicating with remote message queue on " + listener_.host() + "\n";
-    }
-
-    std::string errorLines(int count) const {
-        std::string lines;
-        for (; count > 0; --count)
-            lines += errorLine();
-        return lines;
-    }
-
-    tcp::Listener listener_;
-};
 
 TEST_F(KSRemoteMsgQueueTest, OpeningSendsTheAddressAndTheArgumentsAndTakesTheHostAddressFromTheReply) {
     auto making = std::async(std::launch::async, [this] { return make(); });
@@ -390,117 +307,6 @@ TEST_F(KSRemoteMsgQueueTest, AnAcknowledgementThatNobodyAskedForIsAnError) {
     ASSERT_EQ(queue->msgRead(&read), 0U);
     KSMsgRef(read).free();
     close(queue, relay);
-}
-
-// The whole mailbox over the remote queue, with its reader.
-class KSMsgQueueOverTheNetwork : public KSRemoteMsgQueueTest {
-  protected:
-    std::pair<std::unique_ptr<KSMsgQueue>, Connection> openMailbox() const {
-        const std::string host = listener_.host();
-        auto queue = std::async(std::launch::async,
-                                [&] { return std::make_unique<KSMsgQueue>(Asked, 512, 50, host.c_str()); });
-        Connection relay = listener_.accept();
-        relay.read(OpenRequestSize);
-        relay.write(Opened);
-        return {queue.get(), std::move(relay)};
-    }
-};
-
-TEST_F(KSMsgQueueOverTheNetwork, ARequestGetsItsReply) {
-    auto [queue, relay] = openMailbox();
-    std::thread board([&relay = relay] {
-        relay.read(HeaderSize + 56);
-        relay.write(MessageFrame);
-        relay.read(HeaderSize);
-        relay.write(Closed);
-    });
-    KSMsgRef command(0U);
-    command.setMsgType(8);
-    command.setTrans(10000);
-    command.setTgtAddr({2, 1, 0, 1, 21, 0, 0});
-    KSMsgRef reply = queue->request(command, 30000, 9, 0);
-    ASSERT_NE(reply.getMsgRef(), nullptr);
-    EXPECT_EQ(reply.getSize(), 3U);
-    reply.free();
-    queue.reset();
-    board.join();
-}
-
-TEST_F(KSMsgQueueOverTheNetwork, ARequestThatCannotBeSentIsFreedAndTimesOut) {
-    auto [queue, relay] = openMailbox();
-    KSMsgRef tooLarge(102401U);
-    EXPECT_EQ(queue->request(tooLarge, 5, 9, 0).getMsgRef(), nullptr);
-    EXPECT_EQ(fake_norv::outstanding(), 0U);
-    std::thread board([&relay = relay] {
-        relay.read(HeaderSize);
-        relay.write(Closed);
-    });
-    queue.reset();
-    board.join();
-}
-
-// The standard error stream while it lives.
-class Errors : public std::streambuf {
-  public:
-    Errors() : before_(std::cerr.rdbuf(this)) {}
-    ~Errors() override { std::cerr.rdbuf(before_); }
-
-    // What was written once it ends with this.
-    std::string until(const std::string& end) {
-        std::unique_lock lock(lock_);
-        changed_.wait_for(lock, std::chrono::seconds(30), [&] { return text_.ends_with(end); });
-        return text_;
-    }
-
-  protected:
-    int overflow(int character) override {
-        const std::lock_guard lock(lock_);
-        text_.push_back(static_cast<char>(character));
-        changed_.notify_all();
-        return character;
-    }
-
-  private:
-    std::mutex lock_;
-    std::condition_variable changed_;
-    std::string text_;
-    std::streambuf* before_;
-};
-
-TEST_F(KSMsgQueueOverTheNetwork, AConnectionThatIsLostEndsTheReaderAndNotTheProgram) {
-    Errors errors;
-    auto [queue, relay] = openMailbox();
-    relay.close();
-    const std::string last =
-        "The connection to the remote message queue on " + listener_.host() + " is lost\n";
-    EXPECT_EQ(errors.until(last), errorLines(10) + last);
-    KSMsgRef command(0U);
-    EXPECT_EQ(queue->request(command, 5, 9, 0).getMsgRef(), nullptr);
-    queue.reset();
-}
-
-TEST_F(KSMsgQueueOverTheNetwork, DestructionWhileMessagesStreamInFindsTheAcknowledgementAmongThem) {
-    for (int round = 0; round < 20; ++round) {
-        auto [queue, relay] = openMailbox();
-        std::atomic<bool> asked{false};
-        std::thread sender([&, &relay = relay] {
-            while (!asked)
-                relay.write(MessageFrame);
-            relay.write(Closed);
-        });
-        std::thread listener([&, &relay = relay] {
-            relay.read(HeaderSize);
-            asked = true;
-        });
-        queue->registerAsyncCallback([](KSMsgRef& msg) {
-            msg.free();
-            return 1;
-        });
-        queue.reset();
-        sender.join();
-        listener.join();
-        EXPECT_EQ(fake_norv::outstanding(), 0U);
-    }
 }
 
 TEST(KSRemoteServiceComFailure, ItKeepsTheFirst99CharactersOfTheHost) {

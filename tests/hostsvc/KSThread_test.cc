@@ -35,8 +35,6 @@ std::size_t stackSizeWith(unsigned requested) {
     return size;
 }
 
-Story untilCancelled = goOnUntilCancelled;
-
 TEST(KSThread, TheBodyGetsTheControlAndTheArgumentAndItsResultIsKept) {
     int argument = 0;
     void* seenControl = nullptr;
@@ -343,61 +341,6 @@ TEST(KSThreadDeathTest, AnExceptionOutOfTheBodyEndsTheProcess) {
             thread.join();
         },
         testing::HasSubstr("lost in a body"));
-}
-
-// Tells when it is deleted.
-class Mortal : public KSThread {
-  public:
-    explicit Mortal(std::latch& gone) : KSThread(tell, 0), gone_(gone) {}
-    ~Mortal() override { gone_.count_down(); }
-
-  private:
-    std::latch& gone_;
-};
-
-TEST(KSThread, AnAbandonedThreadDeletesItselfWhenItsBodyReturns) {
-    std::latch gone(1);
-    std::latch go(1);
-    Story body = [&](KSThread::control&) -> void* {
-        go.wait();
-        return nullptr;
-    };
-    auto* const thread = new Mortal(gone);
-    thread->start(&body);
-    thread->abandon();
-    EXPECT_FALSE(gone.try_wait());
-    go.count_down();
-    gone.wait();
-}
-
-TEST(KSThread, AnAbandonedThreadDeletesItselfWhenItIsCancelled) {
-    std::latch gone(1);
-    auto* const thread = new Mortal(gone);
-    thread->abandon();
-    thread->start(&untilCancelled);
-    thread->cancel();
-    gone.wait();
-}
-
-TEST(KSThread, AThreadThatIsAbandonedAroundItsEndIsDeletedAllTheSame) {
-    Story body = [](KSThread::control&) -> void* { return nullptr; };
-    for (int round = 0; round < 200; ++round) {
-        std::latch gone(1);
-        auto* const thread = new Mortal(gone);
-        thread->start(&body);
-        thread->abandon();
-        gone.wait();
-    }
-}
-
-TEST(KSThread, DestroyingAnAbandonedThreadTakesItBack) {
-    std::latch gone(1);
-    {
-        Mortal thread(gone);
-        thread.start(&untilCancelled);
-        thread.abandon();
-    }
-    EXPECT_TRUE(gone.try_wait());
 }
 
 }  // namespace

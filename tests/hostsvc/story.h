@@ -30,4 +30,6 @@ inline void* goOnUntilCancelled(KSThread::control& control) {
     }
 }
 
+inline Story untilCancelled = goOnUntilCancelled;
+
 #endif
