@@ -1,78 +1,14 @@
 // The relay as a peer sees it, on a scripted transport library.
-#include <gmock/gmock.h>
-
 #include <algorithm>
-#include <random>
 #include <thread>
 
-#include "tests/relay/running_relay.h"
-#include "tests/support/fake_norv.h"
-#include "tests/support/tcp.h"
+#include "tests/relay/relay_peer.h"
 
 namespace {
 
+using namespace relay_peer;  // NOLINT(google-build-using-namespace): the words of these tests
 using fake_norv::Op;
-using tcp::Connection;
-using tcp::Octets;
-using tcp::operator+;
-using tcp::words;
 using testing::ElementsAre;
-
-constexpr std::size_t HeaderSize = 20;
-constexpr std::size_t BlockSize = 56;
-
-const Octets OpenRequest = words({1003, 0, 28, 0, 0}) + words({1, 2, 3, 4, 5, 512, 50});
-const Octets CloseRequest = words({2000, 0, 0, 0, 0});
-const Octets Closed = words({2001, 0, 0, 0, 0});
-const Octets Opened = words({1002, 0, 20, 0, 0}) + words({1, 2, 3, 4, 5});
-
-// A command of type 8 to 0.1.1.21.2, under a source that is not the sender's.
-Octets command(std::uint32_t transaction, const Octets& body = {}) {
-    const auto size = static_cast<std::uint32_t>(body.size());
-    return words({1001, 0, BlockSize, size, 0}) +
-           words({0, transaction, 8, 9, 9, 9, 0, 1, 1, 9, 9, 2, 21, size}) + body;
-}
-
-class RelayTest : public testing::Test {
-  protected:
-    RelayTest() {
-        fake_norv::reset();
-        fake_norv::nextHostAddress({5, 2, 0, 3, 4, 1, 0});
-    }
-    ~RelayTest() override {
-        relay_.reset();
-        EXPECT_EQ(fake_norv::openQueues(), 0U);
-        EXPECT_EQ(fake_norv::outstanding(), 0U);
-        EXPECT_THAT(fake_norv::misuses(), ElementsAre());
-        fake_norv::reset();
-    }
-
-    void start(relay::Options options = {}) { relay_ = std::make_unique<RunningRelay>(std::move(options)); }
-
-    Connection connect() const { return Connection::to(relay_->port()); }
-    Connection open() const {
-        Connection host = connect();
-        host.write(OpenRequest);
-        EXPECT_EQ(host.read(Opened.size()).size(), Opened.size());
-        return host;
-    }
-
-    // The relay does this to the connection, says why, gives its queue back, and serves the next one.
-    void expectEnd(const Connection& host, const std::string& why) {
-        EXPECT_TRUE(host.ends());
-        EXPECT_TRUE(relay_->logs(why)) << why;
-        expectService();
-    }
-    void expectService() {
-        fake_norv::onWrite(nullptr);
-        Connection other = open();
-        other.write(CloseRequest);
-        EXPECT_EQ(other.read(HeaderSize), Closed);
-        EXPECT_TRUE(other.ends());
-    }
-
-    std::unique_ptr<RunningRelay> relay_;
-};
 
 TEST_F(RelayTest, OpeningAQueueReturnsItsAddress) {
     start();
@@ -306,103 +242,6 @@ TEST_F(RelayTest, HostsThatAreNotAllowedAreRefused) {
     start(options);
     EXPECT_TRUE(connect().ends());
     EXPECT_TRUE(relay_->logs("refused: not among those allowed"));
-}
-
-TEST_F(RelayTest, ATransportThatRefusesAQueueEndsTheConnection) {
-    start();
-    for (const Op op : {Op::Open, Op::Bind}) {
-        fake_norv::fail(op);
-        const Connection host = connect();
-        host.write(OpenRequest);
-        expectEnd(host, op == Op::Open ? "opens no more queues" : "binds no more queues");
-    }
-}
-
-TEST_F(RelayTest, ATransportThatReadsNoMoreEndsTheConnection) {
-    start();
-    fake_norv::fail(Op::Read);
-    const Connection host = open();
-    expectEnd(host, "ended: the transport library reads no more");
-}
-
-TEST_F(RelayTest, ATransportThatTakesNoMessageEndsTheConnection) {
-    start();
-    const Connection host = open();
-    ASSERT_TRUE(fake_norv::waitForIdleReader());
-    fake_norv::fail(Op::Write);  // what is to come back when everything before it has been sent
-    host.write(CloseRequest);
-    expectEnd(host, "ended: the transport library takes no message");
-}
-
-TEST_F(RelayTest, WithoutMemoryForAMessageTheConnectionEnds) {
-    start();
-    const Connection host = open();
-    fake_norv::fail(Op::Allocate);
-    host.write(command(1));
-    expectEnd(host, "ended: the transport library has no memory for a message");
-}
-
-TEST_F(RelayTest, WithoutMemoryToWakeItsThreadTheQueueIsGivenBackAllTheSame) {
-    start();
-    Connection host = open();
-    ASSERT_TRUE(fake_norv::waitForIdleReader());
-    fake_norv::fail(Op::Allocate, 1);
-    host.close();
-    EXPECT_TRUE(relay_->logs("ended: the connection was closed"));
-    expectService();
-}
-
-TEST_F(RelayTest, StoppingSendsWhatIsOnItsWayAndSaysThatTheRelayCloses) {
-    start();
-    fake_norv::onWrite([](const fake_norv::Message& heard) {
-        if (heard.type == 8)
-            fake_norv::deliver(fake_norv::replyTo(heard, 9));
-    });
-    const Connection host = open();
-    const Connection unopened = connect();
-    host.write(command(1) + command(2));
-    EXPECT_EQ(host.read(HeaderSize + BlockSize).size(), HeaderSize + BlockSize);
-    relay_->stop();
-    EXPECT_EQ(host.read(HeaderSize + BlockSize).size(), HeaderSize + BlockSize);
-    EXPECT_EQ(host.read(HeaderSize), CloseRequest);
-    EXPECT_TRUE(host.ends());
-    EXPECT_TRUE(unopened.ends());
-    EXPECT_EQ(connect().get(), -1);
-}
-
-TEST_F(RelayTest, StoppingTwiceWaitsForNobody) {
-    start();
-    const Connection host = open();
-    for (int i = 0; i < 300; ++i)  // more than the connection holds
-        fake_norv::deliver({0, 32, {}, {5, 2, 0, 3, 4, 1, 0}, Octets(102400)});
-    relay_->sayStop();
-    while (connect().get() != -1)
-        std::this_thread::yield();
-    relay_->stop();
-    EXPECT_EQ(relay_->logged("a frame was not taken"), 0U);
-}
-
-// Frames with octets changed, cut and mixed up: nothing more happens than that connections end.
-TEST_F(RelayTest, DamagedFramesEndNoMoreThanTheirConnections) {
-    relay::Options options;
-    options.patience.frame = std::chrono::milliseconds(200);
-    options.maxClients = 1000;
-    start(options);
-    const Octets good = OpenRequest + command(1, {1, 2, 3}) + command(2) + CloseRequest;
-    std::mt19937 random(20240611);
-    for (int round = 0; round < 400; ++round) {
-        Octets octets = good;
-        for (unsigned changes = random() % 4; changes > 0; --changes)
-            octets[random() % octets.size()] = static_cast<std::uint8_t>(random());
-        if (random() % 3 == 0)
-            octets.resize(random() % octets.size());
-        Connection host = connect();
-        ASSERT_GE(host.get(), 0);
-        host.write(octets);
-        if (random() % 2 == 0)
-            host.close();
-    }
-    expectService();
 }
 
 }  // namespace
