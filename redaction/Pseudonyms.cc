@@ -105,8 +105,8 @@ class Mac {
 // Numbers that look random, drawn from digests of one text: 16 bits each.
 class Draws {
   public:
-    Draws(Mac& mac, Alphabet alphabet, std::string_view before) : mac_(mac) {
-        text_ = {static_cast<char>(alphabet), '\0'};
+    Draws(Mac& mac, Alphabet alphabet, std::string_view before)
+        : mac_(mac), text_{static_cast<char>(alphabet), '\0'} {
         text_ += before;
     }
     std::size_t below(std::size_t limit) {
@@ -115,9 +115,9 @@ class Draws {
             ++text_[1];  // the next digest is another one
             at_ = 0;
         }
-        const std::size_t drawn = digest_[at_] * std::size_t{256} + digest_[at_ + 1];
-        at_ += 2;
-        return drawn % limit;
+        const std::size_t upper = digest_[at_++];
+        const std::size_t lower = digest_[at_++];
+        return (upper * 256 + lower) % limit;
     }
 
   private:

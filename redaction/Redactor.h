@@ -7,6 +7,7 @@
 #include <optional>
 #include <span>
 #include <string>
+#include <tuple>
 #include <utility>
 #include <vector>
 
@@ -64,13 +65,8 @@ class Redactor : public calls::Listener {
         std::vector<std::uint8_t> information;
         std::string before;
     };
-    struct Place {
-        const capture::Interface* interface = nullptr;
-        std::uint8_t tei = 0;
-        std::uint8_t ns = 0;
-        bool transmitted = false;
-        auto operator<=>(const Place&) const = default;
-    };
+    // D channel, TEI, N(S) and direction of a frame that may be sent again.
+    using Place = std::tuple<const capture::Interface*, std::uint8_t, std::uint8_t, bool>;
 
     void apply(const Plan& plan, std::span<std::uint8_t> octets, std::uint8_t messageType);
     void replaceDialled(std::span<std::uint8_t> octets, std::uint8_t messageType);
@@ -83,7 +79,7 @@ class Redactor : public calls::Listener {
     std::uint64_t expected_ = 0;
     std::uint64_t losses_ = 0;
     Heard heard_;
-    Place place_;               // of the frame that is taken
+    Place place_{};             // of the frame that is taken
     isdn::Octets information_;  // of the frame that is taken
     // By number of the call, and side. Calls whose SETUP was seen.
     std::map<std::pair<std::uint64_t, calls::Side>, Dialled> dialled_;

@@ -7,8 +7,8 @@ namespace redaction {
 
 SegmentPieces::Key SegmentPieces::keyOf(const Segment& segment) {
     const isdn::CallReference& reference = segment.message.callReference;
-    return {segment.frame->interface, reference.value, segment.tei, segment.frame->transmitted,
-            reference.flag};
+    return {segment.frame->interface, segment.tei, reference.value, reference.flag,
+            segment.frame->transmitted};
 }
 
 SegmentPieces::Piece SegmentPieces::pieceOf(const Segment& segment) {

@@ -2,9 +2,9 @@
 #ifndef REDACTION_SEGMENTPIECES_H
 #define REDACTION_SEGMENTPIECES_H
 
-#include <compare>
 #include <cstdint>
 #include <map>
+#include <tuple>
 #include <vector>
 
 #include "capture/Frame.h"
@@ -43,14 +43,8 @@ class SegmentPieces {
     void giveUpAll(std::vector<Rebuilt>& givenUp);
 
   private:
-    struct Key {
-        const capture::Interface* interface;
-        std::uint64_t reference;
-        std::uint8_t tei;
-        bool transmitted;
-        bool flag;
-        auto operator<=>(const Key&) const = default;
-    };
+    // D channel, TEI, call reference and its flag, direction.
+    using Key = std::tuple<const capture::Interface*, std::uint8_t, std::uint64_t, bool, bool>;
     struct Piece {
         Rebuilt frame;
         std::size_t at;  // of the piece in the frame; it reaches to the frame's end

@@ -27,15 +27,14 @@ class Planner {
 
     void planLink() {
         const isdn::Layer2 link = isdn::parseLayer2(whole_);
-        if (link.problem != isdn::Problem::none)
-            add(link.information, Treatment::blank);
-        else if (link.carriesMessage())
+        const bool isSound = link.problem == isdn::Problem::none;
+        if (isSound && link.carriesMessage())
             planMessage(link.information);
-        else if (link.carriesTeiMessage())
+        else if (isSound && link.carriesTeiMessage())
             planTeiMessage(link.information);
-        else if (link.type == isdn::FrameType::FRMR)
+        else if (isSound && link.type == isdn::FrameType::FRMR)
             add(behind(link.information, frameRejectSize), Treatment::blank);
-        else if (link.type == isdn::FrameType::XID)
+        else if (isSound && link.type == isdn::FrameType::XID)
             planIdentification(link.information);
         else
             add(link.information, Treatment::blank);
