@@ -22,6 +22,7 @@
 #include "app/display.h"
 #include "decoder/lines.h"
 #include "tests/app/channels.h"
+#include "tests/app/records.h"
 #include "tests/support/fake_norv.h"
 #include "tests/support/test_system.h"
 
@@ -202,6 +203,36 @@ TEST_F(Road, AFrameAfterWhichNothingComesIsInTheFileBeforeTheDisplaySleepsAgain)
     Process.cancel();
     Process.join();
     EXPECT_GT(sizeThen, 0U);
+}
+
+// The second frame comes so soon after the first one is written that it is not written at once.
+TEST_F(Road, AFrameThatComesSoonAfterAnotherIsInTheFileOnceNothingMoreComes) {
+    send(0, 1);
+    constexpr int enough = 5;
+    std::atomic<int> naps = 0;
+    std::uintmax_t sizeOfFirst = 0;
+    std::uintmax_t sizeOfBoth = 0;
+    SleeplessSystem system;
+    system.insteadOfNapping = [&] {
+        if (arrivals->unwritten() != 0 || naps == enough)
+            return;
+        if (naps == 0) {
+            sizeOfFirst = log_.size();
+            auto second = std::make_unique<testing::Record>();
+            testing::fill(*second, testing::received, 1, {0x00, 0x01, 0x73});
+            HANDLE_L2Trace_events(nullptr, 32, second.release());
+        }
+        sizeOfBoth = log_.size();
+        ++naps;
+        naps.notify_all();
+    };
+    Process.start(nullptr);
+    for (int seen = naps; seen < enough; seen = naps)
+        naps.wait(seen);
+    Process.cancel();
+    Process.join();
+    EXPECT_GT(sizeOfFirst, 0U);
+    EXPECT_GT(sizeOfBoth, sizeOfFirst);
 }
 
 TEST_F(Road, ACancelledDisplayShowsWhatHasArrivedWhenTheArrivalsAreClosed) {
