@@ -3,8 +3,10 @@
 
     bench/read_speed.py [--frames 1000000] [--rounds 5] [--lapdread build/release/bin/lapdread]
 
-Files are in memory (/dev/shm) and written once before anything is measured. Prints medians: of the time that passed, which a
-busy machine spoils, and of the processor's time.
+Files are in memory (/dev/shm) and written once before anything is measured. In each round every command runs once, so that all
+of them meet the same neighbours. Prints the medians of the rounds, and below them ratios: each is taken within a round, and the
+median of the rounds is shown. With one job, ratios are of the processor's time, since a busy machine spoils the time that passes; with
+two they are of the time that passes.
 """
 
 import argparse
@@ -18,6 +20,7 @@ import tempfile
 import time
 
 ROOT = pathlib.Path(__file__).resolve().parents[1]
+CAT, SUMMARY, VERBOSE = "cat of the decoded text", "tshark, a line a frame", "tshark -V"
 
 
 def repeated(path, frames):
@@ -37,20 +40,40 @@ def repeated(path, frames):
     return path
 
 
-def measure(command, out, rounds):
-    """Median seconds that passed, median seconds of the processor, most memory in MB."""
-    passed, worked, memory = [], [], 0
-    for _ in range(rounds):
+class Row:
+    """A command and what it took in each round."""
+
+    def __init__(self, name, words):
+        self.name, self.words = name, [str(word) for word in words]
+        self.passed, self.worked = [], []  # seconds
+
+    def measure(self, out):
         with open(out, "r+b" if os.path.exists(out) else "wb") as file:
             begin = time.monotonic()
-            process = subprocess.Popen([str(word) for word in command], stdout=file, stderr=subprocess.DEVNULL)
+            process = subprocess.Popen(self.words, stdout=file, stderr=subprocess.DEVNULL)
             _, status, usage = os.wait4(process.pid, 0)
-            passed.append(time.monotonic() - begin)
-            worked.append(usage.ru_utime + usage.ru_stime)
-            memory = max(memory, usage.ru_maxrss / 1024)
-            if status != 0:
-                raise SystemExit(f"{command} failed")
-    return statistics.median(passed), statistics.median(worked), memory
+        self.passed.append(time.monotonic() - begin)
+        self.worked.append(usage.ru_utime + usage.ru_stime)
+        if status != 0:
+            raise SystemExit(f"{self.words} failed")
+
+
+def ratio(rows, slow, fast, jobs):
+    """How many times as long the slow one takes: the median of the rounds."""
+    seconds = (lambda row: row.worked) if jobs == 1 else (lambda row: row.passed)
+    pairs = zip(seconds(rows[slow]), seconds(rows[f"lapdread {fast}, {jobs} jobs"]))
+    return statistics.median(a / b for a, b in pairs)
+
+
+def print_ratios(rows, log_size):
+    for jobs, share, times in ((1, 50, 12), (2, 85, 20)):
+        print(f"decode, {jobs} jobs: {100 * ratio(rows, CAT, 'decode', jobs):.0f} % of cat (target {share}), "
+              f"{ratio(rows, VERBOSE, 'decode', jobs):.1f} times tshark -V (target {times})")
+    print(f"list, 2 jobs: {ratio(rows, SUMMARY, 'list', 2):.1f} times tshark (target 8)")
+    for jobs in (1, 2):
+        row = rows[f"lapdread log to pcapng, {jobs} jobs"]
+        seconds = statistics.median(row.worked if jobs == 1 else row.passed)
+        print(f"log to pcapng, {jobs} jobs: {log_size / seconds / 1e6:.0f} MB of log a second (target 400)")
 
 
 def main():
@@ -62,26 +85,31 @@ def main():
     folder = pathlib.Path(tempfile.mkdtemp(prefix="read-speed.", dir="/dev/shm"))
     try:
         capture = repeated(folder / "capture.pcap", options.frames)
-        log, text, out = folder / "capture.log", folder / "decoded", folder / "out"
+        log, text = folder / "capture.log", folder / "decoded"
         lapdread = options.lapdread
         subprocess.run([lapdread, "convert", "--quiet", "--to", "log", "-o", log, capture], check=True)
         subprocess.run([lapdread, "decode", "--quiet", "-o", text, capture], check=True)
-        shutil.copy(text, out)
-        rows = [("cat of the decoded text", ["cat", text]),
-                ("tshark, a line a frame", ["tshark", "-n", "-r", capture]),
-                ("tshark -V", ["tshark", "-n", "-V", "-r", capture])]
+        every = [Row(CAT, ["cat", text]), Row(SUMMARY, ["tshark", "-n", "-r", capture]),
+                 Row(VERBOSE, ["tshark", "-n", "-V", "-r", capture])]
         for jobs in (1, 2):
             for words in ("list", "decode", "convert --to jsonl", "convert --to csv", "convert --to pcapng"):
-                rows.append((f"lapdread {words}, {jobs} jobs",
-                             [lapdread, *words.split(), "--quiet", "--jobs", jobs, capture]))
-            rows.append((f"lapdread log to pcapng, {jobs} jobs",
-                         [lapdread, "convert", "--quiet", "--to", "pcapng", "--jobs", jobs, log]))
+                every.append(Row(f"lapdread {words}, {jobs} jobs",
+                                 [lapdread, *words.split(), "--quiet", "--jobs", jobs, capture]))
+            every.append(Row(f"lapdread log to pcapng, {jobs} jobs",
+                             [lapdread, "convert", "--quiet", "--to", "pcapng", "--jobs", jobs, log]))
         print(f"{options.frames} frames, {log.stat().st_size / 1e6:.0f} MB of log, {os.cpu_count()} processors, load "
-              f"{os.getloadavg()[0]:.1f}")
-        for name, command in rows:
-            passed, worked, memory = measure(command, out, options.rounds)
-            print(f"{name:36} {passed:7.2f} s passed {worked:7.2f} s worked {options.frames / worked / 1e6:7.2f} M frames/s "
-                  f"{memory:6.1f} MB")
+              f"{os.getloadavg()[0]:.1f}, {options.rounds} rounds")
+        # Each command has an output of its own, which it has written once before.
+        for measured in range(-1, options.rounds):
+            for number, row in enumerate(every):
+                row.measure(folder / f"out{number}")
+                if measured < 0:
+                    row.passed.clear()
+                    row.worked.clear()
+        for row in every:
+            passed, worked = statistics.median(row.passed), statistics.median(row.worked)
+            print(f"{row.name:36} {passed:7.2f} s passed {worked:7.2f} s worked {options.frames / worked / 1e6:7.2f} M frames/s")
+        print_ratios({row.name: row for row in every}, log.stat().st_size)
     finally:
         shutil.rmtree(folder)
 

@@ -14,8 +14,8 @@ namespace decoder {
 // purpose.
 void timeLines(bool transmitted, unsigned int timestamp, std::string_view localTime);
 
-// Makes the text of a local time. Frames of the same second share the text, because making it takes as long
-// as decoding a frame. Only one thread at a time may use an object.
+// Makes the text of a local time. Frames of the same half minute share the text but for its seconds, because
+// making it takes as long as decoding a frame. Only one thread at a time may use an object.
 class LocalTime {
   public:
     // `second` counts from 1970. The text has the C library's form of 24 characters, and a line end. It is
@@ -23,7 +23,11 @@ class LocalTime {
     std::string_view of(std::time_t second);
 
   private:
-    std::time_t shown_ = -1;
+    // Puts the text forward or back within its minute, if that is all that differs.
+    bool moveTo(std::time_t second);
+
+    bool hasDate_ = false;
+    std::time_t shown_ = 0;
     long shownZone_ = 0;
     std::array<char, 26> text_{};
 };

@@ -17,8 +17,12 @@ void Names::keep(capture::Item& item) {
         }
         frame.interface = lastKept_;
     }
-    if (frame.place.file != lastFile_)
-        lastFile_ = *files_.emplace(frame.place.file).first;
+    // The name of a file stays where it is as long as its reader.
+    const std::string_view file = frame.place.file;
+    if (file.data() != lastFileGiven_.data() || file.size() != lastFileGiven_.size()) {
+        lastFile_ = *files_.emplace(file).first;
+        lastFileGiven_ = file;
+    }
     frame.place.file = lastFile_;
 }
 
@@ -35,6 +39,7 @@ capture::Reader::Next Sequence::next(capture::Item& item) {
         if (got != Next::end || nextInput_ == inputs_.size())
             return got;
         current_ = nullptr;
+        names_.readerIsGone();
     }
 }
 

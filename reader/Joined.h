@@ -21,6 +21,11 @@ using Opener = std::function<std::unique_ptr<capture::Reader>()>;
 class Names {
   public:
     void keep(capture::Item& item);
+    // The reader has gone, and what it gave may stand elsewhere or be another's.
+    void readerIsGone() {
+        lastGiven_ = nullptr;
+        lastFileGiven_ = {};
+    }
 
   private:
     std::list<capture::Interface> interfaces_;
@@ -28,6 +33,7 @@ class Names {
     const capture::Interface* lastGiven_ = nullptr;
     capture::Interface lastSeen_;
     const capture::Interface* lastKept_ = nullptr;
+    std::string_view lastFileGiven_;
     std::string_view lastFile_;
 };
 

@@ -54,6 +54,45 @@ TEST(LocalTimeText, FollowsAZoneThatChangesWithinASecond) {
     tzset();
 }
 
+// The times at which offsets change, of zones that differ from UTC by hours, by minutes and by seconds.
+TEST(LocalTimeText, IsTheCLibrarysOverEveryChangeOfAnOffset) {
+    struct Change {
+        const char* zone;
+        std::time_t at;
+    };
+    constexpr Change changes[] = {
+        {"Europe/Berlin", 1774746000},
+        {"Europe/Berlin", 1793494800},
+        {"Asia/Kolkata", 1795260333},
+        {"Africa/Monrovia", 63593070},
+        {"Australia/Lord_Howe", 1775314800},
+        {"America/St_Johns", 562125660},
+        {"Europe/Amsterdam", -1025741972},
+        {"right/UTC", 1483228826},
+        {"UTC", 0},
+    };
+    for (const Change& change : changes) {
+        setenv("TZ", change.zone, 1);
+        tzset();
+        LocalTime time;
+        for (const int step : {1, 7, -1, -13}) {
+            for (int i = -130; i <= 130; ++i) {
+                const std::time_t second = change.at + i * step;
+                char expected[26];
+                ASSERT_NE(ctime_r(&second, expected), nullptr);
+                ASSERT_EQ(time.of(second), expected) << change.zone << " " << second;
+            }
+        }
+    }
+    setenv("TZ", "UTC", 1);
+    tzset();
+}
+
+TEST(LocalTimeText, OfTheFirstMomentIsADateWhateverTheMoment) {
+    for (const std::time_t second : {std::time_t{-1}, std::time_t{0}, std::time_t{1}})
+        EXPECT_EQ(LocalTime().of(second).size(), 25U);
+}
+
 TEST(LocalTimeText, OfAYearThatTheCLibraryCannotShowIsEmpty) {
     LocalTime time;
     EXPECT_EQ(time.of(std::time_t{1} << 62), "\n");
