@@ -6,6 +6,7 @@ import json
 import os
 import re
 import stat
+import struct
 import unittest
 
 from lapdread_harness import EXAMPLES, Folder, output, run
@@ -172,6 +173,22 @@ class Redact(Folder):
             out = run("redact", "--to", form, "--key", self.key, source)[1]
             for secret in (b"Meier", b"0301234567", b"Schulze"):
                 self.assertNotIn(secret, out, form)
+
+    def test_drops_the_comments_of_a_capture(self):
+        def block(kind, content):
+            size = len(content) + 12
+            return struct.pack("<II", kind, size) + content + struct.pack("<I", size)
+
+        comment = b"call of Frau Meier, 030123456789"
+        packet = struct.pack("<IIIII", 0, 0, 7, 3, 3) + b"\x00\x01\x7f\x00" + struct.pack("<HH", 1, 32) + comment
+        source = self.folder / "trace.pcapng"
+        source.write_bytes(block(0x0A0D0D0A, struct.pack("<IHHq", 0x1A2B3C4D, 1, 0, -1)) +
+                           block(1, struct.pack("<HHI", 203, 0, 0)) + block(6, packet))
+        self.assertIn("Frau Meier", output("convert", "--to", "jsonl", source))
+        for form in FORMS:
+            out = run("redact", "--to", form, source)[1]
+            self.assertNotIn(b"Meier", out, form)
+            self.assertNotIn(b"030123456789", out, form)
 
     def test_makes_a_key_for_its_owner_and_says_so(self):
         key = self.folder / "key"

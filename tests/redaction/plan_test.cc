@@ -41,6 +41,8 @@ constexpr ElementCase elementCases[] = {
     {"* and # stay", Variant::net5, "2c 05 2a 32 31 2a 23", "2c 05 2a 78 78 2a 23"},
     {"subaddress, user-specified", Variant::net5, "71 04 a0 12 34 56", "71 04 a0 ee ee ee"},
     {"subaddress, NSAP: its authority stays", Variant::net5, "6d 05 80 50 41 42 43", "6d 05 80 50 78 78 78"},
+    {"subaddress behind an octet that says that its group goes on", Variant::net5,
+     "71 04 20 12 34 56", "71 04 20 00 00 00"},
     {"display", Variant::net5, "28 04 4a 6f 68 6e", "28 04 78 78 78 78"},
     {"display with its kind", Variant::ni2, "28 05 b1 4a 6f 68 6e", "28 05 b1 78 78 78 78"},
     {"display of fields: tags and lengths stay", Variant::dms100,
