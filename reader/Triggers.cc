@@ -30,7 +30,8 @@ void readTrigger(const std::string& value, RecordOptions& to) {
     if (of.empty() || std::find(std::begin(filters), std::end(filters), name) == std::end(filters))
         throw UsageError(value + " is no trigger: check:error, cause:34,38 or another filter and its values");
     const FilterWord word{name, of};
-    Filter({word});  // which throws for a wrong value
+    const Filter understood({word});  // throws for a wrong value
+    static_cast<void>(understood);
     to.onFrames.push_back(word);
 }
 
