@@ -48,8 +48,8 @@ std::int64_t Durations::quantile(double share) const {
     if (wanted >= count_)
         return longest_;
     std::uint64_t seen = 0;
-    for (const auto& [step, count] : steps_) {
-        seen += count;
+    for (const auto& [step, times] : steps_) {
+        seen += times;
         if (seen >= wanted)
             return static_cast<std::int64_t>(beginOf(step)) * millisecond;
     }

@@ -91,24 +91,24 @@ void Figures::countCauses(const Call& call) {
 }
 
 void Figures::countTraffic(const Call& call) {
-    Traffic& traffic = traffic_[indexOf(call.origin)];
+    Traffic& own = traffic_[indexOf(call.origin)];
     if (call.setupRepeated)
-        ++traffic.setupRepeated;
-    std::uint64_t* const excluded = call.kind == Kind::signalling   ? &traffic.signalling
-                                    : call.beforeTrace              ? &traffic.beforeTrace
-                                    : call.gaveWay                  ? &traffic.gaveWay
-                                    : call.outcome == Outcome::open ? &traffic.open
+        ++own.setupRepeated;
+    std::uint64_t* const excluded = call.kind == Kind::signalling   ? &own.signalling
+                                    : call.beforeTrace              ? &own.beforeTrace
+                                    : call.gaveWay                  ? &own.gaveWay
+                                    : call.outcome == Outcome::open ? &own.open
                                                                     : nullptr;
     if (excluded != nullptr) {
         ++*excluded;
         return;
     }
     const bool answered = call.outcome == Outcome::answered;
-    ++traffic.seizures;
-    ++traffic.byOutcome[static_cast<std::size_t>(call.outcome)];
-    traffic.answered += answered ? 1 : 0;
-    traffic.reached += hasReached(call) ? 1 : 0;
-    traffic.failed += hasFailed(call) ? 1 : 0;
+    ++own.seizures;
+    ++own.byOutcome[static_cast<std::size_t>(call.outcome)];
+    own.answered += answered ? 1 : 0;
+    own.reached += hasReached(call) ? 1 : 0;
+    own.failed += hasFailed(call) ? 1 : 0;
     const std::optional<HourKey> key = hourOf(call.begin);
     if (!key || (hours_.size() >= Occupancy::mostHours && !hours_.contains(*key)))
         return;

@@ -72,14 +72,14 @@ void Occupancy::begin(const Message& message, const Call& call) {
     const Moment moment = momentOf(message);
     std::vector<ChannelKey>& held = held_[call.number];
     for (const ChannelKey& key : keys) {
-        auto found = group.channels.find(key);
-        if (found == group.channels.end()) {
+        auto place = group.channels.find(key);
+        if (place == group.channels.end()) {
             if (channels_ >= mostChannels)
                 continue;
             ++channels_;
-            found = group.channels.emplace(key, Channel()).first;
+            place = group.channels.emplace(key, Channel()).first;
         }
-        Channel& channel = found->second;
+        Channel& channel = place->second;
         ++channel.calls;
         held.push_back(key);
         channel.holders.push_back(call.number);
@@ -148,16 +148,16 @@ void Occupancy::found(const Finding& finding) {
 }
 
 void Occupancy::finish(const std::vector<Span>& spans) {
-    std::map<std::uint32_t, std::pair<std::int64_t, std::int64_t>> heard;
+    std::map<std::uint32_t, std::pair<std::int64_t, std::int64_t>> spanOf;
     for (const Span& span : spans) {
         Group& group = groups_[span.group];
         group.dChannels += (group.dChannels.empty() ? "" : ",") + span.dChannel;
-        const auto [entry, isNew] = heard.try_emplace(span.group, span.from, span.until);
+        const auto [entry, isNew] = spanOf.try_emplace(span.group, span.from, span.until);
         entry->second.first = std::min(entry->second.first, span.from);
         entry->second.second = std::max(entry->second.second, span.until);
     }
     for (auto& [number, group] : groups_) {
-        const auto [from, until] = heard[number];
+        const auto [from, until] = spanOf[number];
         group.heard = until - from;
         for (auto& [key, channel] : group.channels) {
             if (channel.holders.empty())

@@ -57,7 +57,7 @@ bool isCompared(const isdn::Field& field) {
 }
 
 // "name", and "name (2)" when it comes for the second time.
-std::string counted(std::map<std::string, unsigned>& seen, std::string name) {
+std::string counted(std::map<std::string, unsigned>& seen, const std::string& name) {
     const unsigned times = ++seen[name];
     return times == 1 ? name : name + " (" + std::to_string(times) + ")";
 }
