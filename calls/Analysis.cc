@@ -8,6 +8,7 @@
 
 #include "calls/CallFindings.h"
 #include "calls/CallTable.h"
+#include "calls/Carriers.h"
 #include "calls/ChannelClock.h"
 #include "calls/Channels.h"
 #include "calls/FindingKinds.h"
@@ -47,7 +48,7 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
           patterns_(*this) {}
 
     // The message's time is the group's.
-    void take(const Message& message, const LinkWitness& link) {
+    void take(const Message& message, const LinkWitness& link, Carriers& carriers) {
         links_[message.layer2.tei] = &link;
         maintenance_.take(message);
         const Call* const call = table_.take(message);
@@ -61,8 +62,10 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
             findings_.heardWithoutCall(message);
         else
             noteChangeover(message);
+        carriers.heard(message, call, carried_);
         listener_.heard(message, call);
     }
+    const Carriers::Tell& carried() const { return carried_; }
     // The clock of one of its D channels has come to `at`. The clocks of several differ a little; the group's
     // own is the latest of them, so that it never goes back.
     void advance(std::int64_t at) {
@@ -135,6 +138,9 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
     Listener& listener_;
     std::int64_t now_ = std::numeric_limits<std::int64_t>::min();
     std::string active_;                           // the D channel on which a call was heard last
+    Carriers::Tell carried_ = [this](const Message& message, const Call* call) {
+        listener_.carried(message, call);
+    };
     std::array<const LinkWitness*, 128> links_{};  // by TEI, of the D channel that was used last
     CallTable table_;
     Waits waits_;
@@ -175,19 +181,28 @@ struct Analysis::Channel {
         linkFindings.restarted();
         group.table().boardRestarted();
     }
+    // A frame that carries a message.
+    void take(const Message& message, const Timers& timers) {
+        if (links.marks().accepted.value_or(false))
+            accept(message, timers);
+        else
+            carriers.take(message, links.marks(), group.table(), group.carried());
+    }
     // A frame that the receiver's layer 2 hands up.
     void accept(Message message, const Timers& timers) {
         WitnessKeeper& keeper = keepers[message.layer2.tei];
         Segments& pieces = segments[message.layer2.tei];
         const Segments::Taken taken = pieces.take(message);
         reportUnfinished(pieces, message, timers);
-        if (taken == Segments::Taken::kept)
+        if (taken == Segments::Taken::kept) {
+            carriers.take(message, links.marks(), group.table(), group.carried());
             return;
+        }
         if (taken == Segments::Taken::outOfOrder)
             report(findings::segmentsUnfinished, message, message.number,
                    "a SEGMENT does not follow those before it");
         message.at = group.now();
-        group.take(message, keeper.witness());
+        group.take(message, keeper.witness(), carriers);
     }
     void reportUnfinished(Segments& pieces, const Message& message, const Timers& timers) {
         while (const std::uint64_t frame = pieces.unfinished(message.at, timers.t314 + timers.slack))
@@ -209,6 +224,7 @@ struct Analysis::Channel {
     isdn::Variant variant;
     std::map<std::uint8_t, WitnessKeeper> keepers;  // by TEI, of call control
     std::map<std::uint8_t, Segments> segments;      // by TEI
+    Carriers carriers;
 };
 
 Analysis::Analysis(const Options& options, Listener& listener)
@@ -274,8 +290,9 @@ const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
         if (keptLayer2.carriesMessage())
             channel.accept(channel.messageOf(kept, late.number, at, keptLayer2), options_.timers);
     }
-    if (layer2.carriesMessage() && marks.accepted.value_or(false))
-        channel.accept(channel.messageOf(frame, number, at, layer2), options_.timers);
+    channel.carriers.advance(at, channel.group.table(), channel.group.carried());
+    if (layer2.carriesMessage())
+        channel.take(channel.messageOf(frame, number, at, layer2), options_.timers);
     return marks;
 }
 
@@ -296,6 +313,7 @@ void Analysis::advance(std::int64_t nanoseconds) {
         channel->clock.advance(nanoseconds);
         channel->group.advance(channel->clock.now());
         channel->linkFindings.advance(channel->clock.now());
+        channel->carriers.advance(channel->clock.now(), channel->group.table(), channel->group.carried());
     }
 }
 
@@ -303,6 +321,7 @@ void Analysis::finish() {
     for (const auto& [name, channel] : channels_) {
         channel->links.finish();
         channel->linkFindings.finish(channel->links);
+        channel->carriers.finish(channel->group.table(), channel->group.carried());
     }
     for (const auto& group : groups_)
         group->finish();

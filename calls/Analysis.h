@@ -30,6 +30,11 @@ class Listener {
     // A message that the receiver's layer 2 has accepted, put together if it came in segments. `call` is null
     // if it belongs to none. The number of the frame may be lower than that of the frame handed in last.
     virtual void heard(const Message& /*message*/, const Call* /*call*/) {}
+    // A frame that carries a message without being the one by which it is heard: a copy that the receiver's
+    // layer 2 does not hand up, or a segment. `call` is null if it belongs to none. It may come up to ten
+    // seconds of the trace late. Every frame of call control that carries a message comes either here or in
+    // `heard`; only one that stood behind a hole for longer than that may come here first and there later.
+    virtual void carried(const Message& /*message*/, const Call* /*call*/) {}
     // The call has ended; stragglers may still be heard. Nothing is said of a call that outlives the trace.
     virtual void ended(const Call& /*call*/) {}
     // Nothing will change in the call any more. Calls that share a table come in the order of their end.

@@ -22,6 +22,12 @@ bool hasReferenceOfItsOwn(const isdn::Layer3& layer3) {
            !layer3.callReference.dummy() && !layer3.callReference.global();
 }
 
+CallKey keyOf(const Message& message) {
+    const bool toOrigin = message.layer3.callReference.flag;
+    return {message.layer3.callReference.value, message.layer2.tei,
+            toOrigin ? other(message.from()) : message.from()};
+}
+
 bool namesNullState(const Message& message) {
     if (message.layer3.type != type::status)
         return false;
@@ -63,9 +69,7 @@ Call* CallTable::take(const Message& message) {
     advance(message.at);
     if (!hasReferenceOfItsOwn(message.layer3))
         return nullptr;
-    const bool toOrigin = message.layer3.callReference.flag;
-    const CallKey key{message.layer3.callReference.value, message.layer2.tei,
-                      toOrigin ? other(message.from()) : message.from()};
+    const CallKey key = keyOf(message);
     Life* const life = initiates(message.layer3) ? &beginOrRepeat(message, key) : belongsTo(message, key);
     if (life == nullptr) {
         observer_.stray(message);
@@ -73,6 +77,16 @@ Call* CallTable::take(const Message& message) {
     }
     hear(*life, message);
     return &life->call;
+}
+
+const Call* CallTable::callOf(const Message& message) const {
+    if (!hasReferenceOfItsOwn(message.layer3))
+        return nullptr;
+    const CallKey key = keyOf(message);
+    if (const Life* const life = find(key); life != nullptr)
+        return &life->call;
+    const Life* const offered = find({key.value, isdn::groupTei, key.origin});
+    return offered != nullptr && offered->joined.test(key.tei) ? &offered->call : nullptr;
 }
 
 Life* CallTable::find(const CallKey& key) const {

@@ -68,6 +68,9 @@ class CallTable {
     // another protocol, a stray).
     Call* take(const Message& message);
 
+    // The call whose reference a message bears, without taking the message; null if none is known.
+    const Call* callOf(const Message& message) const;
+
     // RESTART ACKNOWLEDGE has passed: ends the calls whose channel it names.
     void restarted(const Message& acknowledge);
 

@@ -13,6 +13,7 @@ constexpr std::int64_t ticksOutOfOrder =
 
 std::int64_t ChannelClock::at(const capture::Frame& frame) {
     restarted_ = false;
+    since_ = 0;
     const bool hasClock = frame.clock != capture::Clock::none;
     hasTime_ = hasTime_ || hasClock || frame.ticks.has_value();
     const std::int64_t passed = hasClock && begun_ ? std::max<std::int64_t>(frame.time - lastTime_, 0) : 0;

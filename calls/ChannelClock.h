@@ -17,14 +17,17 @@ class ChannelClock {
     // The last frame's ticks fell by more than 8 ms, other than by going round: the board was restarted, or
     // another trace begins.
     bool hasRestarted() const { return restarted_; }
-    std::int64_t now() const { return now_; }
-    // No frame has come, but time has passed (a trace that is followed).
-    void advance(std::int64_t nanoseconds) { now_ += nanoseconds; }
+    // Of the last frame, and what has passed since.
+    std::int64_t now() const { return now_ + since_; }
+    // No frame has come, but time has passed (a trace that is followed). The next frame tells exactly how
+    // much, so that durations are those of the frames' clocks alone.
+    void advance(std::int64_t nanoseconds) { since_ += nanoseconds; }
     // Whether frames have times at all; without them nothing can be said about timers.
     bool hasTime() const { return hasTime_; }
 
   private:
-    std::int64_t now_ = 0;
+    std::int64_t now_ = 0;    // at the last frame
+    std::int64_t since_ = 0;  // of another clock, since then
     std::int64_t lastTime_ = 0;
     std::uint32_t lastTicks_ = 0;
     bool begun_ = false;

@@ -139,91 +139,6 @@ constexpr std::array fields{
     CallField{"flags", text, [](std::string& to, const Call& call, TimeText&) { to += flagsOf(call); }},
 };
 
-// Columns of the line for people: what they are called, how wide, and what stands in them.
-struct LineColumn {
-    std::string_view heading;
-    unsigned width;
-    bool right;
-    void (*put)(std::string& to, const Call& call, TimeText& times);
-};
-
-void putSeconds(std::string& to, const std::optional<std::int64_t>& nanoseconds) {
-    if (nanoseconds)
-        appendSeconds(to, *nanoseconds);
-}
-
-void putParties(std::string& to, const Call& call) {
-    appendSafe(to, call.calling.digits.empty() ? "-" : call.calling.digits);
-    to += " > ";
-    appendSafe(to, call.called.digits.empty() ? "-" : call.called.digits);
-}
-
-void putChannels(std::string& to, const Call& call) {
-    to += call.askedWords.empty() ? "-" : call.askedWords;
-    if (call.granted && call.grantedWords != call.askedWords)
-        to += " > " + call.grantedWords;
-}
-
-// "peer: cause 17 user busy, remote user; then 16".
-void putClearing(std::string& to, const Call& call) {
-    if (call.endedBy == calls::EndedBy::open)
-        return;
-    to += nameOf(call.clearedBy);
-    to += ": ";
-    std::string words =
-        call.cause ? call.cause->words : std::string(call.clearingSeen ? "no cause" : nameOf(call.endedBy));
-    appendSafe(to, words);
-    if (call.causeBefore) {
-        to += "; before: ";
-        appendSafe(to, call.causeBefore->words);
-    }
-    for (const calls::CauseGiven& cause : call.laterCauses) {
-        to += "; then ";
-        appendSafe(to, cause.words);
-    }
-}
-
-constexpr std::array columns{
-    LineColumn{"call", 5, true,
-               [](std::string& to, const Call& call, TimeText&) { appendNumber(to, call.number); }},
-    LineColumn{"start", 29, false,
-               [](std::string& to, const Call& call, TimeText& times) { putInstant(to, call.begin, times); }},
-    LineColumn{"dir", 8, false,
-               [](std::string& to, const Call& call, TimeText&) {
-                   to += call.origin == calls::Side::us ? "TX " : "RX ";
-                   to += directionOf(call);
-               }},
-    LineColumn{"ref", 4, false, [](std::string& to, const Call& call, TimeText&) { putReference(to, call); }},
-    LineColumn{"calling > called", 24, false,
-               [](std::string& to, const Call& call, TimeText&) { putParties(to, call); }},
-    LineColumn{"channel", 9, false,
-               [](std::string& to, const Call& call, TimeText&) { putChannels(to, call); }},
-    LineColumn{"respond", 8, true,
-               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.firstResponse); }},
-    LineColumn{"alert", 8, true,
-               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.alerting); }},
-    LineColumn{"connect", 8, true,
-               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.connect); }},
-    LineColumn{"duration", 9, true,
-               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.duration); }},
-    LineColumn{"outcome", 12, false,
-               [](std::string& to, const Call& call, TimeText&) {
-                   to += call.kind == calls::Kind::signalling ? nameOf(call.kind) : nameOf(call.outcome);
-               }},
-    LineColumn{"cleared by: cause", 0, false,
-               [](std::string& to, const Call& call, TimeText&) { putClearing(to, call); }},
-    LineColumn{"flags", 0, false,
-               [](std::string& to, const Call& call, TimeText&) {
-                   if (const std::string flags = flagsOf(call); !flags.empty())
-                       to += "[" + flags + "]";
-               }},
-};
-
-void trimEnd(std::string& to, std::size_t start) {
-    while (to.size() > start && to.back() == ' ')
-        to.pop_back();
-}
-
 }  // namespace
 
 std::span<const CallField> callFields() { return fields; }
@@ -276,32 +191,6 @@ void appendCallJson(std::string& to, const Call& call, TimeText& times) {
         appendNumber(to, call.frames[i]);
     }
     to += "]}\n";
-}
-
-std::string callHeading() {
-    std::string heading;
-    for (const LineColumn& column : columns) {
-        if (!heading.empty())
-            heading += ' ';
-        const std::size_t start = heading.size();
-        heading += column.heading;
-        padTo(heading, start, column.width, column.right);
-    }
-    return heading;
-}
-
-void appendCallLine(std::string& to, const Call& call, TimeText& times) {
-    const std::size_t lineStart = to.size();
-    bool first = true;
-    for (const LineColumn& column : columns) {
-        if (!first)
-            to += ' ';
-        first = false;
-        const std::size_t start = to.size();
-        column.put(to, call, times);
-        padTo(to, start, column.width, column.right);
-    }
-    trimEnd(to, lineStart);
 }
 
 }  // namespace reader
