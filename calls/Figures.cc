@@ -61,13 +61,20 @@ std::optional<double> Traffic::answerSeizureRatio() const { return shareOf(answe
 
 std::optional<double> Traffic::networkEffectivenessRatio() const { return shareOf(reached, seizures); }
 
-void Figures::heard(const Message& message) {
+void Figures::count(Messages& messages, const Message& message) {
     const isdn::Layer3& layer3 = message.layer3;
     const bool known = layer3.discriminator == isdn::callControl || isdn::isMaintenance(layer3.discriminator);
     MessageKind kind;
     if (known && layer3.hasType)
         kind = {layer3.discriminator, true, layer3.national, layer3.type};
-    ++messages_[kind][indexOf(message.from())];
+    ++messages[kind][indexOf(message.from())];
+}
+
+void Figures::heard(const Messages& messages) {
+    for (const auto& [kind, bySide] : messages) {
+        for (std::size_t side = 0; side < bySide.size(); ++side)
+            messages_[kind][side] += bySide[side];
+    }
 }
 
 void Figures::gone(const Call& call) {

@@ -85,12 +85,18 @@ struct HourFigures {
 // Takes what a Listener hears. Memory is bounded whatever the calls are.
 class Figures {
   public:
-    void heard(const Message& message);
+    // How many there were of each kind, by side.
+    using Messages = std::map<MessageKind, std::array<std::uint64_t, 2>>;
+
+    static void count(Messages& messages, const Message& message);
+
+    void heard(const Message& message) { count(messages_, message); }
+    // Messages that were counted elsewhere until it was known whether they count.
+    void heard(const Messages& messages);
     // A call in which nothing will change any more.
     void gone(const Call& call);
 
-    // By side.
-    const std::map<MessageKind, std::array<std::uint64_t, 2>>& messages() const { return messages_; }
+    const Messages& messages() const { return messages_; }
     const std::map<CauseKey, CauseCounts>& causes() const { return causes_; }
     // Calls that were cleared without a cause in the message that should have had one.
     std::uint64_t withoutCause() const { return withoutCause_; }
@@ -105,7 +111,7 @@ class Figures {
     void countCauses(const Call& call);
     void countTraffic(const Call& call);
 
-    std::map<MessageKind, std::array<std::uint64_t, 2>> messages_;
+    Messages messages_;
     std::map<CauseKey, CauseCounts> causes_;
     std::uint64_t withoutCause_ = 0;
     std::array<std::array<Durations, 2>, measureCount> times_;

@@ -1,64 +1,28 @@
 #include "reader/Analysed.h"
 
-#include <array>
-#include <string_view>
+#include <string>
+#include <utility>
 
-#include "calls/standardVariant.h"
+#include "reader/Feed.h"
+#include "reader/forms.h"
 
 namespace reader {
 
-namespace {
-
-// Why frames may be missing, in a few words, by kind of item; empty if none are.
-std::string_view reasonOf(capture::Item::Kind kind) {
-    using Kind = capture::Item::Kind;
-    switch (kind) {
-        case Kind::lost:
-            return "Frames Lost";
-        case Kind::notQueued:
-            return "Enqueue Failed";
-        case Kind::notTaken:
-            return "Get iemsg failed";
-        case Kind::dropped:
-            return "packets dropped by the capture";
-        case Kind::cut:
-            return "a frame that is cut off";
-        case Kind::mixed:
-            return "two traces in one file";
-        case Kind::unproved:
-            return "lines that are no recorder's";
-        case Kind::damaged:
-            return "damage of the file";
-        default:
-            return {};
-    }
-}
-
-}  // namespace
-
-calls::Options analysisOptions(const Options& options) {
-    calls::Options to;
-    to.timers = options.calls.timers;
-    to.role = options.input.role;
-    to.groups = options.calls.groups;
-    if (options.input.variant != capture::Variant::unknown)
-        to.variant = calls::standardVariant(options.input.variant);
-    return to;
-}
-
-void tell(calls::Analysis& analysis, const capture::Item& item) {
-    const capture::Interface& interface = *item.frame.interface;
-    if (item.kind == capture::Item::Kind::oversized)
-        analysis.mayLack(interface, item.frame.transmitted ? calls::Side::us : calls::Side::peer);
-    else if (item.kind == capture::Item::Kind::restart || item.kind == capture::Item::Kind::run ||
-             item.kind == capture::Item::Kind::replaced)
-        analysis.restarted(interface);
-    else if (const std::string_view reason = reasonOf(item.kind); !reason.empty())
-        analysis.mayMiss(interface, reason);
-}
-
 Analysed::Analysed(const Options& options)
-    : analysis_(analysisOptions(options), *this), filtered_(!options.filters.empty()) {}
+    : callFilter_(options.filters),
+      analysis_(analysisOptions(options), *this),
+      filtered_(!Filter(options.filters).isEmpty()) {}
+
+void Analysed::run(Session& session, Chatter& chatter) {
+    session.run(*this, [] { return std::make_unique<NoComposer>(); });
+    analysis_.finish();
+    if (const std::uint64_t dropped = analysis_.dropped(); dropped != 0)
+        chatter.note("calls that were let go before their end, since too many were alive: " +
+                     std::to_string(dropped));
+    if (letGo_ != 0)
+        chatter.note("findings that were let go before the end of their call told whether it is wanted: " +
+                     std::to_string(letGo_));
+}
 
 void Analysed::take(Chunk& chunk, std::size_t count) {
     std::size_t piece = 0;
@@ -82,10 +46,8 @@ void Analysed::look(const Seen& seen, bool passes) {
         while (passed_.size() > framesRemembered)
             passed_.pop_front();
     }
-    if (seen.isFrame())
-        analysis_.take(seen.frame(), seen.number);
-    else
-        tell(analysis_, *seen.item);
+    see(seen);
+    feed(analysis_, seen);
 }
 
 bool Analysed::hasPassed(std::uint64_t frame) const {
@@ -98,16 +60,53 @@ void Analysed::heard(const calls::Message& message, const calls::Call* call) {
         wanted_.insert(call->number);
 }
 
-void Analysed::gone(const calls::Call& call) { wanted_.erase(call.number); }
-
-bool Analysed::isWanted(const calls::Call& call) const { return !filtered_ || wanted_.contains(call.number); }
-
-bool Analysed::isWanted(const calls::Finding& finding) const {
-    return !filtered_ || hasPassed(finding.frame) || (finding.call && wanted_.contains(*finding.call));
+void Analysed::gone(const calls::Call& call) {
+    const bool isCallWanted = callFilter_.wants(call);
+    wanted_.erase(call.number);
+    if (callFilter_.isEmpty())
+        return;
+    decided_[call.number] = isCallWanted;
+    if (decided_.size() > callsRemembered)
+        decided_.erase(decided_.begin());
+    std::erase_if(held_, [&](const calls::Finding& finding) {
+        const bool isItsOwn = finding.call == call.number;
+        if (isItsOwn && isCallWanted)
+            report(finding);
+        return isItsOwn;
+    });
 }
 
-bool Analysed::isWanted(const calls::Message& message) const {
-    return !filtered_ || hasPassed(message.number);
+bool Analysed::isWanted(const calls::Call& call) const {
+    return callFilter_.wants(call) && (!filtered_ || wanted_.contains(call.number));
+}
+
+void Analysed::found(const calls::Finding& finding) {
+    if (filtered_ && !hasPassed(finding.frame) && !(finding.call && wanted_.contains(*finding.call)))
+        return;
+    std::optional<bool> isCallWanted =
+        finding.call ? callFilter_.wants(*finding.call) : std::optional(callFilter_.wantsRest());
+    if (!isCallWanted) {
+        if (const auto gone = decided_.find(*finding.call); gone != decided_.end())
+            isCallWanted = gone->second;
+    }
+    if (!isCallWanted)
+        hold(finding);
+    else if (*isCallWanted)
+        report(finding);
+}
+
+void Analysed::hold(const calls::Finding& finding) {
+    held_.push_back(finding);
+    if (held_.size() <= mostFindingsHeld)
+        return;
+    held_.pop_front();
+    ++letGo_;
+}
+
+std::optional<bool> Analysed::isWanted(const calls::Message& message, const calls::Call* call) const {
+    if (filtered_ && !hasPassed(message.number))
+        return false;
+    return call == nullptr ? callFilter_.wantsRest() : callFilter_.wants(call->number);
 }
 
 }  // namespace reader

@@ -4,51 +4,71 @@
 
 #include <cstdint>
 #include <deque>
+#include <map>
+#include <optional>
 #include <set>
+#include <vector>
 
 #include "calls/Analysis.h"
+#include "reader/CallFilter.h"
 #include "reader/Options.h"
 #include "reader/Pipeline.h"
+#include "reader/session.h"
 
 namespace reader {
 
-// What the command line asks of an analysis.
-calls::Options analysisOptions(const Options& options);
-// Tells the analysis what the recorder had to say between frames.
-void tell(calls::Analysis& analysis, const capture::Item& item);
-
-// The analysis sees every item, whatever the filters say. A call is wanted if one of its frames passes them,
-// a finding if its frame or its call does.
+// The analysis sees every item, whatever the filters say. A call is wanted if one of its frames passes the
+// filters on frames, and if those on calls let it through; a finding if its frame or its call does.
 class Analysed : public Consumer, protected calls::Listener {
   public:
+    // Findings about calls that are alive wait for the end of the call if only that tells whether it is
+    // wanted. So many wait at most; then the oldest is let go.
+    static constexpr std::size_t mostFindingsHeld = 100'000;
+
     explicit Analysed(const Options& options);
+
+    // Reads all that there is. Says on the standard error stream what was let go.
+    void run(Session& session, Chatter& chatter);
 
     void take(Chunk& chunk, std::size_t count) final;
     bool wantsAll() const final { return true; }
-    // The input has ended.
-    void finish() { analysis_.finish(); }
+    void advance(std::int64_t nanoseconds) final { analysis_.advance(nanoseconds); }
     const calls::Analysis& analysis() const { return analysis_; }
 
   protected:
     bool isWanted(const calls::Call& call) const;
-    bool isWanted(const calls::Finding& finding) const;
-    bool isWanted(const calls::Message& message) const;
-    // Derived classes that need messages call this in their own.
+    // Empty while only the end of the message's call can tell.
+    std::optional<bool> isWanted(const calls::Message& message, const calls::Call* call) const;
+    // Whether a call that is alive may still be wanted by the filters on calls.
+    bool mayBeWanted(const calls::Call& call) const { return callFilter_.wants(call.number).value_or(true); }
+    // A finding that is wanted.
+    virtual void report(const calls::Finding& /*finding*/) {}
+    // Each item, before the analysis takes it.
+    virtual void see(const Seen& /*seen*/) {}
+    // Derived classes that need messages, calls or all findings call these in their own.
     void heard(const calls::Message& message, const calls::Call* call) override;
     void gone(const calls::Call& call) override;
+    void found(const calls::Finding& finding) override;
 
   private:
     void look(const Seen& seen, bool passes);
     bool hasPassed(std::uint64_t frame) const;
+    void hold(const calls::Finding& finding);
 
     // Frames this far behind the newest one are forgotten; findings come soon after their frames.
     static constexpr std::size_t framesRemembered = 1'000'000;
+    // The same for calls that have gone: a finding may name one that was replaced.
+    static constexpr std::size_t callsRemembered = 65'536;
 
+    CallFilter callFilter_;
     calls::Analysis analysis_;
     bool filtered_;
-    std::deque<bool> passed_;         // of the last frames, the newest at the end
-    std::uint64_t newest_ = 0;        // number of the frame at the end of `passed_`
-    std::set<std::uint64_t> wanted_;  // numbers of calls that are alive
+    std::deque<bool> passed_;                // of the last frames, the newest at the end
+    std::uint64_t newest_ = 0;               // number of the frame at the end of `passed_`
+    std::set<std::uint64_t> wanted_;         // numbers of calls that are alive
+    std::map<std::uint64_t, bool> decided_;  // calls that have gone, and whether they were wanted
+    std::deque<calls::Finding> held_;
+    std::uint64_t letGo_ = 0;
 };
 
 }  // namespace reader

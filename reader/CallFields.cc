@@ -20,26 +20,6 @@ void putMilliseconds(std::string& to, const std::optional<std::int64_t>& nanosec
         appendNumber(to, *nanoseconds / 1'000'000);
 }
 
-void putReference(std::string& to, const Call& call) {
-    constexpr std::string_view digits = "0123456789abcdef";
-    const unsigned shown = call.referenceLength > 1 ? 4 : 2;
-    for (unsigned i = shown; i-- > 0;)
-        to += digits[(call.reference >> (4 * i)) & 15U];
-}
-
-// The direction of the call: from the side that began it.
-std::string_view directionOf(const Call& call) {
-    switch (call.originRole) {
-        case capture::Role::user:
-            return "U>N";
-        case capture::Role::network:
-            return "N>U";
-        case capture::Role::unknown:
-            break;
-    }
-    return "?>?";
-}
-
 void putCause(std::string& to, const std::optional<calls::CauseGiven>& cause) {
     if (cause)
         appendNumber(to, cause->value);
@@ -51,11 +31,6 @@ void putLocation(std::string& to, const Call& call) {
 }
 
 std::string_view originOf(const Call& call) { return call.origin == calls::Side::us ? "us" : "peer"; }
-
-void putInstant(std::string& to, const calls::Moment& moment, TimeText& times) {
-    if (moment.clock != capture::Clock::none)
-        times.append(to, {moment.clock, moment.time});
-}
 
 void putLaterCauses(std::string& to, const Call& call) {
     bool first = true;
@@ -73,16 +48,18 @@ constexpr std::array fields{
               [](std::string& to, const Call& call, TimeText&) { appendNumber(to, call.number); }},
     CallField{"file", text, [](std::string& to, const Call& call, TimeText&) { to += call.file; }},
     CallField{"dchannel", text, [](std::string& to, const Call& call, TimeText&) { to += call.dChannel; }},
-    CallField{"start", text,
-              [](std::string& to, const Call& call, TimeText& times) { putInstant(to, call.begin, times); }},
+    CallField{
+        "start", text,
+        [](std::string& to, const Call& call, TimeText& times) { appendInstant(to, call.begin, times); }},
     CallField{"end", text,
               [](std::string& to, const Call& call, TimeText& times) {
                   if (call.endedBy != calls::EndedBy::open)
-                      putInstant(to, call.end, times);
+                      appendInstant(to, call.end, times);
               }},
     CallField{"tei", number,
               [](std::string& to, const Call& call, TimeText&) { appendNumber(to, call.tei); }},
-    CallField{"callref", text, [](std::string& to, const Call& call, TimeText&) { putReference(to, call); }},
+    CallField{"callref", text,
+              [](std::string& to, const Call& call, TimeText&) { appendReference(to, call); }},
     CallField{"origin", text, [](std::string& to, const Call& call, TimeText&) { to += originOf(call); }},
     CallField{"dir", text, [](std::string& to, const Call& call, TimeText&) { to += directionOf(call); }},
     CallField{"kind", text, [](std::string& to, const Call& call, TimeText&) { to += nameOf(call.kind); }},
@@ -140,6 +117,30 @@ constexpr std::array fields{
 };
 
 }  // namespace
+
+void appendReference(std::string& to, const Call& call) {
+    constexpr std::string_view digits = "0123456789abcdef";
+    const unsigned shown = call.referenceLength > 1 ? 4 : 2;
+    for (unsigned i = shown; i-- > 0;)
+        to += digits[(call.reference >> (4 * i)) & 15U];
+}
+
+std::string_view directionOf(const Call& call) {
+    switch (call.originRole) {
+        case capture::Role::user:
+            return "U>N";
+        case capture::Role::network:
+            return "N>U";
+        case capture::Role::unknown:
+            break;
+    }
+    return "?>?";
+}
+
+void appendInstant(std::string& to, const calls::Moment& moment, TimeText& times) {
+    if (moment.clock != capture::Clock::none)
+        times.append(to, {moment.clock, moment.time});
+}
 
 std::span<const CallField> callFields() { return fields; }
 

@@ -28,9 +28,11 @@ std::string callCsvHeader();
 void appendCallCsv(std::string& to, const calls::Call& call, TimeText& times);
 // One object with the same keys, and the numbers of the call's frames.
 void appendCallJson(std::string& to, const calls::Call& call, TimeText& times);
-// A line for people, without its line end; and what stands above the lines.
-std::string callHeading();
-void appendCallLine(std::string& to, const calls::Call& call, TimeText& times);
+// What several forms of a call have in common: "0378", "U>N" (from the side that began it), and a time,
+// which is empty where the frames have none.
+void appendReference(std::string& to, const calls::Call& call);
+std::string_view directionOf(const calls::Call& call);
+void appendInstant(std::string& to, const calls::Moment& moment, TimeText& times);
 
 }  // namespace reader
 

@@ -4,6 +4,8 @@
 #include <optional>
 
 #include "isdn/values.h"
+#include "reader/CallFilter.h"
+#include "reader/FilterGroups.h"
 #include "reader/errors.h"
 #include "reader/text.h"
 
@@ -200,6 +202,9 @@ constexpr FilterRow rows[] = {
     {"no-keepalive", "",    "No polls, and answers to them, that only say that nothing has happened", noKeepAlive},
     {"since",   "TIME",     "From this time on: 2026-11-21T11:25:33+01:00, 2026-11-21, 11:25 or +12.5 (after the first frame)", since},
     {"until",   "TIME",     "Before this time", until},
+    {"call",    "N",        "Frames of this call, by the number that `lapdread calls` prints", nullptr, byCallNumber},
+    {"failed",  "",         "Frames of calls that failed, or ended in an unusual way", nullptr, byFailure},
+    {"unanswered", "",      "Frames of calls that nobody answered", nullptr, byNoAnswer},
 };
 // clang-format on
 
@@ -207,38 +212,29 @@ constexpr FilterRow rows[] = {
 
 std::span<const FilterRow> filterRows() { return rows; }
 
-Filter::Filter(const std::vector<FilterWord>& words) {
-    for (const FilterWord& word : words) {
-        const auto* const row = std::find_if(std::begin(rows), std::end(rows),
-                                             [&](const FilterRow& r) { return r.name == word.name; });
-        const auto sameKind = [&](const Group& group) {
-            return group.name == word.name && group.negated == word.negated;
-        };
-        hidesKeepAlives_ = hidesKeepAlives_ || row->make == noKeepAlive;
-        auto group = std::find_if(groups_.begin(), groups_.end(), sameKind);
-        if (group == groups_.end())
-            group = groups_.insert(groups_.end(), Group{word.name, word.negated, {}});
-        if (row->form.empty()) {
-            group->anyOf.push_back(row->make(""));
-            continue;
-        }
-        const std::vector<std::string> values = splitAtCommas(word.value);
-        if (values.empty())
-            throw UsageError("--" + word.name + " needs a value");
-        for (const std::string& value : values)
-            group->anyOf.push_back(row->make(value));
-    }
+const FilterRow& filterRowNamed(std::string_view name) {
+    return *std::find_if(std::begin(rows), std::end(rows),
+                         [&](const FilterRow& row) { return row.name == name; });
 }
 
+Filter::Filter(const std::vector<FilterWord>& words)
+    : groups_(groupsOf(std::span(words), &FilterRow::make)),
+      hidesKeepAlives_(std::ranges::any_of(
+          words, [](const FilterWord& word) { return filterRowNamed(word.name).make == noKeepAlive; })) {}
+
+Filter::~Filter() = default;
+
+bool Filter::isEmpty() const { return groups_.empty(); }
+
 void Filter::begin(Instant firstFrame) {
-    for (const Group& group : groups_) {
+    for (const FilterGroup<Condition>& group : groups_) {
         for (const auto& condition : group.anyOf)
             condition->begin(firstFrame);
     }
 }
 
 bool Filter::passes(const Seen& seen) const {
-    return std::all_of(groups_.begin(), groups_.end(), [&](const Group& group) {
+    return std::all_of(groups_.begin(), groups_.end(), [&](const FilterGroup<Condition>& group) {
         const auto holds = [&](const std::unique_ptr<Condition>& condition) {
             return (seen.isFrame() || condition->isAboutTime()) && condition->holds(seen);
         };

@@ -24,6 +24,10 @@ class Condition {
     virtual bool isAboutTime() const { return false; }
 };
 
+class CallCondition;
+template <class Kind>
+struct FilterGroup;
+
 // A filter as the command line knows it.
 struct FilterRow {
     std::string_view name;
@@ -31,14 +35,23 @@ struct FilterRow {
     std::string_view help;
     // Throws UsageError for a value that means nothing.
     std::unique_ptr<Condition> (*make)(const std::string& value);
+    // The same for a filter that asks for whole calls; `make` is null then.
+    std::unique_ptr<CallCondition> (*makeOnCalls)(const std::string& value) = nullptr;
 };
 std::span<const FilterRow> filterRows();
+// The name must be one of theirs.
+const FilterRow& filterRowNamed(std::string_view name);
 
 // Frames pass if they meet at least one of the values of each filter, and none of those behind --not.
 class Filter {
   public:
-    // Throws UsageError. Dates are taken in the local time of now.
+    // Leaves words alone that ask for whole calls. Throws UsageError. Dates are taken in the local time of
+    // now.
     explicit Filter(const std::vector<FilterWord>& words);
+    ~Filter();
+
+    // Nothing is asked: every item passes.
+    bool isEmpty() const;
 
     // Before the first item is asked about.
     void begin(Instant firstFrame);
@@ -47,13 +60,7 @@ class Filter {
     bool hidesKeepAlives() const { return hidesKeepAlives_; }
 
   private:
-    struct Group {
-        std::string name;
-        bool negated;
-        std::vector<std::unique_ptr<Condition>> anyOf;
-    };
-
-    std::vector<Group> groups_;
+    std::vector<FilterGroup<Condition>> groups_;
     bool hidesKeepAlives_ = false;
 };
 

@@ -68,14 +68,12 @@ struct RecordOptions {
 
 enum class CallForm { text, csv, jsonLines };
 
-// For the commands about calls.
+// For calls: their timers and groups count wherever calls are told apart.
 struct CallOptions {
     calls::Timers timers;
     std::vector<std::vector<std::string>> groups;  // names of D channels that share their calls
     CallForm form = CallForm::text;
-    std::string sort;  // empty: in the order of their end
-    bool failed = false;
-    bool unanswered = false;
+    std::string sort;                                      // empty: in the order of their end
     calls::TrunkSize trunk = calls::TrunkSize::unknown;    // of the figures; unknown: learnt
     calls::Severity least = calls::Severity::note;         // milder findings are not shown
     std::optional<calls::Severity> failOn = std::nullopt;  // exit status 3 for such a finding or a worse one

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <chrono>
+#include <utility>
 #include <vector>
 
 #include "reader/Crew.h"
@@ -15,6 +16,8 @@ namespace {
 constexpr std::size_t itemsInChunk = 256;
 constexpr std::size_t chunksForEachThread = 3;
 constexpr std::chrono::milliseconds longestWait{500};
+// A recorder may write a frame so much later than it passed. Time that passes here counts after that.
+constexpr std::chrono::seconds recorderMayLag{2};
 
 // Where links are left alone nobody asks for headers either.
 void composeChunk(Chunk& chunk, const Filter& filter, Composer& composer, bool readsHeaders) {
@@ -41,29 +44,37 @@ class Run {
           consumer_(consumer),
           chatter_(chatter),
           work_(work),
-          left_(work.first),
+          first_(consumer.wantsAll() ? 0 : work.first),
+          left_(first_),
           crew_(jobs()) {}
 
     void run() {
         bool more = true;
+        bool isFull = false;
         while (more && !isStopped()) {
             const auto next = readChunk();
             const std::size_t most = work_.jobs == 1 ? 0 : work_.jobs * chunksForEachThread;
             const bool nowOrNever = next != capture::Reader::Next::item || work_.eachAtOnce;
-            more = handOn(nowOrNever ? 0 : most) && next != capture::Reader::Next::end;
+            isFull = !handOn(nowOrNever ? 0 : most);
+            more = !isFull && next != capture::Reader::Next::end;
             if (nowOrNever)
                 consumer_.flush();
-            if (more && next == capture::Reader::Next::pause)
+            if (more && next == capture::Reader::Next::pause) {
                 reader_.wait(longestWait);
+                passTime();
+            }
             const auto [done, of] = reader_.progress();
             chatter_.progress(done, of);
         }
+        if (!isFull && work_.gate != nullptr)
+            handInRest();
         handOn(0);
         consumer_.flush();
     }
 
   private:
     using Next = capture::Reader::Next;
+    using HostClock = std::chrono::steady_clock;
 
     std::vector<Crew::Job> jobs() {
         std::vector<Crew::Job> jobs;
@@ -81,14 +92,19 @@ class Run {
     // Reads a chunk and hands it in. Returns why it holds no more.
     Next readChunk() {
         std::unique_ptr<Chunk> chunk = heldBack_ != nullptr ? std::move(heldBack_) : freeChunk();
-        const std::size_t most = chunk->size() + (work_.eachAtOnce ? 1 : itemsInChunk);
+        std::size_t room = work_.eachAtOnce ? 1 : itemsInChunk;
         Next next = Next::item;
-        while (chunk->size() < most && (next = reader_.next(item_)) == Next::item) {
-            Seen seen = tracker_.see(item_);
+        addReleased(*chunk);
+        for (; room > 0 && (next = reader_.next(item_)) == Next::item; --room) {
+            const Seen seen = tracker_.see(item_);
             begin(seen.when);
-            if (filter_.hidesKeepAlives())
-                polls_.take(*chunk, seen);
-            chunk->add(seen);
+            hasCome_ = true;
+            if (work_.gate == nullptr) {
+                add(*chunk, seen);
+                continue;
+            }
+            work_.gate->take(seen);
+            addReleased(*chunk);
         }
         chunk->seal();
         begun_ = begun_ || !chunk->empty();
@@ -96,6 +112,44 @@ class Run {
             holdBack(*chunk, next);
         crew_.handIn(std::move(chunk));
         return next;
+    }
+
+    void add(Chunk& chunk, Seen seen) {
+        if (filter_.hidesKeepAlives())
+            polls_.take(chunk, seen);
+        chunk.add(seen);
+    }
+
+    void addReleased(Chunk& chunk) {
+        if (work_.gate == nullptr)
+            return;
+        while (const Seen* const seen = work_.gate->next())
+            add(chunk, *seen);
+    }
+
+    // What was held goes on, as far as it is wanted.
+    void handInRest() {
+        std::unique_ptr<Chunk> chunk = heldBack_ != nullptr ? std::move(heldBack_) : freeChunk();
+        work_.gate->finish();
+        addReleased(*chunk);
+        chunk->seal();
+        crew_.handIn(std::move(chunk));
+    }
+
+    // Nothing has come: time goes on by this host's clock.
+    void passTime() {
+        if (!work_.clockRuns)
+            return;
+        const HostClock::time_point now = HostClock::now();
+        if (std::exchange(hasCome_, false))
+            timeUntil_ = now + recorderMayLag;
+        if (now <= timeUntil_)
+            return;
+        const auto passed = std::chrono::duration_cast<std::chrono::nanoseconds>(now - timeUntil_).count();
+        timeUntil_ = now;
+        consumer_.advance(passed);
+        if (work_.gate != nullptr)
+            work_.gate->advance(passed);
     }
 
     // Keeps the items from a poll on whose answer may still come: whether the poll is shown depends on that.
@@ -121,14 +175,14 @@ class Run {
         while (crew_.held() > most) {
             std::unique_ptr<Chunk> chunk = crew_.takeBack();
             std::size_t wanted = chunk->pieces.size();
-            if (work_.first != 0) {
+            if (first_ != 0) {
                 wanted = std::min<std::uint64_t>(wanted, left_);
                 left_ -= wanted;
             }
             if (wanted > 0 || consumer_.wantsAll())
                 consumer_.take(*chunk, wanted);
             free_.push_back(std::move(chunk));
-            if (work_.first != 0 && left_ == 0)
+            if (first_ != 0 && left_ == 0)
                 return false;
         }
         return true;
@@ -149,7 +203,10 @@ class Run {
     Consumer& consumer_;
     Chatter& chatter_;
     const Work& work_;
+    std::uint64_t first_;
     std::uint64_t left_;
+    bool hasCome_ = true;              // an item, since time was counted last
+    HostClock::time_point timeUntil_;  // time has been counted up to then
     bool begun_ = false;
     capture::Item item_;
     Polls polls_;

@@ -9,6 +9,7 @@
 #include <memory>
 
 #include "capture/Reader.h"
+#include "reader/CallGate.h"
 #include "reader/Chatter.h"
 #include "reader/Chunk.h"
 #include "reader/Filter.h"
@@ -33,15 +34,19 @@ class Consumer {
     virtual void take(Chunk& chunk, std::size_t count) = 0;
     // Whether chunks are handed over in which nothing has passed the filters.
     virtual bool wantsAll() const { return false; }
+    // The host's clock says that so much time has passed, and nothing has come.
+    virtual void advance(std::int64_t /*nanoseconds*/) {}
     // Nothing more is there just now, or the input has ended: what was taken goes out.
     virtual void flush() = 0;
 };
 
 struct Work {
     std::function<std::unique_ptr<Composer>()> makeComposer;  // called on the thread of runPipeline
-    std::uint64_t first = 0;                                  // so many pieces and no more; 0: all
-    unsigned jobs = 1;                                        // threads, the caller's among them
-    bool eachAtOnce = false;                     // each item is handed on before the next is read
+    std::uint64_t first = 0;   // so many pieces and no more; 0: all. A consumer that wants all counts itself
+    unsigned jobs = 1;         // threads, the caller's among them
+    bool eachAtOnce = false;   // each item is handed on before the next is read
+    CallGate* gate = nullptr;  // lets through frames of the calls that are wanted; null: all
+    bool clockRuns = false;    // time passes while nothing comes
     const std::atomic<bool>* stopped = nullptr;  // set by a signal: the work ends with what was read
 };
 

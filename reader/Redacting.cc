@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <utility>
 
-#include "reader/Analysed.h"
+#include "reader/Feed.h"
 
 namespace reader {
 

@@ -6,8 +6,8 @@
 
 #include "reader/Analysed.h"
 #include "reader/CallFields.h"
+#include "reader/CallLine.h"
 #include "reader/errors.h"
-#include "reader/forms.h"
 #include "reader/session.h"
 #include "reader/text.h"
 
@@ -70,8 +70,7 @@ class CallPrinter : public Analysed {
 
   private:
     void gone(const calls::Call& call) override {
-        const bool wanted = isWanted(call) && (!options_.calls.failed || hasFailed(call)) &&
-                            (!options_.calls.unanswered || isUnanswered(call));
+        const bool wanted = isWanted(call);
         Analysed::gone(call);
         if (!wanted)
             return;
@@ -111,29 +110,12 @@ class CallPrinter : public Analysed {
 
 }  // namespace
 
-const OptionRow timerOption{"--timer", "NAME=TIME", "Another value of a timer: T305=4s, T316=500ms",
-                            [](Options& to, const std::string& value) {
-                                try {
-                                    calls::setTimer(to.calls.timers, value);
-                                } catch (const calls::BadTimer& error) {
-                                    throw UsageError(error.what());
-                                }
-                            }};
-
-const OptionRow groupOption{
-    "--nfas", "A,B", "D channels that share their calls (non-facility associated signalling)",
-    [](Options& to, const std::string& value) { to.calls.groups.push_back(splitAtCommas(value)); }};
-
 std::span<const OptionRow> callsOptions() {
     static const OptionRow rows[] = {
         {"--csv", "", "A row a call, for spreadsheets",
          [](Options& to, const std::string&) { to.calls.form = CallForm::csv; }},
         {"--jsonl", "", "A JSON object a call",
          [](Options& to, const std::string&) { to.calls.form = CallForm::jsonLines; }},
-        {"--failed", "", "Only calls that failed, or ended in an unusual way",
-         [](Options& to, const std::string&) { to.calls.failed = true; }},
-        {"--unanswered", "", "Only calls that nobody answered",
-         [](Options& to, const std::string&) { to.calls.unanswered = true; }},
         {"--sort", "KEY",
          "Sort by start, duration, connect, response, cause or channel; without it, calls come in the order "
          "of "
@@ -142,24 +124,16 @@ std::span<const OptionRow> callsOptions() {
              sortKeyNamed(value);
              to.calls.sort = value;
          }},
-        timerOption,
-        groupOption,
     };
     return rows;
 }
 
 int runCalls(const Options& options, Chatter& chatter) {
-    Options all = options;
-    all.first = 0;  // it counts calls here
-    Session session(all, chatter);
+    Session session(options, chatter);
     CallPrinter printer(options, session.output());
-    session.run(printer, [] { return std::make_unique<NoComposer>(); });
-    printer.finish();
+    printer.run(session, chatter);
     printer.printSorted();
     printer.flush();
-    if (const std::uint64_t dropped = printer.analysis().dropped(); dropped != 0)
-        chatter.note("calls that were let go before their end, since too many were alive: " +
-                     std::to_string(dropped));
     return good;
 }
 

@@ -14,10 +14,6 @@ class Chatter;
 std::span<const OptionRow> callsOptions();
 int runCalls(const Options& options, Chatter& chatter);
 
-// Options that every command about calls takes: timers, groups of D channels.
-extern const OptionRow timerOption;
-extern const OptionRow groupOption;
-
 }  // namespace reader
 
 #endif

@@ -4,9 +4,7 @@
 #include <optional>
 
 #include "reader/Analysed.h"
-#include "reader/calls.h"
 #include "reader/errors.h"
-#include "reader/forms.h"
 #include "reader/json.h"
 #include "reader/session.h"
 #include "reader/text.h"
@@ -49,8 +47,8 @@ class FindingPrinter : public Analysed {
     std::optional<calls::Severity> worst() const { return worst_; }
 
   private:
-    void found(const calls::Finding& finding) override {
-        if (!isWanted(finding) || finding.severity < options_.calls.least)
+    void report(const calls::Finding& finding) override {
+        if (finding.severity < options_.calls.least)
             return;
         ++counts_[static_cast<std::size_t>(finding.severity)];
         worst_ = std::max(worst_.value_or(finding.severity), finding.severity);
@@ -176,20 +174,15 @@ std::span<const OptionRow> checkOptions() {
         {"--fail-on", "note|warning|error",
          "Exit status 3 if there is a finding of this severity or a worse one",
          [](Options& to, const std::string& value) { to.calls.failOn = severityNamed(value); }},
-        timerOption,
-        groupOption,
     };
     return rows;
 }
 
 int runCheck(const Options& options, Chatter& chatter) {
-    Options all = options;
-    all.first = 0;  // it counts findings here
-    Session session(all, chatter);
+    Session session(options, chatter);
     Output& out = session.output();
     FindingPrinter printer(options, out, session.useColors());
-    session.run(printer, [] { return std::make_unique<NoComposer>(); });
-    printer.finish();
+    printer.run(session, chatter);
     printer.flush();
     chatter.note(printer.summary());
     const CallOptions& calls = options.calls;

@@ -94,9 +94,24 @@ constexpr OptionRow filterRowsBesides[] = {
      [](Options&, const std::string&) {}},
 };
 
+// They decide which call a frame belongs to, and so count for filters on calls as well.
+constexpr OptionRow callRows[] = {
+    {"--timer", "NAME=TIME", "Another value of a timer: T305=4s, T316=500ms",
+     [](Options& to, const std::string& value) {
+         try {
+             calls::setTimer(to.calls.timers, value);
+         } catch (const calls::BadTimer& error) {
+             throw UsageError(error.what());
+         }
+     }},
+    {"--nfas", "A,B", "D channels that share their calls (non-facility associated signalling)",
+     [](Options& to, const std::string& value) { to.calls.groups.push_back(splitAtCommas(value)); }},
+};
+
 constexpr OptionGroup common[] = {
     {"Input", inputRows},
     {"Filters", filterRowsBesides},
+    {"Signalling", callRows},
     {"", generalRows},
 };
 // clang-format on

@@ -4,8 +4,10 @@
 #include <atomic>
 #include <csignal>
 #include <cstdlib>
+#include <optional>
 #include <thread>
 
+#include "reader/CallGate.h"
 #include "reader/errors.h"
 #include "reader/inputs.h"
 #include "reader/outputs.h"
@@ -42,6 +44,7 @@ Session::Session(const Options& options, Chatter& chatter)
     : options_(options),
       chatter_(chatter),
       filter_(options.filters),
+      callFilter_(options.filters),
       tracker_(options.input),
       reader_(openInputs(options, chatter)) {
     stopOnSignals();
@@ -76,7 +79,16 @@ void Session::run(Consumer& consumer, const std::function<std::unique_ptr<Compos
         options_.output.jobs != 0 ? options_.output.jobs : std::max(1U, std::thread::hardware_concurrency());
     work.eachAtOnce = options_.output.lineBuffered;
     work.stopped = &stopped;
+    work.clockRuns = options_.input.follow;
+    std::optional<CallGate> gate;
+    if (!callFilter_.isEmpty() && !consumer.wantsAll())
+        work.gate =
+            &gate.emplace(callFilter_, analysisOptions(options_),
+                          options_.input.follow ? CallGate::Order::ofDecision : CallGate::Order::ofInput);
     runPipeline(reader_, tracker_, filter_, consumer, chatter_, work);
+    if (gate && gate->letGo() != 0)
+        chatter_.note("frames that were let go before the end of their call told whether it is wanted: " +
+                      std::to_string(gate->letGo()));
 }
 
 }  // namespace reader

@@ -6,6 +6,7 @@
 #include <memory>
 
 #include "capture/Reader.h"
+#include "reader/CallFilter.h"
 #include "reader/Chatter.h"
 #include "reader/Filter.h"
 #include "reader/Options.h"
@@ -53,6 +54,7 @@ class Session {
     const Options& options_;
     Chatter& chatter_;
     Filter filter_;
+    CallFilter callFilter_;
     Tracker tracker_;
     Primed reader_;
     std::unique_ptr<Output> output_;

@@ -1,15 +1,15 @@
 #include "reader/stats.h"
 
 #include <algorithm>
+#include <map>
+#include <optional>
 
 #include "calls/Figures.h"
 #include "calls/Occupancy.h"
 #include "reader/Analysed.h"
-#include "reader/calls.h"
 #include "reader/csv.h"
 #include "reader/errors.h"
 #include "reader/figureTables.h"
-#include "reader/forms.h"
 #include "reader/json.h"
 #include "reader/session.h"
 #include "reader/text.h"
@@ -34,20 +34,27 @@ class FigureTaker : public Analysed {
   private:
     void heard(const calls::Message& message, const calls::Call* call) override {
         Analysed::heard(message, call);
-        if (isWanted(message))
+        if (const std::optional<bool> wanted = isWanted(message, call); !wanted)
+            calls::Figures::count(undecided_[call->number], message);
+        else if (*wanted)
             figures_.heard(message);
         if (call != nullptr)
             occupancy_.heard(message, *call);
     }
     void ended(const calls::Call& call) override { occupancy_.ended(call); }
     void gone(const calls::Call& call) override {
-        if (isWanted(call))
+        const auto messages = undecided_.extract(call.number);
+        if (isWanted(call)) {
             figures_.gone(call);
+            if (!messages.empty())
+                figures_.heard(messages.mapped());
+        }
         Analysed::gone(call);
     }
     void found(const calls::Finding& finding) override { occupancy_.found(finding); }
 
     calls::Figures figures_;
+    std::map<std::uint64_t, calls::Figures::Messages> undecided_;  // by the number of a call that is alive
     calls::Occupancy occupancy_;
 };
 
@@ -147,8 +154,6 @@ std::span<const OptionRow> statsOptions() {
          [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::t1; }},
         {"--bri", "", "The trunks are basic accesses",
          [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::basic; }},
-        timerOption,
-        groupOption,
     };
     return rows;
 }
@@ -157,8 +162,7 @@ int runStats(const Options& options, Chatter& chatter) {
     Session session(options, chatter);
     Output& out = session.output();
     FigureTaker taker(options);
-    session.run(taker, [] { return std::make_unique<NoComposer>(); });
-    taker.finish();
+    taker.run(session, chatter);
     std::string text;
     if (options.calls.form == CallForm::csv)
         text = "table,row,figure,value\n";

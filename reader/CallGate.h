@@ -1,0 +1,89 @@
+// Lets through the frames of the calls that are wanted, for commands that show frames.
+#ifndef READER_CALLGATE_H
+#define READER_CALLGATE_H
+
+#include <cstdint>
+#include <deque>
+#include <map>
+#include <optional>
+#include <string>
+#include <unordered_map>
+#include <vector>
+
+#include "calls/Analysis.h"
+#include "reader/CallFilter.h"
+#include "reader/Feed.h"
+
+namespace reader {
+
+// A frame belongs to the call whose message it carries; all other items belong to none. Frames are held until
+// it is known whether their call is wanted. Used on the thread that reads.
+class CallGate : private calls::Listener {
+  public:
+    enum class Order {
+        ofInput,    // a frame that is held holds up all that come after it
+        ofDecision  // the frames of a call come together, as soon as it is known that it is wanted
+    };
+    // So many frames are held at most; then the oldest one of an undecided call is let go, and counted.
+    static constexpr std::size_t mostHeld = 100'000;
+
+    // The filter must outlive this. `most` is for tests.
+    CallGate(const CallFilter& filter, const calls::Options& options, Order order,
+             std::size_t most = mostHeld);
+
+    void take(const Seen& seen);
+    // Time has passed, and nothing has come.
+    void advance(std::int64_t nanoseconds);
+    // The input has ended.
+    void finish();
+
+    // What may go on, one at a time; null if there is nothing just now. It is valid until the next call.
+    const Seen* next();
+
+    // Frames that were let go although their call may have been wanted.
+    std::uint64_t letGo() const { return letGo_; }
+
+  private:
+    // An item with copies of all that its reader only lends.
+    struct Held {
+        explicit Held(const Seen& from);
+        const Seen& view();
+
+        Seen seen;
+        capture::Item item;
+        std::vector<std::uint8_t> octets;
+        std::string text;
+        bool wanted = false;
+    };
+    using Place = std::uint64_t;  // counts the items that were held, in the order of the input
+    using HeldItems = std::map<Place, Held>;
+
+    void heard(const calls::Message& message, const calls::Call* call) override {
+        claim(message.number, call);
+    }
+    void carried(const calls::Message& message, const calls::Call* call) override {
+        claim(message.number, call);
+    }
+    void gone(const calls::Call& call) override;
+
+    void claim(std::uint64_t frame, const calls::Call* call);
+    void settle(HeldItems::iterator held, const calls::Call* call);
+    void decide(HeldItems::iterator held, bool wanted);
+    void release();
+
+    const CallFilter& filter_;
+    Order order_;
+    std::size_t most_;
+    HeldItems held_;
+    Place lastPlace_ = 0;
+    std::unordered_map<std::uint64_t, Place> unclaimed_;               // by the number of the frame
+    std::unordered_map<std::uint64_t, std::vector<Place>> undecided_;  // by the number of the call
+    std::deque<Held> ready_;
+    std::optional<Held> given_;
+    std::uint64_t letGo_ = 0;
+    calls::Analysis analysis_;
+};
+
+}  // namespace reader
+
+#endif

@@ -1,0 +1,21 @@
+// From the items of a run to the analysis of calls.
+#ifndef READER_FEED_H
+#define READER_FEED_H
+
+#include "calls/Analysis.h"
+#include "reader/Options.h"
+#include "reader/Seen.h"
+
+namespace reader {
+
+// What the command line asks of an analysis.
+calls::Options analysisOptions(const Options& options);
+
+// Tells the analysis what the recorder had to say between frames.
+void tell(calls::Analysis& analysis, const capture::Item& item);
+// Hands a frame on, or what the recorder says.
+void feed(calls::Analysis& analysis, const Seen& seen);
+
+}  // namespace reader
+
+#endif

@@ -1,0 +1,53 @@
+// How filters are put together: values of one filter are alternatives, different filters must all agree.
+#ifndef READER_FILTER_GROUPS_H
+#define READER_FILTER_GROUPS_H
+
+#include <algorithm>
+#include <memory>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "reader/Filter.h"
+#include "reader/errors.h"
+#include "reader/text.h"
+
+namespace reader {
+
+template <class Kind>
+struct FilterGroup {
+    std::string name;
+    bool negated = false;
+    std::vector<std::unique_ptr<Kind>> anyOf;
+};
+
+// Of the words whose row has this member to make conditions with. Throws UsageError.
+template <class Kind>
+std::vector<FilterGroup<Kind>> groupsOf(std::span<const FilterWord> words,
+                                        std::unique_ptr<Kind> (*FilterRow::*make)(const std::string&)) {
+    std::vector<FilterGroup<Kind>> groups;
+    for (const FilterWord& word : words) {
+        const FilterRow& row = filterRowNamed(word.name);
+        if (row.*make == nullptr)
+            continue;
+        auto group = std::find_if(groups.begin(), groups.end(), [&](const FilterGroup<Kind>& known) {
+            return known.name == word.name && known.negated == word.negated;
+        });
+        if (group == groups.end())
+            group = groups.insert(groups.end(), FilterGroup<Kind>{word.name, word.negated, {}});
+        if (row.form.empty()) {
+            group->anyOf.push_back((row.*make)(""));
+            continue;
+        }
+        const std::vector<std::string> values = splitAtCommas(word.value);
+        if (values.empty())
+            throw UsageError("--" + word.name + " needs a value");
+        for (const std::string& value : values)
+            group->anyOf.push_back((row.*make)(value));
+    }
+    return groups;
+}
+
+}  // namespace reader
+
+#endif
