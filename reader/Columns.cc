@@ -205,19 +205,22 @@ void appendEvent(std::string& to, const capture::Item& item) {
     }
 }
 
-void appendMessageName(std::string& to, const Seen& seen) {
-    if (!seen.hasMessage)
-        return;
-    const std::string_view name = isdn::messageName(seen.message);
+void appendMessageName(std::string& to, const isdn::Layer3& message) {
+    const std::string_view name = isdn::messageName(message);
     if (!name.empty()) {
         to += name;
-    } else if (seen.message.hasType) {
-        to += seen.message.national ? "national message 0x" : "message 0x";
-        appendHex(to, std::span(&seen.message.type, 1));
+    } else if (message.hasType) {
+        to += message.national ? "national message 0x" : "message 0x";
+        appendHex(to, std::span(&message.type, 1));
     } else {
         to += "protocol 0x";
-        appendHex(to, std::span(&seen.message.discriminator, 1));
+        appendHex(to, std::span(&message.discriminator, 1));
     }
+}
+
+void appendMessageName(std::string& to, const Seen& seen) {
+    if (seen.hasMessage)
+        appendMessageName(to, seen.message);
 }
 
 void appendDetails(std::string& to, const Seen& seen) {

@@ -44,6 +44,7 @@ inline constexpr std::size_t deltaWidth = 10;
 void appendEvent(std::string& to, const capture::Item& item);
 
 // The message's name, "SETUP"; what there is to say where there is none.
+void appendMessageName(std::string& to, const isdn::Layer3& message);
 void appendMessageName(std::string& to, const Seen& seen);
 
 // What matters of a frame's contents, in words; nothing of an empty frame.

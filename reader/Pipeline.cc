@@ -44,7 +44,7 @@ class Run {
           consumer_(consumer),
           chatter_(chatter),
           work_(work),
-          first_(consumer.wantsAll() ? 0 : work.first),
+          first_(consumer.countsItself() ? 0 : work.first),
           left_(first_),
           crew_(jobs()) {}
 

@@ -34,6 +34,9 @@ class Consumer {
     virtual void take(Chunk& chunk, std::size_t count) = 0;
     // Whether chunks are handed over in which nothing has passed the filters.
     virtual bool wantsAll() const { return false; }
+    // Whether the number of results that the user has asked for is one of other things than frames, which the
+    // consumer counts.
+    virtual bool countsItself() const { return false; }
     // The host's clock says that so much time has passed, and nothing has come.
     virtual void advance(std::int64_t /*nanoseconds*/) {}
     // Nothing more is there just now, or the input has ended: what was taken goes out.
@@ -42,7 +45,7 @@ class Consumer {
 
 struct Work {
     std::function<std::unique_ptr<Composer>()> makeComposer;  // called on the thread of runPipeline
-    std::uint64_t first = 0;   // so many pieces and no more; 0: all. A consumer that wants all counts itself
+    std::uint64_t first = 0;   // so many pieces and no more; 0: all. A consumer may count itself
     unsigned jobs = 1;         // threads, the caller's among them
     bool eachAtOnce = false;   // each item is handed on before the next is read
     CallGate* gate = nullptr;  // lets through frames of the calls that are wanted; null: all

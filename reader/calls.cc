@@ -54,6 +54,7 @@ class CallPrinter : public Analysed {
             out_.write(callHeading() + "\n");
     }
 
+    bool countsItself() const override { return true; }
     void flush() override { out_.flush(); }
 
     // After the end: the calls that were kept to be sorted.

@@ -31,6 +31,7 @@ class FindingPrinter : public Analysed {
     FindingPrinter(const Options& options, Output& out, bool colors)
         : Analysed(options), options_(options), out_(out), colors_(colors) {}
 
+    bool countsItself() const override { return true; }
     void flush() override { out_.flush(); }
 
     // How many findings of each severity there were, in words.
