@@ -31,9 +31,9 @@ const Seen& CallGate::Held::view() {
 CallGate::CallGate(const CallFilter& filter, const calls::Options& options, Order order, std::size_t most)
     : filter_(filter), order_(order), most_(most), analysis_(options, *this) {}
 
-void CallGate::take(const Seen& seen) {
+void CallGate::take(const Seen& seen, bool passes) {
     const bool mayBelong = carriesMessage(seen);
-    if (mayBelong || filter_.wantsRest()) {
+    if (passes && (mayBelong || filter_.wantsRest())) {
         const auto held = held_.emplace_hint(held_.end(), ++lastPlace_, Held(seen));
         if (mayBelong)
             unclaimed_.emplace(seen.number, lastPlace_);

@@ -31,7 +31,8 @@ class CallGate : private calls::Listener {
     CallGate(const CallFilter& filter, const calls::Options& options, Order order,
              std::size_t most = mostHeld);
 
-    void take(const Seen& seen);
+    // An item that does not pass other filters is looked at, and goes no further.
+    void take(const Seen& seen, bool passes = true);
     // Time has passed, and nothing has come.
     void advance(std::int64_t nanoseconds);
     // The input has ended.

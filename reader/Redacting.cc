@@ -44,7 +44,12 @@ Redacting::Redacting(const Options& options, redaction::Redactor& redactor, Name
       analysis_(analysisOptions(options), redactor),
       names_(names),
       composer_(std::move(composer)),
-      next_(next) {}
+      next_(next),
+      callFilter_(options.filters) {
+    if (!callFilter_.isEmpty())
+        gate_.emplace(callFilter_, analysisOptions(options),
+                      options.input.follow ? CallGate::Order::ofDecision : CallGate::Order::ofInput);
+}
 
 void Redacting::take(Chunk& chunk, std::size_t count) {
     std::size_t piece = 0;
@@ -60,6 +65,10 @@ void Redacting::finish() {
     std::vector<redaction::Rebuilt> done;
     redactor_.giveUpSegments(done);
     settle(done);
+    handOn();
+    if (!gate_)
+        return;
+    gate_->finish();
     handOn();
 }
 
@@ -138,21 +147,34 @@ bool Redacting::isTooLong() const {
 
 void Redacting::handOn() {
     out_.seal();
-    for (std::size_t i = 0; i < out_.size(); ++i) {
-        if (!passes_[i])
+    if (gate_)
+        passGate();
+    Chunk& chunk = gate_ ? released_ : out_;
+    for (std::size_t i = 0; i < chunk.size(); ++i) {
+        if (!gate_ && !passes_[i])
             continue;
-        Seen& seen = out_.seen()[i];
+        Seen& seen = chunk.seen()[i];
         readHeaders(seen);
         Piece piece{.item = i, .instant = {seen.when.clock, seen.at}};
         if (composer_ != nullptr)
-            composer_->compose(seen, out_.text, piece);
-        piece.end = out_.text.size();
-        out_.pieces.push_back(piece);
+            composer_->compose(seen, chunk.text, piece);
+        piece.end = chunk.text.size();
+        chunk.pieces.push_back(piece);
     }
-    if (!out_.pieces.empty())
-        next_.take(out_, out_.pieces.size());
+    if (!chunk.pieces.empty())
+        next_.take(chunk, chunk.pieces.size());
     out_.clear();
+    released_.clear();
     passes_.clear();
+}
+
+// Redaction comes first: it needs the frames of all calls, whichever are wanted.
+void Redacting::passGate() {
+    for (std::size_t i = 0; i < out_.size(); ++i)
+        gate_->take(out_.seen()[i], passes_[i]);
+    while (const Seen* const seen = gate_->next())
+        released_.add(*seen);
+    released_.seal();
 }
 
 }  // namespace reader

@@ -7,10 +7,12 @@
 #include <list>
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
 #include "calls/Analysis.h"
+#include "reader/CallGate.h"
 #include "reader/Pipeline.h"
 #include "redaction/Redactor.h"
 
@@ -54,6 +56,7 @@ class Redacting : public Consumer {
     void settle(std::vector<redaction::Rebuilt>& done);
     void replaceNames(capture::Item& item);
     void handOn();
+    void passGate();
     bool isTooLong() const;
 
     redaction::Redactor& redactor_;
@@ -64,6 +67,9 @@ class Redacting : public Consumer {
     std::deque<Waiting> waiting_;
     Chunk out_;
     std::vector<bool> passes_;  // of the items of out_
+    CallFilter callFilter_;
+    std::optional<CallGate> gate_;  // if whole calls are asked for
+    Chunk released_;                // what it has let through
     std::map<std::string, std::string, std::less<>>
         channels_;  // D channels by name, and how they are called now
     std::map<std::string, std::string, std::less<>> files_;
