@@ -79,6 +79,14 @@ struct CallOptions {
     std::optional<calls::Severity> failOn = std::nullopt;  // exit status 3 for such a finding or a worse one
 };
 
+enum class LadderForm { text, svg, mermaid };
+
+struct LadderOptions {
+    LadderForm form = LadderForm::text;
+    unsigned width = 0;  // columns; 0: those of the terminal
+    bool ascii = false;
+};
+
 struct RedactOptions {
     std::string key;  // the key's file; empty: a key that nobody keeps
     bool undo = false;
@@ -100,6 +108,7 @@ struct Options {
     CallOptions calls;
     CompareAlso compareAlso;  // of two calls or traces
     bool failOnDifference = false;
+    LadderOptions ladder;
     RedactOptions redact;
 };
 

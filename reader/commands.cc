@@ -9,6 +9,7 @@
 #include "reader/decode.h"
 #include "reader/diff.h"
 #include "reader/explain.h"
+#include "reader/ladder.h"
 #include "reader/list.h"
 #include "reader/record.h"
 #include "reader/redact.h"
@@ -65,6 +66,14 @@ constexpr char callsExamples[] = R"(  lapdread calls lapdmon.log
       calls of one subscriber, for a spreadsheet
 )";
 
+constexpr char ladderExamples[] = R"(  lapdread ladder --call 3 lapdmon.log
+      one call, for a ticket; `lapdread calls` prints the numbers
+  lapdread ladder --failed --first 5 lapdmon.log
+      the first five calls that failed
+  lapdread ladder --svg --call 3 lapdmon.log > call.svg
+      a picture
+)";
+
 constexpr char checkExamples[] = R"(  lapdread check lapdmon.log
       what is wrong with the trunk: links, calls, channels
   lapdread check --level warning --timer T305=4s day.pcapng
@@ -109,6 +118,12 @@ const std::array table{
             {"Octets", explainOptions()},
             runExplain},
     Command{"calls", "[FILE...]", "a line a call", callsExamples, {"Calls", callsOptions()}, runCalls},
+    Command{"ladder",
+            "[FILE...]",
+            "the messages of calls as arrows between both sides",
+            ladderExamples,
+            {"Ladder", ladderOptions()},
+            runLadder},
     Command{"check",
             "[FILE...]",
             "what is wrong, and what to look at next",

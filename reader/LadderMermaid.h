@@ -1,0 +1,16 @@
+// Ladders as sequence diagrams of Mermaid, which wikis and ticket systems draw.
+#ifndef READER_LADDERMERMAID_H
+#define READER_LADDERMERMAID_H
+
+#include <string>
+
+#include "reader/CallLadder.h"
+
+namespace reader {
+
+// A block for Markdown: "```mermaid" to "```".
+void appendMermaid(std::string& to, const CallLadder& ladder, TimeText& times);
+
+}  // namespace reader
+
+#endif
