@@ -223,6 +223,8 @@ Filter::Filter(const std::vector<FilterWord>& words)
           words, [](const FilterWord& word) { return filterRowNamed(word.name).make == noKeepAlive; })) {}
 
 Filter::~Filter() = default;
+Filter::Filter(Filter&& other) noexcept = default;
+Filter& Filter::operator=(Filter&& other) noexcept = default;
 
 bool Filter::isEmpty() const { return groups_.empty(); }
 

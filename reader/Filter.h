@@ -49,6 +49,8 @@ class Filter {
     // now.
     explicit Filter(const std::vector<FilterWord>& words);
     ~Filter();
+    Filter(Filter&& other) noexcept;
+    Filter& operator=(Filter&& other) noexcept;
 
     // Nothing is asked: every item passes.
     bool isEmpty() const;

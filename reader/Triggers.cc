@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "reader/Analysed.h"
+#include "reader/Feed.h"
 #include "reader/OptionRow.h"
 #include "reader/check.h"
 #include "reader/errors.h"
