@@ -178,7 +178,14 @@ void Ladders::heard(const calls::Message& message, const calls::Call& call) {
 
 void Ladders::carried(const calls::Message& message, const calls::Call& call) {
     Rung rung = rungOf(message);
-    if (message.layer3.type != isdn::message::segment)
+    const std::vector<Rung>& known = calls_[call.number].rungs;
+    const bool isCopy = std::ranges::any_of(known, [&](const Rung& other) {
+        return other.from == rung.from && other.name == rung.name && other.details == rung.details &&
+               other.frame != rung.frame;
+    });
+    if (isCopy)
+        rung.details.emplace_back("retransmitted");
+    else if (message.layer3.type != isdn::message::segment)
         rung.details.emplace_back("not accepted");
     add(call, std::move(rung));
 }

@@ -52,7 +52,7 @@ class Terminal(Folder):
         display = b"\x1b[2J\x1b]0;evil\x07\x1b[31mred\x9b1m\n"
         setup = bytes([0x02, 0x01, 0, 0, 8, 1, 1, 5, 0x28, len(display)]) + display
         (self.folder / "evil.hex").write_text(f"RX 2026-11-21T11:25:33Z {setup.hex()}\n")
-        commands = ("list", "decode", "explain", "convert --to csv", "convert --to jsonl")
+        commands = ("list", "decode", "explain", "convert --to csv", "convert --to jsonl", "ladder", "ladder --mermaid")
         for number, command in enumerate(commands):
             self.type(f"clear; {LAPDREAD} {command} --quiet --color never evil.hex; echo end{number}")
             screen = self.shows(f"\nend{number}", "-e", "-J")
