@@ -58,6 +58,8 @@ void insertDates(std::vector<Rung>& rungs, const calls::Call& call, TimeText& ti
         Rung day = rungs[i];
         day.kind = Rung::Kind::words;
         day.details.clear();
+        day.when = {};
+        day.at = i == 0 ? day.at : rungs[i - 1].at;
         day.name = date = std::move(own);
         rungs.insert(rungs.begin() + static_cast<std::ptrdiff_t>(i), std::move(day));
         ++i;

@@ -18,7 +18,7 @@ constexpr Pen ascii{"-", ".", ">", "<", "|"};
 constexpr Pen utf8{"─", "╌", "▶", "◀", "│"};
 
 constexpr std::size_t timeWidth = 12;
-constexpr std::size_t deltaWidth = 9;
+constexpr std::size_t deltaWidth = 10;
 constexpr std::size_t arrowWidth =
     24;  // the longest name of a message, two blanks, a piece of line and a head
 constexpr std::size_t leastForDetails = 14;  // columns beside the ladder; with fewer, details stand between
