@@ -3,12 +3,11 @@
 #include <algorithm>
 #include <filesystem>
 #include <optional>
+#include <set>
 
 #include "reader/Analysed.h"
 #include "reader/Comparison.h"
-#include "reader/calls.h"
 #include "reader/errors.h"
-#include "reader/forms.h"
 #include "reader/inputs.h"
 #include "reader/json.h"
 #include "reader/session.h"
@@ -41,12 +40,22 @@ class MessageTaker : public Analysed {
         : Analysed(options), also_(options.compareAlso), operand_(operand) {}
 
     void flush() override {}
-    const std::vector<ComparedMessage>& messages() const { return messages_; }
+    // After the end of the trace.
+    std::vector<ComparedMessage> messages() {
+        std::vector<ComparedMessage> wanted;
+        for (std::size_t i = 0; i < messages_.size(); ++i) {
+            if (!unwanted_.contains(calls_[i]))
+                wanted.push_back(std::move(messages_[i]));
+        }
+        return wanted;
+    }
 
   private:
     void heard(const calls::Message& message, const calls::Call* call) override {
         Analysed::heard(message, call);
-        if (!isWanted(message) || (operand_.call && (call == nullptr || call->number != *operand_.call)))
+        const std::optional<bool> wanted = isWanted(message, call);
+        const bool isOther = operand_.call && (call == nullptr || call->number != *operand_.call);
+        if (isOther || !wanted.value_or(true))
             return;
         if (messages_.size() >= mostMessages)
             throw UsageError(operand_.file + " holds more than " + std::to_string(mostMessages) +
@@ -54,11 +63,22 @@ class MessageTaker : public Analysed {
         if (messages_.empty())
             first_ = message.at;
         messages_.push_back(comparedMessage(message, first_, also_));
+        calls_.push_back(call == nullptr ? 0 : call->number);
+        if (!wanted)
+            undecided_.insert(call->number);
+    }
+    void gone(const calls::Call& call) override {
+        if (undecided_.erase(call.number) != 0 && !isWanted(call))
+            unwanted_.insert(call.number);
+        Analysed::gone(call);
     }
 
     const CompareAlso& also_;
     const Operand& operand_;
     std::vector<ComparedMessage> messages_;
+    std::vector<std::uint64_t> calls_;   // by message: the number of its call, or 0
+    std::set<std::uint64_t> undecided_;  // calls that are alive, and whose end tells whether they are wanted
+    std::set<std::uint64_t> unwanted_;   // calls of which that has told
     std::int64_t first_ = 0;
 };
 
@@ -68,11 +88,11 @@ std::vector<ComparedMessage> messagesOf(const Options& options, const Operand& o
     own.input.files = {operand.file};
     Session session(own, chatter);
     MessageTaker taker(own, operand);
-    session.run(taker, [] { return std::make_unique<NoComposer>(); });
-    taker.finish();
-    if (operand.call && taker.messages().empty())
+    taker.run(session, chatter);
+    std::vector<ComparedMessage> messages = taker.messages();
+    if (operand.call && messages.empty())
         throw UsageError(operand.file + " has no message of a call " + std::to_string(*operand.call));
-    return taker.messages();
+    return messages;
 }
 
 std::string wordsOf(const Operand& operand, std::size_t messages) {
@@ -166,8 +186,6 @@ std::span<const OptionRow> diffOptions() {
          [](Options& to, const std::string&) { to.calls.form = CallForm::jsonLines; }},
         {"--fail-on-difference", "", "Exit status 3 if there is a difference",
          [](Options& to, const std::string&) { to.failOnDifference = true; }},
-        timerOption,
-        groupOption,
     };
     return rows;
 }
