@@ -79,8 +79,11 @@ lapdmon_package(dev libvela-dev "objects and messages of KV9 telephony boards"
 and of the host services below it. A libnorv.so to link with is included; the
 board's own is needed to run a program.")
 
-set(CPACK_DEBIAN_LAPDMON_PACKAGE_CONTROL_EXTRA ${CMAKE_CURRENT_SOURCE_DIR}/debian/lapdmon/postinst)
-set(CPACK_DEBIAN_LAPDMON_PACKAGE_RECOMMENDS "lapdread")
+foreach(script postinst prerm postrm)
+    list(APPEND CPACK_DEBIAN_LAPDMON_PACKAGE_CONTROL_EXTRA ${CMAKE_CURRENT_SOURCE_DIR}/debian/lapdmon/${script})
+endforeach()
+# The services record with lapdread, under a user of their own.
+set(CPACK_DEBIAN_LAPDMON_PACKAGE_DEPENDS "adduser, lapdread (= ${version})")
 set(CPACK_DEBIAN_LAPDREAD_PACKAGE_SUGGESTS "lapdmon-doc")
 set(CPACK_DEBIAN_LAPDMON_PACKAGE_SUGGESTS "softboard, lapdmon-doc")
 set(CPACK_DEBIAN_SOFTBOARD_PACKAGE_RECOMMENDS "lapdmon")

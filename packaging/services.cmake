@@ -1,0 +1,10 @@
+# The services of systemd. The lines that all of them share are in hardening.conf.
+file(READ systemd/hardening.conf HARDENING)
+string(STRIP "${HARDENING}" HARDENING)
+foreach(unit lapdmon@.service lapdmon@.socket lapdmon-record@.service kv9relayd.service)
+    file(READ systemd/${unit} text)
+    string(REPLACE "@HARDENING@" "${HARDENING}" text "${text}")
+    file(CONFIGURE OUTPUT units/${unit} CONTENT "${text}" @ONLY)
+    install(FILES ${CMAKE_CURRENT_BINARY_DIR}/units/${unit} DESTINATION lib/systemd/system COMPONENT lapdmon)
+endforeach()
+install(PROGRAMS systemd/lapdmon-trace DESTINATION lib/lapdmon COMPONENT lapdmon)
