@@ -41,7 +41,7 @@ def options_of_help(program, *words):
             continue
         names, _, form = re.match(r"(\S+)( (\S.*))?$", match[1]).group(1, 2, 3)
         in_order = sorted(names.split(","), key=lambda name: name.startswith("--"))
-        found.add(", ".join(in_order) + (" " + form if form and re.match(r"[A-Z\d]|\w+\|", form) else ""))
+        found.add(", ".join(in_order) + (" " + form if form else ""))
     return found
 
 
