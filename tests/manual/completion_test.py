@@ -19,11 +19,11 @@ zpty asked zsh -f -i
 zpty -w asked "PS1= ; fpath=($1 \$fpath); path=($2 \$path); autoload -Uz compinit; compinit -u -d $3/dump"
 zpty -w asked 'zstyle ":completion:*" list-prompt ""; zstyle ":completion:*" list-separator "##"; LISTMAX=10000'
 zpty -w asked "cd $3; bindkey '^I' list-choices; bindkey '^X' complete-word; stty cols 300 rows 300"
-zpty -w asked 'print READY''NOW'
+zpty -w asked "print READY''NOW"
 zpty -r asked before '*READYNOW*'
 zpty -n -w asked "$4"
 zpty -n -w asked "$5"$'\C-a'': ''\C-e'
-zpty -n -w asked $'\n''print ASKED''NOW'$'\n'
+zpty -n -w asked $'\n'"print ASKED''NOW"$'\n'  # so that the echo of the line is not taken for its output
 zpty -r asked answer '*ASKEDNOW*'
 print -r -- "$answer"
 zpty -d asked
