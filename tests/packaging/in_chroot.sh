@@ -97,7 +97,7 @@ lapdread /var/log/lapdmon/1-1.*.pcapng | grep -q SETUP || fail "the services rec
 setpriv --reuid lapdmon --regid lapdmon --init-groups bash -c "exec $(command_of kv9relayd.service)" >relay 2>&1 &
 relay=$!
 for _ in $(seq 300); do
-    grep -q 'listening on' relay && break
+    grep -qs 'listening on' relay && break
     sleep 0.1
 done
 kill -TERM "$relay"
