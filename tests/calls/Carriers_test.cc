@@ -71,6 +71,24 @@ TEST(Carriers, ASetupBehindAHoleBelongsToTheCallThatItsRepetitionBegins) {
     EXPECT_EQ(Owners().of(lossy), "3 of 1*\n5 of none\n6 of 1\n");
 }
 
+TEST(Carriers, ASetupThatLayerTwoDropsBelongsToNoCallThatHasEnded) {
+    const std::initializer_list<std::uint8_t> setup{0x06, 0x02, 0x08, 0x02, 0x00, 0x05,
+                                                    0x05, 0x04, 0x03, 0x80, 0x90, 0xA3};
+    const std::initializer_list<std::uint8_t> notify{0x04, 0x02, 0x08, 0x02, 0x00, 0x00, 0x6E};
+    CallScript script;
+    script.raw(Side::us, true, {0x7F}).raw(Side::peer, false, {0x73});
+    script.raw(Side::peer, true, {0x00, 0x00, 0x08, 0x02, 0x00, 0x05, 0x05, 0x04, 0x03, 0x80, 0x90, 0xA3});
+    script.raw(Side::us, true, {0x00, 0x02, 0x08, 0x02, 0x80, 0x05, 0x5A});
+    // The frame with N(S) 1 was lost on the line. What comes between REJ and its repetition is dropped.
+    script.raw(Side::peer, true, notify);
+    script.raw(Side::us, false, {0x09, 0x02});
+    script.raw(Side::peer, true, setup);
+    script.raw(Side::peer, true, {0x02, 0x02, 0x08, 0x02, 0x00, 0x00, 0x6E});
+    script.raw(Side::peer, true, notify);
+    script.raw(Side::peer, true, setup);
+    EXPECT_EQ(Owners().of(script), "3 of 1\n4 of 1\n5 of none*\n7 of 2*\n8 of none\n9 of none\n10 of 2\n");
+}
+
 TEST(Carriers, SegmentsBelongToTheCallOfTheWholeMessage) {
     // A SETUP in two segments (Q.931 annex H): the header of each names the whole message's type.
     CallScript script;
