@@ -3,8 +3,8 @@
 
     bench/calls_speed.py [--frames 10000000] [--rounds 3] [--lapdread build/release/bin/lapdread]
 
-The capture is in memory (/dev/shm), 43 octets a frame. Each command also runs on a tenth of it: its memory must be the same
-there but for a quarter, or the status is 1.
+The capture is in memory (/dev/shm), 43 octets a frame. Each command also runs on a tenth of it: if its memory is not flat, the status
+is 1.
 """
 
 import argparse
@@ -17,6 +17,7 @@ import subprocess
 import tempfile
 import time
 
+from read_memory import flat, peak
 from read_speed import ROOT
 
 HEADER = bytes.fromhex("d4c3b2a1020004000000000000000000ffff0000b1000000")  # pcap, LAPD with its direction
@@ -100,15 +101,6 @@ def write(path, wanted):
     return path
 
 
-def most_memory(process):
-    """MB, as long as the process runs. What wait4 reports may be the memory of this script, from which it was started."""
-    try:
-        status = pathlib.Path(f"/proc/{process.pid}/status").read_text()
-    except OSError:
-        return 0
-    return next((int(line.split()[1]) / 1024 for line in status.splitlines() if line.startswith("VmHWM")), 0)
-
-
 def measure(command, rounds):
     """Median seconds that passed, median seconds of the processor, most memory in MB."""
     passed, worked, memory = [], [], 0
@@ -117,7 +109,7 @@ def measure(command, rounds):
         process = subprocess.Popen([str(word) for word in command], stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
         ended = 0
         while ended == 0:
-            memory = max(memory, most_memory(process))
+            memory = max(memory, peak(process) or 0.0)
             time.sleep(0.01)
             ended, status, usage = os.wait4(process.pid, os.WNOHANG)
         passed.append(time.monotonic() - begin)
@@ -145,7 +137,7 @@ def main():
                 words = [options.lapdread, command, "--quiet", "--jobs", jobs]
                 passed, worked, memory = measure([*words, capture], options.rounds)
                 *_, before = measure([*words, tenth], 1)
-                bounded = bounded and memory < before * 1.25 + 1
+                bounded = bounded and flat(before, memory)
                 print(f"lapdread {command:6} {jobs} jobs {passed:7.2f} s passed {worked:7.2f} s worked "
                       f"{options.frames / passed / 1e6:6.2f} M frames/s passed {options.frames / worked / 1e6:6.2f} M frames/s "
                       f"worked {memory:6.1f} MB ({before:.1f} MB with a tenth)")

@@ -86,7 +86,7 @@ TEST_F(LauncherTest, HelpShowsEveryOptionAndExamples) {
 TEST_F(LauncherTest, TheVersionIsTold) {
     const Ran ran = run({"--version"});
     EXPECT_EQ(ran.status, 0);
-    EXPECT_EQ(ran.out, "softboard 1.0\n");
+    EXPECT_EQ(ran.out, "softboard " LAPDMON_VERSION "\n");
 }
 
 TEST_F(LauncherTest, AMistakeIsReportedAndTheProgramIsNotStarted) {
