@@ -39,13 +39,19 @@ TEST_PACKAGES=(bash-completion groff-base libgtest-dev libgmock-dev libbenchmark
                tmux tshark zsh)
 PACKAGE_PACKAGES=(dpkg-dev gzip lintian)
 
-# build_preset PRESET [OPTION...]: configures and builds a preset. Shows the compiler's output only if that fails.
+# build_preset PRESET [OPTION...] [--target NAME]: configures a preset, and builds it or the target. Shows the compiler's
+# output only if that fails.
 build_preset() {
     local preset=$1 log
     shift
+    local options=() targets=()
+    while [ $# -gt 0 ]; do
+        if [ "$1" = --target ]; then targets=("$1" "$2"); shift; else options+=("$1"); fi
+        shift
+    done
     log=$(mktemp)
     printf 'Building %s ...\n' "$preset"
-    if ! { cmake --preset "$preset" "$@" && cmake --build --preset "$preset"; } >"$log" 2>&1; then
+    if ! { cmake --preset "$preset" "${options[@]}" && cmake --build --preset "$preset" "${targets[@]}"; } >"$log" 2>&1; then
         tail -n 60 "$log" >&2
         fail "the $preset build failed"
     fi
