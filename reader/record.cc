@@ -8,6 +8,7 @@
 #include <filesystem>
 #include <map>
 
+#include "reader/CallFilter.h"
 #include "reader/RecordedTrunk.h"
 #include "reader/Triggers.h"
 #include "reader/errors.h"
@@ -224,6 +225,9 @@ int runRecord(const Options& given, Chatter& chatter) {
     Options options = given;
     options.input.follow = true;
     const RecordRules rules = rulesOf(options);
+    if (Triggers(options).areThere() && !CallFilter(options.filters).isEmpty())
+        throw UsageError(
+            "--on keeps all that surrounds a trigger: --call, --failed, --unanswered do not go with it");
     if (!std::filesystem::is_directory(rules.files.folder))
         throw FileError("cannot write into " + rules.files.folder + ": no such folder");
     Session session(options, chatter);

@@ -271,6 +271,12 @@ class Trigger(Recording):
                 recorder = self.record("--on", words)
                 self.assertEqual(recorder.wait(LIMIT), 1)
 
+    def test_a_trigger_goes_with_no_filter_on_calls(self):
+        for words in (("--call", "1"), ("--failed",), ("--not", "--unanswered")):
+            with self.subTest(words):
+                recorder = self.record("--on", "cause:16", *words)
+                self.assertEqual(recorder.wait(LIMIT), 1)
+
 
 @unittest.skipUnless(os.geteuid() == 0, "only root can mount a disk that is small enough to be full")
 class FullDisk(Recording):
