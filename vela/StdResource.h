@@ -21,7 +21,7 @@ class StdResource : public WithBodies<Addressable, StdResourceMessages> {
     StdResource(const CompDesc_t& target, const Addressable& finder) : WithBodies(target, finder) {}
     ~StdResource() override { endCallbacks(); }
 
-    // NOLINTNEXTLINE(bugprone-virtual-near-miss): both names are prescribed
+    // NOLINTNEXTLINE(bugprone-virtual-near-miss): programs call both names
     void msgQueueAttach(MsgQueue* queue) { MsgQueueAttach(queue); }
     // Requests to the board's resource manager: mark the component as in use, with a word of the caller's
     // choice; mark it as no longer in use; give an allocated instance back. Throw Timeout, UnexpectedMsg.
