@@ -21,12 +21,20 @@ using Kind = capture::Item::Kind;
 
 constexpr std::uint64_t mostPending = 64UL * 1024;
 constexpr std::uint64_t leastRoom = 64UL * 1024;  // octets that a full disk must have again
+constexpr std::size_t mostEarly = 100;            // items
 constexpr std::int64_t lateness = 2;              // seconds by which frames may come late
 
 std::int64_t secondOf(const capture::Item& item) {
     if (item.frame.clock == capture::Clock::absolute)
         return item.frame.time / 1'000'000'000;
     return std::time(nullptr);
+}
+
+// It tells of the recorder, and not when.
+bool isWithoutTime(const capture::Item& item) {
+    return item.frame.clock == capture::Clock::none &&
+           (item.kind == Kind::run || item.kind == Kind::restart || item.kind == Kind::replaced ||
+            item.kind == Kind::comment);
 }
 
 bool standsForAFrame(const capture::Item& item) {
@@ -90,6 +98,9 @@ bool RotatingFile::begin(const capture::Item& item) {
     try {
         writer_ = rules_.form->makeWriter(descriptor_, part);
         writeLoss(item);
+        for (const HeldItem& held : early_)
+            writer_->write(held.item());
+        early_.clear();
     } catch (const capture::WriteError& error) {
         fail(error.what());
         return false;
@@ -121,9 +132,16 @@ void RotatingFile::sayWritingWorks() {
 
 void RotatingFile::write(const capture::Item& item) {
     const std::uint64_t frames = standsForAFrame(item) ? 1 : 0;
-    newestSecond_ = secondOf(item);
-    if (writer_ != nullptr && isAnotherPeriod(newestSecond_))
-        finish();
+    if (isWithoutTime(item)) {
+        if (writer_ == nullptr && early_.size() < mostEarly) {
+            early_.emplace_back(item);
+            return;
+        }
+    } else {
+        newestSecond_ = secondOf(item);
+        if (writer_ != nullptr && isAnotherPeriod(newestSecond_))
+            finish();
+    }
     if (writer_ == nullptr && !begin(item)) {
         lose(frames);
         return;

@@ -6,9 +6,11 @@
 #include <cstdint>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "capture/Writer.h"
 #include "reader/Chatter.h"
+#include "reader/HeldItem.h"
 #include "reader/forms.h"
 #include "reader/recordings.h"
 
@@ -40,6 +42,7 @@ class RotatingFile {
     RotatingFile(const RotatingFile&) = delete;
     RotatingFile& operator=(const RotatingFile&) = delete;
 
+    // What tells of the recorder and has no time waits for the next item, whose time names the file.
     void write(const capture::Item& item);
     // Everything is handed to the system, and a file that has its size is finished.
     void flush();
@@ -85,9 +88,10 @@ class RotatingFile {
     std::uint64_t begun_ = 0;
     int descriptor_ = -1;
     std::unique_ptr<capture::Writer> writer_;
-    std::int64_t period_ = 0;    // the multiple of the period that the file belongs to
-    std::uint64_t size_ = 0;     // octets that are safely in the file
-    std::uint64_t pending_ = 0;  // octets of items since
+    std::vector<HeldItem> early_;  // what waits for the item that begins a file
+    std::int64_t period_ = 0;      // the multiple of the period that the file belongs to
+    std::uint64_t size_ = 0;       // octets that are safely in the file
+    std::uint64_t pending_ = 0;    // octets of items since
     std::uint64_t pendingFrames_ = 0;
     std::uint64_t lost_ = 0;  // frames that the next file has to report
     std::uint64_t lostInAll_ = 0;

@@ -1,6 +1,6 @@
 #include "reader/Surroundings.h"
 
-#include "capture/octets.h"
+#include <algorithm>
 
 namespace reader {
 
@@ -9,19 +9,6 @@ namespace {
 bool hasTime(const capture::Item& item) { return item.frame.clock != capture::Clock::none; }
 
 }  // namespace
-
-Surroundings::Held::Held(const capture::Item& of)
-    : bare(of), octets(capture::textOf(of.frame.octets)), text(of.text) {
-    bare.frame.octets = {};
-    bare.text = {};
-}
-
-capture::Item Surroundings::Held::item() const {
-    capture::Item item = bare;
-    item.frame.octets = capture::octetsOf(octets);
-    item.text = text;
-    return item;
-}
 
 Surroundings::Surroundings(const SurroundingsRules& rules, const std::string& trunk, Chatter& chatter)
     : rules_(rules), trunk_(trunk), chatter_(chatter), file_(rules.files, trunk, chatter) {}
@@ -37,10 +24,10 @@ void Surroundings::take(const capture::Item& item) {
 void Surroundings::hold(const capture::Item& item) {
     held_.emplace_back(item);
     octets_ += held_.back().octets.size() + held_.back().text.size();
-    if (hasTime(item)) {
-        while (hasTime(held_.front().bare) && item.frame.time - held_.front().bare.frame.time > rules_.before)
-            dropOldest();
-    }
+    if (hasTime(item))
+        newest_ = item.frame.time;
+    while (beginsTooEarly())
+        dropOldest();
     while (held_.size() > mostItems || octets_ > mostOctets) {
         dropOldest();
         if (!isCut_)
@@ -48,6 +35,13 @@ void Surroundings::hold(const capture::Item& item) {
                           ": more frames than can be held until a trigger; its beginning may be missing");
         isCut_ = true;
     }
+}
+
+// An item without a time goes with the one behind it.
+bool Surroundings::beginsTooEarly() const {
+    const auto first =
+        std::find_if(held_.begin(), held_.end(), [](const HeldItem& held) { return hasTime(held.bare); });
+    return first != held_.end() && newest_ - first->bare.frame.time > rules_.before;
 }
 
 void Surroundings::dropOldest() {
@@ -59,7 +53,7 @@ void Surroundings::trigger(const std::string& why) {
     if (held_.empty())
         return;  // nothing has come from this trunk
     chatter_.note(trunk_ + ": trigger, what surrounds it is kept: " + why);
-    until_ = held_.back().bare.frame.time + rules_.after;
+    until_ = newest_ + rules_.after;
     hostUntil_ = HostClock::now() + std::chrono::nanoseconds(rules_.after);
     if (isOpen_) {
         comment(why, held_.back().bare);
@@ -67,7 +61,7 @@ void Surroundings::trigger(const std::string& why) {
     }
     isOpen_ = true;
     comment(why, held_.front().bare);
-    for (const Held& held : held_)
+    for (const HeldItem& held : held_)
         file_.write(held.item());
 }
 

@@ -9,6 +9,7 @@
 
 #include "capture/Item.h"
 #include "reader/Chatter.h"
+#include "reader/HeldItem.h"
 #include "reader/RotatingFile.h"
 
 namespace reader {
@@ -43,16 +44,8 @@ class Surroundings {
   private:
     using HostClock = std::chrono::steady_clock;
 
-    struct Held {
-        explicit Held(const capture::Item& of);
-        capture::Item item() const;
-
-        capture::Item bare;  // without octets and text
-        std::string octets;
-        std::string text;
-    };
-
     void hold(const capture::Item& item);
+    bool beginsTooEarly() const;
     void dropOldest();
     void comment(const std::string& why, const capture::Item& at);
 
@@ -60,7 +53,8 @@ class Surroundings {
     std::string trunk_;
     Chatter& chatter_;
     RotatingFile file_;
-    std::deque<Held> held_;
+    std::deque<HeldItem> held_;
+    std::int64_t newest_ = 0;  // time of the newest item that has one
     std::size_t octets_ = 0;
     bool isCut_ = false;  // it was said that memory ends before `before`
     bool isOpen_ = false;

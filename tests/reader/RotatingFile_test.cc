@@ -110,6 +110,17 @@ TEST_F(RotatingFileTest, IsNamedAfterItsFirstItemOnceItIsFinished) {
     EXPECT_EQ(files(), Files{"pri1.20261121T112533Z.txt=[4][5]."});
 }
 
+TEST_F(RotatingFileTest, IsNamedAfterAFrameThoughTheRecordersStartHasNoTime) {
+    RotatingFile file(rules_, "pri1", chatter_);
+    capture::Item start;
+    start.kind = Kind::run;
+    file.write(start);
+    EXPECT_EQ(files(), Files());
+    file.write(frame(november));
+    file.finish();
+    EXPECT_EQ(files(), Files{"pri1.20261121T112533Z.txt=[0][4]."});
+}
+
 TEST_F(RotatingFileTest, NeverWritesOverAnother) {
     for (int i = 0; i < 3; ++i) {
         RotatingFile file(rules_, "t", chatter_);

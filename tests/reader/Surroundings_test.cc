@@ -88,6 +88,23 @@ TEST_F(SurroundingsTest, AreKeptFromBeforeTheTriggerUntilAfterIt) {
                       "<lapdread: kept because of a storm> 15/4 16/4 17/4 18/4 19/4 20/4 21/4 22/4 23/4"}}));
 }
 
+TEST_F(SurroundingsTest, BeginWithTheFramesAskedForThoughTheRecordersStartHasNoTime) {
+    Surroundings surroundings(rules_, "t", chatter_);
+    capture::Item start;
+    start.kind = capture::Item::Kind::run;
+    surroundings.take(start);
+    pass(surroundings, 1, 3);
+    surroundings.trigger("early");
+    pass(surroundings, 4, 20);
+    surroundings.trigger("late");
+    pass(surroundings, 21, 24);
+    EXPECT_EQ(files(),
+              (Files{{"t.19700101T000001Z.kept.txt",
+                      "<lapdread: kept because of early> 0/0 1/4 2/4 3/4 4/4 5/4 6/4"},
+                     {"t.19700101T000015Z.kept.txt",
+                      "<lapdread: kept because of late> 15/4 16/4 17/4 18/4 19/4 20/4 21/4 22/4 23/4"}}));
+}
+
 TEST_F(SurroundingsTest, AreProlongedByATriggerWithinThem) {
     Surroundings surroundings(rules_, "t", chatter_);
     pass(surroundings, 1, 1);
