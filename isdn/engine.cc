@@ -49,15 +49,33 @@ class Engine {
             takeOctets(first);
             return;
         }
+        std::size_t second = 0;  // the first field of the group's second octet
         do {
             if (rest_.empty()) {
+                if (open_ && second != 0)
+                    doubtFrom(second);
                 if (first.when.presence != When::Presence::optional)
                     note(Problem::tooShort);
                 return;
             }
             takeOctet(group);
+            if (second == 0)
+                second = fields_.size();
         } while ((first.place.repeat == Place::Repeat::whileExtended && open_) ||
                  (first.place.repeat == Place::Repeat::toEnd && !rest_.empty()));
+    }
+
+    // A group that does not end may have swallowed what follows it.
+    void doubtFrom(std::size_t index) {
+        for (auto field = fields_.begin() + static_cast<std::ptrdiff_t>(index); field != fields_.end();
+             ++field)
+            field->doubtful = true;
+    }
+    // The octet of this label announces more octets than there are. It is wrong, and what follows it may be
+    // anything.
+    void doubtBehind(std::string_view label) {
+        for (auto field = fields_.end(); field != fields_.begin() && (--field)->octet != label;)
+            field->doubtful = true;
     }
 
     bool applies(const When& when) const {
@@ -163,15 +181,21 @@ class Engine {
             note(Problem::tooShort);
         const Octets taken = rest_.first(there);
         rest_ = rest_.subspan(there);
-        if (taken.empty())
-            return;
-        if (!understood_ || place.reader == nullptr) {
+        if (!taken.empty())
+            readOctets(row, taken);
+        if (there < wanted && !place.countedBy.empty())
+            doubtBehind(place.countedBy);
+    }
+
+    void readOctets(const Row& row, Octets taken) {
+        if (!understood_ || row.place.reader == nullptr) {
             addRaw(taken, row.name, row.isPersonal || !understood_, row.octet, row.clause);
             fields_.back().doubtful = !understood_;
             return;
         }
         const std::string_view clause = row.clause.empty() ? table_.clause : row.clause;
-        note(place.reader({taken, row.octet, row.name, clause, row.isPersonal, variant_, seen_}, fields_));
+        const Contents contents{taken, row.octet, row.name, clause, row.isPersonal, variant_, seen_};
+        note(row.place.reader(contents, fields_));
     }
 
     // What is left when the rows are used up, or not to be used. It is numbered on from the last octet.

@@ -18,6 +18,7 @@ using isdn::Variant;
 namespace element = isdn::element;
 
 constexpr std::uint8_t extensionBit = 0x80;
+constexpr std::uint8_t tooLong = 0xFF;  // set in a length that is too long, it stays so
 
 class Planner {
   public:
@@ -45,6 +46,9 @@ class Planner {
         const Element dialled = dialledIn(message);
         for (const Element& each : message.elements)
             planElement(each, message, dialled);
+        const isdn::CallReference& reference = message.callReference;
+        if (reference.octets.size() < reference.length)
+            add(reference.octets, Treatment::blank);
         // A call reference whose length is wrong keeps its length octet, which says so.
         const bool wrongLength = message.problem == isdn::Problem::invalid;
         add(behind(message.raw, wrongLength ? 1 : 0), Treatment::blank);
@@ -62,26 +66,39 @@ class Planner {
             plan_.push_back({static_cast<std::size_t>(octets.data() - whole_.data()), octets.size(),
                              treatment, keptBits, setBits});
     }
-    // Blanks octets of an element so that those around them are read as before: bit 8 says where an extension
-    // ends, and in a display a length that is too long must stay so.
+    // Blanks a field of an element so that what is around it is read as before: bit 8 says where a group
+    // ends, other bits of an octet are other fields, and in a display a length that is too long must stay so.
     void addDoubtful(const Field& field, const Element& each) {
-        constexpr std::uint8_t tooLong = 0xFF;
-        add(field.at, Treatment::blank, field.name == "extension" ? extensionBit : std::uint8_t{0},
+        if (field.kind == Field::Kind::extension)
+            return;
+        const bool keepsEnd = field.name == "extension";
+        add(field.at, Treatment::blank, keepsEnd ? extensionBit : bitsBeside(field),
             isDisplay(each) ? tooLong : std::uint8_t{0});
     }
+    // The bits of its octet that are not the field's; none of a field of several octets.
+    static std::uint8_t bitsBeside(const Field& field) {
+        if (field.at.size() != 1)
+            return 0;
+        const unsigned upTo = (1U << field.high) - 1U, below = (1U << (field.low - 1U)) - 1U;
+        return static_cast<std::uint8_t>(~(upTo & ~below));
+    }
 
-    // Octets behind the last action indicator belong to nothing.
+    // Octets behind the last action indicator belong to nothing. If none says that it is the last, the first
+    // is taken for it.
     void planTeiMessage(Octets information) {
         constexpr std::uint8_t teiManagement = 0x0F;
         constexpr std::size_t header = 4;
         const isdn::TeiMessage message = isdn::parseTeiMessage(information);
         if (message.entity != teiManagement)
             add(behind(information, 1), Treatment::blank);
-        else if (information.size() > header)
-            add(behind(information, header + message.actions.size()), Treatment::blank);
+        else if (information.size() > header) {
+            const bool ends = (message.actions.back() & 1U) != 0;
+            add(behind(information, header + (ends ? message.actions.size() : 1)), Treatment::blank);
+        }
     }
 
-    // Groups of ISO/IEC 8885: the parameters of the link stay; user data (FF) has no length.
+    // Groups of ISO/IEC 8885: the parameters of the link stay; user data (FF) has no length. Of a group with
+    // a wrong length, its own or one within it, the identifier alone stays, and so of all that follows.
     void planIdentification(Octets information) {
         constexpr std::uint8_t generalPurpose = 0x82, linkParameters = 0x80;
         constexpr std::size_t header = 3;
@@ -92,11 +109,21 @@ class Planner {
         Octets rest = information.subspan(1);
         while (rest.size() >= header && rest[0] == linkParameters) {
             const std::size_t size = rest[1] * std::size_t{256} + rest[2];
-            if (size > rest.size() - header)
-                break;
+            if (size > rest.size() - header || !areParameters(rest.subspan(header, size))) {
+                add(behind(rest, 1), Treatment::blank, 0, tooLong);
+                return;
+            }
             rest = rest.subspan(header + size);
         }
         add(behind(rest, 1), Treatment::blank);
+    }
+
+    // Identifier, length and value, again and again.
+    static bool areParameters(Octets octets) {
+        constexpr std::size_t header = 2;
+        while (octets.size() >= header && octets[1] <= octets.size() - header)
+            octets = octets.subspan(header + octets[1]);
+        return octets.empty();
     }
 
     // The element that holds digits as the caller dials them: the called number if it has any, else the

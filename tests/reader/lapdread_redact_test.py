@@ -122,6 +122,25 @@ class Redact(Folder):
             rows = csv.DictReader(io.StringIO(self.redact(variant, path, "csv").read_text()))
             self.assertEqual(len(list(rows)), len(octets[0]))
 
+    def test_leaves_nothing_behind_a_wrong_length(self):
+        digits = b"5557654321"
+        times = (f"TX 2026-01-05T08:00:{second:02}.000Z " for second in range(60))
+        damaged = [
+            "00010000080200010504038090a31803a98381200b0c81" + digits.hex(),  # a network with a long name
+            "00010202080200020504038090a3180ea98305" + digits.hex(),          # channel numbers without an end
+            "00010404080f" + digits.hex(),                                    # a call reference
+            "0001af8280000c0502" + digits.hex(),                              # a parameter of XID
+        ]
+        source = self.folder / "damaged.hex"
+        source.write_text("".join(f"{next(times)}{octets}\n" for octets in damaged))
+        for form in ("hex", "jsonl"):
+            with self.subTest(form=form):
+                octets = self.redact("net5", source, form).read_bytes()
+                self.assertEqual(octets.count(b"\n"), len(damaged) + octets.count(b"\n#") + octets.startswith(b"#"))
+                for secret in (digits, digits[:4], digits[-4:]):
+                    for written in (secret, secret.hex().encode(), secret.hex(" ").encode()):
+                        self.assertNotIn(written, octets)
+
     def test_is_undone_by_the_key_but_for_blanks(self):
         for variant, path in EXAMPLES.items():
             redacted = self.redact(variant, path, "pcapng")

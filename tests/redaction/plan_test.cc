@@ -60,6 +60,21 @@ constexpr ElementCase elementCases[] = {
     {"unknown in codeset 7", Variant::net5, "9f 01 02 12 34", "9f 01 02 00 00"},
     {"unknown in codeset 0", Variant::net5, "5e 02 12 34", "5e 02 00 00"},
     {"parameters of network-specific facilities", Variant::net5, "20 05 02 a1 31 81 55", "20 05 02 a1 31 81 ee"},
+    {"network-specific facilities: the name of a network", Variant::net5,
+     "20 05 03 a1 31 32 81", "20 05 03 a1 31 32 81"},
+    {"network-specific facilities: what follows a length that is too long", Variant::net5,
+     "20 0b 0c 81 35 35 35 37 36 35 34 33 32", "20 0b 0c 80 00 00 00 00 00 00 00 00 00"},
+    {"network-specific facilities: no octet behind such a length stays", Variant::net5,
+     "20 05 39 38 37 36 35", "20 05 39 00 00 00 00"},
+    {"network-specific facilities: an extension behind such a length keeps its end", Variant::ess4,
+     "20 07 39 38 37 b6 35 34 33", "20 07 39 00 00 80 00 00 00"},
+    {"channel numbers that do not end: the first stays", Variant::net5,
+     "18 06 a9 83 05 35 35 37", "18 06 a9 83 05 00 00 00"},
+    {"channel numbers stay", Variant::net5, "18 05 a9 83 05 06 87", "18 05 a9 83 05 06 87"},
+    {"an interface that does not end: its first octet stays", Variant::net5,
+     "18 05 e9 05 35 35 37", "18 05 e9 05 00 00 00"},
+    {"an interface of blocked channels that does not end", Variant::net5,
+     "03 05 a1 05 35 35 37", "03 05 a1 05 00 00 00"},
     {"cause and location stay, and a diagnostic that has a table", Variant::net5, "08 03 82 e4 18", "08 03 82 e4 18"},
     {"diagnostic of cause 22", Variant::net5, "08 05 82 96 31 32 33", "08 05 82 96 00 00 00"},
     {"diagnostic of another coding standard", Variant::net5, "08 04 e2 90 31 32", "08 04 e2 90 00 00"},
@@ -115,13 +130,28 @@ constexpr FrameCase frameCases[] = {
     {"another SAPI", "06 01 00 00 31 32", "06 01 00 00 00 00"},
     {"TEI management stays", "fe ff 03 0f 12 34 02 87", "fe ff 03 0f 12 34 02 87"},
     {"what follows a TEI message", "fe ff 03 0f 12 34 02 87 31 32", "fe ff 03 0f 12 34 02 87 00 00"},
+    {"action indicators that do not end: the first stays",
+     "fe ff 03 0f 12 34 05 86 32 34 36", "fe ff 03 0f 12 34 05 86 00 00 00"},
     {"another management entity", "fe ff 03 10 12 34", "fe ff 03 10 00 00"},
     {"a frame reject stays", "02 01 97 01 02 04 06 01", "02 01 97 01 02 04 06 01"},
     {"XID: the link's parameters stay, user data does not",
      "02 01 af 82 80 00 03 05 01 08 ff 31 32", "02 01 af 82 80 00 03 05 01 08 ff 00 00"},
+    {"XID: a group with a wrong length, which stays wrong",
+     "02 01 af 82 80 00 03 05 01 08 80 35 36 05 02 35 36",
+     "02 01 af 82 80 00 03 05 01 08 80 ff ff ff ff ff ff"},
+    {"XID: a group whose parameters have a wrong length",
+     "02 01 af 82 80 00 0c 05 02 35 35 35 37 36 35 34 33 32 31",
+     "02 01 af 82 80 ff ff ff ff ff ff ff ff ff ff ff ff ff ff"},
+    {"XID: a parameter without a length", "02 01 af 82 80 00 01 35 ff 31", "02 01 af 82 80 ff ff ff ff ff"},
     {"XID of another format", "02 01 af 31 32 33", "02 01 af 00 00 00"},
     {"another protocol", "02 01 00 00 41 01 01 05 70", "02 01 00 00 41 00 00 00 00"},
     {"a call reference with a wrong length", "02 01 00 00 08 31 32 33", "02 01 00 00 08 31 00 00"},
+    {"a call reference longer than what is there",
+     "02 01 00 00 08 0f 35 35 35 37 36", "02 01 00 00 08 0f 00 00 00 00 00"},
+    {"a call reference that is one octet longer than what is there",
+     "02 01 00 00 08 05 35 35 35 37", "02 01 00 00 08 05 00 00 00 00"},
+    {"a long call reference stays", "02 01 00 00 08 05 35 35 35 37 36 05", "02 01 00 00 08 05 35 35 35 37 36 05"},
+    {"a call reference behind which the message ends", "02 01 00 00 08 02 00 01", "02 01 00 00 08 02 00 01"},
     {"a control field that nobody knows", "02 01 ff 31 32", "02 01 ff 00 00"},
     {"an address that does not end", "02 00 00 00 08 01 01 05", "02 00 00 00 00 00 00 00"},
     {"SERVICE stays", "02 01 00 00 03 02 00 00 0f 01 01 80 18 03 a9 83 81",
@@ -137,6 +167,19 @@ constexpr FrameCase frameCases[] = {
 TEST(Plan, ofEachFrame) {
     for (const FrameCase& each : frameCases)
         EXPECT_EQ(redactedFrame(hex(each.octets), Variant::net5), each.expected) << each.says;
+}
+
+// Whatever was wrong in a frame is still wrong in the same place once it is redacted.
+TEST(Plan, ofARedactedFrameIsThatOfTheOriginal) {
+    const auto requireSame = [](const std::string& before, const std::string& after, Variant variant,
+                                const char* says) {
+        EXPECT_EQ(planOfFrame(hex(before), variant), planOfFrame(hex(after), variant)) << says;
+    };
+    const std::string setup = "02 01 00 00 08 01 01 05 ";
+    for (const ElementCase& each : elementCases)
+        requireSame(setup + each.octets, setup + each.expected, each.variant, each.says);
+    for (const FrameCase& each : frameCases)
+        requireSame(each.octets, each.expected, Variant::net5, each.says);
 }
 
 }  // namespace
