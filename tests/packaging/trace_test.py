@@ -38,11 +38,18 @@ class Trace(unittest.TestCase):
         (self.folder / "plan").write_text("".join(line + "\n" for line in plan))
         process = subprocess.Popen([WRAPPER, instance], stdout=subprocess.PIPE, stderr=subprocess.STDOUT, text=True, env={
             **os.environ, "LAPDMON_PROGRAM": str(self.folder / "lapdmon"), "LAPDMON_LONGEST_PAUSE": "0",
-            "TMPDIR": str(self.folder)})
+            "TMPDIR": str(self.folder)}, start_new_session=True)
         self.addCleanup(process.stdout.close)
         self.addCleanup(process.wait)
-        self.addCleanup(process.kill)
+        self.addCleanup(self.kill_with_all_that_it_started, process)
         return process
+
+    @staticmethod
+    def kill_with_all_that_it_started(process):
+        try:
+            os.killpg(process.pid, signal.SIGKILL)
+        except ProcessLookupError:
+            pass
 
     def lines_until(self, process, last):
         lines = []
