@@ -85,8 +85,10 @@ void Waits::heard(Call& call, const Message& message) {
         return;
     if (message.layer3.type == type::connectAcknowledge && message.senderRole() == capture::Role::user)
         acknowledging_.insert(message.layer2.tei);
-    answer(call, message);
-    ask(call, message);
+    const bool answersDisconnect = answer(call, message);
+    // DISCONNECTs that cross answer each other, and either side may go on with RELEASE (Q.931 5.3.5).
+    if (!answersDisconnect || message.layer3.type != type::disconnect)
+        ask(call, message);
 }
 
 std::vector<std::uint64_t> Waits::waitsOf(const Call& call) const {
@@ -94,10 +96,11 @@ std::vector<std::uint64_t> Waits::waitsOf(const Call& call) const {
     return found == ofCall_.end() ? std::vector<std::uint64_t>() : found->second;
 }
 
-void Waits::answer(Call& call, const Message& message) {
+bool Waits::answer(Call& call, const Message& message) {
     const std::uint8_t messageType = message.layer3.type;
     const bool clears = isClearing(messageType);
     const std::vector<std::uint64_t> pending = waitsOf(call);
+    bool answersDisconnect = false;
     for (const std::uint64_t id : pending) {
         const Wait& wait = waits_.at(id);
         const Rule& rule = *wait.rule;
@@ -107,13 +110,18 @@ void Waits::answer(Call& call, const Message& message) {
                                announces(message, {endToEndNot, destinationNotIsdn, inBandInformation})) ||
                               (clears && rule.clearingAnswers);
         if (answered) {
+            answersDisconnect = answersDisconnect || rule.ask == type::disconnect;
             drop(id);
         } else if (rule.ask == type::disconnect && messageType == type::release &&
                    message.from() == wait.asker) {
-            expire(wait, message.at);  // its sender has given up waiting
+            // Its sender goes on. It may do so at any time; if it does when its timer has run out, nobody
+            // had answered.
+            if (message.at >= wait.deadline - timers_.slack)
+                expire(wait, message.at);
             drop(id);
         }
     }
+    return answersDisconnect;
 }
 
 void Waits::ask(Call& call, const Message& message) {
@@ -137,7 +145,7 @@ void Waits::ask(Call& call, const Message& message) {
     wait.tei = message.layer2.tei;
     wait.first = wait.last = momentOf(message);
     wait.timer = timerOf(*rule, message);
-    wait.deadline = message.at + wait.timer * (rule->isRepeated ? 2 : 1) + timers_.slack;
+    wait.deadline = message.at + wait.timer.value * (rule->isRepeated ? 2 : 1) + timers_.slack;
     const std::uint64_t id = ++lastId_;
     ofCall_[call.number].push_back(id);
     deadlines_.emplace(wait.deadline, id);
@@ -145,13 +153,13 @@ void Waits::ask(Call& call, const Message& message) {
 }
 
 // Who waits decides: a timer may differ between the user and the network side.
-std::int64_t Waits::timerOf(const Rule& rule, const Message& message) const {
+Waits::Timer Waits::timerOf(const Rule& rule, const Message& message) const {
     if (rule.ask == type::disconnect && announces(message, {inBandInformation}))
-        return timers_.t306;
+        return {"T306", timers_.t306};
     const capture::Role sender = message.senderRole();
     const bool networkWaits =
         rule.sameSideAnswers ? sender == capture::Role::user : sender == capture::Role::network;
-    return networkWaits ? timers_.*rule.network : timers_.*rule.user;
+    return {rule.timer, networkWaits ? timers_.*rule.network : timers_.*rule.user};
 }
 
 void Waits::repeat(Wait& wait, const Message& message) {
@@ -167,7 +175,7 @@ void Waits::repeat(Wait& wait, const Message& message) {
                                   [&](const auto& each) { return &waits_.at(each.second) == &wait; });
     const std::uint64_t id = old->second;
     deadlines_.erase(old);
-    wait.deadline = message.at + wait.timer + timers_.slack;
+    wait.deadline = message.at + wait.timer.value + timers_.slack;
     deadlines_.emplace(wait.deadline, id);
 }
 
@@ -190,7 +198,7 @@ void Waits::expire(const Wait& wait, std::int64_t until) {
     const Rule& rule = *wait.rule;
     const std::string name(isdn::messageName(isdn::callControl, rule.ask));
     std::string what = name + " of frame " + std::to_string(wait.first.frame) + " got no answer for " +
-                       seconds(until - wait.first.at) + " (" + std::string(rule.timer);
+                       seconds(until - wait.first.at) + " (" + std::string(wait.timer.name);
     what += wait.repetitions == 0 ? ")" : ", repeated " + std::to_string(wait.repetitions) + "x)";
     const Side answering = rule.sameSideAnswers ? wait.asker : other(wait.asker);
     const std::string_view doubt =

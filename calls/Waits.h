@@ -5,6 +5,8 @@
 #include <cstdint>
 #include <map>
 #include <set>
+#include <string>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -34,6 +36,11 @@ class Waits : public CallObserver {
     struct Rule;
     static const std::vector<Rule>& rules();
 
+    // The one that the asker starts.
+    struct Timer {
+        std::string_view name;
+        std::int64_t value = 0;
+    };
     // One question of a call, from when it was asked first.
     struct Wait {
         const Rule* rule = nullptr;
@@ -44,17 +51,18 @@ class Waits : public CallObserver {
         Moment last;  // the latest repetition
         unsigned repetitions = 0;
         std::int64_t deadline = 0;
-        std::int64_t timer = 0;
+        Timer timer;
     };
     using Deadlines = std::set<std::pair<std::int64_t, std::uint64_t>>;  // when, and which wait
 
-    void answer(Call& call, const Message& message);
+    // Whether the message answers the other side's DISCONNECT.
+    bool answer(Call& call, const Message& message);
     void ask(Call& call, const Message& message);
     void repeat(Wait& wait, const Message& message);
     void expire(const Wait& wait, std::int64_t until);
     void drop(std::uint64_t id);
     void dropAll(const Call& call);
-    std::int64_t timerOf(const Rule& rule, const Message& message) const;
+    Timer timerOf(const Rule& rule, const Message& message) const;
     void report(const FindingKind& kind, const Wait& wait, std::string sentence);
     std::vector<std::uint64_t> waitsOf(const Call& call) const;
 

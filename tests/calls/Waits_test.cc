@@ -87,6 +87,33 @@ TEST(Waits, GiveADisconnectWithAnAnnouncementTheTimeOfT306) {
     EXPECT_EQ(findingsOf(script, 60000), "");
 }
 
+TEST(Waits, LetTheSenderOfADisconnectGoOnBeforeItsTimerRunsOut) {
+    for (const std::uint8_t indicator : {1, 8}) {
+        CallScript script = afterACall();
+        script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+        script.at(11000).peer(m::callProceeding, 2, true);
+        script.at(12000).peer(m::disconnect, 2, true, {cause(1, 2), progress(indicator)});
+        script.at(32000).peer(m::release, 2, true).us(m::releaseComplete, 2, false);
+        EXPECT_EQ(findingsOf(script, 60000), "") << int{indicator};
+    }
+}
+
+TEST(Waits, TakeDisconnectsThatCrossForAnswers) {
+    for (const Side one : {Side::us, Side::peer}) {
+        CallScript script = afterACall();
+        script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+        script.at(11000).peer(m::connect, 2, true);
+        const Side another = other(one);
+        script.at(12000).crossing();
+        script.message(one, m::disconnect, 2, one == Side::peer, {cause(16)});
+        script.message(another, m::disconnect, 2, another == Side::peer, {cause(16)});
+        script.at(12010).acknowledge(Side::us).acknowledge(Side::peer);
+        script.at(12050).message(another, m::release, 2, another == Side::peer);
+        script.at(12100).message(one, m::releaseComplete, 2, one == Side::peer);
+        EXPECT_EQ(findingsOf(script, 60000), "") << (one == Side::us);
+    }
+}
+
 TEST(Waits, FindAReleaseThatIsNotAnsweredAfterItsRepetition) {
     CallScript script = afterACall();
     script.at(10000).us(m::setup, 2, false, {bearerSpeech()});

@@ -54,6 +54,25 @@ void crossingDisconnects(CallScript& s, bool spoilt) {
     end(s, 60000);
 }
 
+void disconnectsCrossBeforeRelease(CallScript& s, bool spoilt) {
+    talk(s.at(0).linkUp().at(100), 1, 1);
+    s.at(5000).crossing();
+    s.us(m::disconnect, 1, false, {cause(16)}).peer(m::disconnect, 1, true, {cause(16)});
+    s.at(5010).acknowledge(Side::us).acknowledge(Side::peer);
+    s.at(5050).peer(m::release, 1, true).acknowledge(Side::us);
+    if (!spoilt)
+        s.at(5100).us(m::releaseComplete, 1, false).acknowledge(Side::peer);
+    end(s, 60000);
+}
+
+void senderOfDisconnectGoesOn(CallScript& s, bool spoilt) {
+    s.at(0).linkUp().at(100).us(m::setup, 1, false, {bearerSpeech(), channel(1), called("4021")});
+    s.at(150).peer(m::callProceeding, 1, true, {channel(1)});
+    s.at(1000).peer(m::disconnect, 1, true, {cause(1, 2), progress(8)}).acknowledge(Side::us);
+    s.at(spoilt ? 31000 : 21000).peer(m::release, 1, true, {cause(1, 2)}).us(m::releaseComplete, 1, false);
+    end(s, 60000);
+}
+
 void crossingReleases(CallScript& s, bool spoilt) {
     talk(s.at(0).linkUp().at(100), 1, 1);
     if (spoilt) {
@@ -272,6 +291,10 @@ constexpr Trap all[] = {
      noConnectAcknowledge, &findings::connectNotAcknowledged},
     {"crossing-disconnects", "both sides send DISCONNECT at once", user, crossingDisconnects,
      &findings::disconnectUnanswered},
+    {"disconnects-cross-before-release", "both sides send DISCONNECT at once, and one goes on with RELEASE",
+     user, disconnectsCrossBeforeRelease, &findings::releaseUnanswered},
+    {"sender-of-disconnect-goes-on", "the network ends its announcement with RELEASE after 20 s", user,
+     senderOfDisconnectGoesOn, &findings::disconnectUnanswered},
     {"crossing-releases", "both sides send RELEASE at once; no RELEASE COMPLETE follows", user,
      crossingReleases, &findings::releaseUnanswered},
     {"reject-and-repetition", "REJ, and the frames that it asks for", user, rejectAndRepetition,
