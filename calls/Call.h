@@ -104,6 +104,7 @@ struct Call {
     std::string bearer;  // in words: "speech", "64k unrestricted"
     std::optional<isdn::ChannelId> asked;
     std::optional<isdn::ChannelId> granted;  // of the first answer that names one
+    std::optional<isdn::ChannelId> moved;    // of the latest RETRIEVE or RESUME ACKNOWLEDGE
     std::string askedWords;                  // the same in words: "30!", "any", "none", "0/30"
     std::string grantedWords;
 
@@ -137,8 +138,10 @@ struct Call {
 
     static constexpr std::size_t mostFrames = 1000;
 
-    // The channel that it holds as far as is known: the one granted, else the one asked for.
+    // The channel that it was given first, as far as is known: the one granted, else the one asked for.
     const std::optional<isdn::ChannelId>& channel() const { return granted ? granted : asked; }
+    // The one that it has now: a call may come back from hold, or from suspension, on another.
+    const std::optional<isdn::ChannelId>& held() const { return moved ? moved : channel(); }
 };
 
 // "before-trace setup-repeated"; blanks between, empty for none.

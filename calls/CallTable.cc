@@ -49,7 +49,7 @@ struct Restarted {
     std::optional<isdn::ChannelId> channel;
 
     bool covers(const Call& call) const {
-        const auto& held = call.channel();
+        const auto& held = call.held();
         if (kind == allInterfaces)
             return true;
         if (!held || (channel && channel->interface != held->interface))

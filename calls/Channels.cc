@@ -118,7 +118,7 @@ void Channels::hunt(const Call& call, const Seizure& seizure, const Message& mes
 
 void Channels::hold(Call& call, Seizure& seizure, const Message& message) {
     release(call.number, seizure);
-    seizure.held = channelsOf(call.channel());
+    seizure.held = channelsOf(call.held());
     for (const ChannelKey& key : seizure.held) {
         State* const state = stateOf(key);
         if (state == nullptr)

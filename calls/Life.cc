@@ -75,6 +75,8 @@ void learnChannel(Life& life, const Message& message) {
     if (!channel)
         return;
     Call& call = life.call;
+    if (message.layer3.type == type::retrieveAcknowledge || message.layer3.type == type::resumeAcknowledge)
+        call.moved = channel;
     if (message.from() == call.origin) {
         if (message.layer3.type == type::setup && !call.asked) {
             call.asked = channel;

@@ -153,6 +153,17 @@ void holdAndSecondCall(CallScript& s, bool spoilt) {
     end(s, 30000);
 }
 
+void retrieveOnAnotherChannel(CallScript& s, bool spoilt) {
+    talk(s.at(0).linkUp().at(100), 1, 1);
+    s.at(3000).us(m::hold, 1, false).peer(m::holdAcknowledge, 1, true);
+    s.at(9500).us(m::retrieve, 1, false);
+    s.at(9510).peer(m::retrieveAcknowledge, 1, true, {channel(2)});
+    talk(s.at(10000), 2, spoilt ? 2 : 1);
+    clear(s.at(19000), 2);
+    clear(s.at(20000), 1);
+    end(s, 30000);
+}
+
 void suspendAndResume(CallScript& s, bool spoilt) {
     talk(s.at(0).linkUp().at(100), 1, 1);
     s.at(3000).us(m::suspend, 1, false, {callIdentity(7)});
@@ -306,6 +317,8 @@ constexpr Trap all[] = {
      &findings::disconnectUnanswered},
     {"hold-and-second-call", "HOLD, and a second call on the channel of the first", user, holdAndSecondCall,
      &findings::doubleSeizure},
+    {"retrieve-on-another-channel", "RETRIEVE on another channel, and a call on the one before", user,
+     retrieveOnAnotherChannel, &findings::doubleSeizure},
     {"suspend-and-resume", "SUSPEND, and RESUME a minute later on another channel", user, suspendAndResume,
      &findings::referenceInUse},
     {"segments", "a SETUP in two segments", user, segments, &findings::segmentsUnfinished},
