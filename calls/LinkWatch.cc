@@ -62,6 +62,8 @@ void LinkWatch::take(const DChannel& channel, const Sample& sample, const Circum
     demands(sample, around);
     if (sample.layer2.hasNr() && channel.link() != nullptr)
         windows(sample, *channel.link(), around);
+    if (marks.linkUp || marks.linkDown)
+        notReady_ = {};  // the link begins anew, and both sides with it
     if (sample.layer2.type == FrameType::I)
         repetitions(sample, marks);
     up_ = marks.state == LinkState::up;

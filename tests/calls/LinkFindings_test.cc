@@ -333,6 +333,12 @@ TEST(ReceiverNotReady, IsFoundAfterTenSeconds) {
     EXPECT_EQ(found(std::string(up) + "1 < RNR 0\n5 < RNR 0\n10 < RR 0\n12 > RR 0 P\n12.1 < RR 0 F\n"), "");
 }
 
+TEST(ReceiverNotReady, IsOverWhenTheLinkIsSetUpAgain) {
+    EXPECT_EQ(found(std::string(up) + "1 < RNR 0\n2 > DISC\n2.1 < UA\n3 > SABME\n3.1 < UA\n"
+                                      "20 > RR 0 P\n20.1 < RR 0 F\n"),
+              "");
+}
+
 TEST(OneDirectionSilent, IsFoundWhenEveryDemandIsInVain) {
     EXPECT_EQ(found(std::string(up) + "10 > RR 0 P\n11 > RR 0 P\n12 > RR 0 P\n13 > RR 0 P\n"
                                       "14.1 > SABME\n15.1 > SABME\n16.1 > SABME\n17.1 > SABME\n20 > SABME\n"),
