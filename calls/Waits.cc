@@ -104,6 +104,9 @@ bool Waits::answer(Call& call, const Message& message) {
     for (const std::uint64_t id : pending) {
         const Wait& wait = waits_.at(id);
         const Rule& rule = *wait.rule;
+        // Each terminal of a call to all answers for itself; but any of them may go on with the call.
+        if (wait.tei != message.layer2.tei && !rule.sameSideAnswers)
+            continue;
         const Side answering = rule.sameSideAnswers ? wait.asker : other(wait.asker);
         const bool answered = (message.from() == answering && rule.answers.test(messageType & 127U)) ||
                               (rule.ask == type::callProceeding && messageType == type::progress &&
@@ -129,11 +132,12 @@ void Waits::ask(Call& call, const Message& message) {
         return each.ask == message.layer3.type &&
                (each.asker == capture::Role::unknown || each.asker == message.senderRole());
     });
-    if (rule == rules().end() || call.broadcast)
+    // Which terminals are there is not known, and so not whether a SETUP to all has to be answered.
+    if (rule == rules().end() || (call.broadcast && rule->ask == type::setup))
         return;
     for (const std::uint64_t id : waitsOf(call)) {
         Wait& wait = waits_.at(id);
-        if (wait.rule == &*rule && wait.asker == message.from()) {
+        if (wait.rule == &*rule && wait.asker == message.from() && wait.tei == message.layer2.tei) {
             repeat(wait, message);
             return;
         }

@@ -153,6 +153,27 @@ TEST(Waits, FindAStatusEnquiryThatIsNotAnswered) {
     EXPECT_EQ(findingsOf(script, 20100), "");
 }
 
+TEST(Waits, AreKeptForEachTerminalOfACallToAll) {
+    for (const bool faulty : {false, true}) {
+        CallScript script = afterACall(capture::Role::network);
+        script.at(10000).broadcast(Side::us, m::setup, 4, {bearerSpeech()});
+        script.at(10100).tei(64).peer(m::connect, 4, true);
+        script.at(10200).tei(65).peer(m::connect, 4, true);
+        script.at(10300).tei(64).us(m::connectAcknowledge, 4, false, {channel(1)});
+        if (!faulty)
+            script.at(10400).tei(65).us(m::release, 4, false, {cause(26, 2)});
+        if (!faulty)
+            script.at(10500).tei(65).peer(m::releaseComplete, 4, true);
+        script.at(30000).tei(64).us(m::disconnect, 4, false, {cause(16)});
+        if (!faulty)
+            script.at(30100).tei(64).peer(m::release, 4, true);
+        if (!faulty)
+            script.at(30200).tei(64).us(m::releaseComplete, 4, false);
+        EXPECT_EQ(findingsOf(script, 90000),
+                  faulty ? "5 connect-not-acknowledged\n7 disconnect-unanswered\n" : "");
+    }
+}
+
 TEST(Waits, SayThatItCannotBeToldWhenTheLinkLeavesADoubt) {
     CallScript script = afterACall();
     script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
