@@ -91,12 +91,14 @@ void CallFindings::checkCause(const Call& call, const Message& message) {
 
 void CallFindings::checkStatus(const Call& call, Notes& notes, const Message& message) {
     if (message.layer3.type == type::statusEnquiry) {
-        notes.enquired = true;
+        notes.enquired[static_cast<std::size_t>(message.from())] = true;
         return;
     }
     if (message.layer3.type != type::status)
         return;
-    const bool asked = std::exchange(notes.enquired, false);
+    const bool asked = std::exchange(notes.enquired[static_cast<std::size_t>(other(message.from()))], false);
+    if (call.beforeTrace && call.messages == 1)
+        return;  // what was before it is not known
     const isdn::Element state = message.layer3.elements.find(element::callState);
     const auto value = isdn::callState(state);
     if (value && value->codingStandard == 0 && value->value == 0 && !notes.cleared) {

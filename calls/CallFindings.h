@@ -2,6 +2,8 @@
 #ifndef CALLS_CALLFINDINGS_H
 #define CALLS_CALLFINDINGS_H
 
+#include <array>
+#include <cstdint>
 #include <map>
 
 #include "calls/CallTable.h"
@@ -26,8 +28,8 @@ class CallFindings : public CallObserver {
   private:
     // What has to be remembered of a call that is alive.
     struct Notes {
-        bool enquired = false;      // STATUS ENQUIRY has passed, not yet answered
-        bool acknowledged = false;  // SETUP ACKNOWLEDGE has passed, and nothing later
+        std::array<bool, 2> enquired{};  // a side's STATUS ENQUIRY has passed, not yet answered
+        bool acknowledged = false;       // SETUP ACKNOWLEDGE has passed, and nothing later
         bool sendingComplete = false;
         bool cleared = false;  // a clearing message has passed
         bool channelChecked = false;

@@ -195,7 +195,7 @@ Life* CallTable::belongsTo(const Message& message, const CallKey& key) {
     const bool onlyEndsOrAsks = messageType == type::release || messageType == type::releaseComplete ||
                                 messageType == type::disconnect || messageType == type::status ||
                                 messageType == type::statusEnquiry;
-    if (namesNullState(message) || (onlyEndsOrAsks && remembered_.contains(key)))
+    if (onlyEndsOrAsks && remembered_.contains(key))
         return nullptr;
     return &begin(message, key);
 }

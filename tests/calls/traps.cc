@@ -297,6 +297,25 @@ void statusAfterEnquiry(CallScript& s, bool spoilt) {
     end(s, 10000);
 }
 
+void enquiriesCross(CallScript& s, bool spoilt) {
+    talk(s.at(0).linkUp().at(100), 1, 1);
+    s.at(5000).crossing();
+    s.us(m::statusEnquiry, 1, false).peer(m::statusEnquiry, 1, true);
+    s.at(5050).us(m::status, 1, false, {cause(30), callState(10)});
+    s.at(5060).peer(m::status, 1, true, {cause(30), callState(spoilt ? 0 : 10)});
+    if (!spoilt)
+        clear(s.at(9000), 1);
+    end(s, 10000);
+}
+
+void statusOfAnOlderCall(CallScript& s, bool spoilt) {
+    s.at(0).linkUp();
+    s.at(1000).us(m::status, 7, false, {cause(30), callState(0)}).acknowledge(Side::peer);
+    if (spoilt)  // and once more, when it is forgotten
+        s.at(20000).us(m::status, 7, false, {cause(30), callState(0)}).acknowledge(Side::peer);
+    end(s, 30000);
+}
+
 constexpr Trap all[] = {
     {"no-connect-acknowledge", "the caller does not acknowledge CONNECT, which is its choice", user,
      noConnectAcknowledge, &findings::connectNotAcknowledged},
@@ -333,6 +352,10 @@ constexpr Trap all[] = {
      &findings::unknownReference},
     {"another-channel", "an answer on another channel than the one preferred", user, anotherChannel,
      &findings::channelChanged},
+    {"enquiries-cross", "both sides send STATUS ENQUIRY at once", user, enquiriesCross,
+     &findings::statusIncompatible},
+    {"status-of-an-older-call", "STATUS with state 0 for a call from before the trace", user,
+     statusOfAnOlderCall, &findings::unknownReference},
     {"status-after-enquiry", "STATUS with cause 30 behind STATUS ENQUIRY", user, statusAfterEnquiry,
      &findings::statusIncompatible},
 };

@@ -15,7 +15,7 @@ class Traps(unittest.TestCase):
 
     def test_show_no_warning(self):
         paths = sorted(path for path in TRAPS.glob("*.hex") if not path.name.startswith("changeover"))
-        self.assertEqual(len(paths), 21)
+        self.assertEqual(len(paths), 23)
         for path in paths:
             with self.subTest(path.name):
                 self.checked(path)
