@@ -55,7 +55,7 @@ struct Analysis::Channel {
     void restarted() {
         links.restarted();
         linkFindings.restarted();
-        group.table().boardRestarted();
+        group.boardRestarted();
     }
     // A frame that carries a message.
     void take(const Message& message, const Timers& timers) {

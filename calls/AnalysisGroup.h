@@ -79,6 +79,12 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
         table_.finish();
         patterns_.finish();
     }
+    // The board of one of its D channels restarted.
+    void boardRestarted() {
+        table_.boardRestarted();
+        waits_.boardRestarted();
+        channels_.boardRestarted();
+    }
     CallTable& table() { return table_; }
     const CallTable& table() const { return table_; }
 

@@ -170,6 +170,8 @@ void CallFindings::ended(Call& call, const Message* by) {
 }
 
 void CallFindings::replaced(Call& old, Call& by, const Message& message) {
+    if (old.uncertain)
+        return;  // its end may be what is missing
     report(findings::referenceInUse, &by, message,
            nameOf(message) + " takes the reference of call " + std::to_string(old.number) +
                ", which had not ended");

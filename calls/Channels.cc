@@ -229,7 +229,7 @@ void Channels::noteRefusal(const Call& call, const Seizure& seizure) {
 // The call went without clearing: one end may still hold the channel.
 void Channels::noteOrphan(const Call& call, const Seizure& seizure) {
     const bool lost = call.endedBy == EndedBy::replaced || call.endedBy == EndedBy::link;
-    if (!lost || call.clearingSeen)
+    if (!lost || call.clearingSeen || call.uncertain)
         return;
     for (const ChannelKey& key : seizure.held) {
         Finding stuck = findingOf(findings::stuckChannel, call.end, call,
@@ -291,6 +291,14 @@ void Channels::restarted(const Message& acknowledge) {
         state.refusals = 0;
         state.seenFree = state.seenFree || state.holders.empty();
     }
+}
+
+void Channels::boardRestarted() {
+    for (auto& [key, state] : states_)
+        state = {};
+    seizures_.clear();
+    orphans_.clear();
+    conflicts_.clear();
 }
 
 void Channels::advance(std::int64_t at) {

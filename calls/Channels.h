@@ -26,6 +26,8 @@ class Channels : public CallObserver {
     void gone(const Call& call) override;
     // RESTART ACKNOWLEDGE: its channels are free, whatever was wrong with them.
     void restarted(const Message& acknowledge);
+    // The board restarted: who holds what is not known any more.
+    void boardRestarted();
     // The clock has come to `at`; to be called before what happened then is handed in.
     void advance(std::int64_t at);
     // The end of the trace.

@@ -217,8 +217,9 @@ void LinkFindings::lost(std::string sentence) {
 
 void LinkFindings::restarted() {
     forgetWhatWaits();
-    // Before the first frame, a start is nothing that was interrupted.
-    if (lastFrame_ != 0)
+    // Before the first frame, a start is nothing that was interrupted. The recorder's word and the clock that
+    // falls are one restart.
+    if (std::exchange(restartSaid_, lastFrame_) != lastFrame_)
         observe({&findings::boardRestarted, findings::boardRestarted.severity, lastFrame_, lastAt_,
                  "the recorder or the board was started again"},
                 0);

@@ -64,6 +64,7 @@ class LinkFindings {
     TeiWatch teis_;
     std::array<std::uint64_t, 2> heard_{};  // frames of each direction
     std::uint64_t lastFrame_ = 0;
+    std::uint64_t restartSaid_ = 0;  // the last frame before the restart that was reported
     std::int64_t lastAt_ = 0;
     std::int64_t offset_ = 0;  // of the frames' times against the D channel's clock
     capture::Clock clock_ = capture::Clock::none;

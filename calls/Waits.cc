@@ -185,6 +185,12 @@ void Waits::repeat(Wait& wait, const Message& message) {
 
 void Waits::ended(Call& call, const Message*) { dropAll(call); }
 
+void Waits::boardRestarted() {
+    waits_.clear();
+    ofCall_.clear();
+    deadlines_.clear();
+}
+
 void Waits::advance(std::int64_t at) {
     while (!deadlines_.empty() && deadlines_.begin()->first <= at) {
         const std::uint64_t id = deadlines_.begin()->second;

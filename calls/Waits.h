@@ -29,6 +29,8 @@ class Waits : public CallObserver {
     void heard(Call& call, const Message& message) override;
     void ended(Call& call, const Message* by) override;
 
+    // The board restarted: whether an answer came is not known.
+    void boardRestarted();
     // The clock has come to `at`; to be called before what happened then is handed in.
     void advance(std::int64_t at);
 

@@ -129,6 +129,32 @@ TEST(Channels, WhoseCallWasReplacedAreStuckUntilTheyAreRestarted) {
     EXPECT_EQ(findingsIn(script), "5 reference-in-use\n");
 }
 
+// The recorder says that it was started again, twice, and later the reference and the channel of the first
+// call are taken by others, while nothing answers what was asked before.
+TEST(Channels, AreHeldByNobodyAfterTheBoardRestarted) {
+    CallScript script;
+    talk(script.at(0).linkUp(), 1, 30);
+    talk(script, 2, 29);
+    script.at(2000).us(m::disconnect, 2, false, {cause(16)}).acknowledge(Side::peer);
+    const std::size_t before = script.frames().size();
+    script.at(60000).linkUp();
+    talk(script, 3, 30);
+    talk(script.at(70000), 1, 28);
+    Collected collected;
+    Analysis analysis({}, collected);
+    std::uint64_t number = 0;
+    for (const Sent& sent : script.frames()) {
+        analysis.take(sent.frame, ++number);
+        if (number == before) {
+            analysis.restarted(*sent.frame.interface);
+            analysis.restarted(*sent.frame.interface);
+        }
+    }
+    analysis.advance(300 * second);
+    analysis.finish();
+    EXPECT_EQ(collected.lines, std::to_string(before) + " board-restarted\n");
+}
+
 TEST(Channels, OfALongCallOrThatNobodyUsesAreNeverStuck) {
     CallScript script;
     talk(script.at(0), 1, 30);
