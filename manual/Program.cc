@@ -86,7 +86,7 @@ std::vector<Option> sharedOptions(const Program& program) {
     return shared;
 }
 
-void setChoices(Program& program, const std::string& name, std::vector<std::string> choices) {
+void setChoices(Program& program, const std::string& name, const std::vector<std::string>& choices) {
     for (Command& command : program.commands) {
         for (Option& option : command.options) {
             if (std::find(option.names.begin(), option.names.end(), name) != option.names.end()) {

@@ -48,7 +48,7 @@ Program programOf(const CLI::App& app);
 std::vector<Option> sharedOptions(const Program& program);
 
 // A word of --help: "--fault" takes one of these.
-void setChoices(Program& program, const std::string& option, std::vector<std::string> choices);
+void setChoices(Program& program, const std::string& option, const std::vector<std::string>& choices);
 
 // "Examples:" names the lines of a footer from that one to the next empty line, without their title.
 std::string sectionOf(const std::string& footer, const std::string& title);

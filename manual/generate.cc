@@ -40,7 +40,7 @@ Program softboard() {
     std::vector<std::string> faults;
     for (const softboard::FaultName& row : softboard::faultNames())
         faults.push_back(row.name);
-    setChoices(program, "--fault", std::move(faults));
+    setChoices(program, "--fault", faults);
     return program;
 }
 

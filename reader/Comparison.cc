@@ -149,7 +149,7 @@ class Comparer {
 
     void pair(const ComparedMessage& a, const ComparedMessage& b) {
         const std::size_t before = result.differences.size();
-        const Difference in = about(&a, &b);
+        const Difference in = about(a, a.frame, b.frame);
         for (const ComparedMessage::Whole& each : a.elements) {
             if (find(b, each.element) == nullptr)
                 add(in, Difference::Kind::element, {each.element, ""}, each.words, "");
@@ -179,9 +179,13 @@ class Comparer {
                          [&](const Difference& x, const Difference& y) { return rank(x) < rank(y); });
         ++(result.differences.size() == before ? result.alike : result.differ);
     }
-    void only(const ComparedMessage* a, const ComparedMessage* b) {
-        result.differences.push_back(about(a, b));
-        ++(a != nullptr ? result.onlyA : result.onlyB);
+    void onlyInA(const ComparedMessage& message) {
+        result.differences.push_back(about(message, message.frame, 0));
+        ++result.onlyA;
+    }
+    void onlyInB(const ComparedMessage& message) {
+        result.differences.push_back(about(message, 0, message.frame));
+        ++result.onlyB;
     }
 
     Comparison result;
@@ -191,13 +195,13 @@ class Comparer {
         std::string element, field;
     };
 
-    Difference about(const ComparedMessage* a, const ComparedMessage* b) const {
-        const ComparedMessage& either = a != nullptr ? *a : *b;
+    // The frames are 0 where there is none.
+    Difference about(const ComparedMessage& message, std::uint64_t frameA, std::uint64_t frameB) const {
         Difference difference;
-        difference.message = either.name;
-        difference.direction = directionOf(either, byRole_);
-        difference.frameA = a != nullptr ? a->frame : 0;
-        difference.frameB = b != nullptr ? b->frame : 0;
+        difference.message = message.name;
+        difference.direction = directionOf(message, byRole_);
+        difference.frameA = frameA;
+        difference.frameB = frameB;
         return difference;
     }
     void add(Difference in, Difference::Kind kind, Place place, std::string a, std::string b) {
@@ -270,9 +274,9 @@ Comparison compare(std::span<const ComparedMessage> a, std::span<const ComparedM
     std::size_t i = 0, j = 0;
     const auto upTo = [&](std::size_t endA, std::size_t endB) {
         for (; i < endA; ++i)
-            comparer.only(&a[i], nullptr);
+            comparer.onlyInA(a[i]);
         for (; j < endB; ++j)
-            comparer.only(nullptr, &b[j]);
+            comparer.onlyInB(b[j]);
     };
     for (const AlignedPair& pair : *pairs) {
         upTo(pair.a, pair.b);
