@@ -104,8 +104,11 @@ std::string valueRows(const Program& program) {
     std::string rows;
     for (const auto& [action, all] : patterns) {
         std::string pattern;
-        for (const std::string& each : all)
-            pattern += (pattern.empty() ? "" : " | ") + each;
+        for (const std::string& each : all) {
+            if (!pattern.empty())
+                pattern += " | ";
+            pattern += each;
+        }
         rows += "        " + pattern + ")\n            " + action + "\n            return ;;\n";
     }
     return rows;
