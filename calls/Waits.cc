@@ -153,7 +153,7 @@ void Waits::ask(Call& call, const Message& message) {
     const std::uint64_t id = ++lastId_;
     ofCall_[call.number].push_back(id);
     deadlines_.emplace(wait.deadline, id);
-    waits_.emplace(id, std::move(wait));
+    waits_.emplace(id, wait);
 }
 
 // Who waits decides: a timer may differ between the user and the network side.
