@@ -109,7 +109,8 @@ std::string valueRows(const Program& program) {
                 pattern += " | ";
             pattern += each;
         }
-        rows += "        " + pattern + ")\n            " + action + "\n            return ;;\n";
+        rows.append("        ").append(pattern).append(")\n            ");
+        rows.append(action).append("\n            return ;;\n");
     }
     return rows;
 }
