@@ -17,6 +17,8 @@ struct FigureColumn {
     std::string_view name;     // "median_s", for programs
     std::string_view heading;  // "median s", for people
     Kind kind = Kind::number;
+
+    bool isNumber() const { return kind == Kind::number; }
 };
 
 struct FigureTable {
