@@ -46,7 +46,7 @@ Redacting::Redacting(const Options& options, redaction::Redactor& redactor, Name
       composer_(std::move(composer)),
       next_(next),
       callFilter_(options.filters) {
-    if (!callFilter_.isEmpty())
+    if (!callFilter_.isEmpty() && !next_.wantsAll())
         gate_.emplace(callFilter_, analysisOptions(options),
                       options.input.follow ? CallGate::Order::ofDecision : CallGate::Order::ofInput);
 }
@@ -151,17 +151,17 @@ void Redacting::handOn() {
         passGate();
     Chunk& chunk = gate_ ? released_ : out_;
     for (std::size_t i = 0; i < chunk.size(); ++i) {
-        if (!gate_ && !passes_[i])
-            continue;
         Seen& seen = chunk.seen()[i];
         readHeaders(seen);
+        if (!gate_ && !passes_[i])
+            continue;
         Piece piece{.item = i, .instant = {seen.when.clock, seen.at}};
         if (composer_ != nullptr)
             composer_->compose(seen, chunk.text, piece);
         piece.end = chunk.text.size();
         chunk.pieces.push_back(piece);
     }
-    if (!chunk.pieces.empty())
+    if (!chunk.pieces.empty() || (next_.wantsAll() && !chunk.empty()))
         next_.take(chunk, chunk.pieces.size());
     out_.clear();
     released_.clear();

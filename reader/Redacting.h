@@ -19,9 +19,9 @@
 namespace reader {
 
 // Stands between a run and the consumer that writes. It looks at every item, filters or not, since a number
-// may have begun in another frame; items that pass the filters go on. Names of files and D channels are
-// replaced, comments are left out, and messages are put in words of our own. While pseudonyms are undone all
-// these stay as they are.
+// may have begun in another frame; items that pass the filters go on, or all of them to a consumer that wants
+// all. Names of files and D channels are replaced, comments are left out, and messages are put in words of
+// our own. While pseudonyms are undone all these stay as they are.
 class Redacting : public Consumer {
   public:
     enum class Names { replaced, kept };
@@ -32,6 +32,7 @@ class Redacting : public Consumer {
 
     void take(Chunk& chunk, std::size_t count) override;
     bool wantsAll() const override { return true; }
+    void advance(std::int64_t nanoseconds) override { next_.advance(nanoseconds); }
     void flush() override { next_.flush(); }
     // The input has ended.
     void finish();

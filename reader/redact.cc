@@ -6,7 +6,6 @@
 #include "reader/forms.h"
 #include "reader/inputs.h"
 #include "reader/session.h"
-#include "redaction/Key.h"
 
 namespace reader {
 
@@ -25,25 +24,6 @@ void checkManner(const Options& options, const Key& key) {
     if (asked.blankShort && !manner.blankShort)
         throw UsageError("the key " + asked.key +
                          " was made without --blank-short: another manner needs another key");
-}
-
-Key keyOf(const Options& options, Chatter& chatter) {
-    const RedactOptions& asked = options.redact;
-    if (asked.key.empty() && asked.undo)
-        throw UsageError("--undo needs --key FILE, the key that the pseudonyms were made with");
-    const Manner manner{asked.keepPrefix.value_or(0), asked.blankShort};
-    if (asked.key.empty())
-        return redaction::randomKey(manner);
-    if (const auto known = redaction::readKey(asked.key)) {
-        checkManner(options, *known);
-        return *known;
-    }
-    if (asked.undo)
-        throw FileError("there is no key " + asked.key);
-    const Key made = redaction::randomKey(manner);
-    redaction::writeKey(asked.key, made);
-    chatter.note("made the key " + asked.key + ": whoever has it can undo the redaction");
-    return made;
 }
 
 // That of the first input, if nothing else tells.
@@ -86,6 +66,25 @@ void write(Session& session, const Options& options, const Form& form, Output& o
 
 }  // namespace
 
+Key redactionKey(const Options& options, Chatter& chatter) {
+    const RedactOptions& asked = options.redact;
+    if (asked.key.empty() && asked.undo)
+        throw UsageError("--undo needs --key FILE, the key that the pseudonyms were made with");
+    const Manner manner{asked.keepPrefix.value_or(0), asked.blankShort};
+    if (asked.key.empty())
+        return redaction::randomKey(manner);
+    if (const auto known = redaction::readKey(asked.key)) {
+        checkManner(options, *known);
+        return *known;
+    }
+    if (asked.undo)
+        throw FileError("there is no key " + asked.key);
+    const Key made = redaction::randomKey(manner);
+    redaction::writeKey(asked.key, made);
+    chatter.note("made the key " + asked.key + ": whoever has it can undo the redaction");
+    return made;
+}
+
 std::span<const OptionRow> redactOptions() {
     static constexpr OptionRow rows[] = {
         {"--key", "FILE", "Make pseudonyms by this key, and make the key if there is none",
@@ -109,7 +108,7 @@ int runRedact(const Options& options, Chatter& chatter) {
     const Form& form = formOf(options);
     Session session(options, chatter);
     session.tellGuessedVariant("redacted");
-    const Key key = keyOf(options, chatter);  // before an output is emptied
+    const Key key = redactionKey(options, chatter);  // before an output is emptied
     Output& out = session.output(form.what, form.looksRight);
     if (form.binary && out.isTerminal())
         throw UsageError(std::string(form.name) +
