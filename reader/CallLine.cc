@@ -114,6 +114,20 @@ std::string callHeading() {
     return heading;
 }
 
+std::vector<CallColumn> callColumns() {
+    std::vector<CallColumn> named;
+    for (const LineColumn& column : columns)
+        named.push_back({column.heading, column.right});
+    return named;
+}
+
+std::vector<std::string> callCells(const Call& call, TimeText& times) {
+    std::vector<std::string> cells;
+    for (const LineColumn& column : columns)
+        column.put(cells.emplace_back(), call, times);
+    return cells;
+}
+
 std::vector<std::string> callWords(const Call& call, TimeText& times) {
     std::vector<std::string> words;
     for (const LineColumn& column : columns) {

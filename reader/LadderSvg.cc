@@ -31,27 +31,6 @@ constexpr std::string_view style =
     ".link{stroke:#a05a00;stroke-width:1.5;stroke-dasharray:5 4}"
     ".words{fill:#a00000;text-anchor:middle}";
 
-void appendXml(std::string& to, std::string_view text) {
-    for (const char character : safe(text)) {
-        switch (character) {
-            case '&':
-                to += "&amp;";
-                break;
-            case '<':
-                to += "&lt;";
-                break;
-            case '>':
-                to += "&gt;";
-                break;
-            case '"':
-                to += "&quot;";
-                break;
-            default:
-                to += character;
-        }
-    }
-}
-
 void appendAttribute(std::string& to, std::string_view name, int value) {
     ((to += ' ') += name) += "=\"";
     appendNumber(to, value);
@@ -149,11 +128,29 @@ std::string LadderSvg::picture() const {
     appendAttribute(text, "height", y_ + margin);
     text += ">\n<style>";
     text += style;
-    text += "</style>\n<defs>\n";
+    text += "</style>\n" + definitions();
+    text += "<rect width=\"100%\" height=\"100%\" fill=\"#fff\"/>\n";
+    return text + body_ + "</svg>\n";
+}
+
+std::string LadderSvg::part(std::string_view label) const {
+    std::string text = "<svg class=\"ladder\" role=\"img\" aria-label=\"";
+    appendXml(text, label);
+    text += "\" viewBox=\"0 0 ";
+    appendNumber(text, pageWidth);
+    text += ' ';
+    appendNumber(text, y_ + margin);
+    text += '"';
+    appendAttribute(text, "width", pageWidth);
+    appendAttribute(text, "height", y_ + margin);
+    return text + ">\n" + body_ + "</svg>\n";
+}
+
+std::string LadderSvg::definitions() {
+    std::string text = "<defs>\n";
     appendHead(text, "message", "#1f4e9c");
     appendHead(text, "link", "#a05a00");
-    text += "</defs>\n<rect width=\"100%\" height=\"100%\" fill=\"#fff\"/>\n";
-    return text + body_ + "</svg>\n";
+    return text + "</defs>\n";
 }
 
 }  // namespace reader

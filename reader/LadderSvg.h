@@ -3,6 +3,7 @@
 #define READER_LADDERSVG_H
 
 #include <string>
+#include <string_view>
 
 #include "reader/CallLadder.h"
 
@@ -14,6 +15,11 @@ class LadderSvg {
     void add(const CallLadder& ladder, TimeText& times);
     // The whole picture, with its height.
     std::string picture() const;
+    // The same as a part of a page, with `label` for those who cannot see it. The page has the rules for its
+    // classes in the stylesheet, and once the definitions.
+    std::string part(std::string_view label) const;
+    // The heads of arrows, to stand in an <svg> of the page.
+    static std::string definitions();
 
   private:
     void putRung(const CallLadder& ladder, std::size_t number, TimeText& times);

@@ -45,6 +45,29 @@ std::string safe(std::string_view text) {
     return result;
 }
 
+void appendEntities(std::string& to, std::string_view text) {
+    for (const char character : text) {
+        switch (character) {
+            case '&':
+                to += "&amp;";
+                break;
+            case '<':
+                to += "&lt;";
+                break;
+            case '>':
+                to += "&gt;";
+                break;
+            case '"':
+                to += "&quot;";
+                break;
+            default:
+                to += character;
+        }
+    }
+}
+
+void appendXml(std::string& to, std::string_view text) { appendEntities(to, safe(text)); }
+
 void appendForTerminal(std::string& to, std::string_view text) {
     appendEscaping(to, text, [](char character) {
         return isPrintable(character) || character == '\n' || character == '\t';

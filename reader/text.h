@@ -18,6 +18,11 @@ namespace reader {
 void appendSafe(std::string& to, std::string_view text);
 std::string safe(std::string_view text);
 
+// Text that is safe already, as text of XML or HTML, or as an attribute's value between double quotes.
+void appendEntities(std::string& to, std::string_view text);
+// Both: text that may come from a frame, for XML or HTML.
+void appendXml(std::string& to, std::string_view text);
+
 // What a terminal may get of the text of a log: line feeds and tabs stay, everything else that is no
 // printable ASCII appears as \xHH.
 void appendForTerminal(std::string& to, std::string_view text);

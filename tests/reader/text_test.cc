@@ -22,6 +22,15 @@ TEST(TextForATerminal, KeepsLinesAndTabs) {
     EXPECT_EQ(shown, "one\n\ttwo \\x1b]0;title\\x07\n");
 }
 
+TEST(Xml, HasNoMarkupAndNothingThatIsNotAscii) {
+    std::string text = "x";
+    appendXml(text, "</b>&\"\x1b\xff\\");
+    EXPECT_EQ(text, "x&lt;/b&gt;&amp;&quot;\\x1b\\xff\\\\");
+    text.clear();
+    appendEntities(text, "\\x1b <i>");
+    EXPECT_EQ(text, "\\x1b &lt;i&gt;");
+}
+
 TEST(Padding, StandsBehindOrInFront) {
     std::string text = "ab";
     padTo(text, 1, 3);
