@@ -3,6 +3,7 @@
 #include <string_view>
 
 #include "calls/standardVariant.h"
+#include "redaction/TraceRedactor.h"
 
 namespace reader {
 
@@ -45,16 +46,20 @@ calls::Options analysisOptions(const Options& options) {
     return to;
 }
 
-void tell(calls::Analysis& analysis, const capture::Item& item) {
+template <typename Hearer>
+void tell(Hearer& hearer, const capture::Item& item) {
     const capture::Interface& interface = *item.frame.interface;
     if (item.kind == capture::Item::Kind::oversized)
-        analysis.mayLack(interface, item.frame.transmitted ? calls::Side::us : calls::Side::peer);
+        hearer.mayLack(interface, item.frame.transmitted ? calls::Side::us : calls::Side::peer);
     else if (item.kind == capture::Item::Kind::restart || item.kind == capture::Item::Kind::run ||
              item.kind == capture::Item::Kind::replaced)
-        analysis.restarted(interface);
+        hearer.restarted(interface);
     else if (const std::string_view reason = reasonOf(item.kind); !reason.empty())
-        analysis.mayMiss(interface, reason);
+        hearer.mayMiss(interface, reason);
 }
+
+template void tell(calls::Analysis& hearer, const capture::Item& item);
+template void tell(redaction::TraceRedactor& hearer, const capture::Item& item);
 
 void feed(calls::Analysis& analysis, const Seen& seen) {
     if (seen.isFrame())

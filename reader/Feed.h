@@ -11,8 +11,9 @@ namespace reader {
 // What the command line asks of an analysis.
 calls::Options analysisOptions(const Options& options);
 
-// Tells the analysis what the recorder had to say between frames.
-void tell(calls::Analysis& analysis, const capture::Item& item);
+// Tells an analysis, or a redaction::TraceRedactor, what the recorder had to say between frames.
+template <typename Hearer>
+void tell(Hearer& hearer, const capture::Item& item);
 // Hands a frame on, or what the recorder says.
 void feed(calls::Analysis& analysis, const Seen& seen);
 

@@ -38,11 +38,10 @@ const std::string& numbered(std::map<std::string, std::string, std::less<>>& kno
 
 }  // namespace
 
-Redacting::Redacting(const Options& options, redaction::Redactor& redactor, Names names,
+Redacting::Redacting(const Options& options, const redaction::Key& key, redaction::Direction direction,
                      std::unique_ptr<Composer> composer, Consumer& next)
-    : redactor_(redactor),
-      analysis_(analysisOptions(options), redactor),
-      names_(names),
+    : redactor_(key, direction, analysisOptions(options)),
+      hidesNames_(direction == redaction::Direction::redact),
       composer_(std::move(composer)),
       next_(next),
       callFilter_(options.filters) {
@@ -52,6 +51,7 @@ Redacting::Redacting(const Options& options, redaction::Redactor& redactor, Name
 }
 
 void Redacting::take(Chunk& chunk, std::size_t count) {
+    idle_ = 0;
     std::size_t piece = 0;
     for (std::size_t i = 0; i < chunk.size(); ++i) {
         const bool passes = piece < count && chunk.pieces[piece].item == i;
@@ -61,10 +61,19 @@ void Redacting::take(Chunk& chunk, std::size_t count) {
     handOn();
 }
 
+void Redacting::advance(std::int64_t nanoseconds) {
+    idle_ += nanoseconds;
+    if (idle_ > redaction::TraceRedactor::longestWait)
+        giveUp();
+    if (gate_)
+        gate_->advance(nanoseconds);
+    handOn();
+    next_.advance(nanoseconds);
+    next_.flush();
+}
+
 void Redacting::finish() {
-    std::vector<redaction::Rebuilt> done;
-    redactor_.giveUpSegments(done);
-    settle(done);
+    giveUp();
     handOn();
     if (!gate_)
         return;
@@ -72,24 +81,35 @@ void Redacting::finish() {
     handOn();
 }
 
+void Redacting::giveUp() {
+    std::vector<redaction::Rebuilt> done;
+    redactor_.giveUp(done);
+    settle(done);
+    release();
+}
+
 void Redacting::look(const Seen& seen, bool passes) {
-    if (seen.item->kind == Kind::comment && names_ == Names::replaced)
+    if (seen.item->kind == Kind::comment && hidesNames_)
         return;
     Waiting& waiting = waiting_.emplace_back();
     waiting.seen = seen;
     waiting.item = *seen.item;
+    waiting.text = seen.item->text;
     waiting.passes = passes;
     redact(waiting);
-    if (names_ == Names::replaced)
-        replaceNames(waiting.item);
-    if (isTooLong()) {
-        std::vector<redaction::Rebuilt> done;
-        redactor_.giveUpSegments(done);
-        settle(done);
-    }
+    if (hidesNames_)
+        replaceNames(waiting);
+    if (waiting_.size() > mostWaiting_)
+        giveUp();
+    release();
+}
+
+// Up to the first item that waits for the rest of its message.
+void Redacting::release() {
     while (!waiting_.empty() && waiting_.front().isReady) {
         Waiting& ready = waiting_.front();
         ready.item.frame.octets = ready.octets;
+        ready.item.text = ready.text;
         ready.seen.item = &ready.item;
         out_.add(ready.seen);
         passes_.push_back(ready.passes);
@@ -103,14 +123,11 @@ void Redacting::redact(Waiting& waiting) {
         if (seen.item->kind == Kind::cut)
             waiting.octets = redactor_.cut(seen.frame().octets, seen.variant);
         waiting.isReady = true;
-        tell(analysis_, *seen.item);
-        redactor_.mayMiss();
+        tell(redactor_, *seen.item);
         return;
     }
-    redactor_.expect(seen.number);
-    const calls::Marks& marks = analysis_.take(seen.frame(), seen.number);
     std::vector<redaction::Rebuilt> done;
-    redactor_.take(seen.frame(), marks, seen.variant, done);
+    redactor_.take(seen.frame(), seen.number, seen.variant, done);
     settle(done);
 }
 
@@ -127,8 +144,9 @@ void Redacting::settle(std::vector<redaction::Rebuilt>& done) {
     }
 }
 
-void Redacting::replaceNames(capture::Item& item) {
-    item.text = textOf(item.kind);
+void Redacting::replaceNames(Waiting& waiting) {
+    capture::Item& item = waiting.item;
+    waiting.text = textOf(item.kind);
     item.frame.place.file = numbered(files_, item.frame.place.file, "input");
     if (item.frame.interface == nullptr)
         return;
@@ -138,11 +156,6 @@ void Redacting::replaceNames(capture::Item& item) {
     if (found == interfaces_.end())
         found = interfaces_.insert(interfaces_.end(), wanted);
     item.frame.interface = &*found;
-}
-
-bool Redacting::isTooLong() const {
-    return waiting_.size() > mostWaiting_ ||
-           waiting_.back().seen.at - waiting_.front().seen.at > longestWait_;
 }
 
 void Redacting::handOn() {

@@ -11,10 +11,9 @@
 #include <string>
 #include <vector>
 
-#include "calls/Analysis.h"
 #include "reader/CallGate.h"
 #include "reader/Pipeline.h"
-#include "redaction/Redactor.h"
+#include "redaction/TraceRedactor.h"
 
 namespace reader {
 
@@ -24,15 +23,13 @@ namespace reader {
 // our own. While pseudonyms are undone all these stay as they are.
 class Redacting : public Consumer {
   public:
-    enum class Names { replaced, kept };
-
     // `composer` may be null if the next consumer wants no text. All references outlive this.
-    Redacting(const Options& options, redaction::Redactor& redactor, Names names,
+    Redacting(const Options& options, const redaction::Key& key, redaction::Direction direction,
               std::unique_ptr<Composer> composer, Consumer& next);
 
     void take(Chunk& chunk, std::size_t count) override;
     bool wantsAll() const override { return true; }
-    void advance(std::int64_t nanoseconds) override { next_.advance(nanoseconds); }
+    void advance(std::int64_t nanoseconds) override;
     void flush() override { next_.flush(); }
     // The input has ended.
     void finish();
@@ -43,29 +40,29 @@ class Redacting : public Consumer {
         Seen seen;
         capture::Item item;
         std::vector<std::uint8_t> octets;
+        std::string text;
         bool isReady = false;
         bool passes = false;
     };
 
-    // Items that wait for the end of a message at most, and how long, in nanoseconds of the frames' clock.
-    // The next segment has to follow within T314, 4 s.
+    // Items that wait for the end of a message at most.
     static constexpr std::size_t mostWaiting_ = 4096;
-    static constexpr std::int64_t longestWait_ = 10'000'000'000;
 
     void look(const Seen& seen, bool passes);
     void redact(Waiting& waiting);
     void settle(std::vector<redaction::Rebuilt>& done);
-    void replaceNames(capture::Item& item);
+    void replaceNames(Waiting& waiting);
+    void release();
+    void giveUp();
     void handOn();
     void passGate();
-    bool isTooLong() const;
 
-    redaction::Redactor& redactor_;
-    calls::Analysis analysis_;
-    Names names_;
+    redaction::TraceRedactor redactor_;
+    bool hidesNames_;
     std::unique_ptr<Composer> composer_;
     Consumer& next_;
     std::deque<Waiting> waiting_;
+    std::int64_t idle_ = 0;  // how long nothing has come, in nanoseconds
     Chunk out_;
     std::vector<bool> passes_;  // of the items of out_
     CallFilter callFilter_;

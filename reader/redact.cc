@@ -42,12 +42,9 @@ const Form& formOf(const Options& options) {
 
 void write(Session& session, const Options& options, const Form& form, Output& out, const Key& key,
            Chatter& chatter) {
-    const bool undo = options.redact.undo;
-    const auto pseudonyms = redaction::makePseudonyms(key, undo ? Direction::restore : Direction::redact);
-    redaction::Redactor redactor(*pseudonyms, key.manner.blankShort);
-    const auto names = undo ? Redacting::Names::kept : Redacting::Names::replaced;
+    const Direction direction = options.redact.undo ? Direction::restore : Direction::redact;
     const auto run = [&](Consumer& next, std::unique_ptr<Composer> composer) {
-        Redacting redacting(options, redactor, names, std::move(composer), next);
+        Redacting redacting(options, key, direction, std::move(composer), next);
         session.run(redacting, [] { return std::make_unique<NoComposer>(); });
         redacting.finish();
     };

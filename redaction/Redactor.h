@@ -18,7 +18,8 @@
 
 namespace redaction {
 
-// Listens to an analysis, which says to which call digits belong. For each frame in turn:
+// Listens to an analysis, which says to which call digits belong. TraceRedactor puts both together. For each
+// frame in turn:
 //
 //     redactor.expect(number);
 //     const calls::Marks& marks = analysis.take(frame, number);
@@ -43,6 +44,11 @@ class Redactor : public calls::Listener {
     void mayMiss() { ++losses_; }
     // Segments that wait are blanked and come out.
     void giveUpSegments(std::vector<Rebuilt>& done) { segments_.giveUpAll(done); }
+    // Of messages whose first segment came in a frame before `number`, or before `time`.
+    void giveUpOlderSegments(std::uint64_t number, std::int64_t time, std::vector<Rebuilt>& done) {
+        segments_.giveUpOlder(number, time, done);
+    }
+    bool isWaiting() const { return segments_.isWaiting(); }
 
     void heard(const calls::Message& message, const calls::Call* call) override;
     void gone(const calls::Call& call) override;

@@ -13,7 +13,9 @@ SegmentPieces::Key SegmentPieces::keyOf(const Segment& segment) {
 
 SegmentPieces::Piece SegmentPieces::pieceOf(const Segment& segment) {
     const isdn::Octets octets = segment.frame->octets;
-    return {{segment.number, {octets.begin(), octets.end()}}, octets.size() - segment.message.raw.size()};
+    return {{segment.number, {octets.begin(), octets.end()}},
+            segment.frame->time,
+            octets.size() - segment.message.raw.size()};
 }
 
 bool SegmentPieces::keep(const Segment& segment, bool isFirst, std::vector<Rebuilt>& givenUp) {
@@ -67,6 +69,18 @@ void SegmentPieces::giveUpAll(std::vector<Rebuilt>& givenUp) {
     for (auto& [key, pieces] : pieces_)
         blank(pieces, givenUp);
     pieces_.clear();
+}
+
+void SegmentPieces::giveUpOlder(std::uint64_t number, std::int64_t time, std::vector<Rebuilt>& givenUp) {
+    for (auto each = pieces_.begin(); each != pieces_.end();) {
+        const Piece& first = each->second.front();
+        if (first.frame.number >= number && first.time >= time) {
+            ++each;
+            continue;
+        }
+        blank(each->second, givenUp);
+        each = pieces_.erase(each);
+    }
 }
 
 void SegmentPieces::blank(Pieces& pieces, std::vector<Rebuilt>& givenUp) {

@@ -41,12 +41,16 @@ class SegmentPieces {
     // The pieces before this segment belong to no whole message: they are blanked.
     void giveUp(const Segment& segment, std::vector<Rebuilt>& givenUp);
     void giveUpAll(std::vector<Rebuilt>& givenUp);
+    // The same of messages whose first segment came in a frame before `number`, or before `time`.
+    void giveUpOlder(std::uint64_t number, std::int64_t time, std::vector<Rebuilt>& givenUp);
+    bool isWaiting() const { return !pieces_.empty(); }
 
   private:
     // D channel, TEI, call reference and its flag, direction.
     using Key = std::tuple<const capture::Interface*, std::uint8_t, std::uint64_t, bool, bool>;
     struct Piece {
         Rebuilt frame;
+        std::int64_t time;
         std::size_t at;  // of the piece in the frame; it reaches to the frame's end
     };
     using Pieces = std::vector<Piece>;
