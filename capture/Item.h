@@ -3,6 +3,7 @@
 #define CAPTURE_ITEM_H
 
 #include <cstdint>
+#include <optional>
 #include <string_view>
 
 #include "capture/Frame.h"
@@ -38,6 +39,11 @@ struct Item {
 
     bool isFrame() const { return kind == Kind::frame; }
 };
+
+// "frame", "oversized", "frames-lost", ...: the names of kinds wherever programs read them. `kindNamed` is the
+// reverse; nothing for any other name.
+std::string_view kindName(Item::Kind kind);
+std::optional<Item::Kind> kindNamed(std::string_view name);
 
 }  // namespace capture
 

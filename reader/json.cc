@@ -54,41 +54,6 @@ void putNumberIf(std::string& to, std::string_view key, bool present, Number val
 
 std::string_view nameOf(capture::Role role) { return role == capture::Role::user ? "user" : "network"; }
 
-// The value of "event".
-std::string_view nameOf(Kind kind) {
-    switch (kind) {
-        case Kind::frame:
-            return "";
-        case Kind::oversized:
-            return "oversized";
-        case Kind::cut:
-            return "cut";
-        case Kind::lost:
-            return "frames-lost";
-        case Kind::notQueued:
-            return "not-queued";
-        case Kind::notTaken:
-            return "not-taken";
-        case Kind::dropped:
-            return "dropped";
-        case Kind::run:
-            return "run";
-        case Kind::restart:
-            return "restart";
-        case Kind::replaced:
-            return "replaced";
-        case Kind::mixed:
-            return "mixed";
-        case Kind::unproved:
-            return "unproved";
-        case Kind::damaged:
-            return "damaged";
-        case Kind::comment:
-            return "comment";
-    }
-    return "";
-}
-
 void putField(std::string& to, const isdn::Field& field) {
     to += to.back() == '[' ? "{" : ",{";
     putText(to, "octet", field.octet);
@@ -166,7 +131,7 @@ void JsonComposer::compose(const Seen& seen, std::string& text, Piece& /*piece*/
         appendSeconds(text, seen.sinceFirst);
     putNumberIf(text, "ticks", frame.ticks.has_value(), frame.ticks.value_or(0));
     if (!seen.isFrame()) {
-        putText(text, "event", nameOf(seen.item->kind));
+        putText(text, "event", capture::kindName(seen.item->kind));
         putNumber(text, "count", seen.item->count);
         putText(text, "text", seen.item->text);
         putTruth(text, "oversized", seen.item->kind == Kind::oversized);
