@@ -7,8 +7,18 @@ fail() {
     exit 1
 }
 
-# install_packages NAME...: installs those of the Debian packages that are missing. Needs to be root, or a sudo that
-# asks for no password; otherwise names the missing packages and ends the script.
+# Debian's packages ask /usr/sbin/policy-rc.d whether their services may start. One that is there already stays.
+install_without_services='
+policy=/usr/sbin/policy-rc.d
+if [ ! -e $policy ]; then
+    trap "rm -f $policy" EXIT
+    printf "#!/bin/sh\nexit 101\n" >$policy
+    chmod 755 $policy
+fi
+apt-get install -y -qq --no-install-recommends "$@"'
+
+# install_packages NAME...: installs those of the Debian packages that are missing, and starts no service that is among
+# them. Needs to be root, or a sudo that asks for no password; otherwise names the missing packages and ends the script.
 install_packages() {
     local missing=() package
     for package in "$@"; do
@@ -25,18 +35,19 @@ install_packages() {
     local log
     log=$(mktemp)
     if ! { "${as_root[@]}" apt-get update -qq &&
-           "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive \
-               apt-get install -y -qq --no-install-recommends "${missing[@]}"; } >"$log" 2>&1; then
+           "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive sh -c "$install_without_services" install \
+               "${missing[@]}"; } >"$log" 2>&1; then
         tail -n 20 "$log" >&2
         fail "could not install: ${missing[*]}"
     fi
     rm -f "$log"
 }
 
-BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libpcap-dev libssl-dev libtomlplusplus-dev nlohmann-json3-dev)
+BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libnats-dev libpcap-dev libssl-dev libtomlplusplus-dev nlohmann-json3-dev
+                pkg-config)
 CHECK_PACKAGES=(clang-format clang-tidy cppcheck)
-TEST_PACKAGES=(bash-completion groff-base libgtest-dev libgmock-dev libbenchmark-dev man-db mandoc python3 python3-jsonschema
-               tmux tshark zsh)
+TEST_PACKAGES=(bash-completion groff-base libgtest-dev libgmock-dev libbenchmark-dev man-db mandoc nats-server openssl python3
+               python3-jsonschema tmux tshark zsh)
 PACKAGE_PACKAGES=(dpkg-dev gzip lintian)
 
 # build_preset PRESET [OPTION...] [--target NAME]: configures a preset, and builds it or the target. Shows the compiler's

@@ -1,0 +1,134 @@
+#include "fleet/Nats.h"
+
+#include <array>
+
+#include "fleet/NatsHandles.h"
+
+namespace fleet {
+
+namespace {
+
+using Reason = NatsError::Reason;
+
+Reason reasonOf(natsStatus status, int jetStreamError) {
+    switch (status) {
+        case NATS_NO_SERVER:
+        case NATS_IO_ERROR:
+        case NATS_CONNECTION_CLOSED:
+        case NATS_CONNECTION_DISCONNECTED:
+        case NATS_NO_RESPONDERS:
+            return Reason::unreachable;
+        case NATS_CONNECTION_AUTH_FAILED:
+        case NATS_NOT_PERMITTED:
+        case NATS_SSL_ERROR:
+        case NATS_SECURE_CONNECTION_WANTED:
+        case NATS_SECURE_CONNECTION_REQUIRED:
+            return Reason::refused;
+        case NATS_INSUFFICIENT_BUFFER:
+            return Reason::full;
+        case NATS_TIMEOUT:
+            return Reason::timeout;
+        default:
+            break;
+    }
+    return jetStreamError == JSInsufficientResourcesErr ? Reason::full : Reason::other;
+}
+
+// The library would write errors that no call returns to the standard error stream. They come back as answers
+// that fail to come.
+void ignoreError(natsConnection*, natsSubscription*, natsStatus, void*) {}
+
+void useTls(natsOptions* to, const NatsOptions& options) {
+    require(natsOptions_SetSecure(to, true), "use TLS");
+    require(natsOptions_LoadCATrustedCertificates(to, options.authority.c_str()),
+            "read the certificates in " + options.authority);
+    if (!options.certificate.empty())
+        require(natsOptions_LoadCertificatesChain(to, options.certificate.c_str(), options.key.c_str()),
+                "read " + options.certificate + " and " + options.key);
+}
+
+OwnedOptions libraryOptions(const NatsOptions& options) {
+    natsOptions* made = nullptr;
+    require(natsOptions_Create(&made), "set up NATS");
+    OwnedOptions to(made);
+    std::vector<const char*> servers;
+    for (const std::string& server : options.servers)
+        servers.push_back(server.c_str());
+    require(natsOptions_SetServers(made, servers.data(), static_cast<int>(servers.size())),
+            "use the servers' addresses");
+    constexpr int forEver = -1;
+    constexpr int betweenAttempts = 500;  // milliseconds; the library adds up to as much again
+    for (const natsStatus status :
+         {natsOptions_SetName(made, options.name.c_str()),
+          natsOptions_SetTimeout(made, options.timeout.count()), natsOptions_SetMaxReconnect(made, forEver),
+          natsOptions_SetReconnectWait(made, betweenAttempts),
+          natsOptions_SetReconnectJitter(made, betweenAttempts, betweenAttempts),
+          natsOptions_SetErrorHandler(made, ignoreError, nullptr)})
+        require(status, "set up NATS");
+    if (!options.authority.empty())
+        useTls(made, options);
+    return to;
+}
+
+}  // namespace
+
+void require(natsStatus status, const std::string& wanted, int jetStreamError) {
+    if (status == NATS_OK)
+        return;
+    natsStatus last = NATS_OK;
+    const char* const detail = nats_GetLastError(&last);
+    std::string what = "cannot " + wanted + ": " + natsStatus_GetText(status);
+    if (last == status && detail != nullptr && *detail != '\0')
+        what += std::string(" (") + detail + ")";
+    throw NatsError(reasonOf(status, jetStreamError), what);
+}
+
+OwnedMessage makeMessage(const std::string& subject, const std::string& reply, std::string_view text,
+                         const std::string& id, NatsConnection::Headers headers) {
+    natsMsg* made = nullptr;
+    require(natsMsg_Create(&made, subject.c_str(), reply.empty() ? nullptr : reply.c_str(), text.data(),
+                           static_cast<int>(text.size())),
+            "make a message to " + subject);
+    OwnedMessage message(made);
+    if (!id.empty())
+        require(natsMsgHeader_Set(made, "Nats-Msg-Id", id.c_str()), "name a message");
+    for (const auto& [key, value] : headers)
+        require(natsMsgHeader_Set(made, key.c_str(), value.c_str()), "write a header");
+    return message;
+}
+
+NatsConnection::NatsConnection(const NatsOptions& options) : handles_(std::make_unique<Handles>()) {
+    const OwnedOptions to = libraryOptions(options);
+    natsConnection* connection = nullptr;
+    require(natsConnection_Connect(&connection, to.get()), "connect to NATS");
+    handles_->connection.reset(connection);
+    jsOptions rules;
+    jsOptions_Init(&rules);
+    rules.Wait = options.timeout.count();
+    jsCtx* jetStream = nullptr;
+    require(natsConnection_JetStream(&jetStream, connection, &rules), "use JetStream");
+    handles_->jetStream.reset(jetStream);
+}
+
+NatsConnection::~NatsConnection() = default;
+
+bool NatsConnection::isConnected() const {
+    return natsConnection_Status(handles_->connection.get()) == NATS_CONN_STATUS_CONNECTED;
+}
+
+std::string NatsConnection::server() const {
+    std::array<char, 300> url{};
+    const bool isKnown =
+        natsConnection_GetConnectedUrl(handles_->connection.get(), url.data(), url.size()) == NATS_OK;
+    return isKnown ? std::string(url.data()) : std::string();
+}
+
+void NatsConnection::publish(const std::string& subject, std::string_view text, const std::string& id,
+                             Headers headers) {
+    const OwnedMessage message = makeMessage(subject, "", text, id, headers);
+    jsErrCode error{};
+    require(js_PublishMsg(nullptr, handles_->jetStream.get(), message.get(), nullptr, &error),
+            "publish to " + subject, error);
+}
+
+}  // namespace fleet

@@ -1,0 +1,72 @@
+// A connection to NATS, and its errors.
+#ifndef FLEET_NATS_H
+#define FLEET_NATS_H
+
+#include <chrono>
+#include <cstdint>
+#include <memory>
+#include <span>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+namespace fleet {
+
+// What NATS refused, or did not do in time. what() says what was wanted, and why it failed.
+class NatsError : public std::runtime_error {
+  public:
+    enum class Reason : std::uint8_t {
+        unreachable,  // no server answers; it may later
+        refused,      // a server does not accept the certificate or the permission is missing
+        full,         // the stream takes no more
+        timeout,      // no answer; what was sent may have been kept
+        other
+    };
+
+    NatsError(Reason why, const std::string& what) : std::runtime_error(what), reason(why) {}
+    Reason reason;
+};
+
+struct NatsOptions {
+    std::vector<std::string> servers;  // "tls://host:4222" or "nats://host:4222"; one suffices
+    std::string name;                  // of the program, as the servers' monitoring shows it
+    // Files in PEM. Empty: no TLS, for a test on one machine.
+    std::string authority;    // certificates of who signs the servers'
+    std::string certificate;  // the client's own
+    std::string key;
+    std::chrono::milliseconds timeout{5000};  // of each request
+};
+
+// Connected as long as it lives: when a server goes, the library looks for one again, for ever. Used by one
+// thread at a time; the library has threads of its own and calls nothing of ours.
+class NatsConnection {
+  public:
+    // Throws NatsError if no server takes the connection within the time.
+    explicit NatsConnection(const NatsOptions& options);
+    ~NatsConnection();
+    NatsConnection(const NatsConnection&) = delete;
+    NatsConnection& operator=(const NatsConnection&) = delete;
+
+    bool isConnected() const;
+    // "tls://127.0.0.1:4222"; empty while there is no connection.
+    std::string server() const;
+
+    using Headers = std::span<const std::pair<std::string, std::string>>;
+    // Puts a message into the stream that takes the subject, and waits until the stream has it. Throws
+    // NatsError.
+    void publish(const std::string& subject, std::string_view text, const std::string& id,
+                 Headers headers = {});
+
+    // The library's objects, for the classes that use the connection.
+    struct Handles;
+    Handles& handles() const { return *handles_; }
+
+  private:
+    std::unique_ptr<Handles> handles_;
+};
+
+}  // namespace fleet
+
+#endif

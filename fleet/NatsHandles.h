@@ -1,0 +1,46 @@
+// The NATS library's objects, owned. For the sources of this folder that call the library.
+#ifndef FLEET_NATSHANDLES_H
+#define FLEET_NATSHANDLES_H
+
+#include <nats/nats.h>
+
+#include <memory>
+#include <string>
+
+#include "fleet/Nats.h"
+
+namespace fleet {
+
+template <auto destroy>
+struct NatsDeleter {
+    template <class Object>
+    void operator()(Object* object) const {
+        destroy(object);
+    }
+};
+
+template <class Object, auto destroy>
+using NatsOwned = std::unique_ptr<Object, NatsDeleter<destroy>>;
+
+using OwnedOptions = NatsOwned<natsOptions, natsOptions_Destroy>;
+using OwnedConnection = NatsOwned<natsConnection, natsConnection_Destroy>;
+using OwnedJetStream = NatsOwned<jsCtx, jsCtx_Destroy>;
+using OwnedSubscription = NatsOwned<natsSubscription, natsSubscription_Destroy>;
+using OwnedMessage = NatsOwned<natsMsg, natsMsg_Destroy>;
+using OwnedMetaData = NatsOwned<jsMsgMetaData, jsMsgMetaData_Destroy>;
+
+struct NatsConnection::Handles {
+    OwnedConnection connection;
+    OwnedJetStream jetStream;
+};
+
+// Throws NatsError unless the status is good; `wanted` is "connect to NATS" and the like.
+void require(natsStatus status, const std::string& wanted, int jetStreamError = 0);
+
+// A message ready to be sent. Throws NatsError.
+OwnedMessage makeMessage(const std::string& subject, const std::string& reply, std::string_view text,
+                         const std::string& id, NatsConnection::Headers headers);
+
+}  // namespace fleet
+
+#endif

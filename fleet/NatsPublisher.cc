@@ -1,0 +1,99 @@
+#include "fleet/NatsPublisher.h"
+
+#include <algorithm>
+#include <charconv>
+#include <nlohmann/json.hpp>
+
+#include "fleet/NatsHandles.h"
+
+namespace fleet {
+
+namespace {
+
+using nlohmann::json;
+
+// The server's codes of errors: no room for a message in a stream, or on the disk.
+constexpr int noRoomCodes[] = {10047, 10023, 10077};
+
+struct InboxName {
+    natsInbox* name = nullptr;
+    InboxName() { require(natsInbox_Create(&name), "make an inbox"); }
+    ~InboxName() { natsInbox_Destroy(name); }
+    InboxName(const InboxName&) = delete;
+    InboxName& operator=(const InboxName&) = delete;
+};
+
+std::uint64_t tokenOf(std::string_view inbox) {
+    const std::string_view digits = inbox.substr(inbox.rfind('.') + 1);
+    std::uint64_t token = 0;
+    std::from_chars(digits.data(), digits.data() + digits.size(), token);
+    return token;
+}
+
+void readError(const json& error, NatsPublisher::Answer& answer) {
+    answer.error = error.value("description", "no reason given");
+    const int code = error.value("err_code", 0);
+    answer.isFull = std::find(std::begin(noRoomCodes), std::end(noRoomCodes), code) != std::end(noRoomCodes);
+}
+
+// The stream's answer: {"stream":"LAPD","seq":5,"duplicate":true} or {"error":{...}}.
+void readAnswer(std::string_view text, NatsPublisher::Answer& answer) {
+    try {
+        const json all = json::parse(text);
+        if (const auto error = all.find("error"); error != all.end()) {
+            readError(*error, answer);
+            return;
+        }
+        answer.isKept = all.at("seq").is_number_unsigned();
+        answer.isDuplicate = all.value("duplicate", false);
+    } catch (const json::exception&) {
+        answer.error = "the answer is not one of a stream";
+    }
+}
+
+}  // namespace
+
+struct NatsPublisher::Inbox {
+    InboxName prefix;
+    OwnedSubscription answers;
+};
+
+NatsPublisher::NatsPublisher(NatsConnection& connection)
+    : connection_(connection), inbox_(std::make_unique<Inbox>()) {
+    natsSubscription* answers = nullptr;
+    const std::string subject = std::string(inbox_->prefix.name) + ".*";
+    require(natsConnection_SubscribeSync(&answers, connection.handles().connection.get(), subject.c_str()),
+            "wait for answers");
+    inbox_->answers.reset(answers);
+    constexpr int noLimit = -1;
+    require(natsSubscription_SetPendingLimits(answers, noLimit, noLimit), "wait for answers");
+}
+
+NatsPublisher::~NatsPublisher() = default;
+
+void NatsPublisher::send(const std::string& subject, std::string_view text, const std::string& id,
+                         std::uint64_t token) {
+    const std::string reply = std::string(inbox_->prefix.name) + "." + std::to_string(token);
+    const OwnedMessage message = makeMessage(subject, reply, text, id, {});
+    require(natsConnection_PublishMsg(connection_.handles().connection.get(), message.get()),
+            "publish to " + subject);
+}
+
+std::optional<NatsPublisher::Answer> NatsPublisher::answer(std::chrono::milliseconds wait) {
+    natsMsg* got = nullptr;
+    const natsStatus status = natsSubscription_NextMsg(&got, inbox_->answers.get(), wait.count());
+    if (status == NATS_TIMEOUT)
+        return std::nullopt;
+    Answer answer;
+    if (status == NATS_NO_RESPONDERS) {
+        answer.error = "no stream takes the subject, or none is reachable";
+        return answer;
+    }
+    require(status, "get an answer from NATS");
+    const OwnedMessage message(got);
+    answer.token = tokenOf(natsMsg_GetSubject(got));
+    readAnswer({natsMsg_GetData(got), static_cast<std::size_t>(natsMsg_GetDataLength(got))}, answer);
+    return answer;
+}
+
+}  // namespace fleet

@@ -1,0 +1,44 @@
+// The streams of a fleet, made where they are missing.
+#ifndef FLEET_STREAMS_H
+#define FLEET_STREAMS_H
+
+#include <chrono>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "fleet/Nats.h"
+
+namespace fleet {
+
+// Frames at the centre, frames at a site, and messages that cannot be stored.
+inline constexpr char centreStream[] = "LAPD";
+inline constexpr char siteStream[] = "LAPD_SITE";
+inline constexpr char deadStream[] = "LAPD_DEAD";
+
+// A stream refuses what it has no room for: whoever sends keeps it. It forgets what is older than its age.
+struct StreamRules {
+    std::string name;
+    std::vector<std::string> subjects;
+    std::uint32_t replicas = 1;
+    std::uint64_t mostOctets = 0;  // on each server's disk; 0: as much as the server allows
+    std::chrono::hours age{7 * 24};
+    std::chrono::seconds duplicates{120};  // so long the server knows the ids of messages
+    // JetStream domains of sites, whose LAPD_SITE is copied into this stream.
+    std::vector<std::string> sites;
+};
+
+// Makes the stream, or gives it these rules. Throws NatsError.
+void makeStream(NatsConnection& connection, const StreamRules& rules);
+
+struct StreamFilling {
+    std::uint64_t messages = 0;
+    std::uint64_t octets = 0;
+    std::uint64_t mostOctets = 0;  // 0: no limit of its own
+};
+// Throws NatsError.
+StreamFilling fillingOf(NatsConnection& connection, const std::string& stream);
+
+}  // namespace fleet
+
+#endif
