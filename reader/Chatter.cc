@@ -5,8 +5,8 @@
 #include <algorithm>
 #include <string>
 
-#include "reader/Output.h"
 #include "reader/text.h"
+#include "recording/files.h"
 
 namespace reader {
 
@@ -31,7 +31,7 @@ void Chatter::say(std::string_view text) {
     std::string line = "lapdread: ";
     appendForTerminal(line, text);
     line += '\n';
-    writeAll(STDERR_FILENO, line);
+    recording::writeAll(STDERR_FILENO, line);
 }
 
 void Chatter::error(std::string_view text) { say(text); }
@@ -68,12 +68,12 @@ void Chatter::draw(std::uint64_t done, std::uint64_t of) {
     }
     bar += "\x1b[K";
     drawn_ = true;
-    writeAll(STDERR_FILENO, bar);
+    recording::writeAll(STDERR_FILENO, bar);
 }
 
 void Chatter::clearBar() {
     if (drawn_)
-        writeAll(STDERR_FILENO, "\r\x1b[K");
+        recording::writeAll(STDERR_FILENO, "\r\x1b[K");
     drawn_ = false;
 }
 

@@ -1,7 +1,6 @@
 #include "reader/Output.h"
 
 #include <fcntl.h>
-#include <poll.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -9,16 +8,11 @@
 #include <utility>
 
 #include "reader/errors.h"
+#include "recording/files.h"
 
 namespace reader {
 
 namespace {
-
-// A descriptor that does not block (a terminal that another program has left so) is waited for.
-void awaitRoom(int descriptor) {
-    pollfd room{descriptor, POLLOUT, 0};
-    poll(&room, 1, -1);
-}
 
 int openForWriting(const std::string& path) {
     const int descriptor = open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666);
@@ -28,19 +22,6 @@ int openForWriting(const std::string& path) {
 }
 
 }  // namespace
-
-int writeAll(int descriptor, std::string_view text) {
-    while (!text.empty()) {
-        const ssize_t written = ::write(descriptor, text.data(), text.size());
-        if (written >= 0)
-            text.remove_prefix(static_cast<std::size_t>(written));
-        else if (errno == EAGAIN)
-            awaitRoom(descriptor);
-        else if (errno != EINTR)
-            return errno;
-    }
-    return 0;
-}
 
 Output::Output() : Output(STDOUT_FILENO, "standard output") {}
 
@@ -68,7 +49,7 @@ void Output::flush() {
 }
 
 void Output::writeThrough(std::string_view text) {
-    const int error = writeAll(descriptor_, text);
+    const int error = recording::writeAll(descriptor_, text);
     if (error == EPIPE)
         throw ReaderGone();
     if (error != 0)

@@ -57,9 +57,6 @@ class Output {
     std::string buffer_;
 };
 
-// Writes all of it, however often the system writes less or is interrupted. Returns 0 or the error's number.
-int writeAll(int descriptor, std::string_view text);
-
 }  // namespace reader
 
 #endif

@@ -47,13 +47,13 @@ bool isBeingWritten(const std::string& path) {
 
 RecordedTrunk::RecordedTrunk(const RecordRules& rules, const std::string& trunk, Chatter& chatter)
     : rules_(rules),
-      trunk_(fileNameOf(trunk)),
+      trunk_(recording::fileNameOf(trunk)),
       chatter_(chatter),
-      statePath_(statePath(rules.files.folder, trunk_)),
+      statePath_(recording::statePath(rules.files.folder, trunk_)),
       file_(rules.files, trunk, chatter),
       surroundings_(rules.surroundings, trunk, chatter) {
     try {
-        if (auto state = readState(statePath_))
+        if (auto state = recording::readState(statePath_))
             state_ = *std::move(state);
     } catch (const std::runtime_error& error) {
         chatter_.error(std::string(error.what()) + "; numbers begin anew");
@@ -66,20 +66,20 @@ RecordedTrunk::RecordedTrunk(const RecordRules& rules, const std::string& trunk,
 
 void RecordedTrunk::adoptUnfinished() {
     const RotationRules& files = rules_.files;
-    const RecordingKind kind{files.folder, trunk_, "", std::string(files.form->name)};
-    RecordingKind kept = kind;
+    const recording::RecordingKind kind{files.folder, trunk_, "", std::string(files.form->name)};
+    recording::RecordingKind kept = kind;
     kept.mark = rules_.surroundings.files.mark;
-    std::vector<Recording> left = unfinishedRecordings(kind);
-    const std::vector<Recording> leftKept = unfinishedRecordings(kept);
+    std::vector<recording::Recording> left = recording::unfinishedRecordings(kind);
+    const std::vector<recording::Recording> leftKept = recording::unfinishedRecordings(kept);
     left.insert(left.end(), leftKept.begin(), leftKept.end());
-    for (const Recording& recording : left) {
-        const std::string path = files.folder + "/" + recording.name;
-        const std::string part = path + std::string(unfinishedEnding);
+    for (const recording::Recording& each : left) {
+        const std::string path = files.folder + "/" + each.name;
+        const std::string part = path + std::string(recording::unfinishedEnding);
         if (isBeingWritten(part)) {
             chatter_.error(part + " is being written by another recorder, or cannot be opened");
             continue;
         }
-        if (!state_.files.empty() && state_.files.back().name == recording.name)
+        if (!state_.files.empty() && state_.files.back().name == each.name)
             continueBehind(state_.files.back(), part);
         if (std::rename(part.c_str(), path.c_str()) == 0)
             chatter_.note("finished " + path + ", which was left behind");
@@ -89,7 +89,7 @@ void RecordedTrunk::adoptUnfinished() {
 }
 
 // The file itself knows better than the state how far a recorder came that was killed.
-void RecordedTrunk::continueBehind(const RecordedFile& file, const std::string& path) {
+void RecordedTrunk::continueBehind(const recording::RecordedFile& file, const std::string& path) {
     if (file.run != state_.run)
         return;
     try {
@@ -131,14 +131,15 @@ void RecordedTrunk::take(const capture::Item& item) {
 void RecordedTrunk::meet(const capture::Item& first) {
     isMet_ = true;
     frames_ = besides_ = 0;
-    const std::optional<RecordedLog> log = isNumbered(first) ? logOf(first.frame) : std::nullopt;
+    const std::optional<recording::RecordedLog> log =
+        isNumbered(first) ? recording::logOf(first.frame) : std::nullopt;
     if (state_.run != 0 && log && state_.log && log->holdsTheSameAs(*state_.log)) {
         recordedNext_ = state_.next;
         recordedBesides_ = state_.besides;
         return;
     }
     file_.finish();
-    beginRun(state_, log);
+    recording::beginRun(state_, log);
     recordedNext_ = 1;
     recordedBesides_ = 0;
     isChanged_ = true;
@@ -182,17 +183,17 @@ void RecordedTrunk::record(const capture::Item& item, bool numbered) {
 void RecordedTrunk::enlist() {
     if (std::exchange(enlisted_, file_.begun()) == file_.begun())
         return;
-    std::vector<RecordedFile>& files = state_.files;
+    std::vector<recording::RecordedFile>& files = state_.files;
     if (!files.empty() && files.back().name == file_.newest())
         files.pop_back();  // it came to nothing, since the disk was full
     files.push_back({file_.newest(), state_.run, state_.next});
-    const auto isGone = [&](const RecordedFile& file) {
+    const auto isGone = [&](const recording::RecordedFile& file) {
         const std::string path = rules_.files.folder + "/" + file.name;
         return &file != &files.back() && !std::filesystem::exists(path);
     };
     files.erase(std::remove_if(files.begin(), files.end() - 1, isGone), files.end() - 1);
-    if (files.size() > RecordState::mostFiles)
-        files.erase(files.begin(), files.end() - RecordState::mostFiles);
+    if (files.size() > recording::RecordState::mostFiles)
+        files.erase(files.begin(), files.end() - recording::RecordState::mostFiles);
     isListed_ = false;
 }
 
@@ -225,7 +226,7 @@ void RecordedTrunk::beginFile() { file_.finish(); }
 
 void RecordedTrunk::finish() {
     if (!isMet_ && !waiting_.empty()) {
-        beginRun(state_, std::nullopt);
+        recording::beginRun(state_, std::nullopt);
         isMet_ = true;
         for (const capture::Item& waiting : waiting_.items())
             place(waiting);
@@ -239,7 +240,7 @@ void RecordedTrunk::finish() {
 
 // What is written to the files is behind this, or no longer to be had: the state may be told.
 void RecordedTrunk::saveState() {
-    if (const auto wrong = writeState(state_, statePath_)) {
+    if (const auto wrong = recording::writeState(state_, statePath_)) {
         if (!std::exchange(stateFails_, true))
             chatter_.error(*wrong);
     } else {

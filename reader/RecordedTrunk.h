@@ -9,9 +9,9 @@
 #include "capture/Batch.h"
 #include "capture/Item.h"
 #include "reader/Chatter.h"
-#include "reader/RecordState.h"
 #include "reader/RotatingFile.h"
 #include "reader/Surroundings.h"
+#include "recording/RecordState.h"
 
 namespace reader {
 
@@ -52,7 +52,7 @@ class RecordedTrunk {
 
   private:
     void adoptUnfinished();
-    void continueBehind(const RecordedFile& file, const std::string& path);
+    void continueBehind(const recording::RecordedFile& file, const std::string& path);
     void meet(const capture::Item& first);
     void place(const capture::Item& item);
     bool isRecorded(bool isNumbered) const;
@@ -64,7 +64,7 @@ class RecordedTrunk {
     std::string trunk_;  // as it stands in file names
     Chatter& chatter_;
     std::string statePath_;
-    RecordState state_;
+    recording::RecordState state_;
     RotatingFile file_;
     Surroundings surroundings_;
 

@@ -49,7 +49,7 @@ std::uint64_t sizeOf(int descriptor) {
 }  // namespace
 
 RotatingFile::RotatingFile(const RotationRules& rules, const std::string& trunk, Chatter& chatter)
-    : rules_(rules), chatter_(chatter), trunk_(fileNameOf(trunk)) {}
+    : rules_(rules), chatter_(chatter), trunk_(recording::fileNameOf(trunk)) {}
 
 RotatingFile::~RotatingFile() { finish(); }
 
@@ -68,7 +68,7 @@ bool RotatingFile::isAnotherPeriod(std::int64_t second) const {
     return periodOf(second) > period_ || periodOf(second + lateness) < period_;
 }
 
-RecordingKind RotatingFile::kind() const {
+recording::RecordingKind RotatingFile::kind() const {
     return {rules_.folder, trunk_, rules_.mark, std::string(rules_.form->name)};
 }
 
@@ -83,8 +83,8 @@ bool RotatingFile::begin(const capture::Item& item) {
     if (failing_ && (HostClock::now() < retryAt_ || !hasRoom()))
         return false;
     const std::int64_t second = secondOf(item);
-    path_ = newRecording(kind(), second);
-    const std::string part = path_ + std::string(unfinishedEnding);
+    path_ = recording::newRecording(kind(), second);
+    const std::string part = path_ + std::string(recording::unfinishedEnding);
     descriptor_ = open(part.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
     if (descriptor_ < 0) {
         fail("cannot write " + part + ": " + std::strerror(errno));
@@ -222,7 +222,7 @@ void RotatingFile::fail(const std::string& why) {
     if (size_ > 0 && isCut)
         nameFinished();
     else if (size_ == 0)
-        unlink((path_ + std::string(unfinishedEnding)).c_str());
+        unlink((path_ + std::string(recording::unfinishedEnding)).c_str());
 }
 
 void RotatingFile::closeFile() {
@@ -232,7 +232,7 @@ void RotatingFile::closeFile() {
 }
 
 void RotatingFile::nameFinished() {
-    const std::string part = path_ + std::string(unfinishedEnding);
+    const std::string part = path_ + std::string(recording::unfinishedEnding);
     if (rename(part.c_str(), path_.c_str()) != 0) {
         chatter_.error("cannot rename " + part + ": " + std::strerror(errno));
         return;
@@ -243,7 +243,7 @@ void RotatingFile::nameFinished() {
 
 // A file holds what is older than the beginning of the next one.
 void RotatingFile::removeOldest() const {
-    const std::vector<Recording> finished = finishedRecordings(kind());
+    const std::vector<recording::Recording> finished = recording::finishedRecordings(kind());
     for (std::size_t i = 0; i < finished.size(); ++i) {
         const bool isBeyondNumber = rules_.kept != 0 && i + rules_.kept < finished.size();
         const bool isBeyondSpan = rules_.span != 0 && i + 1 < finished.size() &&

@@ -12,7 +12,7 @@
 #include "reader/Chatter.h"
 #include "reader/HeldItem.h"
 #include "reader/forms.h"
-#include "reader/recordings.h"
+#include "recording/recordings.h"
 
 namespace reader {
 
@@ -76,7 +76,7 @@ class RotatingFile {
     void sayWritingWorks();
     bool hasRoom() const;
     void synchronise() const;
-    RecordingKind kind() const;
+    recording::RecordingKind kind() const;
     bool isAnotherPeriod(std::int64_t second) const;
     std::int64_t periodOf(std::int64_t second) const;
 

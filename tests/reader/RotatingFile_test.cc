@@ -8,7 +8,7 @@
 #include <fstream>
 #include <set>
 
-#include "reader/Output.h"
+#include "recording/files.h"
 
 namespace reader {
 namespace {
@@ -31,15 +31,15 @@ class FakeWriter : public capture::Writer {
     }
     void flush() override {
         if (full && !text_.empty()) {
-            writeAll(file_, "[");  // a disk that is full takes some of it
+            recording::writeAll(file_, "[");  // a disk that is full takes some of it
             throw capture::WriteError("no room", ENOSPC);
         }
-        writeAll(file_, text_);
+        recording::writeAll(file_, text_);
         text_.clear();
     }
     void finish() override {
         flush();
-        writeAll(file_, ".");
+        recording::writeAll(file_, ".");
     }
 
   private:
@@ -244,10 +244,10 @@ TEST_F(RotatingFileTest, SaysHowManyAreMissingOnceItGoesOn) {
 }
 
 TEST(FileName, LeadsToNoOtherFolder) {
-    EXPECT_EQ(fileNameOf("b1.d1"), "b1.d1");
-    EXPECT_EQ(fileNameOf("../x/y z"), "_._x_y_z");
-    EXPECT_EQ(fileNameOf(""), "trunk");
-    EXPECT_EQ(fileNameOf(std::string("a\0b", 3)), "a_b");
+    EXPECT_EQ(recording::fileNameOf("b1.d1"), "b1.d1");
+    EXPECT_EQ(recording::fileNameOf("../x/y z"), "_._x_y_z");
+    EXPECT_EQ(recording::fileNameOf(""), "trunk");
+    EXPECT_EQ(recording::fileNameOf(std::string("a\0b", 3)), "a_b");
 }
 
 }  // namespace

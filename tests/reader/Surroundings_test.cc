@@ -7,7 +7,7 @@
 #include <fstream>
 #include <map>
 
-#include "reader/Output.h"
+#include "recording/files.h"
 
 namespace reader {
 namespace {
@@ -20,9 +20,9 @@ class FakeWriter : public capture::Writer {
     explicit FakeWriter(int file) : file_(file) {}
     void write(const capture::Item& item) override {
         const bool isComment = item.kind == capture::Item::Kind::comment;
-        writeAll(file_, isComment ? "<" + std::string(item.text) + ">"
-                                  : " " + std::to_string(item.frame.time / second) + "/" +
-                                        std::to_string(item.frame.octets.size()));
+        recording::writeAll(file_, isComment ? "<" + std::string(item.text) + ">"
+                                             : " " + std::to_string(item.frame.time / second) + "/" +
+                                                   std::to_string(item.frame.octets.size()));
     }
     void flush() override {}
     void finish() override {}

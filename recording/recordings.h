@@ -1,13 +1,13 @@
 // The files that recordings are kept in: their names, and which of them are there.
-#ifndef READER_RECORDINGS_H
-#define READER_RECORDINGS_H
+#ifndef RECORDING_RECORDINGS_H
+#define RECORDING_RECORDINGS_H
 
 #include <cstdint>
 #include <string>
 #include <string_view>
 #include <vector>
 
-namespace reader {
+namespace recording {
 
 // A name that is safe in a path: letters, digits and "-_+@=." stay, anything else becomes "_".
 std::string fileNameOf(const std::string& trunk);
@@ -37,6 +37,6 @@ std::string newRecording(const RecordingKind& kind, std::int64_t start);
 std::vector<Recording> finishedRecordings(const RecordingKind& kind);
 std::vector<Recording> unfinishedRecordings(const RecordingKind& kind);
 
-}  // namespace reader
+}  // namespace recording
 
 #endif

@@ -1,8 +1,6 @@
-#include "reader/RecordState.h"
+#include "recording/RecordState.h"
 
-#include <fcntl.h>
 #include <sys/stat.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
@@ -14,9 +12,9 @@
 #include <nlohmann/json.hpp>
 #include <stdexcept>
 
-#include "reader/Output.h"
+#include "recording/files.h"
 
-namespace reader {
+namespace recording {
 
 namespace {
 
@@ -132,21 +130,7 @@ std::optional<RecordState> readState(const std::string& path) {
 }
 
 std::optional<std::string> writeState(const RecordState& state, const std::string& path) {
-    const std::string fresh = path + ".new";
-    const auto failed = [&](int reason) {
-        unlink(fresh.c_str());
-        return "cannot write " + path + ": " + std::strerror(reason);
-    };
-    const int descriptor = open(fresh.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666);
-    if (descriptor < 0)
-        return failed(errno);
-    const int unwritten = writeAll(descriptor, textOf(state));
-    const int unclosed = close(descriptor) == 0 ? 0 : errno;
-    if (unwritten != 0 || unclosed != 0)
-        return failed(unwritten != 0 ? unwritten : unclosed);
-    if (rename(fresh.c_str(), path.c_str()) != 0)
-        return failed(errno);
-    return std::nullopt;
+    return replaceFile(path, textOf(state));
 }
 
 void beginRun(RecordState& state, std::optional<RecordedLog> log) {
@@ -159,4 +143,4 @@ void beginRun(RecordState& state, std::optional<RecordedLog> log) {
     state.log = std::move(log);
 }
 
-}  // namespace reader
+}  // namespace recording

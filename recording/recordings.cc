@@ -1,4 +1,4 @@
-#include "reader/recordings.h"
+#include "recording/recordings.h"
 
 #include <algorithm>
 #include <cstring>
@@ -6,7 +6,7 @@
 #include <filesystem>
 #include <regex>
 
-namespace reader {
+namespace recording {
 
 namespace {
 
@@ -75,4 +75,4 @@ std::vector<Recording> unfinishedRecordings(const RecordingKind& kind) {
     return recordings(kind, unfinishedEnding);
 }
 
-}  // namespace reader
+}  // namespace recording

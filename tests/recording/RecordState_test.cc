@@ -1,4 +1,4 @@
-#include "reader/RecordState.h"
+#include "recording/RecordState.h"
 
 #include <gtest/gtest.h>
 #include <unistd.h>
@@ -6,7 +6,7 @@
 #include <filesystem>
 #include <fstream>
 
-namespace reader {
+namespace recording {
 namespace {
 
 class RecordStateTest : public ::testing::Test {
@@ -131,4 +131,4 @@ TEST(Run, IsNumberedBehindAllBeforeThoughTheClockWasSetBack) {
 }
 
 }  // namespace
-}  // namespace reader
+}  // namespace recording

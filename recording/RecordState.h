@@ -1,6 +1,6 @@
 // What a recorder has to know about a trunk when it is started anew: a small file beside the recordings.
-#ifndef READER_RECORDSTATE_H
-#define READER_RECORDSTATE_H
+#ifndef RECORDING_RECORDSTATE_H
+#define RECORDING_RECORDSTATE_H
 
 #include <cstdint>
 #include <optional>
@@ -9,7 +9,7 @@
 
 #include "capture/Frame.h"
 
-namespace reader {
+namespace recording {
 
 // A log and the run of frames that it holds, so that the same run is known again. The path is for people.
 struct RecordedLog {
@@ -61,6 +61,6 @@ std::optional<std::string> writeState(const RecordState& state, const std::strin
 // Makes a new run, numbered behind all that were before.
 void beginRun(RecordState& state, std::optional<RecordedLog> log);
 
-}  // namespace reader
+}  // namespace recording
 
 #endif
