@@ -69,7 +69,7 @@ Source::State Source::want(std::size_t octets) {
 // For what is wanted, and for a whole read behind what is held.
 void Source::makeRoom(std::size_t octets) {
     const std::size_t held = end_ - begin_;
-    const std::size_t needed = std::max(octets, held) + readSize;
+    const std::size_t needed = std::max(octets, held) + readSize + 1;  // and for heldReturn_
     if (capacity_ - begin_ >= needed)
         return;
     if (capacity_ < needed) {
@@ -91,17 +91,41 @@ Source::State Source::readMore() {
         replaced_ = true;
         return State::end;
     }
+    const std::size_t from = end_;
+    if (std::exchange(heldReturn_, false))
+        buffer_[end_++] = '\r';
     const ssize_t some = ::read(file_, buffer_.get() + end_, readSize);
     if (some > 0) {
         end_ += static_cast<std::size_t>(some);
         read_ += static_cast<std::uint64_t>(some);
+        if (joinsLineEnds_)
+            joinLineEndsFrom(from);
         return State::ready;
     }
-    if (some == 0)
-        return atEnd();
-    if (errno == EINTR || errno == EAGAIN)
-        return State::pause;
-    fail(name_);
+    if (some < 0 && errno != EINTR && errno != EAGAIN)
+        fail(name_);
+    const State state = some == 0 ? atEnd() : State::pause;
+    heldReturn_ = state == State::pause && end_ > from;
+    if (heldReturn_)
+        end_ = from;
+    return state;
+}
+
+void Source::joinLineEnds() {
+    joinsLineEnds_ = true;
+    joinLineEndsFrom(begin_);
+}
+
+// What a carriage return at the end belongs to is known when more has come.
+void Source::joinLineEndsFrom(std::size_t from) {
+    std::size_t to = from;
+    for (std::size_t at = from; at < end_; ++at) {
+        const bool belongsToLineEnd = buffer_[at] == '\r' && at + 1 < end_ && buffer_[at + 1] == '\n';
+        if (!belongsToLineEnd)
+            buffer_[to++] = buffer_[at];
+    }
+    heldReturn_ = to > from && buffer_[to - 1] == '\r';
+    end_ = heldReturn_ ? to - 1 : to;
 }
 
 Source::State Source::atEnd() {
@@ -159,7 +183,7 @@ void Source::restart() {
     file_ = file;
     if (file_ == STDIN_FILENO)
         static_cast<void>(::lseek(file_, 0, SEEK_SET));
-    replaced_ = paused_ = false;
+    replaced_ = paused_ = joinsLineEnds_ = heldReturn_ = false;
     begin_ = end_ = 0;
     read_ = 0;
     last_.clear();

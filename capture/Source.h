@@ -34,6 +34,9 @@ class Source {
     std::string_view held() const { return {buffer_.get() + begin_, end_ - begin_}; }
     // Moves the window's beginning on; at most by what it holds.
     void consume(std::size_t octets) { begin_ += octets; }
+    // From the window's beginning on, the carriage return in front of a line feed is left out: one, if there
+    // are more. Until restart().
+    void joinLineEnds();
 
     // Whether the end that want() told of is that of a content that is gone; restart() goes on with the new
     // one.
@@ -47,6 +50,7 @@ class Source {
 
   private:
     void makeRoom(std::size_t octets);
+    void joinLineEndsFrom(std::size_t from);
     State readMore();
     State atEnd();
     bool isReadable() const;
@@ -62,7 +66,9 @@ class Source {
     bool replaced_ = false;
     bool ended_ = false;
     bool paused_ = false;
-    std::uint64_t read_ = 0;  // of the content that is read now
+    bool joinsLineEnds_ = false;
+    bool heldReturn_ = false;  // a carriage return stands behind the window: a line feed may follow
+    std::uint64_t read_ = 0;   // of the content that is read now
     std::unique_ptr<char[]> buffer_;
     std::size_t capacity_ = 0;
     std::size_t begin_ = 0;

@@ -19,6 +19,28 @@ constexpr std::array allForms{pcapForm, pcapngForm, hexForm, dumpForm};
 // How much of an input is looked at, at most, to find out its form.
 constexpr std::size_t beginningSize = std::size_t{1} << 16;
 
+// Some editors write it in front of a text.
+constexpr std::string_view byteOrderMark = "\xef\xbb\xbf";
+
+// How contents begin that something else has to unpack first.
+constexpr std::pair<std::string_view, std::string_view> packings[] = {
+    {"\x1f\x8b", "; it is compressed with gzip: unpack it first"},
+    {"\xfd"
+     "7zXZ",
+     "; it is compressed with xz: unpack it first"},
+    {"\x28\xb5\x2f\xfd", "; it is compressed with zstd: unpack it first"},
+    {"BZh", "; it is compressed with bzip2: unpack it first"},
+    {"\xff\xfe", "; it is text in UTF-16: convert it to UTF-8 first"},
+    {"\xfe\xff", "; it is text in UTF-16: convert it to UTF-8 first"},
+};
+
+std::string_view adviceFor(std::string_view beginning) {
+    const auto* const found =
+        std::find_if(std::begin(packings), std::end(packings),
+                     [&](const auto& packing) { return beginning.starts_with(packing.first); });
+    return found == std::end(packings) ? std::string_view() : found->second;
+}
+
 class AnyReader final : public Reader {
   public:
     AnyReader(const std::string& path, ReadOptions options, std::span<const Form> forms)
@@ -50,8 +72,10 @@ class AnyReader final : public Reader {
         while (true) {
             const std::size_t held = source_.held().size();
             const Source::State state = held < beginningSize ? source_.want(held + 1) : Source::State::end;
+            if (source_.held().starts_with(byteOrderMark))
+                source_.consume(byteOrderMark.size());
             const bool isAll = state == Source::State::end;
-            bool isOpen = false;
+            bool isOpen = !isAll && byteOrderMark.starts_with(source_.held());
             for (const Form& form : forms_) {
                 const Form::Match match = form.matches(source_.held().substr(0, beginningSize), isAll);
                 if (match == Form::Match::yes) {
@@ -73,8 +97,8 @@ class AnyReader final : public Reader {
 
     [[noreturn]] void failUnknown() const {
         if (source_.held().empty())
-            throw BadInput(source_.name() + ": truncated dump file: it is empty");
-        throw BadInput(source_.name() + ": unknown file format");
+            throw BadInput(source_.name() + ": it is empty");
+        throw BadInput(source_.name() + ": unknown file format" + std::string(adviceFor(source_.held())));
     }
 
     void beginAnew(Item& item) {

@@ -9,6 +9,7 @@
 #include "lapdlog/between.h"
 #include "lapdlog/guessing.h"
 #include "lapdlog/headers.h"
+#include "lapdlog/line_ends.h"
 #include "lapdlog/log.h"
 #include "lapdlog/variants.h"
 
@@ -297,19 +298,9 @@ Item LogParser::takePassed(bool isEnd) {
 }  // namespace
 
 std::unique_ptr<capture::Parser> readLog(const capture::Context& context) {
+    if (hasDosLineEnds(context.source.held()))
+        context.source.joinLineEnds();
     return std::make_unique<LogParser>(context);
-}
-
-// What begins one of the recorder's entries, at the beginning of a line.
-capture::Form::Match isLog(std::string_view beginning, bool isAll) {
-    for (std::string_view text = beginning; !text.empty();) {
-        Between between;
-        Header header;
-        if (readBetween(text, isAll, between) == Reading::good || readHeader(text, header) == Reading::good)
-            return capture::Form::Match::yes;
-        text.remove_prefix(std::min(text.find('\n'), text.size() - 1) + 1);
-    }
-    return isAll ? capture::Form::Match::no : capture::Form::Match::perhaps;
 }
 
 }  // namespace lapdlog

@@ -7,7 +7,7 @@
 namespace lapdlog {
 
 // A log shows a head, a frame's time lines or a line that the recorder writes between frames. A piece of one,
-// without head, is a log too.
+// without head, is a log too; so is one whose line feeds have become DOS line ends.
 capture::Form::Match isLog(std::string_view beginning, bool isAll);
 
 // Gives the frames that are proved: whose text, between the time lines and the end of the dump, is what the
@@ -18,6 +18,8 @@ capture::Form::Match isLog(std::string_view beginning, bool isAll);
 //
 // Frames have their ticks, the second in which they were written, and an absolute time, good to a second
 // (their differences to 4 ms; see BoardClock). Dates are local times of this host's zone (TZ).
+//
+// Of DOS line ends the carriage return is left out, in the texts of frames as well.
 //
 // The parser uses the decoder's words of the thread that calls it.
 std::unique_ptr<capture::Parser> readLog(const capture::Context& context);

@@ -106,8 +106,22 @@ TEST_F(TextForms, ADumpHasTheTimeAtTheBeginningOfItsLine) {
 
 TEST_F(TextForms, WhatHasNoFrameIsOfNoKnownForm) {
     EXPECT_EQ(read("once upon a time\n"), "!: unknown file format\n");
-    EXPECT_EQ(read(""), "!: truncated dump file: it is empty\n");
+    EXPECT_EQ(read(""), "!: it is empty\n");
     EXPECT_EQ(read("# nothing\n"), "!: unknown file format\n");
+}
+
+TEST_F(TextForms, AByteOrderMarkIsNoPartOfTheText) {
+    EXPECT_EQ(read("\xef\xbb\xbfTX 00017f\n"), "frame 1 TX 00017f\n");
+    EXPECT_EQ(read("\xef\xbb\xbf> [ 00 01 7f ]\n"), "frame 1 TX 00017f\n");
+    EXPECT_EQ(read("\xef\xbb\xbf"), "!: it is empty\n");
+    EXPECT_EQ(read("\xef\xbb"), "!: unknown file format\n");
+}
+
+TEST_F(TextForms, WhatMustBeUnpackedFirstIsSaid) {
+    EXPECT_EQ(read("\x1f\x8b\x08 and so on"),
+              "!: unknown file format; it is compressed with gzip: unpack it first\n");
+    EXPECT_EQ(read("\xff\xfeT\0X\0"),
+              "!: unknown file format; it is text in UTF-16: convert it to UTF-8 first\n");
 }
 
 TEST_F(TextForms, EveryBeginningOfAnInputIsReadToItsEnd) {

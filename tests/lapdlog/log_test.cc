@@ -68,12 +68,52 @@ TEST_F(LogTest, FramesOfAnyLengthAreRead) {
     EXPECT_EQ(items.find("cut"), std::string::npos);
 }
 
+// What a transfer between systems makes of a log: each line feed gets a carriage return in front of it.
+std::string withDosLineEnds(const std::string& text) {
+    std::string changed;
+    for (const char c : text)
+        changed += c == '\n' ? std::string("\r\n") : std::string(1, c);
+    return changed;
+}
+
+TEST_F(LogTest, DosLineEndsAreReadAsLineFeeds) {
+    const std::string log =
+        net5Head + textOf(true, 250, sabme) + "Frames Lost: 3 \n" + textOf(false, 251, ua);
+    EXPECT_EQ(itemsIn(withDosLineEnds(log)), itemsIn(log));
+    EXPECT_EQ(itemsIn("\xef\xbb\xbf" + withDosLineEnds(log)), itemsIn(log));
+    const std::string piece = textOf(false, 1, setup) + textOf(false, 2, ua);
+    EXPECT_EQ(itemsIn(withDosLineEnds(piece)), itemsIn(piece));
+}
+
+TEST_F(LogTest, ALogWithDosLineEndsIsReadWhereverAReadEnds) {
+    std::string log = net5Head;
+    while (log.size() < 1'200'000)
+        log += textOf(false, 251, ua) + textOf(true, 252, setup);
+    const std::string dos = withDosLineEnds(log);
+    for (std::size_t cut = 0; cut < 4; ++cut) {
+        const std::string same = "x" + std::string(cut, 'x') + "\n";
+        EXPECT_EQ(itemsIn(withDosLineEnds(same) + dos), itemsIn(same + log)) << cut;
+    }
+}
+
+TEST_F(LogTest, ALogWithDosLineEndsMayEndAnywhere) {
+    const std::string dos = withDosLineEnds(net5Head + textOf(false, 1, ua));
+    for (std::size_t size = net5Head.size() + 10; size < dos.size(); ++size)
+        EXPECT_TRUE(itemsIn(dos.substr(0, size)).starts_with("run 1 net5\n")) << size;
+}
+
 // A SETUP with a DISPLAY of this text.
 Octets displaying(std::string_view text) {
     Octets octets{
         0x02, 0x01, 0x00, 0x00, 0x08, 0x02, 0x00, 0x01, 0x05, 0x28, static_cast<std::uint8_t>(text.size())};
     octets.insert(octets.end(), text.begin(), text.end());
     return octets;
+}
+
+TEST_F(LogTest, DosLineEndsInADisplayTextAreTheTexts) {
+    const std::string log = net5Head + textOf(false, 1, displaying("a\r\nb")) + textOf(false, 2, ua);
+    EXPECT_EQ(itemsIn(log).find("unproved"), std::string::npos);
+    EXPECT_EQ(itemsIn(withDosLineEnds(log)), itemsIn(log));
 }
 
 TEST_F(LogTest, ADisplayThatImitatesAFrameIsText) {

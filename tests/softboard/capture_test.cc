@@ -125,7 +125,7 @@ TEST(CaptureTest, ABadFileIsRefusedWithItsPlaceAndTheReason) {
 
 TEST(CaptureTest, WhatIsNoCaptureIsRefused) {
     EXPECT_EQ(complaint("/nowhere/day.pcap"), "/nowhere/day.pcap: No such file or directory");
-    EXPECT_EQ(complaint("/dev/null").substr(0, 30), "/dev/null: truncated dump file");
+    EXPECT_EQ(complaint("/dev/null"), "/dev/null: it is empty");
     EXPECT_EQ(complaint(LAPDMON_SOURCE_DIR "/CMakeLists.txt"),
               LAPDMON_SOURCE_DIR "/CMakeLists.txt: unknown file format");
     EXPECT_EQ(complaint("/"), "/: Is a directory");
