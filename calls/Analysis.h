@@ -84,6 +84,8 @@ class Analysis {
     std::vector<const Call*> open() const;
     // Calls that were let go before their end, since too many were alive.
     std::uint64_t dropped() const;
+    // Calls that have begun, which are numbered from 1.
+    std::uint64_t begun() const { return numbers_->last; }
     // Of each D channel from which a frame has come, by name.
     std::vector<Span> spans() const;
     // What is known of the links of a D channel; null if nothing has come from it.

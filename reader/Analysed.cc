@@ -16,6 +16,8 @@ Analysed::Analysed(const Options& options)
 void Analysed::run(Session& session, Chatter& chatter) {
     session.run(*this, [] { return std::make_unique<NoComposer>(); });
     analysis_.finish();
+    if (!callFilter_.isEmpty() && !isAnyWanted_ && analysis_.begun() != 0)
+        chatter.note("no call passes the filters; calls: " + std::to_string(analysis_.begun()));
     if (const std::uint64_t dropped = analysis_.dropped(); dropped != 0)
         chatter.note("calls that were let go before their end, since too many were alive: " +
                      std::to_string(dropped));
@@ -62,6 +64,7 @@ void Analysed::heard(const calls::Message& message, const calls::Call* call) {
 
 void Analysed::gone(const calls::Call& call) {
     const bool isCallWanted = callFilter_.wants(call);
+    isAnyWanted_ = isAnyWanted_ || isWanted(call);
     wanted_.erase(call.number);
     if (callFilter_.isEmpty())
         return;

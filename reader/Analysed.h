@@ -69,6 +69,7 @@ class Analysed : public Consumer, protected calls::Listener {
     std::map<std::uint64_t, bool> decided_;  // calls that have gone, and whether they were wanted
     std::deque<calls::Finding> held_;
     std::uint64_t letGo_ = 0;
+    bool isAnyWanted_ = false;  // a call that has gone
 };
 
 }  // namespace reader

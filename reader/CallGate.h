@@ -41,6 +41,8 @@ class CallGate : private calls::Listener {
     // What may go on, one at a time; null if there is nothing just now. It is valid until the next call.
     const Seen* next();
 
+    // Calls that have begun.
+    std::uint64_t calls() const { return analysis_.begun(); }
     // Frames that were let go although their call may have been wanted.
     std::uint64_t letGo() const { return letGo_; }
 

@@ -36,6 +36,11 @@ void Chatter::say(std::string_view text) {
 
 void Chatter::error(std::string_view text) { say(text); }
 
+void Chatter::wrongUsage(std::string_view text) {
+    wrongUsage_ = true;
+    say(text);
+}
+
 void Chatter::note(std::string_view text) {
     if (loudness_ != Loudness::quiet)
         say(text);

@@ -23,6 +23,10 @@ class Chatter {
 
     // What ends the program, or spoils its result: always said.
     void error(std::string_view text);
+    // What is wrong with the command line as the input shows: always said; the exit status is that of wrong
+    // usage.
+    void wrongUsage(std::string_view text);
+    bool hasWrongUsage() const { return wrongUsage_; }
     // What the user should know: said unless --quiet.
     void note(std::string_view text);
     // How the work goes on: said with --verbose.
@@ -44,6 +48,7 @@ class Chatter {
     Loudness loudness_;
     bool mayDraw_;
     bool drawn_ = false;
+    bool wrongUsage_ = false;
     unsigned calls_ = 0;
     Clock::time_point next_;
 };

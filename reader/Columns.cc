@@ -187,7 +187,7 @@ const Column& columnNamed(std::string_view name) {
     std::string known;
     for (const Column& column : table)
         (known += known.empty() ? "" : ",") += column.name;
-    throw UsageError("--columns: there is no column " + std::string(name) + " (there are " + known + ")");
+    throw UsageError("there is no column " + std::string(name) + " (there are " + known + ")");
 }
 
 void appendEvent(std::string& to, const capture::Item& item) {

@@ -163,10 +163,18 @@ std::unique_ptr<Condition> byFrameType(const std::string& value) {
 }
 
 std::unique_ptr<Condition> byMark(const std::string& value) {
-    return onFrame([value](const Seen& seen) {
-        std::string marks;
-        appendMarks(marks, seen);
-        return value == "any" ? !marks.empty() : marks.find(value) != std::string::npos;
+    const std::string name = plainName(value);
+    std::vector<MarkRow> wanted;
+    std::string known = "any";
+    for (const MarkRow& row : markRows()) {
+        (known += ", ") += row.word;
+        if (name == "any" || plainName(row.word).find(name) != std::string::npos)
+            wanted.push_back(row);
+    }
+    if (name.empty() || wanted.empty())
+        refuse("mark", value, "a mark or a part of it (" + known + ")");
+    return onFrame([wanted](const Seen& seen) {
+        return std::ranges::any_of(wanted, [&](const MarkRow& row) { return row.holds(seen); });
     });
 }
 

@@ -21,6 +21,8 @@ struct OptionRow {
     // Called each time the option is given, with "" if it takes no value. Throws UsageError; who calls adds
     // the option's name.
     void (*set)(Options& options, const std::string& value);
+    // Of the options of a command whose rows have the same word here only one may be given; empty: any.
+    std::string_view oneOf{};
 };
 
 struct OptionGroup {

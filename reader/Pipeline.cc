@@ -48,11 +48,12 @@ class Run {
           left_(first_),
           crew_(jobs()) {}
 
-    void run() {
+    Outcome run() {
+        Next next = Next::item;
         bool more = true;
         bool isFull = false;
         while (more && !isStopped()) {
-            const auto next = readChunk();
+            next = readChunk();
             const std::size_t most = work_.jobs == 1 ? 0 : work_.jobs * chunksForEachThread;
             const bool nowOrNever = next != capture::Reader::Next::item || work_.eachAtOnce;
             isFull = !handOn(nowOrNever ? 0 : most);
@@ -68,8 +69,9 @@ class Run {
         }
         if (!isFull && work_.gate != nullptr)
             handInRest();
-        handOn(0);
+        isFull = !handOn(0) || isFull;
         consumer_.flush();
+        return {!isFull && next == Next::end, passed_};
     }
 
   private:
@@ -175,6 +177,7 @@ class Run {
         while (crew_.held() > most) {
             std::unique_ptr<Chunk> chunk = crew_.takeBack();
             std::size_t wanted = chunk->pieces.size();
+            passed_ += wanted;
             if (first_ != 0) {
                 wanted = std::min<std::uint64_t>(wanted, left_);
                 left_ -= wanted;
@@ -205,6 +208,7 @@ class Run {
     const Work& work_;
     std::uint64_t first_;
     std::uint64_t left_;
+    std::uint64_t passed_ = 0;
     bool hasCome_ = true;              // an item, since time was counted last
     HostClock::time_point timeUntil_;  // time has been counted up to then
     bool begun_ = false;
@@ -217,9 +221,9 @@ class Run {
 
 }  // namespace
 
-void runPipeline(capture::Reader& reader, Tracker& tracker, Filter& filter, Consumer& consumer,
-                 Chatter& chatter, const Work& work) {
-    Run(reader, tracker, filter, consumer, chatter, work).run();
+Outcome runPipeline(capture::Reader& reader, Tracker& tracker, Filter& filter, Consumer& consumer,
+                    Chatter& chatter, const Work& work) {
+    return Run(reader, tracker, filter, consumer, chatter, work).run();
 }
 
 }  // namespace reader

@@ -53,9 +53,14 @@ struct Work {
     const std::atomic<bool>* stopped = nullptr;  // set by a signal: the work ends with what was read
 };
 
+struct Outcome {
+    bool isWhole = false;      // the input was read to its end, and the consumer has got all that passed
+    std::uint64_t passed = 0;  // items that passed the filters
+};
+
 // Returns once the input has ended, `first` pieces are out, or a signal came. What reading, composing and
 // consuming throw comes out of here.
-void runPipeline(capture::Reader& reader, Tracker& tracker, Filter& filter, Consumer& consumer,
+Outcome runPipeline(capture::Reader& reader, Tracker& tracker, Filter& filter, Consumer& consumer,
                  Chatter& chatter, const Work& work);
 
 }  // namespace reader

@@ -7,10 +7,7 @@ namespace {
 using calls::Marks;
 
 // clang-format off
-constexpr struct {
-    std::string_view word;
-    bool (*holds)(const Seen& seen);
-} markRows[] = {
+constexpr MarkRow rows[] = {
     {"retransmitted",        [](const Seen& seen) { return seen.marks.retransmitted; }},
     {"out of sequence",      [](const Seen& seen) { return seen.marks.outOfSequence; }},
     {"not accepted",
@@ -29,9 +26,11 @@ constexpr struct {
 
 }  // namespace
 
+std::span<const MarkRow> markRows() { return rows; }
+
 void appendMarks(std::string& to, const Seen& seen) {
     bool first = true;
-    for (const auto& row : markRows) {
+    for (const MarkRow& row : rows) {
         if (!row.holds(seen))
             continue;
         if (!first)

@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <optional>
+#include <span>
 #include <string>
 #include <string_view>
 
@@ -41,6 +42,13 @@ struct Seen {
 
 // The side that sent the frame: "U>N", "N>U", or "?>?" while the role is unknown.
 std::string_view direction(const Seen& seen);
+
+// A mark that a frame may have.
+struct MarkRow {
+    std::string_view word;
+    bool (*holds)(const Seen& seen);
+};
+std::span<const MarkRow> markRows();
 
 // "retransmitted, link up": what the link says of the frame, in words; nothing of most frames.
 void appendMarks(std::string& to, const Seen& seen);

@@ -33,6 +33,11 @@ class Tracker {
     void leaveLinksAlone() { followsLinks_ = false; }
     bool followsLinks() const { return followsLinks_; }
 
+    // How many have been numbered.
+    std::uint64_t frames() const { return frames_; }
+    // Whether something has come from a D channel of this name.
+    bool knows(const std::string& dChannel) const { return channels_.contains(dChannel); }
+
     // The headers themselves are left to whoever looks at the frame, see readHeaders.
     Seen see(const capture::Item& item);
 

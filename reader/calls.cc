@@ -114,9 +114,9 @@ class CallPrinter : public Analysed {
 std::span<const OptionRow> callsOptions() {
     static const OptionRow rows[] = {
         {"--csv", "", "A row a call, for spreadsheets",
-         [](Options& to, const std::string&) { to.calls.form = CallForm::csv; }},
+         [](Options& to, const std::string&) { to.calls.form = CallForm::csv; }, "form"},
         {"--jsonl", "", "A JSON object a call",
-         [](Options& to, const std::string&) { to.calls.form = CallForm::jsonLines; }},
+         [](Options& to, const std::string&) { to.calls.form = CallForm::jsonLines; }, "form"},
         {"--sort", "KEY",
          "Sort by start, duration, connect, response, cause or channel; without it, calls come in the order "
          "of "

@@ -2,11 +2,13 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
+#include <filesystem>
 #include <functional>
 #include <memory>
 
 #include "reader/Filter.h"
 #include "reader/errors.h"
+#include "reader/suggestion.h"
 
 namespace reader {
 
@@ -82,9 +84,9 @@ constexpr OptionRow generalRows[] = {
     {"--jobs", "N", "Work on N processors (default: all)",
      [](Options& to, const std::string& value) { to.output.jobs = countIn(value, 256U); }},
     {"-q,--quiet", "", "Say nothing but errors",
-     [](Options& to, const std::string&) { to.loudness = Loudness::quiet; }},
+     [](Options& to, const std::string&) { to.loudness = Loudness::quiet; }, "loudness"},
     {"-v,--verbose", "", "Say more about the work",
-     [](Options& to, const std::string&) { to.loudness = Loudness::verbose; }},
+     [](Options& to, const std::string&) { to.loudness = Loudness::verbose; }, "loudness"},
 };
 
 constexpr OptionRow filterRowsBesides[] = {
@@ -141,12 +143,20 @@ CLI::Option* add(CLI::App& app, std::string_view names, std::string_view form, s
 }
 
 void addGroup(CLI::App& app, const OptionGroup& group, Options& options) {
+    std::vector<std::pair<std::string_view, CLI::Option*>> choices;
     for (const OptionRow& row : group.rows) {
         CLI::Option* const option =
             add(app, row.names, row.form, row.help,
                 [&options, &row](const std::string& value) { row.set(options, value); });
         if (!group.title.empty())
             option->group(std::string(group.title));
+        if (row.oneOf.empty())
+            continue;
+        for (const auto& [what, other] : choices) {
+            if (what == row.oneOf)
+                option->excludes(other);
+        }
+        choices.emplace_back(row.oneOf, option);
     }
 }
 
@@ -209,8 +219,24 @@ bool asksAboutAll(const std::string& word) {
     return word == "-h" || word == "--help" || word == "-V" || word == "--version";
 }
 
+// A file is what exists, or what is like no command.
+void checkNoMistypedCommand(const std::string& word) {
+    if (word.find_first_not_of("abcdefghijklmnopqrstuvwxyz") != std::string::npos)
+        return;
+    std::vector<std::string_view> names;
+    for (const Command& command : commands())
+        names.push_back(command.name);
+    const std::string_view meant = nearest(word, names);
+    std::error_code ignored;
+    if (!meant.empty() && !std::filesystem::exists(word, ignored))
+        throw UsageError("there is no file and no command " + word + "; did you mean " + std::string(meant) +
+                         "?");
+}
+
 std::vector<std::string> withCommand(std::vector<std::string> words) {
     const bool named = !words.empty() && (commandNamed(words[0]) != nullptr || asksAboutAll(words[0]));
+    if (!named && !words.empty())
+        checkNoMistypedCommand(words[0]);
     if (!named)
         words.insert(words.begin(), std::string(commands().front().name));
     return words;

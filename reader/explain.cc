@@ -177,22 +177,33 @@ void ExplainComposer::compose(const Seen& seen, std::string& text, Piece& /*piec
     text += '\n';
 }
 
+namespace {
+
+constexpr std::string_view hexDigits = "0123456789abcdefABCDEF";
+constexpr std::string_view betweenDigits = " \t\n:-,";
+
+}  // namespace
+
 std::optional<std::vector<std::uint8_t>> readHex(std::string_view text) {
-    std::string digits;
-    for (const char character : text) {
-        if (character == ' ' || character == ':' || character == '-')
-            continue;
-        digits += character;
-    }
-    if (digits.empty() || digits.size() % 2 != 0)
-        return std::nullopt;
     std::vector<std::uint8_t> octets;
-    for (std::size_t i = 0; i < digits.size(); i += 2) {
-        unsigned octet = 0;
-        if (!readNumber(std::string_view(digits).substr(i, 2), octet, 16))
+    while (!text.empty()) {
+        const std::size_t size = std::min(text.find_first_of(betweenDigits), text.size());
+        std::string_view digits = text.substr(0, size);
+        text.remove_prefix(std::min(size + 1, text.size()));
+        if (digits.starts_with("0x") || digits.starts_with("0X"))
+            digits.remove_prefix(2);
+        if (digits.find_first_not_of(hexDigits) != std::string_view::npos)
             return std::nullopt;
-        octets.push_back(static_cast<std::uint8_t>(octet));
+        if (digits.size() % 2 != 0)
+            throw UsageError(std::string(digits) + " is not made of octets, of two hexadecimal digits each");
+        for (; !digits.empty(); digits.remove_prefix(2)) {
+            unsigned octet = 0;
+            readNumber(digits.substr(0, 2), octet, 16);
+            octets.push_back(static_cast<std::uint8_t>(octet));
+        }
     }
+    if (octets.empty())
+        return std::nullopt;
     return octets;
 }
 
@@ -203,9 +214,9 @@ bool looksLikeElement(std::span<const std::uint8_t> octets) {
 std::span<const OptionRow> explainOptions() {
     static constexpr OptionRow rows[] = {
         {"--frame", "", "The digits are a frame, address field first",
-         [](Options& to, const std::string&) { to.explainAs = ExplainAs::frame; }},
+         [](Options& to, const std::string&) { to.explainAs = ExplainAs::frame; }, "digits"},
         {"--element", "", "The digits are elements, identifier first",
-         [](Options& to, const std::string&) { to.explainAs = ExplainAs::element; }},
+         [](Options& to, const std::string&) { to.explainAs = ExplainAs::element; }, "digits"},
     };
     return rows;
 }

@@ -41,7 +41,8 @@ class ExplainComposer : public Composer {
     const std::uint8_t* begin_ = nullptr;  // of the octets that positions count from
 };
 
-// The octets of hexadecimal digits, which blanks, colons and dashes may part; nothing for any other text.
+// The octets of hexadecimal digits, which blanks, colons, dashes and commas may part, each part with or
+// without "0x"; nothing for any other text. Throws UsageError for a part with half an octet.
 std::optional<std::vector<std::uint8_t>> readHex(std::string_view text);
 
 // Whether octets that came without further words are an element: the second one tells how many follow.

@@ -129,9 +129,9 @@ class LadderPrinter : public Analysed {
 
 std::span<const OptionRow> ladderOptions() {
     static constexpr OptionRow rows[] = {
-        {"--svg", "", "A picture", [](Options& to, const std::string&) { to.ladder.form = LadderForm::svg; }},
+        {"--svg", "", "A picture", [](Options& to, const std::string&) { to.ladder.form = LadderForm::svg; }, "form"},
         {"--mermaid", "", "Sequence diagrams of Mermaid, for Markdown",
-         [](Options& to, const std::string&) { to.ladder.form = LadderForm::mermaid; }},
+         [](Options& to, const std::string&) { to.ladder.form = LadderForm::mermaid; }, "form"},
         {"--width", "N", "Columns of a line (default: those of the terminal, else 80; at least 40 are used)",
          [](Options& to, const std::string& value) { to.ladder.width = countIn(value, mostWidth); }},
         {"--ascii", "", "Draw with ASCII characters, also where the locale has UTF-8",

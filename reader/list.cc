@@ -82,11 +82,11 @@ void LineComposer::compose(const Seen& seen, std::string& text, Piece& piece) {
 std::span<const OptionRow> listOptions() {
     static constexpr OptionRow rows[] = {
         {"--relative", "", "Seconds since the first frame instead of times",
-         [](Options& to, const std::string&) { to.list.time = TimeForm::relative; }},
+         [](Options& to, const std::string&) { to.list.time = TimeForm::relative; }, "time"},
         {"--delta", "", "Seconds since the line before instead of times",
-         [](Options& to, const std::string&) { to.list.time = TimeForm::delta; }},
+         [](Options& to, const std::string&) { to.list.time = TimeForm::delta; }, "time"},
         {"--wide", "", "All columns, the octets among them",
-         [](Options& to, const std::string&) { to.list.wide = true; }},
+         [](Options& to, const std::string&) { to.list.wide = true; }, "columns"},
         {"--columns", "A,B,...",
          "These columns, in this order: n, time, delta, trunk, place, ticks, dir, link, frame, ns, nr, pf, "
          "length, "
@@ -95,7 +95,7 @@ std::span<const OptionRow> listOptions() {
              to.list.columns = splitAtCommas(value);
              for (const std::string& name : to.list.columns)
                  columnNamed(name);
-         }},
+         }, "columns"},
     };
     return rows;
 }

@@ -23,7 +23,8 @@ int run(const std::vector<std::string>& words) {
     if (!line.options.input.zone.empty())
         useTimeZone(line.options.input.zone);
     Chatter chatter(line.options.loudness);
-    return line.command->run(line.options, chatter);
+    const int status = line.command->run(line.options, chatter);
+    return status == good && chatter.hasWrongUsage() ? badUsage : status;
 }
 
 int fail(ExitStatus status, const std::string& why) {

@@ -85,10 +85,27 @@ void Session::run(Consumer& consumer, const std::function<std::unique_ptr<Compos
         work.gate =
             &gate.emplace(callFilter_, analysisOptions(options_),
                           options_.input.follow ? CallGate::Order::ofDecision : CallGate::Order::ofInput);
-    runPipeline(reader_, tracker_, filter_, consumer, chatter_, work);
+    const Outcome outcome = runPipeline(reader_, tracker_, filter_, consumer, chatter_, work);
+    if (outcome.isWhole)
+        tellWhatWasNotFound(outcome, gate ? &*gate : nullptr);
     if (gate && gate->letGo() != 0)
         chatter_.note("frames that were let go before the end of their call told whether it is wanted: " +
                       std::to_string(gate->letGo()));
+}
+
+// Silence could also mean a trunk on which nothing happens.
+void Session::tellWhatWasNotFound(const Outcome& outcome, const CallGate* gate) {
+    const bool isNothing = outcome.passed == 0 && tracker_.frames() != 0;
+    if (isNothing && gate != nullptr)
+        chatter_.note("no call passes the filters; calls: " + std::to_string(gate->calls()));
+    else if (isNothing && !filter_.isEmpty())
+        chatter_.note("no frame passes the filters; frames: " + std::to_string(tracker_.frames()));
+    for (const std::vector<std::string>& group : options_.calls.groups) {
+        for (const std::string& name : group) {
+            if (!tracker_.knows(name))
+                chatter_.wrongUsage("--nfas: nothing has come from a D channel " + name);
+        }
+    }
 }
 
 }  // namespace reader

@@ -50,6 +50,7 @@ class Session {
 
   private:
     void awaitInputs();
+    void tellWhatWasNotFound(const Outcome& outcome, const CallGate* gate);
 
     const Options& options_;
     Chatter& chatter_;

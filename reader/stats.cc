@@ -12,15 +12,15 @@ namespace reader {
 std::span<const OptionRow> statsOptions() {
     static const OptionRow rows[] = {
         {"--csv", "", "A row a figure, for spreadsheets",
-         [](Options& to, const std::string&) { to.calls.form = CallForm::csv; }},
+         [](Options& to, const std::string&) { to.calls.form = CallForm::csv; }, "form"},
         {"--jsonl", "", "A JSON object a row",
-         [](Options& to, const std::string&) { to.calls.form = CallForm::jsonLines; }},
+         [](Options& to, const std::string&) { to.calls.form = CallForm::jsonLines; }, "form"},
         {"--e1", "", "The trunks have the channels of E1 (default: learnt)",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::e1; }},
+         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::e1; }, "trunk"},
         {"--t1", "", "The trunks have the channels of T1",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::t1; }},
+         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::t1; }, "trunk"},
         {"--bri", "", "The trunks are basic accesses",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::basic; }},
+         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::basic; }, "trunk"},
     };
     return rows;
 }

@@ -54,6 +54,41 @@ TEST(CommandLine, KeepsFiltersAndWhetherNotStandsInFront) {
     EXPECT_EQ(filters({"--not", "--not", "--tei", "5", "a.log"}), Set{"tei=5"});
 }
 
+TEST(CommandLine, SaysWhichCommandAMistypedWordMayMean) {
+    const auto meant = [](const std::string& word) {
+        try {
+            parseCommandLine({word, "a.log"});
+            return std::string();
+        } catch (const UsageError& error) {
+            return std::string(error.what());
+        }
+    };
+    for (const auto& [word, command] : {std::pair("lst", "list"),
+                                        {"lsit", "list"},
+                                        {"ckeck", "check"},
+                                        {"convrt", "convert"},
+                                        {"explian", "explain"},
+                                        {"recrods", "record"}})
+        EXPECT_EQ(meant(word), std::string("there is no file and no command ") + word + "; did you mean " +
+                                   command + "?");
+    for (const std::string word : {"day.log", "a", "list.log", "trunk1", "-", "ls", "explained-again"})
+        EXPECT_EQ(meant(word), "") << word;
+}
+
+TEST(CommandLine, RefusesOptionsOfWhichOnlyOneCanHold) {
+    for (const Words& words : {Words{"calls", "--csv", "--jsonl"},
+                               {"stats", "--jsonl", "--csv"},
+                               {"stats", "--e1", "--t1"},
+                               {"stats", "--bri", "--e1"},
+                               {"list", "--relative", "--delta"},
+                               {"list", "--wide", "--columns", "n"},
+                               {"ladder", "--svg", "--mermaid"},
+                               {"explain", "--frame", "--element"},
+                               {"-q", "-v"}})
+        EXPECT_THROW(parseCommandLine(words), UsageError) << words[0];
+    EXPECT_NO_THROW(parseCommandLine({"stats", "--csv", "--e1"}));
+}
+
 TEST(CommandLine, RefusesNotInFrontOfAnythingElse) {
     EXPECT_THROW(parseCommandLine({"--not", "a.log"}), UsageError);
     EXPECT_THROW(parseCommandLine({"a.log", "--not"}), UsageError);
