@@ -237,8 +237,8 @@ void PcapngParser::readPacket(DescribedInterface& on, const Packet& packet, std:
 
 void PcapngParser::setFrame(Item& item, DescribedInterface& on, const Packet& packet,
                             std::optional<bool> told) {
-    if (packet.units) {
-        item.frame.clock = on.isRelative() ? Clock::relative : Clock::absolute;
+    if (packet.units && on.clock() != Clock::none) {
+        item.frame.clock = on.clock();
         item.frame.time = on.time(*packet.units);
     }
     const std::size_t captured = packet.octets.size();

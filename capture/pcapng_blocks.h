@@ -65,8 +65,10 @@ class Options {
     Order order_;
 };
 
-// The comment of an interface whose times do not count from 1970.
+// Comments of an interface whose times do not count from 1970: they count from the first frame; or frames
+// have none, and those of the packets are their ticks, or 0.
 inline constexpr std::string_view relativeTimes = "lapdmon: times are relative";
+inline constexpr std::string_view noTimes = "lapdmon: no times";
 
 }  // namespace capture::pcapng
 

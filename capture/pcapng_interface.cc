@@ -31,7 +31,9 @@ void DescribedInterface::take(std::uint16_t code, std::string_view value, Order 
     else if (code == checkSequenceSize && !value.empty())
         checkSequence_ = static_cast<unsigned char>(value[0]) / bitsInOctet;
     else if (code == comment && value == relativeTimes)
-        isRelative_ = true;
+        clock_ = Clock::relative;
+    else if (code == comment && value == noTimes)
+        clock_ = Clock::none;
 }
 
 std::int64_t DescribedInterface::time(std::uint64_t units) const {

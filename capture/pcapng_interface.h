@@ -21,7 +21,7 @@ class DescribedInterface {
 
     std::uint32_t linkType() const { return linkType_; }
     std::uint32_t snapLength() const { return snapLength_; }
-    bool isRelative() const { return isRelative_; }
+    Clock clock() const { return clock_; }
     // Nanoseconds; times that 64 bits cannot hold are moved within reach.
     std::int64_t time(std::uint64_t units) const;
     // What it tells over `unnamed`, and what was chosen over that.
@@ -40,7 +40,7 @@ class DescribedInterface {
     Resolution resolution_;
     std::int64_t offset_ = 0;  // seconds
     std::size_t checkSequence_ = 0;
-    bool isRelative_ = false;
+    Clock clock_ = Clock::absolute;
 };
 
 }  // namespace capture::pcapng

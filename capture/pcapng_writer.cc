@@ -63,7 +63,7 @@ struct Channel {
 // An interface that has been described. One channel may have several, as its variant becomes known.
 struct Described {
     Interface interface;
-    bool isRelative = false;
+    Clock clock = Clock::absolute;
     std::size_t channel = 0;
     std::uint64_t lastTime = 0;
 };
@@ -82,7 +82,7 @@ class PcapngWriter final : public Writer {
   private:
     void beginSection();
     std::size_t channelOf(const std::string& name);
-    std::size_t described(const Interface& interface, bool isRelative);
+    std::size_t described(const Interface& interface, Clock clock);
     void describe(const Described& on);
     void writePacket(const Item& item, std::size_t index);
     void putPacketOptions(const Item& item, Channel& channel);
@@ -96,9 +96,18 @@ class PcapngWriter final : public Writer {
     std::size_t last_ = 0;
 };
 
+// A frame that is not known well enough to have a time was still written down at one.
+Clock clockOf(const Frame& frame) {
+    return frame.clock == Clock::none && frame.written ? Clock::absolute : frame.clock;
+}
+
 std::int64_t timeOf(const Frame& frame) {
-    const bool countsTicks = frame.clock == Clock::none && frame.ticks;
-    return std::max<std::int64_t>(countsTicks ? *frame.ticks * nanosecondsPerTick : frame.time, 0);
+    std::int64_t time = frame.time;
+    if (frame.clock == Clock::none && frame.written)
+        time = *frame.written * 1'000'000'000;
+    else if (frame.clock == Clock::none && frame.ticks)
+        time = *frame.ticks * nanosecondsPerTick;
+    return std::max<std::int64_t>(time, 0);
 }
 
 bool isPacket(const Item& item) {
@@ -120,12 +129,12 @@ void PcapngWriter::write(const Item& item) {
     beginSection();
     const Interface& interface = *item.frame.interface;
     if (isPacket(item)) {
-        writePacket(item, described(interface, item.frame.clock == Clock::relative));
+        writePacket(item, described(interface, clockOf(item.frame)));
     } else {
         Channel& channel = channels_[channelOf(interface.name)];
         wait(item, channel);
         if (channel.waitingSize > mostWaiting)
-            writeStatistics(described(interface, false));
+            writeStatistics(described(interface, Clock::absolute));
     }
     sink_.endRecord();
 }
@@ -155,16 +164,14 @@ std::size_t PcapngWriter::channelOf(const std::string& name) {
 }
 
 // The number of an interface, which is described when it comes first.
-std::size_t PcapngWriter::described(const Interface& interface, bool isRelative) {
-    const auto fits = [&](const Described& on) {
-        return on.interface == interface && on.isRelative == isRelative;
-    };
+std::size_t PcapngWriter::described(const Interface& interface, Clock clock) {
+    const auto fits = [&](const Described& on) { return on.interface == interface && on.clock == clock; };
     if (last_ < interfaces_.size() && fits(interfaces_[last_]))
         return last_;
     const auto found = std::find_if(interfaces_.begin(), interfaces_.end(), fits);
     last_ = static_cast<std::size_t>(found - interfaces_.begin());
     if (found == interfaces_.end()) {
-        interfaces_.push_back({interface, isRelative, channelOf(interface.name), 0});
+        interfaces_.push_back({interface, clock, channelOf(interface.name), 0});
         describe(interfaces_.back());
     }
     return last_;
@@ -179,8 +186,8 @@ void PcapngWriter::describe(const Described& on) {
         putOption(record, interfaceName, std::string_view(on.interface.name).substr(0, longestComment));
         putOption(record, interfaceText, descriptionOf(on.interface.variant));
         putOption(record, timeResolution, std::string_view(&nanoseconds, 1));
-        if (on.isRelative)
-            putComment(record, relativeTimes);
+        if (on.clock != Clock::absolute)
+            putComment(record, on.clock == Clock::none ? noTimes : relativeTimes);
         putOption(record, endOfOptions, std::string_view());
     });
 }
@@ -259,7 +266,7 @@ void PcapngWriter::finish() {
         const bool isDescribed = on != interfaces_.end();
         if (channels_[i].dropped != 0 || !channels_[i].waiting.empty())
             writeStatistics(isDescribed ? static_cast<std::size_t>(on - interfaces_.begin())
-                                        : described({channels_[i].name, Variant::unknown}, false));
+                                        : described({channels_[i].name, Variant::unknown}, Clock::absolute));
     }
     sink_.flush();
 }

@@ -61,7 +61,7 @@ struct Outcome {
 // Returns once the input has ended, `first` pieces are out, or a signal came. What reading, composing and
 // consuming throw comes out of here.
 Outcome runPipeline(capture::Reader& reader, Tracker& tracker, Filter& filter, Consumer& consumer,
-                 Chatter& chatter, const Work& work);
+                    Chatter& chatter, const Work& work);
 
 }  // namespace reader
 

@@ -37,7 +37,7 @@ void write(Session& session, const Form& form, Output& out, Chatter& chatter) {
         return;
     }
     const auto writer = form.makeWriter(out.descriptor(), out.name());
-    WriterConsumer consumer(*writer, chatter);
+    WriterConsumer consumer(*writer, form, chatter);
     session.run(consumer, [] { return std::make_unique<NoComposer>(); });
     consumer.finish();
 }

@@ -45,12 +45,12 @@ bool looksLikeCsv(std::string_view beginning) { return beginning.starts_with("n,
 
 // clang-format off
 const Form table[] = {
-    {"pcapng", "a pcapng capture",      true,  looksLikePcapng, "", nullptr, capture::makePcapngWriter},
-    {"pcap",   "a pcap capture",        true,  looksLikePcap,   "", nullptr, capture::makePcapWriter},
+    {"pcapng", "a pcapng capture",      true,  looksLikePcapng, "", nullptr, capture::makePcapngWriter, true},
+    {"pcap",   "a pcap capture",        true,  looksLikePcap,   "", nullptr, capture::makePcapWriter, true},
     {"jsonl",  "JSON Lines of lapdread", false, looksLikeJson, "",          make<JsonComposer>, nullptr},
     {"csv",    "a CSV file of lapdread", false, looksLikeCsv,   csvHeader(), make<CsvComposer>, nullptr},
     {"hex",    "lines of hexadecimal digits", false, looksLikeHex, "", nullptr, capture::makeHexWriter},
-    {"log",    "a log of lapdmon",      true,  looksLikeLog,    "", nullptr, makeLogWriter},
+    {"log",    "a log of lapdmon",      true,  looksLikeLog,    "", nullptr, makeLogWriter, true},
 };
 // clang-format on
 
@@ -96,9 +96,16 @@ const Form* formOfFile(std::string_view path) {
 void WriterConsumer::take(Chunk& chunk, std::size_t count) {
     reporting([&] {
         for (std::size_t i = 0; i < count; ++i)
-            roles_.take(chunk.seen()[chunk.pieces[i].item],
-                        [&](const capture::Item& item) { writer_.write(item); });
+            roles_.take(chunk.seen()[chunk.pieces[i].item], [&](const capture::Item& item) { write(item); });
     });
+}
+
+void WriterConsumer::write(const capture::Item& item) {
+    if (needsTimeOfDay_ && item.isFrame() && item.frame.clock != capture::Clock::absolute) {
+        needsTimeOfDay_ = false;
+        chatter_.note("the input has no time of day: other programs will show times since 1 January 1970");
+    }
+    writer_.write(item);
 }
 
 void WriterConsumer::flush() {
@@ -107,7 +114,7 @@ void WriterConsumer::flush() {
 
 void WriterConsumer::finish() {
     reporting([&] {
-        roles_.giveUp([&](const capture::Item& item) { writer_.write(item); });
+        roles_.giveUp([&](const capture::Item& item) { write(item); });
         writer_.finish();
     });
 }

@@ -24,6 +24,7 @@ struct Form {
     std::string_view header;                         // of text
     std::unique_ptr<Composer> (*makeComposer)();     // null if there is a writer
     std::unique_ptr<capture::Writer> (*makeWriter)(int descriptor, const std::string& name);
+    bool needsTimeOfDay = false;  // it has no other times
 };
 
 std::span<const Form> forms();
@@ -38,7 +39,9 @@ const Form* formOfFile(std::string_view path);
 // pipe has gone as ReaderGone, and what else cannot be written as FileError.
 class WriterConsumer : public Consumer {
   public:
-    WriterConsumer(capture::Writer& writer, Chatter& chatter) : writer_(writer), roles_(chatter) {}
+    // `form` is the writer's. Says once if it needs a time of day that frames do not have.
+    WriterConsumer(capture::Writer& writer, const Form& form, Chatter& chatter)
+        : writer_(writer), chatter_(chatter), roles_(chatter), needsTimeOfDay_(form.needsTimeOfDay) {}
 
     void take(Chunk& chunk, std::size_t count) override;
     void flush() override;
@@ -46,8 +49,12 @@ class WriterConsumer : public Consumer {
     void finish();
 
   private:
+    void write(const capture::Item& item);
+
     capture::Writer& writer_;
+    Chatter& chatter_;
     Roles roles_;
+    bool needsTimeOfDay_;  // until it was said
 };
 
 // Composes nothing: the items themselves are wanted.

@@ -129,7 +129,8 @@ class LadderPrinter : public Analysed {
 
 std::span<const OptionRow> ladderOptions() {
     static constexpr OptionRow rows[] = {
-        {"--svg", "", "A picture", [](Options& to, const std::string&) { to.ladder.form = LadderForm::svg; }, "form"},
+        {"--svg", "", "A picture", [](Options& to, const std::string&) { to.ladder.form = LadderForm::svg; },
+         "form"},
         {"--mermaid", "", "Sequence diagrams of Mermaid, for Markdown",
          [](Options& to, const std::string&) { to.ladder.form = LadderForm::mermaid; }, "form"},
         {"--width", "N", "Columns of a line (default: those of the terminal, else 80; at least 40 are used)",

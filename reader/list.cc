@@ -95,7 +95,8 @@ std::span<const OptionRow> listOptions() {
              to.list.columns = splitAtCommas(value);
              for (const std::string& name : to.list.columns)
                  columnNamed(name);
-         }, "columns"},
+         },
+         "columns"},
     };
     return rows;
 }

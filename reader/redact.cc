@@ -56,7 +56,7 @@ void write(Session& session, const Options& options, const Form& form, Output& o
         return;
     }
     const auto writer = form.makeWriter(out.descriptor(), out.name());
-    WriterConsumer consumer(*writer, chatter);
+    WriterConsumer consumer(*writer, form, chatter);
     run(consumer, nullptr);
     consumer.finish();
 }

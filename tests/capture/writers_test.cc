@@ -135,6 +135,26 @@ TEST(PcapngWriterTest, RelativeTimesStayRelative) {
     EXPECT_EQ(roundTrip(makePcapngWriter, item), "frame 1 TX user +1500ms 00017f\n");
 }
 
+TEST(PcapngWriterTest, FramesWithoutTimesGetNone) {
+    Item ticks = frameOf(trunk, true, 0, sabme);
+    ticks.frame.clock = Clock::none;
+    ticks.frame.ticks = 1095;
+    Item nothing = frameOf(trunk, false, 0, ua);
+    nothing.frame.clock = Clock::none;
+    EXPECT_EQ(roundTrip(makePcapngWriter, ticks, nothing, frameOf(trunk, true, then, sabme)),
+              "frame 1 TX user t1095 00017f\n"
+              "frame 2 RX user 000173\n"
+              "frame 3 TX user 1795260333300ms 00017f\n");
+}
+
+TEST(PcapngWriterTest, ACutFrameHasTheSecondInWhichItWasWritten) {
+    Item cut = frameOf(trunk, false, 0, ua);
+    cut.kind = Kind::cut;
+    cut.frame.clock = Clock::none;
+    cut.frame.written = 1795260333;
+    EXPECT_TRUE(roundTrip(makePcapngWriter, cut).starts_with("cut 1 RX user 1795260333000ms w1795260333 "));
+}
+
 TEST(PcapngWriterTest, AFlushLeavesWholeBlocksInOneWrite) {
     int ends[2];
     ASSERT_EQ(pipe2(ends, O_DIRECT), 0);  // a read gives one write

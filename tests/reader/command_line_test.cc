@@ -69,8 +69,8 @@ TEST(CommandLine, SaysWhichCommandAMistypedWordMayMean) {
                                         {"convrt", "convert"},
                                         {"explian", "explain"},
                                         {"recrods", "record"}})
-        EXPECT_EQ(meant(word), std::string("there is no file and no command ") + word + "; did you mean " +
-                                   command + "?");
+        EXPECT_EQ(meant(word),
+                  std::string("there is no file and no command ") + word + "; did you mean " + command + "?");
     for (const std::string word : {"day.log", "a", "list.log", "trunk1", "-", "ls", "explained-again"})
         EXPECT_EQ(meant(word), "") << word;
 }

@@ -87,7 +87,7 @@ class Cut : public ::testing::TestWithParam<const char*> {
         const std::unique_ptr<capture::Reader> reader = openInputs(options, chatter_);
         Output out(converted);
         const auto writer = form.makeWriter(out.descriptor(), converted);
-        WriterConsumer convert(*writer, chatter_);
+        WriterConsumer convert(*writer, form, chatter_);
         Collector collector(made, convert);
         Tracker tracker(options.input);
         Filter filter({});
