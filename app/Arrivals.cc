@@ -10,7 +10,7 @@ std::shared_ptr<Arrivals> arrivals = std::make_shared<Arrivals>();
 namespace {
 
 vela::Lane::Bounds forTheQueue(vela::Lane::Bounds bounds) {
-    bounds.atWork = QueueCapacity;
+    bounds.atWork = queueCapacity;
     return bounds;
 }
 

@@ -15,7 +15,7 @@ namespace app {
 
 // How many records the queue holds. Those that are delivered, queued and written at the same time are not
 // more either.
-inline constexpr int QueueCapacity = 100;
+inline constexpr int queueCapacity = 100;
 
 // The lane of the trace events. Each event is delivered on a thread of its own, and threads overtake one
 // another. So a record whose turn has not come is kept until those before it have come. A record counts as at
@@ -75,7 +75,7 @@ class Arrivals : public vela::Lane {
     void sayLost(std::uint64_t) override {}  // the log itself says where records are missing
     void tellOf(Record& rec);
 
-    std::array<std::unique_ptr<Record>, QueueCapacity> early_;  // records before their turn, by number
+    std::array<std::unique_ptr<Record>, queueCapacity> early_;  // records before their turn, by number
     std::uint64_t next_ = 1;                                    // the number whose turn it is
     std::uint64_t untold_ = 0;  // lost before a refused record: the next record that is queued tells of them
     std::atomic<std::uint64_t> taken_ = 0;

@@ -19,7 +19,7 @@ std::FILE* Log::open(const char* name) {
 
 void Log::write(std::string_view entry) {
     block_.add(entry, std::exchange(isFrame_, false));
-    if (block_.text().size() >= BlockSize)
+    if (block_.text().size() >= blockSize)
         writeOut();
 }
 
@@ -35,7 +35,7 @@ void Log::flush() {
 }
 
 void Log::flushIfDue() {
-    if (holdsSomethingNew() && std::chrono::steady_clock::now() - lastWrite_ >= DueAfter)
+    if (holdsSomethingNew() && std::chrono::steady_clock::now() - lastWrite_ >= dueAfter)
         flush();
 }
 

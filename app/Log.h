@@ -20,8 +20,8 @@ namespace app {
 // The class has no lock. Callers must see to it that only one thread at a time uses it, except for giveUp.
 class Log {
   public:
-    static constexpr std::size_t BlockSize = 4096;            // text is written when so many octets are held
-    static constexpr std::chrono::milliseconds DueAfter{10};  // least time between writes of flushIfDue
+    static constexpr std::size_t blockSize = 4096;            // text is written when so many octets are held
+    static constexpr std::chrono::milliseconds dueAfter{10};  // least time between writes of flushIfDue
 
     Log() = default;
     Log(const Log&) = delete;

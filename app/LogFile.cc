@@ -19,8 +19,8 @@ namespace app {
 
 namespace {
 
-constexpr mode_t AsTheUmaskSays = 0666;
-constexpr int ForEver = -1;
+constexpr mode_t asTheUmaskSays = 0666;
+constexpr int forEver = -1;
 
 bool isRegular(int file) {
     struct stat status {};
@@ -37,7 +37,7 @@ LogFile::~LogFile() {
 }
 
 std::FILE* LogFile::open(const char* name) {
-    const int file = ::open(name, O_WRONLY | O_CREAT | O_CLOEXEC, AsTheUmaskSays);
+    const int file = ::open(name, O_WRONLY | O_CREAT | O_CLOEXEC, asTheUmaskSays);
     if (file < 0)
         return nullptr;
     stream_ = fdopen(file, "w");
@@ -90,7 +90,7 @@ std::size_t LogFile::append(std::string_view text) const {
 bool LogFile::awaitRoom() const {
     std::array<pollfd, 2> waited{pollfd{fileno(stream_), POLLOUT, 0}, pollfd{wakeUp_, POLLIN, 0}};
     if (!givenUp_)
-        static_cast<void>(poll(waited.data(), waited.size(), ForEver));
+        static_cast<void>(poll(waited.data(), waited.size(), forEver));
     errno = ECANCELED;
     return !givenUp_;
 }

@@ -26,9 +26,9 @@ namespace {
 using Clock = std::chrono::steady_clock;
 using std::chrono::milliseconds;
 
-constexpr int ForEver = -1;
+constexpr int forEver = -1;
 // A pipe that is ready for writing takes this many octets without blocking.
-constexpr std::size_t LargestWrite = PIPE_BUF;
+constexpr std::size_t largestWrite = PIPE_BUF;
 
 unsigned long linesIn(std::string_view text) {
     const auto ends = static_cast<unsigned long>(std::count(text.begin(), text.end(), '\n'));
@@ -41,13 +41,13 @@ std::string dropNotice(unsigned long lines) {
 
 int timeoutUntil(std::optional<Clock::time_point> limit) {
     if (!limit)
-        return ForEver;
+        return forEver;
     const auto left = std::chrono::ceil<milliseconds>(*limit - Clock::now());
     return static_cast<int>(std::max(left, milliseconds::zero()).count());
 }
 
 ssize_t writeSomeOf(int descriptor, std::string_view text) {
-    return ::write(descriptor, text.data(), std::min(text.size(), LargestWrite));
+    return ::write(descriptor, text.data(), std::min(text.size(), largestWrite));
 }
 
 bool mayWorkLater(ssize_t written) { return written < 0 && (errno == EAGAIN || errno == EINTR); }

@@ -19,10 +19,10 @@ namespace app {
 // Any thread may use it. SIGPIPE must be ignored.
 class StreamWriter {
   public:
-    static constexpr std::size_t Bound = 1 << 20;  // most octets that wait for one stream
+    static constexpr std::size_t usualBound = 1 << 20;  // most octets that wait for one stream
 
     // The caller keeps the descriptors. Throws std::system_error when the system refuses the thread.
-    explicit StreamWriter(const std::vector<int>& descriptors, std::size_t bound = Bound);
+    explicit StreamWriter(const std::vector<int>& descriptors, std::size_t bound = usualBound);
     // Ends the thread; text that still waits is lost. Returns when no descriptor is used any more.
     ~StreamWriter();
     StreamWriter(const StreamWriter&) = delete;

@@ -13,8 +13,8 @@ namespace app {
 
 namespace {
 
-constexpr std::string_view DefaultLogFile = "lapdmon.log";
-constexpr std::string_view Blanks = " \t\n\v\f\r";
+constexpr std::string_view defaultLogFile = "lapdmon.log";
+constexpr std::string_view blanks = " \t\n\v\f\r";
 
 void readNumber(const char* text, int& setting) {
     char* end = nullptr;
@@ -25,8 +25,8 @@ void readNumber(const char* text, int& setting) {
 
 // Sets the name of the log to the first word of the text. If there is no word, leaves the name unchanged.
 void readFileName(std::string_view text) {
-    text.remove_prefix(std::min(text.find_first_not_of(Blanks), text.size()));
-    const std::string_view name = text.substr(0, text.find_first_of(Blanks));
+    text.remove_prefix(std::min(text.find_first_not_of(blanks), text.size()));
+    const std::string_view name = text.substr(0, text.find_first_of(blanks));
     if (name.empty())
         return;
     const std::size_t length = std::min(name.size(), log_file_name.size() - 1);
@@ -47,7 +47,7 @@ void readFileName(std::string_view text) {
 
 bool readArgs(int argc, char** argv) {
     INST_NUM = 1;
-    readFileName(DefaultLogFile);
+    readFileName(defaultLogFile);
     decoder::file_output = true;
     int status = 0;
 

@@ -19,9 +19,9 @@
 
 namespace app {
 
-vela::Queue event_queue(QueueCapacity);
+vela::Queue event_queue(queueCapacity);
 vela::Mutex queueGuard;
-vela::Semaphore sema(QueueCapacity, 0);
+vela::Semaphore sema(queueCapacity, 0);
 vela::Thread Process(&Process_L2_Trace, 0);
 int trunkVariant = 0;
 
@@ -29,15 +29,15 @@ namespace {
 
 using Record = vela::CCS::EvtL2Trace_t;
 
-constexpr unsigned int FrameLabel = 2;
-constexpr unsigned int Transmitted = 1;
+constexpr unsigned int frameLabel = 2;
+constexpr unsigned int transmitted = 1;
 
 // The numbers in the reports of foreign exceptions.
-constexpr int CallbackPlace = 100;
-constexpr int DisplayThreadPlace = 215;
+constexpr int callbackPlace = 100;
+constexpr int displayThreadPlace = 215;
 
-constexpr unsigned int PollMs = 10;
-constexpr int EnoughToShow = QueueCapacity / 2;
+constexpr unsigned int pollMs = 10;
+constexpr int enoughToShow = queueCapacity / 2;
 
 // True while the display thread waits for records to gather. The callback that makes them enough sets it to
 // false and posts `enough`, once for each such wait.
@@ -82,14 +82,14 @@ void awaitRecord(vela::Thread::control& ctl) {
     if (sema.tryWait())
         return;
     gathering = true;
-    enough.tryWait(PollMs, PollMs);
+    enough.tryWait(pollMs, pollMs);
     gathering = false;
     if (sema.tryWait())
         return;
     do {
         flushLog();
         testCancel(ctl);
-    } while (!sema.tryWait(PollMs, PollMs));
+    } while (!sema.tryWait(pollMs, pollMs));
 }
 
 // Writes the next record. Returns false when the queue is empty.
@@ -124,7 +124,7 @@ void queueRecord(std::unique_ptr<Record> rec) {
     }
     static_cast<void>(rec.release());  // now the thread that dequeues it owns it
     sema.post();
-    if (event_queue.queuecount() >= EnoughToShow && gathering.exchange(false))
+    if (event_queue.queuecount() >= enoughToShow && gathering.exchange(false))
         enough.post();
 }
 
@@ -133,13 +133,13 @@ void queueRecord(std::unique_ptr<Record> rec) {
 void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
     if (rec.arrival().missing != 0)
         traceLog.framesMissing(rec.arrival().missing);
-    if (rec.Label != FrameLabel) {
+    if (rec.Label != frameLabel) {
         std::cout << "ERROR - received unexpected rtc event" << std::endl;
         return;
     }
     octets = rec.List.value();
     decoder::msglen = frameLength(rec.Length, octets.length());
-    decoder::timeLines(rec.Direction == Transmitted, rec.Timestamp, localTime.of(std::time(nullptr)));
+    decoder::timeLines(rec.Direction == transmitted, rec.Timestamp, localTime.of(std::time(nullptr)));
     decoder::RingBuffer frame;
     if (decoder::getBlock(&frame, octets, decoder::msglen)) {
         decoder::parse_isdn_frame(frame);
@@ -154,14 +154,14 @@ void showRecord(Record& rec, vela::staticList<unsigned char>& octets) {
 
 void HANDLE_L2Trace_events(vela::CCS*, unsigned int, Record* rec) {
     std::unique_ptr<Record> held(rec);
-    guarded(CallbackPlace, [&] {
+    guarded(callbackPlace, [&] {
         const std::lock_guard guard(queueGuard);
         arrivals->takeInTurn(std::move(held), queueRecord);
     });
 }
 
 void* Process_L2_Trace(vela::Thread::control* ctl, void*) {
-    guarded(DisplayThreadPlace, [&] { displayForEver(*ctl); });
+    guarded(displayThreadPlace, [&] { displayForEver(*ctl); });
     return nullptr;
 }
 

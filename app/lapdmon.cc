@@ -34,16 +34,16 @@ std::unique_ptr<vela::CCS> ccs;
 namespace {
 
 // Numbers that the board knows.
-constexpr unsigned char TscType = 0x12;
-constexpr unsigned char TscProcessor = 1;
-constexpr unsigned char CcsType = 0x15;
-constexpr unsigned char AnyProcessor = 0xFF;
-constexpr unsigned int ProtocolTypeParm = 7;
-constexpr unsigned int L2TraceParm = 10;
+constexpr unsigned char tscType = 0x12;
+constexpr unsigned char tscProcessor = 1;
+constexpr unsigned char ccsType = 0x15;
+constexpr unsigned char anyProcessor = 0xFF;
+constexpr unsigned int protocolTypeParm = 7;
+constexpr unsigned int l2TraceParm = 10;
 
-constexpr unsigned int QueueDepth = 50;
-constexpr unsigned int PollMs = 10;
-constexpr int MainPlace = 749;  // the number in main's report of a foreign exception
+constexpr unsigned int queueDepth = 50;
+constexpr unsigned int pollMs = 10;
+constexpr int mainPlace = 749;  // the number in main's report of a foreign exception
 
 void openLog() {
     if (!decoder::file_output)
@@ -66,7 +66,7 @@ void closeLog() {
 }
 
 vela::TSCComponent findTsc(vela::Board& board) {
-    vela::TSCComponent tsc(board.findComp(TscType, TscProcessor));
+    vela::TSCComponent tsc(board.findComp(tscType, tscProcessor));
     std::cout << "TSC Component Information" << tsc.getTgtDesc() << std::endl;
     return tsc;
 }
@@ -81,7 +81,7 @@ std::unique_ptr<vela::CCS> openCcs(const vela::Instance& instance) {
 // standard error stream says what that means.
 vela::Instance findDChannel(vela::Board& board) {
     try {
-        return board.findInst(CcsType, AnyProcessor, static_cast<unsigned short>(INST_NUM));
+        return board.findInst(ccsType, anyProcessor, static_cast<unsigned short>(INST_NUM));
     } catch (const vela::Addressable::UnexpectedMsg&) {
         std::cerr << "lapdmon: board " + std::to_string(boardnumber) + " found no D channel " +
                          std::to_string(INST_NUM) + "\n"
@@ -92,10 +92,10 @@ vela::Instance findDChannel(vela::Board& board) {
 
 // Tells the board to trace and to report what it traces.
 void switchOn(vela::CCS& opened) {
-    opened.SetParm(L2TraceParm, 1, nullptr);
-    opened.asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0,
+    opened.SetParm(l2TraceParm, 1, nullptr);
+    opened.asyncRegisterEvtGroup(vela::CCS::l2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0,
                                  arrivals);
-    opened.DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
+    opened.DetectEvt(vela::CCS::l2TraceGroup, 0, nullptr);
 }
 
 template <typename Step>
@@ -115,8 +115,8 @@ void startTrace(std::unique_ptr<vela::CCS> opened) {
     try {
         switchOn(*opened);
     } catch (...) {
-        withoutReport([&] { opened->CancelEvt(vela::CCS::L2TraceGroup, nullptr); });
-        withoutReport([&] { opened->SetParm(L2TraceParm, 0, nullptr); });
+        withoutReport([&] { opened->CancelEvt(vela::CCS::l2TraceGroup, nullptr); });
+        withoutReport([&] { opened->SetParm(l2TraceParm, 0, nullptr); });
         throw;
     }
     ccs = std::move(opened);
@@ -127,7 +127,7 @@ void startTrace(std::unique_ptr<vela::CCS> opened) {
 
 // Waits until the trace is to end. Returns the exit status.
 int untilEnded() {
-    if (awaitQuit() == Ending::Asked)
+    if (awaitQuit() == Ending::asked)
         return EXIT_SUCCESS;
     std::cerr << "lapdmon: the board cannot be reached any more, the trace ends\n" << std::flush;
     return EXIT_FAILURE;
@@ -135,7 +135,7 @@ int untilEnded() {
 
 // Starts the trace and waits until it is to end. Returns the exit status.
 int trace(int argc, char** argv) {
-    vela::MsgQueue::DefaultDepth = QueueDepth;
+    vela::MsgQueue::DefaultDepth = queueDepth;
     parseArgs(argc, argv);
     openLog();
     telvar_header();
@@ -146,7 +146,7 @@ int trace(int argc, char** argv) {
     const vela::Instance instance = findDChannel(board);
     std::unique_ptr<vela::CCS> opened = openCcs(instance);
     vela::StdResource::MsgGetParmCmplt_t reply;
-    opened->GetParm(ProtocolTypeParm, &reply);
+    opened->GetParm(protocolTypeParm, &reply);
     const std::optional<int> variant = reportProtocol(reply.Val);
     if (!variant)
         return EXIT_FAILURE;  // nothing has been switched on yet
@@ -184,7 +184,7 @@ bool isWhole() { return noneLost() && traceLog.complete(); }
 template <typename Step>
 void attempt(Step step) {
     try {
-        guarded(MainPlace, step);
+        guarded(mainPlace, step);
     } catch (...) {  // reported
     }
 }
@@ -203,7 +203,7 @@ void writeOut() {
 void giveUpRest() {
     givenUp = arrivals->discardWaiting();
     while (arrivals->pending() != 0)  // deliveries that have begun end at once
-        vela::sleep_ms(PollMs);
+        vela::sleep_ms(pollMs);
     const Discarded queued = discardQueued();
     givenUp += queued.records + arrivals->unwritten();  // one may have gone with a display thread that failed
     if (const std::uint64_t missing = givenUp + queued.missing + arrivals->untold(); missing != 0)
@@ -219,8 +219,8 @@ void quit() {
         return;
     shutdownBegins();
     std::cout << "One moment. Program Exiting" << std::endl;
-    attempt([] { ccs->CancelEvt(vela::CCS::L2TraceGroup, nullptr); });
-    attempt([] { ccs->SetParm(L2TraceParm, 0, nullptr); });
+    attempt([] { ccs->CancelEvt(vela::CCS::l2TraceGroup, nullptr); });
+    attempt([] { ccs->SetParm(l2TraceParm, 0, nullptr); });
     attempt(writeOut);
     attempt(giveUpRest);
     attempt(closeLog);
@@ -231,7 +231,7 @@ int runTrace(int argc, char** argv) {
     closeLogWhenUnhandled();
     int status = EXIT_SUCCESS;
     try {
-        guarded(MainPlace, [&] { status = trace(argc, argv); });
+        guarded(mainPlace, [&] { status = trace(argc, argv); });
     } catch (...) {  // reported
         status = EXIT_FAILURE;
     }

@@ -15,17 +15,17 @@ namespace app {
 
 namespace {
 
-constexpr std::array Signals{SIGINT, SIGTERM, SIGHUP};
-constexpr int PauseMs = 10000;
-constexpr int ForEver = -1;
+constexpr std::array signals{SIGINT, SIGTERM, SIGHUP};
+constexpr int pauseMs = 10000;
+constexpr int forEver = -1;
 
 // The pipe that ends the wait: the end that awaitQuit reads, and the end that the signal handler writes.
 std::array<int, 2> signalled{-1, -1};
 
 std::atomic<bool> lost = false;
 
-enum class State { Tracing, ShuttingDown, WritingOut };
-std::atomic<State> state = State::Tracing;
+enum class State { tracing, shuttingDown, writingOut };
+std::atomic<State> state = State::tracing;
 std::atomic<bool> hurried = false;
 static_assert(std::atomic<State>::is_always_lock_free, "a signal handler uses it");
 
@@ -50,10 +50,10 @@ bool awaitSignal(Poll wait, int timeoutMs, int input) {
 
 void exit_handle(int signal) {
     const int saved = errno;
-    if (moveOn(State::Tracing, State::ShuttingDown)) {
+    if (moveOn(State::tracing, State::shuttingDown)) {
         wakeWaiter();
     } else if (signal == SIGHUP) {  // the shutdown runs already, and this signal must not end it
-    } else if (moveOn(State::WritingOut, State::ShuttingDown)) {
+    } else if (moveOn(State::writingOut, State::shuttingDown)) {
         hurried = true;
         traceLog.giveUp();
     } else {
@@ -64,11 +64,11 @@ void exit_handle(int signal) {
     errno = saved;
 }
 
-void shutdownBegins() { moveOn(State::Tracing, State::ShuttingDown); }
+void shutdownBegins() { moveOn(State::tracing, State::shuttingDown); }
 
-WritingOut::WritingOut() { moveOn(State::ShuttingDown, State::WritingOut); }
+WritingOut::WritingOut() { moveOn(State::shuttingDown, State::writingOut); }
 
-WritingOut::~WritingOut() { moveOn(State::WritingOut, State::ShuttingDown); }
+WritingOut::~WritingOut() { moveOn(State::writingOut, State::shuttingDown); }
 
 bool shutdownHurried() { return hurried; }
 
@@ -78,7 +78,7 @@ void watchSignals() {
     struct sigaction action = {};
     action.sa_handler = exit_handle;
     action.sa_flags = SA_RESTART;
-    for (const int each : Signals) {
+    for (const int each : signals) {
         struct sigaction before = {};
         sigaction(each, nullptr, &before);
         if (each != SIGHUP || before.sa_handler != SIG_IGN)
@@ -95,16 +95,16 @@ namespace {
 
 // Waits until a "q" is read or the pipe is written to.
 void awaitEnd(Poll wait) {
-    constexpr int NoInput = -1;
+    constexpr int noInput = -1;
     int input = STDIN_FILENO;
-    while (!awaitSignal(wait, ForEver, input)) {
+    while (!awaitSignal(wait, forEver, input)) {
         char typed = 0;
         const ssize_t got = read(STDIN_FILENO, &typed, 1);
         if (got == 1 && typed == 'q')
             return;
         if (got == 0 || (got < 0 && errno != EINTR && errno != EAGAIN))
-            input = NoInput;
-        if (awaitSignal(wait, PauseMs, NoInput))
+            input = noInput;
+        if (awaitSignal(wait, pauseMs, noInput))
             return;
     }
 }
@@ -113,7 +113,7 @@ void awaitEnd(Poll wait) {
 
 Ending awaitQuit(Poll wait) {
     awaitEnd(wait);
-    return lost ? Ending::BoardLost : Ending::Asked;
+    return lost ? Ending::boardLost : Ending::asked;
 }
 
 }  // namespace app

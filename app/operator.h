@@ -35,7 +35,7 @@ class WritingOut {
 // once, and records that still wait must be counted and dropped. Any thread may call it.
 bool shutdownHurried();
 
-enum class Ending { Asked, BoardLost };
+enum class Ending { asked, boardLost };
 
 // Waits until "q" is read from the standard input, a signal comes, or boardLost is called. After any other
 // character it does not read for 10 seconds. After the end of the input only a signal or boardLost ends the

@@ -13,7 +13,7 @@ namespace app {
 namespace {
 
 // clang-format off
-constexpr std::array Protocols{
+constexpr std::array protocols{
     Protocol{ 1,  1, "4ESS Switch ",  decoder::variantLine(1)},
     Protocol{ 2,  2, "5ESS Switch ",  decoder::variantLine(2)},
     Protocol{ 3,  3, "DMS100 Switch", decoder::variantLine(3)},
@@ -26,9 +26,9 @@ constexpr std::array Protocols{
 }  // namespace
 
 const Protocol* protocolOf(unsigned int type) {
-    const auto* const found = std::find_if(Protocols.begin(), Protocols.end(),
+    const auto* const found = std::find_if(protocols.begin(), protocols.end(),
                                            [type](const Protocol& p) { return p.type == type; });
-    return found == Protocols.end() ? nullptr : found;
+    return found == protocols.end() ? nullptr : found;
 }
 
 std::optional<int> reportProtocol(unsigned int type) {

@@ -23,7 +23,7 @@ namespace app {
 
 namespace {
 
-constexpr std::chrono::seconds Patience{1};
+constexpr std::chrono::seconds patience{1};
 
 // The buffer of a C++ stream, which hands the text to the StreamWriter. Each thread has a text of its own.
 class TextBuffer : public std::streambuf {
@@ -101,7 +101,7 @@ void afterForkInParent() {
 }
 
 void afterForkInChild() {
-    streams->writer.afterForkInChild(Patience);
+    streams->writer.afterForkInChild(patience);
     unlockBuffers();
 }
 
@@ -134,7 +134,7 @@ void decoupleStandardStreams() try {
 
 void awaitStandardStreams() {
     if (streams != nullptr)
-        streams->writer.awaitWritten(Patience);
+        streams->writer.awaitWritten(patience);
 }
 
 void endStandardStreams() {
@@ -142,7 +142,7 @@ void endStandardStreams() {
         return;
     std::cout << std::flush;
     std::cerr << std::flush;
-    streams->writer.end(Patience);
+    streams->writer.end(patience);
 }
 
 }  // namespace app

@@ -21,8 +21,8 @@ namespace app {
 
 namespace {
 
-constexpr unsigned int PatienceMs = 1000;
-constexpr unsigned int PollMs = 10;
+constexpr unsigned int patienceMs = 1000;
+constexpr unsigned int pollMs = 10;
 
 std::string typeOfException() {
     const std::type_info* const type = abi::__cxa_current_exception_type();
@@ -56,7 +56,7 @@ std::string place() {
 
 // Closes the log, unless another thread holds it for too long.
 void closeInTime() {
-    if (!queueGuard.tryLock(PatienceMs, PollMs))
+    if (!queueGuard.tryLock(patienceMs, pollMs))
         return;
     decoder::ofp = nullptr;  // the display thread may go on until the process ends
     traceLog.close();
@@ -64,7 +64,7 @@ void closeInTime() {
 }
 
 // Memory that is freed before the last report, because the process may end for want of memory.
-constexpr std::size_t ReserveSize = 65536;
+constexpr std::size_t reserveSize = 65536;
 std::atomic<char*> reserve = nullptr;
 
 void sayWhatAndWhere() {
@@ -91,7 +91,7 @@ void sayWhatAndWhere() {
 
 void closeLogWhenUnhandled() {
     if (reserve == nullptr)
-        reserve = std::make_unique<char[]>(ReserveSize).release();
+        reserve = std::make_unique<char[]>(reserveSize).release();
     std::set_terminate(endUnhandled);
 }
 

@@ -21,40 +21,40 @@ class Host {
     explicit Host(std::unique_ptr<KSAbstractMsgQueue> queue) : queue_(std::move(queue)) {}
 
     void askProtocol() {
-        tell(GetParm, {ProtocolParm, 0, 0, 0});
+        tell(getParm, {protocolParm, 0, 0, 0});
         hear();
     }
 
     // Subscribes, switches the trace on, and reads up to and including the first event.
     void startTrace() {
-        tell(DetectEvt, detectBody());
-        tell(SetParm, {TraceParm, 0, 0, 0, 1, 0, 0, 0});
+        tell(detectEvt, detectBody());
+        tell(setParm, {traceParm, 0, 0, 0, 1, 0, 0, 0});
         while (!hearEvent()) {
         }
     }
     void endTrace() {
-        tell(SetParm, {TraceParm, 0, 0, 0, 0, 0, 0, 0});
-        while (hear() != SetParm + 1) {
+        tell(setParm, {traceParm, 0, 0, 0, 0, 0, 0, 0});
+        while (hear() != setParm + 1) {
         }
     }
 
     // Waits for the next message and frees it. Returns whether it was an event.
-    bool hearEvent() { return hear() == EvtDetected; }
+    bool hearEvent() { return hear() == evtDetected; }
 
   private:
-    static constexpr NvCompDesc Ccs{1, 1, 0, 1, 0x15, 0, 0};
-    static constexpr unsigned SetParm = 8;
-    static constexpr unsigned GetParm = 18;
-    static constexpr unsigned DetectEvt = 22;
-    static constexpr unsigned EvtDetected = 32;
-    static constexpr std::uint8_t TraceParm = 10;
-    static constexpr std::uint8_t ProtocolParm = 7;
+    static constexpr NvCompDesc ccs{1, 1, 0, 1, 0x15, 0, 0};
+    static constexpr unsigned setParm = 8;
+    static constexpr unsigned getParm = 18;
+    static constexpr unsigned detectEvt = 22;
+    static constexpr unsigned evtDetected = 32;
+    static constexpr std::uint8_t traceParm = 10;
+    static constexpr std::uint8_t protocolParm = 7;
 
     void tell(unsigned type, const std::vector<std::uint8_t>& body) {
         KSMsgRef msg(static_cast<unsigned>(body.size()));
         msg.setMsgType(type);
         msg.setSrcAddr(queue_->getHostDesc());
-        msg.setTgtAddr(Ccs);
+        msg.setTgtAddr(ccs);
         std::memcpy(msg.getMsgRef() + 1, body.data(), body.size());
         queue_->msgWrite(msg.getMsgRef());
     }

@@ -26,7 +26,7 @@ int main() try {
     ccs.GetParm(7, &protocol);
     std::cout << "protocol type " << protocol.Val << "\n";
 
-    ccs.asyncRegisterEvtGroup(2, vela::Handler::of<&onFrame>(), vela::EvtCallback::OnDispatchingThread);
+    ccs.asyncRegisterEvtGroup(2, vela::Handler::of<&onFrame>(), vela::EvtCallback::onDispatchingThread);
     ccs.DetectEvt(2, 0, nullptr);
     ccs.SetParm(10, 1, nullptr);
     for (int i = 0; i < 5; ++i)

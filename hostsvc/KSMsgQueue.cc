@@ -13,8 +13,8 @@
 
 namespace {
 
-constexpr unsigned PollMs = 10;
-constexpr unsigned ReaderEndMs = 1000;
+constexpr unsigned pollMs = 10;
+constexpr unsigned readerEndMs = 1000;
 
 }  // namespace
 
@@ -43,7 +43,7 @@ KSMsgQueue::KSMsgQueue(NvCompDesc desc, unsigned a, unsigned b, const char* host
 KSMsgQueue::~KSMsgQueue() {
     reader_.cancel();
     transport_->wakeReader();
-    reader_.tryJoin(ReaderEndMs, 1);
+    reader_.tryJoin(readerEndMs, 1);
     transport_->close();
     reader_.join();
     KSMsgQueueThread_Cleanup(&reply_);
@@ -89,7 +89,7 @@ KSMsgRef KSMsgQueue::request(KSMsgRef& msg, unsigned timeoutMs, unsigned replyTy
         transport_->freeUnsent(sent);
     if (timeoutMs == 0)
         return KSMsgRef(0U);
-    return replyLock_.tryLock(timeoutMs, PollMs) ? takeReply() : giveUp();
+    return replyLock_.tryLock(timeoutMs, pollMs) ? takeReply() : giveUp();
 }
 
 void KSMsgQueue::expect(const Expected& reply) {
@@ -167,7 +167,7 @@ void KSMsgQueue::readNroute(KSThread::control* control, char* /*arg*/) {
         if (!failed)
             route(*control, current);
         else if (wasFailing)
-            ks_sleep_ms(PollMs);  // otherwise a transport that always fails would use up the processor
+            ks_sleep_ms(pollMs);  // otherwise a transport that always fails would use up the processor
         control->testCancel();
     }
 }
@@ -215,7 +215,7 @@ bool KSMsgQueue::acceptReply(NvMsg32Bit*& msg, NvMsg32Bit*& late) {
 
 bool KSMsgQueue::Expected::matches(const KSMsgRef& msg) const {
     const unsigned type = msg.getMsgType();
-    return msg.getTrans() == transaction && (type == 0 || type == GeneralReply || type == replyType) &&
+    return msg.getTrans() == transaction && (type == 0 || type == generalReply || type == replyType) &&
            (anySource || descComp(msg.getSrcAddr(), source));
 }
 
@@ -225,7 +225,7 @@ void KSMsgQueue::handOn(KSThread::control& control, NvMsg32Bit*& msg) {
     Receivers to = receivers();
     while (to.none()) {
         control.testCancel();
-        if (slotFree_.tryLock(PollMs, PollMs) && park(msg))
+        if (slotFree_.tryLock(pollMs, pollMs) && park(msg))
             return;
         to = receivers();
     }

@@ -28,7 +28,7 @@ class KSMsgQueue : private KSRunnable {
     using AsyncMember = int (KSAsyncMsgReceiver::*)(KSMsgRef&);
 
     // A reply of this type answers a request of its transaction whatever reply type the request expects.
-    static constexpr unsigned GeneralReply = 0x800001;
+    static constexpr unsigned generalReply = 0x800001;
 
     // Opens the transport's queue and starts the reader thread. hostName is the machine with the board's
     // relay; null leaves the choice to the environment (KSTransportChoice.h). desc, a and b are only used for

@@ -15,7 +15,7 @@ bool ks_poll(unsigned timeoutMs, unsigned intervalMs, Try once, Pause pause) {
     for (unsigned round = 0; round < rounds; ++round) {
         if (once())
             return true;
-        const int result = pause(ks_timeout_ms(intervalMs));
+        const int result = pause(ks_timeoutMs(intervalMs));
         if (result == 0)
             return true;
         if (result == EINTR)

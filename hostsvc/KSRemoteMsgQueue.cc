@@ -19,15 +19,15 @@
 namespace {
 
 // The relay protocol's frames.
-constexpr std::uint32_t MessageFrame = 1001;
-constexpr std::uint32_t OpenedFrame = 1002;
-constexpr std::uint32_t OpenFrame = 1003;
-constexpr std::uint32_t CloseFrame = 2000;
-constexpr std::uint32_t ClosedFrame = 2001;
+constexpr std::uint32_t messageFrame = 1001;
+constexpr std::uint32_t openedFrame = 1002;
+constexpr std::uint32_t openFrame = 1003;
+constexpr std::uint32_t closeFrame = 2000;
+constexpr std::uint32_t closedFrame = 2001;
 
-constexpr unsigned AnswerMs = 5000;  // how long the relay may take to open or close a queue
-constexpr unsigned PollMs = 10;
-constexpr unsigned PauseSeconds = 6;
+constexpr unsigned answerMs = 5000;  // how long the relay may take to open or close a queue
+constexpr unsigned pollMs = 10;
+constexpr unsigned pauseSeconds = 6;
 
 template <std::size_t N>
 msg_t frameOf(std::uint32_t type, std::array<std::uint32_t, N>& words) {
@@ -46,7 +46,7 @@ class Patience {
   public:
     explicit Patience(const sock& connection)
         : watcher_([this, &connection] {
-              if (answered_.tryLock(AnswerMs, PollMs))
+              if (answered_.tryLock(answerMs, pollMs))
                   return;
               isOver_ = true;
               connection.shutdown(SHUT_RDWR);
@@ -79,7 +79,7 @@ class KSRemoteMsgQueue::ReceivedFrame {
     ReceivedFrame& operator=(const ReceivedFrame&) = delete;
     ~ReceivedFrame() { free_msg(frame_); }
 
-    bool good() const { return result_ == 0 && frame_.type != CloseFrame; }
+    bool good() const { return result_ == 0 && frame_.type != closeFrame; }
     bool is(std::uint32_t type) const { return result_ == 0 && frame_.type == type; }
     // Whether the header has come and the rest has not. (A frame that is too large but whole is not broken
     // off.)
@@ -93,7 +93,7 @@ class KSRemoteMsgQueue::ReceivedFrame {
 };
 
 KSRemoteMsgQueue::KSRemoteMsgQueue(NvCompDesc desc, unsigned a, unsigned b, const char* hostName)
-    : hostName_(hostName), connection_(hostName, Port) {
+    : hostName_(hostName), connection_(hostName, port) {
     if (connection_.failed())
         cannotOpen(hostName_, connection_.descriptor() < 0 ? std::strerror(errno) : "the name is unknown");
     if (connection_.connect() < 0)
@@ -125,10 +125,10 @@ void KSRemoteMsgQueue::open(NvCompDesc desc, unsigned a, unsigned b) try {
                                          a,         b};
     KS_htonU32(request.data(), request.data(), sizeof request);
     const Patience patience(connection_);
-    const bool sent = sendFrame(frameOf(OpenFrame, request)) == 0;
+    const bool sent = sendFrame(frameOf(openFrame, request)) == 0;
     const ReceivedFrame reply(connection_);
     std::array<std::uint32_t, 5> address{};
-    if (!sent || !reply.is(OpenedFrame) || (*reply).size < static_cast<int>(sizeof address))
+    if (!sent || !reply.is(openedFrame) || (*reply).size < static_cast<int>(sizeof address))
         cannotOpen(hostName_, patience.isOver() ? "the relay does not answer" : "refused by the relay");
     KS_ntohU32(address.data(), (*reply).data, sizeof address);
     const auto octet = [&](std::size_t word) { return static_cast<std::uint8_t>(address[word]); };
@@ -144,7 +144,7 @@ long KSRemoteMsgQueue::sendFrame(const msg_t& frame) {
 
 std::uint32_t KSRemoteMsgQueue::msgWrite(NvMsg32Bit* msg) {
     KSHeaderBlock block = ks_headerBlock(*msg);
-    msg_t frame = frameOf(MessageFrame, block);
+    msg_t frame = frameOf(messageFrame, block);
     frame.ex_size = static_cast<std::int32_t>(msg->size);
     frame.ex_data = reinterpret_cast<char*>(msg) + NVMSG_HEADER_SIZE;
     if (sendFrame(frame) != 0)
@@ -158,12 +158,12 @@ void KSRemoteMsgQueue::freeUnsent(NvMsg32Bit* msg) { nvMsgFree(msg); }
 std::uint32_t KSRemoteMsgQueue::msgRead(NvMsg32Bit** out) {
     const std::lock_guard lock(reading_);
     const ReceivedFrame frame(connection_);
-    if (frame.is(ClosedFrame)) {
+    if (frame.is(closedFrame)) {
         acknowledged();
         return NVSTATUS_ERROR;
     }
     if (frame.good()) {
-        retryBudget_ = RetryBudget;
+        retryBudget_ = retryBudget;
         return takeMessage(*frame, out);
     }
     failed(frame.brokenOff(), out);
@@ -171,7 +171,7 @@ std::uint32_t KSRemoteMsgQueue::msgRead(NvMsg32Bit** out) {
 }
 
 void KSRemoteMsgQueue::acknowledged() {
-    closing_ |= Acknowledged;
+    closing_ |= closeAcknowledged;
     handshake_.unlock();
 }
 
@@ -191,20 +191,20 @@ void KSRemoteMsgQueue::failed(bool withinFrame, NvMsg32Bit** out) {
     std::cerr << "Error communicating with remote message queue on " + hostName_ + "\n" << std::flush;
     if (withinFrame) {
         *out = nullptr;
-        if ((closing_ & Asked) == 0)
-            ks_sleep(PauseSeconds);
+        if ((closing_ & closeAsked) == 0)
+            ks_sleep(pauseSeconds);
     }
     if (--retryBudget_ <= 0)
-        throw KSRemoteService_ComFailure(hostName_.c_str(), Port);
+        throw KSRemoteService_ComFailure(hostName_.c_str(), port);
 }
 
 // Reads the connection until the relay's acknowledgement or the connection's end. The reader thread may have
 // been cancelled already and not read any more; then this function reads in its place.
 void KSRemoteMsgQueue::readToAcknowledgement() {
     const std::lock_guard lock(reading_);
-    while ((closing_ & Acknowledged) == 0) {
+    while ((closing_ & closeAcknowledged) == 0) {
         const ReceivedFrame frame(connection_);
-        if (frame.is(ClosedFrame) || connection_.failed())
+        if (frame.is(closedFrame) || connection_.failed())
             acknowledged();
     }
 }
@@ -215,7 +215,7 @@ void KSRemoteMsgQueue::awaitAcknowledgement() {
         other = std::thread([this] { readToAcknowledgement(); });
     } catch (const std::system_error&) {  // no thread: only the reader thread can see the acknowledgement
     }
-    handshake_.tryLock(AnswerMs, PollMs);
+    handshake_.tryLock(answerMs, pollMs);
     connection_.shutdown(SHUT_RDWR);
     if (other.joinable())
         other.join();
@@ -223,10 +223,10 @@ void KSRemoteMsgQueue::awaitAcknowledgement() {
 
 // If the close request cannot be sent, there is nothing to wait for.
 void KSRemoteMsgQueue::wakeReader() {
-    if ((closing_.fetch_or(Asked) & Asked) != 0)
+    if ((closing_.fetch_or(closeAsked) & closeAsked) != 0)
         return;
     msg_t request;
-    request.type = CloseFrame;
+    request.type = closeFrame;
     if (sendFrame(request) == 0)
         awaitAcknowledgement();
     else

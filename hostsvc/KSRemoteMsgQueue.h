@@ -16,8 +16,8 @@
 // the connection. A connection that is lost is not made again.
 class KSRemoteMsgQueue : public KSAbstractMsgQueue {
   public:
-    static constexpr int Port = 6554;
-    static constexpr int RetryBudget = 10;
+    static constexpr int port = 6554;
+    static constexpr int retryBudget = 10;
 
     // Connects to the relay on hostName and asks it to open a queue. hostName may end with a colon and a
     // port; without one the port is Port. desc, a and b are passed to the relay. Throws
@@ -43,9 +43,9 @@ class KSRemoteMsgQueue : public KSAbstractMsgQueue {
   private:
     class ReceivedFrame;
 
-    // Asked: this end has asked the relay to close. Acknowledged: the relay has closed, or the connection has
-    // ended. A relay may acknowledge what nobody has asked for.
-    enum Closing : unsigned { Asked = 1, Acknowledged = 2 };
+    // closeAsked: this end has asked the relay to close. closeAcknowledged: the relay has closed, or the
+    // connection has ended. A relay may acknowledge what nobody has asked for.
+    enum Closing : unsigned { closeAsked = 1, closeAcknowledged = 2 };
 
     void open(NvCompDesc desc, unsigned a, unsigned b);
     void keepAlive() const;
@@ -58,7 +58,7 @@ class KSRemoteMsgQueue : public KSAbstractMsgQueue {
 
     std::string hostName_;
     sock connection_;
-    int retryBudget_ = RetryBudget;  // reads that may still fail; used by the reading thread only
+    int retryBudget_ = retryBudget;  // reads that may still fail; used by the reading thread only
     KSMutex handshake_;              // a signal: locked until the relay has acknowledged the close
     std::mutex reading_;             // held by the thread that reads the connection
     std::mutex writing_;             // held by the thread that writes to the connection

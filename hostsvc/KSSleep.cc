@@ -24,6 +24,6 @@ void ks_sleep_us(unsigned microseconds) {
         ks_reportInterruptedSleep();
 }
 
-timeval ks_timeout_ms(unsigned milliseconds) { return timeoutOf(microsecondsOf(milliseconds)); }
+timeval ks_timeoutMs(unsigned milliseconds) { return timeoutOf(microsecondsOf(milliseconds)); }
 
 void ks_reportInterruptedSleep() { std::cerr << "*** sleep_us interupted by signal ***" << std::endl; }

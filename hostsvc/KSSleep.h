@@ -14,7 +14,7 @@ void ks_sleep_us(unsigned microseconds);
 
 // For waits that last as long as such a sleep: the time in the form of the system's calls (with the same
 // wrap), and the report of a signal.
-timeval ks_timeout_ms(unsigned milliseconds);
+timeval ks_timeoutMs(unsigned milliseconds);
 void ks_reportInterruptedSleep();
 
 #endif

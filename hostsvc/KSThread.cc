@@ -10,7 +10,7 @@ class StoppedAtEnd {
     explicit StoppedAtEnd(std::atomic<KSThreadStatus>& status) : status_(status) {}
     StoppedAtEnd(const StoppedAtEnd&) = delete;
     StoppedAtEnd& operator=(const StoppedAtEnd&) = delete;
-    ~StoppedAtEnd() { status_.store(KSThreadStatus::Stopped); }
+    ~StoppedAtEnd() { status_.store(KSThreadStatus::stopped); }
 
   private:
     std::atomic<KSThreadStatus>& status_;
@@ -29,23 +29,23 @@ KSThread::KSThread(const KSBody& body, unsigned stackSize)
 }
 
 KSThread::~KSThread() {
-    life_.fetch_and(~unsigned{Abandoned});
-    if (status_.load() == ThreadStatus::Running)
+    life_.fetch_and(~unsigned{abandoned});
+    if (status_.load() == ThreadStatus::running)
         cancel();
     join();  // also if the status says stopped: a cancelled body may still be running
 }
 
 void KSThread::start(void* arg) {
-    if (status_.load() != ThreadStatus::Stopped)
+    if (status_.load() != ThreadStatus::stopped)
         throw AlreadyActive();
     lock_.lock();  // first wait for a cancelled body: setting the status now would make it run on
     argument_ = arg;
     result_.store(nullptr);
-    life_.fetch_and(~unsigned{Ended});
-    status_.store(ThreadStatus::Running);
+    life_.fetch_and(~unsigned{ended});
+    status_.store(ThreadStatus::running);
     if (ks_startDetached(KSThread_run, this, stackSize_))
         return;  // do not touch the object any more: an abandoned one may have deleted itself
-    status_.store(ThreadStatus::Stopped);
+    status_.store(ThreadStatus::stopped);
     lock_.unlock();
     throw CreationError();
 }
@@ -55,26 +55,26 @@ void KSThread::run() {
     result_.store(body_(handedControl_, argument_));
 }
 
-void KSThread::cancel() { status_.store(ThreadStatus::Stopped); }
+void KSThread::cancel() { status_.store(ThreadStatus::stopped); }
 
 void KSThread::join() {
     lock_.lock();
     lock_.unlock();
-    life_.fetch_and(~unsigned{Ended});
+    life_.fetch_and(~unsigned{ended});
 }
 
 bool KSThread::tryJoin(unsigned timeoutMs, unsigned intervalMs) {
     if (!lock_.tryLock(timeoutMs, intervalMs))
         return false;
     lock_.unlock();
-    life_.fetch_and(~unsigned{Ended});
+    life_.fetch_and(~unsigned{ended});
     return true;
 }
 
 void* KSThread::getResult() const { return result_.load(); }
 
 void KSThread::abandon() {
-    if ((life_.fetch_or(Abandoned) & Ended) == 0)
+    if ((life_.fetch_or(abandoned) & ended) == 0)
         return;
     join();
     delete this;
@@ -90,8 +90,8 @@ void* KSThread_run(void* thread) {
 // joins may destroy it. If the object is abandoned, nobody joins, and it is deleted here.
 void KSThread::finish(void* thread) {
     auto* const self = static_cast<KSThread*>(thread);
-    const bool abandoned = (self->life_.fetch_or(Ended) & Abandoned) != 0;
+    const bool wasAbandoned = (self->life_.fetch_or(ended) & abandoned) != 0;
     self->lock_.unlock();
-    if (abandoned)
+    if (wasAbandoned)
         delete self;
 }

@@ -57,14 +57,14 @@ class KSThread {
     void setControl(void* handed) { handedControl_ = handed; }
 
   private:
-    // Ended: the body has ended, and no thread has joined it yet.
-    enum Life : unsigned { Abandoned = 1, Ended = 2 };
+    // `ended`: the body has ended, and no thread has joined it yet.
+    enum Life : unsigned { abandoned = 1, ended = 2 };
 
     KSThread(const KSBody& body, unsigned stackSize);
     friend void* KSThread_run(void* thread);
     static void finish(void* thread);
 
-    std::atomic<ThreadStatus> status_{ThreadStatus::Stopped};
+    std::atomic<ThreadStatus> status_{ThreadStatus::stopped};
     KSBody body_;
     void* argument_ = nullptr;
     std::atomic<void*> result_{nullptr};

@@ -18,7 +18,7 @@ KSThreadControl::~KSThreadControl() {
 }
 
 void KSThreadControl::testCancel() {
-    if (status_.load() != KSThreadStatus::Stopped)
+    if (status_.load() != KSThreadStatus::stopped)
         return;
     while (popCleanup(1) != 0) {
     }

@@ -11,7 +11,7 @@
 #include "hostsvc/KSRunnable.h"
 
 // Stopped means that the thread does not run, or that it has been asked to stop.
-enum class KSThreadStatus : std::uint32_t { Running = 0, Stopped = 1 };
+enum class KSThreadStatus : std::uint32_t { running = 0, stopped = 1 };
 
 // Also named KSThread::control. The clean-up routines form a stack: the last one pushed is the first to run.
 // Only the body uses the stack, and the destructor after the body has ended.

@@ -15,8 +15,8 @@ struct msg_t {
     char* data = nullptr;
     char* ex_data = nullptr;
 
-    static constexpr std::int32_t Largest = 102400;  // of each part
-    static constexpr int HeaderSize = 20;            // on the wire
+    static constexpr std::int32_t largest = 102400;  // of each part
+    static constexpr int headerSize = 20;            // on the wire
 };
 
 // The code that converts the header to network order relies on this layout.

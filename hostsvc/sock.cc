@@ -15,7 +15,7 @@
 
 namespace {
 
-constexpr long ForEver = -1;
+constexpr long forEver = -1;
 
 short eventsOf(char mode) {
     switch (mode) {
@@ -116,12 +116,12 @@ int sock::connect() {
 // select would leave the descriptor in its set.
 int sock::ready(char mode, long sec, long usec) const {
     const short events = eventsOf(mode);
-    const bool forEver = sec == ForEver && usec == ForEver;
-    if (events == 0 || descriptor_ < 0 || (!forEver && (sec < 0 || usec < 0)))
+    const bool waits = sec == forEver && usec == forEver;
+    if (events == 0 || descriptor_ < 0 || (!waits && (sec < 0 || usec < 0)))
         return 1;
     const timespec timeout{sec + usec / 1000000, usec % 1000000 * 1000};
     pollfd waited{descriptor_, events, 0};
-    if (ppoll(&waited, 1, forEver ? nullptr : &timeout, nullptr) < 0)
+    if (ppoll(&waited, 1, waits ? nullptr : &timeout, nullptr) < 0)
         return 1;
     return (waited.revents & shownBy(events)) != 0 ? 1 : 0;
 }
@@ -136,7 +136,7 @@ long sock::transferred(long count) {
 long sock::readblock(void* buf, long len) {
     auto* to = static_cast<char*>(buf);
     while (len > 0) {
-        if (ready('r', ForEver, ForEver) == 0)
+        if (ready('r', forEver, forEver) == 0)
             continue;
         const long count = transferred(::recv(descriptor_, to, static_cast<std::size_t>(len), 0));
         if (count <= 0)
@@ -150,7 +150,7 @@ long sock::readblock(void* buf, long len) {
 long sock::writeblock(const void* buf, long len) {
     const auto* from = static_cast<const char*>(buf);
     while (len > 0) {
-        if (ready('w', ForEver, ForEver) == 0)
+        if (ready('w', forEver, forEver) == 0)
             continue;
         // MSG_NOSIGNAL: a peer that has closed must not end the process with a signal.
         const long count =

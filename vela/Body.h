@@ -39,7 +39,7 @@
 namespace vela {
 
 // The code of a body that is only part of another body.
-inline constexpr unsigned int NoCode = 0xFFFFFFFFU;
+inline constexpr unsigned int noCode = 0xFFFFFFFFU;
 
 struct NoFields {};
 
@@ -69,9 +69,9 @@ class Body : public MsgBody, public Row {
     unsigned int writeMsg(Msg* msg, unsigned int offset) override {
         static_assert(isListed(), "a body is missing from the table of its family");
         setCounts(std::make_index_sequence<n>{});
-        return move<Move::Put>(msg, offset);
+        return move<Move::put>(msg, offset);
     }
-    unsigned int readMsg(Msg* msg, unsigned int offset) override { return move<Move::Get>(msg, offset); }
+    unsigned int readMsg(Msg* msg, unsigned int offset) override { return move<Move::get>(msg, offset); }
 
     unsigned int GetByteSize() const override {
         unsigned int size = 0;
@@ -106,7 +106,7 @@ class Body : public MsgBody, public Row {
     }
 
   private:
-    static constexpr std::size_t n = FieldCount<Row>;
+    static constexpr std::size_t n = fieldCount<Row>;
     // Called when the family is complete.
     static constexpr bool isListed() {
         if constexpr (std::is_void_v<Messages>)
@@ -178,7 +178,7 @@ class Body : public MsgBody, public Row {
     template <std::size_t i, Move direction>
     void moveFrom(FieldMover<direction>& mover, Msg* msg, unsigned int& announced) {
         if (hasOptionalFields && !isPresent(i)) {
-            if constexpr (direction == Move::Get)
+            if constexpr (direction == Move::get)
                 emptyListsFrom<i>();
             return;
         }

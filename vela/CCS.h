@@ -14,13 +14,13 @@ struct EvtL2Trace {
 };
 // One information element: an identifier, and unless the element has a single octet, a length and a value.
 struct IEPubData {
-    U8<"IEId"> IEId; Count8<"Length"> Length; Array<unsigned char, WireType::Unsigned8, "Value"> Value;
+    U8<"IEId"> IEId; Count8<"Length"> Length; Array<unsigned char, WireType::unsigned8, "Value"> Value;
     std::size_t fieldsPresent() const;
 };
 struct ieMessage {
-    using IEPubData_t = Body<NoCode, rows::IEPubData>;
+    using IEPubData_t = Body<noCode, rows::IEPubData>;
     U16<"CallId"> CallId; U16<"CallRef"> CallRef; Count16<"IEPrivBufLen"> IEPrivBufLen;
-    U8<"MessageId"> MessageId; Array<unsigned char, WireType::Unsigned8, "IEPrivData"> IEPrivData;
+    U8<"MessageId"> MessageId; Array<unsigned char, WireType::unsigned8, "IEPrivData"> IEPrivData;
     RestOf<IEPubData_t, "IEPubData"> IEPubData;
 };
 // clang-format on
@@ -43,7 +43,7 @@ struct CCSMessages : Family<CCSMessages> {
 
 class CCS : public WithBodies<Component, CCSMessages> {
   public:
-    static constexpr unsigned int L2TraceGroup = EvtL2Trace_t::code;
+    static constexpr unsigned int l2TraceGroup = EvtL2Trace_t::code;
 
     CCS(const CompDesc_t& target, MsgQueue* queue) : WithBodies(target, queue) {}
     ~CCS() override { endCallbacks(); }

@@ -13,9 +13,9 @@ struct CompAttr {
 };
 }  // namespace rows
 
-class CompAttr_t : public Body<NoCode, rows::CompAttr> {
+class CompAttr_t : public Body<noCode, rows::CompAttr> {
   public:
-    static constexpr unsigned int ComponentType = 0;  // the key that a search by type uses
+    static constexpr unsigned int componentType = 0;  // the key that a search by type uses
 
     CompAttr_t() = default;
     CompAttr_t(unsigned int attributeKey, int attributeValue) {

@@ -15,12 +15,12 @@ struct FieldRef {
     T& field;
     T& value() const { return field; }
 };
-using Octet = FieldRef<unsigned char, WireType::Unsigned8>;
+using Octet = FieldRef<unsigned char, WireType::unsigned8>;
 
 template <Move move>
 unsigned int transfer(CompDesc_t& address, Msg* msg, unsigned int offset) {
     FieldMover<move> mover(msg->getNvMsgRef(), offset);
-    const FieldRef<unsigned short, WireType::Unsigned16> instance{address.Instance};
+    const FieldRef<unsigned short, WireType::unsigned16> instance{address.Instance};
     const Octet board{address.Board}, processor{address.Processor};
     const Octet component{address.Component}, node{address.Node};
     mover.scalars(instance);
@@ -49,11 +49,11 @@ bool CompDesc_t::operator==(const CompDesc_t& other) const {
 }
 
 unsigned int CompDesc_t::writeMsg(Msg* msg, unsigned int offset) {
-    return transfer<Move::Put>(*this, msg, offset);
+    return transfer<Move::put>(*this, msg, offset);
 }
 
 unsigned int CompDesc_t::readMsg(Msg* msg, unsigned int offset) {
-    return transfer<Move::Get>(*this, msg, offset);
+    return transfer<Move::get>(*this, msg, offset);
 }
 
 void CompDesc_t::toStream(std::ostream* out) const {

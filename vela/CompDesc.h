@@ -9,7 +9,7 @@ namespace vela {
 
 class CompDesc_t : public MsgBody {
   public:
-    static constexpr unsigned char AnyComponent = 255;
+    static constexpr unsigned char anyComponent = 255;
 
     CompDesc_t() = default;
     CompDesc_t(unsigned short instance, unsigned char board, unsigned char processor, unsigned char component,

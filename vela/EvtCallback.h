@@ -15,21 +15,21 @@
 
 namespace vela {
 
-enum class Awaited { Message, Event };
+enum class Awaited { message, event };
 template <Awaited what>
 class Waiter;
 
 class EvtCallback : public AsyncMsgReceiver {
   public:
     using Callback = CallbackBase;
-    using MsgWait = Waiter<Awaited::Message>;
-    using EvtWait = Waiter<Awaited::Event>;
+    using MsgWait = Waiter<Awaited::message>;
+    using EvtWait = Waiter<Awaited::event>;
 
     // The thread parameter of a callback that runs on the dispatching thread. That thread holds the
     // dispatcher's lock meanwhile and reads no further message, so the callback must not register, cancel,
     // wait for a reply or destroy the object. Any other thread parameter is the stack size, 0 for the
     // default, of the delivery's own thread, which it gets from the lane of its registration.
-    static constexpr unsigned int OnDispatchingThread = 0xFFFFFFFFU;
+    static constexpr unsigned int onDispatchingThread = 0xFFFFFFFFU;
 
     explicit EvtCallback(Addressable* owner);
     // Calls end(). A callback on the dispatching thread must not destroy the dispatcher, because that thread

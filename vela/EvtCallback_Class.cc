@@ -23,7 +23,7 @@ void giveBody(Msg& msg, LookUp lookUp) {
 
 void reportUnregistered(const Addressable& owner, const Msg& msg, const char* what, unsigned int key,
                         const char* advice) {
-    report(BannerBegin, joined(what, key), joined("For ", owner), msg, advice, BannerEnd);
+    report(bannerBegin, joined(what, key), joined("For ", owner), msg, advice, bannerEnd);
 }
 
 void reportUnregisteredMsgType(Addressable* owner, Msg* raw) {
@@ -86,7 +86,7 @@ void EvtCallback::registerEvtGroup(unsigned int group, const Handler& callback, 
 }
 
 void EvtCallback::registerNext(Awaited what, unsigned int key, const Handler& callback) {
-    add(what == Awaited::Message ? msgTypes_ : evtGroups_, key, {callback, 0, nullptr, true});
+    add(what == Awaited::message ? msgTypes_ : evtGroups_, key, {callback, 0, nullptr, true});
 }
 
 void EvtCallback::cancelMsgType(unsigned int type, const Handler& callback, unsigned int threadParam) {
@@ -126,7 +126,7 @@ void EvtCallback::remove(Table& table, unsigned int key, const Handler& callback
     unsigned int i = 0;
     while (i < callbacks.length() && !callbacks.element(i).is(callback, threadParam))
         ++i;
-    callbacks.remove(i < callbacks.length() ? i : NoIndex);
+    callbacks.remove(i < callbacks.length() ? i : noIndex);
 }
 
 void EvtCallback::remove(Table& table, unsigned int key) {
@@ -151,7 +151,7 @@ void EvtCallback::receiveUnregistered(Msg* msg) {
 
 void EvtCallback::dispatch(std::unique_ptr<Msg> msg) {
     const unsigned int type = msg->getMsgType();
-    const bool isEvent = type == EvtDetected;
+    const bool isEvent = type == evtDetected;
     const unsigned int key = isEvent ? evtGroupOf(*msg) : type;
     linkedList<callbackInfo>* const callbacks = (isEvent ? evtGroups_ : msgTypes_).find(key);
     if (callbacks == nullptr || callbacks->length() == 0)
@@ -182,7 +182,7 @@ void EvtCallback::dispatchTo(linkedList<callbackInfo>& callbacks, unsigned int k
 
 void EvtCallback::dispatchUnregistered(std::unique_ptr<Msg> msg) {
     const unsigned int type = msg->getMsgType();
-    const callbackInfo& handler = type == EvtDetected ? defaultEvt_ : defaultMsg_;
+    const callbackInfo& handler = type == evtDetected ? defaultEvt_ : defaultMsg_;
     std::unique_ptr<Delivery> delivery = handler.lane->spare();
     delivery->begin(handler.handler, owner(), type, deliveries_);
     delivery->msg = std::move(msg);
@@ -214,7 +214,7 @@ std::unique_ptr<MsgBody> EvtCallback::bodyOf(Msg& msg, unsigned int key, bool is
 }
 
 void EvtCallback::run(const callbackInfo& to, std::unique_ptr<Delivery> delivery) {
-    if (to.threadParam == OnDispatchingThread) {
+    if (to.threadParam == onDispatchingThread) {
         to.lane->runHere(std::move(delivery));
         return;
     }

@@ -6,14 +6,14 @@
 
 namespace vela {
 
-inline constexpr unsigned int EvtDetected = 32;  // the standard resource's event-detected message
+inline constexpr unsigned int evtDetected = 32;  // the standard resource's event-detected message
 
 // The group is the first field of every event; 0 when the payload is too short to hold one.
 inline unsigned int evtGroupOf(Msg& msg) {
     struct Row {
         U32<"EvtGroup"> EvtGroup;
     };
-    Body<NoCode, Row> head;
+    Body<noCode, Row> head;
     msg.read(&head, 0);
     return head.EvtGroup;
 }

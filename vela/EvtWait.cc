@@ -25,13 +25,13 @@ void Waiter<what>::enable(unsigned int type) {
     end();
     lock();
     type_ = type;
-    state_ = Enabled;
+    state_ = enabled;
     dispatcher_->registerNext(what, type, Handler(this, &Waiter::trigger));
 }
 
 template <Awaited what>
 void Waiter<what>::disable() {
-    if (State enabled = Enabled; state_.compare_exchange_strong(enabled, Idle)) {
+    if (State expected = enabled; state_.compare_exchange_strong(expected, idle)) {
         withdraw();
         unlock();
     }
@@ -51,7 +51,7 @@ void Waiter<what>::end() {
 // meanwhile.
 template <Awaited what>
 void Waiter<what>::trigger(Addressable*, Msg* msg) {
-    if (State enabled = Enabled; !state_.compare_exchange_strong(enabled, Triggered)) {
+    if (State expected = enabled; !state_.compare_exchange_strong(expected, triggered)) {
         dispatcher_->receiveUnregistered(msg);
         return;
     }
@@ -66,7 +66,7 @@ template <Awaited what>
 void Waiter<what>::withdraw() {
     const Handler self(this, &Waiter::trigger);
     try {
-        what == Awaited::Message ? dispatcher_->cancelMsgType(type_, self, 0)
+        what == Awaited::message ? dispatcher_->cancelMsgType(type_, self, 0)
                                  : dispatcher_->cancelEvtGroup(type_, self, 0);
     } catch (const Exception&) {
     }
@@ -84,7 +84,7 @@ std::unique_ptr<Msg> Waiter<what>::await(unsigned int timeoutMs) {
     unlock();
     if (msg == nullptr)
         throw Timeout(type_, timeoutMs);
-    state_ = Idle;
+    state_ = idle;
     return msg;
 }
 
@@ -100,7 +100,7 @@ void Waiter<what>::wait(MsgBody* body, unsigned int timeoutMs) {
         msg->read(body, 0);
 }
 
-template class Waiter<Awaited::Message>;
-template class Waiter<Awaited::Event>;
+template class Waiter<Awaited::message>;
+template class Waiter<Awaited::event>;
 
 }  // namespace vela

@@ -20,7 +20,7 @@ class Waiter : public Mutex, public CallbackBase {
     class Timeout : public Exception {
       public:
         Timeout(unsigned int type, unsigned int timeoutMs)
-            : Exception(what == Awaited::Message ? "EvtCallback::MsgWait::Timeout"
+            : Exception(what == Awaited::message ? "EvtCallback::MsgWait::Timeout"
                                                  : "EvtCallback::EvtWait::Timeout"),
               type_(type),
               timeoutMs_(timeoutMs) {}
@@ -58,13 +58,13 @@ class Waiter : public Mutex, public CallbackBase {
     void end();
     std::unique_ptr<Msg> await(unsigned int timeoutMs);
 
-    enum State { Idle, Enabled, Triggered };
+    enum State { idle, enabled, triggered };
 
     EvtCallback* dispatcher_;
     unsigned int type_ = 0;
     std::atomic<Msg*> msg_{nullptr};  // the message that arrived, until a wait takes it
     std::unique_ptr<Msg> awaited_;    // the message of a wait in the constructor, for the next wait
-    std::atomic<State> state_{Idle};
+    std::atomic<State> state_{idle};
 };
 
 }  // namespace vela

@@ -33,11 +33,11 @@ struct CompInstAllocate {
 };
 struct DescPayload { Address<"desc"> desc; U32<"Payload"> Payload; };
 struct CompUse {
-    using List_t = Body<NoCode, DescPayload>;
+    using List_t = Body<noCode, DescPayload>;
     Count32<"Count"> Count; ListOf<List_t, "List"> List;
 };
 struct CompUnuse {
-    using List_t = Body<NoCode, DescOnly>;
+    using List_t = Body<noCode, DescOnly>;
     Count32<"Count"> Count; ListOf<List_t, "List"> List;
 };
 struct CompFindAll {
@@ -46,7 +46,7 @@ struct CompFindAll {
 };
 struct CompAttrs { Address<"compDesc"> compDesc; Nested<CompAttr_t, "attrs"> attrs; };
 struct CompMultipleResult {
-    using comps_t = Body<NoCode, CompAttrs>;
+    using comps_t = Body<noCode, CompAttrs>;
     Count32<"count"> count; Address<"nextComponent"> nextComponent; ListOf<comps_t, "comps"> comps;
 };
 
@@ -69,7 +69,7 @@ struct ClusterCompInfoResult {
 };
 struct ClusterSlots {
     Address<"ClustDesc"> ClustDesc; U32<"portId"> portId; Count32<"width"> width; U32<"encoding"> encoding;
-    U32<"idlePattern"> idlePattern; Array<unsigned int, WireType::Unsigned32, "slotIds"> slotIds;
+    U32<"idlePattern"> idlePattern; Array<unsigned int, WireType::unsigned32, "slotIds"> slotIds;
 };
 struct ClusterUnlockCmplt {
     U32<"unlocked"> unlocked; Count32<"count"> count; ListOf<CompDesc_t, "unlockedList"> unlockedList;

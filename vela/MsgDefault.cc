@@ -8,15 +8,15 @@
 namespace vela {
 
 unsigned int MsgDefault_t::writeMsg(Msg* msg, unsigned int offset) {
-    FieldMover<Move::Put> mover(msg->getNvMsgRef(), offset);
-    mover.array(used_->begin(), used_->length(), WireType::Unsigned8);
+    FieldMover<Move::put> mover(msg->getNvMsgRef(), offset);
+    mover.array(used_->begin(), used_->length(), WireType::unsigned8);
     return mover.offset();
 }
 
 unsigned int MsgDefault_t::readMsg(Msg* msg, unsigned int offset) {
-    FieldMover<Move::Get> mover(msg->getNvMsgRef(), offset);
+    FieldMover<Move::get> mover(msg->getNvMsgRef(), offset);
     used_->realloc(mover.rest());
-    mover.array(used_->begin(), used_->length(), WireType::Unsigned8);
+    mover.array(used_->begin(), used_->length(), WireType::unsigned8);
     return mover.offset();
 }
 

@@ -12,11 +12,11 @@ namespace {
 
 void reportUnregisteredSource(MsgQueue* queue, Msg* raw) {
     const std::unique_ptr<Msg> msg(raw);
-    report(BannerBegin, joined("Unregisterd Source sent to MsgQueue ", *queue),
+    report(bannerBegin, joined("Unregisterd Source sent to MsgQueue ", *queue),
            joined("MsgType ", msg->getMsgType()), *msg,
            "You may specify your own handler for messages from unregistered sources using\n"
            "MsgQueue::unregisteredSource",
-           BannerEnd);
+           bannerEnd);
 }
 
 // Makes a Msg of the message of a handle, which becomes empty. If there is no memory for the Msg, frees the

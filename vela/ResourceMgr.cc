@@ -14,7 +14,7 @@ void addType(staticList<CompAttr_t>& attributes, unsigned char compType) {
     if (compType == 0)
         return;
     attributes.realloc(attributes.length() + 1);
-    attributes[attributes.length() - 1] = CompAttr_t(CompAttr_t::ComponentType, compType);
+    attributes[attributes.length() - 1] = CompAttr_t(CompAttr_t::componentType, compType);
 }
 
 void append(ResourceMgr::Found& all, const ResourceMgr::Found& more) {
@@ -29,7 +29,7 @@ ResourceMgr::ResourceMgr(const Addressable* object) : WithBodies(managerOf(objec
 
 CompDesc_t ResourceMgr::searchStart(unsigned char processor, unsigned short instance) const {
     const CompDesc_t own = getTgtDesc();
-    return {instance, own.Board, processor, CompDesc_t::AnyComponent, own.Node};
+    return {instance, own.Board, processor, CompDesc_t::anyComponent, own.Node};
 }
 
 StdResource ResourceMgr::find(unsigned char compType, unsigned char processor, unsigned short instance,

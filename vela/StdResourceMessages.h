@@ -24,42 +24,42 @@ struct GroupAction { U32<"EvtGroup"> EvtGroup; U32<"Action"> Action; };
 // An error: the code of the command that failed, the component's error number, and for parameter commands the
 // refused parameter and its value.
 struct Error {
-    U32<"ErrorMsg"> ErrorMsg; U32<"ErrorCode"> ErrorCode; Nested<Body<NoCode, NumVal>, "Data"> Data;
+    U32<"ErrorMsg"> ErrorMsg; U32<"ErrorCode"> ErrorCode; Nested<Body<noCode, NumVal>, "Data"> Data;
     std::size_t fieldsPresent() const;
 };
 
 struct ParmValList {
-    using Parms_t = Body<NoCode, ParmVal>;
+    using Parms_t = Body<noCode, ParmVal>;
     Count32<"Count"> Count; ListOf<Parms_t, "Parms"> Parms;
 };
 struct ParmVarValList {
-    using Parms_t = Body<NoCode, ParmVarVal>;
+    using Parms_t = Body<noCode, ParmVarVal>;
     Count32<"Count"> Count; ListOf<Parms_t, "Parms"> Parms;
 };
 struct ParmList {
-    using Parms_t = Body<NoCode, ParmOnly>;
+    using Parms_t = Body<noCode, ParmOnly>;
     Count32<"Count"> Count; ListOf<Parms_t, "Parms"> Parms;
 };
 
 struct GetParmCmplt {
     U32<"Num"> Num; U32<"Val"> Val; Count32<"TextSize"> TextSize;
-    Rest<unsigned char, WireType::Text8, "Text"> Text;
+    Rest<unsigned char, WireType::text8, "Text"> Text;
 };
 
 struct DetectEvt { Nested<CompDesc_t, "RetAddr"> RetAddr; U32<"EvtType"> EvtType; U32<"EvtGroup"> EvtGroup; };
 struct DetectxEvts {
-    using List_t = Body<NoCode, TypeGroup>;
+    using List_t = Body<noCode, TypeGroup>;
     Nested<CompDesc_t, "RetAddr"> RetAddr; Count32<"Count"> Count; ListOf<List_t, "List"> List;
 };
-struct CancelxEvts { Count32<"Count"> Count; Array<unsigned int, WireType::Unsigned32, "EvtTypeList"> EvtTypeList; };
+struct CancelxEvts { Count32<"Count"> Count; Array<unsigned int, WireType::unsigned32, "EvtTypeList"> EvtTypeList; };
 struct EvtDetected { U32<"EvtGroup"> EvtGroup; RestBytes<"Data"> Data; };
 
 struct ArmxRTCs {
-    using EventGroupList_t = Body<NoCode, GroupAction>;
+    using EventGroupList_t = Body<noCode, GroupAction>;
     Count32<"Count"> Count; ListOf<EventGroupList_t, "EventGroupList"> EventGroupList;
 };
 struct DisarmxRTCs {
-    Count32<"Count"> Count; Array<unsigned int, WireType::Unsigned32, "EventGroupList"> EventGroupList;
+    Count32<"Count"> Count; Array<unsigned int, WireType::unsigned32, "EventGroupList"> EventGroupList;
 };
 // clang-format on
 
@@ -68,7 +68,7 @@ struct DisarmxRTCs {
 // The bodies. StdResource derives from this struct, so that they can be named as its own.
 struct StdResourceMessages : Family<StdResourceMessages> {
     // The refused parameter of an error; it has this form for every parameter command.
-    using Data_ErrorMsg_0x8_t = vela::Body<NoCode, rows::NumVal>;
+    using Data_ErrorMsg_0x8_t = vela::Body<noCode, rows::NumVal>;
     using Data_ErrorMsg_0xa_t = Data_ErrorMsg_0x8_t;
     using Data_ErrorMsg_0x12_t = Data_ErrorMsg_0x8_t;
     using Data_ErrorMsg_0x14_t = Data_ErrorMsg_0x8_t;

@@ -12,16 +12,16 @@ namespace rows {
 // A parameter. Its FieldDef says how many elements its value has, and of which type.
 struct ParmFieldDefVal { U32<"Parm"> Parm; Descriptor32<"FieldDef"> FieldDef; Described<"Val"> Val; };
 struct Std_ParmValList {
-    using Parms_t = Body<NoCode, ParmVal>;
+    using Parms_t = Body<noCode, ParmVal>;
     Count32<"Count"> Count; ListOf<Parms_t, "Parms"> Parms;
 };
 struct Std_ParmFieldDefValList {
-    using Parms_t = Body<NoCode, ParmFieldDefVal>;
+    using Parms_t = Body<noCode, ParmFieldDefVal>;
     Count32<"Count"> Count; ListOf<Parms_t, "Parms"> Parms;
 };
 struct BChannel { U8<"BChanId"> BChanId; U8<"SlotId"> SlotId; U8<"Direction"> Direction; U8<"Count"> Count; };
 struct DefineBSet {
-    using List_t = Body<NoCode, BChannel>;
+    using List_t = Body<noCode, BChannel>;
     U8<"SetId"> SetId; U8<"LineId"> LineId; U8<"StartChannelId"> StartChannelId; U8<"NumChannels"> NumChannels;
     U32<"BaseProtocol"> BaseProtocol; U8<"InboundVariantId"> InboundVariantId;
     U8<"OutboundVariantId"> OutboundVariantId; Nested<CompDesc_t, "DChannelDesc"> DChannelDesc;

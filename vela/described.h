@@ -58,11 +58,11 @@ class Described : public Field<staticList<unsigned int>, name> {
     void moveAs(FieldMover<move>& mover, unsigned int count, WireType type) {
         unsigned int* const numbers = this->value().begin();
         staticList<Element> elements(count);
-        if constexpr (move == Move::Put)
+        if constexpr (move == Move::put)
             std::transform(numbers, numbers + count, elements.begin(),
                            [](unsigned int number) { return static_cast<Element>(number); });
         mover.array(elements.begin(), count, type);
-        if constexpr (move == Move::Get)
+        if constexpr (move == Move::get)
             std::copy(elements.begin(), elements.end(), numbers);
     }
 };

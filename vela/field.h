@@ -78,15 +78,15 @@ class Scalar : public Field<T, name> {
 };
 
 template <Label name>
-using U8 = Scalar<unsigned char, WireType::Unsigned8, name>;
+using U8 = Scalar<unsigned char, WireType::unsigned8, name>;
 template <Label name>
-using U16 = Scalar<unsigned short, WireType::Unsigned16, name>;
+using U16 = Scalar<unsigned short, WireType::unsigned16, name>;
 template <Label name>
-using U32 = Scalar<unsigned int, WireType::Unsigned32, name>;
+using U32 = Scalar<unsigned int, WireType::unsigned32, name>;
 template <Label name>
-using S32 = Scalar<int, WireType::Signed32, name>;
+using S32 = Scalar<int, WireType::signed32, name>;
 template <Label name>
-using Value32 = Scalar<unsigned int, WireType::Value32, name>;
+using Value32 = Scalar<unsigned int, WireType::value32, name>;
 
 // The number of elements of the next list in the body. It is set from the list's length when the body is
 // written.
@@ -154,7 +154,7 @@ class Array : public Field<staticList<T>, name> {
     template <Move move>
     void transfer(FieldMover<move>& mover, Msg*, unsigned int announced) {
         staticList<T>& elements = this->value();
-        if constexpr (move == Move::Get)
+        if constexpr (move == Move::get)
             elements.realloc(std::min(announced, mover.rest() / elementSize(type)));
         mover.array(elements.begin(), elements.length(), type);
     }
@@ -173,7 +173,7 @@ class Rest : public Array<T, type, name> {
 };
 
 template <Label name>
-using RestBytes = Rest<unsigned char, WireType::Unsigned8, name>;
+using RestBytes = Rest<unsigned char, WireType::unsigned8, name>;
 
 // Always n octets.
 template <unsigned int n, Label name>
@@ -186,9 +186,9 @@ class FixedOctets : public Field<std::array<unsigned char, n>, name> {
 
     template <Move move>
     void transfer(FieldMover<move>& mover, Msg*, unsigned int) {
-        if constexpr (move == Move::Get)
+        if constexpr (move == Move::get)
             this->value().fill(0);
-        mover.array(this->value().data(), n, WireType::Unsigned8);
+        mover.array(this->value().data(), n, WireType::unsigned8);
     }
 };
 
@@ -210,26 +210,26 @@ class ListOf : public Field<staticList<Element>, name> {
 
     template <Move move>
     void transfer(FieldMover<move>& mover, Msg* msg, unsigned int announced) {
-        if constexpr (move == Move::Get)
+        if constexpr (move == Move::get)
             get(mover, msg, announced);
         else
             put(mover, msg);
     }
 
   protected:
-    void put(FieldMover<Move::Put>& mover, Msg* msg) {
+    void put(FieldMover<Move::put>& mover, Msg* msg) {
         for (Element& element : this->value())
             mover.nested(msg, element);
     }
     // Reads one entry, and replaces what it held before.
-    static void getOne(FieldMover<Move::Get>& mover, Msg* msg, Element& element) {
+    static void getOne(FieldMover<Move::get>& mover, Msg* msg, Element& element) {
         element = Element();
         mover.nested(msg, element);
     }
 
   private:
     // No entry is smaller than an empty one. Octets after the last whole entry are not read.
-    void get(FieldMover<Move::Get>& mover, Msg* msg, unsigned int announced) {
+    void get(FieldMover<Move::get>& mover, Msg* msg, unsigned int announced) {
         staticList<Element>& elements = this->value();
         const unsigned int least = Element().GetByteSize();
         elements.realloc(std::min(announced, mover.rest() / least));
@@ -249,14 +249,14 @@ class RestOf : public ListOf<Element, name> {
 
     template <Move move>
     void transfer(FieldMover<move>& mover, Msg* msg, unsigned int) {
-        if constexpr (move == Move::Get)
+        if constexpr (move == Move::get)
             get(mover, msg);
         else
             this->put(mover, msg);
     }
 
   private:
-    void get(FieldMover<Move::Get>& mover, Msg* msg) {
+    void get(FieldMover<Move::get>& mover, Msg* msg) {
         this->value().realloc(mover.rest());
         for (Element& element : this->value()) {
             if (mover.rest() > 0)

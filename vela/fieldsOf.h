@@ -35,11 +35,11 @@ constexpr std::size_t fieldCount() {
 }  // namespace detail
 
 template <typename Row>
-inline constexpr std::size_t FieldCount = detail::fieldCount<std::remove_const_t<Row>>();
+inline constexpr std::size_t fieldCount = detail::fieldCount<std::remove_const_t<Row>>();
 
 template <typename Row>
 constexpr auto fieldsOf(Row& row) {
-    constexpr std::size_t n = FieldCount<Row>;
+    constexpr std::size_t n = fieldCount<Row>;
     static_assert(n <= 11, "a longer row needs a longer ladder here");
     // clang-format off
     if constexpr (n == 0) { return std::tie(); }
@@ -69,14 +69,14 @@ constexpr std::size_t valuesBefore() {
         return valuesBefore<Row, i - 1>() + (CountField<FieldAt<Row, i - 1>> ? 0 : 1);
 }
 template <typename Row>
-inline constexpr std::size_t ValueCount = valuesBefore<Row, FieldCount<Row>>();
+inline constexpr std::size_t valueCount = valuesBefore<Row, fieldCount<Row>>();
 
 // Whether a body can be bound to variables of these types: one for each field, or one for each field that is
 // no count.
 template <typename Row, typename... Variables>
 concept BindsTo = (sizeof...(Variables) > 0) &&
-                  (sizeof...(Variables) == FieldCount<Row> ||
-                   sizeof...(Variables) == ValueCount<Row>)&&(!std::is_base_of_v<Row, Variables> && ...);
+                  (sizeof...(Variables) == fieldCount<Row> ||
+                   sizeof...(Variables) == valueCount<Row>)&&(!std::is_base_of_v<Row, Variables> && ...);
 
 }  // namespace vela
 

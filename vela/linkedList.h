@@ -158,7 +158,7 @@ class keyedList : public virtualObject {
     // Null when the key is not present.
     V* find(const K& key) {
         const unsigned int i = indexOf(key);
-        return i == NoIndex ? nullptr : &entries_.element(i).value;
+        return i == noIndex ? nullptr : &entries_.element(i).value;
     }
 
     // Both throw OutOfBoundsError, with NoIndex, when the key is not present.
@@ -174,7 +174,7 @@ class keyedList : public virtualObject {
             if (entries_.element(i).key == key)
                 return i;
         }
-        return NoIndex;
+        return noIndex;
     }
 
     linkedList<keyLink<K, V>> entries_;

@@ -16,7 +16,7 @@
 namespace vela {
 
 // The index in an OutOfBoundsError about a key that is not in the container.
-inline constexpr unsigned int NoIndex = 0xFFFFFFFFU;
+inline constexpr unsigned int noIndex = 0xFFFFFFFFU;
 
 // Prints one element of a list: an object by its toStream, anything else with <<.
 template <typename T>

@@ -43,8 +43,8 @@ inline void reportInternalError() {
 }
 
 // The asterisks before and after longer reports.
-inline constexpr const char* BannerBegin = "\n********************************************";
-inline constexpr const char* BannerEnd = "********************************************\n";
+inline constexpr const char* bannerBegin = "\n********************************************";
+inline constexpr const char* bannerEnd = "********************************************\n";
 
 }  // namespace vela
 

@@ -14,19 +14,19 @@
 namespace vela {
 
 enum class WireType : std::uint32_t {
-    Signed8 = 0,
-    Signed16 = 1,
-    Word32 = 2,
-    Signed32 = 3,
-    Unsigned8 = 4,
-    Unsigned16 = 5,
-    Value32 = 6,
-    Unsigned32 = 7,
-    Text8 = 10,
-    Field32 = 17,
+    signed8 = 0,
+    signed16 = 1,
+    word32 = 2,
+    signed32 = 3,
+    unsigned8 = 4,
+    unsigned16 = 5,
+    value32 = 6,
+    unsigned32 = 7,
+    text8 = 10,
+    field32 = 17,
 };
 
-inline constexpr unsigned int MaxChunk = 255;  // elements that one descriptor can announce
+inline constexpr unsigned int maxChunk = 255;  // elements that one descriptor can announce
 
 constexpr std::uint32_t descriptor(WireType type, unsigned int count = 1) {
     return ((count - 1) << 11) | (static_cast<std::uint32_t>(type) << 19);
@@ -38,19 +38,19 @@ constexpr WireType descriptorType(std::uint32_t word) {
 
 constexpr unsigned int elementSize(WireType type) {
     switch (type) {
-        case WireType::Signed8:
-        case WireType::Unsigned8:
-        case WireType::Text8:
+        case WireType::signed8:
+        case WireType::unsigned8:
+        case WireType::text8:
             return 1;
-        case WireType::Signed16:
-        case WireType::Unsigned16:
+        case WireType::signed16:
+        case WireType::unsigned16:
             return 2;
         default:
             return 4;
     }
 }
 
-enum class Move { Put, Get };
+enum class Move { put, get };
 
 // Moves the fields of one body and keeps the offset. Reading never goes outside the payload: a field that is
 // missing, in whole or in part, becomes 0, and the offset advances past it.
@@ -67,7 +67,7 @@ class FieldMover {
     template <typename... Fields>
     void scalars(Fields&... fields) {
         constexpr unsigned int size = (elementSize(Fields::wire) + ...);
-        if (move == Move::Put || rest() >= size)
+        if (move == Move::put || rest() >= size)
             call(size, sizeof...(Fields), std::tuple_cat(pair(descriptor(Fields::wire), &fields.value())...));
         else
             (scalarIfThere(fields), ...);
@@ -77,11 +77,11 @@ class FieldMover {
     // elements than the payload holds.
     template <typename T>
     void array(T* elements, unsigned int count, WireType type) {
-        if (move == Move::Get)
+        if (move == Move::get)
             count = std::min(count, rest() / elementSize(type));
         for (unsigned int at = 0; at < count;) {
-            const unsigned int odd = at == 0 ? count % MaxChunk : 0;
-            const unsigned int chunk = odd != 0 ? odd : MaxChunk;
+            const unsigned int odd = at == 0 ? count % maxChunk : 0;
+            const unsigned int chunk = odd != 0 ? odd : maxChunk;
             call(chunk * elementSize(type), 1, pair(descriptor(type, chunk), elements + at));
             at += chunk;
         }
@@ -90,7 +90,7 @@ class FieldMover {
     // Moves a body within this one, by its own writeMsg or readMsg.
     template <typename Message, typename NestedBody>
     void nested(Message* msg, NestedBody& body) {
-        offset_ = move == Move::Put ? body.writeMsg(msg, offset_) : body.readMsg(msg, offset_);
+        offset_ = move == Move::put ? body.writeMsg(msg, offset_) : body.readMsg(msg, offset_);
         first_ = false;
     }
 
@@ -120,7 +120,7 @@ class FieldMover {
         first_ = false;
     }
 
-    static constexpr auto transfer = move == Move::Put ? nvMsgVarFieldPut : nvMsgVarFieldGet;
+    static constexpr auto transfer = move == Move::put ? nvMsgVarFieldPut : nvMsgVarFieldGet;
 
     NvMsg32Bit* raw_;
     unsigned int offset_;

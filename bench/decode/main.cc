@@ -182,7 +182,7 @@ void measure(const Arguments& arguments) {
         round = firstRound(arguments);
         if (!round.empty()) {
             times.copying[i] = copy(round, round.size(), arguments);
-            times.copyingBlocks[i] = copy(round, app::Log::BlockSize, arguments);
+            times.copyingBlocks[i] = copy(round, app::Log::blockSize, arguments);
         }
     }
     const double frames = static_cast<double>(records.size() * arguments.repeat);

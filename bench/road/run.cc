@@ -214,7 +214,7 @@ class Measurement {
             return;
         if (start_ == 0)
             begin(now);
-        if (now - lastLook_ > LookEveryNs || logged_ == wanted_)
+        if (now - lastLook_ > lookEveryNs || logged_ == wanted_)
             look(now);
         if (logged_ == wanted_)
             finish(now);
@@ -240,7 +240,7 @@ class Measurement {
         traced_.typeQuit();
     }
 
-    static constexpr std::int64_t LookEveryNs = 20000000;
+    static constexpr std::int64_t lookEveryNs = 20000000;
 
     Run run_;
     std::uint64_t wanted_;

@@ -13,7 +13,7 @@
 
 namespace {
 
-constexpr std::uint32_t EvtDetected = 32;
+constexpr std::uint32_t evtDetected = 32;
 
 bench::Stamps* stamps = nullptr;
 
@@ -23,7 +23,7 @@ bench::Stamps* stamps = nullptr;
 uint32_t nvMsgRead(uint32_t queue, uint32_t zero, NvMsg32Bit** msg) {
     static const auto real = reinterpret_cast<decltype(&nvMsgRead)>(dlsym(RTLD_NEXT, "nvMsgRead"));
     const uint32_t status = real(queue, zero, msg);
-    if (status == NVSTATUS_OK && stamps != nullptr && (*msg)->type == EvtDetected) {
+    if (status == NVSTATUS_OK && stamps != nullptr && (*msg)->type == evtDetected) {
         while (stamps->tooFarAhead())
             usleep(100);
         stamps->add(bench::nowNs());

@@ -54,8 +54,8 @@ TEST(Arrivals, AsManyAsTheQueueHoldsMayComeBeforeTheirTurn) {
     Arrivals arrivals;
     for (std::uint64_t round = 0; round < 5; ++round) {
         Numbers numbers, wanted;
-        for (std::uint64_t i = 1; i <= QueueCapacity; ++i)
-            wanted.push_back(round * QueueCapacity + i);
+        for (std::uint64_t i = 1; i <= queueCapacity; ++i)
+            wanted.push_back(round * queueCapacity + i);
         numbers.assign(wanted.rbegin(), wanted.rend());
         EXPECT_EQ(queued(arrivals, numbers), wanted);
     }

@@ -52,21 +52,21 @@ class OperatorTest : public testing::Test {
 
 TEST_F(OperatorTest, QEndsTheTraceAtOnce) {
     types("q\n");
-    EXPECT_EQ(awaitQuit(noteThePause), Ending::Asked);
+    EXPECT_EQ(awaitQuit(noteThePause), Ending::asked);
     EXPECT_EQ(pauses, std::vector<int>());
     EXPECT_EQ(unread(), "\n");
 }
 
 TEST_F(OperatorTest, EachOtherCharacterIsFollowedByAPauseOf10Seconds) {
     types("x\nq\n");
-    EXPECT_EQ(awaitQuit(noteThePause), Ending::Asked);
+    EXPECT_EQ(awaitQuit(noteThePause), Ending::asked);
     EXPECT_EQ(pauses, (std::vector<int>{10000, 10000}));
     EXPECT_EQ(unread(), "\n");
 }
 
 TEST_F(OperatorTest, ACapitalQIsAnotherCharacter) {
     types("Qq");
-    EXPECT_EQ(awaitQuit(noteThePause), Ending::Asked);
+    EXPECT_EQ(awaitQuit(noteThePause), Ending::asked);
     EXPECT_EQ(pauses, (std::vector<int>{10000}));
 }
 

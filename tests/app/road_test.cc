@@ -95,7 +95,7 @@ class Road : public ::testing::Test {
         fake_norv::reset();
         arrivals = std::make_shared<Arrivals>(bounds);
         ccs_ = std::make_unique<TracedCcs>(vela::CompDesc_t(1, 1, 1, 0x15, 0), nullptr);
-        ccs_->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0,
+        ccs_->asyncRegisterEvtGroup(vela::CCS::l2TraceGroup, vela::Handler::of<&HANDLE_L2Trace_events>(), 0,
                                     arrivals);
     }
     ~Road() override {
@@ -164,7 +164,7 @@ TEST_F(Road, WhileTheLogStallsTheReaderGoesOnAndNoFrameIsRefusedLostOrOutOfOrder
 
 TEST_F(Road, TheQueueHasRoomForEachRecordThatIsDelivered) {
     send(0, 500);  // nobody shows any
-    for (std::uint64_t seen = 0; seen < QueueCapacity;) {
+    for (std::uint64_t seen = 0; seen < queueCapacity;) {
         const std::lock_guard guard(queueGuard);
         seen = static_cast<std::uint64_t>(event_queue.queuecount());
     }
@@ -177,7 +177,7 @@ TEST_F(Road, TheQueueHasRoomForEachRecordThatIsDelivered) {
 // The queue has kept no nodes of earlier records, so each of the first ones needs memory.
 TEST_F(Road, AFrameForWhichTheQueueHasNoMemoryIsCountedAndTheLogSaysSo) {
     std::destroy_at(&event_queue);
-    std::construct_at(&event_queue, QueueCapacity);
+    std::construct_at(&event_queue, queueCapacity);
     refusedNodes = 2;
     send(0, 5);
     showAll();

@@ -19,7 +19,7 @@ template <typename BodyType>
 constexpr bool comesBack = !std::is_same_v<BodyType, vela::CCS::ieMessage_t>;
 
 void readsStayInside() {
-    for (const fake_norv::Call& call : fake_norv::calls(fake_norv::Op::VarFieldGet))
+    for (const fake_norv::Call& call : fake_norv::calls(fake_norv::Op::varFieldGet))
         fuzz::require(call.status == 0, "a body is read from its payload alone");
 }
 

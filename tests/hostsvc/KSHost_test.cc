@@ -12,7 +12,7 @@ using testing::ElementsAre;
 TEST(KSHost, StartUpMakesTheTransportReadyAndReturnsItsStatus) {
     fake_norv::reset();
     EXPECT_EQ(KSHostInit(), 0U);
-    fake_norv::fail(fake_norv::Op::SetInterface);
+    fake_norv::fail(fake_norv::Op::setInterface);
     EXPECT_EQ(KSHostInit(), NVSTATUS_ERROR);
     EXPECT_THAT(fake_norv::texts(), ElementsAre("nvDrvSetInterface(0, 0)", "nvDrvSetInterface(0, 0)"));
 }

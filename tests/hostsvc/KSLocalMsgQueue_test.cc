@@ -75,10 +75,10 @@ TEST_F(KSLocalMsgQueueTest, TheReaderIsWokenOnce) {
 TEST_F(KSLocalMsgQueueTest, ClosingWithoutMemoryForTheWakeUpClosesAllTheSame) {
     {
         const KSLocalMsgQueue queue({}, 0, 0);
-        fake_norv::fail(Op::Allocate);
+        fake_norv::fail(Op::allocate);
     }
     EXPECT_EQ(fake_norv::written().size(), 0U);
-    EXPECT_EQ(fake_norv::count(Op::Close), 1U);
+    EXPECT_EQ(fake_norv::count(Op::close), 1U);
 }
 
 TEST_F(KSLocalMsgQueueTest, ItWritesAndReadsMessages) {
@@ -89,51 +89,51 @@ TEST_F(KSLocalMsgQueueTest, ItWritesAndReadsMessages) {
     EXPECT_EQ(queue.msgWrite(msg.getMsgRef()), 0U);
     NvMsg32Bit* read = nullptr;
     EXPECT_EQ(queue.msgRead(&read), 0U);
-    EXPECT_EQ(fake_norv::calls(Op::Read).front().text, "nvMsgRead(100, 0)");
+    EXPECT_EQ(fake_norv::calls(Op::read).front().text, "nvMsgRead(100, 0)");
     KSMsgRef back(read);
     EXPECT_EQ(back.getMsgType(), 8U);
     EXPECT_EQ(back.getSize(), 3U);
     back.free();
 
-    fake_norv::fail(Op::Read);
+    fake_norv::fail(Op::read);
     EXPECT_EQ(queue.msgRead(&read), NVSTATUS_ERROR);
-    fake_norv::fail(Op::Write);
+    fake_norv::fail(Op::write);
     EXPECT_EQ(queue.msgWrite(KSMsgRef(0U).getMsgRef()), NVSTATUS_ERROR);
 }
 
 TEST_F(KSLocalMsgQueueTest, AnOpenThatFailsIsTriedOnceMoreWithSixtyMoreFiles) {
     allow(256);
-    fake_norv::fail(Op::Open);
+    fake_norv::fail(Op::open);
     const KSLocalMsgQueue queue({}, 0, 0);
     EXPECT_EQ(allowed(), 316U);
-    EXPECT_EQ(fake_norv::count(Op::Open), 2U);
+    EXPECT_EQ(fake_norv::count(Op::open), 2U);
 }
 
 TEST_F(KSLocalMsgQueueTest, ABindThatFailsIsTriedOnceMoreWithSixtyMoreFiles) {
     allow(256);
-    fake_norv::fail(Op::Bind);
+    fake_norv::fail(Op::bind);
     const KSLocalMsgQueue queue({}, 0, 0);
     EXPECT_EQ(allowed(), 316U);
-    EXPECT_EQ(fake_norv::count(Op::Bind), 2U);
+    EXPECT_EQ(fake_norv::count(Op::bind), 2U);
 }
 
 TEST_F(KSLocalMsgQueueTest, TheLimitGoesNoFurtherThanTheHardOne) {
     allow(before_.rlim_max);
-    fake_norv::fail(Op::Open);
+    fake_norv::fail(Op::open);
     const KSLocalMsgQueue queue({}, 0, 0);
     EXPECT_EQ(allowed(), before_.rlim_max);
 }
 
 TEST_F(KSLocalMsgQueueTest, ASecondOpenThatFailsThrows) {
     allow(256);
-    fake_norv::fail(Op::Open, 2);
+    fake_norv::fail(Op::open, 2);
     EXPECT_THROW(KSLocalMsgQueue({}, 0, 0), KSResource_CreationError);
     EXPECT_EQ(allowed(), 316U);
     EXPECT_THAT(fake_norv::texts(), ElementsAre("nvQueueOpen()", "nvQueueOpen()"));
 }
 
 TEST_F(KSLocalMsgQueueTest, ASecondBindThatFailsClosesTheQueueAndThrows) {
-    fake_norv::fail(Op::Bind, 2);
+    fake_norv::fail(Op::bind, 2);
     EXPECT_THROW(KSLocalMsgQueue({}, 0, 0), KSResource_CreationError);
     EXPECT_THAT(fake_norv::texts(),
                 ElementsAre("nvQueueOpen()", "nvQueueBind(100)", "nvQueueBind(100)", "nvQueueClose(100)"));
@@ -144,7 +144,7 @@ TEST_F(KSLocalMsgQueueDeathTest, AnUnbindThatFailsEndsTheProcess) {
     EXPECT_EXIT(
         {
             const KSLocalMsgQueue queue({}, 0, 0);
-            fake_norv::fail(Op::Unbind);
+            fake_norv::fail(Op::unbind);
         },
         testing::KilledBySignal(SIGABRT),
         testing::HasSubstr("KSLocalMsgQueue:98: virtual KSLocalMsgQueue::~KSLocalMsgQueue(): Assertion "
@@ -156,7 +156,7 @@ TEST_F(KSLocalMsgQueueDeathTest, ACloseThatFailsEndsTheProcess) {
     EXPECT_EXIT(
         {
             const KSLocalMsgQueue queue({}, 0, 0);
-            fake_norv::fail(Op::Close);
+            fake_norv::fail(Op::close);
         },
         testing::KilledBySignal(SIGABRT),
         testing::HasSubstr("KSLocalMsgQueue:100: virtual KSLocalMsgQueue::~KSLocalMsgQueue(): Assertion "

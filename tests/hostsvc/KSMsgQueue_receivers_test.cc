@@ -52,7 +52,7 @@ TEST_F(KSMsgQueueReceiversTest, APlainCallbackAloneOwnsTheMessage) {
 TEST_F(KSMsgQueueReceiversTest, AReceiverReplacesThePlainCallbackAndTheReceiverBefore) {
     plainCalls = 0;
     Receiver other;
-    queue_->registerAsyncCallback(static_cast<KSAsyncMsgReceiver*>(&other), ReceiverMember);
+    queue_->registerAsyncCallback(static_cast<KSAsyncMsgReceiver*>(&other), receiverMember);
     queue_->registerAsyncCallback(notePlain);
     receive();
     event(1001);
@@ -73,7 +73,7 @@ TEST_F(KSMsgQueueReceiversTest, WithoutReceiverMessagesAreParkedOneAtATime) {
 TEST_F(KSMsgQueueReceiversTest, AReceiverThatComesLaterGetsTheParkedMessageAndTheOneThatWaitsForItsPlace) {
     event(1001);
     event(1002);
-    ASSERT_TRUE(fake_norv::waitForCalls(Op::Read, 2));  // the first is parked, the second waits
+    ASSERT_TRUE(fake_norv::waitForCalls(Op::read, 2));  // the first is parked, the second waits
     receive();
     ASSERT_TRUE(receiver_.waitFor(2));
     EXPECT_THAT(receiver_.types(), ElementsAre(1001, 1002));

@@ -16,10 +16,10 @@ class KSMsgQueueOverTheNetwork : public KSRemoteMsgQueueTest {
     std::pair<std::unique_ptr<KSMsgQueue>, Connection> openMailbox() const {
         const std::string host = listener_.host();
         auto queue = std::async(std::launch::async,
-                                [&] { return std::make_unique<KSMsgQueue>(Asked, 512, 50, host.c_str()); });
+                                [&] { return std::make_unique<KSMsgQueue>(asked, 512, 50, host.c_str()); });
         Connection relay = listener_.accept();
-        relay.read(OpenRequestSize);
-        relay.write(Opened);
+        relay.read(openRequestSize);
+        relay.write(opened);
         return {queue.get(), std::move(relay)};
     }
 };
@@ -27,10 +27,10 @@ class KSMsgQueueOverTheNetwork : public KSRemoteMsgQueueTest {
 TEST_F(KSMsgQueueOverTheNetwork, ARequestGetsItsReply) {
     auto [queue, relay] = openMailbox();
     std::thread board([&relay = relay] {
-        relay.read(HeaderSize + 56);
-        relay.write(MessageFrame);
-        relay.read(HeaderSize);
-        relay.write(Closed);
+        relay.read(headerSize + 56);
+        relay.write(messageFrame);
+        relay.read(headerSize);
+        relay.write(closed);
     });
     KSMsgRef command(0U);
     command.setMsgType(8);
@@ -50,8 +50,8 @@ TEST_F(KSMsgQueueOverTheNetwork, ARequestThatCannotBeSentIsFreedAndTimesOut) {
     EXPECT_EQ(queue->request(tooLarge, 5, 9, 0).getMsgRef(), nullptr);
     EXPECT_EQ(fake_norv::outstanding(), 0U);
     std::thread board([&relay = relay] {
-        relay.read(HeaderSize);
-        relay.write(Closed);
+        relay.read(headerSize);
+        relay.write(closed);
     });
     queue.reset();
     board.join();
@@ -103,11 +103,11 @@ TEST_F(KSMsgQueueOverTheNetwork, DestructionWhileMessagesStreamInFindsTheAcknowl
         std::atomic<bool> asked{false};
         std::thread sender([&, &relay = relay] {
             while (!asked)
-                relay.write(MessageFrame);
-            relay.write(Closed);
+                relay.write(messageFrame);
+            relay.write(closed);
         });
         std::thread listener([&, &relay = relay] {
-            relay.read(HeaderSize);
+            relay.read(headerSize);
             asked = true;
         });
         queue->registerAsyncCallback([](KSMsgRef& msg) {

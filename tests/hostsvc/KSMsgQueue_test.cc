@@ -15,8 +15,8 @@
 
 // The two halves of a request by themselves: a requester that gives up at the last moment.
 struct KSMsgQueueProbe {
-    static void expect(KSMsgQueue& queue, unsigned transaction, unsigned replyType, NvCompDesc source) {
-        queue.expect({transaction, replyType, source, false});
+    static void expect(KSMsgQueue& queue, unsigned transaction, unsigned type, NvCompDesc source) {
+        queue.expect({transaction, type, source, false});
     }
     static void giveUp(KSMsgQueue& queue) { queue.giveUp(); }
     static bool waiting(KSMsgQueue& queue) {
@@ -32,58 +32,60 @@ using fake_norv::Op;
 using testing::ElementsAre;
 
 TEST_F(KSMsgQueueTest, ARequestIsSentUnderTheQueuesAddressAndReturnsItsReply) {
-    answers({{0, Reply, Board, {}, {}}});
-    EXPECT_EQ(ask(Soon), Reply);
+    answers({{0, replyType, boardAddress, {}, {}}});
+    EXPECT_EQ(ask(soon), replyType);
     const Message sent = fake_norv::written().at(0);
     EXPECT_TRUE(descComp(sent.source, queue_->getHostDesc()));
-    EXPECT_TRUE(descComp(sent.target, Board));
+    EXPECT_TRUE(descComp(sent.target, boardAddress));
     EXPECT_EQ(sent.transaction, 10000U);
-    EXPECT_EQ(sent.type, Command);
+    EXPECT_EQ(sent.type, commandType);
 }
 
 TEST_F(KSMsgQueueTest, RepliesOfTheGeneralTypeAndOfTypeZeroAnswerAnyRequest) {
-    answers({{0, 8388609, Board, {}, {}}});
-    EXPECT_EQ(ask(Soon), 0x800001U);
-    answers({{0, 0, Board, {}, {}}});
-    EXPECT_EQ(ask(Soon), 0U);
+    answers({{0, 8388609, boardAddress, {}, {}}});
+    EXPECT_EQ(ask(soon), 0x800001U);
+    answers({{0, 0, boardAddress, {}, {}}});
+    EXPECT_EQ(ask(soon), 0U);
 }
 
 TEST_F(KSMsgQueueTest, AMessageOfAnotherTypeOrTransactionIsNoReply) {
     receive();
-    answers({{0, Reply + 1, Board, {}, {}}, {10001, Reply, Board, {}, {}}, {0, Reply, Board, {}, {}}});
-    EXPECT_EQ(ask(Soon), Reply);
-    EXPECT_THAT(receiver_.types(), ElementsAre(Reply + 1, Reply));
+    answers({{0, replyType + 1, boardAddress, {}, {}},
+             {10001, replyType, boardAddress, {}, {}},
+             {0, replyType, boardAddress, {}, {}}});
+    EXPECT_EQ(ask(soon), replyType);
+    EXPECT_THAT(receiver_.types(), ElementsAre(replyType + 1, replyType));
 }
 
 TEST_F(KSMsgQueueTest, AReplyFromAnotherSourceCountsOnlyWhenAnySourceMayAnswer) {
     receive();
-    answers({{0, Reply, Elsewhere, {}, {}}});
-    EXPECT_EQ(ask(Soon, 1), Reply);
+    answers({{0, replyType, otherAddress, {}, {}}});
+    EXPECT_EQ(ask(soon, 1), replyType);
     EXPECT_THAT(receiver_.types(), ElementsAre());
     {
         SleeplessSystem system;
         EXPECT_EQ(ask(50), std::nullopt);
     }
     ASSERT_TRUE(receiver_.waitFor(1));
-    EXPECT_THAT(receiver_.types(), ElementsAre(Reply));
+    EXPECT_THAT(receiver_.types(), ElementsAre(replyType));
 }
 
 TEST_F(KSMsgQueueTest, ARequestWithoutTimeoutReturnsAFreshEmptyMessage) {
     receive();
-    answers({{0, Reply, Board, {}, {1, 2, 3}}});
+    answers({{0, replyType, boardAddress, {}, {1, 2, 3}}});
     KSMsgRef msg = command();
-    KSMsgRef back = queue_->request(msg, 0, Reply, 0);
+    KSMsgRef back = queue_->request(msg, 0, replyType, 0);
     EXPECT_EQ(back.getSize(), 0U);
-    EXPECT_NE(back.getMsgType(), Reply);
+    EXPECT_NE(back.getMsgType(), replyType);
     back.free();
     ASSERT_TRUE(receiver_.waitFor(1));
-    EXPECT_THAT(receiver_.types(), ElementsAre(Reply));
+    EXPECT_THAT(receiver_.types(), ElementsAre(replyType));
 }
 
 TEST_F(KSMsgQueueTest, ARequestWithoutTimeoutAndWithoutMemoryThrowsOnceItIsSent) {
     KSMsgRef msg = command();
-    fake_norv::fail(Op::Allocate);
-    EXPECT_THROW(queue_->request(msg, 0, Reply, 0), KSMsgRef::AllocationError);
+    fake_norv::fail(Op::allocate);
+    EXPECT_THROW(queue_->request(msg, 0, replyType, 0), KSMsgRef::AllocationError);
     EXPECT_EQ(fake_norv::written().size(), 1U);
 }
 
@@ -95,7 +97,7 @@ TEST_F(KSMsgQueueTest, ARequestThatNobodyAnswersPollsEveryTenMillisecondsAndRetu
 
 TEST_F(KSMsgQueueTest, ARequestThatTheTransportLosesTimesOut) {
     SleeplessSystem system;
-    fake_norv::fail(Op::Write);
+    fake_norv::fail(Op::write);
     EXPECT_EQ(ask(20), std::nullopt);
 }
 
@@ -105,17 +107,17 @@ TEST_F(KSMsgQueueTest, AReplyThatComesLateGoesToTheReceiver) {
         SleeplessSystem system;
         EXPECT_EQ(ask(10), std::nullopt);
     }
-    fake_norv::deliver(fake_norv::replyTo(fake_norv::written().at(0), Reply));
+    fake_norv::deliver(fake_norv::replyTo(fake_norv::written().at(0), replyType));
     ASSERT_TRUE(receiver_.waitFor(1));
-    EXPECT_THAT(receiver_.types(), ElementsAre(Reply));
-    answers({{0, Reply, Board, {}, {}}});
-    EXPECT_EQ(ask(Soon, 0, 10001), Reply);
+    EXPECT_THAT(receiver_.types(), ElementsAre(replyType));
+    answers({{0, replyType, boardAddress, {}, {}}});
+    EXPECT_EQ(ask(soon, 0, 10001), replyType);
 }
 
 // The reply of transaction 10000 has reached the slot just when its requester gave up.
 void leaveReplyBehind(KSMsgQueue& queue) {
-    KSMsgQueueProbe::expect(queue, 10000, Reply, Board);
-    fake_norv::deliver({10000, Reply, Board, queue.getHostDesc(), {}});
+    KSMsgQueueProbe::expect(queue, 10000, replyType, boardAddress);
+    fake_norv::deliver({10000, replyType, boardAddress, queue.getHostDesc(), {}});
     while (KSMsgQueueProbe::waiting(queue))
         std::this_thread::yield();
     KSMsgQueueProbe::giveUp(queue);
@@ -124,16 +126,16 @@ void leaveReplyBehind(KSMsgQueue& queue) {
 TEST_F(KSMsgQueueTest, AReplyGivenUpAtTheLastMomentGoesToTheReceiverDuringTheNextRequest) {
     receive();
     leaveReplyBehind(*queue_);
-    answers({{0, 0x800001, Board, {}, {}}});
-    EXPECT_EQ(ask(Soon, 0, 10001), 0x800001U);
-    EXPECT_THAT(receiver_.types(), ElementsAre(Reply));
+    answers({{0, 0x800001, boardAddress, {}, {}}});
+    EXPECT_EQ(ask(soon, 0, 10001), 0x800001U);
+    EXPECT_THAT(receiver_.types(), ElementsAre(replyType));
 }
 
 TEST_F(KSMsgQueueTest, AReplyGivenUpAtTheLastMomentIsParkedWhereThereIsNoReceiver) {
     leaveReplyBehind(*queue_);
-    answers({{0, 0x800001, Board, {}, {}}});
-    EXPECT_EQ(ask(Soon, 0, 10001), 0x800001U);
-    EXPECT_EQ(queue_->read(), Reply);
+    answers({{0, 0x800001, boardAddress, {}, {}}});
+    EXPECT_EQ(ask(soon, 0, 10001), 0x800001U);
+    EXPECT_EQ(queue_->read(), replyType);
 }
 
 TEST_F(KSMsgQueueTest, AReplyThatNobodyTookIsFreedWithTheQueue) {
@@ -151,10 +153,10 @@ TEST_F(KSMsgQueueTest, ARequestWithoutTimeoutDoesNotDisturbOneThatWaits) {
             KSMsgRef back = queue_->request(other, 0, 0, 0);
             nested = true;
             back.free();
-            fake_norv::deliver(fake_norv::replyTo(heard, Reply));
+            fake_norv::deliver(fake_norv::replyTo(heard, replyType));
         }
     });
-    EXPECT_EQ(ask(Soon), Reply);
+    EXPECT_EQ(ask(soon), replyType);
     EXPECT_TRUE(nested);
 }
 
@@ -162,7 +164,7 @@ TEST_F(KSMsgQueueTest, DestructionFreesTheParkedMessageAndTheOneThatWaitsForItsP
     event(1001);
     event(1002);
     event(1003);
-    ASSERT_TRUE(fake_norv::waitForCalls(Op::Read, 2));
+    ASSERT_TRUE(fake_norv::waitForCalls(Op::read, 2));
     queue_.reset();
     EXPECT_EQ(fake_norv::outstanding(), 0U);
 }
@@ -178,7 +180,7 @@ TEST_F(KSMsgQueueTest, DestructionWakesTheReaderAndClosesTheTransportsQueue) {
 TEST_F(KSMsgQueueTest, DestructionWithoutMemoryForTheWakeUpEndsTheReaderAllTheSame) {
     SleeplessSystem system;
     ASSERT_TRUE(fake_norv::waitForIdleReader());
-    fake_norv::fail(Op::Allocate, 2);
+    fake_norv::fail(Op::allocate, 2);
     queue_.reset();
     EXPECT_EQ(fake_norv::openQueues(), 0U);
     EXPECT_EQ(fake_norv::written().size(), 0U);
@@ -191,7 +193,7 @@ TEST_F(KSMsgQueueTest, DestructionWhileMessagesArriveLeavesNoneBehind) {
         const NvCompDesc host = queue_->getHostDesc();
         std::thread board([&] {
             while (!stop)
-                fake_norv::deliver({0, 1001, Board, host, {1, 2, 3}});
+                fake_norv::deliver({0, 1001, boardAddress, host, {1, 2, 3}});
         });
         ASSERT_TRUE(receiver_.waitFor(receiver_.types().size() + 1));
         queue_.reset();
@@ -213,7 +215,7 @@ TEST_F(KSMsgQueueTest, QueuesComeAndGo) {
 TEST_F(KSMsgQueueTest, AReadThatFailsIsAWakeUpAndNoMore) {
     receive();
     ASSERT_TRUE(fake_norv::waitForIdleReader());
-    fake_norv::fail(Op::Read, 3);
+    fake_norv::fail(Op::read, 3);
     event(1001);  // ends the read that is under way
     ASSERT_TRUE(receiver_.waitFor(1));
     event(1002);
@@ -224,7 +226,7 @@ TEST_F(KSMsgQueueTest, AReadThatFailsIsAWakeUpAndNoMore) {
 TEST_F(KSMsgQueueTest, ReadsThatKeepFailingArePaced) {
     SleeplessSystem system;
     ASSERT_TRUE(fake_norv::waitForIdleReader());
-    fake_norv::fail(Op::Read, 5);
+    fake_norv::fail(Op::read, 5);
     receive();
     event(1001);
     event(1002);
@@ -248,7 +250,7 @@ TEST_F(KSMsgQueueTest, NoReplyIsLostOrMistakenAroundTheTimeout) {
             changed.wait(held, [&] { return stop || !heard.empty(); });
             if (heard.empty())
                 return;
-            const Message answer = fake_norv::replyTo(heard.front(), Reply);
+            const Message answer = fake_norv::replyTo(heard.front(), replyType);
             heard.pop_front();
             held.unlock();
             fake_norv::deliver(answer);
@@ -256,7 +258,7 @@ TEST_F(KSMsgQueueTest, NoReplyIsLostOrMistakenAroundTheTimeout) {
     });
     fake_norv::onWrite([&](const Message& message) {
         const std::lock_guard held(lock);
-        if (message.type == Command)
+        if (message.type == commandType)
             heard.push_back(message);
         changed.notify_all();
     });
@@ -264,7 +266,7 @@ TEST_F(KSMsgQueueTest, NoReplyIsLostOrMistakenAroundTheTimeout) {
     std::size_t got = 0;
     for (unsigned i = 0; i < rounds; ++i) {
         KSMsgRef msg = command(10000 + i);
-        KSMsgRef back = queue_->request(msg, 10, Reply, 0);
+        KSMsgRef back = queue_->request(msg, 10, replyType, 0);
         if (back.getMsgRef() == nullptr)
             continue;
         EXPECT_EQ(back.getTrans(), 10000 + i);
@@ -286,7 +288,7 @@ TEST_F(KSMsgQueueTest, NoReplyIsLostOrMistakenAroundTheTimeout) {
 
 TEST(KSMsgQueueCreation, ATransportThatCannotBeOpenedThrows) {
     fake_norv::reset();
-    fake_norv::fail(Op::Open, 2);
+    fake_norv::fail(Op::open, 2);
     EXPECT_THROW(KSMsgQueue({}, 0, 0, nullptr), KSResource_CreationError);
     EXPECT_THROW(KSMsgQueue({}, 0, 0, "127.0.0.1:1"), KSResource_CreationError);
     EXPECT_EQ(fake_norv::openQueues(), 0U);
@@ -306,7 +308,7 @@ TEST(KSMsgQueueThreadCleanup, ItFreesTheMessageAndForgetsIt) {
     EXPECT_EQ(KSMsgQueueThread_Cleanup(&msg), nullptr);
     EXPECT_EQ(msg, nullptr);
     KSMsgQueueThread_Cleanup(&msg);
-    EXPECT_EQ(fake_norv::count(Op::Free), 1U);
+    EXPECT_EQ(fake_norv::count(Op::free), 1U);
 }
 
 }  // namespace

@@ -43,14 +43,14 @@ TEST_F(KSMsgRefTest, ASizedHandleHasABufferForABodyOfThatSize) {
 }
 
 TEST_F(KSMsgRefTest, AnAllocationThatFailsThrowsTheSize) {
-    fake_norv::fail(Op::Allocate);
+    fake_norv::fail(Op::allocate);
     try {
         const KSMsgRef msg(1234U);
         FAIL() << "no exception";
     } catch (const KSMsgRef::AllocationError& error) {
         EXPECT_EQ(error.size(), 1234U);
     }
-    fake_norv::fail(Op::Allocate);
+    fake_norv::fail(Op::allocate);
     EXPECT_THROW(KSMsgRef(1U), KSException);
 }
 
@@ -73,12 +73,12 @@ TEST_F(KSMsgRefTest, FreeingThroughOneCopyEmptiesThatOneAlone) {
     msg.free();
     EXPECT_EQ(msg.getMsgRef(), nullptr);
     EXPECT_NE(other.getMsgRef(), nullptr);
-    EXPECT_EQ(fake_norv::count(Op::Free), 1U);
+    EXPECT_EQ(fake_norv::count(Op::free), 1U);
 }
 
 TEST_F(KSMsgRefTest, FreeReturnsTheLibrarysStatus) {
     KSMsgRef msg(4U);
-    fake_norv::fail(Op::Free);
+    fake_norv::fail(Op::free);
     EXPECT_EQ(msg.free(), NVSTATUS_ERROR);
     EXPECT_EQ(msg.getMsgRef(), nullptr);
 }
@@ -135,7 +135,7 @@ TEST_F(KSMsgRefTest, ACloneOfAnEmptyBodyCopies48Octets) {
 
 TEST_F(KSMsgRefTest, ACloneWithoutMemoryThrowsAndLeavesTheOriginal) {
     KSMsgRef msg(9U);
-    fake_norv::fail(Op::Allocate);
+    fake_norv::fail(Op::allocate);
     EXPECT_THROW(msg.clone(), KSMsgRef::AllocationError);
     EXPECT_EQ(msg.getSize(), 9U);
     msg.free();
@@ -164,7 +164,7 @@ TEST_F(KSMsgRefTest, ReallocOfAnEmptyHandleAllocates) {
 TEST_F(KSMsgRefTest, AReallocThatFailsThrowsTheSizeAndKeepsTheBuffer) {
     KSMsgRef msg(4U);
     NvMsg32Bit* const before = msg.getMsgRef();
-    fake_norv::fail(Op::Reallocate);
+    fake_norv::fail(Op::reallocate);
     try {
         msg.realloc(4000);
         FAIL() << "no exception";
@@ -175,7 +175,7 @@ TEST_F(KSMsgRefTest, AReallocThatFailsThrowsTheSizeAndKeepsTheBuffer) {
     EXPECT_EQ(msg.getSize(), 4U);
     msg.free();
 
-    fake_norv::fail(Op::Allocate);
+    fake_norv::fail(Op::allocate);
     KSMsgRef empty;
     EXPECT_THROW(empty.realloc(4), KSMsgRef::AllocationError);
     EXPECT_EQ(empty.getMsgRef(), nullptr);
@@ -188,11 +188,11 @@ TEST_F(KSMsgRefTest, FixedFieldsGoThroughTheLibraryAndItsStatusComesBack) {
     value = 0;
     EXPECT_EQ(msg.fieldGet(3, &value), 0U);
     EXPECT_EQ(value, 1001U);
-    fake_norv::fail(Op::FieldGet);
-    fake_norv::fail(Op::FieldPut);
+    fake_norv::fail(Op::fieldGet);
+    fake_norv::fail(Op::fieldPut);
     EXPECT_EQ(msg.fieldGet(3, &value), NVSTATUS_ERROR);
     EXPECT_EQ(msg.fieldPut(3, &value), NVSTATUS_ERROR);
-    EXPECT_EQ(fake_norv::calls(Op::FieldPut).front().text, "nvMsgFieldPut(3)");
+    EXPECT_EQ(fake_norv::calls(Op::fieldPut).front().text, "nvMsgFieldPut(3)");
     msg.free();
 }
 

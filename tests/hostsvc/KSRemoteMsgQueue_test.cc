@@ -21,29 +21,29 @@ using testing::internal::GetCapturedStderr;
 TEST_F(KSRemoteMsgQueueTest, OpeningSendsTheAddressAndTheArgumentsAndTakesTheHostAddressFromTheReply) {
     auto making = std::async(std::launch::async, [this] { return make(); });
     Connection relay = listener_.accept();
-    EXPECT_EQ(withoutSendersWord(relay.read(OpenRequestSize)),
+    EXPECT_EQ(withoutSendersWord(relay.read(openRequestSize)),
               words({1003, 0, 28, 0, 0}) + words({1, 2, 3, 4, 1005, 512, 50}));
-    relay.write(Opened);
+    relay.write(opened);
     auto queue = making.get();
-    EXPECT_TRUE(descComp(queue->getHostDesc(), Given));
+    EXPECT_TRUE(descComp(queue->getHostDesc(), given));
     close(queue, relay);
 }
 
 TEST_F(KSRemoteMsgQueueTest, ANameWithAPortLeadsToTheRelayToo) {
     const std::string host = listener_.host("localhost");
     auto making = std::async(std::launch::async,
-                             [&] { return std::make_unique<KSRemoteMsgQueue>(Asked, 0, 0, host.c_str()); });
+                             [&] { return std::make_unique<KSRemoteMsgQueue>(asked, 0, 0, host.c_str()); });
     Connection relay = listener_.accept();
-    relay.read(OpenRequestSize);
-    relay.write(Opened);
+    relay.read(openRequestSize);
+    relay.write(opened);
     auto queue = making.get();
     close(queue, relay);
 }
 
 TEST_F(KSRemoteMsgQueueTest, WithoutARelayOpeningThrowsAndSaysWhy) {
     CaptureStderr();
-    EXPECT_THROW(KSRemoteMsgQueue(Asked, 0, 0, "127.0.0.1:1"), KSResource_CreationError);
-    EXPECT_THROW(KSRemoteMsgQueue(Asked, 0, 0, "no such name"), KSResource_CreationError);
+    EXPECT_THROW(KSRemoteMsgQueue(asked, 0, 0, "127.0.0.1:1"), KSResource_CreationError);
+    EXPECT_THROW(KSRemoteMsgQueue(asked, 0, 0, "no such name"), KSResource_CreationError);
     EXPECT_EQ(GetCapturedStderr(),
               "Cannot open a remote message queue on 127.0.0.1:1: Connection refused\n"
               "Cannot open a remote message queue on no such name: the name is unknown\n");
@@ -52,14 +52,14 @@ TEST_F(KSRemoteMsgQueueTest, WithoutARelayOpeningThrowsAndSaysWhy) {
 TEST_F(KSRemoteMsgQueueTest, ARelayThatRefusesMakesOpeningThrowAndIsNamed) {
     const std::string refused =
         "Cannot open a remote message queue on " + listener_.host() + ": refused by the relay\n";
-    for (const Octets& answer : {words({1001, 0, 20, 0, 0}) + words({11, 12, 13, 14, 15}), CloseRequest,
-                                 Closed, words({1002, 0, 16, 0, 0}) + words({11, 12, 13, 14}),
+    for (const Octets& answer : {words({1001, 0, 20, 0, 0}) + words({11, 12, 13, 14, 15}), closeRequest,
+                                 closed, words({1002, 0, 16, 0, 0}) + words({11, 12, 13, 14}),
                                  words({1002, 0, 102401, 0, 0}) + Octets(102401), words({0, 0, 0, 0, 0}),
                                  words({1002, 0, 0xFFFFFFFF, 0, 0})}) {
         CaptureStderr();
         auto making = std::async(std::launch::async, [this] { return make(); });
         Connection relay = listener_.accept();
-        relay.read(OpenRequestSize);
+        relay.read(openRequestSize);
         relay.write(answer);
         EXPECT_THROW(making.get(), KSResource_CreationError);
         EXPECT_TRUE(relay.ends());
@@ -68,11 +68,11 @@ TEST_F(KSRemoteMsgQueueTest, ARelayThatRefusesMakesOpeningThrowAndIsNamed) {
 }
 
 TEST_F(KSRemoteMsgQueueTest, ARelayThatClosesAfterAnyOctetOfItsAnswerMakesOpeningThrow) {
-    for (std::size_t n = 0; n < Opened.size(); ++n) {
+    for (std::size_t n = 0; n < opened.size(); ++n) {
         auto making = std::async(std::launch::async, [this] { return make(); });
         Connection relay = listener_.accept();
-        relay.read(OpenRequestSize);
-        relay.write({Opened.begin(), Opened.begin() + static_cast<long>(n)});
+        relay.read(openRequestSize);
+        relay.write({opened.begin(), opened.begin() + static_cast<long>(n)});
         relay.close();
         EXPECT_THROW(making.get(), KSResource_CreationError) << n;
     }
@@ -85,8 +85,8 @@ TEST_F(KSRemoteMsgQueueTest, ARelayThatDoesNotAnswerIsGivenUpAfterFiveSeconds) {
     system.insteadOfNapping = [&, wait = read.get_future().share()] { wait.wait(); };
     auto making = std::async(std::launch::async, [this] { return make(); });
     Connection relay = listener_.accept();
-    relay.read(OpenRequestSize);
-    relay.write({Opened.begin(), Opened.end() - 1});
+    relay.read(openRequestSize);
+    relay.write({opened.begin(), opened.end() - 1});
     read.set_value();
     EXPECT_THROW(making.get(), KSResource_CreationError);
     EXPECT_EQ(system.naps(), std::vector<long>(500, 10000));
@@ -100,12 +100,12 @@ TEST_F(KSRemoteMsgQueueTest, AMessageIsWrittenAsItsHeaderBlockAndItsBody) {
     msg.setMsgType(9);
     msg.setTrans(10000);
     msg.setSrcAddr({2, 1, 0, 1, 21, 0, 0});
-    msg.setTgtAddr(Given);
-    std::memcpy(msg.getMsgRef() + 1, Body.data(), Body.size());
+    msg.setTgtAddr(given);
+    std::memcpy(msg.getMsgRef() + 1, body.data(), body.size());
     EXPECT_EQ(queue->msgWrite(msg.getMsgRef()), 0U);
-    EXPECT_EQ(withoutSendersWord(relay.read(MessageFrame.size())), MessageFrame);
+    EXPECT_EQ(withoutSendersWord(relay.read(messageFrame.size())), messageFrame);
     EXPECT_EQ(fake_norv::outstanding(), 0U);
-    EXPECT_EQ(fake_norv::count(Op::Free), 1U);
+    EXPECT_EQ(fake_norv::count(Op::free), 1U);
     close(queue, relay);
 }
 
@@ -118,13 +118,13 @@ TEST_F(KSRemoteMsgQueueTest, AMessageThatCannotBeSentStaysTheCallers) {
     KSMsgRef other(0U);
     EXPECT_EQ(queue->msgWrite(other.getMsgRef()), 0U);  // the connection is as it was
     EXPECT_EQ(relay.read(4), words({1001}));
-    relay.read(HeaderSize - 4 + 56);
+    relay.read(headerSize - 4 + 56);
     close(queue, relay);
 }
 
 TEST_F(KSRemoteMsgQueueTest, AMessageIsReadIntoABufferOfItsOwn) {
     auto [queue, relay] = open();
-    relay.write(MessageFrame);
+    relay.write(messageFrame);
     NvMsg32Bit* read = nullptr;
     ASSERT_EQ(queue->msgRead(&read), 0U);
     KSMsgRef msg(read);
@@ -132,9 +132,9 @@ TEST_F(KSRemoteMsgQueueTest, AMessageIsReadIntoABufferOfItsOwn) {
     EXPECT_EQ(read->transaction & 0xFFU, 0x5AU);
     EXPECT_EQ(msg.getMsgType(), 9U);
     EXPECT_TRUE(descComp(msg.getSrcAddr(), {2, 1, 0, 1, 21, 0, 0}));
-    EXPECT_TRUE(descComp(msg.getTgtAddr(), Given));
+    EXPECT_TRUE(descComp(msg.getTgtAddr(), given));
     EXPECT_EQ(msg.getSize(), 3U);
-    EXPECT_EQ(std::memcmp(read + 1, Body.data(), 3), 0);
+    EXPECT_EQ(std::memcmp(read + 1, body.data(), 3), 0);
     msg.free();
     close(queue, relay);
 }
@@ -158,8 +158,8 @@ TEST_F(KSRemoteMsgQueueTest, AnyOtherTypeIsAMessageAndItsSizeIsThatOfItsBody) {
 
 TEST_F(KSRemoteMsgQueueTest, WithoutMemoryForAMessageItIsLostAndTheNextIsRead) {
     auto [queue, relay] = open();
-    relay.write(MessageFrame + MessageFrame);
-    fake_norv::fail(Op::Allocate);
+    relay.write(messageFrame + messageFrame);
+    fake_norv::fail(Op::allocate);
     NvMsg32Bit* read = nullptr;
     EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
     EXPECT_EQ(read, nullptr);
@@ -175,10 +175,10 @@ TEST_F(KSRemoteMsgQueueTest, ACloseRequestFromTheRelayIsAnErrorAndAGoodFrameStar
     CaptureStderr();
     for (int round = 0; round < 3; ++round) {
         for (int i = 0; i < 9; ++i) {
-            relay.write(CloseRequest);
+            relay.write(closeRequest);
             EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
         }
-        relay.write(MessageFrame);
+        relay.write(messageFrame);
         ASSERT_EQ(queue->msgRead(&read), 0U);
         KSMsgRef(read).free();
     }
@@ -205,9 +205,9 @@ TEST_F(KSRemoteMsgQueueTest, TenFailuresInARowAreReportedAndThrow) {
 }
 
 TEST_F(KSRemoteMsgQueueTest, ARelayThatClosesAfterAnyOctetOfAFrameIsAFailureAndWithinItsPartsAPause) {
-    for (std::size_t n = 0; n < MessageFrame.size(); ++n) {
+    for (std::size_t n = 0; n < messageFrame.size(); ++n) {
         auto [queue, relay] = open();
-        relay.write({MessageFrame.begin(), MessageFrame.begin() + static_cast<long>(n)});
+        relay.write({messageFrame.begin(), messageFrame.begin() + static_cast<long>(n)});
         relay.close();
         SleeplessSystem system;
         NvMsg32Bit other{};
@@ -215,8 +215,8 @@ TEST_F(KSRemoteMsgQueueTest, ARelayThatClosesAfterAnyOctetOfAFrameIsAFailureAndW
         CaptureStderr();
         EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR) << n;
         EXPECT_EQ(GetCapturedStderr(), errorLine());
-        EXPECT_EQ(read, n < HeaderSize ? &other : nullptr) << n;
-        EXPECT_EQ(system.sleeps(), std::vector<unsigned>(n < HeaderSize ? 0 : 1, 6)) << n;
+        EXPECT_EQ(read, n < headerSize ? &other : nullptr) << n;
+        EXPECT_EQ(system.sleeps(), std::vector<unsigned>(n < headerSize ? 0 : 1, 6)) << n;
         for (int i = 0; i < 8; ++i)
             queue->msgRead(&read);
         EXPECT_THROW(queue->msgRead(&read), KSRemoteService_ComFailure);
@@ -245,7 +245,7 @@ TEST_F(KSRemoteMsgQueueTest, FramesBeyondTheLimitAreErrors) {
 TEST_F(KSRemoteMsgQueueTest, AFrameOfNegativeSizeIsAnErrorAndTheNextOneIsRead) {
     auto [queue, relay] = open();
     SleeplessSystem system;
-    relay.write(words({1001, 0, 56, 0xFFFFFFFF, 0}) + MessageFrame);
+    relay.write(words({1001, 0, 56, 0xFFFFFFFF, 0}) + messageFrame);
     NvMsg32Bit* read = nullptr;
     CaptureStderr();
     EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
@@ -259,7 +259,7 @@ TEST_F(KSRemoteMsgQueueTest, AFrameOfNegativeSizeIsAnErrorAndTheNextOneIsRead) {
 TEST_F(KSRemoteMsgQueueTest, OneOctetAtATimeIsAFrameToo) {
     auto [queue, relay] = open();
     std::thread sender([&relay = relay] {
-        for (const std::uint8_t octet : MessageFrame)
+        for (const std::uint8_t octet : messageFrame)
             relay.write({octet});
     });
     NvMsg32Bit* read = nullptr;
@@ -276,9 +276,9 @@ TEST_F(KSRemoteMsgQueueTest, DestructionAsksTheRelayToCloseAndWaitsForItsAcknowl
         doomed.reset();
         gone = true;
     });
-    EXPECT_EQ(withoutSendersWord(relay.read(HeaderSize)), CloseRequest);
+    EXPECT_EQ(withoutSendersWord(relay.read(headerSize)), closeRequest);
     EXPECT_FALSE(gone);
-    relay.write(Closed);
+    relay.write(closed);
     destroyer.join();
     EXPECT_TRUE(relay.ends());
 }
@@ -288,22 +288,22 @@ TEST_F(KSRemoteMsgQueueTest, ARelayThatNeverAcknowledgesTheCloseDelaysItByFiveSe
     SleeplessSystem system;
     queue.reset();
     EXPECT_EQ(system.naps(), std::vector<long>(500, 10000));
-    EXPECT_EQ(withoutSendersWord(relay.read(HeaderSize)), CloseRequest);
+    EXPECT_EQ(withoutSendersWord(relay.read(headerSize)), closeRequest);
     EXPECT_TRUE(relay.ends());
 }
 
 TEST_F(KSRemoteMsgQueueTest, MessagesBeforeTheAcknowledgementAreDropped) {
     auto [queue, relay] = open();
-    relay.write(MessageFrame + CloseRequest + MessageFrame);
+    relay.write(messageFrame + closeRequest + messageFrame);
     close(queue, relay);
 }
 
 TEST_F(KSRemoteMsgQueueTest, AnAcknowledgementThatNobodyAskedForIsAnError) {
     auto [queue, relay] = open();
-    relay.write(Closed);
+    relay.write(closed);
     NvMsg32Bit* read = nullptr;
     EXPECT_EQ(queue->msgRead(&read), NVSTATUS_ERROR);
-    relay.write(MessageFrame);
+    relay.write(messageFrame);
     ASSERT_EQ(queue->msgRead(&read), 0U);
     KSMsgRef(read).free();
     close(queue, relay);

@@ -19,7 +19,7 @@ class KSThreadControlTest : public testing::Test {
 
     void push(Act& routine) { control_->pushCleanup(act, static_cast<void*>(&routine)); }
 
-    std::atomic<KSThreadStatus> status_{KSThreadStatus::Running};
+    std::atomic<KSThreadStatus> status_{KSThreadStatus::running};
     KSMutex lock_;
     std::string ran_;
     Act a_ = [this] { ran_ += 'a'; };
@@ -101,7 +101,7 @@ TEST_F(KSThreadControlTest, TestCancelOnAThreadOfAnyMakeRunsTheCleanUpsAndReleas
     push(a_);
     push(b_);
     lock_.lock();
-    status_ = KSThreadStatus::Stopped;
+    status_ = KSThreadStatus::stopped;
     Act after = [this] { ran_ += "went on"; };
     pthread_t thread{};
     Act body = [&] {

@@ -17,7 +17,7 @@ struct Case {
     const char* chosen;  // null: this machine
 };
 
-constexpr Case Cases[] = {
+constexpr Case cases[] = {
     {"nothing is named", nullptr, nullptr, nullptr, nullptr},
     {"nothing is named, this machine is", nullptr, nullptr, "alpha", nullptr},
     {"REMOTE_NORV alone is another machine", nullptr, "relay", nullptr, "relay"},
@@ -32,7 +32,7 @@ constexpr Case Cases[] = {
 };
 
 TEST(KSTransportChoice, AQueueIsRemoteWhenAHostIsNamedThatDoesNotBeginWithThisOne) {
-    for (const Case& each : Cases) {
+    for (const Case& each : cases) {
         SCOPED_TRACE(each.says);
         EXPECT_STREQ(ks_chooseHost(each.hostName, each.remoteNorv, each.host), each.chosen);
     }
@@ -54,10 +54,10 @@ class KSTransportOpening : public testing::Test {
 TEST_F(KSTransportOpening, TheEnvironmentIsAskedForTheHost) {
     setenv("REMOTE_NORV", "127.0.0.1:1", 1);  // where nobody listens
     EXPECT_THROW(ks_openTransport({}, 0, 0, nullptr), KSResource_CreationError);
-    EXPECT_EQ(fake_norv::count(fake_norv::Op::Open), 0U);
+    EXPECT_EQ(fake_norv::count(fake_norv::Op::open), 0U);
     setenv("HOST", "127.0.0.1", 1);
     EXPECT_NE(ks_openTransport({}, 0, 0, nullptr), nullptr);
-    EXPECT_EQ(fake_norv::count(fake_norv::Op::Open), 1U);
+    EXPECT_EQ(fake_norv::count(fake_norv::Op::open), 1U);
 }
 
 TEST_F(KSTransportOpening, AHostThatIsGivenComesBeforeTheEnvironment) {

@@ -14,11 +14,11 @@
 #include "hostsvc/KSMsgQueue.h"
 #include "tests/support/fake_norv.h"
 
-constexpr NvCompDesc Board{2, 1, 0, 1, 0x15, 0, 0};
-constexpr NvCompDesc Elsewhere{3, 1, 0, 1, 0x15, 0, 0};
-constexpr unsigned Command = 8;
-constexpr unsigned Reply = 9;
-constexpr unsigned Soon = 10000;  // ms; what is waited for comes at once
+constexpr NvCompDesc boardAddress{2, 1, 0, 1, 0x15, 0, 0};
+constexpr NvCompDesc otherAddress{3, 1, 0, 1, 0x15, 0, 0};
+constexpr unsigned commandType = 8;
+constexpr unsigned replyType = 9;
+constexpr unsigned soon = 10000;  // ms; what is waited for comes at once
 
 // Keeps the types of what it receives; frees the messages.
 class Receiver : public KSAsyncMsgReceiver {
@@ -48,7 +48,7 @@ class Receiver : public KSAsyncMsgReceiver {
     std::vector<unsigned> types_;
 };
 
-constexpr auto ReceiverMember = static_cast<KSMsgQueue::AsyncMember>(&Receiver::receive);
+constexpr auto receiverMember = static_cast<KSMsgQueue::AsyncMember>(&Receiver::receive);
 
 // Takes what is parked.
 class SynchronousQueue : public KSMsgQueue {
@@ -82,21 +82,21 @@ class KSMsgQueueTest : public testing::Test {
     }
 
     void receive() {
-        queue_->registerAsyncCallback(static_cast<KSAsyncMsgReceiver*>(&receiver_), ReceiverMember);
+        queue_->registerAsyncCallback(static_cast<KSAsyncMsgReceiver*>(&receiver_), receiverMember);
     }
 
     static KSMsgRef command(unsigned transaction = 10000) {
         KSMsgRef msg(0U);
-        msg.setMsgType(Command);
+        msg.setMsgType(commandType);
         msg.setTrans(transaction);
-        msg.setTgtAddr(Board);
+        msg.setTgtAddr(boardAddress);
         return msg;
     }
 
     // What came back: its type, or nothing. The message is freed.
     std::optional<unsigned> ask(unsigned timeoutMs, int anySource = 0, unsigned transaction = 10000) {
         KSMsgRef msg = command(transaction);
-        KSMsgRef back = queue_->request(msg, timeoutMs, Reply, anySource);
+        KSMsgRef back = queue_->request(msg, timeoutMs, replyType, anySource);
         EXPECT_EQ(msg.getMsgRef(), nullptr);
         if (back.getMsgRef() == nullptr)
             return std::nullopt;
@@ -106,13 +106,13 @@ class KSMsgQueueTest : public testing::Test {
     }
 
     void event(unsigned type) const {
-        EXPECT_TRUE(fake_norv::deliver({0, type, Board, queue_->getHostDesc(), {}}));
+        EXPECT_TRUE(fake_norv::deliver({0, type, boardAddress, queue_->getHostDesc(), {}}));
     }
 
     // Each command is answered with these messages, all of its transaction unless they have one.
     static void answers(std::vector<fake_norv::Message> with) {
         fake_norv::onWrite([with](const fake_norv::Message& heard) {
-            if (heard.type != Command)
+            if (heard.type != commandType)
                 return;
             for (fake_norv::Message message : with) {
                 message.transaction = message.transaction != 0 ? message.transaction : heard.transaction;

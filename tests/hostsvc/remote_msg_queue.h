@@ -24,19 +24,19 @@ using tcp::Octets;
 using tcp::operator+;
 using tcp::words;
 
-constexpr NvCompDesc Asked{1005, 2, 0, 3, 4, 1, 0};
-constexpr NvCompDesc Given{0x1234, 12, 0, 13, 14, 11, 0};
-constexpr std::size_t OpenRequestSize = 20 + 28;
-constexpr std::size_t HeaderSize = 20;
+constexpr NvCompDesc asked{1005, 2, 0, 3, 4, 1, 0};
+constexpr NvCompDesc given{0x1234, 12, 0, 13, 14, 11, 0};
+constexpr std::size_t openRequestSize = 20 + 28;
+constexpr std::size_t headerSize = 20;
 
-const Octets Opened = words({1002, 0, 20, 0, 0}) + words({11, 12, 13, 14, 0x1234});
-const Octets Closed = words({2001, 0, 0, 0, 0});
-const Octets CloseRequest = words({2000, 0, 0, 0, 0});
+const Octets opened = words({1002, 0, 20, 0, 0}) + words({11, 12, 13, 14, 0x1234});
+const Octets closed = words({2001, 0, 0, 0, 0});
+const Octets closeRequest = words({2000, 0, 0, 0, 0});
 
 // A message of type 9, transaction 10000 and low octet 0x5A, from 0.1.1.21.2 to Given, with a body of three.
-const Octets Block = words({0x5A, 10000, 9, 0, 1, 1, 11, 12, 13, 2, 21, 0x1234, 14, 3});
-const Octets Body{1, 2, 3};
-const Octets MessageFrame = words({1001, 0, 56, 3, 0}) + Block + Body;
+const Octets block = words({0x5A, 10000, 9, 0, 1, 1, 11, 12, 13, 2, 21, 0x1234, 14, 3});
+const Octets body{1, 2, 3};
+const Octets messageFrame = words({1001, 0, 56, 3, 0}) + block + body;
 
 inline Octets withoutSendersWord(Octets frame) {
     std::fill(frame.begin() + 16, frame.begin() + 20, 0);
@@ -58,23 +58,23 @@ class KSRemoteMsgQueueTest : public testing::Test {
     }
 
     std::unique_ptr<KSRemoteMsgQueue> make() const {
-        return std::make_unique<KSRemoteMsgQueue>(Asked, 512, 50, listener_.host().c_str());
+        return std::make_unique<KSRemoteMsgQueue>(asked, 512, 50, listener_.host().c_str());
     }
 
     // A queue, and its relay's end of the connection.
     std::pair<std::unique_ptr<KSRemoteMsgQueue>, Connection> open() const {
         auto queue = std::async(std::launch::async, [this] { return make(); });
         Connection relay = listener_.accept();
-        relay.read(OpenRequestSize);
-        relay.write(Opened);
+        relay.read(openRequestSize);
+        relay.write(opened);
         return {queue.get(), std::move(relay)};
     }
 
     // The queue goes, and the relay closes as it should.
     static void close(std::unique_ptr<KSRemoteMsgQueue>& queue, const Connection& relay) {
         std::thread other([&] {
-            relay.read(HeaderSize);
-            relay.write(Closed);
+            relay.read(headerSize);
+            relay.write(closed);
         });
         queue.reset();
         other.join();

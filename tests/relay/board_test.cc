@@ -20,8 +20,8 @@ namespace {
 using Octets = std::vector<unsigned char>;
 using Record = vela::CCS::EvtL2Trace_t;
 
-constexpr unsigned TraceParm = 10;
-constexpr unsigned ProtocolParm = 7;
+constexpr unsigned traceParm = 10;
+constexpr unsigned protocolParm = 7;
 
 // Keeps what it is shown.
 class Watcher : public vela::CallbackBase {
@@ -77,10 +77,10 @@ class BoardOver : public testing::TestWithParam<bool> {
 
 TEST_P(BoardOver, ParametersAreReadAndSet) {
     vela::StdResource::MsgGetParmCmplt_t reply;
-    ccs_->GetParm(ProtocolParm, &reply);
+    ccs_->GetParm(protocolParm, &reply);
     EXPECT_EQ(reply.Val, 7U);
-    ccs_->SetParm(TraceParm, 1, nullptr);
-    ccs_->GetParm(TraceParm, &reply);
+    ccs_->SetParm(traceParm, 1, nullptr);
+    ccs_->GetParm(traceParm, &reply);
     EXPECT_EQ(reply.Val, 1U);
 }
 
@@ -88,39 +88,39 @@ TEST_P(BoardOver, WhatTheBoardRefusesIsAnUnexpectedMessage) {
     EXPECT_THROW(ccs_->GetParm(4242, nullptr), vela::Addressable::UnexpectedMsg);
     EXPECT_THROW(board_->findComp(0x77, 1), vela::Addressable::UnexpectedMsg);
     vela::StdResource::MsgGetParmCmplt_t reply;
-    ccs_->GetParm(ProtocolParm, &reply);  // and the next is answered
+    ccs_->GetParm(protocolParm, &reply);  // and the next is answered
     EXPECT_EQ(reply.Val, 7U);
 }
 
 TEST_P(BoardOver, EventsReachTheirReceiver) {
     Watcher watcher;
-    ccs_->asyncRegisterEvtGroup(vela::CCS::L2TraceGroup, vela::Handler(&watcher, &Watcher::show), 0);
-    ccs_->DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
-    ccs_->SetParm(TraceParm, 1, nullptr);
+    ccs_->asyncRegisterEvtGroup(vela::CCS::l2TraceGroup, vela::Handler(&watcher, &Watcher::show), 0);
+    ccs_->DetectEvt(vela::CCS::l2TraceGroup, 0, nullptr);
+    ccs_->SetParm(traceParm, 1, nullptr);
     EXPECT_THAT(
         watcher.frames(3),
         testing::UnorderedElementsAre(Octets{0x00, 0x01, 0x7f}, Octets{0x00, 0x01, 0x73}, Octets(260, 0x55)));
-    ccs_->CancelEvt(vela::CCS::L2TraceGroup, nullptr);
+    ccs_->CancelEvt(vela::CCS::l2TraceGroup, nullptr);
     ccs_.reset();
 }
 
 TEST_P(BoardOver, AnEventIsWaitedFor) {
     softboard::reset(softboard::oneChannel({{true, 0, {0x00, 0x01, 0x7f}}}));
-    const auto waiter = ccs_->getNewEvtWait(vela::CCS::L2TraceGroup);
-    ccs_->DetectEvt(vela::CCS::L2TraceGroup, 0, nullptr);
-    ccs_->SetParm(TraceParm, 1, nullptr);
+    const auto waiter = ccs_->getNewEvtWait(vela::CCS::l2TraceGroup);
+    ccs_->DetectEvt(vela::CCS::l2TraceGroup, 0, nullptr);
+    ccs_->SetParm(traceParm, 1, nullptr);
     Record record;
     waiter->wait(&record, 30000);
     EXPECT_EQ(record.Direction, 1U);
     EXPECT_EQ(record.Length, 3U);
-    ccs_->CancelEvt(vela::CCS::L2TraceGroup, nullptr);
+    ccs_->CancelEvt(vela::CCS::l2TraceGroup, nullptr);
 }
 
 TEST_P(BoardOver, ObjectsComeAndGo) {
     for (int round = 0; round < 20; ++round) {
         vela::CCS other(ccs_->getTgtDesc(), nullptr);
         vela::StdResource::MsgGetParmCmplt_t reply;
-        other.GetParm(ProtocolParm, &reply);
+        other.GetParm(protocolParm, &reply);
         EXPECT_EQ(reply.Val, 7U);
     }
 }

@@ -20,7 +20,7 @@ using tcp::operator+;
 using tcp::words;
 using testing::HasSubstr;
 
-const Octets Block = words({0x5A, 10000, 9, 0, 1, 1, 11, 12, 13, 2, 21, 0x1234, 14, 3});
+const Octets block = words({0x5A, 10000, 9, 0, 1, 1, 11, 12, 13, 2, 21, 0x1234, 14, 3});
 
 FrameHeader parse(std::uint32_t dataSize, std::uint32_t extraSize) {
     const Octets octets = words({1001, 7, dataSize, extraSize, 0xDEADBEEF});
@@ -60,33 +60,33 @@ class RelayMessage : public testing::Test {
 };
 
 TEST_F(RelayMessage, GoesFromItsFrameIntoABufferAndBack) {
-    const Message msg = decodeMessage(frame(Block, {1, 2, 3}));
+    const Message msg = decodeMessage(frame(block, {1, 2, 3}));
     EXPECT_EQ(msg->transaction, 10000U << 8 | 0x5A);
     EXPECT_EQ(msg->type, 9U);
     EXPECT_TRUE(same(sourceOf(*msg), {2, 1, 0, 1, 21, 0, 0}));
     EXPECT_TRUE(same(targetOf(*msg), {0x1234, 12, 0, 13, 14, 11, 0}));
     EXPECT_EQ(msg->size, 3U);
-    EXPECT_EQ(encodeMessage(*msg), words({1001, 0, 56, 3, 0}) + Block + Octets({1, 2, 3}));
+    EXPECT_EQ(encodeMessage(*msg), words({1001, 0, 56, 3, 0}) + block + Octets({1, 2, 3}));
 }
 
 TEST_F(RelayMessage, ABlockOfAnotherSizeIsRefused) {
     for (const std::size_t size : {0, 4, 55, 57, 60}) {
-        Octets data = Block;
+        Octets data = block;
         data.resize(size);
         EXPECT_THROW(decodeMessage(frame(data, {1, 2, 3})), Ended) << size;
     }
 }
 
 TEST_F(RelayMessage, ABodyOfAnotherSizeThanAnnouncedIsRefused) {
-    EXPECT_THROW(decodeMessage(frame(Block, {1, 2})), Ended);
-    EXPECT_THROW(decodeMessage(frame(Block, {1, 2, 3, 4})), Ended);
+    EXPECT_THROW(decodeMessage(frame(block, {1, 2})), Ended);
+    EXPECT_THROW(decodeMessage(frame(block, {1, 2, 3, 4})), Ended);
 }
 
 TEST_F(RelayMessage, AWordThatDoesNotFitItsFieldIsRefused) {
     constexpr std::uint32_t most[] = {0xFF, 0xFFFFFF, 0xFFFFFFFF, 0xFF, 0xFF,   0xFF, 0xFF,
                                       0xFF, 0xFF,     0xFFFF,     0xFF, 0xFFFF, 0xFF};
     for (std::size_t i = 0; i < std::size(most); ++i) {
-        Octets data = Block;
+        Octets data = block;
         const Octets fits = words({most[i]});
         std::copy(fits.begin(), fits.end(), data.begin() + 4 * static_cast<long>(i));
         EXPECT_NE(decodeMessage(frame(data, {1, 2, 3})), nullptr) << i;
@@ -99,8 +99,8 @@ TEST_F(RelayMessage, AWordThatDoesNotFitItsFieldIsRefused) {
 }
 
 TEST_F(RelayMessage, WithoutMemoryItIsRefused) {
-    fake_norv::fail(fake_norv::Op::Allocate);
-    EXPECT_THROW(decodeMessage(frame(Block, {1, 2, 3})), Ended);
+    fake_norv::fail(fake_norv::Op::allocate);
+    EXPECT_THROW(decodeMessage(frame(block, {1, 2, 3})), Ended);
 }
 
 TEST_F(RelayMessage, AnAddressIsFiveWords) {

@@ -19,12 +19,12 @@ namespace {
 using fake_norv::Message;
 using testing::ElementsAre;
 
-constexpr NvCompDesc Board{2, 1, 0, 1, 0x15, 0, 0};
-constexpr NvCompDesc Elsewhere{3, 1, 0, 1, 0x15, 0, 0};
-constexpr unsigned Command = 8;
-constexpr unsigned Reply = 9;
-constexpr unsigned Event = 32;
-constexpr unsigned Soon = 30000;  // ms; what is waited for comes at once
+constexpr NvCompDesc boardAddress{2, 1, 0, 1, 0x15, 0, 0};
+constexpr NvCompDesc otherAddress{3, 1, 0, 1, 0x15, 0, 0};
+constexpr unsigned commandType = 8;
+constexpr unsigned replyType = 9;
+constexpr unsigned eventType = 32;
+constexpr unsigned soon = 30000;  // ms; what is waited for comes at once
 
 using Octets = std::vector<std::uint8_t>;
 
@@ -65,14 +65,14 @@ class Receiver : public KSAsyncMsgReceiver {
     std::vector<Octets> bodies_;
 };
 
-enum class Way { Local, Relay };
+enum class Way { local, relay };
 
 class Mailbox : public testing::TestWithParam<Way> {
   protected:
     Mailbox() {
         fake_norv::reset();
         unsetenv("HOST");
-        if (GetParam() == Way::Relay) {
+        if (GetParam() == Way::relay) {
             relay_.emplace();
             setenv("REMOTE_NORV", relay_->host().c_str(), 1);
         } else {
@@ -99,15 +99,15 @@ class Mailbox : public testing::TestWithParam<Way> {
         Octets body;
     };
 
-    std::optional<Answer> ask(unsigned timeoutMs = Soon, int anySource = 0, const Octets& body = {},
+    std::optional<Answer> ask(unsigned timeoutMs = soon, int anySource = 0, const Octets& body = {},
                               unsigned transaction = 10000) {
         KSMsgRef msg(static_cast<unsigned>(body.size()));
-        msg.setMsgType(Command);
+        msg.setMsgType(commandType);
         msg.setTrans(transaction);
-        msg.setTgtAddr(Board);
+        msg.setTgtAddr(boardAddress);
         if (!body.empty())
             std::memcpy(msg.getMsgRef() + 1, body.data(), body.size());
-        KSMsgRef back = queue_->request(msg, timeoutMs, Reply, anySource);
+        KSMsgRef back = queue_->request(msg, timeoutMs, replyType, anySource);
         if (back.getMsgRef() == nullptr)
             return std::nullopt;
         Answer answer{back.getMsgType(), back.getTrans(), back.getSrcAddr(), bodyOf(back)};
@@ -118,7 +118,7 @@ class Mailbox : public testing::TestWithParam<Way> {
     // Each command is answered with these, all of its transaction unless they have one.
     static void answers(const std::vector<Message>& with) {
         fake_norv::onWrite([with](const Message& heard) {
-            for (Message message : heard.type == Command ? with : std::vector<Message>()) {
+            for (Message message : heard.type == commandType ? with : std::vector<Message>()) {
                 message.transaction = message.transaction != 0 ? message.transaction : heard.transaction;
                 message.target = heard.source;
                 fake_norv::deliver(message);
@@ -127,7 +127,7 @@ class Mailbox : public testing::TestWithParam<Way> {
     }
 
     void event(unsigned type, const Octets& body = {}) const {
-        EXPECT_TRUE(fake_norv::deliver({0, type, Board, queue_->getHostDesc(), body}));
+        EXPECT_TRUE(fake_norv::deliver({0, type, boardAddress, queue_->getHostDesc(), body}));
     }
 
     Receiver receiver_;
@@ -136,60 +136,60 @@ class Mailbox : public testing::TestWithParam<Way> {
 };
 
 TEST_P(Mailbox, ARequestReachesItsTargetUnderTheQueuesAddressAndReturnsItsReply) {
-    answers({{0, Reply, Board, {}, {4, 5, 6}}});
-    const auto answer = ask(Soon, 0, {1, 2, 3});
+    answers({{0, replyType, boardAddress, {}, {4, 5, 6}}});
+    const auto answer = ask(soon, 0, {1, 2, 3});
     ASSERT_TRUE(answer);
-    EXPECT_EQ(answer->type, Reply);
+    EXPECT_EQ(answer->type, replyType);
     EXPECT_EQ(answer->transaction, 10000U);
-    EXPECT_TRUE(descComp(answer->source, Board));
+    EXPECT_TRUE(descComp(answer->source, boardAddress));
     EXPECT_EQ(answer->body, Octets({4, 5, 6}));
     const Message heard = fake_norv::written().at(0);
-    EXPECT_EQ(heard.type, Command);
+    EXPECT_EQ(heard.type, commandType);
     EXPECT_EQ(heard.transaction, 10000U);
     EXPECT_TRUE(descComp(heard.source, queue_->getHostDesc()));
-    EXPECT_TRUE(descComp(heard.target, Board));
+    EXPECT_TRUE(descComp(heard.target, boardAddress));
     EXPECT_EQ(heard.body, Octets({1, 2, 3}));
 }
 
 TEST_P(Mailbox, RepliesOfTheGeneralTypeAndOfTypeZeroAnswerAnyRequest) {
-    answers({{0, 0x800001, Board, {}, {}}});
+    answers({{0, 0x800001, boardAddress, {}, {}}});
     EXPECT_EQ(ask()->type, 0x800001U);
-    answers({{0, 0, Board, {}, {}}});
+    answers({{0, 0, boardAddress, {}, {}}});
     EXPECT_EQ(ask()->type, 0U);
 }
 
 TEST_P(Mailbox, MessagesOfAnotherTypeTransactionOrSourceAreNoReplies) {
-    answers({{0, Reply + 1, Board, {}, {}},
-             {10001, Reply + 2, Board, {}, {}},
-             {0, 0x800001, Elsewhere, {}, {}},
-             {0, Reply, Board, {}, {}}});
-    EXPECT_EQ(ask()->type, Reply);
-    EXPECT_THAT(receiver_.types(3), ElementsAre(Reply + 1, Reply + 2, 0x800001));
+    answers({{0, replyType + 1, boardAddress, {}, {}},
+             {10001, replyType + 2, boardAddress, {}, {}},
+             {0, 0x800001, otherAddress, {}, {}},
+             {0, replyType, boardAddress, {}, {}}});
+    EXPECT_EQ(ask()->type, replyType);
+    EXPECT_THAT(receiver_.types(3), ElementsAre(replyType + 1, replyType + 2, 0x800001));
 }
 
 TEST_P(Mailbox, AnySourceMayAnswerWhenItIsAllowed) {
-    answers({{0, Reply, Elsewhere, {}, {}}});
-    EXPECT_EQ(ask(Soon, 1)->type, Reply);
+    answers({{0, replyType, otherAddress, {}, {}}});
+    EXPECT_EQ(ask(soon, 1)->type, replyType);
 }
 
 TEST_P(Mailbox, ARequestThatNobodyAnswersEndsAndItsLateReplyGoesToTheReceiver) {
     EXPECT_FALSE(ask(20));
-    ASSERT_TRUE(fake_norv::waitForCalls(fake_norv::Op::Write, 1));
-    fake_norv::deliver(fake_norv::replyTo(fake_norv::written().at(0), Reply));
-    EXPECT_THAT(receiver_.types(1), ElementsAre(Reply));
+    ASSERT_TRUE(fake_norv::waitForCalls(fake_norv::Op::write, 1));
+    fake_norv::deliver(fake_norv::replyTo(fake_norv::written().at(0), replyType));
+    EXPECT_THAT(receiver_.types(1), ElementsAre(replyType));
 }
 
 TEST_P(Mailbox, ARequestWithoutTimeoutReturnsAFreshMessageAndItsReplyGoesToTheReceiver) {
-    answers({{0, Reply, Board, {}, {1, 2, 3}}});
+    answers({{0, replyType, boardAddress, {}, {1, 2, 3}}});
     EXPECT_EQ(ask(0)->body, Octets());
-    EXPECT_THAT(receiver_.types(1), ElementsAre(Reply));
+    EXPECT_THAT(receiver_.types(1), ElementsAre(replyType));
 }
 
 TEST_P(Mailbox, EventsComeWholeAndInOrder) {
     std::vector<unsigned> types;
     std::vector<Octets> bodies;
     for (unsigned i = 0; i < 300; ++i) {
-        types.push_back(Event + i);
+        types.push_back(eventType + i);
         bodies.emplace_back(i * 3 % 1000, static_cast<std::uint8_t>(i));
         event(types.back(), bodies.back());
     }
@@ -198,15 +198,15 @@ TEST_P(Mailbox, EventsComeWholeAndInOrder) {
 }
 
 TEST_P(Mailbox, RequestsAndEventsGoTogether) {
-    answers({{0, Reply, Board, {}, {}}});
+    answers({{0, replyType, boardAddress, {}, {}}});
     std::atomic<bool> stop{false};
     std::thread board([&] {
         const NvCompDesc host = queue_->getHostDesc();
         for (unsigned i = 0; i < 2000 && !stop; ++i)
-            fake_norv::deliver({0, Event, Board, host, {static_cast<std::uint8_t>(i)}});
+            fake_norv::deliver({0, eventType, boardAddress, host, {static_cast<std::uint8_t>(i)}});
     });
     for (unsigned i = 0; i < 50; ++i) {
-        const auto answer = ask(Soon, 0, {}, 20000 + i);
+        const auto answer = ask(soon, 0, {}, 20000 + i);
         ASSERT_TRUE(answer);
         EXPECT_EQ(answer->transaction, 20000 + i);
     }
@@ -220,8 +220,8 @@ TEST_P(Mailbox, RequestsAndEventsGoTogether) {
 
 TEST_P(Mailbox, TheLargestBodyGoesThrough) {
     const Octets large(102400, 0x42);
-    answers({{0, Reply, Board, {}, large}});
-    EXPECT_EQ(ask(Soon, 0, large)->body, large);
+    answers({{0, replyType, boardAddress, {}, large}});
+    EXPECT_EQ(ask(soon, 0, large)->body, large);
     EXPECT_EQ(fake_norv::written().at(0).body, large);
 }
 
@@ -230,8 +230,8 @@ TEST_P(Mailbox, QueuesComeAndGoAndHaveAddressesOfTheirOwn) {
     EXPECT_FALSE(descComp(other.getHostDesc(), queue_->getHostDesc()));
     for (int i = 0; i < 20; ++i)
         KSMsgQueue(NvCompDesc{}, 512, 5, nullptr);
-    answers({{0, Reply, Board, {}, {}}});
-    EXPECT_EQ(ask()->type, Reply);
+    answers({{0, replyType, boardAddress, {}, {}}});
+    EXPECT_EQ(ask()->type, replyType);
 }
 
 TEST_P(Mailbox, DestructionWhileEventsArriveLeavesNothingBehind) {
@@ -239,7 +239,7 @@ TEST_P(Mailbox, DestructionWhileEventsArriveLeavesNothingBehind) {
         std::atomic<bool> stop{false};
         std::thread board([&, host = queue_->getHostDesc()] {
             while (!stop)
-                fake_norv::deliver({0, Event, Board, host, {1, 2, 3}});
+                fake_norv::deliver({0, eventType, boardAddress, host, {1, 2, 3}});
         });
         receiver_.types(receiver_.types(0).size() + 1);
         queue_.reset();
@@ -251,8 +251,8 @@ TEST_P(Mailbox, DestructionWhileEventsArriveLeavesNothingBehind) {
     }
 }
 
-INSTANTIATE_TEST_SUITE_P(Over, Mailbox, testing::Values(Way::Local, Way::Relay), [](const auto& each) {
-    return std::string(each.param == Way::Local ? "TheLocalQueue" : "TheRelay");
+INSTANTIATE_TEST_SUITE_P(Over, Mailbox, testing::Values(Way::local, Way::relay), [](const auto& each) {
+    return std::string(each.param == Way::local ? "TheLocalQueue" : "TheRelay");
 });
 
 }  // namespace

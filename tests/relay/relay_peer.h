@@ -19,18 +19,18 @@ using tcp::Octets;
 using tcp::operator+;
 using tcp::words;
 
-constexpr std::size_t HeaderSize = 20;
-constexpr std::size_t BlockSize = 56;
+constexpr std::size_t headerSize = 20;
+constexpr std::size_t blockSize = 56;
 
-const Octets OpenRequest = words({1003, 0, 28, 0, 0}) + words({1, 2, 3, 4, 5, 512, 50});
-const Octets CloseRequest = words({2000, 0, 0, 0, 0});
-const Octets Closed = words({2001, 0, 0, 0, 0});
-const Octets Opened = words({1002, 0, 20, 0, 0}) + words({1, 2, 3, 4, 5});
+const Octets openRequest = words({1003, 0, 28, 0, 0}) + words({1, 2, 3, 4, 5, 512, 50});
+const Octets closeRequest = words({2000, 0, 0, 0, 0});
+const Octets closed = words({2001, 0, 0, 0, 0});
+const Octets opened = words({1002, 0, 20, 0, 0}) + words({1, 2, 3, 4, 5});
 
 // A command of type 8 to 0.1.1.21.2, under a source that is not the sender's.
 inline Octets command(std::uint32_t transaction, const Octets& body = {}) {
     const auto size = static_cast<std::uint32_t>(body.size());
-    return words({1001, 0, BlockSize, size, 0}) +
+    return words({1001, 0, blockSize, size, 0}) +
            words({0, transaction, 8, 9, 9, 9, 0, 1, 1, 9, 9, 2, 21, size}) + body;
 }
 
@@ -53,8 +53,8 @@ class RelayTest : public testing::Test {
     Connection connect() const { return Connection::to(relay_->port()); }
     Connection open() const {
         Connection host = connect();
-        host.write(OpenRequest);
-        EXPECT_EQ(host.read(Opened.size()).size(), Opened.size());
+        host.write(openRequest);
+        EXPECT_EQ(host.read(opened.size()).size(), opened.size());
         return host;
     }
 
@@ -67,8 +67,8 @@ class RelayTest : public testing::Test {
     void expectService() {
         fake_norv::onWrite(nullptr);
         Connection other = open();
-        other.write(CloseRequest);
-        EXPECT_EQ(other.read(HeaderSize), Closed);
+        other.write(closeRequest);
+        EXPECT_EQ(other.read(headerSize), closed);
         EXPECT_TRUE(other.ends());
     }
 

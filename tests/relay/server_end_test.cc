@@ -14,17 +14,17 @@ using RelayEndTest = RelayTest;
 
 TEST_F(RelayEndTest, ATransportThatRefusesAQueueEndsTheConnection) {
     start();
-    for (const Op op : {Op::Open, Op::Bind}) {
+    for (const Op op : {Op::open, Op::bind}) {
         fake_norv::fail(op);
         const Connection host = connect();
-        host.write(OpenRequest);
-        expectEnd(host, op == Op::Open ? "opens no more queues" : "binds no more queues");
+        host.write(openRequest);
+        expectEnd(host, op == Op::open ? "opens no more queues" : "binds no more queues");
     }
 }
 
 TEST_F(RelayEndTest, ATransportThatReadsNoMoreEndsTheConnection) {
     start();
-    fake_norv::fail(Op::Read);
+    fake_norv::fail(Op::read);
     const Connection host = open();
     expectEnd(host, "ended: the transport library reads no more");
 }
@@ -33,15 +33,15 @@ TEST_F(RelayEndTest, ATransportThatTakesNoMessageEndsTheConnection) {
     start();
     const Connection host = open();
     ASSERT_TRUE(fake_norv::waitForIdleReader());
-    fake_norv::fail(Op::Write);  // what is to come back when everything before it has been sent
-    host.write(CloseRequest);
+    fake_norv::fail(Op::write);  // what is to come back when everything before it has been sent
+    host.write(closeRequest);
     expectEnd(host, "ended: the transport library takes no message");
 }
 
 TEST_F(RelayEndTest, WithoutMemoryForAMessageTheConnectionEnds) {
     start();
     const Connection host = open();
-    fake_norv::fail(Op::Allocate);
+    fake_norv::fail(Op::allocate);
     host.write(command(1));
     expectEnd(host, "ended: the transport library has no memory for a message");
 }
@@ -50,7 +50,7 @@ TEST_F(RelayEndTest, WithoutMemoryToWakeItsThreadTheQueueIsGivenBackAllTheSame) 
     start();
     Connection host = open();
     ASSERT_TRUE(fake_norv::waitForIdleReader());
-    fake_norv::fail(Op::Allocate, 1);
+    fake_norv::fail(Op::allocate, 1);
     host.close();
     EXPECT_TRUE(relay_->logs("ended: the connection was closed"));
     expectService();
@@ -65,10 +65,10 @@ TEST_F(RelayEndTest, StoppingSendsWhatIsOnItsWayAndSaysThatTheRelayCloses) {
     const Connection host = open();
     const Connection unopened = connect();
     host.write(command(1) + command(2));
-    EXPECT_EQ(host.read(HeaderSize + BlockSize).size(), HeaderSize + BlockSize);
+    EXPECT_EQ(host.read(headerSize + blockSize).size(), headerSize + blockSize);
     relay_->stop();
-    EXPECT_EQ(host.read(HeaderSize + BlockSize).size(), HeaderSize + BlockSize);
-    EXPECT_EQ(host.read(HeaderSize), CloseRequest);
+    EXPECT_EQ(host.read(headerSize + blockSize).size(), headerSize + blockSize);
+    EXPECT_EQ(host.read(headerSize), closeRequest);
     EXPECT_TRUE(host.ends());
     EXPECT_TRUE(unopened.ends());
     EXPECT_EQ(connect().get(), -1);
@@ -92,7 +92,7 @@ TEST_F(RelayEndTest, DamagedFramesEndNoMoreThanTheirConnections) {
     options.patience.frame = std::chrono::milliseconds(200);
     options.maxClients = 1000;
     start(options);
-    const Octets good = OpenRequest + command(1, {1, 2, 3}) + command(2) + CloseRequest;
+    const Octets good = openRequest + command(1, {1, 2, 3}) + command(2) + closeRequest;
     std::mt19937 random(20240611);
     for (int round = 0; round < 400; ++round) {
         Octets octets = good;

@@ -26,7 +26,7 @@ TEST_F(RelayTest, AMessageIsWrittenUnderTheQueuesAddressAndItsReplyComesBack) {
     });
     const Connection host = open();
     host.write(command(10000, {1, 2, 3}));
-    EXPECT_EQ(host.read(HeaderSize + BlockSize + 2),
+    EXPECT_EQ(host.read(headerSize + blockSize + 2),
               words({1001, 0, 56, 2, 0}) + words({0x5A, 10000, 9, 0, 1, 1, 1, 2, 3, 2, 21, 5, 4, 2}) +
                   Octets({7, 8}));
     const fake_norv::Message heard = fake_norv::written().at(0);
@@ -43,9 +43,9 @@ TEST_F(RelayTest, EventsComeInOrderAndTheLargestFits) {
     for (const Octets& body : {Octets{1}, large, Octets{}})
         fake_norv::deliver({0, 32, {2, 1, 0, 1, 21, 0, 0}, {5, 2, 0, 3, 4, 1, 0}, body});
     for (const Octets& body : {Octets{1}, large, Octets{}}) {
-        const Octets frame = host.read(HeaderSize + BlockSize + body.size());
-        ASSERT_EQ(frame.size(), HeaderSize + BlockSize + body.size());
-        EXPECT_TRUE(std::equal(body.begin(), body.end(), frame.begin() + HeaderSize + BlockSize));
+        const Octets frame = host.read(headerSize + blockSize + body.size());
+        ASSERT_EQ(frame.size(), headerSize + blockSize + body.size());
+        EXPECT_TRUE(std::equal(body.begin(), body.end(), frame.begin() + headerSize + blockSize));
     }
 }
 
@@ -68,10 +68,10 @@ TEST_F(RelayTest, ACloseIsAcknowledgedBehindEverythingThatWasOnItsWay) {
         all = std::move(all) + command(10000 + i);
     host.write(all + words({2000, 43, 0, 0, 0}));
     for (std::uint32_t i = 0; i < 200; ++i) {
-        const Octets frame = host.read(HeaderSize + BlockSize);
-        ASSERT_EQ(Octets(frame.begin() + HeaderSize + 4, frame.begin() + HeaderSize + 8), words({10000 + i}));
+        const Octets frame = host.read(headerSize + blockSize);
+        ASSERT_EQ(Octets(frame.begin() + headerSize + 4, frame.begin() + headerSize + 8), words({10000 + i}));
     }
-    EXPECT_EQ(host.read(HeaderSize), words({2001, 43, 0, 0, 0}));
+    EXPECT_EQ(host.read(headerSize), words({2001, 43, 0, 0, 0}));
     EXPECT_TRUE(host.ends());
     EXPECT_TRUE(relay_->logs(": closed"));
 }
@@ -86,8 +86,8 @@ TEST_F(RelayTest, ClientsHaveQueuesOfTheirOwn) {
     const Connection two = open();
     one.write(command(1, {1}));
     two.write(command(2, {2}));
-    EXPECT_EQ(one.read(HeaderSize + BlockSize + 1).back(), 1);
-    EXPECT_EQ(two.read(HeaderSize + BlockSize + 1).back(), 2);
+    EXPECT_EQ(one.read(headerSize + blockSize + 1).back(), 1);
+    EXPECT_EQ(two.read(headerSize + blockSize + 1).back(), 2);
 }
 
 TEST_F(RelayTest, AMessageToTheQueueItselfComesBackWhateverItLooksLike) {
@@ -97,15 +97,15 @@ TEST_F(RelayTest, AMessageToTheQueueItselfComesBackWhateverItLooksLike) {
         words({1001, 0, 56, 0, 0}) + words({0x5A, 0xFFFFFF, 0, 1, 2, 3, 1, 2, 3, 5, 4, 5, 4, 0});
     host.write(asMark + asMark);
     EXPECT_EQ(host.read(2 * asMark.size()), asMark + asMark);
-    host.write(CloseRequest);
-    EXPECT_EQ(host.read(HeaderSize), Closed);
+    host.write(closeRequest);
+    EXPECT_EQ(host.read(headerSize), closed);
 }
 
 TEST_F(RelayTest, APeerThatClosesAfterAnyOctetGivesItsQueueBack) {
     relay::Options options;
     options.maxClients = 1000;  // more than there are octets: none is refused, however slow the ends are
     start(options);
-    const Octets all = OpenRequest + command(10000, {1, 2, 3}) + CloseRequest;
+    const Octets all = openRequest + command(10000, {1, 2, 3}) + closeRequest;
     for (std::size_t n = 0; n < all.size(); ++n) {
         Connection host = connect();
         host.write({all.begin(), all.begin() + static_cast<long>(n)});
@@ -122,7 +122,7 @@ TEST_F(RelayTest, AFirstFrameThatIsNoOpenRequestEndsTheConnection) {
         const char* why;
     } cases[] = {
         {command(1), "ended: a frame of type 1001 instead of 1003"},
-        {CloseRequest, "ended: a frame of type 2000 instead of 1003"},
+        {closeRequest, "ended: a frame of type 2000 instead of 1003"},
         {words({1003, 0, 24, 0, 0}) + Octets(24), "ended: an open request of 24 octets"},
         {words({1003, 0, 32, 0, 0}) + Octets(32), "ended: an open request of 32 octets"},
         {words({1003, 0, 102401, 0, 0}), "ended: a frame with a part of 102401 octets; the most is 102400"},
@@ -142,8 +142,8 @@ TEST_F(RelayTest, AFrameThatIsNoMessageEndsTheConnection) {
         Octets octets;
         const char* why;
     } cases[] = {
-        {OpenRequest, "ended: a frame of type 1003 instead of 1001"},
-        {Closed, "ended: a frame of type 2001 instead of 1001"},
+        {openRequest, "ended: a frame of type 1003 instead of 1001"},
+        {closed, "ended: a frame of type 2001 instead of 1001"},
         {words({1001, 0, 55, 0, 0}) + Octets(55), "ended: a header block of 55 octets"},
         {words({1001, 0, 56, 4, 0}) + Octets(60), "ended: a body of 4 octets that should have 0"},
         {words({1001, 0, 56, 0, 0}) + words({256}) + Octets(52), "ended: word 1 of a header block is 256"},
@@ -191,7 +191,7 @@ TEST_F(RelayTest, AHostThatWaitsForEventsMayBeSilent) {
     EXPECT_TRUE(silent.ends());  // its time is over; the other's would be too
     EXPECT_TRUE(silent.ends());
     fake_norv::deliver({0, 32, {}, {5, 2, 0, 3, 4, 1, 0}, {1}});
-    EXPECT_EQ(host.read(HeaderSize + BlockSize + 1).size(), HeaderSize + BlockSize + 1);
+    EXPECT_EQ(host.read(headerSize + blockSize + 1).size(), headerSize + blockSize + 1);
 }
 
 TEST_F(RelayTest, AHostThatTakesNothingIsEnded) {
@@ -227,12 +227,12 @@ TEST_F(RelayTest, MoreClientsThanAllowedAreRefusedUntilOneGoes) {
     const Connection two = open();
     EXPECT_TRUE(connect().ends());
     EXPECT_TRUE(relay_->logs("refused: 2 clients already"));
-    one.write(CloseRequest);
-    EXPECT_TRUE(one.read(HeaderSize) == Closed && one.ends());
+    one.write(closeRequest);
+    EXPECT_TRUE(one.read(headerSize) == closed && one.ends());
     for (bool served = false; !served;) {  // once it has been noticed that one has gone
         const Connection three = connect();
-        three.write(OpenRequest);
-        served = three.read(Opened.size()).size() == Opened.size();
+        three.write(openRequest);
+        served = three.read(opened.size()).size() == opened.size();
     }
 }
 

@@ -36,8 +36,8 @@ void reset() {
     s.mostOctets = SIZE_MAX;
     s.firstOffsetStaysZero = false;
     s.offsetsStayZero = false;
-    s.nextQueue = FirstQueue;
-    s.nextHost = FirstHost;
+    s.nextQueue = firstQueue;
+    s.nextHost = firstHost;
 }
 
 std::vector<Call> calls() {
@@ -56,7 +56,7 @@ std::size_t count(Op op) { return calls(op).size(); }
 std::vector<std::string> texts() {
     std::vector<std::string> all;
     for (const Call& call : calls()) {
-        if (call.op != Op::VarFieldGet && call.op != Op::VarFieldPut && call.op != Op::Read)
+        if (call.op != Op::varFieldGet && call.op != Op::varFieldPut && call.op != Op::read)
             all.push_back(call.text);
     }
     return all;

@@ -21,26 +21,26 @@ namespace fake_norv {
 
 // The names of the transport's functions in records and faults.
 enum class Op {
-    SetInterface,
-    Allocate,
-    Reallocate,
-    Free,
-    FieldGet,
-    FieldPut,
-    VarFieldGet,
-    VarFieldPut,
-    Open,
-    Bind,
-    Unbind,
-    Close,
-    Read,
-    Write
+    setInterface,
+    allocate,
+    reallocate,
+    free,
+    fieldGet,
+    fieldPut,
+    varFieldGet,
+    varFieldPut,
+    open,
+    bind,
+    unbind,
+    close,
+    read,
+    write
 };
 
 // What a new buffer holds for the library's own use: the low octet of the transaction word, and each of the
 // 24 octets after the body.
-inline constexpr std::uint8_t LowOctet = 0x5A;
-inline constexpr std::uint8_t TailOctet = 0xE7;
+inline constexpr std::uint8_t lowOctet = 0x5A;
+inline constexpr std::uint8_t tailOctet = 0xE7;
 
 // A message as scripts see it.
 struct Message {

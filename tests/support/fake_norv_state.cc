@@ -48,9 +48,9 @@ NvMsg32Bit* newBuffer(State& s, std::uint32_t size) {
     auto* const msg = static_cast<NvMsg32Bit*>(std::calloc(1, whole));
     if (msg == nullptr)
         return nullptr;
-    msg->transaction = LowOctet;
+    msg->transaction = lowOctet;
     msg->size = size;
-    std::fill(octets(msg) + NVMSG_HEADER_SIZE + size, octets(msg) + whole, TailOctet);
+    std::fill(octets(msg) + NVMSG_HEADER_SIZE + size, octets(msg) + whole, tailOctet);
     s.buffers[msg] = Buffer();
     return msg;
 }
@@ -102,7 +102,7 @@ Message seen(NvMsg32Bit* msg) {
 }
 
 void fill(NvMsg32Bit* msg, const Message& from) {
-    msg->transaction = (from.transaction << 8) | LowOctet;
+    msg->transaction = (from.transaction << 8) | lowOctet;
     msg->type = from.type;
     msg->sourceInstance = from.source.instance;
     msg->sourceBoard = from.source.board;

@@ -18,10 +18,10 @@
 
 namespace fake_norv {
 
-inline constexpr std::uint32_t Done = NVSTATUS_OK;
-inline constexpr std::uint32_t Failed = NVSTATUS_ERROR;
-inline constexpr std::uint32_t FirstQueue = 100;
-inline constexpr NvCompDesc FirstHost{0x1001, 9, 0, 8, 7, 6, 0};
+inline constexpr std::uint32_t done = NVSTATUS_OK;
+inline constexpr std::uint32_t failed = NVSTATUS_ERROR;
+inline constexpr std::uint32_t firstQueue = 100;
+inline constexpr NvCompDesc firstHost{0x1001, 9, 0, 8, 7, 6, 0};
 
 struct Fault {
     unsigned after = 0;
@@ -53,8 +53,8 @@ struct State {
     std::size_t mostOctets = SIZE_MAX;
     bool firstOffsetStaysZero = false;
     bool offsetsStayZero = false;
-    std::uint32_t nextQueue = FirstQueue;
-    NvCompDesc nextHost = FirstHost;
+    std::uint32_t nextQueue = firstQueue;
+    NvCompDesc nextHost = firstHost;
 };
 
 State& state();

@@ -32,14 +32,14 @@ namespace {
 std::atomic<unsigned long> taken = 0;
 
 bool isTraceEvent(const NvMsg32Bit& msg) {
-    constexpr std::uint32_t EvtDetected = 32;
-    constexpr std::uint32_t TraceGroup = 2;
-    constexpr std::uint8_t Ccs = 0x15;
+    constexpr std::uint32_t evtDetected = 32;
+    constexpr std::uint32_t traceGroup = 2;
+    constexpr std::uint8_t ccs = 0x15;
     std::uint32_t group = 0;
-    if (msg.type != EvtDetected || msg.size < sizeof group)
+    if (msg.type != evtDetected || msg.size < sizeof group)
         return false;
     std::memcpy(&group, &msg + 1, sizeof group);
-    return group == TraceGroup && msg.sourceInstance == 1 && msg.sourceComponent == Ccs;
+    return group == traceGroup && msg.sourceInstance == 1 && msg.sourceComponent == ccs;
 }
 
 std::string answerTo(const std::string& line) {

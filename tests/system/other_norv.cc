@@ -37,15 +37,15 @@ using body_fields::Field;
 using Octets = std::vector<unsigned char>;
 
 enum : std::uint32_t {
-    Error = 0,
-    GetParm = 18,
-    DetectEvt = 22,
-    EvtDetected = 32,
-    CompFind = 8388669,
-    ComponentResult = 8388615
+    error = 0,
+    getParm = 18,
+    detectEvt = 22,
+    evtDetected = 32,
+    compFind = 8388669,
+    componentResult = 8388615
 };
-constexpr std::uint32_t ProtocolType = 3;
-constexpr std::uint32_t OversizedFrame = 300;
+constexpr std::uint32_t protocolType = 3;
+constexpr std::uint32_t oversizedFrame = 300;
 
 std::string variable(const char* name) {
     const char* const value = std::getenv(name);
@@ -139,11 +139,11 @@ void sendEvents(const NvMsg32Bit& subscriber) {
     frame.insert(frame.end(), {0x00, 0x01, 0x7F});
     if (told("short")) {
         for (const std::size_t size : {4U, 8U, 11U, 12U, 16U, 17U})
-            reply(subscriber, EvtDetected,
+            reply(subscriber, evtDetected,
                   Octets(frame.begin(), frame.begin() + static_cast<std::ptrdiff_t>(size)));
     }
-    reply(subscriber, EvtDetected, frame);
-    reply(subscriber, EvtDetected, numbers({2, 0, 500, OversizedFrame}));
+    reply(subscriber, evtDetected, frame);
+    reply(subscriber, evtDetected, numbers({2, 0, 500, oversizedFrame}));
 }
 
 void answer(NvMsg32Bit& command) {
@@ -154,28 +154,28 @@ void answer(NvMsg32Bit& command) {
     }
     if (told("silent=" + std::to_string(command.type)))
         return;
-    if (command.type == DetectEvt && told("flood")) {
+    if (command.type == detectEvt && told("flood")) {
         for (int i = 0; i < 300; ++i)
-            reply(command, EvtDetected, numbers({2, 0, 500, 0}));
+            reply(command, evtDetected, numbers({2, 0, 500, 0}));
     }
     if (told("error=" + std::to_string(command.type))) {
-        reply(command, Error, numbers({command.type, 1001}));
+        reply(command, error, numbers({command.type, 1001}));
         return;
     }
     switch (command.type) {
-        case CompFind: {
+        case compFind: {
             Octets found(bodyOf(&command),
                          bodyOf(&command) + 6);  // instance, board, processor, component, node
             found[3] = 1;
             found[4] = found[0] == 0 ? 0x12 : 0x15;
-            reply(command, ComponentResult, found);
+            reply(command, componentResult, found);
             break;
         }
-        case GetParm:
-            reply(command, GetParm + 1, numbers({7, ProtocolType, 0}));
+        case getParm:
+            reply(command, getParm + 1, numbers({7, protocolType, 0}));
             break;
-        case DetectEvt:
-            reply(command, DetectEvt + 1, {});
+        case detectEvt:
+            reply(command, detectEvt + 1, {});
             sendEvents(command);
             break;
         default:

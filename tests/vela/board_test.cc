@@ -12,8 +12,8 @@ using vela::CompDesc_t;
 using vela::Instance;
 using vela::TmpInstance;
 
-constexpr std::uint32_t CompFind = 8388669, ComponentResult = 8388615, ResultComplete = 8388608;
-constexpr std::uint32_t CompUse = 8388697, CompUnuse = 8388698, CompInstFree = 8388673;
+constexpr std::uint32_t compFind = 8388669, componentResult = 8388615, resultComplete = 8388608;
+constexpr std::uint32_t compUse = 8388697, compUnuse = 8388698, compInstFree = 8388673;
 
 const CompDesc_t Managers(0, 3, 0, 0, 0);
 const CompDesc_t Found(2, 3, 1, 0x15, 0);
@@ -21,10 +21,10 @@ const CompDesc_t Found(2, 3, 1, 0x15, 0);
 class BoardTest : public TransportTest {
   protected:
     BoardTest() {
-        script_.answers(CompFind, ComponentResult, {2, 0, 3, 1, 0x15, 0});
-        script_.answers(CompUse, ResultComplete);
-        script_.answers(CompUnuse, ResultComplete);
-        script_.answers(CompInstFree, ResultComplete);
+        script_.answers(compFind, componentResult, {2, 0, 3, 1, 0x15, 0});
+        script_.answers(compUse, resultComplete);
+        script_.answers(compUnuse, resultComplete);
+        script_.answers(compInstFree, resultComplete);
     }
 
     // Types of what was sent to the managers since the last look, and the bodies' octets.
@@ -59,7 +59,7 @@ TEST_F(BoardTest, FindsAComponentByItsTypeOnAProcessor) {
     EXPECT_EQ(component.getMsgQueue(), board_.getMsgQueue());
     const std::vector<Message> messages = sent();
     ASSERT_EQ(messages.size(), 1U);
-    EXPECT_EQ(messages[0].type, CompFind);
+    EXPECT_EQ(messages[0].type, compFind);
     // Instance 0, board 3, processor 1, any component, node 0; one attribute: key 0, value 0x15.
     EXPECT_EQ(messages[0].body, (Octets{0, 0, 3, 1, 255, 0, 1, 0, 0, 0, 0, 0, 0, 0, 0x15, 0, 0, 0}));
 }
@@ -85,7 +85,7 @@ TEST_F(BoardTest, ASearchKeepsTheCallersAttributesAsTheyAre) {
 }
 
 TEST_F(BoardTest, ASearchThatFindsNothingIsAnUnexpectedReply) {
-    script_.answers(CompFind, 0, fake_norv::words({CompFind, 4}));
+    script_.answers(compFind, 0, fake_norv::words({compFind, 4}));
     EXPECT_THROW(board_.findComp(0x15, 1), vela::Addressable::UnexpectedMsg);
     EXPECT_THROW(board_.findInst(0x15, 1, 9), vela::Addressable::UnexpectedMsg);
 }
@@ -93,7 +93,7 @@ TEST_F(BoardTest, ASearchThatFindsNothingIsAnUnexpectedReply) {
 TEST_F(BoardTest, LooksBodiesUpWithBothManagers) {
     std::unique_ptr<vela::MsgBody> body(board_.MsgBodyLookup(8388691));
     EXPECT_NE(dynamic_cast<vela::ClusterMgr::ClusterFind_t*>(body.get()), nullptr);
-    body.reset(board_.MsgBodyLookup(CompFind));
+    body.reset(board_.MsgBodyLookup(compFind));
     EXPECT_NE(dynamic_cast<vela::ResourceMgr::CompFind_t*>(body.get()), nullptr);
     EXPECT_THROW(board_.MsgBodyLookup(8), vela::Addressable::UndefinedMsgBody);
     EXPECT_THROW(board_.EvtBodyLookup(2), vela::Addressable::UndefinedEvtBody);
@@ -108,7 +108,7 @@ TEST_F(BoardTest, MovesToAnotherQueueWithItsManagers) {
 
 TEST_F(BoardTest, ABoardThatCannotMoveToAQueueStaysWhereItWasWithItsManagers) {
     vela::MsgQueue* const own = board_.getMsgQueue();
-    fake_norv::fail(fake_norv::Op::Open, 2);
+    fake_norv::fail(fake_norv::Op::open, 2);
     EXPECT_THROW(board_.MsgQueueAttach(nullptr), KSResource_CreationError);
     EXPECT_EQ(board_.getMsgQueue(), own);
     EXPECT_EQ(board_.findComp(0x15, 1).getMsgQueue(), own);
@@ -127,14 +127,14 @@ TEST_F(BoardTest, AnInstanceMadeForUseReservesAndGivesBackOnce) {
         const Instance instance(Found, board_.getMsgQueue(), 1);
         const std::vector<Message> messages = sent();
         ASSERT_EQ(messages.size(), 1U);
-        EXPECT_EQ(messages[0].type, CompUse);
+        EXPECT_EQ(messages[0].type, compUse);
         // One entry: the address and a payload of 0.
         EXPECT_EQ(messages[0].body, (Octets{1, 0, 0, 0, 2, 0, 3, 1, 0x15, 0, 0, 0, 0, 0}));
         const Instance copy(instance);
     }
     const std::vector<Message> messages = sent();
     ASSERT_EQ(messages.size(), 1U) << "the copy reserved nothing";
-    EXPECT_EQ(messages[0].type, CompUnuse);
+    EXPECT_EQ(messages[0].type, compUnuse);
     EXPECT_EQ(messages[0].body, (Octets{1, 0, 0, 0, 2, 0, 3, 1, 0x15, 0}));
 }
 
@@ -150,26 +150,26 @@ TEST_F(BoardTest, InstancesThatReservedNothingSendNothing) {
         const TmpInstance made(resource);
         const Instance fromTemporary(temporary, 0);
     }
-    EXPECT_THAT(sentTypes(), testing::ElementsAre(CompFind));
+    EXPECT_THAT(sentTypes(), testing::ElementsAre(compFind));
 }
 
 TEST_F(BoardTest, AnInstanceMadeOfATemporaryOneMayReserve) {
     const TmpInstance temporary(Found, board_.getMsgQueue());
     { const Instance instance(temporary, 1); }
-    EXPECT_THAT(sentTypes(), testing::ElementsAre(CompUse, CompUnuse));
+    EXPECT_THAT(sentTypes(), testing::ElementsAre(compUse, compUnuse));
 }
 
 TEST_F(BoardTest, AnInstanceThatCannotBeReservedIsNotMade) {
-    script_.answers(CompUse, 0, fake_norv::words({CompUse, 1}));
+    script_.answers(compUse, 0, fake_norv::words({compUse, 1}));
     EXPECT_THROW(Instance(Found, board_.getMsgQueue(), 1), vela::Addressable::UnexpectedMsg);
-    EXPECT_THAT(sentTypes(), testing::ElementsAre(CompUse));
+    EXPECT_THAT(sentTypes(), testing::ElementsAre(compUse));
 }
 
 TEST_F(BoardTest, AnInstanceThatCannotBeGivenBackSaysSo) {
     CapturedErrors errors;
     {
         const Instance instance(Found, board_.getMsgQueue(), 1);
-        script_.answers(CompUnuse, 0, fake_norv::words({CompUnuse, 1}));
+        script_.answers(compUnuse, 0, fake_norv::words({compUnuse, 1}));
     }
     EXPECT_THAT(errors.text(), testing::HasSubstr("Addressable::UnexpectedMsg"));
 }
@@ -181,26 +181,26 @@ TEST_F(BoardTest, AnInstanceGivesBackWhatItReservedAndHasNotGivenBackItself) {
         void (*act)(vela::StdResource&);
         std::vector<std::uint32_t> sent;
     } cases[] = {
-        {"reserved", [](vela::StdResource& r) { r.use(1001); }, {CompUse, CompUnuse}},
+        {"reserved", [](vela::StdResource& r) { r.use(1001); }, {compUse, compUnuse}},
         {"reserved and given back",
          [](vela::StdResource& r) {
              r.use(1001);
              r.unuse();
          },
-         {CompUse, CompUnuse}},
+         {compUse, compUnuse}},
         {"reserved and freed",
          [](vela::StdResource& r) {
              r.use(1001);
              r.free();
          },
-         {CompUse, CompInstFree}},
+         {compUse, compInstFree}},
         {"reserved again",
          [](vela::StdResource& r) {
              r.use(1001);
              r.unuse();
              r.use(1002);
          },
-         {CompUse, CompUnuse, CompUse, CompUnuse}},
+         {compUse, compUnuse, compUse, compUnuse}},
     };
     for (const auto& c : cases) {
         {
@@ -212,19 +212,19 @@ TEST_F(BoardTest, AnInstanceGivesBackWhatItReservedAndHasNotGivenBackItself) {
 }
 
 TEST_F(BoardTest, AnInstanceThatTheBoardRefusesStaysAsItWas) {
-    script_.answers(CompUse, 0, fake_norv::words({CompUse, 1}));
-    script_.answers(CompInstFree, 0, fake_norv::words({CompInstFree, 1}));
+    script_.answers(compUse, 0, fake_norv::words({compUse, 1}));
+    script_.answers(compInstFree, 0, fake_norv::words({compInstFree, 1}));
     {
         Instance refused(Found, board_.getMsgQueue());
         EXPECT_THROW(refused.use(0), vela::Addressable::UnexpectedMsg);
     }
-    EXPECT_THAT(sentTypes(), testing::ElementsAre(CompUse)) << "nothing was reserved";
-    script_.answers(CompUse, ResultComplete);
+    EXPECT_THAT(sentTypes(), testing::ElementsAre(compUse)) << "nothing was reserved";
+    script_.answers(compUse, resultComplete);
     {
         Instance kept(Found, board_.getMsgQueue(), 1);
         EXPECT_THROW(kept.free(), vela::Addressable::UnexpectedMsg);
     }
-    EXPECT_THAT(sentTypes(), testing::ElementsAre(CompUse, CompInstFree, CompUnuse)) << "still reserved";
+    EXPECT_THAT(sentTypes(), testing::ElementsAre(compUse, compInstFree, compUnuse)) << "still reserved";
 }
 
 TEST_F(BoardTest, ATemporaryInstanceGivesNothingBackWhateverWasDoneWithIt) {
@@ -233,7 +233,7 @@ TEST_F(BoardTest, ATemporaryInstanceGivesNothingBackWhateverWasDoneWithIt) {
         temporary.use(1001);
         const TmpInstance copy(temporary);
     }
-    EXPECT_THAT(sentTypes(), testing::ElementsAre(CompUse));
+    EXPECT_THAT(sentTypes(), testing::ElementsAre(compUse));
 }
 
 TEST_F(BoardTest, AResourceIsUsedUnusedAndFreedThroughTheManager) {
@@ -244,7 +244,7 @@ TEST_F(BoardTest, AResourceIsUsedUnusedAndFreedThroughTheManager) {
     const std::vector<Message> messages = sent();
     ASSERT_EQ(messages.size(), 3U);
     EXPECT_EQ(messages[0].body, (Octets{1, 0, 0, 0, 2, 0, 3, 1, 0x15, 0, 0xE9, 3, 0, 0}));
-    EXPECT_EQ(messages[2].type, CompInstFree);
+    EXPECT_EQ(messages[2].type, compInstFree);
     EXPECT_EQ(messages[2].body, (Octets{2, 0, 3, 1, 0x15, 0}));
 }
 

@@ -108,7 +108,7 @@ TEST_F(BodyTest, AnAddressIs6Octets) {
     CompDesc_t address(0x0102, 3, 4, 5, 6);
     EXPECT_EQ(address.GetByteSize(), 6U);
     EXPECT_EQ(encoded(address), (Octets{2, 1, 3, 4, 5, 6}));
-    EXPECT_EQ(fieldCalls(fake_norv::Op::VarFieldPut),
+    EXPECT_EQ(fieldCalls(fake_norv::Op::varFieldPut),
               "@0 0x280000\n@2 0x200000 0x200000 0x200000 0x200000\n");
     CompDesc_t read;
     EXPECT_EQ(messageOf({2, 1, 3, 4, 5, 6})->read(&read, 0), 6U);
@@ -137,7 +137,7 @@ TEST_F(BodyTest, AnAddressConvertsToTheTransportsAndBack) {
 TEST_F(BodyTest, AnAttributeIsAnUnsignedKeyAndASignedValue) {
     vela::CompAttr_t attribute(0x01020304, -2);
     EXPECT_EQ(encoded(attribute), (Octets{4, 3, 2, 1, 0xFE, 0xFF, 0xFF, 0xFF}));
-    EXPECT_EQ(fieldCalls(fake_norv::Op::VarFieldPut), "@0 0x380000\n@4 0x180000\n");
+    EXPECT_EQ(fieldCalls(fake_norv::Op::varFieldPut), "@0 0x380000\n@4 0x180000\n");
 }
 
 TEST_F(BodyTest, AnErrorCarriesDataForTheParameterCommandsAlone) {

@@ -14,7 +14,7 @@ using EventReportTest = EventTest;
 
 // ---- What nobody registered for.
 
-constexpr const char* Stars = "********************************************\n";
+constexpr const char* stars = "********************************************\n";
 constexpr const char* For =
     "For {TgtDesc: {Node 0 Board 1 Processor 1 Component 21 Instance 1} "
     "HostDesc: {Node 6 Board 9 Processor 8 Component 7 Instance 4097}\n";
@@ -23,17 +23,17 @@ constexpr const char* Addresses =
     "Target: {Node 0x6 Board 0x9 Processor 0x8 Component 0x7 Instance 0x1001} ";
 
 std::string messageBanner(const std::string& type, const std::string& message) {
-    return std::string("\n") + Stars + "Unregisterd MsgType " + type + "\n" + For + message +
+    return std::string("\n") + stars + "Unregisterd MsgType " + type + "\n" + For + message +
            "You may specify your own handler for unregisted messages using\n"
            "Addressable::asyncUnregisteredMsgType\n" +
-           Stars + "\n";
+           stars + "\n";
 }
 
 std::string eventBanner(const std::string& group, const std::string& message) {
-    return std::string("\n") + Stars + "Unregisterd EventGroup " + group + "\n" + For + message +
+    return std::string("\n") + stars + "Unregisterd EventGroup " + group + "\n" + For + message +
            "You may specify your own handler for unregisted events using\n"
            "Addressable::asyncUnregisteredEvtGroup\n" +
-           Stars + "\n";
+           stars + "\n";
 }
 
 // A dispatcher with nothing in its tables.
@@ -90,25 +90,25 @@ TEST_F(EventReportTest, AnEventTooShortForAGroupIsOfGroup0) {
 }
 
 TEST_F(EventReportTest, AKeyWhoseLastCallbackWasCancelledIsUnregistered) {
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
-    ccs_->asyncCancelMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
-    ccs_->asyncUnregisteredMsgType(&Recorder::msgFunction, Inline);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, 0);
+    ccs_->asyncCancelMsgType(replyType, &recorder_, &Recorder::onMsg, 0);
+    ccs_->asyncUnregisteredMsgType(&Recorder::msgFunction, onDispatcher);
     ASSERT_TRUE(sendReply());
-    EXPECT_THAT(Recorder::functions().texts(1), ElementsAre(ReplyMessage));
+    EXPECT_THAT(Recorder::functions().texts(1), ElementsAre(replyMessage));
 }
 
 TEST_F(EventReportTest, TheDefaultsCanBeReplacedByFunctionsOrMembers) {
     ccs_->asyncUnregisteredMsgType(&Recorder::msgFunction, 0);
-    ccs_->asyncUnregisteredEvtGroup(&Recorder::msgFunction, Inline);
+    ccs_->asyncUnregisteredEvtGroup(&Recorder::msgFunction, onDispatcher);
     ASSERT_TRUE(sendReply());
-    EXPECT_THAT(Recorder::functions().texts(1), ElementsAre(ReplyMessage));
+    EXPECT_THAT(Recorder::functions().texts(1), ElementsAre(replyMessage));
     ASSERT_TRUE(sendTrace());
-    EXPECT_THAT(Recorder::functions().texts(2), ElementsAre(ReplyMessage, TraceMessage));
-    ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, Inline);
+    EXPECT_THAT(Recorder::functions().texts(2), ElementsAre(replyMessage, traceMessage));
+    ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, onDispatcher);
     ccs_->asyncUnregisteredEvtGroup(&recorder_, &Recorder::onMsg, 0);
     ASSERT_TRUE(sendReply());
     ASSERT_TRUE(sendTrace());
-    EXPECT_THAT(recorder_.texts(2), ElementsAre(ReplyMessage, TraceMessage));
+    EXPECT_THAT(recorder_.texts(2), ElementsAre(replyMessage, traceMessage));
     for (const Recorder::Entry& entry : recorder_.entries(2))
         EXPECT_EQ(entry.owner, ccs_.get());
     end();
@@ -139,16 +139,16 @@ TEST_F(EventReportTest, ACallbackThatThrowsIsReportedAndTheNextOneRuns) {
         {&throwsItsMessage, "(EvtCallback_Class287) genreal Exception caught from callback handler thread\n"},
     };
     std::string expected;
-    for (const unsigned int threadParam : {0U, Inline}) {
+    for (const unsigned int threadParam : {0U, onDispatcher}) {
         for (const auto& c : cases) {
             recorder_.clear();
-            ccs_->asyncRegisterMsgType(Reply, c.callback, threadParam);
+            ccs_->asyncRegisterMsgType(replyType, c.callback, threadParam);
             ASSERT_TRUE(sendReply());
-            ccs_->asyncCancelMsgType(Reply);
-            ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, threadParam);
+            ccs_->asyncCancelMsgType(replyType);
+            ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, threadParam);
             ASSERT_TRUE(sendReply());
-            EXPECT_THAT(recorder_.texts(1), ElementsAre(ReplyMessage));
-            ccs_->asyncCancelMsgType(Reply);
+            EXPECT_THAT(recorder_.texts(1), ElementsAre(replyMessage));
+            ccs_->asyncCancelMsgType(replyType);
             ASSERT_TRUE(fake_norv::waitForIdleReader());
             expected += c.report;
         }
@@ -163,11 +163,11 @@ TEST_F(EventReportTest, ACallbackThatThrowsIsReportedAndTheNextOneRuns) {
 TEST_F(EventReportTest, ABodyThatNoLookUpKnowsIsAnInternalErrorAndTheQueueGoesOn) {
     ccs_->asyncRegisterMsgType(1001, &recorder_, &Recorder::onBody, 0);
     ccs_->asyncRegisterEvtGroup(1002, &recorder_, &Recorder::onBody, 0);
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onBody, 0);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onBody, 0);
     ASSERT_TRUE(send(1001, {1, 2, 3}));
     ASSERT_TRUE(sendEvent(1002));
     ASSERT_TRUE(sendReply());
-    EXPECT_THAT(recorder_.texts(1), ElementsAre(ReplyBody));
+    EXPECT_THAT(recorder_.texts(1), ElementsAre(replyBody));
     end();
     EXPECT_EQ(errors_.text(),
               "(EvtCallback_Class214) vela internal error\nvela::Addressable::UndefinedMsgBody\n"
@@ -175,23 +175,23 @@ TEST_F(EventReportTest, ABodyThatNoLookUpKnowsIsAnInternalErrorAndTheQueueGoesOn
 }
 
 TEST_F(EventReportTest, ADeliveryThatTheSystemRefusesAThreadIsAnInternalError) {
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, 0);
     {
         const ThreadlessSystem none;
         ASSERT_TRUE(sendReply());
     }
     ASSERT_TRUE(sendReply());
-    EXPECT_THAT(recorder_.texts(1), ElementsAre(ReplyMessage));
+    EXPECT_THAT(recorder_.texts(1), ElementsAre(replyMessage));
     end();
     EXPECT_EQ(errors_.text(), "(EvtCallback_Class214) vela internal error\nvela::Thread::CreationError\n");
 }
 
 TEST_F(EventReportTest, ACopyThatThereIsNoMemoryForIsAnInternalErrorOfAnotherKind) {
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, Inline);
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, Inline);
-    fake_norv::fail(fake_norv::Op::Allocate, 1, 1);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, onDispatcher);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, onDispatcher);
+    fake_norv::fail(fake_norv::Op::allocate, 1, 1);
     ASSERT_TRUE(sendReply());
-    EXPECT_THAT(recorder_.texts(1), ElementsAre(ReplyMessage)) << "the first had its copy";
+    EXPECT_THAT(recorder_.texts(1), ElementsAre(replyMessage)) << "the first had its copy";
     end();
     EXPECT_EQ(errors_.text(), "(EvtCallback_Class219) vela internal error\n");
 }

@@ -68,13 +68,13 @@ class Recorder : public vela::EvtCallback::Callback {
 
 class EventTest : public TransportTest {
   protected:
-    static constexpr unsigned int Inline = vela::EvtCallback::OnDispatchingThread;
-    static constexpr unsigned int Reply = 19;  // a message type that has a body
+    static constexpr unsigned int onDispatcher = vela::EvtCallback::onDispatchingThread;
+    static constexpr unsigned int replyType = 19;  // a message type that has a body
     // What the callbacks are given of sendReply and sendTrace.
-    static constexpr const char* ReplyBody = "body 19 {Num 7 Val 1001 TextSize 0 Text {}}";
-    static constexpr const char* ReplyMessage = "message 19 12 octets";
-    static constexpr const char* TraceBody = "body 32 {Label 2 Direction 1 Timestamp 1003 Length 1 List {x}}";
-    static constexpr const char* TraceMessage = "message 32 17 octets";
+    static constexpr const char* replyBody = "body 19 {Num 7 Val 1001 TextSize 0 Text {}}";
+    static constexpr const char* replyMessage = "message 19 12 octets";
+    static constexpr const char* traceBody = "body 32 {Label 2 Direction 1 Timestamp 1003 Length 1 List {x}}";
+    static constexpr const char* traceMessage = "message 32 17 octets";
 
     EventTest() { Recorder::functions().clear(); }
 
@@ -85,7 +85,7 @@ class EventTest : public TransportTest {
                    {1001, type, ccs_->getTgtDesc().getNvCompDesc(), host().getNvCompDesc(), body}) &&
                fake_norv::waitForIdleReader();
     }
-    bool sendReply() { return send(Reply, fake_norv::words({7, 1001, 0})); }
+    bool sendReply() { return send(replyType, fake_norv::words({7, 1001, 0})); }
     bool sendEvent(std::uint32_t group, Octets data = {}) {
         Octets body = fake_norv::words({group});
         body.insert(body.end(), data.begin(), data.end());

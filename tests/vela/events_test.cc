@@ -15,42 +15,42 @@ using vela::MsgBody;
 class EvtCallbackTest : public EventTest {};
 
 TEST_F(EvtCallbackTest, AMessageTypeReachesEachFormOfCallback) {
-    for (const unsigned int threadParam : {0U, 1U << 20, Inline}) {
+    for (const unsigned int threadParam : {0U, 1U << 20, onDispatcher}) {
         recorder_.clear();
         Recorder::functions().clear();
-        ccs_->asyncRegisterMsgType(Reply, &Recorder::bodyFunction, threadParam);
-        ccs_->asyncRegisterMsgType(Reply, &Recorder::msgFunction, threadParam);
+        ccs_->asyncRegisterMsgType(replyType, &Recorder::bodyFunction, threadParam);
+        ccs_->asyncRegisterMsgType(replyType, &Recorder::msgFunction, threadParam);
         ASSERT_TRUE(sendReply());
-        EXPECT_THAT(Recorder::functions().texts(2), testing::UnorderedElementsAre(ReplyBody, ReplyMessage));
-        ccs_->asyncCancelMsgType(Reply);
-        ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onBody, threadParam);
-        ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, threadParam);
+        EXPECT_THAT(Recorder::functions().texts(2), testing::UnorderedElementsAre(replyBody, replyMessage));
+        ccs_->asyncCancelMsgType(replyType);
+        ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onBody, threadParam);
+        ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, threadParam);
         ASSERT_TRUE(sendReply());
-        EXPECT_THAT(recorder_.texts(2), testing::UnorderedElementsAre(ReplyBody, ReplyMessage));
-        ccs_->asyncCancelMsgType(Reply);
+        EXPECT_THAT(recorder_.texts(2), testing::UnorderedElementsAre(replyBody, replyMessage));
+        ccs_->asyncCancelMsgType(replyType);
     }
 }
 
 TEST_F(EvtCallbackTest, AnEventGroupReachesEachFormOfCallback) {
-    for (const unsigned int threadParam : {0U, 1U << 20, Inline}) {
+    for (const unsigned int threadParam : {0U, 1U << 20, onDispatcher}) {
         recorder_.clear();
         Recorder::functions().clear();
         ccs_->asyncRegisterEvtGroup(2, &Recorder::bodyFunction, threadParam);
         ccs_->asyncRegisterEvtGroup(2, &Recorder::msgFunction, threadParam);
         ASSERT_TRUE(sendTrace());
-        EXPECT_THAT(Recorder::functions().texts(2), testing::UnorderedElementsAre(TraceBody, TraceMessage));
+        EXPECT_THAT(Recorder::functions().texts(2), testing::UnorderedElementsAre(traceBody, traceMessage));
         ccs_->asyncCancelEvtGroup(2);
         ccs_->asyncRegisterEvtGroup(2, &recorder_, &Recorder::onBody, threadParam);
         ccs_->asyncRegisterEvtGroup(2, &recorder_, &Recorder::onMsg, threadParam);
         ASSERT_TRUE(sendTrace());
-        EXPECT_THAT(recorder_.texts(2), testing::UnorderedElementsAre(TraceBody, TraceMessage));
+        EXPECT_THAT(recorder_.texts(2), testing::UnorderedElementsAre(traceBody, traceMessage));
         ccs_->asyncCancelEvtGroup(2);
     }
 }
 
 TEST_F(EvtCallbackTest, TheCallbackIsGivenItsObject) {
     ccs_->asyncRegisterEvtGroup(2, &recorder_, &Recorder::onBody, 0);
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, Inline);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, onDispatcher);
     ASSERT_TRUE(sendReply());
     ASSERT_TRUE(sendTrace());
     for (const Recorder::Entry& entry : recorder_.entries(2))
@@ -72,7 +72,7 @@ TEST_F(EvtCallbackTest, AFunctionMayNameItsOwnKindsOfObjectAndBody) {
 TEST_F(EvtCallbackTest, InlineCallbacksRunInOrderOnTheQueuesThreadOthersOnTheirOwn) {
     Recorder second;
     for (Recorder* recorder : {&recorder_, &second, &recorder_})
-        ccs_->asyncRegisterMsgType(Reply, recorder, &Recorder::onMsg, Inline);
+        ccs_->asyncRegisterMsgType(replyType, recorder, &Recorder::onMsg, onDispatcher);
     ASSERT_TRUE(sendReply());
     ASSERT_TRUE(sendReply());
     const std::thread::id queue = recorder_.entries(4).at(0).thread;
@@ -110,10 +110,10 @@ class Sequence : public EvtCallback::Callback {
 TEST_F(EvtCallbackTest, InlineCallbacksRunInTheOrderOfTheirRegistration) {
     std::string order;
     Sequence a(order, 'a'), b(order, 'b'), c(order, 'c');
-    ccs_->asyncRegisterMsgType(Reply, &b, &Sequence::onMsg, Inline);
-    ccs_->asyncRegisterMsgType(Reply, &a, &Sequence::onBody, Inline);
-    ccs_->asyncRegisterMsgType(Reply, &c, &Sequence::onMsg, Inline);
-    ccs_->asyncRegisterMsgType(Reply, &b, &Sequence::onMsg, Inline);
+    ccs_->asyncRegisterMsgType(replyType, &b, &Sequence::onMsg, onDispatcher);
+    ccs_->asyncRegisterMsgType(replyType, &a, &Sequence::onBody, onDispatcher);
+    ccs_->asyncRegisterMsgType(replyType, &c, &Sequence::onMsg, onDispatcher);
+    ccs_->asyncRegisterMsgType(replyType, &b, &Sequence::onMsg, onDispatcher);
     ASSERT_TRUE(sendReply());
     end();
     EXPECT_EQ(order, "bacb");
@@ -131,43 +131,43 @@ class Louder : public Sequence {
 TEST_F(EvtCallbackTest, AVirtualMemberIsTheObjectsOwn) {
     std::string order;
     Louder louder(order, 'a');
-    ccs_->asyncRegisterMsgType(Reply, static_cast<Sequence*>(&louder), &Sequence::onMsg, Inline);
+    ccs_->asyncRegisterMsgType(replyType, static_cast<Sequence*>(&louder), &Sequence::onMsg, onDispatcher);
     ASSERT_TRUE(sendReply());
     end();
     EXPECT_EQ(order, "a!");
 }
 
 TEST_F(EvtCallbackTest, ASingleCallbackGetsTheReceivedMessageItself) {
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, 0);
     ASSERT_TRUE(sendReply());
     end();
-    EXPECT_EQ(fake_norv::count(fake_norv::Op::Free), 2U) << "the message, and the one that woke the reader";
-    EXPECT_EQ(fake_norv::count(fake_norv::Op::Allocate), 1U) << "the one that woke the reader";
+    EXPECT_EQ(fake_norv::count(fake_norv::Op::free), 2U) << "the message, and the one that woke the reader";
+    EXPECT_EQ(fake_norv::count(fake_norv::Op::allocate), 1U) << "the one that woke the reader";
 }
 
 TEST_F(EvtCallbackTest, SeveralCallbacksGetACopyEachAndTheReceivedMessageIsFreed) {
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, Inline);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, 0);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, onDispatcher);
     ASSERT_TRUE(sendReply());
-    EXPECT_THAT(recorder_.texts(2), ElementsAre(ReplyMessage, ReplyMessage));
+    EXPECT_THAT(recorder_.texts(2), ElementsAre(replyMessage, replyMessage));
     end();
-    EXPECT_EQ(fake_norv::count(fake_norv::Op::Allocate), 2U + 1U);
-    EXPECT_EQ(fake_norv::count(fake_norv::Op::Free), 3U + 1U);
+    EXPECT_EQ(fake_norv::count(fake_norv::Op::allocate), 2U + 1U);
+    EXPECT_EQ(fake_norv::count(fake_norv::Op::free), 3U + 1U);
 }
 
 TEST_F(EvtCallbackTest, ABodyCallbackLeavesNoMessageBehind) {
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onBody, Inline);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onBody, onDispatcher);
     ASSERT_TRUE(sendReply());
     EXPECT_EQ(fake_norv::outstanding(), 0U);
-    EXPECT_EQ(fake_norv::count(fake_norv::Op::Allocate), 0U);
+    EXPECT_EQ(fake_norv::count(fake_norv::Op::allocate), 0U);
 }
 
 TEST_F(EvtCallbackTest, RegisteredTwiceItRunsTwiceUntilOneIsCancelled) {
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, Inline);
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, Inline);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, onDispatcher);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, onDispatcher);
     ASSERT_TRUE(sendReply());
     EXPECT_EQ(recorder_.entries(2).size(), 2U);
-    ccs_->asyncCancelMsgType(Reply, &recorder_, &Recorder::onMsg, Inline);
+    ccs_->asyncCancelMsgType(replyType, &recorder_, &Recorder::onMsg, onDispatcher);
     ASSERT_TRUE(sendReply());
     EXPECT_EQ(recorder_.entries(3).size(), 3U);
 }
@@ -175,17 +175,17 @@ TEST_F(EvtCallbackTest, RegisteredTwiceItRunsTwiceUntilOneIsCancelled) {
 TEST_F(EvtCallbackTest, CancellingTakesTheMatchingEntryAlone) {
     std::string order;
     Sequence a(order, 'a'), b(order, 'b');
-    ccs_->asyncRegisterMsgType(Reply, &a, &Sequence::onMsg, Inline);
-    ccs_->asyncRegisterMsgType(Reply, &a, &Sequence::onBody, Inline);
-    ccs_->asyncRegisterMsgType(Reply, &b, &Sequence::onMsg, Inline);
-    ccs_->asyncRegisterMsgType(Reply, &Recorder::msgFunction, Inline);
-    ccs_->asyncRegisterMsgType(Reply, &Recorder::bodyFunction, Inline);
-    ccs_->asyncCancelMsgType(Reply, &a, &Sequence::onMsg, Inline);
-    ccs_->asyncCancelMsgType(Reply, &Recorder::msgFunction, Inline);
+    ccs_->asyncRegisterMsgType(replyType, &a, &Sequence::onMsg, onDispatcher);
+    ccs_->asyncRegisterMsgType(replyType, &a, &Sequence::onBody, onDispatcher);
+    ccs_->asyncRegisterMsgType(replyType, &b, &Sequence::onMsg, onDispatcher);
+    ccs_->asyncRegisterMsgType(replyType, &Recorder::msgFunction, onDispatcher);
+    ccs_->asyncRegisterMsgType(replyType, &Recorder::bodyFunction, onDispatcher);
+    ccs_->asyncCancelMsgType(replyType, &a, &Sequence::onMsg, onDispatcher);
+    ccs_->asyncCancelMsgType(replyType, &Recorder::msgFunction, onDispatcher);
     ASSERT_TRUE(sendReply());
     end();
     EXPECT_EQ(order, "ab");
-    EXPECT_THAT(Recorder::functions().texts(1), ElementsAre(ReplyBody));
+    EXPECT_THAT(Recorder::functions().texts(1), ElementsAre(replyBody));
 }
 
 TEST_F(EvtCallbackTest, CancellingWhatIsNotRegisteredIsOutOfBounds) {
@@ -197,24 +197,24 @@ TEST_F(EvtCallbackTest, CancellingWhatIsNotRegisteredIsOutOfBounds) {
             EXPECT_EQ(printed(exception), "list::OutOfBoundsError(Index: 4294967295)");
         }
     };
-    outOfBounds([&] { ccs_->asyncCancelMsgType(Reply); });
+    outOfBounds([&] { ccs_->asyncCancelMsgType(replyType); });
     outOfBounds([&] { ccs_->asyncCancelEvtGroup(2); });
-    outOfBounds([&] { ccs_->asyncCancelMsgType(Reply, &Recorder::msgFunction, 0); });
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, Inline);
-    outOfBounds([&] { ccs_->asyncCancelMsgType(Reply, &recorder_, &Recorder::onMsg, 0); });
-    outOfBounds([&] { ccs_->asyncCancelMsgType(Reply, &recorder_, &Recorder::onBody, Inline); });
-    outOfBounds([&] { ccs_->asyncCancelEvtGroup(Reply, &recorder_, &Recorder::onMsg, Inline); });
+    outOfBounds([&] { ccs_->asyncCancelMsgType(replyType, &Recorder::msgFunction, 0); });
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, onDispatcher);
+    outOfBounds([&] { ccs_->asyncCancelMsgType(replyType, &recorder_, &Recorder::onMsg, 0); });
+    outOfBounds([&] { ccs_->asyncCancelMsgType(replyType, &recorder_, &Recorder::onBody, onDispatcher); });
+    outOfBounds([&] { ccs_->asyncCancelEvtGroup(replyType, &recorder_, &Recorder::onMsg, onDispatcher); });
     ASSERT_TRUE(sendReply());
-    EXPECT_THAT(recorder_.texts(1), ElementsAre(ReplyMessage)) << "the lock is free and the entry is there";
+    EXPECT_THAT(recorder_.texts(1), ElementsAre(replyMessage)) << "the lock is free and the entry is there";
 }
 
 TEST_F(EvtCallbackTest, AnEntryWithoutTargetIsPassedOverAndItsMessageFreed) {
-    ccs_->asyncRegisterMsgType(Reply, Handler(Handler::MsgFunction(nullptr)), Inline);
+    ccs_->asyncRegisterMsgType(replyType, Handler(Handler::MsgFunction(nullptr)), onDispatcher);
     ASSERT_TRUE(sendReply());
     EXPECT_EQ(fake_norv::outstanding(), 0U);
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, Inline);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, onDispatcher);
     ASSERT_TRUE(sendReply());
-    EXPECT_THAT(recorder_.texts(1), ElementsAre(ReplyMessage));
+    EXPECT_THAT(recorder_.texts(1), ElementsAre(replyMessage));
 }
 
 // ---- While other things happen.
@@ -229,7 +229,7 @@ TEST_F(EvtCallbackTest, EventsArriveWhileARequestWaits) {
         fake_norv::deliver({0, 32, m.target, m.source, trace});
     });
     ccs_->SetParm(10, 1, nullptr);
-    EXPECT_THAT(recorder_.texts(2), ElementsAre(TraceBody, TraceBody));
+    EXPECT_THAT(recorder_.texts(2), ElementsAre(traceBody, traceBody));
 }
 
 struct Busy : EvtCallback::Callback {
@@ -249,7 +249,7 @@ struct Busy : EvtCallback::Callback {
 
 TEST_F(EvtCallbackTest, DestroyingTheObjectWaitsForItsCallbacks) {
     Busy busy;
-    ccs_->asyncRegisterMsgType(Reply, &busy, &Busy::onMsg, 0);
+    ccs_->asyncRegisterMsgType(replyType, &busy, &Busy::onMsg, 0);
     ASSERT_TRUE(sendReply());
     ASSERT_TRUE(busy.begun.wait());
     const Addressable keepsTheQueue(*ccs_);
@@ -261,7 +261,7 @@ TEST_F(EvtCallbackTest, DestroyingTheObjectWaitsForItsCallbacks) {
     // The address is free once the object has left its queue, which comes before it waits.
     for (bool left = false; !left;) {
         try {
-            next.asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
+            next.asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, 0);
             left = true;
         } catch (const vela::Exception&) {
             std::this_thread::yield();
@@ -294,10 +294,10 @@ TEST_F(ForgetfulDeathTest, AClassWhoseDestructorDoesNotEndTheCallbacksEndsThePro
 TEST_F(EvtCallbackTest, ACallbackMayCancelAndRegisterWhileTheObjectIsBeingDestroyed) {
     Busy busy;
     busy.act = [&](Addressable* owner) {
-        owner->asyncCancelMsgType(Reply);
+        owner->asyncCancelMsgType(replyType);
         owner->asyncRegisterEvtGroup(2, &recorder_, &Recorder::onBody, 0);
     };
-    ccs_->asyncRegisterMsgType(Reply, &busy, &Busy::onMsg, 0);
+    ccs_->asyncRegisterMsgType(replyType, &busy, &Busy::onMsg, 0);
     ASSERT_TRUE(sendReply());
     ASSERT_TRUE(busy.begun.wait());
     std::thread destroyer([&] { end(); });
@@ -309,7 +309,7 @@ TEST_F(EvtCallbackTest, ACallbackMayCancelAndRegisterWhileTheObjectIsBeingDestro
 TEST_F(EvtCallbackTest, ACallbackOnItsOwnThreadMayDestroyTheObject) {
     Busy busy;
     busy.act = [&](Addressable*) { end(); };
-    ccs_->asyncRegisterMsgType(Reply, &busy, &Busy::onMsg, 0);
+    ccs_->asyncRegisterMsgType(replyType, &busy, &Busy::onMsg, 0);
     ASSERT_TRUE(sendReply());
     busy.mayEnd.raise();
     EXPECT_TRUE(busy.ended.wait());
@@ -319,30 +319,30 @@ TEST_F(EvtCallbackTest, ACallbackOnItsOwnThreadMayRegisterCancelAndRequest) {
     board_.answers(8, 9);
     Busy busy;
     busy.act = [&](Addressable* owner) {
-        owner->asyncCancelMsgType(Reply);
+        owner->asyncCancelMsgType(replyType);
         owner->asyncRegisterEvtGroup(2, &recorder_, &Recorder::onBody, 0);
         dynamic_cast<CCS*>(owner)->SetParm(10, 1, nullptr);
     };
-    ccs_->asyncRegisterMsgType(Reply, &busy, &Busy::onMsg, 0);
+    ccs_->asyncRegisterMsgType(replyType, &busy, &Busy::onMsg, 0);
     ASSERT_TRUE(sendReply());
     busy.mayEnd.raise();
     ASSERT_TRUE(busy.ended.wait());
     ASSERT_TRUE(sendTrace());
-    EXPECT_THAT(recorder_.texts(1), ElementsAre(TraceBody));
+    EXPECT_THAT(recorder_.texts(1), ElementsAre(traceBody));
 }
 
 TEST_F(EvtCallbackTest, RegistrationsMoveWithTheObjectToAnotherQueue) {
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, 0);
     Addressable keepsTheFormerQueue(*ccs_);
     ccs_->MsgQueueAttach(nullptr);
     ASSERT_TRUE(sendReply());
-    EXPECT_THAT(recorder_.texts(1), ElementsAre(ReplyMessage));
+    EXPECT_THAT(recorder_.texts(1), ElementsAre(replyMessage));
 }
 
 TEST_F(EvtCallbackTest, ASecondDispatcherForTheAddressIsRefusedOnTheSameQueue) {
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, 0);
     CCS same(ccs_->getTgtDesc(), ccs_->getMsgQueue());
-    EXPECT_THROW(same.asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0), vela::Exception);
+    EXPECT_THROW(same.asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, 0), vela::Exception);
 }
 
 }  // namespace

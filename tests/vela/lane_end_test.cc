@@ -14,7 +14,7 @@ TEST_F(LaneEndTest, TheObjectsEndWaitsForWhatWaits) {
     traceInto({.atWork = 1});
     sendTraces(0, 20);
     slow_.given(1);
-    slow_.letEnd(All);
+    slow_.letEnd(all);
     end();
     EXPECT_EQ(slow_.given(20).size(), 20U);
 }
@@ -24,7 +24,7 @@ TEST_F(LaneEndTest, AClosedOneDropsWhatComesWithoutCountingIt) {
     sendTraces(0, 3);
     lane_->close();
     sendTraces(3, 3);
-    slow_.letEnd(All);
+    slow_.letEnd(all);
     EXPECT_EQ(slow_.given(3).size(), 3U);
     end();
     EXPECT_EQ(slow_.given(3).size(), 3U);
@@ -37,7 +37,7 @@ TEST_F(LaneEndTest, WhatWaitsCanBeGivenUp) {
     slow_.given(2);
     EXPECT_EQ(lane_->discardWaiting(), 28U);
     EXPECT_EQ(lane_->waiting(), 0U);
-    slow_.letEnd(All);
+    slow_.letEnd(all);
     end();
     EXPECT_EQ(slow_.given(2).size(), 2U);
 }
@@ -74,7 +74,7 @@ TEST_F(LaneEndTest, WhatItsOwnerHoldsCountsAsAtWork) {
     gated->hold(3);
     slow_.letEnd(2);
     gated->hold(0);
-    slow_.letEnd(All);
+    slow_.letEnd(all);
     slow_.given(4);
 }
 
@@ -85,7 +85,7 @@ TEST_F(LaneEndTest, ItsOwnerIsToldOnceThatItIsFullAndHowManyWereLostWhenNoneWait
     EXPECT_EQ(gated->fullTimes, 1U);
     EXPECT_EQ(gated->lost, 0U);
     gated->hold(0);
-    slow_.letEnd(All);
+    slow_.letEnd(all);
     slow_.given(6);
     while (gated->lost == 0)
         std::this_thread::yield();
@@ -99,7 +99,7 @@ TEST_F(LaneEndTest, ReportsHaveALaneOfTheirOwnWhoseWaitingOnesAreDroppedAtTheEnd
     for (int i = 0; i < 150; ++i)
         ASSERT_TRUE(sendEvent(1001));
     slow_.given(100);
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, 0);
     ASSERT_TRUE(sendReply());
     EXPECT_EQ(recorder_.entries(1).size(), 1U);
     // The reports that are at work end when the others have been given up.
@@ -107,7 +107,7 @@ TEST_F(LaneEndTest, ReportsHaveALaneOfTheirOwnWhoseWaitingOnesAreDroppedAtTheEnd
       public:
         explicit EndsThem(Slow& slow) : slow_(slow) {}
         std::streamsize xsputn(const char* text, std::streamsize size) override {
-            slow_.letEnd(All);
+            slow_.letEnd(all);
             return std::stringbuf::xsputn(text, size);
         }
 

@@ -22,7 +22,7 @@ using vela::Lane;
 using vela::Msg;
 using vela::MsgBody;
 
-constexpr unsigned int Group = 2;
+constexpr unsigned int group = 2;
 
 // A callback that lasts until it may end, and what it was given.
 class Slow : public vela::EvtCallback::Callback {
@@ -78,12 +78,12 @@ class Slow : public vela::EvtCallback::Callback {
     unsigned int most_ = 0;
 };
 
-constexpr unsigned int All = 1000000;
+constexpr unsigned int all = 1000000;
 
 class LaneTest : public EventTest {
   protected:
     ~LaneTest() override {
-        slow_.letEnd(All);
+        slow_.letEnd(all);
         end();
     }
 
@@ -91,13 +91,13 @@ class LaneTest : public EventTest {
     void traceInto(const Lane::Bounds& bounds) { traceInto(std::make_shared<Lane>(bounds)); }
     void traceInto(std::shared_ptr<Lane> lane) {
         lane_ = std::move(lane);
-        ccs_->asyncRegisterEvtGroup(Group, vela::Handler(&slow_, &Slow::onTrace), 0, lane_);
+        ccs_->asyncRegisterEvtGroup(group, vela::Handler(&slow_, &Slow::onTrace), 0, lane_);
     }
     void sendTraces(unsigned int first, unsigned int count, unsigned int octets = 0) {
         for (unsigned int i = first; i < first + count; ++i) {
             Octets data = fake_norv::words({1, i, octets});
             data.resize(data.size() + octets);
-            ASSERT_TRUE(sendEvent(Group, data));
+            ASSERT_TRUE(sendEvent(group, data));
         }
     }
 

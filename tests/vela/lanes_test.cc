@@ -42,7 +42,7 @@ TEST_F(LaneTest, AboutAHundredAreAtWorkUnlessSomebodySaysOtherwise) {
 TEST_F(LaneTest, WhatIsDeliveredIsNumberedInTheOrderOfArrival) {
     traceInto({.atWork = 2});
     sendTraces(0, 50);
-    slow_.letEnd(All);
+    slow_.letEnd(all);
     unsigned int number = 0;
     for (const Slow::Given& each : slow_.given(50)) {
         EXPECT_EQ(each.arrival.number, ++number);
@@ -57,7 +57,7 @@ TEST_F(LaneTest, ABodyThatCameAnotherWayHasNoNumber) {
 }
 
 TEST_F(LaneTest, CallbacksOnTheDispatchingThreadAreNumberedToo) {
-    ccs_->asyncRegisterEvtGroup(Group, vela::Handler(&slow_, &Slow::onTrace), Inline);
+    ccs_->asyncRegisterEvtGroup(group, vela::Handler(&slow_, &Slow::onTrace), onDispatcher);
     slow_.letEnd(2);
     sendTraces(0, 2);
     EXPECT_EQ(slow_.given(2)[0].arrival.number, 1U);
@@ -74,7 +74,7 @@ TEST_F(LaneTest, TheNewestAreLostWhenTooManyWaitAndTheNextOneSaysHowMany) {
     slow_.given(3);
     sendTraces(9, 1);
     EXPECT_EQ(lane_->missing(), 0U);
-    slow_.letEnd(All);
+    slow_.letEnd(all);
     const auto given = slow_.given(6);
     for (unsigned int i = 0; i < 6; ++i) {
         EXPECT_EQ(given[i].timestamp, i < 5 ? i : 9);
@@ -90,7 +90,7 @@ TEST_F(LaneTest, TheyMayTakeSoMuchMemory) {
     sendTraces(0, 9, octets);
     EXPECT_EQ(lane_->waiting(), 3U) << "each takes its octets and some more";
     EXPECT_EQ(lane_->losses().noRoom, 5U);
-    slow_.letEnd(All);
+    slow_.letEnd(all);
     slow_.given(4);
     sendTraces(9, 3, octets);
     EXPECT_EQ(slow_.given(7).size(), 7U) << "the room was given back";
@@ -102,7 +102,7 @@ TEST_F(LaneTest, OneThatNeedNotWaitNeedsNoRoom) {
         sendTraces(i, 1);
         slow_.letEnd(1);
         slow_.given(i + 1);
-        ccs_->asyncCancelEvtGroup(Group);
+        ccs_->asyncCancelEvtGroup(group);
         traceInto({.atWork = 1, .waiting = 0});  // that one may not have ended yet
     }
     EXPECT_EQ(slow_.given(5).size(), 5U);
@@ -134,7 +134,7 @@ TEST_F(LaneTest, WhatWaitsIsNotLostWhileSomethingIsAtWorkAndThreadsAreRefused) {
             std::this_thread::yield();
     }
     EXPECT_EQ(lane_->waiting(), 3U) << "one was refused, the others wait for the end of the next one";
-    slow_.letEnd(All);
+    slow_.letEnd(all);
     const auto given = slow_.given(5);
     EXPECT_EQ(given[2].timestamp, 3U);
     EXPECT_EQ(given[2].arrival.number, 3U);
@@ -177,7 +177,7 @@ TEST_F(LaneTest, OneWhoseBodyCannotBeMadeIsLostAndTheNextOneSaysSo) {
     EXPECT_EQ(given[1].timestamp, 2U);
     EXPECT_EQ(given[1].arrival.missing, 1U);
     EXPECT_EQ(lane_->losses().noMeans, 1U);
-    slow_.letEnd(All);
+    slow_.letEnd(all);
     EXPECT_EQ(said(), "(EvtCallback_Class219) vela internal error\n");
 }
 
@@ -189,19 +189,19 @@ TEST_F(LaneTest, RepliesRegistrationsAndOtherCallbacksDoNotWaitForASlowOne) {
     sendTraces(0, 500);
     slow_.given(2);
     ccs_->SetParm(10, 1, nullptr);
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, 0);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, 0);
     ASSERT_TRUE(sendReply());
     EXPECT_THAT(recorder_.texts(1), ElementsAre("message 19 12 octets"));
-    ccs_->asyncCancelMsgType(Reply);
-    ccs_->asyncCancelEvtGroup(Group);
+    ccs_->asyncCancelMsgType(replyType);
+    ccs_->asyncCancelEvtGroup(group);
     EXPECT_EQ(lane_->waiting(), 498U) << "what arrived before the end of the registration is still delivered";
-    slow_.letEnd(All);
+    slow_.letEnd(all);
     EXPECT_EQ(slow_.given(500).size(), 500U);
 }
 
 TEST_F(LaneTest, EachRegistrationHasItsOwn) {
     traceInto({.atWork = 1});
-    ccs_->asyncRegisterEvtGroup(Group, &recorder_, &Recorder::onBody, 0);
+    ccs_->asyncRegisterEvtGroup(group, &recorder_, &Recorder::onBody, 0);
     sendTraces(0, 300);
     EXPECT_EQ(recorder_.entries(300).size(), 300U);
     EXPECT_EQ(lane_->waiting(), 299U);
@@ -210,7 +210,7 @@ TEST_F(LaneTest, EachRegistrationHasItsOwn) {
 TEST_F(LaneTest, AWaiterGetsItsMessageWhileDeliveriesWait) {
     traceInto({.atWork = 1});
     sendTraces(0, 300);
-    const auto waiter = ccs_->getNewEvtWait(Group);
+    const auto waiter = ccs_->getNewEvtWait(group);
     sendTraces(300, 2);
     const std::unique_ptr<Msg> msg(waiter->waitMsg(0));
     CCS::EvtL2Trace_t trace;

@@ -68,14 +68,14 @@ TEST_F(MsgTest, ACopyHasTheWholeBufferButNoBody) {
     EXPECT_THAT(printed(*original), testing::HasSubstr("Parm"));
 }
 
-constexpr const char* Head =
+constexpr const char* head =
     "{MsgType: 0x20 Source: {Node 0 Board 0x1 Processor 0x1 Component 0x15 Instance 0x1} "
     "Target: {Node 0x6 Board 0x9 Processor 0x8 Component 0x7 Instance 0x1001} ";
 
 TEST_F(MsgTest, WithoutABodyItPrintsItsOctetsInHexadecimal) {
     const auto msg = messageOf({0, 9, 10, 255});
     address(*msg);
-    EXPECT_EQ(printed(*msg), std::string(Head) + "Size: 4 Trans: 10001 Body: {ByteData {0 0x9 0xa 0xff }}}");
+    EXPECT_EQ(printed(*msg), std::string(head) + "Size: 4 Trans: 10001 Body: {ByteData {0 0x9 0xa 0xff }}}");
 }
 
 TEST_F(MsgTest, WithABodyItPrintsThePayloadDecodedInHexadecimal) {
@@ -83,7 +83,7 @@ TEST_F(MsgTest, WithABodyItPrintsThePayloadDecodedInHexadecimal) {
     address(*msg);
     msg->setBodyDef(std::make_unique<vela::StdResource::MsgInit_t>().release());
     msg->setBodyDef(std::make_unique<vela::StdResource::MsgSetParm_t>().release());
-    EXPECT_EQ(printed(*msg), std::string(Head) + "Size: 8 Trans: 10001 Body: {Parm 0xa Val 0x3e9}}");
+    EXPECT_EQ(printed(*msg), std::string(head) + "Size: 8 Trans: 10001 Body: {Parm 0xa Val 0x3e9}}");
 }
 
 TEST_F(MsgTest, TakesTheBodyThatItHasAgain) {
@@ -107,7 +107,7 @@ TEST_F(MsgTest, GivesTheStreamItsFlagsBack) {
 }
 
 TEST_F(MsgTest, SaysWhichSizeTheTransportHasNoMemoryFor) {
-    fake_norv::fail(fake_norv::Op::Allocate);
+    fake_norv::fail(fake_norv::Op::allocate);
     try {
         const Msg msg(1001);
         FAIL() << "nothing was thrown";

@@ -128,11 +128,11 @@ TEST_F(OddBodyTest, AFieldDefOf0x3800MovesEightOctets) {
     EXPECT_EQ(parm.GetByteSize(), 16U);
     const Octets octets = words({1001, 0x3800}) + Octets{1, 2, 3, 4, 5, 6, 7, 255};
     EXPECT_EQ(encoded(parm), octets);
-    EXPECT_EQ(fieldCalls(Op::VarFieldPut), "@0 0x380000\n@4 0x380000\n@8 0x3800\n");
+    EXPECT_EQ(fieldCalls(Op::varFieldPut), "@0 0x380000\n@4 0x380000\n@8 0x3800\n");
     Parm read;
     EXPECT_EQ(messageOf(octets)->read(&read, 0), 16U);
     EXPECT_EQ(printed(read), "{Parm 1001 FieldDef 14336 Val {1 2 3 4 5 6 7 255}}");
-    EXPECT_EQ(fieldCalls(Op::VarFieldGet), fieldCalls(Op::VarFieldPut));
+    EXPECT_EQ(fieldCalls(Op::varFieldGet), fieldCalls(Op::varFieldPut));
 }
 
 TEST_F(OddBodyTest, AValueHasTheWidthOfItsType) {
@@ -146,7 +146,7 @@ TEST_F(OddBodyTest, AValueHasTheWidthOfItsType) {
         const Octets value(whole.begin(), whole.begin() + width);
         EXPECT_EQ(parm.GetByteSize(), 8 + width) << type;
         EXPECT_EQ(encoded(parm), words({0, type << 19}) + value) << type;
-        EXPECT_EQ(fake_norv::calls(Op::VarFieldPut).back().descriptors[0], type << 19);
+        EXPECT_EQ(fake_norv::calls(Op::varFieldPut).back().descriptors[0], type << 19);
         Parm read;
         EXPECT_EQ(messageOf(words({0, type << 19}) + value)->read(&read, 0), 8 + width);
         EXPECT_EQ(read.Val->element(0), 0x04030201U & (width == 4 ? ~0U : (1U << (8 * width)) - 1)) << type;
@@ -172,11 +172,11 @@ TEST_F(OddBodyTest, AValueOfManyElementsGoesInChunks) {
             parm.Val->element(i) = 1001 + i;
         const Octets octets = encoded(parm);
         EXPECT_EQ(octets.size(), 8 + 2 * c.count);
-        EXPECT_EQ(fieldCalls(Op::VarFieldPut), std::string("@0 0x380000\n@4 0x380000\n") + c.calls);
+        EXPECT_EQ(fieldCalls(Op::varFieldPut), std::string("@0 0x380000\n@4 0x380000\n") + c.calls);
         Parm read;
         messageOf(octets)->read(&read, 0);
         EXPECT_EQ(printed(read), printed(parm));
-        EXPECT_EQ(fieldCalls(Op::VarFieldGet), fieldCalls(Op::VarFieldPut));
+        EXPECT_EQ(fieldCalls(Op::varFieldGet), fieldCalls(Op::varFieldPut));
     }
 }
 
@@ -237,7 +237,7 @@ TEST_F(OddBodyTest, SignalBitsAre32OctetsInOneCall) {
     TSCComponent::MsgTxRxSignalingGetAllCmplt_t body;
     Filler().fill(body);
     EXPECT_EQ(encoded(body).size(), 33U);
-    EXPECT_EQ(fieldCalls(Op::VarFieldPut), "@0 0x200000\n@1 0x20f800\n");
+    EXPECT_EQ(fieldCalls(Op::varFieldPut), "@0 0x200000\n@1 0x20f800\n");
     messageOf({7, 'a', 'b'})->read(&body, 0);
     EXPECT_EQ(body.signalbits.value()[1], 'b');
     EXPECT_EQ(body.signalbits.value()[2], 0) << "what is not there";

@@ -8,7 +8,7 @@ using vela::CompDesc_t;
 using vela::Msg;
 using vela::MsgQueue;
 
-constexpr unsigned int Soon = 20;  // ms
+constexpr unsigned int soon = 20;  // ms
 
 const CompDesc_t Ccs(1, 1, 1, 0x15, 0);
 
@@ -38,13 +38,13 @@ TEST_F(QueueTest, ReturnsTheExpectedReplyToTheCaller) {
 }
 
 TEST_F(QueueTest, ReturnsNothingWhereNothingWasExpectedAndNothingCame) {
-    EXPECT_EQ(queue_->request(command().release(), Soon, 0), nullptr);
+    EXPECT_EQ(queue_->request(command().release(), soon, 0), nullptr);
     EXPECT_EQ(queue_->request(command().release(), 0, 0), nullptr);
 }
 
 TEST_F(QueueTest, ItsTimeoutPrintsTypeAndTimeWithAnUnbalancedParenthesis) {
     try {
-        queue_->request(command().release(), Soon, 19);
+        queue_->request(command().release(), soon, 19);
         FAIL() << "nothing was thrown";
     } catch (const MsgQueue::Timeout& timeout) {
         EXPECT_EQ(printed(timeout), "MsgQueue::Timeout MsgType: 0x13 Timeout: 20ms)");

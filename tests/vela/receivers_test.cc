@@ -124,13 +124,13 @@ TEST_F(ReceiverTest, WhatADispatcherCannotDeliverIsPassedOnToItsCaller) {
     vela::EvtCallback dispatcher(&object_);
     const vela::Handler ignoreBody([](Addressable*, unsigned int, vela::MsgBody* body) { delete body; });
     const vela::Handler ignore([](Addressable*, Msg* msg) { delete msg; });
-    dispatcher.registerMsgType(0, ignoreBody, vela::EvtCallback::OnDispatchingThread);
+    dispatcher.registerMsgType(0, ignoreBody, vela::EvtCallback::onDispatchingThread);
     EXPECT_THROW(dispatcher.receive(messageOf({}).release()), Addressable::UndefinedMsgBody);
     dispatcher.cancelMsgType(0);
-    dispatcher.registerMsgType(0, ignore, vela::EvtCallback::OnDispatchingThread);
-    dispatcher.registerMsgType(0, ignore, vela::EvtCallback::OnDispatchingThread);
+    dispatcher.registerMsgType(0, ignore, vela::EvtCallback::onDispatchingThread);
+    dispatcher.registerMsgType(0, ignore, vela::EvtCallback::onDispatchingThread);
     Msg* const twice = messageOf({}).release();
-    fake_norv::fail(fake_norv::Op::Allocate);
+    fake_norv::fail(fake_norv::Op::allocate);
     EXPECT_THROW(dispatcher.receive(twice), KSMsgRef::AllocationError);
     EXPECT_EQ(errors.text(),
               "(EvtCallback_Class214) vela internal error\nvela::Addressable::UndefinedMsgBody\n"

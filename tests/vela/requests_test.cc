@@ -18,20 +18,20 @@ using vela::Msg;
 using vela::MsgQueue;
 using vela::StdResource;
 
-constexpr unsigned int Soon = 20;  // ms; long enough to be looked at, and then it is over
+constexpr unsigned int soon = 20;  // ms; long enough to be looked at, and then it is over
 
 const CompDesc_t Ccs(1, 1, 1, 0x15, 0);
-constexpr const char* Object =
+constexpr const char* object =
     "{TgtDesc: {Node 0 Board 1 Processor 1 Component 21 Instance 1} "
     "HostDesc: {Node 6 Board 9 Processor 8 Component 7 Instance 4097}";
-constexpr const char* HexObject =
+constexpr const char* hexObject =
     "{TgtDesc: {Node 0 Board 0x1 Processor 0x1 Component 0x15 Instance 0x1} "
     "HostDesc: {Node 0x6 Board 0x9 Processor 0x8 Component 0x7 Instance 0x1001}";
 
 class RequestTest : public TransportTest {
   protected:
     RequestTest() {
-        ccs_.setErrorWaitTime(Soon);
+        ccs_.setErrorWaitTime(soon);
         cmd_.Parm = 10;
         cmd_.Val = 1;
     }
@@ -86,16 +86,16 @@ TEST_F(RequestTest, TransactionsCountUpwardsUnlessTheCallerNamesOne) {
 }
 
 TEST_F(RequestTest, SilenceIsATimeout) {
-    ccs_.setResponseTimeout(Soon);
+    ccs_.setResponseTimeout(soon);
     EXPECT_EQ(thrown<Addressable::Timeout>([&] { ccs_.request(8, &cmd_, 9, nullptr, 1001); }),
-              std::string("Addressable::Timeout ObjSource: ") + Object +
+              std::string("Addressable::Timeout ObjSource: ") + object +
                   " CmdMsgType: 0x8 RetMsgType: 0x9 Trans: 1001 Timeout: 20ms");
 }
 
 TEST_F(RequestTest, ALostCommandIsATimeout) {
     board_.answers(8, 9);
-    ccs_.setResponseTimeout(Soon);
-    fake_norv::fail(fake_norv::Op::Write);
+    ccs_.setResponseTimeout(soon);
+    fake_norv::fail(fake_norv::Op::write);
     EXPECT_THROW(ccs_.request(8, &cmd_, 9, nullptr), Addressable::Timeout);
     EXPECT_NO_THROW(ccs_.request(8, &cmd_, 9, nullptr));
 }
@@ -119,7 +119,7 @@ TEST_F(RequestTest, AnUnexpectedReplyPrintsObjectCommandAndReplyInHexadecimal) {
     board_.answers(8, 0, {8, 10});
     EXPECT_EQ(
         thrown<Addressable::UnexpectedMsg>([&] { ccs_.request(8, &cmd_, 9, nullptr, 1001); }),
-        std::string("Addressable::UnexpectedMsg ObjSource: ") + HexObject +
+        std::string("Addressable::UnexpectedMsg ObjSource: ") + hexObject +
             " CmdMsgType 0x8 RespMsg: {MsgType: 0 Source: {Node 0 Board 0x1 Processor 0x1 Component 0x15 "
             "Instance 0x1} Target: {Node 0x6 Board 0x9 Processor 0x8 Component 0x7 Instance 0x1001} "
             "Size: 2 Trans: 1001 Body: {ByteData {0x8 0xa }}}");
@@ -140,7 +140,7 @@ TEST_F(RequestTest, AReplyOfType0IsAnErrorEvenWhereItIsTheExpectedOne) {
 
 TEST_F(RequestTest, AnotherTypeAnswersNothing) {
     board_.answers(8, 11);
-    ccs_.setResponseTimeout(Soon);
+    ccs_.setResponseTimeout(soon);
     EXPECT_THROW(ccs_.request(8, &cmd_, 9, nullptr), Addressable::Timeout);
     ASSERT_TRUE(fake_norv::waitForIdleReader());
     EXPECT_THAT(errors_.text(), testing::HasSubstr("Unregisterd Source sent to MsgQueue"));
@@ -163,7 +163,7 @@ TEST_F(RequestTest, AnotherSourceAnswersNothingUnlessAnyMay) {
         other.source.instance = 2;
         fake_norv::deliver(other);
     });
-    ccs_.setResponseTimeout(Soon);
+    ccs_.setResponseTimeout(soon);
     EXPECT_THROW(ccs_.request(8, &cmd_, 9, nullptr), Addressable::Timeout);
     ccs_.setResponseTimeout(Addressable::DefaultResponseTimeout);
     EXPECT_NO_THROW(ccs_.request(8, &cmd_, 9, nullptr, 0, 1));
@@ -171,7 +171,7 @@ TEST_F(RequestTest, AnotherSourceAnswersNothingUnlessAnyMay) {
 }
 
 TEST_F(RequestTest, AReplyThatIsLateGoesWhereUnsolicitedMessagesGo) {
-    ccs_.setResponseTimeout(Soon);
+    ccs_.setResponseTimeout(soon);
     Message late;
     board_.script(8, [&](const Message& m) { late = replyTo(m, 9); });
     EXPECT_THROW(ccs_.request(8, &cmd_, 9, nullptr), Addressable::Timeout);
@@ -241,13 +241,13 @@ TEST_F(RequestTest, WithoutAWaitNothingIsWaitedFor) {
     ASSERT_TRUE(fake_norv::waitForIdleReader());
     ccs_.setResponseTimeout(0);
     EXPECT_EQ(thrown<Addressable::Timeout>([&] { ccs_.request(18, &cmd_, 19, nullptr, 1001); }),
-              std::string("Addressable::Timeout ObjSource: ") + Object +
+              std::string("Addressable::Timeout ObjSource: ") + object +
                   " CmdMsgType: 0x12 RetMsgType: 0x13 Trans: 1001 Timeout: 0ms");
     EXPECT_THAT(errors_.text(), testing::HasSubstr("MsgType 0\n"));
 }
 
 TEST_F(RequestTest, NoMemoryForTheCommandIsTheTransportsExceptionAndNothingIsSent) {
-    fake_norv::fail(fake_norv::Op::Allocate);
+    fake_norv::fail(fake_norv::Op::allocate);
     EXPECT_THROW(ccs_.request(8, &cmd_, 9, nullptr), KSMsgRef::AllocationError);
     EXPECT_TRUE(fake_norv::written().empty());
 }
@@ -281,7 +281,7 @@ TEST_F(RequestTest, FromManyThreadsEachGetsItsOwnReply) {
 }
 
 TEST_F(RequestTest, AnObjectPrintsItsAddressesWithoutAClosingBrace) {
-    EXPECT_EQ(printed(ccs_), Object);
+    EXPECT_EQ(printed(ccs_), object);
     EXPECT_EQ(printed(*ccs_.getMsgQueue()),
               "{HostDesc: {Node 6 Board 9 Processor 8 Component 7 Instance 4097}}");
 }
@@ -334,16 +334,16 @@ TEST_F(RequestTest, AttachingToAnotherQueueLeavesTheOneBefore) {
 TEST_F(RequestTest, AnObjectThatCannotMoveToAQueueStaysWhereItWas) {
     MsgQueue* const own = ccs_.getMsgQueue();
     const auto ignore = [](Addressable*, Msg* msg) { delete msg; };
-    ccs_.asyncRegisterMsgType(19, ignore, vela::EvtCallback::OnDispatchingThread);
+    ccs_.asyncRegisterMsgType(19, ignore, vela::EvtCallback::onDispatchingThread);
     {
         StdResource same(Ccs, nullptr);  // whose address is taken on its queue
-        same.asyncRegisterMsgType(19, ignore, vela::EvtCallback::OnDispatchingThread);
+        same.asyncRegisterMsgType(19, ignore, vela::EvtCallback::onDispatchingThread);
         EXPECT_EQ(fake_norv::openQueues(), 2U);
         EXPECT_THROW(ccs_.MsgQueueAttach(same.getMsgQueue()), vela::Exception);
         EXPECT_EQ(ccs_.getMsgQueue(), own);
     }
     EXPECT_EQ(fake_norv::openQueues(), 1U) << "the other queue went with its only holder";
-    fake_norv::fail(fake_norv::Op::Open, 2);
+    fake_norv::fail(fake_norv::Op::open, 2);
     EXPECT_THROW(ccs_.MsgQueueAttach(nullptr), KSResource_CreationError);
     EXPECT_EQ(ccs_.getMsgQueue(), own);
     board_.answers(8, 9);

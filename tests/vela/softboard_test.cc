@@ -89,7 +89,7 @@ TEST_F(SoftboardTest, AnInstanceIsReservedAndGivenBack) {
 TEST_F(SoftboardTest, FramesArriveInOrderOnTheDispatchingThread) {
     Recorder recorder;
     CCS ccs(CompDesc_t(1, 1, 1, 0x15, 0), nullptr);
-    ccs.asyncRegisterEvtGroup(2, &recorder, &Recorder::onBody, vela::EvtCallback::OnDispatchingThread);
+    ccs.asyncRegisterEvtGroup(2, &recorder, &Recorder::onBody, vela::EvtCallback::onDispatchingThread);
     ccs.DetectEvt(2, 0, nullptr);
     ccs.SetParm(10, 1, nullptr);
     EXPECT_THAT(

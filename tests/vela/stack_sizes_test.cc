@@ -8,8 +8,8 @@ namespace {
 using vela::Thread;
 
 // Above the system's default, below which no stack is made.
-constexpr unsigned int Large = 64U << 20;
-constexpr unsigned int Larger = 65U << 20;
+constexpr unsigned int large = 64U << 20;
+constexpr unsigned int larger = 65U << 20;
 
 // Makes the threads that it is asked for and notes the sizes of their stacks.
 class StackNotes : public KSSystem {
@@ -61,44 +61,44 @@ TEST(StackSize, OfAThreadReachesTheSystem) {
     const StackNotes system;
     Job job;
     const auto member = static_cast<Thread::Member>(&Job::member);
-    for (const unsigned int size : {0U, 1U, Large}) {
+    for (const unsigned int size : {0U, 1U, large}) {
         Thread byFunction(&Job::function, size), byMember(static_cast<Thread::Runnable*>(&job), member, size);
         byFunction.start(&job);
         byMember.start(nullptr);
         byFunction.join();
         byMember.join();
     }
-    vela::AbandonedThread_create(&Job::function, &job, Large);
-    vela::AbandonedThread_create(static_cast<Thread::Runnable*>(&job), member, nullptr, Larger);
+    vela::AbandonedThread_create(&Job::function, &job, large);
+    vela::AbandonedThread_create(static_cast<Thread::Runnable*>(&job), member, nullptr, larger);
     ASSERT_TRUE(job.ran.wait(8));
     const std::size_t usual = StackNotes::usual();
     EXPECT_THAT(system.sizes(),
-                testing::ElementsAre(usual, usual, usual, usual, Large, Large, Large, Larger));
+                testing::ElementsAre(usual, usual, usual, usual, large, large, large, larger));
 }
 
 class ThreadParameterTest : public EventTest {};
 
 TEST_F(ThreadParameterTest, OfACallbackIsTheStackSizeOfItsThreads) {
     const StackNotes system;
-    ccs_->asyncRegisterMsgType(Reply, &recorder_, &Recorder::onMsg, Large);
-    ccs_->asyncRegisterEvtGroup(2, &recorder_, &Recorder::onBody, Larger);
+    ccs_->asyncRegisterMsgType(replyType, &recorder_, &Recorder::onMsg, large);
+    ccs_->asyncRegisterEvtGroup(2, &recorder_, &Recorder::onBody, larger);
     ASSERT_TRUE(sendReply());
     recorder_.entries(1);
     ASSERT_TRUE(sendTrace());
     recorder_.entries(2);
-    EXPECT_THAT(system.sizes(), testing::ElementsAre(Large, Larger));
+    EXPECT_THAT(system.sizes(), testing::ElementsAre(large, larger));
     end();
 }
 
 TEST_F(ThreadParameterTest, OfAHandlerForTheUnregisteredIsTheStackSizeOfItsThreads) {
     const StackNotes system;
-    ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, Larger);
-    ccs_->asyncUnregisteredEvtGroup(&recorder_, &Recorder::onMsg, Large);
+    ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, larger);
+    ccs_->asyncUnregisteredEvtGroup(&recorder_, &Recorder::onMsg, large);
     ASSERT_TRUE(sendReply());
     recorder_.entries(1);
     ASSERT_TRUE(sendTrace());
     recorder_.entries(2);
-    EXPECT_THAT(system.sizes(), testing::ElementsAre(Larger, Large));
+    EXPECT_THAT(system.sizes(), testing::ElementsAre(larger, large));
     end();
 }
 

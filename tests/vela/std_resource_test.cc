@@ -47,7 +47,7 @@ TEST_F(StdResourceTest, GetsAParameterThatIsAText) {
     StdResource::MsgGetParmCmplt_t reply;
     resource_.GetParm(7, &reply);
     EXPECT_EQ(printed(reply), "{Num 7 Val 0 TextSize 3 Text {a b c}}");
-    EXPECT_EQ(fieldCalls(fake_norv::Op::VarFieldGet), "@0 0x380000\n@4 0x380000 0x380000\n@12 0x501000\n");
+    EXPECT_EQ(fieldCalls(fake_norv::Op::varFieldGet), "@0 0x380000\n@4 0x380000 0x380000\n@12 0x501000\n");
 }
 
 TEST_F(StdResourceTest, SubscribesForItsOwnQueueOrForAnotherObject) {

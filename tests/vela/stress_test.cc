@@ -27,7 +27,7 @@ void throwsNumber(Addressable*, unsigned int, MsgBody* body) {
 
 class StressTest : public EventTest {
   protected:
-    static constexpr int Rounds = 40;
+    static constexpr int rounds = 40;
 
     StressTest() {
         board_.script(18, [](const Message& m) {
@@ -67,10 +67,10 @@ class StressTest : public EventTest {
     }
 
     void request(unsigned int thread) {
-        for (unsigned int i = 0; i < Rounds; ++i) {
-            CCS::MsgGetParmCmplt_t reply;
-            ccs_->GetParm(thread * 1000 + i, &reply);
-            EXPECT_EQ(reply.Num, thread * 1000 + i);
+        for (unsigned int i = 0; i < rounds; ++i) {
+            CCS::MsgGetParmCmplt_t got;
+            ccs_->GetParm(thread * 1000 + i, &got);
+            EXPECT_EQ(got.Num, thread * 1000 + i);
             try {
                 ccs_->SetParm(i, 1, nullptr);
                 EXPECT_EQ(i % 2, 0U);
@@ -81,8 +81,8 @@ class StressTest : public EventTest {
     }
 
     void registerAndCancel() {
-        for (int i = 0; i < Rounds; ++i) {
-            const unsigned int threadParam = i % 2 == 0 ? 0 : Inline;
+        for (int i = 0; i < rounds; ++i) {
+            const unsigned int threadParam = i % 2 == 0 ? 0 : onDispatcher;
             ccs_->asyncRegisterEvtGroup(2, &takesBody, threadParam);
             ccs_->asyncRegisterEvtGroup(2, &takesMsg, threadParam);
             ccs_->asyncRegisterEvtGroup(2, &throwsNumber, 0);
@@ -97,7 +97,7 @@ class StressTest : public EventTest {
     }
 
     void wait() {
-        for (int i = 0; i < Rounds; ++i) {
+        for (int i = 0; i < rounds; ++i) {
             StdResource::MsgGetxParmsCmplt_t list;
             ccs_->asyncWaitMsg(21, &list, 0);
             EXPECT_EQ(list.Parms->length(), 1U);
@@ -109,9 +109,9 @@ class StressTest : public EventTest {
 
     // Others on the same queue come and go while their messages arrive.
     void comeAndGo() {
-        for (int i = 0; i < Rounds; ++i) {
+        for (int i = 0; i < rounds; ++i) {
             CCS other(CompDesc_t(2, 1, 1, 0x15, 0), ccs_->getMsgQueue());
-            other.asyncRegisterEvtGroup(2, &takesBody, i % 2 == 0 ? 0 : Inline);
+            other.asyncRegisterEvtGroup(2, &takesBody, i % 2 == 0 ? 0 : onDispatcher);
             other.asyncUnregisteredMsgType(&takesMsg, 0);
             CCS copy(other);
             std::this_thread::yield();

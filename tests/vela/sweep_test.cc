@@ -55,7 +55,7 @@ class SweepTest : public TransportTest {
         out << "text " << text << "\n";
         if (const std::string read = readBack<BodyType>(octets); read != text)
             out << "read " << read << "\n";
-        out << "octets\n" << hexLines(octets) << "calls\n" << indented(fieldCalls(Op::VarFieldPut));
+        out << "octets\n" << hexLines(octets) << "calls\n" << indented(fieldCalls(Op::varFieldPut));
         return out.str();
     }
 
@@ -64,7 +64,7 @@ class SweepTest : public TransportTest {
     std::string readBack(const Octets& octets) {
         Bound<BodyType> bound;
         EXPECT_EQ(messageOf(octets)->read(&bound.body, 0), octets.size()) << nameOf<BodyType>();
-        EXPECT_EQ(fieldCalls(Op::VarFieldGet), fieldCalls(Op::VarFieldPut)) << nameOf<BodyType>();
+        EXPECT_EQ(fieldCalls(Op::varFieldGet), fieldCalls(Op::varFieldPut)) << nameOf<BodyType>();
         const std::string text = printed(bound.body);
         const BodyType copy(bound.body);
         BodyType assigned;
@@ -123,7 +123,7 @@ TEST_F(SweepTest, EveryBodySurvivesAPayloadCutAnywhere) {
                     ->read(&read, 0);
                 EXPECT_NE(printed(read), printed(own)) << nameOf<BodyType>() << " of " << size;
             }
-            for (const fake_norv::Call& call : fake_norv::calls(Op::VarFieldGet))
+            for (const fake_norv::Call& call : fake_norv::calls(Op::varFieldGet))
                 EXPECT_EQ(call.status, 0U) << "a read outside the payload";
             fake_norv::reset();
         });
@@ -220,7 +220,7 @@ class ListSizeTest : public SweepTest {
     }
     template <typename Element>
     static std::vector<std::uint32_t> callsOf(Element element) {
-        const std::size_t before = fake_norv::count(Op::VarFieldPut);
+        const std::size_t before = fake_norv::count(Op::varFieldPut);
         encoded(element);
         return counts(before);
     }
@@ -239,7 +239,7 @@ class ListSizeTest : public SweepTest {
     // Of the calls from the `from`th on, the elements of the first field.
     static std::vector<std::uint32_t> counts(std::size_t from) {
         std::vector<std::uint32_t> all;
-        const std::vector<fake_norv::Call> calls = fake_norv::calls(Op::VarFieldPut);
+        const std::vector<fake_norv::Call> calls = fake_norv::calls(Op::varFieldPut);
         for (std::size_t k = from; k < calls.size(); ++k)
             all.push_back(((calls[k].descriptors[0] >> 11) & 0xFF) + 1);
         return all;

@@ -327,7 +327,7 @@ TEST(UniqueNumbers, BeginAt1000AndAt10000) {
 TEST(Init, PreparesTheTransportAndReturnsItsStatus) {
     fake_norv::reset();
     EXPECT_EQ(vela::velaInit(), 0U);
-    fake_norv::fail(fake_norv::Op::SetInterface);
+    fake_norv::fail(fake_norv::Op::setInterface);
     EXPECT_EQ(vela::velaInit(), 2U);
     vela::velaCleanup();
     EXPECT_THAT(fake_norv::texts(),

@@ -10,12 +10,12 @@ using vela::Addressable;
 using vela::CompDesc_t;
 using vela::StdResource;
 
-constexpr std::uint32_t CompFind = 8388669, ComponentResult = 8388615, CompInstAllocate = 8388670;
-constexpr std::uint32_t ClusterFind = 8388691, ClusterResult = 8388652, ClusterCompByAttr = 8388638;
-constexpr std::uint32_t CompUse = 8388697, ResultComplete = 8388608;
+constexpr std::uint32_t compFind = 8388669, componentResult = 8388615, compInstAllocate = 8388670;
+constexpr std::uint32_t clusterFind = 8388691, clusterResult = 8388652, clusterCompByAttr = 8388638;
+constexpr std::uint32_t compUse = 8388697, resultComplete = 8388608;
 
 const CompDesc_t Ccs(1, 1, 1, 0x15, 0);
-const Octets FoundAddress{2, 0, 3, 1, 0x15, 0};
+const Octets foundAddress{2, 0, 3, 1, 0x15, 0};
 
 using Pair = std::pair<unsigned int, unsigned int>;
 
@@ -32,11 +32,11 @@ void setTimeouts(Addressable& object, unsigned int responseMs, unsigned int erro
 class TimeoutsTest : public TransportTest {
   protected:
     TimeoutsTest() {
-        script_.answers(CompFind, ComponentResult, FoundAddress);
-        script_.answers(CompInstAllocate, ComponentResult, FoundAddress);
-        script_.answers(ClusterFind, ClusterResult, FoundAddress);
-        script_.answers(ClusterCompByAttr, ComponentResult, FoundAddress);
-        script_.answers(CompUse, ResultComplete);
+        script_.answers(compFind, componentResult, foundAddress);
+        script_.answers(compInstAllocate, componentResult, foundAddress);
+        script_.answers(clusterFind, clusterResult, foundAddress);
+        script_.answers(clusterCompByAttr, componentResult, foundAddress);
+        script_.answers(compUse, resultComplete);
     }
 
     ScriptedBoard script_;
@@ -70,7 +70,7 @@ TEST_F(TimeoutsTest, ACopyTakesBothAsTheyAreThenAndKeepsThem) {
 }
 
 TEST_F(TimeoutsTest, AnInstanceMadeOfATemporaryOneReservesWithItsTimeout) {
-    script_.script(CompUse, [](const fake_norv::Message&) {});
+    script_.script(compUse, [](const fake_norv::Message&) {});
     vela::TmpInstance temporary(Ccs, board_.getMsgQueue());
     temporary.setResponseTimeout(20);
     try {
@@ -89,7 +89,7 @@ TEST_F(TimeoutsTest, AManagerTakesBothFromTheObjectItIsMadeFor) {
 }
 
 TEST_F(TimeoutsTest, ThoseOfABoardReachSearchesMadeAfterwards) {
-    script_.script(CompFind, [](const fake_norv::Message&) {});
+    script_.script(compFind, [](const fake_norv::Message&) {});
     static_cast<Addressable&>(board_).setResponseTimeout(20);
     for (int i = 0; i < 2; ++i) {
         try {

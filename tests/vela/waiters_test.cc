@@ -35,15 +35,15 @@ class WaiterTest : public EventTest {
     std::optional<SleeplessSystem> system_{std::in_place};
 };
 
-constexpr unsigned int Long = 100000;  // ms, in no time
+constexpr unsigned int longWait = 100000;  // ms, in no time
 
 TEST_F(WaiterTest, Waiting25MillisecondsTriesThreeTimesAndGivesUp) {
-    const auto waiter = ccs_->getNewMsgWait(Reply);
+    const auto waiter = ccs_->getNewMsgWait(replyType);
     try {
         waiter->wait(nullptr, 25);
         FAIL() << "nothing was thrown";
     } catch (const EvtCallback::MsgWait::Timeout& timeout) {
-        EXPECT_EQ(timeout.type(), Reply);
+        EXPECT_EQ(timeout.type(), replyType);
         EXPECT_EQ(timeout.timeoutMs(), 25U);
         EXPECT_EQ(printed(timeout), "EvtCallback::MsgWait::Timeout Type: 0x13 Timeout: 25ms");
     }
@@ -62,24 +62,24 @@ TEST_F(WaiterTest, AnEventThatDoesNotComeIsATimeoutToo) {
 TEST_F(WaiterTest, WhatArrivesIsReadIntoTheBody) {
     whenAsleep([&] { EXPECT_TRUE(sendReply()); });
     StdResource::MsgGetParmCmplt_t reply;
-    ccs_->asyncWaitMsg(Reply, &reply, Long);
+    ccs_->asyncWaitMsg(replyType, &reply, longWait);
     EXPECT_EQ(reply.Val, 1001U);
 }
 
 TEST_F(WaiterTest, AnEventThatArrivesIsReadIntoTheBody) {
     whenAsleep([&] { EXPECT_TRUE(sendTrace()); });
     vela::CCS::EvtL2Trace_t trace;
-    ccs_->asyncWaitEvtGroup(2, &trace, Long);
+    ccs_->asyncWaitEvtGroup(2, &trace, longWait);
     EXPECT_EQ(trace.Timestamp, 1003U);
 }
 
 TEST_F(WaiterTest, TheMessageItselfIsTheCallers) {
     whenAsleep([&] { EXPECT_TRUE(sendReply()); });
-    const std::unique_ptr<Msg> msg(ccs_->asyncWaitMsgMsg(Reply, Long));
-    EXPECT_EQ(msg->getMsgType(), Reply);
+    const std::unique_ptr<Msg> msg(ccs_->asyncWaitMsgMsg(replyType, longWait));
+    EXPECT_EQ(msg->getMsgType(), replyType);
     ccs_->asyncRegisterMsgType(1001, &recorder_, &Recorder::onMsg, 0);  // a dispatcher for what comes between
     whenAsleep([&] { EXPECT_TRUE(sendTrace()); });
-    const std::unique_ptr<Msg> event(ccs_->asyncWaitEvtGroupMsg(2, Long));
+    const std::unique_ptr<Msg> event(ccs_->asyncWaitEvtGroupMsg(2, longWait));
     EXPECT_EQ(event->getMsgType(), 32U);
 }
 
@@ -91,7 +91,7 @@ TEST_F(WaiterTest, WhatCameBeforeTheWaitIsWaitingForIt) {
 }
 
 TEST_F(WaiterTest, AWaiterTriggersOnce) {
-    const auto waiter = ccs_->getNewMsgWait(Reply);
+    const auto waiter = ccs_->getNewMsgWait(replyType);
     ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, 0);
     ASSERT_TRUE(sendReply());
     waiter->wait(nullptr, 0);
@@ -102,17 +102,17 @@ TEST_F(WaiterTest, AWaiterTriggersOnce) {
 
 TEST_F(WaiterTest, AWaiterMayBeEnabledAgain) {
     const auto waiter = ccs_->getNewMsgWait(1001);
-    waiter->enable(Reply);
+    waiter->enable(replyType);
     ASSERT_TRUE(sendReply());
-    waiter->enable(Reply);
+    waiter->enable(replyType);
     ASSERT_TRUE(sendReply());
     waiter->wait(nullptr, 0);
-    waiter->enable(Reply);
+    waiter->enable(replyType);
     EXPECT_THROW(waiter->wait(nullptr, 25), EvtCallback::MsgWait::Timeout);
 }
 
 TEST_F(WaiterTest, OneThatTimedOutMayGoOnWaiting) {
-    const auto waiter = ccs_->getNewMsgWait(Reply);
+    const auto waiter = ccs_->getNewMsgWait(replyType);
     EXPECT_THROW(waiter->wait(nullptr, 25), EvtCallback::MsgWait::Timeout);
     ASSERT_TRUE(sendReply());
     EXPECT_NO_THROW(waiter->wait(nullptr, 0));
@@ -128,21 +128,21 @@ TEST_F(WaiterTest, AnIdleOneHasNothingToWaitFor) {
 
 TEST_F(WaiterTest, MadeWithATimeItWaitsAtOnce) {
     EvtCallback dispatcher(ccs_.get());
-    EXPECT_THROW(EvtCallback::MsgWait(&dispatcher, Reply, 25), EvtCallback::MsgWait::Timeout);
+    EXPECT_THROW(EvtCallback::MsgWait(&dispatcher, replyType, 25), EvtCallback::MsgWait::Timeout);
     EXPECT_THROW(EvtCallback::EvtWait(&dispatcher, 2, 25), EvtCallback::EvtWait::Timeout);
     whenAsleep([&] { EXPECT_TRUE(sendReply()); });
-    EXPECT_NO_THROW(EvtCallback::MsgWait(&dispatcher, Reply, Long));
+    EXPECT_NO_THROW(EvtCallback::MsgWait(&dispatcher, replyType, longWait));
 }
 
 TEST_F(WaiterTest, MadeWithATimeItHandsOutWhatCame) {
     EvtCallback dispatcher(ccs_.get());
     whenAsleep([&] { EXPECT_TRUE(sendReply()); });
-    EvtCallback::MsgWait returned(&dispatcher, Reply, Long);
+    EvtCallback::MsgWait returned(&dispatcher, replyType, longWait);
     const std::unique_ptr<Msg> msg(returned.waitMsg(25));
-    EXPECT_EQ(msg->getMsgType(), Reply);
+    EXPECT_EQ(msg->getMsgType(), replyType);
     EXPECT_THROW(returned.waitMsg(25), EvtCallback::MsgWait::Timeout) << "once";
     whenAsleep([&] { EXPECT_TRUE(sendTrace()); });
-    EvtCallback::EvtWait read(&dispatcher, 2, Long);
+    EvtCallback::EvtWait read(&dispatcher, 2, longWait);
     vela::CCS::EvtL2Trace_t trace;
     read.wait(&trace, 25);
     EXPECT_EQ(trace.Timestamp, 1003U);
@@ -150,18 +150,18 @@ TEST_F(WaiterTest, MadeWithATimeItHandsOutWhatCame) {
 
 TEST_F(WaiterTest, MadeWithATimeAndNotAskedAgainItDropsWhatCame) {
     EvtCallback dispatcher(ccs_.get());
-    dispatcher.unregisteredMsgType(vela::Handler(&recorder_, &Recorder::onMsg), Inline);
+    dispatcher.unregisteredMsgType(vela::Handler(&recorder_, &Recorder::onMsg), onDispatcher);
     whenAsleep([&] { EXPECT_TRUE(sendReply()); });
-    { const EvtCallback::MsgWait waiter(&dispatcher, Reply, Long); }
+    { const EvtCallback::MsgWait waiter(&dispatcher, replyType, longWait); }
     EXPECT_EQ(recorder_.entries(0).size(), 0U) << "somebody had waited for it";
 }
 
 TEST_F(WaiterTest, OfMessagesThatComeTogetherItTakesTheOneThatArrivedFirst) {
-    ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, Inline);
+    ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, onDispatcher);
     for (int i = 0; i < 200; ++i) {
-        const auto waiter = ccs_->getNewMsgWait(Reply);
+        const auto waiter = ccs_->getNewMsgWait(replyType);
         for (const std::uint32_t value : {1U, 2U, 3U}) {
-            ASSERT_TRUE(fake_norv::deliver({1, Reply, ccs_->getTgtDesc().getNvCompDesc(),
+            ASSERT_TRUE(fake_norv::deliver({1, replyType, ccs_->getTgtDesc().getNvCompDesc(),
                                             host().getNvCompDesc(), fake_norv::words({7, value, 0})}));
         }
         ASSERT_TRUE(fake_norv::waitForIdleReader());
@@ -175,11 +175,11 @@ TEST_F(WaiterTest, OfMessagesThatComeTogetherItTakesTheOneThatArrivedFirst) {
 
 TEST_F(WaiterTest, WhatComesAtTheTimeOutIsWaitedForAgainOrGoesToTheHandlerForUnregisteredOnes) {
     ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, 0);
-    auto waiter = ccs_->getNewMsgWait(Reply);
+    auto waiter = ccs_->getNewMsgWait(replyType);
     EXPECT_THROW(waiter->wait(nullptr, 25), EvtCallback::MsgWait::Timeout);
     ASSERT_TRUE(sendReply());
     waiter->wait(nullptr, 0);
-    waiter->enable(Reply);
+    waiter->enable(replyType);
     EXPECT_THROW(waiter->wait(nullptr, 25), EvtCallback::MsgWait::Timeout);
     ASSERT_TRUE(sendReply());
     waiter.reset();
@@ -188,14 +188,14 @@ TEST_F(WaiterTest, WhatComesAtTheTimeOutIsWaitedForAgainOrGoesToTheHandlerForUnr
 
 TEST_F(WaiterTest, OneThatIsEnabledAgainHandsOnWhatNobodyWaitedFor) {
     ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, 0);
-    const auto waiter = ccs_->getNewMsgWait(Reply);
+    const auto waiter = ccs_->getNewMsgWait(replyType);
     ASSERT_TRUE(sendReply());
-    waiter->enable(Reply);
+    waiter->enable(replyType);
     EXPECT_THAT(recorder_.texts(1), testing::ElementsAre("message 19 12 octets"));
 }
 
 TEST_F(WaiterTest, ADisabledOneIsRegisteredNoMore) {
-    const auto waiter = ccs_->getNewMsgWait(Reply);
+    const auto waiter = ccs_->getNewMsgWait(replyType);
     waiter->disable();
     ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, 0);
     ASSERT_TRUE(sendReply());
@@ -203,8 +203,8 @@ TEST_F(WaiterTest, ADisabledOneIsRegisteredNoMore) {
 }
 
 TEST_F(WaiterTest, OneThatSomebodyElseCancelledGoesQuietly) {
-    auto waiter = ccs_->getNewMsgWait(Reply);
-    ccs_->asyncCancelMsgType(Reply);
+    auto waiter = ccs_->getNewMsgWait(replyType);
+    ccs_->asyncCancelMsgType(replyType);
     EXPECT_THROW(waiter->wait(nullptr, 25), EvtCallback::MsgWait::Timeout);
     EXPECT_NO_THROW(waiter.reset());
 }
@@ -212,15 +212,15 @@ TEST_F(WaiterTest, OneThatSomebodyElseCancelledGoesQuietly) {
 TEST_F(WaiterTest, DestroyedAsItsMessageArrivesItLeavesNothingBehind) {
     ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, 0);
     for (int i = 0; i < 50; ++i) {
-        const auto waiter = ccs_->getNewMsgWait(Reply);
-        ASSERT_TRUE(
-            fake_norv::deliver({1, Reply, ccs_->getTgtDesc().getNvCompDesc(), host().getNvCompDesc(), {}}));
+        const auto waiter = ccs_->getNewMsgWait(replyType);
+        ASSERT_TRUE(fake_norv::deliver(
+            {1, replyType, ccs_->getTgtDesc().getNvCompDesc(), host().getNvCompDesc(), {}}));
     }
 }
 
 TEST_F(WaiterTest, SeveralWaitersOfOneTypeEachGetIt) {
-    const auto first = ccs_->getNewMsgWait(Reply);
-    const auto second = ccs_->getNewMsgWait(Reply);
+    const auto first = ccs_->getNewMsgWait(replyType);
+    const auto second = ccs_->getNewMsgWait(replyType);
     ASSERT_TRUE(sendReply());
     EXPECT_NO_THROW(first->wait(nullptr, 0));
     EXPECT_NO_THROW(second->wait(nullptr, 0));

@@ -41,7 +41,7 @@ TEST_F(WireTest, AByteListIsWrittenInChunksOfAtMost255TheOddOneFirst) {
             staticList<unsigned char> list = listOf(counted(c.size));
             vela::MsgDefault_t body(list);
             EXPECT_EQ(encoded(body), counted(c.size)) << c.size;
-            EXPECT_EQ(fieldCalls(Op::VarFieldPut), c.calls) << c.size;
+            EXPECT_EQ(fieldCalls(Op::varFieldPut), c.calls) << c.size;
         }
     }
 }
@@ -55,26 +55,26 @@ TEST_F(WireTest, AByteListIsReadInTheSameChunks) {
             vela::MsgDefault_t body;
             EXPECT_EQ(msg->read(&body, 0), c.size);
             EXPECT_EQ(body.bytes(), listOf(counted(c.size))) << c.size;
-            EXPECT_EQ(fieldCalls(Op::VarFieldGet), c.calls) << c.size;
+            EXPECT_EQ(fieldCalls(Op::varFieldGet), c.calls) << c.size;
         }
     }
 }
 
 struct Shorts {
-    vela::Array<unsigned short, vela::WireType::Unsigned16, "Shorts"> values;
+    vela::Array<unsigned short, vela::WireType::unsigned16, "Shorts"> values;
 };
 
 TEST_F(WireTest, WiderElementsGoInChunksOf255Too) {
-    vela::Body<vela::NoCode, Shorts> shorts;
+    vela::Body<vela::noCode, Shorts> shorts;
     shorts.values->realloc(256);
     EXPECT_EQ(encoded(shorts).size(), 512U);
-    EXPECT_EQ(fieldCalls(Op::VarFieldPut), "@0 0x280000\n@2 0x2ff000\n");
+    EXPECT_EQ(fieldCalls(Op::varFieldPut), "@0 0x280000\n@2 0x2ff000\n");
 
     fake_norv::reset();
     StdResource::MsgCancelxEvts_t words;
     words.EvtTypeList->realloc(510);
     EXPECT_EQ(encoded(words).size(), 4U + 2040U);
-    EXPECT_EQ(fieldCalls(Op::VarFieldPut), "@0 0x380000\n@4 0x3ff000\n@1024 0x3ff000\n");
+    EXPECT_EQ(fieldCalls(Op::varFieldPut), "@0 0x380000\n@4 0x3ff000\n@1024 0x3ff000\n");
 }
 
 CCS::EvtL2Trace_t traceOf(unsigned int length) {
@@ -94,7 +94,7 @@ TEST_F(WireTest, ATraceRecordOf300OctetsIs16OctetsOfFieldsAChunkOf45AndOneOf255)
         expected.push_back(octet);
     EXPECT_EQ(trace.GetByteSize(), 316U);
     EXPECT_EQ(encoded(trace), expected);
-    EXPECT_EQ(fieldCalls(Op::VarFieldPut),
+    EXPECT_EQ(fieldCalls(Op::varFieldPut),
               "@0 0x380000\n@4 0x380000 0x380000 0x380000\n@16 0x216000\n@61 0x27f000\n");
 }
 
@@ -108,7 +108,7 @@ TEST_F(WireTest, ABodyEndsBehindItselfWhetherOrNotTheLibraryMovesTheFirstOffset)
         EXPECT_EQ(msg->read(&read, 0), 316U);
         EXPECT_EQ(read.Timestamp, 1003U);
         EXPECT_EQ(read.List.value(), trace.List.value());
-        EXPECT_EQ(fieldCalls(Op::VarFieldGet), fieldCalls(Op::VarFieldPut));
+        EXPECT_EQ(fieldCalls(Op::varFieldGet), fieldCalls(Op::varFieldPut));
     }
 }
 
@@ -119,7 +119,7 @@ TEST_F(WireTest, AnAddressThatBeginsABodyIsCorrectedByItsOwnFirstField) {
     body.EvtType = 1001;
     body.EvtGroup = 1002;
     EXPECT_EQ(encoded(body), (Octets{2, 1, 3, 4, 5, 6, 0xE9, 3, 0, 0, 0xEA, 3, 0, 0}));
-    EXPECT_EQ(fieldCalls(Op::VarFieldPut),
+    EXPECT_EQ(fieldCalls(Op::varFieldPut),
               "@0 0x280000\n@2 0x200000 0x200000 0x200000 0x200000\n@6 0x380000 0x380000\n");
 }
 
@@ -154,7 +154,7 @@ TEST_F(WireTest, ABodyWithinAPayloadStartsAtItsOffsetAndNeedsNoCorrection) {
         body.Val = 1;
         EXPECT_EQ(msg.write(&body, 4), 12U);
         EXPECT_EQ(octetsOf(msg), (Octets{0, 0, 0, 0, 10, 0, 0, 0, 1, 0, 0, 0}));
-        EXPECT_EQ(fieldCalls(Op::VarFieldPut), "@4 0x380000\n@8 0x380000\n");
+        EXPECT_EQ(fieldCalls(Op::varFieldPut), "@4 0x380000\n@8 0x380000\n");
     }
 }
 
@@ -182,7 +182,7 @@ TEST_F(WireTest, APayloadShorterThanTheFieldsLeavesTheMissingOnes0) {
             EXPECT_EQ(trace.Timestamp, size < 12 ? 0U : 0xFFFFFFFFU) << size;
             EXPECT_EQ(trace.Length, 0U) << size;
             EXPECT_EQ(trace.List->length(), 0U) << size;
-            for (const fake_norv::Call& call : fake_norv::calls(Op::VarFieldGet))
+            for (const fake_norv::Call& call : fake_norv::calls(Op::varFieldGet))
                 EXPECT_EQ(call.status, 0U) << "a read outside the payload";
         }
     }
@@ -193,7 +193,7 @@ TEST_F(WireTest, AnOffsetBeyondThePayloadReadsAnEmptyList) {
     vela::MsgDefault_t body;
     EXPECT_EQ(msg->read(&body, 9), 9U);
     EXPECT_EQ(body.bytes().length(), 0U);
-    EXPECT_EQ(fake_norv::count(Op::VarFieldGet), 0U);
+    EXPECT_EQ(fake_norv::count(Op::varFieldGet), 0U);
 }
 
 TEST_F(WireTest, ACountThatSaysMoreThanIsThereReadsWhatIsThere) {
@@ -237,19 +237,19 @@ TEST_F(WireTest, TheCountIsWrittenFromTheListWhateverItWas) {
 
 TEST(Descriptor, HoldsCountAndTypeAndNothingElse) {
     using vela::WireType;
-    EXPECT_EQ(vela::descriptor(WireType::Signed8), 0U);
-    EXPECT_EQ(vela::descriptor(WireType::Signed16), 0x080000U);
-    EXPECT_EQ(vela::descriptor(WireType::Word32), 0x100000U);
-    EXPECT_EQ(vela::descriptor(WireType::Signed32), 0x180000U);
-    EXPECT_EQ(vela::descriptor(WireType::Unsigned8), 0x200000U);
-    EXPECT_EQ(vela::descriptor(WireType::Unsigned16), 0x280000U);
-    EXPECT_EQ(vela::descriptor(WireType::Value32), 0x300000U);
-    EXPECT_EQ(vela::descriptor(WireType::Unsigned32), 0x380000U);
-    EXPECT_EQ(vela::descriptor(WireType::Text8), 0x500000U);
-    EXPECT_EQ(vela::descriptor(WireType::Field32), 0x880000U);
-    EXPECT_EQ(vela::descriptor(WireType::Unsigned8, 255), 0x27F000U);
+    EXPECT_EQ(vela::descriptor(WireType::signed8), 0U);
+    EXPECT_EQ(vela::descriptor(WireType::signed16), 0x080000U);
+    EXPECT_EQ(vela::descriptor(WireType::word32), 0x100000U);
+    EXPECT_EQ(vela::descriptor(WireType::signed32), 0x180000U);
+    EXPECT_EQ(vela::descriptor(WireType::unsigned8), 0x200000U);
+    EXPECT_EQ(vela::descriptor(WireType::unsigned16), 0x280000U);
+    EXPECT_EQ(vela::descriptor(WireType::value32), 0x300000U);
+    EXPECT_EQ(vela::descriptor(WireType::unsigned32), 0x380000U);
+    EXPECT_EQ(vela::descriptor(WireType::text8), 0x500000U);
+    EXPECT_EQ(vela::descriptor(WireType::field32), 0x880000U);
+    EXPECT_EQ(vela::descriptor(WireType::unsigned8, 255), 0x27F000U);
     EXPECT_EQ(vela::descriptorCount(0x3800), 8U);
-    EXPECT_EQ(vela::descriptorType(0x3800), WireType::Signed8);
+    EXPECT_EQ(vela::descriptorType(0x3800), WireType::signed8);
 }
 
 TEST(Descriptor, NamesTheElementSizeOfEachType) {
