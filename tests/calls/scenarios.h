@@ -16,6 +16,7 @@ struct Scenario {
 };
 std::span<const Scenario> linkScenarios();
 std::span<const Scenario> callScenarios();
+std::span<const Scenario> channelScenarios();
 
 }  // namespace calls::test
 

@@ -13,7 +13,8 @@ using test::Scenario;
 
 std::vector<Scenario> allScenarios() {
     std::vector<Scenario> all;
-    for (const std::span<const Scenario> some : {test::linkScenarios(), test::callScenarios()})
+    for (const std::span<const Scenario> some :
+         {test::linkScenarios(), test::callScenarios(), test::channelScenarios()})
         all.insert(all.end(), some.begin(), some.end());
     return all;
 }

@@ -6,10 +6,11 @@ import types
 import unittest
 
 import soak
+import soak_frames
 
 
 def checked(numbers):
-    checker = soak.Checker()
+    checker = soak_frames.Checker()
     for number in numbers:
         checker.frame(number)
     return checker.frames, checker.lost, checker.disordered, checker.wrong
@@ -41,12 +42,12 @@ class Soak(unittest.TestCase):
         self.assertEqual(checked([0, 1, 1, None, 2]), (3, 0, 0, 2))
 
     def test_a_frame_is_its_direction_its_time_and_its_octets(self):
-        log = [(*soak.frame_of(number), number) for number in (0, 1, 2)]
+        log = [(*soak_frames.frame_of(number), number) for number in (0, 1, 2)]
         text = b"".join(block("T" if sent else "R", ticks, octets) for sent, octets, ticks in log)
         for changed, expected in ((text, (3, 0)), (text.replace(b"TX", b"RX"), (3, 1)),
                                   (text.replace(b"02 01 02 00", b"02 01 02 02"), (3, 1)),
                                   (text.replace(b"Time = 0.4\n", b"Time = 0.12\n"), (3, 1))):
-            checker = soak.Checker()
+            checker = soak_frames.Checker()
             for at in range(0, len(changed), 7):  # as it may come through a FIFO
                 checker.feed(changed[at:at + 7])
             checker.end()

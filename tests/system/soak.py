@@ -18,7 +18,6 @@ import random
 import re
 import select
 import signal
-import struct
 import subprocess
 import sys
 import tempfile
@@ -26,10 +25,10 @@ import threading
 import time
 
 from fault_switch import LIBRARY, FaultSwitch
-from order import LINE_RATE, MOST_THREADS, PAUSE, number_of
+from order import LINE_RATE, MOST_THREADS
+from soak_bound import Bound
+from soak_frames import LIMIT, Checker, write_capture
 
-ROUND = 20000        # frames in the capture, which is played again and again
-LIMIT = 120          # seconds without a frame, after which none is waited for
 QUEUE = 64 + 8       # messages that wait for the program before the board waits, and those on their way through it
 ON_THE_WAY = 500     # frames that were read from the board and are not seen in the log: 10 ms of them, and the FIFO's
 LONG_STALL_EVERY = 10  # troubled times
@@ -42,67 +41,6 @@ WRONG_EVENTS = (
 )
 OTHER_FAULTS = (("burst", 101, 3000), ("silent", 0, 50), ("never-waits", None, None), ("offset-stays-0", None, None))
 OUTSIDE = ("the log is not read", "the program is stopped", "the machine is busy")
-
-HEADER = re.compile(rb"([RT])X Frame: Time = (\d+)\.(\d+)\n")
-DUMP = re.compile(rb"Hex Dump: \n((?: *(?:[0-9a-f]{2} )+\n)+)")
-
-
-def frame_of(number):
-    """Direction (whether transmitted) and octets: the shortest frames, and every tenth a message with its number."""
-    at = number % ROUND
-    octets = bytes((2, 1, 2 * (at % 127), 2 * (at // 127 % 127)))
-    if at % 10 == 0:
-        octets += bytes((8, 2, at >> 8, at & 0xFF, 0x7D))
-    return at % 2 == 1, octets
-
-
-def write_capture(path):
-    """A pcap file of one round, 4 ms from frame to frame, so that the board's time is the number."""
-    with open(path, "wb") as file:
-        file.write(struct.pack("<IHHiIII", 0xA1B2C3D4, 2, 4, 0, 0, 65535, 177))
-        for number in range(ROUND):
-            transmitted, octets = frame_of(number)
-            packet = struct.pack(">HHH8sH", 4 if transmitted else 0, 0, 0, bytes(8), 0x30) + octets
-            file.write(struct.pack("<IIII", *divmod(4000 * number, 1_000_000), len(packet), len(packet)) + packet)
-
-
-class Checker:
-    """Looks for each frame in its turn; what else is in the log must be what the board sent wrong."""
-
-    def __init__(self):
-        self.frames = self.lost = self.disordered = self.wrong = 0
-        self._text = b""
-
-    def feed(self, some):
-        text = self._text + some
-        headers = list(HEADER.finditer(text))
-        for header, following in zip(headers, headers[1:]):
-            self._block(header, text[header.end():following.start()])
-        self._text = text[headers[-1].start():] if headers else text
-
-    def end(self):
-        header = HEADER.match(self._text)
-        if header:
-            self._block(header, self._text[header.end():])
-
-    def _block(self, header, text):
-        ticks = int(header[2]) * 250 + int(header[3]) // 4
-        dump = DUMP.search(text)
-        octets = bytes.fromhex(dump[1].decode()) if dump else b""
-        number = number_of(ticks, ROUND)
-        in_round = ticks % (ROUND - 1 + PAUSE) < ROUND
-        self.frame(number if in_round and frame_of(number) == (header[1] == b"T", octets) else None)
-
-    def frame(self, number):
-        """The next in the log; None is one that the board never had."""
-        if number is None or number == self.frames - 1:
-            self.wrong += 1
-        elif number >= self.frames:
-            self.lost += number - self.frames
-            self.frames = number + 1
-        else:
-            self.disordered += 1
-            self.lost -= 1
 
 
 class Sample:
@@ -377,54 +315,6 @@ class Soak:
             yield (f"long stalls  {len(self.stalls)} of {self._options.long_stall:g} seconds, with at most "
                    f"{max(self.stalls)} frames")
         yield "faults       " + ", ".join(f"{name} {times}" for name, times in sorted(self.times.items()))
-
-
-class Bound:
-    """The log is not read until the program says that it loses frames."""
-
-    def __init__(self, program):
-        self._program = program
-        self._checker = Checker()
-        self._said_lost = 0
-        self._rest = b""
-
-    def run(self):
-        end = time.monotonic() + 20 * LIMIT
-        while not any("too many frames wait" in line for line in self._program.said):
-            if time.monotonic() > end:
-                raise TimeoutError("it never says that too many frames wait")
-            time.sleep(0.1)
-        self._full = self._program.sample()
-        waited = self._program.taken()
-        while self._program.taken() < waited + 1000:
-            time.sleep(0.1)
-        self._program.types_q()
-        while some := self._program.read():
-            self._feed(some)
-        self._checker.end()
-        return self._program.status()
-
-    def idle(self):
-        """There is nothing else to end."""
-
-    def _feed(self, some):
-        self._checker.feed(some)
-        *lines, self._rest = (self._rest + some).split(b"\n")
-        self._said_lost += sum(int(line.split()[-1]) for line in lines if line.startswith(b"Frames Lost: "))
-
-    def complaints(self, status):
-        said = [line for line in self._program.said if "because too many waited for the log: " in line]
-        counted = int(said[0].split()[-1]) if said else 0
-        if status != 1:
-            yield f"it ended with status {status}"
-        if counted == 0 or self._said_lost != counted:
-            yield f"standard error says that {counted} frames were lost, the log {self._said_lost}"
-        if self._checker.lost > counted or self._checker.disordered or self._checker.wrong:
-            yield f"{self._checker.lost} frames were lost, {self._checker.disordered} out of order"
-
-    def report(self):
-        yield (f"frames       {self._checker.frames}, lost as it says {self._said_lost}; when too many waited, "
-               f"{self._full.used} kB in use, {self._full.resident} kB resident, {self._full.threads} threads")
 
 
 def main(arguments):

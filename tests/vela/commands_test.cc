@@ -1,105 +1,10 @@
-// Every command call: what it sends, whose reply it takes, how long it waits.
-#include "tests/vela/fill.h"
-#include "tests/vela/transport.h"
-#include "vela/Board.h"
-#include "vela/CCS.h"
-#include "vela/Cluster.h"
-#include "vela/ClusterMgr.h"
-#include "vela/ResourceMgr.h"
-#include "vela/TSCComponent.h"
+// The commands of resources, of the telephony service component and of the D channel: what each sends, whose
+// reply it takes, how long it waits.
+#include "tests/vela/commands.h"
 
 namespace {
 
-using fake_norv::words;
-using vela::CCS;
-using vela::Cluster;
-using vela::ClusterMgr;
-using vela::CompAttr_t;
-using vela::CompDesc_t;
-using vela::ResourceMgr;
-using vela::staticList;
-using vela::StdResource;
-using vela::TSCComponent;
-
-class CommandTest : public TransportTest {
-  protected:
-    CommandTest() {
-        for (vela::Addressable* object :
-             {static_cast<vela::Addressable*>(&resource_), static_cast<vela::Addressable*>(&ccs_)})
-            object->setErrorWaitTime(10);
-    }
-
-    // The call sends the body that it is given and reads the reply into the caller's.
-    template <typename Cmd, typename Call>
-    void prepared(Call call) {
-        using Reply = typename Cmd::Reply;
-        SCOPED_TRACE(Cmd::code);
-        Cmd cmd;
-        Filler().fill(cmd);
-        Reply answer;
-        Filler().fill(answer);
-        board_.answers(Cmd::code, Reply::code, encoded(answer));
-        Reply reply;
-        call(cmd, &reply);
-        EXPECT_EQ(fake_norv::written().back().type, Cmd::code);
-        EXPECT_EQ(fake_norv::written().back().body, encoded(cmd));
-        EXPECT_EQ(printed(reply), printed(answer));
-        call(cmd, static_cast<Reply*>(nullptr));
-    }
-    template <typename Object>
-    void sendsEachPrepared(Object& object) {
-        Object::Bodies::forEach([&]<typename Body>() {
-            if constexpr (requires { typename Body::Reply; })
-                prepared<Body>([&](Body& cmd, auto* reply) { object.send(cmd, reply); });
-        });
-    }
-    template <typename Cmd, typename Call>
-    void preparedWithoutReply(Call call) {
-        Cmd cmd;
-        Filler().fill(cmd);
-        call(cmd);
-        EXPECT_EQ(fake_norv::written().back().type, Cmd::code);
-        EXPECT_EQ(fake_norv::written().back().body, encoded(cmd));
-    }
-
-    // The call sends the command with this body, and takes the reply.
-    template <typename Call>
-    void sends(std::uint32_t command, std::uint32_t reply, const Octets& body, Call call) {
-        SCOPED_TRACE(command);
-        if (reply != NoReply)
-            board_.answers(command, reply);
-        call();
-        EXPECT_EQ(fake_norv::written().back().type, command);
-        EXPECT_EQ(fake_norv::written().back().body, body);
-    }
-    static constexpr std::uint32_t NoReply = 0xFFFFFFFF;
-
-    // Bodies of the one field of each entry.
-    template <typename List>
-    static List listOf(unsigned int n) {
-        List list(n);
-        Filler filler;
-        for (auto& element : list)
-            filler.fill(element);
-        return list;
-    }
-
-    ScriptedBoard board_;
-    StdResource resource_{CompDesc_t(1, 1, 1, 0x15, 0), nullptr};
-    CCS ccs_{CompDesc_t(2, 1, 1, 0x15, 0), resource_.getMsgQueue()};
-    TSCComponent tsc_{vela::Component(CompDesc_t(0, 1, 1, 0x12, 0), resource_.getMsgQueue())};
-    ResourceMgr resources_{resource_};
-    ClusterMgr clusters_{resource_};
-    Cluster cluster_{CompDesc_t(7, 1, 2, 3, 0), resource_.getMsgQueue()};
-    staticList<CompAttr_t> attributes_{{1001, -1}};
-};
-
-const Octets OneAttribute{1, 0, 0, 0, 0xE9, 3, 0, 0, 0xFF, 0xFF, 0xFF, 0xFF};
-
-Octets operator+(Octets left, const Octets& right) {
-    left.insert(left.end(), right.begin(), right.end());
-    return left;
-}
+using namespace vela::test;
 
 TEST_F(CommandTest, AStandardCommandSendsItsPreparedBody) {
     using S = StdResource;
@@ -134,11 +39,11 @@ TEST_F(CommandTest, AStandardCommandSendsItsFields) {
     sends(4, 5, {}, [&] { resource_.Init(nullptr); });
     sends(6, 7, {}, [&] { resource_.Exit(nullptr); });
     sends(2, 3, {}, [&] { resource_.ComTest(nullptr); });
-    sends(1, NoReply, {}, [&] { resource_.Ack(); });
-    sends(0, NoReply, words({4, 1002}), [&] { resource_.Error(4, 1002); });
+    sends(1, noReply, {}, [&] { resource_.Ack(); });
+    sends(0, noReply, words({4, 1002}), [&] { resource_.Error(4, 1002); });
     S::Data_ErrorMsg_0x8_t data;
     Filler().fill(data);
-    sends(0, NoReply, words({8, 1002, 1001, 1002}), [&] { resource_.Error(8, 1002, data); });
+    sends(0, noReply, words({8, 1002, 1001, 1002}), [&] { resource_.Error(8, 1002, data); });
 
     sends(8, 9, words({10, 1001}), [&] { resource_.SetParm(10, 1001, nullptr); });
     sends(18, 19, words({7}), [&] { resource_.GetParm(7, nullptr); });
@@ -163,7 +68,7 @@ TEST_F(CommandTest, AStandardCommandSendsItsFields) {
     staticList<unsigned int> types{1001, 1002};
     sends(26, 27, words({2}), [&] { resource_.CancelEvt(2, nullptr); });
     sends(28, 29, words({2, 1001, 1002}), [&] { resource_.CancelxEvts(types, nullptr); });
-    sends(30, NoReply, {}, [&] { resource_.CancelAllEvts(nullptr); });
+    sends(30, noReply, {}, [&] { resource_.CancelAllEvts(nullptr); });
 
     auto controls = listOf<staticList<S::MsgArmxRTCs_t::EventGroupList_t>>(1);
     sends(33, 34, words({2, 1001}), [&] { resource_.ArmRTC(2, 1001, nullptr); });
@@ -245,10 +150,10 @@ TEST_F(CommandTest, ACallControlMessageIsSentInFiveForms) {
     // CallId 0x0304, CallRef 0x0102.
     const Octets empty{4, 3, 2, 1, 0, 0, 5}, full{4, 3, 2, 1, 2, 0, 5};
     const Octets elements{8, 2, 0x80, 0x90, 161};
-    sends(5376, NoReply, empty, [&] { ccs_.SendIE(0x0102, 0x0304, 5); });
-    sends(5376, NoReply, full + Octets{'x', 'y'}, [&] { ccs_.SendIE(0x0102, 0x0304, 5, priv); });
-    sends(5376, NoReply, empty + elements, [&] { ccs_.SendIE(0x0102, 0x0304, 5, pub); });
-    sends(5376, NoReply, full + Octets{'x', 'y'} + elements,
+    sends(5376, noReply, empty, [&] { ccs_.SendIE(0x0102, 0x0304, 5); });
+    sends(5376, noReply, full + Octets{'x', 'y'}, [&] { ccs_.SendIE(0x0102, 0x0304, 5, priv); });
+    sends(5376, noReply, empty + elements, [&] { ccs_.SendIE(0x0102, 0x0304, 5, pub); });
+    sends(5376, noReply, full + Octets{'x', 'y'} + elements,
           [&] { ccs_.SendIE(0x0102, 0x0304, 5, priv, pub); });
 }
 
@@ -262,152 +167,6 @@ TEST_F(CommandTest, ACcsLooksCallControlMessagesUp) {
     const std::unique_ptr<vela::MsgBody> body(ccs_.MsgBodyLookup(5376));
     EXPECT_NE(dynamic_cast<CCS::ieMessage_t*>(body.get()), nullptr);
     EXPECT_THROW(ccs_.MsgBodyLookup(5377), vela::Addressable::UndefinedMsgBody);
-}
-
-// ---- The resource manager.
-
-TEST_F(CommandTest, AResourceManagerCommandSendsItsPreparedBody) {
-    sendsEachPrepared(resources_);
-    EXPECT_EQ(CompDesc_t(fake_norv::written().back().target), CompDesc_t(0, 1, 0, 0, 0));
-}
-
-TEST_F(CommandTest, AResourceManagerCommandSendsItsFields) {
-    const CompDesc_t instance(0x0102, 1, 2, 3, 4);
-    const Octets address{2, 1, 1, 2, 3, 4};
-    sends(8388669, 8388615, Octets{5, 0, 1, 2, 255, 0} + OneAttribute,
-          [&] { resources_.find(0, 2, 5, attributes_); });
-    sends(8388669, 8388615, Octets{5, 0, 1, 2, 255, 0} + words({2, 1001, 0xFFFFFFFF, 0, 0x15}),
-          [&] { resources_.find(0x15, 2, 5, attributes_); });
-    sends(8388670, 8388615, Octets{0, 0, 1, 2, 255, 0} + address + words({2, 1001, 0xFFFFFFFF, 0, 0x15}),
-          [&] { resources_.allocate(0x15, 2, instance, attributes_); });
-    sends(8388673, 8388608, address, [&] { resources_.free(instance); });
-    sends(8388697, 8388608, words({1}) + address + words({1001}), [&] { resources_.use(instance, 1001); });
-    sends(8388698, 8388608, words({1}) + address, [&] { resources_.unuse(instance); });
-    sends(8388666, 8388614, address + words({3, 4}), [&] { resources_.attributes(instance, 3, 4); });
-    sends(8388706, 8388707, Octets{2, 1, 1, 2, 3, 4, 5, 0, 6, 7, 8, 9} + OneAttribute,
-          [&] { resources_.findAll(instance, CompDesc_t(5, 6, 7, 8, 9), attributes_); });
-    sends(8388706, 8388707, Octets{0, 0, 1, 0, 0, 0, 0xFF, 0xFF, 1, 0xFF, 0xFF, 0} + words({1, 0, 0x15}),
-          [&] { resources_.findAll(0x15); });
-    sends(8388706, 8388707, Octets{0, 0, 1, 0, 0, 0, 0xFF, 0xFF, 1, 0xFF, 0xFF, 0} + words({0}),
-          [&] { resources_.findAll(); });
-}
-
-TEST_F(CommandTest, AttributesAndFoundInstancesComeBackAsValues) {
-    board_.answers(8388666, 8388614, Octets{1, 0, 1, 1, 0x15, 0} + OneAttribute);
-    EXPECT_EQ(printed(resources_.attributes(CompDesc_t(1, 1, 1, 0x15, 0), 1, 0)), "{{key 1001 value -1}}");
-    board_.answers(8388670, 8388615, {3, 0, 1, 1, 0x16, 0});
-    const StdResource allocated = resources_.allocate(0x16, 1, cluster_.getTgtDesc(), {});
-    EXPECT_EQ(allocated.getTgtDesc(), CompDesc_t(3, 1, 1, 0x16, 0));
-    EXPECT_EQ(allocated.getMsgQueue(), resource_.getMsgQueue());
-}
-
-// A reply to "find all": the next address, and components of one attribute each.
-Octets foundAll(std::uint8_t next, const std::vector<std::uint8_t>& instances) {
-    Octets body = words({static_cast<std::uint32_t>(instances.size())}) +
-                  (next == 0 ? Octets(6, 0) : Octets{next, 0, 1, 1, 0x15, 0});
-    for (const std::uint8_t instance : instances)
-        body = body + Octets{instance, 0, 1, 1, 0x15, 0} + words({0, 0x15});
-    return body;
-}
-
-TEST_F(CommandTest, FindingAllGoesOnWhereTheReplySays) {
-    board_.script(8388706, [](const fake_norv::Message& m) {
-        const bool first = m.body[0] == 0;
-        fake_norv::deliver(fake_norv::replyTo(m, 8388707, first ? foundAll(3, {1, 2}) : foundAll(0, {3})));
-    });
-    const ResourceMgr::Found found = resources_.findAll();
-    ASSERT_EQ(found.length(), 3U);
-    EXPECT_EQ(found[2].compDesc.value(), CompDesc_t(3, 1, 1, 0x15, 0));
-    EXPECT_EQ(printed(found[2].attrs.value()), "{key 0 value 21}");
-    EXPECT_EQ(fake_norv::written().size(), 2U);
-}
-
-TEST_F(CommandTest, FindingAllEndsWhereTheRepliesGoRoundInCircles) {
-    board_.answers(8388706, 8388707, foundAll(3, {1}));
-    EXPECT_EQ(resources_.findAll().length(), 2U);
-    board_.answers(8388706, 8388707, foundAll(3, {}));
-    EXPECT_EQ(resources_.findAll().length(), 0U);
-}
-
-// ---- Clusters.
-
-TEST_F(CommandTest, AClusterManagerCommandSendsItsPreparedBody) {
-    sendsEachPrepared(clusters_);
-    EXPECT_EQ(CompDesc_t(fake_norv::written().back().target), CompDesc_t(0, 1, 0, 0, 0));
-}
-
-TEST_F(CommandTest, AClusterManagerCommandSendsItsFields) {
-    const CompDesc_t start(0x0102, 1, 2, 3, 4);
-    const Octets address{2, 1, 1, 2, 3, 4};
-    sends(8388691, 8388652, address + OneAttribute, [&] { clusters_.find(start, attributes_); });
-    sends(8388689, 8388652, address + OneAttribute, [&] { clusters_.allocate(start, attributes_); });
-    sends(8388640, 8388652, address + OneAttribute, [&] { clusters_.create(start, attributes_); });
-    sends(8388690, 8388608, address, [&] { clusters_.free(start); });
-    sends(8388644, 8388608, address, [&] { clusters_.destroy(start); });
-    sends(8388637, 8388652, address, [&] { clusters_.byComponent(start); });
-    sends(8388638, 8388615, address + words({0x15}) + OneAttribute,
-          [&] { clusters_.componentByAttr(start, 0x15, attributes_); });
-}
-
-TEST_F(CommandTest, AClusterIsAtTheAddressThatTheManagerNames) {
-    board_.answers(8388691, 8388652, {7, 0, 1, 2, 3, 0});
-    const Cluster found = clusters_.find(CompDesc_t(), attributes_);
-    EXPECT_EQ(found.getTgtDesc(), cluster_.getTgtDesc());
-    EXPECT_EQ(found.getMsgQueue(), resource_.getMsgQueue());
-}
-
-TEST_F(CommandTest, AClusterCommandSendsItsPreparedBody) {
-    sendsEachPrepared(cluster_);
-    EXPECT_EQ(CompDesc_t(fake_norv::written().back().target), cluster_.getTgtDesc());
-}
-
-TEST_F(CommandTest, AClusterCommandSendsItsFields) {
-    const CompDesc_t first(0x0102, 1, 2, 3, 4), second(5, 6, 7, 8, 9);
-    const Octets own{7, 0, 1, 2, 3, 0}, one{2, 1, 1, 2, 3, 4}, two{5, 0, 6, 7, 8, 9};
-    staticList<unsigned int> slots{1001, 1002};
-    sends(8388639, 8388608, one + words({3}) + two + words({4}),
-          [&] { cluster_.connect(first, 3, second, 4); });
-    sends(8388645, 8388608, one + words({3}) + two + words({4}),
-          [&] { cluster_.disconnect(first, 3, second, 4); });
-    sends(8388635, 8388608, own + words({3, 4}) + one, [&] { cluster_.activate(3, 4, first); });
-    sends(8388643, 8388608, own + words({3}), [&] { cluster_.deactivate(3); });
-    sends(8388656, 8388608, own + words({3, 2, 4, 5, 1001, 1002}),
-          [&] { cluster_.assignSlots(3, 4, 5, slots); });
-    sends(8388662, 8388608, own + words({3}), [&] { cluster_.unassignSlots(3); });
-    sends(8388658, 8388659, own + words({3}), [&] { cluster_.slots(3, nullptr); });
-    sends(8388692, 8388608, OneAttribute, [&] { cluster_.addAttributes(attributes_); });
-    sends(8388693, 8388608, OneAttribute, [&] { cluster_.removeAttributes(attributes_); });
-    sends(8388694, 8388608, own, [&] { cluster_.lock(); });
-    sends(8388695, 8388696, own, [&] { cluster_.unlock(nullptr); });
-    board_.answers(8388647, 8388648, own + words({2}) + one + two);
-    const staticList<CompDesc_t> members = cluster_.components();
-    EXPECT_EQ(fake_norv::written().back().body, own);
-    ASSERT_EQ(members.length(), 2U);
-    EXPECT_EQ(members[1], second);
-}
-
-TEST_F(CommandTest, TheFamiliesKnowTheirOwnCodesAlone) {
-    const auto knows = [](vela::Addressable& object, unsigned int code) {
-        try {
-            delete object.MsgBodyLookup(code);
-            return true;
-        } catch (const vela::Addressable::UndefinedMsgBody& undefined) {
-            EXPECT_EQ(undefined.type(), code);
-            return false;
-        }
-    };
-    unsigned int known[3] = {0, 0, 0};
-    vela::Addressable* const families[3] = {&resources_, &clusters_, &cluster_};
-    for (unsigned int code = 8388600; code < 8388720; ++code) {
-        for (int f = 0; f < 3; ++f)
-            known[f] += knows(*families[f], code) ? 1 : 0;
-    }
-    EXPECT_EQ(known[0], 11U);
-    EXPECT_EQ(known[1], 9U);
-    EXPECT_EQ(known[2], 16U);
-    EXPECT_FALSE(knows(clusters_, 8388608)) << "below its first code";
-    EXPECT_FALSE(knows(cluster_, 8388615));
-    EXPECT_FALSE(knows(resources_, 8));
 }
 
 }  // namespace
