@@ -94,7 +94,7 @@ struct Analysis::Channel {
     DChannel links;
     LinkFindings linkFindings;
     ChannelClock clock;
-    std::optional<std::int64_t> begin;  // of the first frame
+    std::optional<std::int64_t> begin;  // the time of the first frame
     Group& group;
     std::uint32_t groupNumber;
     isdn::Variant variant;
@@ -160,7 +160,8 @@ const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
     for (const KeptFrame& late : channel.links.late()) {
         capture::Frame kept = late.frame;
         kept.octets = late.octets;
-        kept.interface = frame.interface;  // its reader may be gone
+        // the reader that owns it may be destroyed before the kept frame is used
+        kept.interface = frame.interface;
         kept.place.file = frame.place.file;
         const isdn::Layer2 keptLayer2 = isdn::parseLayer2(kept.octets);
         if (keptLayer2.carriesMessage())

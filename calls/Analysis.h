@@ -1,4 +1,4 @@
-// Everything about calls, from frames: which call a frame belongs to, the calls themselves, and findings.
+// Turns frames into calls: finds the call of each frame, follows the calls, and reports findings.
 #ifndef CALLS_ANALYSIS_H
 #define CALLS_ANALYSIS_H
 
@@ -19,7 +19,7 @@
 
 namespace calls {
 
-// Told of results, in the order in which they are certain.
+// Is told the results, each as soon as it is certain.
 class Listener {
   public:
     Listener() = default;
@@ -27,33 +27,36 @@ class Listener {
     Listener& operator=(const Listener&) = delete;
     virtual ~Listener() = default;
 
-    // A message that the receiver's layer 2 has accepted, put together if it came in segments. `call` is null
-    // if it belongs to none. The number of the frame may be lower than that of the frame handed in last.
+    // A message that the receiver's layer 2 has accepted; if it came in segments, the whole message. `call`
+    // is null if it belongs to none. The message may belong to an earlier frame than the one that was handed
+    // in last.
     virtual void heard(const Message& /*message*/, const Call* /*call*/) {}
     // A frame that carries a message without being the one by which it is heard: a copy that the receiver's
     // layer 2 does not hand up, or a segment. `call` is null if it belongs to none. It may come up to ten
     // seconds of the trace late. Every frame of call control that carries a message comes either here or in
     // `heard`; only one that stood behind a hole for longer than that may come here first and there later.
     virtual void carried(const Message& /*message*/, const Call* /*call*/) {}
-    // The call has ended; stragglers may still be heard. Nothing is said of a call that outlives the trace.
+    // The call has ended. Late messages of it may still be heard. Is not called for a call that outlives the
+    // trace.
     virtual void ended(const Call& /*call*/) {}
-    // Nothing will change in the call any more. Calls that share a table come in the order of their end.
+    // Nothing will change in the call any more, and its object goes. Calls that share a table come in the
+    // order of their end.
     virtual void gone(const Call& /*call*/) {}
     virtual void found(const Finding& /*finding*/) {}
 };
 
-// How long a D channel was heard, on its clock, in nanoseconds.
+// From when until when frames of a D channel were heard, in nanoseconds on its clock.
 struct Span {
     std::string dChannel;
-    std::uint32_t group = 0;  // as in Call
+    std::uint32_t group = 0;  // the number of its group, as in Call
     std::int64_t from = 0;
     std::int64_t until = 0;
 };
 
 struct Options {
     Timers timers;
-    capture::Role role = capture::Role::unknown;   // of our side, if it is given from outside
-    isdn::Variant variant = isdn::Variant::net5;   // of D channels whose own is not known
+    capture::Role role = capture::Role::unknown;   // the role of our side, if the user gives it
+    isdn::Variant variant = isdn::Variant::net5;   // used for D channels whose variant is not known
     std::vector<std::vector<std::string>> groups;  // names of D channels that share their calls (NFAS)
 };
 
@@ -66,29 +69,29 @@ class Analysis {
     Analysis(const Analysis&) = delete;
     Analysis& operator=(const Analysis&) = delete;
 
-    // `number` counts the frames of the input from 1. The frame's interface must not be null. The result is
-    // that of the frame's link and valid until the next call.
+    // `number` is the frame's number in the input, from 1. The frame's interface must not be null. Returns
+    // what the frame is to its link; the result is valid until the next call.
     const Marks& take(const capture::Frame& frame, std::uint64_t number);
-    // The recorder may have missed frames of this D channel; `reason` says why and is a literal.
+    // The recorder may have missed frames of this D channel. `reason` says why and must be a literal.
     void mayMiss(const capture::Interface& interface, std::string_view reason);
-    // It has seen a frame without its octets.
+    // The recorder has seen a frame of `side` without its octets.
     void mayLack(const capture::Interface& interface, Side side);
     // The recorder or the board was started again.
     void restarted(const capture::Interface& interface);
-    // Time has passed, and no frame has come.
+    // So much time has passed without a frame.
     void advance(std::int64_t nanoseconds);
-    // No frame follows: what is open is handed out as it stands.
+    // The trace has ended. Hands out what is open as it stands.
     void finish();
 
-    // Calls that have not ended, of all D channels, in order of their beginning.
+    // The calls of all D channels that have not ended, in order of their beginning.
     std::vector<const Call*> open() const;
-    // Calls that were let go before their end, since too many were alive.
+    // How many calls were dropped before their end, because too many were alive.
     std::uint64_t dropped() const;
-    // Calls that have begun, which are numbered from 1.
+    // How many calls have begun. They are numbered from 1.
     std::uint64_t begun() const { return numbers_->last; }
-    // Of each D channel from which a frame has come, by name.
+    // The spans of all D channels from which a frame has come, in order of their names.
     std::vector<Span> spans() const;
-    // What is known of the links of a D channel; null if nothing has come from it.
+    // The links of a D channel, or null if no frame has come from it.
     const DChannel* dChannel(std::string_view name) const;
 
   private:
@@ -102,7 +105,7 @@ class Analysis {
     Listener& listener_;
     std::vector<std::unique_ptr<Group>> groups_;
     std::map<std::string, std::unique_ptr<Channel>, std::less<>> channels_;
-    Channel* last_ = nullptr;  // the one of the last frame
+    Channel* last_ = nullptr;  // the channel of the last frame
     std::unique_ptr<CallNumbers> numbers_;
 };
 

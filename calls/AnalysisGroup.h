@@ -1,4 +1,4 @@
-// What the analysis keeps of calls, apart from their links. Internal to calls/.
+// The part of the analysis that follows calls; links are followed elsewhere. Internal to calls/.
 #ifndef CALLS_ANALYSISGROUP_H
 #define CALLS_ANALYSISGROUP_H
 
@@ -25,7 +25,7 @@
 
 namespace calls {
 
-// The calls of one D channel or of several that share them, and those who watch them.
+// The calls of one D channel, or of several that share their calls, and all that makes findings from them.
 class Analysis::Group : public CallObserver, public LinkWitnesses, public FindingSink {
   public:
     Group(const Timers& timers, CallNumbers& numbers, Listener& listener)
@@ -37,7 +37,7 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
           channels_(timers, maintenance_, *this),
           patterns_(*this) {}
 
-    // The message's time is the group's.
+    // The time of `message` is on the group's clock.
     void take(const Message& message, const LinkWitness& link, Carriers& carriers) {
         links_[message.layer2.tei] = &link;
         maintenance_.take(message);

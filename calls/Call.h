@@ -1,4 +1,4 @@
-// One life of a call reference: what the messages of a call have said of it so far.
+// A call, which is one life of a call reference: what its messages have said about it so far.
 #ifndef CALLS_CALL_H
 #define CALLS_CALL_H
 
@@ -23,7 +23,7 @@ struct Moment {
 Moment momentOf(const Message& message);
 
 enum class Kind : std::uint8_t {
-    call,       // with a B channel, as far as is known
+    call,       // it has a B channel, as far as is known
     signalling  // a connection without a B channel, or a transaction (REGISTER)
 };
 
@@ -82,13 +82,13 @@ struct Number {
 };
 
 struct Call {
-    std::uint64_t number = 0;   // in order of beginning, over all D channels, from 1
-    std::uint64_t resumes = 0;  // the number of the suspended call that this one goes on with, or 0
+    std::uint64_t number = 0;   // numbers the calls of all D channels from 1, in order of beginning
+    std::uint64_t resumes = 0;  // the number of the suspended call that this call continues, or 0
     std::uint32_t group = 0;
     std::string file;
     std::string dChannel;
     Moment begin;
-    Moment end;  // of the message that ended it, else of the last one
+    Moment end;  // the message that ended it, or else the last one
     std::uint8_t tei = 0;
     std::uint64_t reference = 0;
     std::uint8_t referenceLength = 0;
@@ -138,16 +138,16 @@ struct Call {
 
     static constexpr std::size_t mostFrames = 1000;
 
-    // The channel that it was given first, as far as is known: the one granted, else the one asked for.
+    // The channel that the call got first, as far as is known: the one granted, or else the one asked for.
     const std::optional<isdn::ChannelId>& channel() const { return granted ? granted : asked; }
-    // The one that it has now: a call may come back from hold, or from suspension, on another.
+    // The channel that the call has now. It may come back from hold, or from suspension, on another channel.
     const std::optional<isdn::ChannelId>& held() const { return moved ? moved : channel(); }
 };
 
-// "before-trace setup-repeated"; blanks between, empty for none.
+// What is special about the call, as words with blanks between them: "before-trace setup-repeated".
 std::string flagsOf(const Call& call);
 
-// Whether an engineer would call it failed. Calls that the trace does not see the end of have not failed.
+// Whether an engineer would say that the call failed. A call whose end is not in the trace has not failed.
 bool hasFailed(const Call& call);
 // Whether nobody answered it, for whatever reason.
 bool isUnanswered(const Call& call);

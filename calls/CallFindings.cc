@@ -98,7 +98,7 @@ void CallFindings::checkStatus(const Call& call, Notes& notes, const Message& me
         return;
     const bool asked = std::exchange(notes.enquired[static_cast<std::size_t>(other(message.from()))], false);
     if (call.beforeTrace && call.messages == 1)
-        return;  // what was before it is not known
+        return;  // what was sent before the trace is not known
     const isdn::Element state = message.layer3.elements.find(element::callState);
     const auto value = isdn::callState(state);
     if (value && value->codingStandard == 0 && value->value == 0 && !notes.cleared) {
@@ -171,7 +171,7 @@ void CallFindings::ended(Call& call, const Message* by) {
 
 void CallFindings::replaced(Call& old, Call& by, const Message& message) {
     if (old.uncertain)
-        return;  // its end may be what is missing
+        return;  // perhaps only its end is missing in the trace
     report(findings::referenceInUse, &by, message,
            nameOf(message) + " takes the reference of call " + std::to_string(old.number) +
                ", which had not ended");

@@ -1,4 +1,4 @@
-// What a call's messages show to be wrong at once, without a timer: elements, causes, states, references.
+// Findings that one message of a call shows, without a timer: elements, causes, states, references.
 #ifndef CALLS_CALLFINDINGS_H
 #define CALLS_CALLFINDINGS_H
 
@@ -22,18 +22,18 @@ class CallFindings : public CallObserver {
     void gone(const Call& call) override { notes_.erase(call.number); }
     void replaced(Call& old, Call& by, const Message& message) override;
     void stray(const Message& message) override;
-    // A message of the global or the dummy reference, or one that belongs to no call.
+    // Takes a message of the global or the dummy reference, or one that belongs to no call.
     void heardWithoutCall(const Message& message);
 
   private:
-    // What has to be remembered of a call that is alive.
+    // What is remembered about a call that is alive.
     struct Notes {
         std::array<bool, 2> enquired{};  // a side's STATUS ENQUIRY has passed, not yet answered
         bool acknowledged = false;       // SETUP ACKNOWLEDGE has passed, and nothing later
         bool sendingComplete = false;
         bool cleared = false;  // a clearing message has passed
         bool channelChecked = false;
-        std::int64_t lastDigit = 0;  // or SETUP, or SETUP ACKNOWLEDGE
+        std::int64_t lastDigit = 0;  // when the last digit, SETUP or SETUP ACKNOWLEDGE passed
     };
 
     void checkElements(const Call* call, const Message& message, bool clearsFirst);

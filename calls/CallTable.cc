@@ -41,7 +41,7 @@ std::vector<std::uint8_t> identityIn(const Message& message) {
     return copyOf(message.layer3.elements.find(element::callIdentity).contents);
 }
 
-// What a RESTART ACKNOWLEDGE names.
+// The channels that a RESTART ACKNOWLEDGE names.
 struct Restarted {
     static constexpr std::uint8_t channels = 0, oneInterface = 6, allInterfaces = 7;
 
@@ -94,8 +94,8 @@ Life* CallTable::find(const CallKey& key) const {
     return found == lives_.end() ? nullptr : found->second.get();
 }
 
-// A terminal that answers a SETUP to all joins its call; from then on the call's messages go to and fro
-// between that terminal and the network.
+// A terminal that answers a broadcast SETUP joins its call. From then on the call's messages pass between
+// that terminal and the network.
 Life* CallTable::findBroadcast(const Message& message, const CallKey& key) const {
     Life* const life = find({key.value, isdn::groupTei, key.origin});
     const std::uint8_t tei = message.layer2.tei;
@@ -121,7 +121,7 @@ Life& CallTable::beginOrRepeat(const Message& message, const CallKey& key) {
         forget(*old);
         return begin(message, key);
     }
-    // The old call has to be there until its observer has seen the new one.
+    // Keep the old call until the observer has been told that the new one replaces it.
     end(*old, EndedBy::replaced, momentOf(message), nullptr);
     const std::unique_ptr<Life> kept = std::move(lives_.find(key)->second);
     inOrder_.erase(kept->call.number);
@@ -132,7 +132,7 @@ Life& CallTable::beginOrRepeat(const Message& message, const CallKey& key) {
     return life;
 }
 
-// A SETUP is a repetition while nothing has answered it, and if it is the same to the octet.
+// A SETUP is a repetition if nothing has answered the first one and all octets are the same.
 bool CallTable::repeats(const Life& life, const Message& message) const {
     return message.layer3.type == type::setup && !life.answered && !life.ended &&
            message.at - life.lastSetup <= 2 * timers_.t303 &&
@@ -184,8 +184,9 @@ void CallTable::joinSuspended(Life& life, const Message& message) {
     suspended_.erase(found);
 }
 
-// The call of a message that begins none. What comes long after the end of a call, and only ends or asks, is
-// nobody's; anything else shows a call whose beginning is not in the trace.
+// Finds the call of a message that begins none. A message that comes long after the end of its call, and only
+// ends a call or asks for its state, belongs to no call. Any other message shows a call whose beginning is
+// not in the trace.
 Life* CallTable::belongsTo(const Message& message, const CallKey& key) {
     if (Life* const life = find(key); life != nullptr)
         return life;
@@ -246,8 +247,8 @@ void CallTable::endIfLast(Life& life, const Message& message) {
     }
 }
 
-// A terminal leaves a call that was offered to all. The call ends when the last one has left and no other can
-// join any more.
+// A terminal leaves a call that was offered to all terminals. The call ends when the last terminal has left
+// and no other can join any more.
 void CallTable::endTerminal(Life& life, const Message& message) {
     if (message.layer3.type == type::releaseComplete)
         life.left.set(message.layer2.tei);
@@ -271,7 +272,7 @@ void CallTable::end(Life& life, EndedBy by, const Moment& moment, const Message*
     observer_.ended(life.call, message);
 }
 
-// Older deadlines of the life are void.
+// The new deadline replaces the older ones of this life.
 void CallTable::schedule(Life& life, std::int64_t at) {
     deadlines_.emplace(at, std::pair(life.key, ++life.generation));
 }
@@ -317,7 +318,8 @@ void CallTable::advance(std::int64_t at) {
     endLostLinks(at);
 }
 
-// Stragglers come no more, or terminals cannot join any more.
+// The deadline of a life has come. A call that has ended is forgotten, because no late message is expected
+// any more; a call that was offered to all terminals can be joined by none any more.
 void CallTable::due(Life& life, std::int64_t at) {
     if (life.ended) {
         forget(life);

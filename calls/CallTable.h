@@ -17,7 +17,8 @@
 
 namespace calls {
 
-// Told what happens to calls, in order. A call's object stays where it is until `gone` has returned.
+// Is told what happens to calls, in order of time. A call's object keeps its address until `gone` has
+// returned.
 class CallObserver {
   public:
     CallObserver() = default;
@@ -25,7 +26,7 @@ class CallObserver {
     CallObserver& operator=(const CallObserver&) = delete;
     virtual ~CallObserver() = default;
 
-    // Each message of a call, after the call has been told of it; a call's first message comes here, too.
+    // A message of a call, after the call has taken it over. The first message of a call comes here as well.
     virtual void heard(Call& /*call*/, const Message& /*message*/) {}
     // The call has ended; stragglers may still be heard. `by` is null if no message ended it.
     virtual void ended(Call& /*call*/, const Message* /*by*/) {}
@@ -33,11 +34,11 @@ class CallObserver {
     virtual void gone(const Call& /*call*/) {}
     // SETUP, RESUME or REGISTER took the reference of a call that was alive.
     virtual void replaced(Call& /*old*/, Call& /*by*/, const Message& /*message*/) {}
-    // A message of a reference whose call had ended long before.
+    // A message whose call reference belonged to a call that ended long ago.
     virtual void stray(const Message& /*message*/) {}
 };
 
-// What tells the calls of one group apart that are alive at the same time.
+// Distinguishes the calls of one group that are alive at the same time.
 struct CallKey {
     std::uint64_t value = 0;  // of the call reference, without the flag
     std::uint8_t tei = 0;
@@ -54,7 +55,8 @@ struct Life;  // a call, and what the table needs to know besides
 
 class CallTable {
   public:
-    // What is alive or remembered at once; beyond that the oldest is let go, and counted.
+    // The largest number of calls that are alive, and of ended calls that are remembered. Beyond it the
+    // oldest is dropped and counted.
     static constexpr std::size_t mostAlive = 65536;
     static constexpr std::size_t mostRemembered = 65536;
 
@@ -63,29 +65,29 @@ class CallTable {
     CallTable(const CallTable&) = delete;
     CallTable& operator=(const CallTable&) = delete;
 
-    // A message with a reference of its own, in the order in which they passed. Returns the call that it
-    // belongs to, until the next call of a member; null if it belongs to none (dummy and global reference,
-    // another protocol, a stray).
+    // Takes the next message, in the order in which they passed. Returns its call, which is valid until the
+    // next call of a member function. Returns null if the message belongs to none: it has the dummy or the
+    // global reference, is of another protocol, or is a stray.
     Call* take(const Message& message);
 
-    // The call whose reference a message bears, without taking the message; null if none is known.
+    // The call whose reference the message bears, or null if none is known. Does not take the message.
     const Call* callOf(const Message& message) const;
 
-    // RESTART ACKNOWLEDGE has passed: ends the calls whose channel it names.
+    // Takes a RESTART ACKNOWLEDGE: ends the calls whose channels it names.
     void restarted(const Message& acknowledge);
 
-    // The clock has come to `at`: what is due by now happens.
+    // The clock has come to `at`. Ends calls and forgets references whose time has come.
     void advance(std::int64_t at);
     // The link of a TEI went down, or came up again.
     void linkDown(std::uint8_t tei, std::int64_t at);
     void linkUp(std::uint8_t tei);
-    // The board restarted: what is open may not be so any more, and the clock begins anew.
+    // The board restarted. Marks the calls that are open as uncertain.
     void boardRestarted();
 
-    // The end of the trace: every call is handed out as it stands.
+    // The trace has ended. Reports every call as it stands.
     void finish();
 
-    // Calls that were let go before their end, since too many were alive.
+    // How many calls were dropped before their end, because too many were alive.
     std::uint64_t dropped() const { return dropped_; }
     std::size_t alive() const { return lives_.size(); }
 

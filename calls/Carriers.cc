@@ -19,7 +19,7 @@ bool haveOneReference(const Message& a, const Message& b) {
            a.layer3.callReference.flag == b.layer3.callReference.flag;
 }
 
-// Whether `heard` is what the frame carries, or a part of.
+// Whether the frame carries the message `heard`, or a part of it.
 bool carries(const Message& frame, const Message& heard) {
     return haveOneReference(frame, heard) &&
            (isSegment(frame) || std::ranges::equal(frame.layer3.octets, heard.layer3.octets));

@@ -1,4 +1,4 @@
-// Frames that carry a message of a call, but are not the one by which the call hears of it.
+// Finds the call of each frame that carries a message without being the frame by which the call hears of it.
 #ifndef CALLS_CARRIERS_H
 #define CALLS_CARRIERS_H
 
@@ -14,28 +14,31 @@
 
 namespace calls {
 
-// Of one D channel: copies that the receiver's layer 2 does not hand up, frames behind a hole, and segments.
-// Such a frame waits until the message itself is heard, since that alone shows whose it is: a SETUP that is
-// lost and sent again begins its call only with the second copy. Memory is bounded.
+// Such frames are copies that the receiver's layer 2 does not hand up, frames behind a hole, and segments.
+// One object serves one D channel. It keeps a frame until the message itself is heard, because only then its
+// call is known: when a SETUP is lost and sent again, its call begins with the second copy. Memory is
+// bounded.
 class Carriers {
   public:
-    // A frame waits no longer than this, in nanoseconds of its D channel's clock, and no more of them wait.
+    // The longest time that a frame waits, in nanoseconds of its D channel's clock, and the largest number of
+    // frames that wait.
     static constexpr std::int64_t patience = 10 * second;
     static constexpr std::size_t mostWaiting = 64;
 
-    // Told once of each frame; `call` is null if it belongs to none.
+    // Is called once for each frame, with the call that it belongs to. The call is null if there is none.
     using Tell = std::function<void(const Message&, const Call*)>;
 
-    // A frame whose message is not handed up now, or is a segment.
+    // Takes a frame whose message is not handed up now, or is a segment.
     void take(const Message& message, const Marks& marks, const CallTable& table, const Tell& tell);
-    // A message was heard: frames that carried it are told of, and the heard one waits no longer.
+    // A message was heard. Tells of the waiting frames that carried it, and drops the heard frame itself if
+    // it waits.
     void heard(const Message& message, const Call* call, const Tell& tell);
-    // What has waited too long belongs to the call that has its reference now.
+    // Tells of frames that have waited too long; they count for the call that has their call reference now.
     void advance(std::int64_t at, const CallTable& table, const Tell& tell);
     void finish(const CallTable& table, const Tell& tell);
 
   private:
-    // A frame with copies of all that its reader only lends.
+    // A frame, with copies of everything that the reader owns and will reuse.
     struct Waiting {
         explicit Waiting(const Message& from);
         Waiting(const Waiting&) = delete;

@@ -7,7 +7,7 @@ namespace calls {
 namespace {
 
 constexpr std::int64_t ticksOutOfOrder =
-    2;  // 8 ms: frames of two directions may be reported the wrong way round
+    2;  // 8 ms, because the recorder may give frames of the two directions in the wrong order
 
 }  // namespace
 
@@ -26,7 +26,7 @@ std::int64_t ChannelClock::at(const capture::Frame& frame) {
         now_ += passed;
         return now_;
     }
-    // The difference modulo 2^32, so that going round is a small step forward.
+    // The difference modulo 2^32, so that a wrap of the ticks is a small step forward.
     const auto step = static_cast<std::int32_t>(*frame.ticks - lastTicks_);
     if (!hasTicks_) {
         now_ += passed;

@@ -8,26 +8,27 @@
 
 namespace calls {
 
-// Goes by the board's ticks where frames have them, else by their times; it never goes back. It begins at the
-// first frame's time, so that the clocks of several D channels can be compared as well as their hosts' can.
+// Counts the board's ticks where the frames have them, and the frames' times otherwise. It never goes back.
+// It starts at the time of the first frame, so the clocks of several D channels agree with each other as well
+// as the clocks of their hosts do.
 class ChannelClock {
   public:
-    // Nanoseconds at this frame.
+    // Moves the clock on to this frame and returns its reading, in nanoseconds.
     std::int64_t at(const capture::Frame& frame);
-    // The last frame's ticks fell by more than 8 ms, other than by going round: the board was restarted, or
-    // another trace begins.
+    // Whether the ticks of the last frame were more than 8 ms lower than those before, and had not just
+    // wrapped at 2^32. Then the board was restarted, or another trace begins here.
     bool hasRestarted() const { return restarted_; }
-    // Of the last frame, and what has passed since.
+    // The reading at the last frame, plus the time that advance() has added since.
     std::int64_t now() const { return now_ + since_; }
-    // No frame has come, but time has passed (a trace that is followed). The next frame tells exactly how
-    // much, so that durations are those of the frames' clocks alone.
+    // Says that time has passed without a frame, in a trace that is followed. The next frame replaces this
+    // estimate by its own time, so that durations depend on the frames' clocks only.
     void advance(std::int64_t nanoseconds) { since_ += nanoseconds; }
-    // Whether frames have times at all; without them nothing can be said about timers.
+    // Whether any frame has had ticks or a time. Without them nothing can be said about timers.
     bool hasTime() const { return hasTime_; }
 
   private:
     std::int64_t now_ = 0;    // at the last frame
-    std::int64_t since_ = 0;  // of another clock, since then
+    std::int64_t since_ = 0;  // added by advance() since the last frame
     std::int64_t lastTime_ = 0;
     std::uint32_t lastTicks_ = 0;
     bool begun_ = false;

@@ -16,7 +16,7 @@ namespace {
 namespace type = isdn::message;
 
 constexpr std::uint8_t noChannel = 34, requestedNotAvailable = 44, doesNotExist = 82;
-constexpr unsigned setupsToJudgeHunting = 20;  // of each side
+constexpr unsigned setupsToJudgeHunting = 20;  // SETUPs of each side
 
 std::string callName(std::uint64_t number) { return "call " + std::to_string(number); }
 
@@ -78,7 +78,8 @@ void Channels::setUp(Call& call, Seizure& seizure, const Message& message) {
     hunt(call, seizure, message);
 }
 
-// SETUPs cross if neither side had seen the other's: this one's N(R) does not cover the other one.
+// Two SETUPs cross if neither side had received the other's: the N(R) of this one does not acknowledge the
+// other.
 void Channels::findGlare(Call& call, Seizure& seizure, const Message& message) {
     if (!seizure.numbered)
         return;
@@ -127,7 +128,7 @@ void Channels::hold(Call& call, Seizure& seizure, const Message& message) {
         state->refusals = 0;
         for (const std::uint64_t holder : state->holders) {
             if (seizure.glare == holder)
-                continue;  // said as glare
+                continue;  // reported as glare
             conflicts_.push_back(
                 {key, holder, call.number, message.at + timers_.slack,
                  findingOf(findings::doubleSeizure, message, &call,
@@ -149,8 +150,8 @@ void Channels::release(std::uint64_t call, Seizure& seizure) {
     seizure.held.clear();
 }
 
-// Glare is settled when one of the two calls is moved to another channel or refused; it persists when both
-// have been given the channel.
+// Glare is settled when one of the two calls is refused or moved to another channel. It persists when both
+// calls have been given the channel.
 void Channels::settleGlare(Call& call, Seizure& seizure, const Message* message) {
     if (seizure.glare == 0 || seizure.glareSettled)
         return;
@@ -161,7 +162,7 @@ void Channels::settleGlare(Call& call, Seizure& seizure, const Message* message)
     const bool moved = message != nullptr && !share(seizure.held, seizure.asked);
     const bool bothGoOn = message != nullptr && opposite.answered && share(seizure.held, opposite.held);
     if (!moved && !bothGoOn && message != nullptr)
-        return;  // the other call decides
+        return;  // the messages of the other call decide
     seizure.glareSettled = opposite.glareSettled = true;
     const std::string which =
         "SETUPs of " + callName(call.number) + " and " + callName(seizure.glare) + " crossed";
@@ -226,7 +227,7 @@ void Channels::noteRefusal(const Call& call, const Seizure& seizure) {
     }
 }
 
-// The call went without clearing: one end may still hold the channel.
+// The call went away without clearing. One end may still hold the channel.
 void Channels::noteOrphan(const Call& call, const Seizure& seizure) {
     const bool lost = call.endedBy == EndedBy::replaced || call.endedBy == EndedBy::link;
     if (!lost || call.clearingSeen || call.uncertain)
@@ -240,8 +241,8 @@ void Channels::noteOrphan(const Call& call, const Seizure& seizure) {
     }
 }
 
-// Reports the channels whose calls went before a moment. Those that went with a link have one cause, and so
-// one finding.
+// Reports the channels whose calls went away before this moment. Calls that went away with a link have one
+// cause, so they are reported in one finding.
 void Channels::reportOrphans(std::int64_t before) {
     std::vector<Orphan> lost;
     for (auto orphan = orphans_.begin(); orphan != orphans_.end();) {

@@ -1,4 +1,4 @@
-// Who holds which B channel, and what goes wrong about it (Q.931 5.1.2, 5.2.3, 5.7).
+// Follows which call holds which B channel, and reports what goes wrong with it (Q.931 5.1.2, 5.2.3, 5.7).
 #ifndef CALLS_CHANNELS_H
 #define CALLS_CHANNELS_H
 
@@ -14,8 +14,8 @@
 
 namespace calls {
 
-// One object for each table of calls. A channel is held from its grant until the call has ended, or is on
-// hold; a channel that was only asked for is held by nobody.
+// One object serves one table of calls. A call holds a channel from its grant until the call ends or is put
+// on hold. A channel that was only asked for is not held.
 class Channels : public CallObserver {
   public:
     Channels(const Timers& timers, const Maintenance& maintenance, FindingSink& sink)
@@ -24,37 +24,38 @@ class Channels : public CallObserver {
     void heard(Call& call, const Message& message) override;
     void ended(Call& call, const Message* by) override;
     void gone(const Call& call) override;
-    // RESTART ACKNOWLEDGE: its channels are free, whatever was wrong with them.
+    // Takes a RESTART ACKNOWLEDGE: the channels that it names are free now, whatever was wrong with them.
     void restarted(const Message& acknowledge);
-    // The board restarted: who holds what is not known any more.
+    // The board restarted. Which call holds which channel is not known any more.
     void boardRestarted();
-    // The clock has come to `at`; to be called before what happened then is handed in.
+    // The clock has come to `at`. Call this before handing in what happened at that time.
     void advance(std::int64_t at);
     // The end of the trace.
     void finish();
 
-    // The calls that hold a channel, by its key; channels that were ever named are there, free or not.
+    // The numbers of the calls that hold a channel, by channel. Has an entry, perhaps an empty one, for each
+    // channel that was ever named.
     std::map<ChannelKey, std::vector<std::uint64_t>> holders() const;
 
   private:
     struct State {
         std::vector<std::uint64_t> holders;  // numbers of calls
         bool seenFree = false;               // a call has left it, or it was restarted
-        unsigned refusals = 0;               // 44 or 82 although it was idle
+        unsigned refusals = 0;               // how often cause 44 or 82 refused it although it was idle
     };
-    // What has to be known of a call that is alive.
+    // What is remembered about a call that is alive.
     struct Seizure {
         Side origin = Side::us;
         std::vector<ChannelKey> asked;
         std::vector<ChannelKey> held;
-        bool answered = false;  // the other side has taken it
+        bool answered = false;  // the other side has answered SETUP
         bool numbered = false;  // SETUP came in an I frame
         std::uint8_t setupNs = 0;
-        std::uint64_t glare = 0;  // the call that crosses it, or 0
+        std::uint64_t glare = 0;  // the number of the call that crosses this one, or 0
         bool glareSettled = false;
     };
-    // Two calls on one channel: reported if they are still there a moment later, since frames of the two
-    // directions may be reported the wrong way round.
+    // Two calls on one channel. Reported only if both are still there a moment later, because the recorder
+    // may give frames of the two directions in the wrong order.
     struct Conflict {
         ChannelKey channel;
         std::uint64_t first;
@@ -62,14 +63,14 @@ class Channels : public CallObserver {
         std::int64_t deadline;
         Finding finding;
     };
-    // A channel whose call went without clearing: one end may still hold it.
+    // A channel whose call went away without clearing. One end may still hold it.
     struct Orphan {
         std::int64_t at = 0;
         std::uint64_t call = 0;
-        bool withLink = false;  // the call went with its link, like others perhaps
+        bool withLink = false;  // the call went away because its link did
         Finding finding;
     };
-    // In which order a side takes channels.
+    // The order in which a side takes channels.
     struct Hunting {
         std::uint32_t last = 0;
         unsigned up = 0;
@@ -95,7 +96,7 @@ class Channels : public CallObserver {
     FindingSink& sink_;
     std::map<ChannelKey, State> states_;
     std::map<std::uint64_t, Seizure> seizures_;  // by number of the call
-    std::map<ChannelKey, Orphan> orphans_;       // reported if nobody restarts or takes them
+    std::map<ChannelKey, Orphan> orphans_;       // reported unless somebody restarts or takes the channel
     std::vector<Conflict> conflicts_;
     std::array<Hunting, 2> hunting_;
     bool glareProneSaid_ = false;

@@ -1,5 +1,4 @@
-// Which frames of a link are commands, and with it which end is the user: found out from the frames
-// themselves.
+// Finds out from the frames of a link which of them are commands, and so which end is the user.
 #ifndef CALLS_COMMANDBITS_H
 #define CALLS_COMMANDBITS_H
 
@@ -15,9 +14,10 @@ namespace calls {
 
 constexpr std::size_t indexOf(Side side) { return static_cast<std::size_t>(side); }
 
-// Commands of the user and responses of the network have C/R 0, the other two have 1 (Q.921 3.3.2). The first
-// frame that is always a command or always a response tells how its sender codes commands; the other side
-// codes them the other way. A poll and its answer carry one value, of which the earlier is the command.
+// Commands of the user and responses of the network have C/R 0; commands of the network and responses of the
+// user have 1 (Q.921 3.3.2). The first frame whose type is always a command, or always a response, shows how
+// its sender codes commands. The other side then codes them the other way. A poll and its answer carry the
+// same value, and the earlier of the two is the command.
 class CommandBits {
   public:
     enum class Lesson : std::uint8_t {
@@ -30,9 +30,9 @@ class CommandBits {
     // `longest` is how long after a poll its answer may come, in nanoseconds.
     Lesson learn(const isdn::Layer2& frame, Side from, std::int64_t at, std::int64_t longest);
 
-    // Empty until it is known.
+    // Whether a frame with this C/R bit is a command. Empty until it is known.
     std::optional<bool> isCommand(bool cr, Side from) const;
-    // Of our side.
+    // The role of our side.
     capture::Role role() const;
 
   private:
@@ -44,7 +44,7 @@ class CommandBits {
 
     Lesson learn(bool commandBit, Side from);
 
-    std::array<std::optional<bool>, 2> bits_;  // of a side's commands, as its own frames show
+    std::array<std::optional<bool>, 2> bits_;  // by side: the C/R bit of its commands, as its own frames show
     std::optional<Poll> poll_;                 // the last frame with P/F set, until the commands are known
 };
 

@@ -21,7 +21,8 @@ namespace calls {
 // and a few kept frames each. Used by one thread at a time.
 class DChannel {
   public:
-    // `role` is that of our side if it was given from outside; it is not questioned then.
+    // `role` is the role of our side if the user has given it. It is then believed even if frames contradict
+    // it.
     explicit DChannel(const Timers& timers = {}, capture::Role role = capture::Role::unknown);
     DChannel(const DChannel&) = delete;  // links look at the timers
     DChannel& operator=(const DChannel&) = delete;
@@ -31,12 +32,13 @@ class DChannel {
     // until the next one.
     const Marks& take(const capture::Frame& frame, std::uint64_t number, std::int64_t at);
 
-    // What the recorder has to say between frames: it may have missed some (`reason` in words, a literal); it
-    // has seen one of `side` without its octets; it was started again, and nothing is known about the links.
+    // What the recorder says between frames. mayMiss: it may have missed frames; `reason` says why and must
+    // be a literal. mayLack: it has seen a frame of `side` without its octets. restarted: it was started
+    // again, so nothing is known about the links any more.
     void mayMiss(std::string_view reason);
     void mayLack(Side side);
     void restarted();
-    // No frame follows. What was left open is in events().
+    // Ends the trace. events() then holds what was left open.
     void finish();
 
     const Sample& sample() const { return sample_; }
@@ -45,12 +47,12 @@ class DChannel {
     // The link of the last frame; null before the first one, and for a frame without an address.
     const Link* link() const { return link_; }
     std::span<const LinkEvent> events() const { return events_; }
-    // Frames that came earlier and are accepted only now, oldest first. They come before the frame itself.
+    // Earlier frames that are accepted only now, oldest first. They were sent before the last frame.
     std::span<const KeptFrame> late() const { return late_; }
 
-    // Null if nothing was seen of it.
+    // The link of this SAPI and TEI, or null if none of its frames was seen.
     const Link* find(std::uint8_t sapi, std::uint8_t tei) const;
-    // Of our side, from whichever link has shown it first.
+    // The role of our side, as the first link that showed it has told.
     capture::Role role() const;
 
   private:
@@ -60,11 +62,11 @@ class DChannel {
 
     Timers timers_;
     capture::Role fixed_;
-    CommandBits shared_;  // from all links: for those that have not shown it themselves
+    CommandBits shared_;  // what all links together have shown, for links that have not shown it themselves
     std::vector<std::unique_ptr<Link>> byAddress_;
     std::vector<std::pair<std::uint8_t, Link*>> links_;  // with their TEIs
     Link* link_ = nullptr;
-    capture::Frame frame_;  // the last one; its octets are the caller's
+    capture::Frame frame_;  // the last frame; the caller owns its octets
     Sample sample_{};
     Marks marks_;
     std::vector<LinkEvent> events_;

@@ -10,7 +10,7 @@ namespace calls {
 
 namespace {
 
-// Values below `exact` are their own step; each doubling above has half as many steps.
+// Each value below `exact` is a step of its own. Above it, each doubling of the value has half as many steps.
 constexpr unsigned bits = 10;
 constexpr std::uint64_t exact = std::uint64_t{1} << bits;
 

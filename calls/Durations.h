@@ -1,4 +1,4 @@
-// Many durations in little memory: how many, the middle one, the one that few exceed, the longest.
+// Counts many durations in little memory, and gives their number, mean, quantiles and longest.
 #ifndef CALLS_DURATIONS_H
 #define CALLS_DURATIONS_H
 
@@ -7,26 +7,27 @@
 
 namespace calls {
 
-// Counts durations in steps: of a millisecond below 1.024 s, and above of less than a 512th of the duration.
-// A quantile is the beginning of its step, so it is exact to the millisecond, or too short by less than 0.2
-// %. Count, mean and longest are exact. At most 20,000 steps exist, however many durations there are.
+// Durations are counted in steps. A step is a millisecond long below 1.024 s, and above that less than a
+// 512th of the duration. A quantile is the beginning of its step, so it is exact to the millisecond, or too
+// short by less than 0.2 %. Count, mean and longest are exact. There are at most 20,000 steps.
 class Durations {
   public:
     // Nanoseconds. A negative duration counts as 0.
     void add(std::int64_t nanoseconds);
 
     std::uint64_t count() const { return count_; }
-    // Nanoseconds; 0 while there is none.
+    // Nanoseconds; 0 if nothing was added.
     std::int64_t longest() const { return longest_; }
     std::int64_t mean() const;
-    // The shortest duration that at least this share (0 to 1) of all do not exceed: 0.5 is the median.
+    // The shortest duration that at least this share (0 to 1) of all durations do not exceed. A share of 0.5
+    // gives the median.
     std::int64_t quantile(double share) const;
 
   private:
     std::map<std::uint32_t, std::uint64_t> steps_;
     std::uint64_t count_ = 0;
     std::int64_t longest_ = 0;
-    std::uint64_t milliseconds_ = 0;  // of all together
+    std::uint64_t milliseconds_ = 0;  // the sum of all durations
 };
 
 }  // namespace calls

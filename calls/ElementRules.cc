@@ -55,7 +55,7 @@ std::string nameOf(const isdn::Element& found, isdn::Variant variant) {
            std::to_string(found.codeset);
 }
 
-// The standard's own name for an element that is not there.
+// The standard's name for an element that is absent.
 std::string nameOf(std::uint8_t id, isdn::Variant variant) {
     return std::string(isdn::elementName(0, id, variant));
 }

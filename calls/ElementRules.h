@@ -16,8 +16,8 @@ struct BrokenRule {
     std::string sentence;
 };
 
-// `clearsFirst`: the message is the first of its call that clears it, and so must name a cause. The message
-// is one of call control or maintenance.
+// Returns the rules that the message breaks. It must be a message of call control or maintenance.
+// `clearsFirst`: it is the first message that clears its call, and so must name a cause.
 std::vector<BrokenRule> brokenElementRules(const Message& message, bool clearsFirst);
 
 }  // namespace calls

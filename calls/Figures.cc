@@ -32,7 +32,7 @@ CauseKey keyOf(const CauseGiven& cause) {
     return {cause.codingStandard, cause.value, cause.location, cause.from, cause.role, madeBy(cause)};
 }
 
-// The network has done what it could, and the called party has decided (E.425).
+// Whether the network did its part, so that only the called party decided how the call went on (E.425).
 bool hasReached(const Call& call) {
     switch (call.outcome) {
         case Outcome::answered:

@@ -28,7 +28,7 @@ struct MessageKind {
     auto operator<=>(const MessageKind&) const = default;
 };
 
-// A cause, who said it and where it was made, as far as its location tells.
+// A cause, the side that sent it, and where it was made as far as its location tells.
 struct CauseKey {
     std::uint8_t codingStandard = 0;
     std::uint8_t value = 0;
@@ -85,22 +85,22 @@ struct HourFigures {
 // Takes what a Listener hears. Memory is bounded whatever the calls are.
 class Figures {
   public:
-    // How many there were of each kind, by side.
+    // The number of messages of each kind, by side.
     using Messages = std::map<MessageKind, std::array<std::uint64_t, 2>>;
 
     static void count(Messages& messages, const Message& message);
 
     void heard(const Message& message) { count(messages_, message); }
-    // Messages that were counted elsewhere until it was known whether they count.
+    // Adds messages that were counted elsewhere until it was known whether they count.
     void heard(const Messages& messages);
-    // A call in which nothing will change any more.
+    // Counts a call in which nothing will change any more.
     void gone(const Call& call);
 
     const Messages& messages() const { return messages_; }
     const std::map<CauseKey, CauseCounts>& causes() const { return causes_; }
     // Calls that were cleared without a cause in the message that should have had one.
     std::uint64_t withoutCause() const { return withoutCause_; }
-    // Of a measure, of calls that a side began.
+    // The values of a measure, of the calls that `origin` began.
     const Durations& times(std::size_t measure, Side origin) const {
         return times_[measure][static_cast<std::size_t>(origin)];
     }

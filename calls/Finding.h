@@ -32,18 +32,18 @@ struct FindingKind {
 std::span<const FindingKind* const> findingKinds();
 const FindingKind* findingKind(std::string_view id);
 
-// A finding belongs to a frame: the one that shows it, or the last one before a timer ran out.
+// A finding belongs to a frame: the frame that shows it, or the last frame before a timer ran out.
 struct Finding {
     const FindingKind* kind = nullptr;
-    Severity severity = Severity::note;  // that of its kind, unless the case is milder
-    std::uint64_t frame = 0;             // number of the frame in the input, from 1
+    Severity severity = Severity::note;  // the severity of its kind, or a milder one
+    std::uint64_t frame = 0;             // the frame's number in the input, from 1
     capture::Clock clock = capture::Clock::none;
     std::int64_t time = 0;  // nanoseconds, as `clock` says
     std::string dChannel;
-    std::optional<std::uint64_t> call;  // its number, if the finding is about a call
+    std::optional<std::uint64_t> call;  // the call's number, if the finding is about a call
     std::string sentence;               // what happened, with the values of this case; no full stop
-    std::uint32_t count = 1;            // how often it has happened since
-    std::vector<std::string> channels;  // "7", "2/7": the B channels that it says are stuck
+    std::uint32_t count = 1;            // how many occurrences this finding stands for
+    std::vector<std::string> channels;  // the B channels that the finding calls stuck: "7", "2/7"
 };
 
 }  // namespace calls

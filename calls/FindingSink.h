@@ -1,4 +1,4 @@
-// Where findings go.
+// The interface through which findings are reported.
 #ifndef CALLS_FINDINGSINK_H
 #define CALLS_FINDINGSINK_H
 

@@ -17,7 +17,7 @@ Number numberOf(const isdn::PartyNumber& party) {
     return {std::string(party.digits), party.type, party.plan, party.presentation};
 }
 
-// The first element counts when one stands twice (Q.931 4.5.1).
+// When an element occurs twice, the first one counts (Q.931 4.5.1).
 void learnNumber(Number& number, const Element& found) {
     if (!number.digits.empty() || found.octets.empty())
         return;
@@ -44,7 +44,7 @@ void learnDigits(Life& life, const Message& message) {
         life.digitsFromKeypad = true;
         digits = keypad;
     }
-    constexpr std::size_t most = 256;  // more are no number that anybody dials
+    constexpr std::size_t most = 256;  // nobody dials a longer number
     if (call.called.digits.size() + digits.size() <= most)
         call.called.digits.append(digits);
     if (!isSetup && (party || !keypad.empty())) {
@@ -134,13 +134,14 @@ std::optional<CauseGiven> causeOf(const Message& message) {
     return given;
 }
 
-// N(R) of the message covers the frame that began the clearing (modulo 128).
+// Whether N(R) of the message acknowledges the frame that began the clearing (modulo 128).
 bool covers(const Message& message, std::uint8_t ns) {
     const unsigned ahead = (message.layer2.nr - ns - 1U) & 127U;
     return message.layer2.hasNr() && ahead < 64;
 }
 
-// A terminal refuses a call to all terminals, or is let go because another one has it.
+// Whether the message is about one terminal of a call that was offered to all: the terminal refuses, or it is
+// released because another one has the call.
 bool concernsOneTerminal(const Life& life, const Message& message) {
     if (!life.call.broadcast)
         return false;
@@ -270,7 +271,7 @@ void conclude(Life& life, EndedBy by, const Moment& end) {
         call.outcome = Outcome::noAnswer;
     else
         call.outcome = call.cause ? outcomeOf(*call.cause) : Outcome::other;
-    // A caller that gives a reason ("no answer" as a timer ran out) has not simply hung up.
+    // A caller that gives a reason, for example that a timer ran out, has not simply hung up.
     if (call.outcome == Outcome::other && byOrigin && call.clearingSeen && !call.beforeTrace)
         call.outcome = Outcome::abandoned;
 }

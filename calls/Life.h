@@ -20,7 +20,7 @@ struct Life {
     bool proceeding = false;          // CALL PROCEEDING or later: no more digits come
     bool digitsFromKeypad = false;
     bool ended = false;
-    std::uint64_t generation = 0;      // of its deadlines; older ones are void
+    std::uint64_t generation = 0;  // the generation of its deadlines that count; older deadlines are ignored
     std::optional<Side> releasedBy;    // who sent RELEASE first
     std::optional<Side> clearedFirst;  // who sent the first clearing message
     std::uint8_t clearingNs = 0;       // its N(S), if it was an I frame
@@ -28,14 +28,14 @@ struct Life {
     bool crossingDecided = false;  // whether the other side cleared on its own
     std::optional<std::int64_t> connectAt;
     std::vector<std::uint8_t> identity;  // of SUSPEND or RESUME
-    // Of a broadcast SETUP: the terminals that answered, and those that are out of it.
+    // For a broadcast SETUP, by TEI: the terminals that answered, and those that have left the call.
     std::bitset<128> joined;
     std::bitset<128> left;
     std::optional<std::uint8_t> winner;  // the one that got CONNECT ACKNOWLEDGE
 };
 
-// Takes over what a message says about the call: numbers, bearer, channel, times, causes. Whether the call
-// begins or ends with it is not looked at.
+// Takes over what a message says about the call: numbers, bearer, channel, times, causes. It does not decide
+// whether the call begins or ends with the message.
 void learn(Life& life, const Message& message);
 
 // Fills in what is known only at the end: outcome, duration, who cleared.

@@ -8,7 +8,8 @@ using isdn::FrameType;
 
 namespace {
 
-// What is near an event is not hidden. As long as a link may be idle before it is polled (T203).
+// Keep-alives are not hidden within this time of an event. It is as long as a link may be idle before it is
+// polled (T203).
 constexpr std::int64_t nearby = 10 * second;
 
 }  // namespace
@@ -110,8 +111,8 @@ void Link::answer(const Sample& sample, Marks& marks, std::vector<LinkEvent>& ev
     const std::size_t asking = indexOf(other(sample.from()));
     if (settingUp_[asking]) {
         settingUp_[asking] = false;
-        // The second UA, of SABMEs that crossed, begins nothing: frames may have been numbered since the
-        // first.
+        // When two SABMEs crossed, the second UA does not begin the numbers again, because numbered frames
+        // may have passed since the first UA.
         if (state_ == LinkState::up)
             return;
         for (Stream& stream : streams_)
@@ -154,8 +155,8 @@ void Link::isAlive(const Sample& sample) {
         return;
     const bool both = heard_[0] && heard_[1];
     const bool waits = settingUp_[indexOf(other(sample.from()))] || releasing_[indexOf(other(sample.from()))];
-    // Who has asked for something sends numbered frames only once it was answered; the other side's may have
-    // been on their way.
+    // A side that waits for the answer to its SABME or DISC sends no numbered frames. Those of the other side
+    // may have been on their way already.
     const bool sends = sample.layer2.type == FrameType::I && !waits && state_ != LinkState::unknown;
     if (!both && !sends)
         return;

@@ -1,5 +1,5 @@
-// One link of a D channel (a TEI at a SAPI) as an observer sees it: its state, what each frame is to it, and
-// what the receivers accept (Q.921 5).
+// One link of a D channel (a TEI at a SAPI) as an observer sees it: its state, the meaning of each frame for
+// it, and which frames the receivers accept (Q.921 5).
 #ifndef CALLS_LINK_H
 #define CALLS_LINK_H
 
@@ -26,12 +26,12 @@ enum class LinkState : std::uint8_t {
 // "unknown", "down", "establishing", "up", "releasing".
 std::string_view nameOf(LinkState state);
 
-// What a frame is to its link. A list shows these as marks.
+// What a frame means for its link. `lapdread list` shows these as marks.
 struct Marks {
-    capture::Role role = capture::Role::unknown;  // of our side, as far as known by now
+    capture::Role role = capture::Role::unknown;  // the role of our side, as far as it is known by now
     std::optional<bool> command{};                // empty while it is not known
-    // Of I frames and UI: whether the receiver's layer 2 hands it up. Empty for other frames, and for a frame
-    // behind a hole until the receiver's N(R) decides.
+    // For I and UI frames: whether the receiver's layer 2 hands the message up. Empty for other frames, and
+    // for a frame behind a hole, until the receiver's N(R) decides.
     std::optional<bool> accepted{};
     LinkState state = LinkState::unknown;  // after the frame
     bool retransmitted = false;            // its N(S) was sent before
@@ -41,16 +41,16 @@ struct Marks {
     bool linkDown = false;                 // DM, or the answer to DISC: the link is not up any more
     bool unseenSetUp = false;              // numbers begin at 0 again: a SABME is missing in the trace
     bool contradictsRole = false;
-    // A poll that may be hidden if an answer follows; and the answer, with the number of the frame that it
-    // answers: both may be hidden.
+    // `keepAlive`: a poll that says nothing but that the link is alive; it may be hidden if its answer
+    // follows. `answers`: the number of the poll that this frame answers, if both may be hidden.
     bool keepAlive = false;
     std::optional<std::uint64_t> answers{};
 };
 
-// What happened besides, for those who look for faults.
+// What else happened on the link. The findings are made of these events.
 struct LinkEvent {
     enum class Kind : std::uint8_t {
-        hole,               // `hole` was lost by `by`
+        hole,               // the frames of `hole` were lost by `by`
         nrInvalid,          // N(R) `number` acknowledges what was not sent
         unseenSetUp,        // numbers begin at 0 again without SABME
         setUpAgain,         // SABME while the link was up
@@ -85,14 +85,14 @@ class Link {
     void mayLack(Side side);
     // The recorder, or the board, was restarted: nothing is known for sure.
     void forget();
-    // Holes and numbers about which nothing will be decided any more.
+    // The trace has ended. Appends events for holes and numbers that were not decided.
     void finish(std::vector<LinkEvent>& events);
 
     LinkState state() const { return state_; }
     // When and at which frame the state was entered.
     std::int64_t since() const { return since_; }
     std::uint64_t sinceFrame() const { return sinceFrame_; }
-    // The set-up itself was seen; otherwise the link is up at least since `since`.
+    // Whether the set-up itself was seen. If not, the link may have been up before `since`.
     bool sawSetUp() const { return sawSetUp_; }
     const CommandBits& commands() const { return commands_; }
     const Stream& sentBy(Side side) const { return streams_[indexOf(side)]; }

@@ -11,7 +11,7 @@ namespace calls {
 
 namespace {
 
-// What follows this soon after the recorder has missed frames may come of that.
+// What is seen within this time after the recorder has missed frames may only be a consequence of that.
 constexpr std::int64_t nearLoss = 10 * second;
 // Fewer frames than these do not show that a direction is absent.
 constexpr std::uint64_t fewFrames = 4;
@@ -85,7 +85,7 @@ void LinkFindings::take(const DChannel& channel) {
     due_ = std::min(due_, watch.due());
 }
 
-// Which access it is: a channel identification says so, a TEI that was assigned suggests it.
+// Learns which access it is. A channel identification says so; a TEI that was assigned suggests it.
 void LinkFindings::learn(const Sample& sample) {
     if (sample.layer2.carriesMessage() && sample.layer2.type == isdn::FrameType::I)
         learnFromMessage(sample);
@@ -186,7 +186,8 @@ void LinkFindings::collect(LinkWatch& watch, std::uint8_t tei) {
     watch.observations().clear();
 }
 
-// Two ends of one role, or a loop, break whatever else there is.
+// Drops other observations while two ends play one role or the line is looped, because these follow from
+// that.
 void LinkFindings::observe(Observation observation, std::uint8_t tei) {
     const bool isRole = observation.kind == &findings::sameRole || observation.kind == &findings::lineLooped;
     if (roles_.broken() && !isRole)
@@ -217,8 +218,8 @@ void LinkFindings::lost(std::string sentence) {
 
 void LinkFindings::restarted() {
     forgetWhatWaits();
-    // Before the first frame, a start is nothing that was interrupted. The recorder's word and the clock that
-    // falls are one restart.
+    // A start before the first frame interrupts nothing. The recorder's report and the clock that falls are
+    // one restart, so it is reported once for each frame.
     if (std::exchange(restartSaid_, lastFrame_) != lastFrame_)
         observe({&findings::boardRestarted, findings::boardRestarted.severity, lastFrame_, lastAt_,
                  "the recorder or the board was started again"},

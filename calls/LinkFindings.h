@@ -1,4 +1,4 @@
-// What is wrong, or worth knowing, with the links of one D channel.
+// Findings about the links of one D channel.
 #ifndef CALLS_LINKFINDINGS_H
 #define CALLS_LINKFINDINGS_H
 
@@ -18,9 +18,9 @@
 
 namespace calls {
 
-// Looks at what a DChannel says of its frames. Reports to a sink, each fault once and then, ten minutes later
-// at the earliest, how often it has come again. Memory is bounded as that of the channel. Used by the thread
-// that feeds the channel.
+// Looks at what a DChannel says about its frames, and reports findings to a sink. A fault that comes again
+// within ten minutes is only counted (RepeatedFindings). Memory is bounded like that of the channel. Used by
+// the thread that feeds the channel.
 class LinkFindings {
   public:
     struct Options {
@@ -34,15 +34,15 @@ class LinkFindings {
     LinkFindings(const LinkFindings&) = delete;
     LinkFindings& operator=(const LinkFindings&) = delete;
 
-    // Takes what the channel has said of its last frame.
+    // Takes what the channel says about its last frame.
     void take(const DChannel& channel);
-    // The clock has come to `at` and no frame has.
+    // The clock has come to `at`, and no frame has come.
     void advance(std::int64_t at);
     // The recorder says, in `sentence`, that frames are missing behind the last one.
     void lost(std::string sentence);
     // The board, or the recorder, was started again behind the last frame.
     void restarted();
-    // The end of the trace. The channel was told before.
+    // The trace has ended. Call this after the channel's finish().
     void finish(const DChannel& channel);
 
     Access access() const { return around_.access; }

@@ -1,4 +1,4 @@
-// What N(S) and N(R) of a link's frames tell.
+// The part of Link that follows the sequence numbers N(S) and N(R).
 #include <functional>
 #include <utility>
 
@@ -19,7 +19,7 @@ std::size_t textOf(const isdn::Layer2& frame) {
 
 void Link::supervise(const Sample& sample, std::vector<LinkEvent>& events, std::vector<KeptFrame>& late) {
     isAlive(sample);
-    const Side sender = other(sample.from());  // of the frames that N(R) is about
+    const Side sender = other(sample.from());  // the side whose frames N(R) acknowledges
     if (beginsAgain(sample))
         return;
     Stream& stream = streams_[indexOf(sender)];
@@ -29,7 +29,8 @@ void Link::supervise(const Sample& sample, std::vector<LinkEvent>& events, std::
     report(sample, sender, stream.acknowledged(sample, missing_[indexOf(sender)].reason, late), events);
 }
 
-// Both numbers are 0, the octets are new ones, and this does not come of counting.
+// Whether the numbers of the link begin again: both are 0, the octets are new, and counting on would not have
+// led to 0.
 bool Link::beginsAgain(const Sample& sample) const {
     const isdn::Layer2& frame = sample.layer2;
     const Stream& stream = streams_[indexOf(sample.from())];
@@ -55,7 +56,7 @@ void Link::information(const Sample& sample, Marks& marks, std::vector<LinkEvent
     }
     Stream& stream = streams_[indexOf(from)];
     std::string_view recorded = std::exchange(missing_[indexOf(from)].reason, {});
-    // What the receiver has acknowledged was sent, and is missing in the trace.
+    // The receiver has acknowledged these frames, so they were sent and are missing in the trace.
     const std::optional<PendingNr>& pending = beyond_[indexOf(other(from))];
     if (pending && recorded.empty() && stream.isFirm() && isAhead(sample.layer2.ns, stream.next()) &&
         !isAhead(pending->nr, sample.layer2.ns))
@@ -71,8 +72,8 @@ void Link::information(const Sample& sample, Marks& marks, std::vector<LinkEvent
     settleNr(sample, events);
 }
 
-// An N(R) beyond what was seen: by now the sender has shown how far it was. The two directions are recorded
-// up to 8 ms out of order.
+// Decides about an N(R) that acknowledged more than was seen, now that the sender has shown how far it was.
+// It waits for that because the two directions are recorded up to 8 ms out of order.
 void Link::settleNr(const Sample& sample, std::vector<LinkEvent>& events) {
     std::optional<PendingNr>& pending = beyond_[indexOf(other(sample.from()))];
     if (!pending)
@@ -82,7 +83,7 @@ void Link::settleNr(const Sample& sample, std::vector<LinkEvent>& events) {
     const bool prompt = sample.at - pending->at <= timers_->slack;
     if (!covered && prompt)
         return;
-    // A hole up to this number has been reported, as the recorder's.
+    // Whether a hole up to this number has been reported already, as one that the recorder made.
     const bool holeWasReported = !events.empty() && events.back().kind == LinkEvent::Kind::hole &&
                                  events.back().frame == sample.number;
     if (!(covered && prompt) && !holeWasReported)

@@ -17,7 +17,7 @@ constexpr std::size_t flapTimes = 3;
 constexpr std::int64_t notReadyTime = 10 * second;
 constexpr std::int64_t hour = 3600 * second;
 constexpr unsigned idlePeriods = 3, leastPeriods = 2;
-// Fewer repetitions than these are an accident, not a line that loses frames.
+// Fewer repetitions, or on fewer occasions, do not show a line that loses frames.
 constexpr std::uint64_t leastRepeated = 10, leastOccasions = 3;
 
 constexpr std::array bothSides{Side::us, Side::peer};
@@ -63,7 +63,7 @@ void LinkWatch::take(const DChannel& channel, const Sample& sample, const Circum
     if (sample.layer2.hasNr() && channel.link() != nullptr)
         windows(sample, *channel.link(), around);
     if (marks.linkUp || marks.linkDown)
-        notReady_ = {};  // the link begins anew, and both sides with it
+        notReady_ = {};  // the link was set up again, so both sides are ready
     if (sample.layer2.type == FrameType::I)
         repetitions(sample, marks);
     up_ = marks.state == LinkState::up;
@@ -73,7 +73,7 @@ void LinkWatch::take(const DChannel& channel, const Sample& sample, const Circum
     schedule(around);
 }
 
-// A poll ends with F; SABME, DISC and DM end the wait for it.
+// A frame with F answers a poll. SABME, DISC and DM end the wait for the answer.
 void LinkWatch::polls(const Sample& sample) {
     if (isSetUp(sample.layer2.type) || sample.layer2.type == FrameType::DISC ||
         sample.layer2.type == FrameType::DM) {
@@ -109,7 +109,8 @@ void LinkWatch::setUps(const Sample& sample, const Marks& marks, const Circumsta
     flaps(sample, marks, around);
 }
 
-// A basic access sets its links up as needed; a standby D channel carries nothing that could be lost.
+// Flaps are not reported on basic access, which sets its links up as needed, nor on a standby D channel,
+// which carries nothing that could be lost.
 void LinkWatch::flaps(const Sample& sample, const Marks& marks, const Circumstances& around) {
     const bool mayFlap =
         around.access != Access::basic && !around.outOfService && (sentInformation_ || !around.grouped);
@@ -131,7 +132,7 @@ void LinkWatch::flaps(const Sample& sample, const Marks& marks, const Circumstan
                     secondsOf(sample.at - setUpTimes_.front()));
 }
 
-// What is on its way when the window is full waits for the receiver, who may say that it is not ready.
+// Once the window is full, the sender waits for the receiver, which may say that it is not ready.
 void LinkWatch::windows(const Sample& sample, const Link& link, const Circumstances& around) {
     const FrameType type = sample.layer2.type;
     Since& notReady = notReady_[indexOf(sample.from())];
@@ -156,7 +157,7 @@ void LinkWatch::windows(const Sample& sample, const Link& link, const Circumstan
     }
 }
 
-// I frames and polls demand an answer, whichever it is. A burst of them is one demand.
+// I frames and polls demand some answer. A burst of them is one demand.
 void LinkWatch::demands(const Sample& sample, const Circumstances& around) {
     if (sample.layer2.type != FrameType::I && !isPoll(sample))
         return;
@@ -271,7 +272,8 @@ void LinkWatch::expireDemands(Side side, std::int64_t at, const Circumstances& a
     }
 }
 
-// After a direction fell silent, SABMEs without an answer are what follows from it.
+// SABMEs without an answer are not reported after the direction was reported silent, because they follow from
+// that.
 void LinkWatch::expireSetUps(Side side, std::int64_t at, const Circumstances& around) {
     Asked& setUp = setUps_[indexOf(side)];
     if (at <= dueOf(setUp, around))

@@ -1,5 +1,4 @@
-// Watches one link for what only time shows: polls and SABMEs without an answer, full windows, silence,
-// flaps.
+// Finds what only time shows on a link: polls and SABMEs without an answer, full windows, silence, flaps.
 #ifndef CALLS_LINKWATCH_H
 #define CALLS_LINKWATCH_H
 
@@ -20,7 +19,7 @@ namespace calls {
 // has one link that stays up.
 enum class Access : std::uint8_t { unknown, basic, primary };
 
-// What a watch has found, for its owner to report.
+// What a watch has found. The owner of the watch reports it.
 struct Observation {
     const FindingKind* kind;
     Severity severity;
@@ -31,7 +30,7 @@ struct Observation {
 
 class LinkWatch {
   public:
-    // What the watch has to know of the D channel.
+    // What the watch has to know about the D channel.
     struct Circumstances {
         const Timers* timers;
         Access access = Access::unknown;
@@ -44,17 +43,18 @@ class LinkWatch {
 
     explicit LinkWatch(std::uint8_t tei) : tei_(tei) {}
 
-    // Takes what the channel has said of its last frame, which is of this link.
+    // Takes what the channel says about its last frame, which must belong to this link.
     void take(const DChannel& channel, const Sample& sample, const Circumstances& around);
-    // Reports what has not happened by `at`.
+    // Notes what should have happened by `at` and has not.
     void expire(std::int64_t at, const Circumstances& around);
     // When expire() may have something to report.
     std::int64_t due() const { return due_; }
-    // The recorder was started again, or has missed frames: what was waited for may have come.
+    // The recorder was started again, or has missed frames. What was waited for may have come, so nothing is
+    // waited for any more.
     void forget();
     void finish();
 
-    // Found since the last call; the owner clears it.
+    // What was found and not cleared yet. The owner reports the observations and clears the list.
     std::vector<Observation>& observations() { return observations_; }
 
   private:

@@ -1,4 +1,5 @@
-// What the link layer knows about the fate of messages: it tells "not answered" from "cannot be told".
+// What the link layer knows about the fate of messages. It decides whether a missing answer was really not
+// sent, or may only be missing in the trace.
 #ifndef CALLS_LINKWITNESS_H
 #define CALLS_LINKWITNESS_H
 
@@ -11,7 +12,7 @@
 
 namespace calls {
 
-// Of one TEI of one D channel, as of the last frame. Kept by the link's state machine.
+// Describes the link of one TEI of one D channel after the last frame. WitnessKeeper keeps it up to date.
 struct LinkWitness {
     static constexpr std::int64_t never = std::numeric_limits<std::int64_t>::min();
 
@@ -38,7 +39,7 @@ struct LinkWitness {
 std::string_view doubtAbout(const LinkWitness* link, std::uint64_t frame, std::int64_t at, Side asker,
                             Side answering);
 
-// Gives the witness of the link of a TEI that carries a table's calls; null if nothing is known of it.
+// Gives the witness of the link that carries the calls of a TEI, or null if nothing is known of that link.
 class LinkWitnesses {
   public:
     LinkWitnesses() = default;

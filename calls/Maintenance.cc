@@ -85,7 +85,7 @@ void Maintenance::restart(const Message& message) {
     ask(message, target, false);
 }
 
-// The same question again, while it waits for its answer, is its repetition.
+// The same question, sent again while it waits for its answer, is a repetition.
 void Maintenance::ask(const Message& message, const Target& target, bool isService) {
     for (Asked& each : asked_) {
         if (each.service == isService && each.target == target && each.asker == message.from()) {
@@ -104,7 +104,7 @@ void Maintenance::ask(const Message& message, const Target& target, bool isServi
                       momentOf(message), 0});
 }
 
-// A restart of a channel that is not a repetition has had its acknowledge in between.
+// Counts a restart of a channel that is no repetition, so an acknowledgement has come in between.
 void Maintenance::countRestart(const Message& message, const Target& target) {
     std::vector<ChannelKey> keys;
     for (std::uint32_t i = 0; target.kind == 0 && i < target.channels.size(); ++i) {
@@ -126,7 +126,7 @@ void Maintenance::countRestart(const Message& message, const Target& target) {
             continue;
         storm = true;
         which = key.number >= wholeInterface ? "the interface" : "channel " + toString(key);
-        while (times.size() > 1)  // said once, then counted anew
+        while (times.size() > 1)  // reported once; then the count begins again
             times.pop_front();
     }
     if (storm)

@@ -1,5 +1,5 @@
-// RESTART and SERVICE: what the two sides do about channels outside of calls (Q.931 5.5; the maintenance
-// messages of North American trunks).
+// Follows RESTART and SERVICE, with which the two sides reset channels and take them out of service (Q.931
+// 5.5; the maintenance messages of North American trunks).
 #ifndef CALLS_MAINTENANCE_H
 #define CALLS_MAINTENANCE_H
 
@@ -22,7 +22,7 @@
 
 namespace calls {
 
-// One B channel of a group. The interface is empty if it is implicit.
+// One B channel of a group. The interface is empty if the message does not name it.
 struct ChannelKey {
     std::optional<std::uint32_t> interface;
     std::uint32_t number = 0;
@@ -41,13 +41,14 @@ class Maintenance {
     Maintenance(const Timers& timers, const LinkWitnesses& links, FindingSink& sink)
         : timers_(timers), links_(links), sink_(sink) {}
 
-    // Any message; others than RESTART, SERVICE and their answers only show that their side is heard.
+    // Takes every message. Messages other than RESTART, SERVICE and their answers only show that their side
+    // is heard.
     void take(const Message& message);
-    // The clock has come to `at`; to be called before what happened then is handed in.
+    // The clock has come to `at`. Call this before handing in what happened at that time.
     void advance(std::int64_t at);
 
     Service serviceOf(const ChannelKey& channel) const;
-    // Which side has taken the channel furthest out of service.
+    // The side that has taken the channel furthest out of service; empty if it is in service.
     std::optional<Side> blockedBy(const ChannelKey& channel) const;
 
   private:

@@ -24,21 +24,24 @@ constexpr capture::Role opposite(capture::Role role) {
 inline constexpr std::int64_t millisecond = 1'000'000;
 inline constexpr std::int64_t second = 1'000 * millisecond;
 
-// A message that the receiver's layer 2 accepts: no duplicate, none out of sequence. A message of segments
-// comes once, put together, as part of its last frame. All views are valid during the call alone.
+// A message that the receiver's layer 2 accepts, so no duplicate and none out of sequence. A message that was
+// sent in segments comes once, put together, with the last of its frames. The views in it are valid only
+// during the call that hands it over.
 struct Message {
     const capture::Frame* frame = nullptr;
-    std::uint64_t number = 0;  // of the frame in the input, from 1
-    // Nanoseconds on the clock of this D channel, which never goes back: durations are differences of it.
+    std::uint64_t number = 0;  // the frame's number in the input, from 1
+    // Nanoseconds on the clock of this D channel, which never goes back. A duration is the difference of two
+    // of these.
     std::int64_t at = 0;
-    std::uint32_t group = 0;  // the D channel, or the group of D channels that share their calls (NFAS)
-    capture::Role role = capture::Role::unknown;  // of our side, as the link's frames have shown it
+    // number of the D channel, or of the group of D channels that share their calls (NFAS)
+    std::uint32_t group = 0;
+    capture::Role role = capture::Role::unknown;  // the role of our side, as the link's frames have shown it
     isdn::Layer2 layer2;
     isdn::Layer3 layer3;
     isdn::Variant variant = isdn::Variant::net5;
 
     Side from() const { return frame->transmitted ? Side::us : Side::peer; }
-    // Of the side that sent it.
+    // The role of the side that sent the message.
     capture::Role senderRole() const { return from() == Side::us ? role : opposite(role); }
     isdn::Sender sender() const {
         const capture::Role sends = senderRole();

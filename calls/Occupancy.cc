@@ -16,13 +16,13 @@ constexpr std::uint32_t lastOfE1 = 31;
 
 std::int64_t hoursIn(std::int64_t time) { return time >= 0 ? time / hour : (time + 1) / hour - 1; }
 
-// The other side takes a call, and with it the channel.
+// Whether the message says that the other side takes the call, and with it the channel.
 bool takes(std::uint8_t messageType) {
     return messageType == type::callProceeding || messageType == type::setupAcknowledge ||
            messageType == type::alerting || messageType == type::connect;
 }
 
-// What a message makes of its call's channel.
+// Whether a message may begin the use of its call's channel.
 bool mayBegin(const Message& message, const Call& call) {
     const std::uint8_t messageType = message.layer3.type;
     if (messageType == type::retrieveAcknowledge || messageType == type::resumeAcknowledge)

@@ -1,4 +1,4 @@
-// How much the B channels were in use: by channel, at once, and by the hour.
+// Measures how much the B channels were in use: each channel, at the same time, and in each hour.
 #ifndef CALLS_OCCUPANCY_H
 #define CALLS_OCCUPANCY_H
 
@@ -15,27 +15,27 @@
 
 namespace calls {
 
-// An hour of the clock that frames' times count on: whole hours since its beginning.
+// An hour of the clock that the frames' times belong to, as whole hours since that clock began.
 struct HourKey {
     capture::Clock clock = capture::Clock::none;
     std::int64_t hour = 0;
     auto operator<=>(const HourKey&) const = default;
 };
-// Nothing of a time that no clock has told.
+// The hour of a moment; nothing if the moment has no time.
 std::optional<HourKey> hourOf(const Moment& moment);
 
 // A channel is in use from the first answer to SETUP until its call has ended or is on hold.
 class Occupancy {
   public:
     struct Channel {
-        std::uint64_t calls = 0;  // that it was given to
+        std::uint64_t calls = 0;  // the calls that it was given to
         std::int64_t used = 0;    // nanoseconds
         bool usedAtEnd = false;   // a call held it when the trace ended
-        bool stuck = false;       // there was a finding that says so
+        bool stuck = false;       // a finding says so
         std::vector<std::uint64_t> holders{};
-        Moment since{};  // while there are holders
+        Moment since{};  // when the present use began, while there are holders
     };
-    // Of the calls of one D channel, or of several that share their calls.
+    // The channels for the calls of one D channel, or of several D channels that share their calls.
     struct Group {
         std::string dChannels;  // their names
         std::map<ChannelKey, Channel> channels{};
@@ -52,7 +52,7 @@ class Occupancy {
         double erlangs() const;
     };
 
-    // As a Listener is told.
+    // To be called as the functions of calls::Listener.
     void heard(const Message& message, const Call& call);
     void ended(const Call& call);
     void found(const Finding& finding);
@@ -60,10 +60,10 @@ class Occupancy {
     void finish(const std::vector<Span>& spans);
 
     const std::map<std::uint32_t, Group>& groups() const { return groups_; }
-    // Nanoseconds for which channels were in use, all together, in each hour in which one was.
+    // For each hour in which a channel was in use: the time in use of all channels together, in nanoseconds.
     const std::map<HourKey, std::int64_t>& hours() const { return hours_; }
 
-    // Beyond these, channels and hours are not told apart any more, and not counted.
+    // The largest number of channels, and of hours. Others are not counted.
     static constexpr std::size_t mostChannels = 65536;
     static constexpr std::size_t mostHours = 20000;
 
@@ -80,9 +80,9 @@ class Occupancy {
     std::size_t channels_ = 0;
 };
 
-// The channels that a trunk has: of a primary rate those of E1 or T1.
+// How many B channels a trunk has: 30 (E1), 23 (T1) or two (basic access).
 enum class TrunkSize : std::uint8_t { unknown, e1, t1, basic };
-// What the channels in use and the variant suggest; unknown if no call has used one.
+// The size that the channels in use and the variant suggest; unknown if no call has used a channel.
 TrunkSize learntSize(const Occupancy::Group& group);
 // The B channels of a trunk of this size on which no call was, for each interface that calls have named: 1 to
 // 15 and 17 to 31, 1 to 23, or 1 and 2. None of an unknown size.

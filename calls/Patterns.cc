@@ -14,7 +14,7 @@ namespace {
 
 constexpr std::size_t callsThatEndTogether = 3;
 constexpr std::size_t callsOfOneLength = 5;
-// With more calls to compare, chance alone makes five of one length.
+// Among more calls than these, five would have the same length by chance.
 constexpr std::size_t durationsCompared = 30;
 constexpr std::int64_t shortestLength = 10 * second;
 constexpr std::int64_t lengthTolerance = second / 2;
@@ -24,7 +24,7 @@ constexpr std::int64_t burstSilence = 600 * second;
 constexpr std::size_t prefixDigits = 4;
 constexpr std::size_t mostFailures = 256;
 
-// Causes of everyday life: nobody looks for what such calls have in common.
+// Ordinary causes. Calls that end with one of them are not compared.
 bool isOrdinary(std::uint8_t cause) {
     constexpr std::array<std::uint8_t, 7> ordinary{16, 17, 18, 19, 21, 26, 31};
     return std::find(ordinary.begin(), ordinary.end(), cause) != ordinary.end();
@@ -49,8 +49,8 @@ void Patterns::linkChanged(const Moment& moment, const std::string& dChannel, bo
     link_ = LinkChange{moment, dChannel, isUp};
 }
 
-// The link was down for too long, or one side cleared as the link went or came, for a reason that is not
-// everyday's.
+// Whether the call ended because of its link: the link was down for too long, or one side cleared it when the
+// link went down or came up, and with a cause that is not ordinary.
 bool Patterns::endsWithLink(const Call& call) const {
     if (!link_)
         return false;

@@ -1,4 +1,4 @@
-// What shows in several calls together: they end at once, last equally long, or fail for one reason.
+// Findings about several calls together: many end at once, many last equally long, many fail for one reason.
 #ifndef CALLS_PATTERNS_H
 #define CALLS_PATTERNS_H
 
@@ -14,15 +14,15 @@
 
 namespace calls {
 
-// One object for each table of calls. Looks at calls that have ended, in the order in which they are handed
-// out. Memory is bounded: it remembers the last few.
+// One object serves one table of calls. It looks at the calls that have ended, in the order in which the
+// table reports them. Memory is bounded: it remembers the last few calls.
 class Patterns : public CallObserver {
   public:
     explicit Patterns(FindingSink& sink) : sink_(sink) {}
     void ended(Call& call, const Message* by) override;
     // A link went down, or was set up (again), in this frame.
     void linkChanged(const Moment& moment, const std::string& dChannel, bool isUp);
-    // The clock has come to `at`; to be called before what happened then is handed in.
+    // The clock has come to `at`. Call this before handing in what happened at that time.
     void advance(std::int64_t at);
     // The end of the trace.
     void finish();
@@ -48,7 +48,7 @@ class Patterns : public CallObserver {
         bool isUp = false;
     };
 
-    std::optional<LinkChange> link_;      // the last one
+    std::optional<LinkChange> link_;      // the last change
     std::vector<std::string> lost_;       // numbers of the calls that ended with it, within a second
     std::int64_t lostAt_ = 0;             // when the first of them ended
     std::deque<std::int64_t> durations_;  // of the last answered calls

@@ -1,4 +1,4 @@
-// Passes findings on, each kind of a link once in ten minutes.
+// Limits repeated findings: of each kind, one in ten minutes for each link.
 #ifndef CALLS_REPEATEDFINDINGS_H
 #define CALLS_REPEATEDFINDINGS_H
 
@@ -13,8 +13,9 @@
 
 namespace calls {
 
-// The first finding of a kind goes to the sink at once. Those that come within ten minutes are counted, and
-// the last of them goes with their count: with the next one after that time, or at the end.
+// Reports the first finding of a kind to the sink at once. Counts the findings that come in the next ten
+// minutes and reports only the last of them, with their number, when the next finding comes after that time,
+// or at the end.
 class RepeatedFindings {
   public:
     explicit RepeatedFindings(FindingSink& sink) : sink_(&sink) {}
@@ -27,7 +28,7 @@ class RepeatedFindings {
     using Key = std::tuple<const FindingKind*, Severity, std::uint8_t>;  // with the TEI
     struct Repeats {
         std::int64_t reported = 0;
-        std::optional<Finding> last{};  // its count says how many it stands for
+        std::optional<Finding> last{};  // its count is the number of findings that it stands for
     };
 
     FindingSink* sink_;

@@ -19,7 +19,8 @@ std::size_t hashOf(const Sample& sample) {
     return std::hash<std::string_view>()({reinterpret_cast<const char*>(octets.data()), octets.size()});
 }
 
-// A poll and its answer are the same octets if both sides' N(R) are equal.
+// Whether the frame may be a poll or an answer; these consist of the same octets when the N(R) of both sides
+// are equal.
 bool mayAnswer(const Sample& sample) {
     return sample.layer2.hasNr() && !sample.layer2.hasNs() && sample.layer2.pf;
 }

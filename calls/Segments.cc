@@ -21,7 +21,7 @@ Segments::Taken Segments::take(Message& message) {
             return Taken::outOfOrder;
         Pieces pieces;
         pieces.type = header->messageType;
-        // The header of the whole message is that of its segments, but for the type.
+        // The whole message has the header of its segments, except for the message type.
         pieces.octets.assign(layer3.header.begin(), layer3.header.end());
         pieces.octets.back() = header->messageType;
         pieces.remaining = header->remaining + 1U;

@@ -11,19 +11,20 @@
 
 namespace calls {
 
-// Of one link and both sides. Memory is bounded: a few messages at a time, of eight segments each.
+// One object serves both sides of one link. Memory is bounded: it keeps at most 64 messages of at most eight
+// segments.
 class Segments {
   public:
     enum class Taken : std::uint8_t {
         no,         // the message is no segment
-        kept,       // more segments are to come
+        kept,       // more segments must come
         complete,   // `message.layer3` is the whole message now, valid until the next call
         outOfOrder  // a segment without its beginning, or one that does not follow: dropped
     };
     Taken take(Message& message);
 
-    // The frame of a message whose next segment has not come for `limit` nanoseconds, and which is forgotten
-    // now; 0 if there is none. To be asked until it says 0.
+    // Forgets a message whose next segment has not come for `limit` nanoseconds, and returns the number of
+    // its frame; returns 0 if there is none. Call it until it returns 0.
     std::uint64_t unfinished(std::int64_t at, std::int64_t limit);
 
   private:
@@ -37,7 +38,7 @@ class Segments {
         auto operator<=>(const Key&) const = default;
     };
     struct Pieces {
-        std::vector<std::uint8_t> octets;  // of the message as it was before it was cut
+        std::vector<std::uint8_t> octets;  // of the message before it was divided
         std::uint8_t type = 0;
         unsigned remaining = 0;
         std::uint64_t frame = 0;

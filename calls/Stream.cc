@@ -6,7 +6,7 @@ namespace calls {
 
 namespace {
 
-// More frames than any window lets a sender have on the way without an answer.
+// More frames than the window of any sender allows without an acknowledgement.
 constexpr std::size_t mostWaiting = 16;
 
 }  // namespace
@@ -68,7 +68,7 @@ Stream::Taken Stream::take(const Sample& sample, std::string_view recorded) {
     else if (ns != expected_)
         taken.verdict = Verdict::duplicate;
     else if (hole_) {
-        // The first missing frame is sent again: the receiver has not got it.
+        // The first missing frame is sent again, so the receiver had not received it.
         taken.decided = giveUp();
         taken.by = LostBy::line;
     }
@@ -118,7 +118,8 @@ Stream::Taken Stream::acknowledged(const Sample& sample, std::string_view record
         return taken;
     }
     if (hole_ && isAhead(nr, expected_)) {
-        // The receiver has what the trace lacks, and what it acknowledges behind it.
+        // The receiver has received the frames that the trace lacks, and those behind them that it
+        // acknowledges.
         std::vector<KeptFrame> waiting = std::move(waiting_);
         taken.decided = giveUp();
         taken.by = LostBy::recorder;

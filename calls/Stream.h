@@ -1,4 +1,4 @@
-// The I frames of one side of a link, as the other side's layer 2 takes them.
+// Follows the I frames of one side of a link, and decides which of them the other side's layer 2 accepts.
 #ifndef CALLS_STREAM_H
 #define CALLS_STREAM_H
 
@@ -35,10 +35,10 @@ struct Sample {
     Side from() const { return frame->transmitted ? Side::us : Side::peer; }
 };
 
-// A frame that was kept, with octets of its own.
+// A frame with its own copy of the octets.
 struct KeptFrame {
     explicit KeptFrame(const Sample& sample);
-    // A view of it, valid as long as this.
+    // A view of the kept frame, valid as long as this object.
     Sample sample() const;
 
     std::vector<std::uint8_t> octets;
@@ -53,7 +53,7 @@ struct Hole {
     unsigned count = 0;       // how many are missing
     std::uint64_t frame = 0;  // number of the frame behind it
     std::int64_t at = 0;
-    std::string_view reason{};  // what the recorder says about it; empty if it says nothing
+    std::string_view reason{};  // what the recorder says about the missing frames; empty if it says nothing
 };
 
 // Who lost the frames of a hole.
@@ -75,24 +75,24 @@ class Stream {
         std::optional<Hole> decided{};
     };
 
-    // An I frame of this side. `recorded` is what says that the recorder has missed frames since the last
-    // one; empty if nothing does. A hole in what our own side sent is the recorder's.
+    // Takes an I frame of this side. `recorded` is the recorder's own report that it has missed frames since
+    // the last one, or empty. A hole in what our own side sent was made by the recorder.
     Taken take(const Sample& sample, std::string_view recorded);
-    // N(R) of the other side; `rejects` if it came in REJ. What was waiting and was accepted goes to
-    // `accepted`.
+    // Takes the N(R) of a frame of the other side. Appends to `accepted` the frames that were waiting and are
+    // accepted now.
     Taken acknowledged(const Sample& sample, std::string_view recorded, std::vector<KeptFrame>& accepted);
 
     // The link was set up: numbers begin at 0.
     void reset();
-    // Frames may be missing from here on: the next number is taken as it comes.
+    // Frames may be missing from here on. The next number is believed, whatever it is.
     void loosen();
 
-    // A hole about which nothing was decided. It is closed.
+    // Closes the hole about which nothing was decided, and returns it.
     std::optional<Hole> giveUp();
 
     unsigned outstanding() const { return firm_ ? ahead(next_, acknowledged_) : 0; }
     std::uint8_t acknowledged() const { return acknowledged_; }
-    // N(R) that acknowledges what this side has not sent, as far as the trace shows.
+    // Whether N(R) acknowledges what this side has not sent, as far as the trace shows.
     bool isBeyond(std::uint8_t nr) const { return firm_ && isAhead(nr, next_); }
     bool isFirm() const { return firm_; }
     std::uint8_t next() const { return next_; }
@@ -103,7 +103,7 @@ class Stream {
 
     bool known_ = false;             // some number was seen
     bool firm_ = false;              // the next number is known for sure
-    std::uint8_t next_ = 0;          // V(S): behind the highest number that was sent
+    std::uint8_t next_ = 0;          // V(S): the number after the highest that was sent
     std::uint8_t expected_ = 0;      // V(R) of the receiver
     std::uint8_t acknowledged_ = 0;  // the last N(R) of the receiver
     bool recovering_ = false;        // the receiver waits for `expected_` to be sent again

@@ -52,8 +52,8 @@ void TeiWatch::take(const Sample& sample, std::int64_t longest, std::vector<Obse
     }
 }
 
-// A terminal chooses Ri at random for each answer: two values for one TEI in answers to one check are two
-// terminals.
+// A terminal chooses Ri at random for each answer. So two values for one TEI in the answers to one check show
+// two terminals.
 void TeiWatch::answers(const Sample& sample, const isdn::TeiMessage& message, std::int64_t longest,
                        std::vector<Observation>& found) {
     Answer& answer = answers_[message.action];

@@ -1,4 +1,4 @@
-// What the management of TEIs shows: TEIs that were denied, removed, doubled or assigned (Q.921 5.3).
+// Findings in the management of TEIs: TEIs that were denied, removed, doubled or assigned (Q.921 5.3).
 #ifndef CALLS_TEIWATCH_H
 #define CALLS_TEIWATCH_H
 
@@ -17,7 +17,8 @@ class TeiWatch {
     // Takes a UI frame of management and appends what it shows. `longest` (T201) is how long after a check
     // its answers may come.
     void take(const Sample& sample, std::int64_t longest, std::vector<Observation>& found);
-    // The D channel is one of a primary rate: TEIs need not be assigned there. Gives the first that was.
+    // Tells the watch that the D channel is one of a primary rate, where TEIs need not be assigned. Returns
+    // the observation of the first TEI that was assigned, if there is one.
     std::optional<Observation> isPrimary();
 
   private:

@@ -1,4 +1,5 @@
-// The timers of Q.921 and Q.931 that findings go by. Each can be changed, since networks differ.
+// The timers of Q.921 and Q.931 that decide when an answer is late. The user can change each, because
+// networks differ.
 #ifndef CALLS_TIMERS_H
 #define CALLS_TIMERS_H
 
@@ -12,8 +13,8 @@
 
 namespace calls {
 
-// Values in nanoseconds. Defaults are those of Q.931 table 9-1 and 9-2 and Q.921 5.9, where these give
-// several the one that raises fewer alarms.
+// Values are in nanoseconds. The defaults are those of Q.931 tables 9-1 and 9-2 and Q.921 5.9. Where these
+// give several values, the default is the one that raises fewer alarms.
 struct Timers {
     // Layer 2
     std::int64_t t200 = 1 * second;
@@ -40,7 +41,7 @@ struct Timers {
     std::int64_t t318 = 4 * second;
     std::int64_t t319 = 4 * second;
     std::int64_t t322 = 4 * second;
-    // Added to each: the board's clock has ticks of 4 ms, at both ends.
+    // Added to each timer, because the board's clock is exact only to a tick of 4 ms at both ends.
     std::int64_t slack = 8 * millisecond;
 };
 
@@ -51,14 +52,15 @@ struct TimerName {
 };
 std::span<const TimerName> timerNames();
 
-// A timer that does not exist, or no duration. what() says which word is wrong.
+// Thrown for a timer that does not exist and for a value that is no duration. what() says which word is
+// wrong.
 class BadTimer : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
 };
 
-// Takes "T305=4s", "T316=500ms", "T307=3min"; a number without a unit is seconds. Case does not matter.
-// "T304" sets the timers of both sides. Throws BadTimer.
+// Sets a timer as `setting` says: "T305=4s", "T316=500ms", "T307=3min". A number without a unit is seconds.
+// Case does not matter. "T304" sets the timers of both sides. Throws BadTimer.
 void setTimer(Timers& timers, std::string_view setting);
 
 }  // namespace calls

@@ -41,13 +41,13 @@ std::string seconds(std::int64_t nanoseconds) {
 // A row for each question. The finding comes one timer after the last repetition.
 struct Waits::Rule {
     std::uint8_t ask;
-    capture::Role asker;            // of which side; unknown: of either
-    Types answers;                  // from the side that must answer
+    capture::Role asker;            // the role of the side that asks; unknown: either side
+    Types answers;                  // the messages that answer, from the other side
     bool clearingAnswers;           // a clearing message of either side ends the wait
-    bool sameSideAnswers;           // the side that sent `ask` has to go on
-    std::string_view timer;         // its name, for people
-    std::int64_t Timers::*user;     // its value if the user waits
-    std::int64_t Timers::*network;  // if the network does
+    bool sameSideAnswers;           // the side that sent `ask` must send the answer itself
+    std::string_view timer;         // the timer's name, for the sentence of the finding
+    std::int64_t Timers::*user;     // the timer's value if the user waits
+    std::int64_t Timers::*network;  // the timer's value if the network waits
     bool isRepeated;                // the sender repeats it once
     const FindingKind* finding;
     const FindingKind* repetition;
@@ -66,7 +66,8 @@ const std::vector<Waits::Rule>& Waits::rules() {
          "T310", &T::t310User, &T::t310Network, false, &findings::proceedingUnanswered, nullptr},
         {type::connect, capture::Role::user, typesOf({type::connectAcknowledge}), true, false, "T313",
          &T::t313, &T::t313, false, &findings::connectNotAcknowledged, nullptr},
-        // The standard leaves the answer to the user: it is missed only if this user has given it before.
+        // The standard leaves this answer to the user. It counts as missing only if this user has given it
+        // before.
         {type::connect, capture::Role::network, typesOf({type::connectAcknowledge}), true, false, "T313",
          &T::t313, &T::t313, false, &findings::connectNeverAcknowledged, nullptr},
         {type::disconnect, capture::Role::unknown, clearing, false, false, "T305", &T::t305, &T::t305, false,
@@ -104,7 +105,7 @@ bool Waits::answer(Call& call, const Message& message) {
     for (const std::uint64_t id : pending) {
         const Wait& wait = waits_.at(id);
         const Rule& rule = *wait.rule;
-        // Each terminal of a call to all answers for itself; but any of them may go on with the call.
+        // Each terminal of a broadcast call answers for itself, but any of them may go on with the call.
         if (wait.tei != message.layer2.tei && !rule.sameSideAnswers)
             continue;
         const Side answering = rule.sameSideAnswers ? wait.asker : other(wait.asker);
@@ -117,8 +118,8 @@ bool Waits::answer(Call& call, const Message& message) {
             drop(id);
         } else if (rule.ask == type::disconnect && messageType == type::release &&
                    message.from() == wait.asker) {
-            // Its sender goes on. It may do so at any time; if it does when its timer has run out, nobody
-            // had answered.
+            // The asking side goes on by itself. It may do so at any time. If it does so when its timer has
+            // run out, nobody has answered.
             if (message.at >= wait.deadline - timers_.slack)
                 expire(wait, message.at);
             drop(id);
@@ -132,7 +133,7 @@ void Waits::ask(Call& call, const Message& message) {
         return each.ask == message.layer3.type &&
                (each.asker == capture::Role::unknown || each.asker == message.senderRole());
     });
-    // Which terminals are there is not known, and so not whether a SETUP to all has to be answered.
+    // Nobody knows which terminals exist, so a broadcast SETUP need not be answered.
     if (rule == rules().end() || (call.broadcast && rule->ask == type::setup))
         return;
     for (const std::uint64_t id : waitsOf(call)) {
@@ -156,7 +157,7 @@ void Waits::ask(Call& call, const Message& message) {
     waits_.emplace(id, wait);
 }
 
-// Who waits decides: a timer may differ between the user and the network side.
+// The timer of the side that waits. Some timers differ between the user and the network side.
 Waits::Timer Waits::timerOf(const Rule& rule, const Message& message) const {
     if (rule.ask == type::disconnect && announces(message, {inBandInformation}))
         return {"T306", timers_.t306};

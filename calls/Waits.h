@@ -1,4 +1,4 @@
-// Messages that demand an answer, and whether it came in time (Q.931 5 and 9).
+// Follows messages that demand an answer, and reports answers that did not come in time (Q.931 5 and 9).
 #ifndef CALLS_WAITS_H
 #define CALLS_WAITS_H
 
@@ -29,21 +29,21 @@ class Waits : public CallObserver {
     void heard(Call& call, const Message& message) override;
     void ended(Call& call, const Message* by) override;
 
-    // The board restarted: whether an answer came is not known.
+    // The board restarted. Drops all waits, because nobody knows whether the answers came.
     void boardRestarted();
-    // The clock has come to `at`; to be called before what happened then is handed in.
+    // The clock has come to `at`. Call this before handing in what happened at that time.
     void advance(std::int64_t at);
 
   private:
     struct Rule;
     static const std::vector<Rule>& rules();
 
-    // The one that the asker starts.
+    // The timer that the asker starts.
     struct Timer {
         std::string_view name;
         std::int64_t value = 0;
     };
-    // One question of a call, from when it was asked first.
+    // One question of a call, and its repetitions.
     struct Wait {
         const Rule* rule = nullptr;
         Call* call = nullptr;
@@ -57,7 +57,7 @@ class Waits : public CallObserver {
     };
     using Deadlines = std::set<std::pair<std::int64_t, std::uint64_t>>;  // when, and which wait
 
-    // Whether the message answers the other side's DISCONNECT.
+    // Returns whether the message answers the other side's DISCONNECT.
     bool answer(Call& call, const Message& message);
     void ask(Call& call, const Message& message);
     void repeat(Wait& wait, const Message& message);

@@ -14,7 +14,7 @@ namespace calls {
 
 class WitnessKeeper {
   public:
-    // After the link has taken the frame. Events are those of this frame.
+    // Call this after the link has taken the frame. `marks` and `events` are those of this frame.
     void take(const isdn::Layer2& frame, Side from, std::uint64_t number, std::int64_t at, const Marks& marks,
               std::span<const LinkEvent> events);
     const LinkWitness& witness() const { return witness_; }
@@ -23,7 +23,7 @@ class WitnessKeeper {
     void acknowledge(Side sender, std::uint8_t nr);
 
     LinkWitness witness_;
-    // By side: N(S) and number of the I frames that the other side has not acknowledged. At most 128.
+    // By side: N(S) and frame number of the I frames that the other side has not acknowledged, at most 128.
     std::array<std::deque<std::pair<std::uint8_t, std::uint64_t>>, 2> sent_;
 };
 

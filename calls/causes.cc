@@ -9,7 +9,7 @@ namespace {
 
 constexpr std::uint8_t ituT = 0;
 
-// Causes that speak about this interface, whoever sends them and whatever location they name.
+// Causes that are about this interface, whichever side sends them and whatever location they name.
 bool isOfThisInterface(std::uint8_t value) {
     constexpr std::array<std::uint8_t, 6> single{6, 30, 44, 81, 82, 95};
     return std::find(single.begin(), single.end(), value) != single.end() || (value >= 96 && value <= 102);

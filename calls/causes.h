@@ -1,4 +1,4 @@
-// Whose cause it is, and what became of a call by its cause.
+// Where a cause was made, and what it says about the call.
 #ifndef CALLS_CAUSES_H
 #define CALLS_CAUSES_H
 

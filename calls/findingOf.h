@@ -1,4 +1,4 @@
-// Puts findings together.
+// Builds findings.
 #ifndef CALLS_FINDINGOF_H
 #define CALLS_FINDINGOF_H
 
@@ -13,12 +13,12 @@ namespace calls {
 
 Finding findingOf(const FindingKind& kind, const Moment& moment, const std::string& dChannel,
                   std::string sentence);
-// Of the message that shows it. `call` may be null.
+// The finding belongs to the frame of `message`. `call` may be null.
 Finding findingOf(const FindingKind& kind, const Message& message, const Call* call, std::string sentence);
-// Of an earlier frame of a call.
+// The finding belongs to an earlier frame of `call`.
 Finding findingOf(const FindingKind& kind, const Moment& moment, const Call& call, std::string sentence);
 
-// "1, 2, 5", and of a long list "1, 2, 5 and 40 more".
+// "1, 2, 5". A long list ends early: "1, 2, 5 and 40 more".
 std::string listOf(std::span<const std::string> words);
 
 }  // namespace calls

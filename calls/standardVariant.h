@@ -1,4 +1,4 @@
-// The rules that a trunk's switch variant goes by.
+// The standard that a trunk's switch variant follows.
 #ifndef CALLS_STANDARDVARIANT_H
 #define CALLS_STANDARDVARIANT_H
 
@@ -7,7 +7,7 @@
 
 namespace calls {
 
-// `otherwise` are those of a trunk whose variant is not known.
+// Returns `otherwise` for a trunk whose variant is not known.
 isdn::Variant standardVariant(capture::Variant variant, isdn::Variant otherwise = isdn::Variant::net5);
 
 }  // namespace calls

@@ -1,4 +1,4 @@
-// Items that outlive the reader's next one: copies of them, with their octets and texts.
+// Copies of items, with their octets and texts, that stay valid when the reader gives its next item.
 #ifndef CAPTURE_BATCH_H
 #define CAPTURE_BATCH_H
 
@@ -10,7 +10,7 @@
 
 namespace capture {
 
-// Keeps its memory from one use to the next. Interfaces and file names stay the reader's.
+// clear() keeps the memory for the next use. Interfaces and file names are not copied; the reader owns them.
 class Batch {
   public:
     void add(const Item& item);
@@ -22,7 +22,7 @@ class Batch {
 
   private:
     mutable std::vector<Item> items_;
-    std::vector<std::uint8_t> octets_;  // of all items, texts too, in their order
+    std::vector<std::uint8_t> octets_;  // octets and texts of all items, in their order
     mutable bool areBound_ = false;     // whether the items look into octets_
 };
 

@@ -1,4 +1,4 @@
-// Who sent a frame, where an input does not say.
+// Guesses which side sent a frame, for inputs that do not say so.
 #ifndef CAPTURE_DIRECTIONS_H
 #define CAPTURE_DIRECTIONS_H
 
@@ -19,7 +19,7 @@ class Directions {
   private:
     bool isCommand(std::uint8_t control, bool pollFinal, std::uint32_t address);
 
-    std::bitset<65536> polled_;  // by address, C/R bit included: a poll waits for its answer
+    std::bitset<65536> polled_;  // by address with C/R bit: whether a poll waits for its answer
 };
 
 }  // namespace capture

@@ -1,4 +1,4 @@
-// A form of input: how its beginning looks, and who reads it.
+// A form of input: how to recognise it by its beginning, and how to read it.
 #ifndef CAPTURE_FORM_H
 #define CAPTURE_FORM_H
 
@@ -13,11 +13,11 @@ namespace capture {
 
 struct ReadOptions {
     bool follow = false;
-    std::string trunk{};                 // the D channel's name, in place of what the input says
-    Variant variant = Variant::unknown;  // in place of what the input says
+    std::string trunk{};                 // the D channel's name; replaces what the input says, unless empty
+    Variant variant = Variant::unknown;  // the switch variant; replaces what the input says, unless unknown
 };
 
-// The interfaces of an input, each once. They stay where they are.
+// The interfaces of an input. Each is kept once, and its address never changes.
 class Interfaces {
   public:
     const Interface* of(const Interface& wanted);
@@ -26,15 +26,17 @@ class Interfaces {
     std::deque<Interface> interfaces_;
 };
 
-// What a parser works on. All of it outlives the parser.
+// What a parser works on. Everything in it must outlive the parser.
 struct Context {
     Source& source;
     const ReadOptions& options;
     Interfaces& interfaces;
-    const Interface* unnamed;  // what nothing in the input names: as chosen, or after the file
+    // for frames whose interface the input does not name; it has the name that was chosen, or the file's
+    const Interface* unnamed;
 };
 
-// Reads one content of one form from a source. wait and progress are the source's.
+// Reads items of one form from a source, up to the end of its content. Waiting and progress are left to the
+// source.
 class Parser {
   public:
     Parser() = default;
@@ -42,7 +44,7 @@ class Parser {
     Parser& operator=(const Parser&) = delete;
     virtual ~Parser() = default;
 
-    // As Reader's next. After the end of a content that was replaced it is not called again.
+    // Does what Reader::next does. It is not called again once it has returned `end`.
     virtual Reader::Next next(Item& item) = 0;
 };
 
@@ -50,7 +52,8 @@ struct Form {
     enum class Match : std::uint8_t { no, perhaps, yes };
 
     std::string_view name;
-    // `isAll`: nothing follows the beginning. Then "perhaps" counts as "no".
+    // Says whether an input that begins so is of this form. `isAll`: nothing follows. Then `perhaps` counts
+    // as `no`.
     Match (*matches)(std::string_view beginning, bool isAll);
     std::unique_ptr<Parser> (*read)(const Context& context);
 };

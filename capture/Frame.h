@@ -10,7 +10,7 @@
 
 namespace capture {
 
-// Which end of the link our side is, the one whose frames count as transmitted (Q.921 3.3.2).
+// Which end of the link our side is (Q.921 3.3.2). Our side is the one whose frames count as transmitted.
 enum class Role : std::uint8_t { unknown, user, network };
 
 // The switch variant of a trunk. `variantName` gives "4ess", "5ess", "dms100", "ntt", "net5", "ni2", and ""
@@ -19,7 +19,8 @@ enum class Variant : std::uint8_t { unknown, att4ess, ess5, dms100, ntt, net5, n
 std::string_view variantName(Variant variant);
 Variant variantNamed(std::string_view name);
 
-// What a frame's time counts from: nothing is known; the first frame of the input; 1 January 1970, UTC.
+// What a frame's time counts from. none: there is no time; relative: the first frame of the input; absolute:
+// 1 January 1970, UTC.
 enum class Clock : std::uint8_t { none, relative, absolute };
 
 // The D channel that a frame was recorded on. Frames of one name belong to one trunk, also across files.
@@ -30,7 +31,8 @@ struct Interface {
     bool operator==(const Interface&) const = default;
 };
 
-// Where something stood, for messages: the line of a text or the packet of a capture, counted from 1.
+// The place in an input where something stood, for messages: the line of a text or the packet of a capture,
+// counted from 1.
 struct Place {
     enum class Unit : std::uint8_t { line, packet };
 
@@ -47,15 +49,16 @@ struct Frame {
     // Address, control and information, without the check sequence. They belong to whoever gave the frame
     // and are valid until the next one is asked for; Batch keeps copies.
     std::span<const std::uint8_t> octets;
-    // By our side. Where an input has no direction, the user side counts as ours (Directions), and `role` is
-    // user.
+    // Whether our side sent the frame. If the input does not tell directions, the user side counts as ours
+    // (Directions), and `role` is user.
     bool transmitted = false;
     Role role = Role::unknown;
     Clock clock = Clock::none;
     std::int64_t time = 0;               // nanoseconds, as `clock` says
     std::optional<std::uint32_t> ticks;  // the board's time stamp, which wraps at 2^32
     std::optional<std::int64_t>
-        written;  // the host's second in which the recorder wrote it (log), since 1970
+        // the second, since 1970 on the host's clock, in which the recorder wrote the frame; known from logs
+        written;
     const Interface* interface = nullptr;  // never null in what a reader gives; valid as long as the reader
     Place place;
 };

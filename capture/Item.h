@@ -1,4 +1,4 @@
-// What a stream of frames consists of: the frames, and what its recorder had to say between them.
+// What a stream of frames consists of: the frames, and what the recorder says between them.
 #ifndef CAPTURE_ITEM_H
 #define CAPTURE_ITEM_H
 
@@ -29,11 +29,11 @@ struct Item {
     };
 
     Kind kind = Kind::frame;
-    // Whole for frame; for other kinds what is known of direction, ticks and time, and always interface and
-    // place. Octets stand in frame and cut alone.
+    // Complete if the kind is frame. For other kinds it has what is known of direction, ticks and time, and
+    // always interface and place. Only frame and cut have octets.
     Frame frame;
     std::uint64_t count = 0;
-    // In words, for a message: no line end, but control characters of the input as they are. Valid until the
+    // Words for a message, without line end. Control characters of the input are left in it. Valid until the
     // next item is asked for.
     std::string_view text;
 

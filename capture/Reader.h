@@ -1,4 +1,5 @@
-// A stream of frames that is pulled, an item at a time.
+// The interface of all inputs: a stream of frames and other items, from which the caller takes one item after
+// another.
 #ifndef CAPTURE_READER_H
 #define CAPTURE_READER_H
 
@@ -10,22 +11,23 @@
 
 namespace capture {
 
-// An input that cannot be opened or is of no known form. what() names the file, the place and the reason.
+// Thrown for an input that cannot be opened, or whose form is not known. what() names the file, the place and
+// the reason.
 class BadInput : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
 };
 
-// Reads one input in constant memory. Items come in the order in which they stand there. A reader is used by
-// one thread at a time. Damage inside an input is no exception but an item.
+// Reads one input in constant memory, and gives its items in the order of the input. Used by one thread at a
+// time. Damage inside an input is reported as an item, not by an exception.
 class Reader {
   public:
     enum class Next : std::uint8_t {
-        item,   // `item` holds the next one
-        pause,  // nothing more is there just now: a pipe, or a file that is followed; see wait()
+        item,   // `item` holds the next item
+        pause,  // a pipe, or a file that is followed, has nothing more just now; see wait()
         end     // for good
     };
-    // How far reading has come, in octets; `of` is 0 when the length is unknown (a pipe).
+    // How many octets have been read, and of how many. `of` is 0 if the length is not known, as for a pipe.
     struct Progress {
         std::uint64_t octets = 0;
         std::uint64_t of = 0;
@@ -38,7 +40,8 @@ class Reader {
 
     // What it puts into `item` is valid until the next call. Throws BadInput when the system refuses a read.
     virtual Next next(Item& item) = 0;
-    // After `pause`: returns when more may be there, when a signal came, or after `most`.
+    // To be called after `pause`. Returns when there may be more to read, when a signal came, or after
+    // `most`.
     virtual void wait(std::chrono::milliseconds most) = 0;
     virtual Progress progress() const = 0;
 };

@@ -1,4 +1,4 @@
-// The octets of an output, gathered and written in whole records.
+// Gathers the octets of an output and writes them in whole records.
 #ifndef CAPTURE_SINK_H
 #define CAPTURE_SINK_H
 
@@ -9,7 +9,7 @@
 
 namespace capture {
 
-// Writes to an open descriptor, which stays whoever opened it. Each function throws WriteError.
+// Writes to an open descriptor, which the caller opens and closes. Functions that write throw WriteError.
 class Sink {
   public:
     // The name is for messages.
@@ -17,14 +17,14 @@ class Sink {
     Sink(const Sink&) = delete;
     Sink& operator=(const Sink&) = delete;
 
-    // Where a record is composed; endRecord() follows.
+    // The text that waits to be written. Append a record to it, then call endRecord().
     std::string& record() { return held_; }
-    // Writes what is held, if it is much.
+    // Ends a record. Writes everything that waits if that has become 256 kB.
     void endRecord() {
         if (held_.size() >= most)
             flush();
     }
-    // Writes what is held with one write(), or more if the system takes less.
+    // Writes everything that waits, with one write(), or with more if the system takes less.
     void flush();
 
   private:

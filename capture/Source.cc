@@ -147,7 +147,8 @@ bool Source::isReadable() const {
     return ::poll(&input, 1, 0) > 0;
 }
 
-// At the end of what is there. A name that leads nowhere may be about to lead to a new file.
+// Called at the end of the content. If the name leads to no file, it counts as not replaced, because the new
+// file may be about to get the name.
 bool Source::isReplaced() const {
     const struct stat here = statusOf(file_, name_);
     if (static_cast<std::uint64_t>(here.st_size) < read_)
@@ -155,7 +156,7 @@ bool Source::isReplaced() const {
     struct stat named {};
     if (file_ == STDIN_FILENO || ::stat(name_.c_str(), &named) != 0)
         return false;
-    // What was written to the old file before the new one came is still to be read.
+    // If the old file grew before the new one replaced it, read that part first.
     return (named.st_ino != here.st_ino || named.st_dev != here.st_dev) &&
            static_cast<std::uint64_t>(here.st_size) == read_;
 }

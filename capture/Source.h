@@ -12,15 +12,15 @@
 
 namespace capture {
 
-// Followed, a file has no end: it may grow, be emptied in place, or be replaced by another one of its name,
-// which inode, size and the octets read last tell. A FIFO that is followed has no end either. Used by one
-// thread at a time. Functions that read throw BadInput when the system refuses.
+// A file that is followed has no end. It may grow, be emptied in place, or be replaced by another file of its
+// name; the source notices this by inode, size and the octets read last. A FIFO that is followed has no end
+// either. Used by one thread at a time. Functions that read throw BadInput when the system refuses.
 class Source {
   public:
     enum class State : std::uint8_t {
         ready,  // the window holds what was wanted
-        pause,  // not yet
-        end     // it holds all there is; of a followed file, see replaced()
+        pause,  // the input has not got it yet
+        end     // the input has ended, and the window holds all that is left; see also replaced()
     };
 
     // "-" is the standard input. Waits for the writer of a FIFO.
@@ -29,21 +29,22 @@ class Source {
     Source(const Source&) = delete;
     Source& operator=(const Source&) = delete;
 
-    // Makes the window hold at least so many octets. What held() gave before is no longer valid.
+    // Tries to make the window hold at least so many octets. Views that held() returned before are not valid
+    // any more.
     State want(std::size_t octets);
     std::string_view held() const { return {buffer_.get() + begin_, end_ - begin_}; }
-    // Moves the window's beginning on; at most by what it holds.
+    // Moves the beginning of the window forward, at most by the octets that it holds.
     void consume(std::size_t octets) { begin_ += octets; }
     // From the window's beginning on, the carriage return in front of a line feed is left out: one, if there
     // are more. Until restart().
     void joinLineEnds();
 
-    // Whether the end that want() told of is that of a content that is gone; restart() goes on with the new
-    // one.
+    // After want() has returned `end`: whether the file was emptied or replaced, so that there is a new
+    // content. restart() begins to read it.
     bool replaced() const { return replaced_; }
     void restart();
 
-    // As Reader's.
+    // These do what the functions of Reader do.
     void wait(std::chrono::milliseconds most);
     Reader::Progress progress() const;
     const std::string& name() const { return name_; }
@@ -60,15 +61,15 @@ class Source {
 
     std::string name_;
     int file_ = -1;
-    int ownWriter_ = -1;  // of a followed FIFO, so that it never ends
+    int ownWriter_ = -1;  // open for a FIFO that is followed, so that it never ends
     bool follow_;
     bool isRegular_ = false;
     bool replaced_ = false;
     bool ended_ = false;
     bool paused_ = false;
     bool joinsLineEnds_ = false;
-    bool heldReturn_ = false;  // a carriage return stands behind the window: a line feed may follow
-    std::uint64_t read_ = 0;   // of the content that is read now
+    bool heldReturn_ = false;  // a carriage return was read last; a line feed may follow it
+    std::uint64_t read_ = 0;   // octets read of the present content
     std::unique_ptr<char[]> buffer_;
     std::size_t capacity_ = 0;
     std::size_t begin_ = 0;

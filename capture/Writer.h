@@ -1,4 +1,4 @@
-// Where a stream of frames goes.
+// The interface of all outputs for a stream of frames.
 #ifndef CAPTURE_WRITER_H
 #define CAPTURE_WRITER_H
 
@@ -8,16 +8,16 @@
 
 namespace capture {
 
-// An output that cannot be written. what() names the file and the reason; `reason` is the errno, so that a
-// reader that has gone (EPIPE) can be told from a full disk.
+// Thrown when an output cannot be written. what() names the file and the reason. `reason` is the errno, so
+// that callers can distinguish a pipe without a reader (EPIPE) from a full disk.
 class WriteError : public std::runtime_error {
   public:
     WriteError(const std::string& what, int errnoOfIt) : std::runtime_error(what), reason(errnoOfIt) {}
     int reason;
 };
 
-// Takes every kind of item. What its form has no place for is left out. A writer is used by one thread at a
-// time. Each function throws WriteError.
+// Takes every kind of item, and leaves out what its form has no place for. Used by one thread at a time. Each
+// function throws WriteError.
 class Writer {
   public:
     Writer() = default;
@@ -26,11 +26,11 @@ class Writer {
     virtual ~Writer() = default;
 
     virtual void write(const Item& item) = 0;
-    // Hands over all that was composed, in one write() of whole records: a live output flushes after each
+    // Writes what was composed so far to the system, as whole records. A live output calls this after each
     // item or batch.
     virtual void flush() = 0;
-    // Ends the output, flushes it, and reports what closing reports. Nothing is written afterwards. A writer
-    // that is destroyed without it leaves an output that may lack its end.
+    // Completes the output and flushes it. Nothing may be written afterwards. If a writer is destroyed
+    // without this call, the end of its output may be missing.
     virtual void finish() = 0;
 };
 

@@ -27,11 +27,11 @@ inline constexpr auto hexValues = makeHexValues();
 
 }  // namespace tables
 
-// Below 0 for what is no hexadecimal digit.
+// The value of a hexadecimal digit, or a negative number for any other character.
 inline int hexValue(char c) { return tables::hexValues[static_cast<unsigned char>(c)]; }
 
-// Appends the octets that the digits, an even number of them, stand for; false, with the octets before the
-// place, when they are none.
+// Appends the octets that the digits stand for. Returns false if their number is odd or one of them is no
+// digit; then the octets before that place may have been appended.
 inline bool appendOctets(std::string_view digits, std::vector<std::uint8_t>& octets) {
     if (digits.size() % 2 != 0)
         return false;

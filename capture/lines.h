@@ -9,16 +9,16 @@
 
 namespace capture {
 
-// Hands out one line after another, without line feed and carriage return. A line is valid until the next is
+// Gives one line after another, without line feed and carriage return. A line is valid until the next one is
 // asked for.
 class Lines {
   public:
-    static constexpr std::size_t longest = std::size_t{1} << 20;  // a longer one comes in pieces
+    static constexpr std::size_t longest = std::size_t{1} << 20;  // a longer line is given in pieces
 
     explicit Lines(Source& source) : source_(source) {}
 
     Source::State next(std::string_view& line);
-    std::uint64_t number() const { return number_; }  // of the line handed out last, from 1
+    std::uint64_t number() const { return number_; }  // the number of the last line, from 1
 
   private:
     Source& source_;

@@ -1,4 +1,4 @@
-// Packets of the two link types that carry LAPD, and the frames in them.
+// The two link types whose packets carry LAPD, and how to get the frames out of them.
 #ifndef CAPTURE_LINK_H
 #define CAPTURE_LINK_H
 
@@ -24,17 +24,18 @@ std::array<std::uint8_t, pseudoHeaderSize> pseudoHeaderOf(const Frame& frame);
 // "link type 1 (EN10MB); a D-channel capture has 177 (LINUX_LAPD) or 203 (LAPD)", or empty for these two.
 std::string complaintAbout(std::uint32_t linkType);
 
-// Takes packets of one interface, in their order, apart.
+// Gets the frames out of the packets of one interface, which must be given in their order.
 class Link {
   public:
-    // `checkSequence` is how many octets of check sequence each packet ends with.
+    // `checkSequence` is the number of octets of check sequence at the end of each packet.
     explicit Link(std::uint32_t type, std::size_t checkSequence = 0)
         : type_(type), checkSequence_(checkSequence) {}
 
-    // Octets before the frame.
+    // The number of octets in a packet before the frame.
     std::size_t before() const { return type_ == linuxLapd ? pseudoHeaderSize : 0; }
-    // Sets the frame's octets, direction and role. `told` is a direction that the capture's form knows; it is
-    // used where the packet has none. False for a packet that ends within its pseudo-header.
+    // Sets the frame's octets, direction and role. `told` is the direction that the capture gives besides the
+    // packet, if any; it is used for packets without a direction. Returns false for a packet that ends within
+    // its pseudo-header.
     bool take(std::span<const std::uint8_t> packet, std::optional<bool> told, Frame& frame);
 
   private:

@@ -1,5 +1,5 @@
-// What a pcapng capture has no field for travels in comments with a fixed prefix: the board's ticks, the
-// second in which a log was written, and what its recorder said between frames.
+// Comments with a fixed prefix carry what a pcapng capture has no field for: the board's ticks, the second in
+// which a log was written, and what the recorder said between frames.
 #ifndef CAPTURE_NOTES_H
 #define CAPTURE_NOTES_H
 
@@ -14,14 +14,14 @@ inline constexpr std::string_view notePrefix = "lapdmon: ";
 
 // "lapdmon: ticks 75 written 1795260333", as far as the frame has them; empty when it has neither.
 std::string noteOfFrame(const Frame& frame);
-// "lapdmon: Frames Lost: 17", "lapdmon: head net5", ... Of a frame: none. An oversized frame's note stands
-// with its packet.
+// "lapdmon: Frames Lost: 17", "lapdmon: head net5", ...; empty for a frame. The note of an oversized frame
+// belongs into the comment of its packet.
 std::string noteOf(const Item& item);
 
-// What stands in a note.
+// What a comment says.
 struct Note {
     enum class Kind : std::uint8_t {
-        comment,    // none of ours
+        comment,    // it is no note of ours
         frame,      // `ticks` and `written` of the packet's frame
         oversized,  // the packet is an oversized frame
         item        // `item`, with kind, count, text and the variant of a head
@@ -32,7 +32,7 @@ struct Note {
     Item item;
     Variant variant = Variant::unknown;
 };
-// Views in the result are of `comment`.
+// Reads a comment. Views in the result point into `comment`.
 Note noteIn(std::string_view comment);
 
 // An interface's description: "KV9 D channel, variant net5"; without the variant when it is unknown.

@@ -1,4 +1,4 @@
-// Numbers in the octets of capture files, in either order.
+// Reads numbers from the octets of capture files, in either order of octets.
 #ifndef CAPTURE_OCTETS_H
 #define CAPTURE_OCTETS_H
 
@@ -13,7 +13,7 @@ namespace capture {
 
 enum class Order : std::uint8_t { little, big };
 
-// The number that begins at `at`; whoever calls has checked that it is all there.
+// The number that begins at `at`. The caller must have checked that all its octets are there.
 template <std::unsigned_integral Number>
 Number numberAt(std::string_view octets, std::size_t at, Order order) {
     Number number = 0;

@@ -1,4 +1,4 @@
-// Captures in the pcap form: of either order of octets, with micro- or nanoseconds.
+// Reads captures in the pcap form, in either order of octets, with micro- or nanoseconds.
 #ifndef CAPTURE_PCAP_H
 #define CAPTURE_PCAP_H
 

@@ -1,4 +1,4 @@
-// Captures in the pcapng form, read.
+// Reads captures in the pcapng form.
 #ifndef CAPTURE_PCAPNG_H
 #define CAPTURE_PCAPNG_H
 

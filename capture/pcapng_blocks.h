@@ -12,7 +12,7 @@ namespace capture::pcapng {
 enum Block : std::uint32_t {
     sectionHeader = 0x0a0d0d0a,
     interfaceDescription = 1,
-    packet = 2,  // of an older draft
+    packet = 2,  // the packet block of an older draft
     simplePacket = 3,
     interfaceStatistics = 5,
     enhancedPacket = 6
@@ -47,13 +47,13 @@ struct Resolution {
     bool isBinary = false;
     unsigned power = 6;  // at most 19 when decimal
 
-    // Of the value of an interface's option; microseconds when it makes no sense.
+    // Reads the value of an interface's option. A value that makes no sense gives microseconds.
     static Resolution of(char option);
-    // Beyond what an int64_t holds, the furthest time.
+    // Nanoseconds. A time that an int64_t cannot hold becomes the furthest time that it can.
     std::int64_t nanoseconds(std::uint64_t units) const;
 };
 
-// The options at the end of a block, one after another, until one does not fit.
+// Gives the options at the end of a block, one after another, and ends at the first that does not fit.
 class Options {
   public:
     Options(std::string_view octets, Order order) : rest_(octets), order_(order) {}

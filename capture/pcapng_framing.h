@@ -1,4 +1,4 @@
-// The blocks of a pcapng stream, one after another, whatever is in them.
+// Divides a pcapng stream into its blocks.
 #ifndef CAPTURE_PCAPNG_FRAMING_H
 #define CAPTURE_PCAPNG_FRAMING_H
 
@@ -16,8 +16,8 @@ class Framing {
 
     explicit Framing(Source& source) : source_(source) {}
 
-    // Passes on to the next block. A section's header says the order of octets from there on. Nothing can be
-    // read behind damage.
+    // Moves on to the next block. The header of a section sets the order of octets for the blocks that
+    // follow. After `damaged` nothing more can be read.
     Next next();
 
     std::uint32_t type() const { return type_; }

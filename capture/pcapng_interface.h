@@ -1,4 +1,4 @@
-// An interface of a pcapng section, as its description says.
+// An interface of a pcapng section, read from its description block.
 #ifndef CAPTURE_PCAPNG_INTERFACE_H
 #define CAPTURE_PCAPNG_INTERFACE_H
 
@@ -16,20 +16,21 @@ class DescribedInterface {
   public:
     static constexpr std::size_t fields = 8;  // octets in front of the options
 
-    // Of a description's body, which has those octets at least.
+    // Reads the body of a description block, which must have at least `fields` octets.
     DescribedInterface(std::string_view body, Order order);
 
     std::uint32_t linkType() const { return linkType_; }
     std::uint32_t snapLength() const { return snapLength_; }
     Clock clock() const { return clock_; }
-    // Nanoseconds; times that 64 bits cannot hold are moved within reach.
+    // Nanoseconds. A time that 64 bits cannot hold becomes the furthest time that they can.
     std::int64_t time(std::uint64_t units) const;
-    // What it tells over `unnamed`, and what was chosen over that.
+    // The interface of the frames: what the user has chosen, or else what the description says, or else
+    // `unnamed`.
     Interface named(const Interface& unnamed, const ReadOptions& options) const;
 
-    std::optional<Link> link;  // none: not LAPD
+    std::optional<Link> link;  // empty if the interface does not carry LAPD
     const Interface* interface = nullptr;
-    std::uint64_t dropped = 0;  // packets that the capture has said so far
+    std::uint64_t dropped = 0;  // dropped packets that the capture has reported so far
 
   private:
     void take(std::uint16_t code, std::string_view value, Order order);

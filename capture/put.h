@@ -1,4 +1,4 @@
-// Numbers into the octets of capture files, least significant octet first.
+// Writes numbers into the octets of capture files, least significant octet first.
 #ifndef CAPTURE_PUT_H
 #define CAPTURE_PUT_H
 
@@ -19,7 +19,7 @@ void put(std::string& octets, Number number) {
     octets.append(copy, sizeof number);
 }
 
-// In place of what stands at `at`.
+// Writes the number over the octets at `at`.
 template <std::unsigned_integral Number>
 void replace(std::string& octets, std::size_t at, Number number) {
     std::memcpy(octets.data() + at, &number, sizeof number);

@@ -1,4 +1,4 @@
-// Frames in lines of text.
+// Reads frames from lines of text.
 #ifndef CAPTURE_TEXT_FORMS_H
 #define CAPTURE_TEXT_FORMS_H
 
@@ -6,7 +6,7 @@
 
 namespace capture {
 
-// A frame a line: direction, time if known, octets; blanks between them.
+// Hex lines have one frame a line: direction, time if it is known, and octets, with blanks between them.
 //
 //     RX 2026-11-21T11:25:33.300Z 020101a5       1 1095 00019009        TX 02 01 7f
 //
@@ -18,10 +18,10 @@ Form::Match isHexLines(std::string_view beginning, bool isAll);
 std::unique_ptr<Parser> readHexLines(const Context& context);
 inline constexpr Form hexForm{"hex lines", isHexLines, readHexLines};
 
-// The raw dumps in the debug logs of telephone exchanges made of software: octets in brackets behind the sign
-// of a direction, ">" sent and "<" received. They may go on in following lines. Other text is passed over. A
-// time at the beginning of the line, in brackets or not, is used: "2026-11-21 11:25:33.300", or "Nov 21
-// 11:25:33", which counts from the first of its kind.
+// Bracketed dumps stand in the debug logs of telephone exchanges made of software: octets in brackets after
+// ">" (sent) or "<" (received). They may go on in the following lines. Other text is ignored. A time at the
+// beginning of the line, with or without brackets, is the frame's: "2026-11-21 11:25:33.300", or "Nov 21
+// 11:25:33", which counts from the first time of that kind.
 //
 //     [2026-11-21 11:25:33] > [ 00 01 7f ]
 Form::Match isDumps(std::string_view beginning, bool isAll);

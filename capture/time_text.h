@@ -1,4 +1,4 @@
-// Times as text.
+// Reads and writes times as text.
 #ifndef CAPTURE_TIME_TEXT_H
 #define CAPTURE_TIME_TEXT_H
 
@@ -18,17 +18,18 @@ struct ToldTime {
     bool operator==(const ToldTime&) const = default;
 };
 
-// "2026-11-21T11:25:33.300+01:00" (a blank for the T, Z for the offset; without offset in this host's zone),
-// "11:25:33.300" or "12.345". Nothing for any other text.
+// Reads "2026-11-21T11:25:33.300+01:00", "11:25:33.300" or "12.345", and returns nothing for any other text.
+// A blank may replace the T, and Z the offset. A date without offset is in this host's zone.
 std::optional<ToldTime> timeIn(std::string_view text);
 
 // "2026-11-21T11:25:33.300000000Z", or "12.345000000" for a time that is not absolute.
 std::string toText(const ToldTime& time);
 
-// Takes a whole number of exactly so many decimal digits off the front of the text; nothing, and the text as
-// it was, when they are not there.
+// Removes a number of exactly so many decimal digits from the front of the text and returns it. Returns
+// nothing, and leaves the text alone, if it does not begin with them.
 std::optional<int> takeDigits(std::string_view& text, std::size_t digits);
-// "11:25:33.300" off the front, as nanoseconds.
+// Removes a time like "11:25:33.300" from the front of the text and returns it in nanoseconds. Returns
+// nothing if there is none.
 std::optional<std::int64_t> takeTimeOfDay(std::string_view& text);
 
 }  // namespace capture

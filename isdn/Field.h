@@ -1,4 +1,5 @@
-// The fields of an element, a message header or a link header: where each stands, and what it means.
+// The fields of an element, a message header or a link header: which octets and bits each takes, and what it
+// means.
 #ifndef ISDN_FIELD_H
 #define ISDN_FIELD_H
 
@@ -17,9 +18,9 @@
 
 namespace isdn {
 
-// A field is some bits of one octet, or several octets from a bit of the first to one of the last. The fields
-// of an element cover each of its bits exactly once, in their order, so that whoever prints or rewrites them
-// leaves nothing out.
+// A field consists of some bits of one octet, or of several octets, from a bit of the first to a bit of the
+// last. The fields of an element are in order and cover each of its bits exactly once, so that code that
+// prints or rewrites them leaves nothing out.
 struct Field {
     enum class Kind : std::uint8_t {
         value,      // a number, and its name in `meaning` if the number has one
@@ -30,30 +31,30 @@ struct Field {
         header,     // identifier and length
     };
 
-    std::string_view octet;    // as the standard numbers it: "3", "3a", "5.1"
+    std::string_view octet;    // the octet's number in the standard: "3", "3a", "5.1"
     std::string_view name;     // "cause value"
     std::string_view meaning;  // "user busy"; empty if the value has no name
     std::string_view clause;   // "Q.931 4.5.12"
-    Octets at;                 // the octets in which it stands, within the frame
-    std::uint64_t value = 0;   // of at most eight octets; of more the last eight
-    std::uint8_t high = 8;     // of the first octet, 8 to 1
+    Octets at;                 // the octets of the frame in which the field stands
+    std::uint64_t value = 0;   // the number in the field's octets, or in the last eight of them
+    std::uint8_t high = 8;     // the field's highest bit in the first octet, 8 to 1
 
-    std::uint8_t low = 1;  // of the last octet
+    std::uint8_t low = 1;  // its lowest bit in the last octet, 8 to 1
     Kind kind = Kind::value;
     bool personal = false;   // identifies a person: a number, a name, user data
     bool doubtful = false;   // no table says what it holds, or the octets contradict the table
-    std::uint8_t depth = 0;  // 0, or how deep it stands in nested contents (facility)
+    std::uint8_t depth = 0;  // how deep the field stands in nested contents (facility); 0 elsewhere
 
-    // "8-1", "7-6", "4".
+    // The field's bits as text: "8-1", "7-6", "4".
     std::string_view bits() const;
 };
 
-// Fields in their order, and the texts that had to be composed for them. Reusing one object saves
+// Fields in their order, and the texts that had to be composed for them. Using one object again saves
 // allocations.
 class Fields {
   public:
     void add(const Field& field) { fields_.push_back(field); }
-    // Keeps a composed text for as long as the fields; a view of it may be a field's name, octet or meaning.
+    // Keeps a composed text as long as the fields. A field's name, octet or meaning may be a view of it.
     std::string_view keep(std::string text) { return texts_.emplace_back(std::move(text)); }
     void clear() {
         fields_.clear();
@@ -69,7 +70,7 @@ class Fields {
     auto begin() { return fields_.begin(); }
     auto end() { return fields_.end(); }
 
-    // The first field of this name, or null. Looked for linearly.
+    // The first field of this name, or null. Searches all fields one after another.
     const Field* find(std::string_view name) const;
 
   private:
@@ -77,22 +78,22 @@ class Fields {
     std::deque<std::string> texts_;  // a deque leaves texts where they are
 };
 
-// Appends the fields of an element. Returns the element's own problem, or what its contents have shown.
-// Fields point into the element's octets.
+// Appends the fields of an element. Returns the element's own problem, or else the problem of its contents.
+// The fields are views of the element's octets.
 Problem fieldsOf(const Element& element, Variant variant, Fields& fields);
 
-// Appends the fields of address and control; with `information` also of a frame reject, a TEI message, or the
-// raw octets of XID. A layer-3 message is not among them.
+// Appends the fields of the address and the control field, and those of the information field of FRMR, TEI
+// messages and XID. The fields of a layer-3 message are not appended.
 Problem fieldsOf(const Layer2& frame, Fields& fields);
 
-// Appends discriminator, call reference and message type, and what is raw in the message. Its elements are
-// not among them.
+// Appends the fields of discriminator, call reference and message type, and of octets that are no elements.
+// The fields of elements are not appended.
 Problem fieldsOf(const Layer3& message, Fields& fields);
 
-// "CHANNEL IDENTIFICATION"; empty for an element that no table knows on this variant. In the words of the
-// standard, in capitals.
+// The standard's name of an element, in capitals: "CHANNEL IDENTIFICATION". Empty if no table knows the
+// element on this variant.
 std::string_view elementName(const Element& element, Variant variant);
-// The same of an identifier in a message of call control.
+// The same for an identifier in a message of call control.
 std::string_view elementName(std::uint8_t codeset, std::uint8_t id, Variant variant);
 
 }  // namespace isdn

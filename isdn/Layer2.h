@@ -20,8 +20,8 @@ inline constexpr std::uint8_t packetSapi = 16;
 inline constexpr std::uint8_t managementSapi = 63;
 inline constexpr std::uint8_t groupTei = 127;
 
-// A frame is from the first octet of the address on, without its check sequence. Any octets make a view; what
-// is missing is 0, and `problem` says so. Parsing allocates nothing.
+// A view of a frame, from the first octet of the address on, without its check sequence. Any octets can be
+// parsed; fields that are missing are 0, and `problem` says so. Parsing allocates nothing.
 struct Layer2 {
     Octets octets;       // the frame
     Octets header;       // address and control field, as far as they are there
@@ -52,8 +52,8 @@ struct Layer2 {
 
 Layer2 parseLayer2(Octets frame);
 
-// Whether a frame is a command, once its sender's side is known (Q.921 3.3.2). Commands of the network have
-// the bit set, and so do responses of the user.
+// Whether a frame with this C/R bit is a command, when the role of its sender is known (Q.921 3.3.2).
+// Commands of the network and responses of the user have the bit set.
 constexpr bool isCommand(bool cr, bool sentByNetwork) { return cr == sentByNetwork; }
 
 // SABME, DISC, I and UI are always commands, UA, DM and FRMR always responses; the others may be either.

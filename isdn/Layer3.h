@@ -1,4 +1,4 @@
-// A layer-3 message: its header, and its elements where they stand (Q.931 4.1 to 4.5).
+// A layer-3 message: its header and its elements (Q.931 4.1 to 4.5). Everything in it is a view of the frame.
 #ifndef ISDN_LAYER3_H
 #define ISDN_LAYER3_H
 
@@ -11,9 +11,10 @@
 
 namespace isdn {
 
-inline constexpr std::uint8_t callControl = 0x08;           // protocol discriminator of Q.931
-inline constexpr std::uint8_t maintenance = 0x03;           // of SERVICE, North American trunks
-inline constexpr std::uint8_t maintenanceOfNetwork = 0x43;  // of SERVICE, other North American trunks
+inline constexpr std::uint8_t callControl = 0x08;  // protocol discriminator of Q.931
+// protocol discriminator of SERVICE on North American trunks
+inline constexpr std::uint8_t maintenance = 0x03;
+inline constexpr std::uint8_t maintenanceOfNetwork = 0x43;  // the same on other North American trunks
 
 constexpr bool isMaintenance(std::uint8_t discriminator) {
     return discriminator == maintenance || discriminator == maintenanceOfNetwork;
@@ -46,8 +47,8 @@ struct Element {
     bool shift() const { return (id & 0xF0U) == 0x90U; }
 };
 
-// The elements of a message in their order, found while one walks over them: `for (const Element& e :
-// elements)`. Shifts are among them. Nothing is allocated. Every octet belongs to exactly one element.
+// The elements of a message in their order, shifts included. They are found during the walk: `for (const
+// Element& e : elements)`. Nothing is allocated. Every octet belongs to exactly one element.
 class Elements {
   public:
     class Iterator {
@@ -87,7 +88,7 @@ class Elements {
     std::default_sentinel_t end() const { return {}; }
     Octets octets() const { return octets_; }
 
-    // The first element of this identifier in this codeset; one without octets if there is none.
+    // The first element with this identifier in this codeset, or an element without octets if there is none.
     Element find(std::uint8_t id, std::uint8_t codeset = 0) const;
 
   private:
@@ -96,8 +97,8 @@ class Elements {
     bool ofService_ = false;
 };
 
-// A message, of the call control of Q.931 or of maintenance. Of another protocol the discriminator alone is
-// known: hasCallReference and hasType are false, and everything behind it is `raw`.
+// A message of the call control of Q.931, or of maintenance. In a message of another protocol only the
+// discriminator is read: hasCallReference and hasType are false, and everything after it is in `raw`.
 struct Layer3 {
     Octets octets;
     Octets header;  // discriminator, call reference, message type

@@ -60,7 +60,7 @@ class Names {
     std::string_view (*function_)(std::uint8_t) = nullptr;
 };
 
-// Octets that a reader of its own takes apart: characters, digits, diagnostics, components.
+// Octets that a function of their own takes apart: characters, digits, diagnostics, components.
 struct Contents {
     Octets octets;
     std::string_view octet;  // the label of the first
@@ -77,7 +77,7 @@ struct Place {
     enum class Kind : std::uint8_t {
         bits,      // of one octet
         heading,   // bits that hold the identifier
-        reserved,  // bits that are spare although one might take them for another thing
+        reserved,  // bits that are spare even where bit 8 would be the extension bit
         nothing,   // no field: the octet's fields are those of the rows that follow
         octets,
     };
@@ -149,7 +149,7 @@ constexpr Row personal(Row row) {
     return row;
 }
 
-// Rows after rows, for elements that share some.
+// Joins rows to one table, for elements that share some rows.
 template <std::size_t... Sizes>
 consteval auto join(const Row (&... parts)[Sizes]) {
     std::array<Row, (Sizes + ...)> all{};
@@ -159,7 +159,7 @@ consteval auto join(const Row (&... parts)[Sizes]) {
 }
 
 struct ElementTable {
-    // What becomes of octets when `understood` fails.
+    // What happens to the octets when `understood` fails.
     enum class Otherwise : std::uint8_t {
         unnamed,  // they are fields all the same, but their values have no names
         raw,      // they are raw

@@ -1,4 +1,4 @@
-// When an octet of an element is there, or a field of it: conditions that the rows of tables ask for.
+// The conditions in the rows of tables: they decide whether an octet of an element, or a field, is present.
 #ifndef ISDN_WHEN_H
 #define ISDN_WHEN_H
 
@@ -39,7 +39,7 @@ struct Test {
     }
 };
 
-// When an octet, or a field, is there.
+// Decides whether an octet, or a field, is present.
 class When {
   public:
     enum class Presence : std::uint8_t {

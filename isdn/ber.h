@@ -1,4 +1,4 @@
-// Values in the Basic Encoding Rules of ASN.1 (X.690 clause 8), as facilities hold them.
+// Reads values in the Basic Encoding Rules of ASN.1 (X.690 clause 8), which facilities contain.
 #ifndef ISDN_BER_H
 #define ISDN_BER_H
 
@@ -46,8 +46,8 @@ enum class BerProblem : std::uint8_t {
     overrun,       // the length reaches beyond the value around it, or beyond the octets
     noEnd,         // of indefinite length, without end-of-contents octets
     endlessPlain,  // primitive, yet of indefinite length (8.1.3.2)
-    tooDeep,       // stands deeper than berDeepest; its contents are not looked into
-    tooMany        // the octets hold more values than berMost; the rest of them is here
+    tooDeep,       // it stands deeper than berDeepest; its contents are not read
+    tooMany        // the octets hold more values than berMost; this value holds the rest of them
 };
 // "the length reaches beyond the end"; "" for none.
 std::string_view toString(BerProblem problem);
@@ -65,23 +65,23 @@ struct BerValue {
     std::size_t next = 0;      // the index of the value behind this one and all that it holds
 };
 
-// What bounds the work that octets from outside can cause.
+// Limits on the work that octets from outside can cause.
 inline constexpr std::uint16_t berDeepest = 32;
 inline constexpr std::size_t berMost = 4096;
 
-// All values of some octets, each followed by those that it holds. A value with a problem is the last one in
-// the value around it, and takes every octet that is left there, so each octet belongs to a value.
+// All values in some octets. Each value is followed by those that it holds. A value with a problem is the
+// last one inside its enclosing value and takes all octets that are left there, so that each octet belongs to
+// a value.
 class BerTree {
   public:
-    // The octets are only looked at and must outlive the tree.
+    // Keeps a view of the octets, which must outlive the tree.
     explicit BerTree(Octets octets);
 
     const std::vector<BerValue>& values() const { return values_; }
     Octets octets() const { return octets_; }
     Octets contentsOf(const BerValue& value) const { return octets_.subspan(value.contents, value.length); }
 
-    // Indices of the values that values()[index] holds, without those that they hold; empty for primitive
-    // ones.
+    // The indices of the values directly inside values()[index]; empty for a primitive value.
     std::vector<std::size_t> childrenOf(std::size_t index) const;
 
   private:
@@ -92,7 +92,7 @@ class BerTree {
     std::vector<BerValue> values_;
 };
 
-// Readers of contents octets. Empty when the octets are no such value, or the number does not fit.
+// Read contents octets. The result is empty if the octets are no such value, or if the number does not fit.
 std::optional<std::int64_t> berIntegerOf(Octets contents);          // X.690 8.3; ENUMERATED likewise
 std::optional<bool> berBooleanOf(Octets contents);                  // 8.2
 std::optional<std::string> berObjectIdentifierOf(Octets contents);  // 8.19, as "0.4.0.359.1.2"

@@ -1,4 +1,4 @@
-// Types of ASN.1 as tables, and the values of a tree told apart by them.
+// Types of ASN.1 as tables, and the meanings that they give to the values of a tree.
 #ifndef ISDN_BER_TYPES_H
 #define ISDN_BER_TYPES_H
 
@@ -22,9 +22,10 @@ struct BerName {
 
 // A member of a SEQUENCE, an alternative of a CHOICE, or the one member type of a SEQUENCE OF.
 struct BerMember {
-    // How a context tag stands to the type's own: it is none, it replaces it, it stands around it.
+    // Whether the member has a context tag: none; implicit: it replaces the type's own tag; explicitly: it
+    // stands around the tagged value.
     enum class Tagging : std::uint8_t { none, implicit, explicitly };
-    // Whether a line of words shows the member's name, or its value alone.
+    // Whether a line of words shows the member's name and value, or only its value.
     enum class Words : std::uint8_t { named, valueAlone };
 
     std::string_view name;
@@ -60,21 +61,23 @@ struct BerMeaning {
     std::string_view name;
     const BerType* type = nullptr;
     BerMember::Words words = BerMember::Words::named;
-    // Of a member that is a choice, the alternative that was taken.
+    // The name of the alternative that was taken, if the member is a choice.
     std::string_view alternative{};
     BerMember::Words alternativeWords = BerMember::Words::valueAlone;
     std::string_view says{};  // what its value means, where more than its type tells
 };
 
-// Tells what values of a tree are. Members that are absent, or that the type does not know, are passed over.
+// Finds the meanings of the values of a tree. Skips members that are absent, and values that the type does
+// not know.
 class BerMeanings {
   public:
-    // The tree is only looked at and must outlive this.
+    // Keeps a pointer to the tree, which must outlive this object.
     explicit BerMeanings(const BerTree& tree) : tree_(&tree), meanings_(tree.values().size()) {}
 
-    // The value at `index`, and all that it holds, is `member`. False, with nothing told, if it cannot be.
+    // Gives the value at `index`, and all that it holds, the meaning of `member`. Returns false and does
+    // nothing if the value cannot be that member.
     bool tell(std::size_t index, const BerMember& member);
-    // The same of a value whose tag is not part of any type.
+    // Names a value that is part of no type.
     void name(std::size_t index, std::string_view name) { meanings_[index].name = name; }
     void say(std::size_t index, std::string_view meaning) { meanings_[index].says = meaning; }
 

@@ -1,5 +1,5 @@
-// The contents of FACILITY and EXTENDED FACILITY: components of supplementary services (Q.932 8.2.3, X.880,
-// and ECMA-165 for networking extensions).
+// Reads the contents of FACILITY and EXTENDED FACILITY: components of supplementary services (Q.932 8.2.3,
+// X.880, and ECMA-165 for networking extensions).
 #ifndef ISDN_FACILITY_H
 #define ISDN_FACILITY_H
 
@@ -18,7 +18,7 @@
 
 namespace isdn {
 
-// One component: somebody asks for an operation, or answers.
+// One component: a request for an operation, or an answer to one.
 struct Component {
     enum class Kind : std::uint8_t {
         invoke = 1,
@@ -28,10 +28,10 @@ struct Component {
     };  // the tag number (X.880 9)
 
     Kind kind = Kind::invoke;
-    std::size_t index = 0;  // of its value in the tree
+    std::size_t index = 0;  // the index of its value in the tree
     std::optional<std::int64_t> invokeId;
     std::optional<std::int64_t> linkedId;
-    facility::Code code;                             // of the operation, or of the error
+    facility::Code code;                             // the code of the operation or of the error
     const facility::Operation* operation = nullptr;  // null if there is none, or no table knows it
     std::string_view error;    // the error's name, or what a reject says; empty if unknown
     std::size_t argument = 0;  // index of its argument, result or parameter; 0: there is none
@@ -40,18 +40,18 @@ struct Component {
 // "invoke", "return result", "return error", "reject".
 std::string_view nameOf(Component::Kind kind);
 
-// What a facility holds. It looks at the octets, which must outlive it.
+// The contents of a facility, taken apart. Keeps views of the octets, which must outlive it.
 class Facility {
   public:
-    // `contents` is what follows the element's length octet. On which trunk it was seen tells whose
-    // operations the numbers mean where the profile leaves it open.
+    // `contents` is what follows the element's length octet. If the profile does not say which set of
+    // services the operation numbers belong to, the variant of the trunk decides.
     Facility(Octets contents, Variant variant);
 
     std::uint8_t profile() const { return profile_; }  // 0x11 remote operations, 0x12, 0x13, 0x1F
     const BerTree& tree() const { return tree_; }
     const BerMeanings& meanings() const { return meanings_; }
     const std::vector<Component>& components() const { return components_; }
-    // Of the first value that has one.
+    // The problem of the first value that has one.
     Problem problem() const { return problem_; }
 
     // Appends a field for each bit of the contents: the profile, then for each value its identifier and

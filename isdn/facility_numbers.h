@@ -1,4 +1,4 @@
-// How the types of facility arguments are written down, and those that several services use.
+// Functions with which the types of facility arguments are declared, and the types that several services use.
 #ifndef ISDN_FACILITY_NUMBERS_H
 #define ISDN_FACILITY_NUMBERS_H
 

@@ -11,7 +11,8 @@
 
 namespace isdn::facility {
 
-// Whose operations a local number means: the same number is another operation elsewhere.
+// The set of services that a local operation number belongs to. The same number means another operation in
+// another set.
 enum class Family : std::uint8_t {
     etsi,            // supplementary services of public networks (EN 300 series)
     privateNetwork,  // between private exchanges (ECMA, ISO/IEC)
@@ -27,18 +28,18 @@ struct Code {
 std::string toString(const Code& code);
 
 struct Operation {
-    std::int64_t local;  // -1 if it has an object identifier
+    std::int64_t local;  // its number, or -1 if it has an object identifier
     std::string_view global;
     std::string_view name;
     std::string_view clause;
-    const BerType* argument = nullptr;  // null: none, or none that is described here
+    const BerType* argument = nullptr;  // null if there is none, or if no type describes it
     const BerType* result = nullptr;
 };
 
-// Null for an unknown one.
+// The operation with this code, or null if no table knows it.
 const Operation* findOperation(Family family, const Code& code);
 
-// "not subscribed"; empty for an unknown one.
+// The name of an error, "not subscribed"; empty if no table knows it.
 std::string_view errorName(Family family, const Code& code);
 
 // What a reject component says: `kind` is the tag of its problem, 0 general to 3 return error (X.880 9.5).

@@ -92,7 +92,7 @@ const ElementTable& controlTable(std::uint8_t control) {
     return (control & 2U) == 0 ? supervisoryTable : unnumberedTable;
 }
 
-// Of no variant: link headers are the same everywhere.
+// Link headers are the same on all variants.
 Problem read(const ElementTable& table, Octets octets, Fields& fields) {
     return readRows(table, octets, Variant::net5, fields);
 }

@@ -1,4 +1,4 @@
-// Octets that somebody else owns, and what can be wrong with them.
+// Views of octets, and what can be wrong with them.
 #ifndef ISDN_OCTETS_H
 #define ISDN_OCTETS_H
 
@@ -8,7 +8,8 @@
 
 namespace isdn {
 
-// A view of octets of a frame. Whoever handed in the frame keeps it for as long as any view of it is used.
+// A view of octets of a frame. The code that handed in the frame must keep it as long as any view of it is
+// used.
 using Octets = std::span<const std::uint8_t>;
 
 // The same octets as characters, whatever they are.
@@ -16,7 +17,7 @@ inline std::string_view asCharacters(Octets octets) {
     return {reinterpret_cast<const char*>(octets.data()), octets.size()};  // NOLINT(*-reinterpret-cast)
 }
 
-// What is wrong with a frame, a message or an element. Its octets are handed out all the same.
+// What is wrong with a frame, a message or an element. Its octets are available nevertheless.
 enum class Problem : std::uint8_t {
     none,
     truncated,  // the frame ends before the length octet says

@@ -199,7 +199,7 @@ Problem readNumber(const Contents& contents, Fields& fields) {
     return Problem::none;
 }
 
-// Of an NSAP the first octet names the authority and the format of what follows.
+// The first octet of an NSAP address names the authority and the format of what follows.
 Problem readSubaddress(const Contents& contents, Fields& fields) {
     constexpr unsigned nsap = 0;
     constexpr std::uint8_t localCharacters = 0x50;

@@ -1,4 +1,5 @@
-// Readers of contents that are no fields of bits: characters, diagnostics, subaddresses, maps, components.
+// Functions that take apart contents which are no fields of bits: characters, diagnostics, subaddresses,
+// maps, components. Each appends fields that cover all the contents.
 #ifndef ISDN_READERS_H
 #define ISDN_READERS_H
 
@@ -7,7 +8,8 @@
 namespace isdn {
 
 Problem readCharacters(const Contents& contents, Fields& fields);
-Problem readNumber(const Contents& contents, Fields& fields);       // of several octets, the highest first
+// a number of several octets, the most significant first
+Problem readNumber(const Contents& contents, Fields& fields);
 Problem readSubaddress(const Contents& contents, Fields& fields);   // Q.931 4.5.9
 Problem readSlotMap(const Contents& contents, Fields& fields);      // Q.931 4.5.13, figures 4-20 and 4-21
 Problem readDiagnostics(const Contents& contents, Fields& fields);  // Q.850 table 1

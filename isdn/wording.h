@@ -1,4 +1,4 @@
-// What the words of elements are made with. Internal to isdn/words*.cc.
+// The tables that isdn/words.cc puts together. Internal to isdn/words*.cc.
 #ifndef ISDN_WORDING_H
 #define ISDN_WORDING_H
 
@@ -17,14 +17,14 @@ struct Context {
     Sender sender;
 };
 
-// Appends the words of an element that has the identifier of the row. It may have any contents.
+// Appends the words for an element with the identifier of the row. The element may have any contents.
 using Wording = void (*)(std::string& line, const Element& element, const Context& context);
 
 struct WordingRow {
     std::uint8_t codeset;
     std::uint8_t id;
     Wording words;
-    std::string_view name = {};  // of the element, where one identifier has several
+    std::string_view name = {};  // the element's name, where one identifier stands for several elements
 };
 
 std::span<const WordingRow> bearerWordings();  // bearers, compatibility, channels

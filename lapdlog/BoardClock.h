@@ -1,5 +1,6 @@
-// When a frame passed: from the board's ticks, which are exact but count from anywhere and drift, and from
-// the second in which the log was written, which is never early by a second or more but may be late.
+// Computes when a frame passed. It combines the board's ticks, which are exact but begin anywhere and drift,
+// and the second in which the frame was written to the log, which is at most a second early but may be very
+// late.
 #ifndef LAPDLOG_BOARD_CLOCK_H
 #define LAPDLOG_BOARD_CLOCK_H
 
@@ -23,11 +24,11 @@ class BoardClock {
   public:
     enum class Verdict : std::uint8_t { goesOn, restarted, otherTrace };
 
-    // The next frame's ticks, and the host's second.
+    // Takes the ticks of the next frame and the host's second in which it was written.
     Verdict take(std::uint32_t ticks, std::int64_t host);
-    // Of the frame taken last, in nanoseconds since 1970.
+    // The time of the frame taken last, in nanoseconds since 1970.
     std::int64_t time() const { return current_.offset + current_.ticks * capture::nanosecondsPerTick; }
-    // The host's second at these ticks if the board's clock goes on.
+    // The host's second that belongs to these ticks if the board's clock has gone on without a restart.
     std::optional<std::int64_t> expected(std::uint32_t ticks) const;
     // A new run begins.
     void reset() { *this = {}; }

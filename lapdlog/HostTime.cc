@@ -52,7 +52,7 @@ bool isDate(const std::tm& time) {
     return date.ok() && std::chrono::weekday(date).c_encoding() == static_cast<unsigned>(time.tm_wday);
 }
 
-// Of a date without its seconds. Nothing for what is none.
+// Reads a date without its seconds. Returns nothing for any other text.
 std::optional<std::tm> minuteOf(std::string_view date) {
     std::tm time{};
     time.tm_wday = indexOf(weekdays, date.substr(0, 3));

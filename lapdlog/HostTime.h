@@ -1,4 +1,4 @@
-// The second in which a log was written, from its text.
+// Reads the date of a log's time line.
 #ifndef LAPDLOG_HOST_TIME_H
 #define LAPDLOG_HOST_TIME_H
 
@@ -13,9 +13,9 @@ namespace lapdlog {
 // Turns local time, in this host's zone (TZ), into seconds since 1970. Used by one thread at a time.
 class HostTime {
   public:
-    // Of "Sat Nov 21 11:25:33 2026"; nothing for a text that is no such date, whose weekday is not the
-    // date's, or whose year is not 1900 to 2199. In the hour that comes twice when summer time ends, the one
-    // nearer to `expected` counts.
+    // Reads "Sat Nov 21 11:25:33 2026". Returns nothing for a text of another form, a wrong weekday, or a
+    // year outside 1900 to 2199. In the hour that comes twice when summer time ends, it returns the second
+    // that is nearer to `expected`.
     std::optional<std::int64_t> of(std::string_view date, std::optional<std::int64_t> expected);
 
   private:

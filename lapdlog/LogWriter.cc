@@ -48,7 +48,7 @@ class LogWriter final : public capture::Writer {
     Variant fallback_;
     bool hasHead_ = false;
     decoder::LocalTime localTime_;
-    // Of frames without ticks.
+    // The first time of a frame without ticks, from which its ticks are counted.
     bool hasFirst_ = false;
     std::int64_t first_ = 0;
     std::uint32_t lastTicks_ = 0;

@@ -1,4 +1,4 @@
-// The two time lines that begin a frame in a log.
+// Reads the two time lines with which a frame begins in a log.
 #ifndef LAPDLOG_HEADERS_H
 #define LAPDLOG_HEADERS_H
 
@@ -17,18 +17,18 @@ struct Header {
 
 enum class Reading : std::uint8_t {
     good,
-    cut,  // the text ends too early to say, and agrees so far
+    cut,  // the text agrees as far as it goes, and ends too early
     bad
 };
 
-// Reads the time lines that `text` begins with, the empty line first. What it accepts is what the decoder
-// writes, but for the date, which is any text of 24 characters here.
+// Reads the time lines that `text` begins with, including the empty line before them. Accepts exactly what
+// the decoder writes, except that the date may be any text of 24 characters.
 Reading readHeader(std::string_view text, Header& header);
 
-// Whether `text` begins with these pieces, one behind another; then sets `size` to their size.
+// Checks whether `text` begins with these pieces, one after another. If so, sets `size` to their total size.
 Reading readPieces(std::string_view text, std::initializer_list<std::string_view> pieces, std::size_t& size);
 
-// How many lines end in `text`.
+// The number of line ends in `text`.
 std::uint64_t lineEndsIn(std::string_view text);
 
 inline constexpr std::size_t dateSize = 24;

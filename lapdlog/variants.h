@@ -1,4 +1,4 @@
-// The switch variants, as captures and as the decoder name them.
+// Translates between the switch variants of captures and those of the decoder.
 #ifndef LAPDLOG_VARIANTS_H
 #define LAPDLOG_VARIANTS_H
 
@@ -13,9 +13,10 @@ inline constexpr std::array allVariants{capture::Variant::att4ess, capture::Vari
                                         capture::Variant::dms100,  capture::Variant::ntt,
                                         capture::Variant::net5,    capture::Variant::ni2};
 
-// decoder::swit; 0 for unknown.
+// The value of decoder::swit; 0 for unknown.
 int switOf(capture::Variant variant);
-// The line of a log's head, without its line end ("NET5 Switch "); unknown for any other line.
+// The variant that a line of a log's head names ("NET5 Switch ", without line end); unknown for any other
+// line.
 capture::Variant variantOfLine(std::string_view line);
 
 }  // namespace lapdlog

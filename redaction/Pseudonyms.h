@@ -1,4 +1,4 @@
-// What stands in place of numbers, names and user data.
+// Replaces numbers, names and user data by pseudonyms.
 #ifndef REDACTION_PSEUDONYMS_H
 #define REDACTION_PSEUDONYMS_H
 
@@ -11,7 +11,7 @@
 
 namespace redaction {
 
-// Replaces octets where they stand. Length stays. Used by one thread at a time.
+// Replaces octets in place and keeps their number. Used by one thread at a time.
 class Pseudonyms {
   public:
     enum class Characters : std::uint8_t { number, text };
@@ -21,19 +21,21 @@ class Pseudonyms {
     Pseudonyms& operator=(const Pseudonyms&) = delete;
     virtual ~Pseudonyms() = default;
 
-    // Characters of a number or text. `before` holds what precedes them in it, as it is without pseudonyms;
-    // the same of these characters is appended to it. `*` and `#` stay.
+    // Replaces characters of a number or text. `before` holds the characters that precede them in it, without
+    // pseudonyms; the function appends these characters to it, without pseudonyms as well. `*` and `#` are
+    // kept.
     virtual void replaceCharacters(std::span<std::uint8_t> octets, std::string& before, Characters kind) = 0;
-    // Octets of which only the whole is known: a subaddress, user data.
+    // Replaces octets that are no characters: a subaddress, user data.
     virtual void replaceOctets(std::span<std::uint8_t> octets) = 0;
 };
 
 enum class Direction : std::uint8_t { redact, restore };
 
-// By a key. A digit becomes another digit, a letter another letter of its case, and so on. What it becomes
-// depends on the key and, for a digit, on the digits before it in its run of digits; for any other character
-// on all that is before it in the text. So a number has one pseudonym wherever it stands, whether it comes in
-// one piece or digit by digit, and numbers with the same beginning have pseudonyms with the same beginning.
+// Makes pseudonyms from a key. A digit becomes another digit, a letter another letter of its case, and so on.
+// For a digit, the result depends on the key and on the digits before it in its run of digits. For any other
+// character it depends on the key and on everything before it in the text. So a number has the same pseudonym
+// everywhere, whether it comes in one piece or digit by digit, and numbers with the same beginning have
+// pseudonyms with the same beginning.
 std::unique_ptr<Pseudonyms> makePseudonyms(const Key& key, Direction direction);
 
 }  // namespace redaction

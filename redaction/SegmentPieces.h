@@ -1,4 +1,4 @@
-// Frames that carry pieces of messages, until the messages are whole.
+// Keeps frames that carry pieces of messages until the messages are whole.
 #ifndef REDACTION_SEGMENTPIECES_H
 #define REDACTION_SEGMENTPIECES_H
 
@@ -15,30 +15,32 @@ namespace redaction {
 
 // A frame whose octets were rebuilt.
 struct Rebuilt {
-    std::uint64_t number = 0;  // of the frame in the input
+    std::uint64_t number = 0;  // the frame's number in the input
     std::vector<std::uint8_t> octets;
 };
 
-// A SEGMENT, with the frame that carries it.
+// A SEGMENT message, with the frame that carries it.
 struct Segment {
     const capture::Frame* frame;
     std::uint64_t number;
-    isdn::Layer3 message;  // a view of the frame
+    isdn::Layer3 message;  // a view into the frame
     std::uint8_t tei;
 };
 
-// Which frames belong to one message. The rule by which segments follow each other is the analysis's: it says
-// when a message is whole.
+// Knows which frames belong to one message. It does not decide when a message is whole; the analysis of calls
+// does, and the caller passes that on.
 class SegmentPieces {
   public:
-    // Keeps a segment. Without `isFirst` it joins those before it; false if there are none.
+    // Keeps a segment. If `isFirst` is false, the segment joins those before it; returns false if there are
+    // none.
     bool keep(const Segment& segment, bool isFirst, std::vector<Rebuilt>& givenUp);
-    // Writes the message that ends with this segment over its pieces. The frames before the last go to
-    // `done`, the last one is `lastOctets`. False, and nothing is written, if the pieces are not those of the
-    // message.
+    // Writes `whole`, the message that ends with this segment, over its pieces. Appends the frames before the
+    // last to `done`, and puts the octets of the last frame into `lastOctets`. Returns false, and changes
+    // nothing, if the pieces do not belong to this message.
     bool finish(const Segment& last, isdn::Octets whole, std::vector<Rebuilt>& done,
                 std::vector<std::uint8_t>& lastOctets);
-    // The pieces before this segment belong to no whole message: they are blanked.
+    // The pieces before this segment belong to no whole message. Blanks them and appends their frames to
+    // `givenUp`.
     void giveUp(const Segment& segment, std::vector<Rebuilt>& givenUp);
     void giveUpAll(std::vector<Rebuilt>& givenUp);
     // The same of messages whose first segment came in a frame before `number`, or before `time`.
@@ -50,8 +52,8 @@ class SegmentPieces {
     using Key = std::tuple<const capture::Interface*, std::uint8_t, std::uint64_t, bool, bool>;
     struct Piece {
         Rebuilt frame;
-        std::int64_t time;
-        std::size_t at;  // of the piece in the frame; it reaches to the frame's end
+        std::int64_t time;  // nanoseconds
+        std::size_t at;     // where the piece begins in the frame; it ends with the frame
     };
     using Pieces = std::vector<Piece>;
 

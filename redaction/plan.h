@@ -1,4 +1,4 @@
-// Which octets of a frame name a person, and what is to become of them.
+// Finds the octets of a frame that identify a person, and says how each must be treated.
 #ifndef REDACTION_PLAN_H
 #define REDACTION_PLAN_H
 
@@ -12,9 +12,9 @@
 namespace redaction {
 
 enum class Treatment : std::uint8_t {
-    blank,    // nobody can say what they hold
+    blank,    // it is not known what they hold, so they are blanked
     number,   // a party's number
-    dialled,  // the called number, or a piece of it, as the caller dials it
+    dialled,  // the called number, or a piece of it, which the caller may dial digit by digit
     text,     // a name, or what a terminal shows
     octets,   // user data and the like
 };
@@ -23,22 +23,23 @@ struct Part {
     std::size_t at = 0;  // counted from the first octet of the frame, or of the message
     std::size_t size = 0;
     Treatment treatment = Treatment::blank;
-    // Of octets that are blanked: the bits that stay, since they say how the element goes on, and those that
-    // are set besides.
+    // For octets that are blanked: the bits that are kept because they say how the element goes on, and the
+    // bits that are set.
     std::uint8_t keptBits = 0;
     std::uint8_t setBits = 0;
 
     bool operator==(const Part&) const = default;
 };
 
-// Parts in their order, none of them empty. Octets of no part stay. The plan follows from identifiers,
-// lengths and codes, never from what the parts hold: a redacted frame has the plan of the original.
+// The parts in their order; none is empty. Octets outside the parts are kept. The plan depends on
+// identifiers, lengths and codes only, never on what the parts hold, so a redacted frame has the same plan as
+// the original.
 using Plan = std::vector<Part>;
 
-// Of a frame. The piece of a message that a SEGMENT carries is blank in it.
+// The plan of a frame. If the frame carries a SEGMENT, the plan blanks the piece of a message in it.
 Plan planOfFrame(isdn::Octets frame, isdn::Variant variant);
 
-// Of a message, which may have been put together from segments.
+// The plan of a message, which may have been put together from segments.
 Plan planOfMessage(isdn::Octets message, isdn::Variant variant);
 
 }  // namespace redaction

@@ -21,10 +21,10 @@ using vela::StdResource;
 constexpr unsigned int soon = 20;  // ms; long enough to be looked at, and then it is over
 
 const CompDesc_t Ccs(1, 1, 1, 0x15, 0);
-constexpr const char* object =
+constexpr const char* objectText =
     "{TgtDesc: {Node 0 Board 1 Processor 1 Component 21 Instance 1} "
     "HostDesc: {Node 6 Board 9 Processor 8 Component 7 Instance 4097}";
-constexpr const char* hexObject =
+constexpr const char* hexObjectText =
     "{TgtDesc: {Node 0 Board 0x1 Processor 0x1 Component 0x15 Instance 0x1} "
     "HostDesc: {Node 0x6 Board 0x9 Processor 0x8 Component 0x7 Instance 0x1001}";
 
@@ -88,7 +88,7 @@ TEST_F(RequestTest, TransactionsCountUpwardsUnlessTheCallerNamesOne) {
 TEST_F(RequestTest, SilenceIsATimeout) {
     ccs_.setResponseTimeout(soon);
     EXPECT_EQ(thrown<Addressable::Timeout>([&] { ccs_.request(8, &cmd_, 9, nullptr, 1001); }),
-              std::string("Addressable::Timeout ObjSource: ") + object +
+              std::string("Addressable::Timeout ObjSource: ") + objectText +
                   " CmdMsgType: 0x8 RetMsgType: 0x9 Trans: 1001 Timeout: 20ms");
 }
 
@@ -119,7 +119,7 @@ TEST_F(RequestTest, AnUnexpectedReplyPrintsObjectCommandAndReplyInHexadecimal) {
     board_.answers(8, 0, {8, 10});
     EXPECT_EQ(
         thrown<Addressable::UnexpectedMsg>([&] { ccs_.request(8, &cmd_, 9, nullptr, 1001); }),
-        std::string("Addressable::UnexpectedMsg ObjSource: ") + hexObject +
+        std::string("Addressable::UnexpectedMsg ObjSource: ") + hexObjectText +
             " CmdMsgType 0x8 RespMsg: {MsgType: 0 Source: {Node 0 Board 0x1 Processor 0x1 Component 0x15 "
             "Instance 0x1} Target: {Node 0x6 Board 0x9 Processor 0x8 Component 0x7 Instance 0x1001} "
             "Size: 2 Trans: 1001 Body: {ByteData {0x8 0xa }}}");
@@ -241,7 +241,7 @@ TEST_F(RequestTest, WithoutAWaitNothingIsWaitedFor) {
     ASSERT_TRUE(fake_norv::waitForIdleReader());
     ccs_.setResponseTimeout(0);
     EXPECT_EQ(thrown<Addressable::Timeout>([&] { ccs_.request(18, &cmd_, 19, nullptr, 1001); }),
-              std::string("Addressable::Timeout ObjSource: ") + object +
+              std::string("Addressable::Timeout ObjSource: ") + objectText +
                   " CmdMsgType: 0x12 RetMsgType: 0x13 Trans: 1001 Timeout: 0ms");
     EXPECT_THAT(errors_.text(), testing::HasSubstr("MsgType 0\n"));
 }
@@ -281,7 +281,7 @@ TEST_F(RequestTest, FromManyThreadsEachGetsItsOwnReply) {
 }
 
 TEST_F(RequestTest, AnObjectPrintsItsAddressesWithoutAClosingBrace) {
-    EXPECT_EQ(printed(ccs_), object);
+    EXPECT_EQ(printed(ccs_), objectText);
     EXPECT_EQ(printed(*ccs_.getMsgQueue()),
               "{HostDesc: {Node 6 Board 9 Processor 8 Component 7 Instance 4097}}");
 }
