@@ -1,4 +1,4 @@
-// Feeds the items of a run to the analysis of calls. Commands about calls derive from it.
+// The base of commands about calls: feeds the items of a run to the analysis of calls.
 #ifndef READER_ANALYSED_H
 #define READER_ANALYSED_H
 
@@ -18,16 +18,17 @@
 namespace reader {
 
 // The analysis sees every item, whatever the filters say. A call is wanted if one of its frames passes the
-// filters on frames, and if those on calls let it through; a finding if its frame or its call does.
+// filters on frames and the call itself passes the filters on calls. A finding is wanted if its frame passes
+// or its call is wanted.
 class Analysed : public Consumer, protected calls::Listener {
   public:
-    // Findings about calls that are alive wait for the end of the call if only that tells whether it is
-    // wanted. So many wait at most; then the oldest is let go.
+    // A finding about a call waits for the end of the call if only that tells whether the call is wanted. At
+    // most so many findings wait; then the oldest is dropped.
     static constexpr std::size_t mostFindingsHeld = 100'000;
 
     explicit Analysed(const Options& options);
 
-    // Reads all that there is. Says on the standard error stream what was let go.
+    // Reads all inputs to their end. Says on the standard error stream what was dropped.
     void run(Session& session, Chatter& chatter);
 
     void take(Chunk& chunk, std::size_t count) final;
@@ -37,15 +38,15 @@ class Analysed : public Consumer, protected calls::Listener {
 
   protected:
     bool isWanted(const calls::Call& call) const;
-    // Empty while only the end of the message's call can tell.
+    // Whether a message is wanted. Empty while only the end of its call can tell.
     std::optional<bool> isWanted(const calls::Message& message, const calls::Call* call) const;
     // Whether a call that is alive may still be wanted by the filters on calls.
     bool mayBeWanted(const calls::Call& call) const { return callFilter_.wants(call.number).value_or(true); }
-    // A finding that is wanted.
+    // Is called for each finding that is wanted.
     virtual void report(const calls::Finding& /*finding*/) {}
-    // Each item, before the analysis takes it.
+    // Is called for each item, before the analysis takes it.
     virtual void see(const Seen& /*seen*/) {}
-    // Derived classes that need messages, calls or all findings call these in their own.
+    // A derived class that overrides one of these must call it from its own function.
     void heard(const calls::Message& message, const calls::Call* call) override;
     void gone(const calls::Call& call) override;
     void found(const calls::Finding& finding) override;
@@ -55,9 +56,10 @@ class Analysed : public Consumer, protected calls::Listener {
     bool hasPassed(std::uint64_t frame) const;
     void hold(const calls::Finding& finding);
 
-    // Frames this far behind the newest one are forgotten; findings come soon after their frames.
+    // For how many of the newest frames it is remembered whether they passed the filters. Findings come soon
+    // after their frames.
     static constexpr std::size_t framesRemembered = 1'000'000;
-    // The same for calls that have gone: a finding may name one that was replaced.
+    // The same for calls that have gone, because a finding may name a call that was replaced.
     static constexpr std::size_t callsRemembered = 65'536;
 
     CallFilter callFilter_;

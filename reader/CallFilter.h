@@ -18,29 +18,30 @@ namespace reader {
 class CallCondition {
   public:
     virtual ~CallCondition() = default;
-    // Of a call that has gone.
+    // Whether a call that has gone meets the condition.
     virtual bool holds(const calls::Call& call) const = 0;
-    // What the number alone tells, of a call that is alive; empty if only its end can tell.
+    // Whether a call that is alive meets the condition, as far as its number tells; empty if only its end can
+    // tell.
     virtual std::optional<bool> holdsFor(std::uint64_t /*number*/) const { return std::nullopt; }
 };
 
-// For the rows of filters. They throw UsageError for a value that means nothing.
+// Make the conditions for the rows of filters. They throw UsageError for a value that means nothing.
 std::unique_ptr<CallCondition> byCallNumber(const std::string& value);
 std::unique_ptr<CallCondition> byFailure(const std::string& value);
 std::unique_ptr<CallCondition> byNoAnswer(const std::string& value);
 
 class CallFilter {
   public:
-    // Takes the words that are about calls, and leaves the others alone. Throws UsageError.
+    // Uses the filters that are about calls and ignores the others. Throws UsageError.
     explicit CallFilter(std::span<const FilterWord> words);
 
-    // Nothing is asked: all is wanted.
+    // Whether there is no condition, so that everything is wanted.
     bool isEmpty() const { return groups_.empty(); }
-    // Whether what belongs to no call is wanted.
+    // Whether frames and findings that belong to no call are wanted.
     bool wantsRest() const;
-    // Of a call that is alive: empty while its end may still change the answer.
+    // Whether a call that is alive is wanted; empty while its end may still change the answer.
     std::optional<bool> wants(std::uint64_t number) const;
-    // Of a call that has gone.
+    // Whether a call that has gone is wanted.
     bool wants(const calls::Call& call) const;
 
   private:

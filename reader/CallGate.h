@@ -24,30 +24,32 @@ class CallGate : private calls::Listener {
         ofInput,    // a frame that is held holds up all that come after it
         ofDecision  // the frames of a call come together, as soon as it is known that it is wanted
     };
-    // So many frames are held at most; then the oldest one of an undecided call is let go, and counted.
+    // At most so many frames are held. Then the oldest frame of an undecided call is dropped and counted.
     static constexpr std::size_t mostHeld = 100'000;
 
     // The filter must outlive this. `most` is for tests.
     CallGate(const CallFilter& filter, const calls::Options& options, Order order,
              std::size_t most = mostHeld);
 
-    // An item that does not pass other filters is looked at, and goes no further.
+    // Takes the next item. If it does not pass the other filters (`passes` is false), the gate looks at it
+    // but does not let it through.
     void take(const Seen& seen, bool passes = true);
-    // Time has passed, and nothing has come.
+    // So much time has passed, and nothing has come.
     void advance(std::int64_t nanoseconds);
     // The input has ended.
     void finish();
 
-    // What may go on, one at a time; null if there is nothing just now. It is valid until the next call.
+    // Returns the next item that may go on, or null if there is none just now. It is valid until the next
+    // call.
     const Seen* next();
 
-    // Calls that have begun.
+    // How many calls have begun.
     std::uint64_t calls() const { return analysis_.begun(); }
-    // Frames that were let go although their call may have been wanted.
+    // How many frames were dropped although their call may have been wanted.
     std::uint64_t letGo() const { return letGo_; }
 
   private:
-    // An item with copies of all that its reader only lends.
+    // An item, with copies of everything that the reader owns and will reuse.
     struct Held {
         explicit Held(const Seen& from);
         const Seen& view();

@@ -18,30 +18,30 @@ namespace reader {
 // One arrow, or one line of words.
 struct Rung {
     enum class Kind : std::uint8_t {
-        message,  // of the call
+        message,  // a message of the call
         link,     // a frame that sets the link up, ends it, or asks for frames again
         words     // no frame: what the recorder says, or a new day
     };
 
     Kind kind = Kind::message;
-    std::uint64_t frame = 0;  // its number; of words that of the frame before them
+    std::uint64_t frame = 0;  // the frame's number; for words, the number of the frame before them
     Instant when;
     std::int64_t at = 0;  // nanoseconds on the D channel's clock, for durations
     calls::Side from = calls::Side::us;
     std::uint8_t tei = 0;
     std::string dChannel;
-    std::string name;                  // "SETUP", "SABME"; of words all there is to say
+    std::string name;                  // "SETUP", "SABME"; for words, the whole text
     std::vector<std::string> details;  // "channel 1?", "cause 16 normal clearing, remote user"
 };
 
-// Texts may hold what the frames hold: whoever prints them makes them harmless.
+// Texts may contain any characters that frames contain; the code that prints them must make them harmless.
 struct CallLadder {
-    std::vector<std::string> headline;  // as `calls` has it, a word or a few each
+    std::vector<std::string> headline;  // the call as the command `calls` shows it, a field an entry
     std::string us;                     // what stands above the life lines: "us (user)"
     std::string peer;
     std::vector<Rung> rungs;      // in the order of the input
-    std::uint64_t missing = 0;    // messages that are not among them, since there were too many
-    bool hasSeveralTeis = false;  // the terminal of a rung is worth a word
+    std::uint64_t missing = 0;    // how many messages were left out because there were too many
+    bool hasSeveralTeis = false;  // the call has several terminals, so each rung names its own
 
     // Nanoseconds since the rung before; nothing for the first one.
     std::optional<std::int64_t> sinceBefore(std::size_t rung) const;
@@ -50,27 +50,28 @@ struct CallLadder {
 // "08:00:01.300" of a date, "1.300" of a time that is no date, empty without a time.
 std::string timeOfDay(Instant when, TimeText& times);
 
-// The details, with what the ladder as a whole makes worth a word: "TEI 67".
+// The details of a rung, and its terminal ("TEI 67") if the call has several.
 std::vector<std::string> detailsOf(const CallLadder& ladder, const Rung& rung);
 
-// Collects the rungs of the calls that are alive, and what happens to links. Memory is bounded.
+// Collects the rungs of the calls that are alive, and the events of links. Memory is bounded.
 class Ladders {
   public:
-    // What is kept: of one call the first ones; of all calls together all but the oldest calls'; of all links
-    // the last ones.
+    // How many rungs are kept. Of one call the first ones are kept; if all calls have too many together,
+    // those of the oldest calls are dropped; of the links the last ones are kept.
     static constexpr std::size_t mostOfACall = 1000;
     static constexpr std::size_t mostInAll = 100'000;
     static constexpr std::size_t mostOfLinks = 10'000;
 
-    // Each item, before the analysis takes it.
+    // To be called for each item, before the analysis takes it.
     void see(const Seen& seen);
-    // A message of the call.
+    // Adds a message of the call.
     void heard(const calls::Message& message, const calls::Call& call);
-    // A frame that carried a message of the call without being the one that counts.
+    // Adds a frame that carried a message of the call without being the one by which it was heard.
     void carried(const calls::Message& message, const calls::Call& call);
-    // RESTART or its answer: it may end calls.
+    // Keeps a RESTART or its answer with the events of links, because it may end calls.
     void restarted(const calls::Message& message);
-    // The call has gone: its ladder, with what happened to its links meanwhile. Nothing is kept of it.
+    // Returns the ladder of a call that has gone, with what happened to its links meanwhile, and forgets the
+    // call.
     CallLadder take(const calls::Call& call, TimeText& times);
     void forget(const calls::Call& call);
 
@@ -84,10 +85,10 @@ class Ladders {
     bool add(const calls::Call& call, Rung rung);
     void addLinkRungs(const calls::Call& call, std::vector<Rung>& rungs) const;
 
-    std::map<std::uint64_t, OfCall> calls_;  // by number, so that the oldest is the first
-    std::size_t count_ = 0;                  // of their rungs
+    std::map<std::uint64_t, OfCall> calls_;  // by number of the call, so that the oldest call is the first
+    std::size_t count_ = 0;                  // how many rungs all calls have together
     std::deque<Rung> links_;
-    // Of the item that was seen last.
+    // Describe the item that was seen last.
     std::uint64_t number_ = 0;
     capture::Frame frame_;
     Instant when_;

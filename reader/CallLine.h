@@ -1,4 +1,4 @@
-// A call in one line, for people.
+// Shows a call in one line.
 #ifndef READER_CALLLINE_H
 #define READER_CALLLINE_H
 
@@ -11,19 +11,20 @@
 
 namespace reader {
 
-// What stands above the lines.
+// The heading above the lines.
 std::string callHeading();
-// The line, without its line end.
+// Appends the line of a call, without line end.
 void appendCallLine(std::string& to, const calls::Call& call, TimeText& times);
-// The same as cells of a table. Nothing in them commands a terminal; an empty one has no value.
+// The same as the cells of a table. Control characters are made harmless. An empty cell means that there is
+// no value.
 struct CallColumn {
     std::string_view heading;
     bool isNumber = false;
 };
 std::vector<CallColumn> callColumns();
 std::vector<std::string> callCells(const calls::Call& call, TimeText& times);
-// The same for a headline: what there is to say, each with the word that tells what it is ("duration 3.100").
-// Nothing in it commands a terminal.
+// The same for a headline: the fields that have a value, each with a word that names it ("duration 3.100").
+// Control characters are made harmless.
 std::vector<std::string> callWords(const calls::Call& call, TimeText& times);
 
 }  // namespace reader

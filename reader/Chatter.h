@@ -1,4 +1,5 @@
-// What lapdread says about its work, on the standard error stream: never part of a command's data.
+// Writes what lapdread says about its work to the standard error stream. This is never part of a command's
+// data.
 #ifndef READER_CHATTER_H
 #define READER_CHATTER_H
 
@@ -10,7 +11,7 @@ namespace reader {
 
 enum class Loudness { quiet, usual, verbose };
 
-// Says lines that begin with "lapdread: ". Not shared between threads.
+// Writes lines that begin with "lapdread: ". Used by one thread.
 class Chatter {
   public:
     explicit Chatter(Loudness loudness);
@@ -21,21 +22,22 @@ class Chatter {
     Chatter(const Chatter&) = delete;
     Chatter& operator=(const Chatter&) = delete;
 
-    // What ends the program, or spoils its result: always said.
+    // Says what ends the program or spoils its result. It is always said.
     void error(std::string_view text);
-    // What is wrong with the command line as the input shows: always said; the exit status is that of wrong
-    // usage.
+    // Says that the command line does not fit the input. It is always said, and the exit status becomes that
+    // of wrong usage.
     void wrongUsage(std::string_view text);
     bool hasWrongUsage() const { return wrongUsage_; }
-    // What the user should know: said unless --quiet.
+    // Says what the user should know, unless --quiet is given.
     void note(std::string_view text);
-    // How the work goes on: said with --verbose.
+    // Says how the work goes on, if --verbose is given.
     void detail(std::string_view text);
 
-    // Draws how much of the work is done, when the standard error stream is a terminal, --quiet was not
-    // given, and the work has taken a second. Cheap to call often; `of` may be 0 when nobody knows.
+    // Draws a bar that shows how much of the work is done, if the standard error stream is a terminal,
+    // --quiet is not given, and the work has taken a second. Calling it often costs little. `of` is 0 if the
+    // size of the work is not known.
     void progress(std::uint64_t done, std::uint64_t of);
-    // The bar would disturb data that goes to the same terminal.
+    // Never draw the bar, because data go to the same terminal.
     void forbidProgress() { mayDraw_ = false; }
 
   private:

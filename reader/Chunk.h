@@ -1,4 +1,5 @@
-// Some items on their way through the pipeline, with copies of all that their reader only lends.
+// Some items on their way through the pipeline, with copies of everything that the reader owns and will
+// reuse.
 #ifndef READER_CHUNK_H
 #define READER_CHUNK_H
 
@@ -12,24 +13,24 @@
 
 namespace reader {
 
-// What was composed for one item that passed the filters.
+// The text that was composed for one item that passed the filters.
 struct Piece {
-    std::size_t item = 0;       // which item of the chunk it is about
-    std::size_t end = 0;        // where its text ends
-    std::size_t deltaAt = 0;    // where the place for the time since the piece before begins
-    std::size_t deltaSize = 0;  // 0: there is none in any piece
-    Instant instant;            // the time that counts for it
+    std::size_t item = 0;       // index of the item in the chunk
+    std::size_t end = 0;        // where its text ends in the chunk's text
+    std::size_t deltaAt = 0;    // where the time since the piece before is to be written
+    std::size_t deltaSize = 0;  // the size of that place; 0 if the pieces have none
+    Instant instant;            // the item's time
 };
 
-// Used by one thread at a time. Clearing keeps the memory, so that a chunk that is used again allocates
+// Used by one thread at a time. clear() keeps the memory, so that a chunk that is used again allocates
 // nothing.
 class Chunk {
   public:
-    // Copies octets and text. The interface and the file's name stay with whoever owns them.
+    // Copies octets and text. The interface and the file's name are not copied; they must outlive the chunk.
     void add(const Seen& seen);
-    // No more is added: views of the items are valid from now on until clear().
+    // Ends the adding. From now on views of the items are valid, until clear().
     void seal();
-    // Moves all items from this one on to another chunk. This one is sealed, the other is not.
+    // Moves all items from index `from` on to `other`. This chunk must be sealed, and `other` must not be.
     void split(std::size_t from, Chunk& other);
     void clear();
 
@@ -37,7 +38,7 @@ class Chunk {
     std::size_t size() const { return seen_.size(); }
     std::vector<Seen>& seen() { return seen_; }
 
-    std::string text;           // composed for the pieces, one after another
+    std::string text;           // the texts of all pieces, one after another
     std::vector<Piece> pieces;  // in the order of the items
 
   private:

@@ -1,4 +1,4 @@
-// The columns of a line that shows a frame.
+// The columns of the line with which `list` shows a frame.
 #ifndef READER_COLUMNS_H
 #define READER_COLUMNS_H
 
@@ -12,7 +12,7 @@
 
 namespace reader {
 
-// What a column's text is made of.
+// What a column gets to write its text.
 struct Cell {
     const Seen& seen;
     std::string& line;
@@ -24,34 +24,34 @@ struct Cell {
 struct Column {
     std::string_view name;
     std::string_view help;
-    unsigned width;  // shorter texts are filled up with blanks; 0 for the last columns, which are as long as
-                     // they are
-    bool right;      // the blanks stand in front
+    // shorter texts are filled up with blanks; 0 for the last columns, which are not filled up
+    unsigned width;
+    bool right;  // blanks go before the text, not after it
     void (*put)(Cell& cell);
 };
 
 // In the order in which they stand in the widest line.
 std::span<const Column> columns();
 
-// Throws UsageError for a name that is none.
+// Throws UsageError if there is no column of this name.
 const Column& columnNamed(std::string_view name);
 
-// The column whose text is known only when the lines are put in order: the time since the line before.
+// The column for the time since the line before. Its text is known only when the lines are in order.
 inline constexpr std::string_view deltaColumn = "delta";
 inline constexpr std::size_t deltaWidth = 10;
 
-// What stands in the place of a message for an item that is no frame: "frames lost: 17".
+// Appends the words that replace the message if the item is no frame: "frames lost: 17".
 void appendEvent(std::string& to, const capture::Item& item);
 
-// The message's name, "SETUP"; what there is to say where there is none.
+// Appends the message's name, "SETUP". Without a message, appends the name of the frame or event.
 void appendMessageName(std::string& to, const isdn::Layer3& message);
 void appendMessageName(std::string& to, const Seen& seen);
 
-// What matters of a frame's contents, in words; nothing of an empty frame.
+// Appends what matters in a frame's contents, in words. Appends nothing for an empty frame.
 void appendDetails(std::string& to, const Seen& seen);
 
-// "0378o": the call reference in hexadecimal, and whether the message comes from the originator or goes to
-// it.
+// Appends "0378o": the call reference in hexadecimal, and whether the message comes from the call's
+// originator (o) or goes to it (d).
 void appendCallReference(std::string& to, const Seen& seen);
 
 }  // namespace reader

@@ -1,4 +1,4 @@
-// What differs between two series of messages: of two calls, or of two traces.
+// Compares two series of messages, those of two calls or of two traces.
 #ifndef READER_COMPARISON_H
 #define READER_COMPARISON_H
 
@@ -13,30 +13,29 @@
 
 namespace reader {
 
-// What is compared besides. Two calls always differ in these, so nobody asks for them at first.
+// What is compared only on demand, because two calls always differ in it.
 struct CompareAlso {
     bool references = false;  // call reference and TEI
     bool channels = false;    // numbers of channels and interfaces
     bool times = false;       // the time since the first message, and DATE/TIME
 };
 
-// A message, with all that is compared as text.
+// A message, with everything that is compared turned into text.
 struct ComparedMessage {
     struct Part {
-        std::string
-            element;        // "CAUSE", "CAUSE (2)" for the second one; empty for what stands in front of them
-        std::string field;  // "cause value", "number (2)"
-        std::string value;  // "17 user busy"
+        std::string element;  // "CAUSE", "CAUSE (2)" for the second one; empty for the message's header
+        std::string field;    // "cause value", "number (2)"
+        std::string value;    // "17 user busy"
     };
     struct Whole {
         std::string element;
-        std::string words;  // all of it in a few words, or its octets
+        std::string words;  // the whole element in a few words, or its octets
     };
 
     std::uint64_t frame = 0;
     std::int64_t since = 0;  // nanoseconds since the first message
     calls::Side from = calls::Side::us;
-    capture::Role role = capture::Role::unknown;  // of the side that sent it
+    capture::Role role = capture::Role::unknown;  // the role of the side that sent it
     std::string name;                             // "SETUP"
     std::vector<Part> parts;
     std::vector<Whole> elements;
@@ -51,9 +50,9 @@ struct Difference {
     Kind kind = Kind::message;
     std::string message{};
     std::string direction{};               // "U>N", "TX" where the roles are not known
-    std::uint64_t frameA = 0, frameB = 0;  // 0: the message is not there
+    std::uint64_t frameA = 0, frameB = 0;  // 0 if that side has no such message
     std::string element{}, field{};
-    std::string a{}, b{};  // values; empty: it is not there
+    std::string a{}, b{};  // values; empty if that side does not have it
 };
 
 struct Comparison {
@@ -63,7 +62,7 @@ struct Comparison {
     bool same() const { return differences.empty(); }
 };
 
-// The series differ in too many messages to be aligned.
+// Thrown if the series differ in too many messages to be aligned.
 class TooDifferent : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;

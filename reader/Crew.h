@@ -1,4 +1,4 @@
-// Threads that work on chunks.
+// Works on chunks with several threads.
 #ifndef READER_CREW_H
 #define READER_CREW_H
 
@@ -15,22 +15,23 @@
 
 namespace reader {
 
-// Works on chunks in any order, and gives them back in the order in which they were handed in. All functions
-// are called on one thread, the owner's, which helps when it would have to wait.
+// The threads work on chunks in any order; takeBack() returns them in the order in which they were handed in.
+// All functions are called on one thread, the owner's, which does a job itself when it would have to wait.
 class Crew {
   public:
     using Job = std::function<void(Chunk&)>;
 
-    // The first job is the owner's; each of the others is done on a thread of its own. At least one.
+    // The owner's thread does the first job, and a new thread each of the others. There must be at least one.
     explicit Crew(std::vector<Job> jobs);
-    // Waits for the chunks that are being worked on.
+    // Waits until no thread works on a chunk any more.
     ~Crew();
 
     Crew(const Crew&) = delete;
     Crew& operator=(const Crew&) = delete;
 
     void handIn(std::unique_ptr<Chunk> chunk);
-    // The oldest chunk that was handed in, worked on; null if there is none. Throws what its job threw.
+    // Returns the oldest chunk that was handed in, once it is finished; null if there is none. Throws what
+    // its job threw.
     std::unique_ptr<Chunk> takeBack();
     std::size_t held() const { return entries_.size(); }
 

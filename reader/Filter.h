@@ -18,9 +18,9 @@ class Condition {
   public:
     virtual ~Condition() = default;
     virtual bool holds(const Seen& seen) const = 0;
-    // Conditions on time learn when the stream began. Called once, before `holds`.
+    // Tells the condition when the stream began. Called once, before `holds`. Conditions on time need it.
     virtual void begin(Instant /*firstFrame*/) {}
-    // Conditions on time are asked about losses and other events as well.
+    // Whether the condition is about time. Such conditions also apply to losses and other events.
     virtual bool isAboutTime() const { return false; }
 };
 
@@ -31,31 +31,30 @@ struct FilterGroup;
 // A filter as the command line knows it.
 struct FilterRow {
     std::string_view name;
-    std::string_view form;  // of its value; empty if it takes none
+    std::string_view form;  // the form of its value; empty if it takes none
     std::string_view help;
     // Throws UsageError for a value that means nothing.
     std::unique_ptr<Condition> (*make)(const std::string& value);
-    // The same for a filter that asks for whole calls; `make` is null then.
+    // Does the same for a filter on whole calls, whose `make` is null.
     std::unique_ptr<CallCondition> (*makeOnCalls)(const std::string& value) = nullptr;
 };
 std::span<const FilterRow> filterRows();
-// The name must be one of theirs.
+// The row of this name, which must exist.
 const FilterRow& filterRowNamed(std::string_view name);
 
 // Frames pass if they meet at least one of the values of each filter, and none of those behind --not.
 class Filter {
   public:
-    // Leaves words alone that ask for whole calls. Throws UsageError. Dates are taken in the local time of
-    // now.
+    // Ignores filters on whole calls. Throws UsageError. Dates are in the time zone that is set now.
     explicit Filter(const std::vector<FilterWord>& words);
     ~Filter();
     Filter(Filter&& other) noexcept;
     Filter& operator=(Filter&& other) noexcept;
 
-    // Nothing is asked: every item passes.
+    // Whether there is no condition, so that every item passes.
     bool isEmpty() const;
 
-    // Before the first item is asked about.
+    // To be called before the first passes().
     void begin(Instant firstFrame);
     bool passes(const Seen& seen) const;
     // Whether a condition asks for `keepAlive`, which is known only when a poll's answer is there.

@@ -1,4 +1,4 @@
-// How filters are put together: values of one filter are alternatives, different filters must all agree.
+// Combines filters: the values of one filter are alternatives, and all filters must agree.
 #ifndef READER_FILTER_GROUPS_H
 #define READER_FILTER_GROUPS_H
 
@@ -21,7 +21,8 @@ struct FilterGroup {
     std::vector<std::unique_ptr<Kind>> anyOf;
 };
 
-// Of the words whose row has this member to make conditions with. Throws UsageError.
+// Groups the filters whose row has a function in the member `make`, and makes their conditions with it.
+// Ignores the other words. Throws UsageError.
 template <class Kind>
 std::vector<FilterGroup<Kind>> groupsOf(std::span<const FilterWord> words,
                                         std::unique_ptr<Kind> (*FilterRow::*make)(const std::string&)) {

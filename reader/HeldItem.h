@@ -1,4 +1,4 @@
-// An item with memory of its own, for those that are written later.
+// A copy of an item that owns its memory, for items that are written later.
 #ifndef READER_HELDITEM_H
 #define READER_HELDITEM_H
 
@@ -9,14 +9,14 @@
 
 namespace reader {
 
-// The interface and the name of the file stay with whoever owns them.
+// The interface and the name of the file are not copied; they must outlive the copy.
 struct HeldItem {
     explicit HeldItem(const capture::Item& of)
         : bare(of), octets(capture::textOf(of.frame.octets)), text(of.text) {
         bare.frame.octets = {};
         bare.text = {};
     }
-    // Valid as long as this object.
+    // A view of the copy, valid as long as this object.
     capture::Item item() const {
         capture::Item item = bare;
         item.frame.octets = capture::octetsOf(octets);

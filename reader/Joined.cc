@@ -48,7 +48,7 @@ void Sequence::wait(std::chrono::milliseconds most) {
         current_->wait(most);
 }
 
-// Of several inputs nobody knows the length of those that are not open yet.
+// The length is not known, because inputs that are not open yet have none.
 capture::Reader::Progress Sequence::progress() const {
     if (current_ == nullptr)
         return {};

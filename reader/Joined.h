@@ -1,4 +1,4 @@
-// Several inputs as one stream: one after another, or by time.
+// Joins several inputs to one stream, one after another or by time.
 #ifndef READER_JOINED_H
 #define READER_JOINED_H
 
@@ -17,11 +17,11 @@ namespace reader {
 // Opens an input when its turn comes, so that a thousand files need no thousand descriptors.
 using Opener = std::function<std::unique_ptr<capture::Reader>()>;
 
-// Keeps the names that items refer to for longer than the reader they came from.
+// Keeps the names that items refer to, so that they outlive the reader that the items came from.
 class Names {
   public:
     void keep(capture::Item& item);
-    // The reader has gone, and what it gave may stand elsewhere or be another's.
+    // The reader is destroyed, so the addresses of its names may be used again for other names.
     void readerIsGone() {
         lastGiven_ = nullptr;
         lastFileGiven_ = {};
@@ -37,7 +37,7 @@ class Names {
     std::string_view lastFile_;
 };
 
-// One after another; an input that is followed never ends, and so must be the last.
+// Gives the items of one input after another. An input that is followed never ends, so it must be the last.
 class Sequence : public capture::Reader {
   public:
     explicit Sequence(std::vector<Opener> inputs) : inputs_(std::move(inputs)) {}
@@ -53,8 +53,8 @@ class Sequence : public capture::Reader {
     Names names_;
 };
 
-// By time. Inputs without times, and those that have nothing to give just now, hold nobody up. Items of equal
-// times come in the order of the inputs.
+// Gives the items of all inputs in the order of their times. Inputs without times, and those that have
+// nothing just now, do not hold up the others. Items of equal times come in the order of the inputs.
 class Merge : public capture::Reader {
   public:
     explicit Merge(const std::vector<Opener>& inputs);

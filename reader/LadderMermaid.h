@@ -1,4 +1,4 @@
-// Ladders as sequence diagrams of Mermaid, which wikis and ticket systems draw.
+// Shows ladders as sequence diagrams of Mermaid, which wikis and ticket systems draw.
 #ifndef READER_LADDERMERMAID_H
 #define READER_LADDERMERMAID_H
 
@@ -8,7 +8,7 @@
 
 namespace reader {
 
-// A block for Markdown: "```mermaid" to "```".
+// Appends a block for Markdown, from "```mermaid" to "```".
 void appendMermaid(std::string& to, const CallLadder& ladder, TimeText& times);
 
 }  // namespace reader

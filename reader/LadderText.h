@@ -1,4 +1,4 @@
-// Ladders as text, which can be pasted into a ticket.
+// Shows ladders as text, which can be pasted into a ticket.
 #ifndef READER_LADDERTEXT_H
 #define READER_LADDERTEXT_H
 
@@ -9,16 +9,17 @@
 namespace reader {
 
 struct LadderTextForm {
-    unsigned width = 80;  // columns of a line; below `leastWidth` lines are that long all the same
+    unsigned width = 80;  // columns of a line; less than `leastWidth` counts as `leastWidth`
     bool utf8 = false;    // arrows and life lines of UTF-8, else ASCII
     static constexpr unsigned leastWidth = 40;
 };
 
-// The headline, the names of both sides, and a line or more for each rung; no line end behind the last one.
-// Nothing in it commands a terminal.
+// Appends the headline, the names of both sides, and at least one line for each rung, without a line end
+// after the last. Control characters are made harmless.
 void appendLadder(std::string& to, const CallLadder& ladder, const LadderTextForm& form, TimeText& times);
 
-// Lines of `width` characters at most, broken at blanks where there are any. Items stand two blanks apart.
+// Puts items, with two blanks between them, into lines of at most `width` characters. Lines are broken at
+// blanks where possible.
 std::vector<std::string> wrapped(const std::vector<std::string>& items, std::size_t width);
 
 }  // namespace reader

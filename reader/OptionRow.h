@@ -16,10 +16,10 @@ namespace reader {
 
 struct OptionRow {
     std::string_view names;  // "-o,-w,--output"
-    std::string_view form;   // of its value: "FILE", "auto|always|never"; empty: it takes none
+    std::string_view form;   // the form of its value: "FILE", "auto|always|never"; empty if it takes none
     std::string_view help;
-    // Called each time the option is given, with "" if it takes no value. Throws UsageError; who calls adds
-    // the option's name.
+    // Is called each time the option is given, with "" if it takes no value. Throws UsageError without the
+    // option's name, which the caller adds.
     void (*set)(Options& options, const std::string& value);
     // Of the options of a command whose rows have the same word here only one may be given; empty: any.
     std::string_view oneOf{};
@@ -30,7 +30,7 @@ struct OptionGroup {
     std::span<const OptionRow> rows;
 };
 
-// What a word stands for. Throws UsageError for one that is not among the choices.
+// The value that a word stands for. Throws UsageError if the word is not among the choices.
 template <class Value>
 Value chosen(const std::string& word, std::initializer_list<std::pair<std::string_view, Value>> choices) {
     std::string known;
@@ -42,7 +42,7 @@ Value chosen(const std::string& word, std::initializer_list<std::pair<std::strin
     throw UsageError(word + " is none of " + known);
 }
 
-// A number from 1 to `most`. Throws UsageError.
+// Reads a number from 1 to `most`. Throws UsageError for anything else.
 template <class Number>
 Number countIn(const std::string& word, Number most) {
     Number number = 0;

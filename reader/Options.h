@@ -58,7 +58,7 @@ struct RecordOptions {
     std::int64_t seconds = 0;  // clock-aligned; 0: no limit
     unsigned files = 0;        // how many files are kept; 0: all
     std::int64_t span = 0;     // seconds that are kept; 0: all
-    // Triggers: the mildest finding, and frames that pass one of these filters.
+    // Triggers: findings of this severity or a worse one, and frames that pass one of these filters.
     std::optional<calls::Severity> onCheck = std::nullopt;
     std::vector<FilterWord> onFrames;
     std::int64_t before = 300;  // seconds that are kept in front of a trigger
@@ -68,7 +68,7 @@ struct RecordOptions {
 
 enum class CallForm { text, csv, jsonLines };
 
-// For calls: their timers and groups count wherever calls are told apart.
+// Options about calls. Timers and groups matter wherever frames are assigned to calls.
 struct CallOptions {
     calls::Timers timers;
     std::vector<std::vector<std::string>> groups;  // names of D channels that share their calls

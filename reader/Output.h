@@ -1,4 +1,4 @@
-// Where a command's data goes: standard output or a file, through a buffer.
+// Writes a command's data to standard output or a file, through a buffer.
 #ifndef READER_OUTPUT_H
 #define READER_OUTPUT_H
 
@@ -8,7 +8,7 @@
 
 namespace reader {
 
-// Gathers text and writes it in large pieces. Not shared between threads.
+// Gathers text and writes it in large pieces. Used by one thread.
 class Output {
   public:
     // Standard output, which stays open.
@@ -26,8 +26,8 @@ class Output {
     Output(const Output&) = delete;
     Output& operator=(const Output&) = delete;
 
-    // Both throw ReaderGone when a pipe has no reader any more, and FileError when the text cannot be
-    // written.
+    // write() and flush() throw ReaderGone if a pipe has no reader any more, and FileError if the text cannot
+    // be written.
     void write(std::string_view text) {
         if (text.size() >= large_) {
             flush();

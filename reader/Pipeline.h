@@ -1,5 +1,5 @@
-// From an input to a command's output: items are read in order, worked on by several threads, and handed on
-// in order.
+// Moves items from an input to a command's output: reads them in order, lets several threads work on them,
+// and hands them on in the same order.
 #ifndef READER_PIPELINE_H
 #define READER_PIPELINE_H
 
@@ -17,49 +17,50 @@
 
 namespace reader {
 
-// Makes a command's text of items. Each thread has one of its own.
+// Makes the text that a command shows for an item. Each thread has its own object.
 class Composer {
   public:
     virtual ~Composer() = default;
-    // Appends the text of an item that passed the filters. The piece may tell where the place for the time
-    // since the last one is.
+    // Appends the text of an item that passed the filters. May set in `piece` where the time since the piece
+    // before is to be written.
     virtual void compose(const Seen& seen, std::string& text, Piece& piece) = 0;
 };
 
-// Where chunks go. Called on the thread of runPipeline, in the order of the input.
+// Takes the chunks at the end of the pipeline. All functions are called on the thread of runPipeline, in the
+// order of the input.
 class Consumer {
   public:
     virtual ~Consumer() = default;
-    // Of the chunk's pieces the first `count` are wanted.
+    // Takes a chunk. Only the first `count` of its pieces are wanted.
     virtual void take(Chunk& chunk, std::size_t count) = 0;
-    // Whether chunks are handed over in which nothing has passed the filters.
+    // Whether take() is also called for chunks in which nothing has passed the filters.
     virtual bool wantsAll() const { return false; }
-    // Whether the number of results that the user has asked for is one of other things than frames, which the
-    // consumer counts.
+    // Whether --first limits something other than frames. The consumer then does the counting itself.
     virtual bool countsItself() const { return false; }
-    // The host's clock says that so much time has passed, and nothing has come.
+    // So much time has passed on the host's clock, and nothing has come.
     virtual void advance(std::int64_t /*nanoseconds*/) {}
-    // Nothing more is there just now, or the input has ended: what was taken goes out.
+    // Writes out everything that was taken. Called when the input has nothing more just now, and at its end.
     virtual void flush() = 0;
 };
 
 struct Work {
     std::function<std::unique_ptr<Composer>()> makeComposer;  // called on the thread of runPipeline
-    std::uint64_t first = 0;   // so many pieces and no more; 0: all. A consumer may count itself
-    unsigned jobs = 1;         // threads, the caller's among them
+    std::uint64_t first = 0;                                  // the most pieces that are handed on; 0: all
+    unsigned jobs = 1;                                        // how many threads work, the caller's included
     bool eachAtOnce = false;   // each item is handed on before the next is read
-    CallGate* gate = nullptr;  // lets through frames of the calls that are wanted; null: all
-    bool clockRuns = false;    // time passes while nothing comes
-    const std::atomic<bool>* stopped = nullptr;  // set by a signal: the work ends with what was read
+    CallGate* gate = nullptr;  // lets through only frames of the calls that are wanted; null: all frames
+    bool clockRuns = false;    // whether the consumer is told that time passes while nothing comes
+    // a signal sets it; the work then ends with what has been read
+    const std::atomic<bool>* stopped = nullptr;
 };
 
 struct Outcome {
-    bool isWhole = false;      // the input was read to its end, and the consumer has got all that passed
-    std::uint64_t passed = 0;  // items that passed the filters
+    bool isWhole = false;      // the input was read to its end, and the consumer got all that passed
+    std::uint64_t passed = 0;  // how many items passed the filters
 };
 
-// Returns once the input has ended, `first` pieces are out, or a signal came. What reading, composing and
-// consuming throw comes out of here.
+// Returns once the input has ended, `first` pieces are handed on, or a signal came. Throws what the reader,
+// the composers and the consumer throw.
 Outcome runPipeline(capture::Reader& reader, Tracker& tracker, Filter& filter, Consumer& consumer,
                     Chatter& chatter, const Work& work);
 

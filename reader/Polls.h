@@ -1,4 +1,4 @@
-// Finds out which polls and answers say nothing but that nothing has happened, so that they can be hidden.
+// Finds polls and answers that only show that the link is alive, so that they can be hidden.
 #ifndef READER_POLLS_H
 #define READER_POLLS_H
 
@@ -10,10 +10,11 @@
 
 namespace reader {
 
-// A poll is a keep-alive only once its answer is there. Items wait for that in the chunk they are in.
+// A poll is a keep-alive only if its answer follows, so items wait in their chunk until that is known.
 class Polls {
   public:
-    // Looks at an item that is about to be added to the chunk, and marks it and the poll that it answers.
+    // Looks at an item that is about to be added to the chunk. If it answers a poll, marks both as
+    // keep-alive.
     void take(Chunk& chunk, Seen& seen);
 
     // The first item of a sealed chunk whose poll may still be answered; the chunk's size if there is none. A
@@ -23,7 +24,7 @@ class Polls {
   private:
     using HostClock = std::chrono::steady_clock;
 
-    std::uint64_t waitingFor_ = 0;  // number of the poll that items were held back for last
+    std::uint64_t waitingFor_ = 0;  // number of the poll for which items were held back last
     HostClock::time_point since_;
 };
 

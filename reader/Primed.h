@@ -1,4 +1,4 @@
-// A stream whose beginning can be looked at before anybody takes from it.
+// A reader that can wait for its first item without giving it away.
 #ifndef READER_PRIMED_H
 #define READER_PRIMED_H
 
@@ -10,7 +10,7 @@
 
 namespace reader {
 
-// Gives what the reader behind it gives. Used by one thread at a time.
+// Gives the items of another reader. Used by one thread at a time.
 class Primed : public capture::Reader {
   public:
     explicit Primed(std::unique_ptr<capture::Reader> reader) : reader_(std::move(reader)) {}
@@ -26,7 +26,7 @@ class Primed : public capture::Reader {
   private:
     std::unique_ptr<capture::Reader> reader_;
     capture::Item first_;
-    std::optional<Next> held_;  // what came with `first_`, until next() has given it
+    std::optional<Next> held_;  // the result that belongs to `first_`, until next() has returned it
 };
 
 }  // namespace reader

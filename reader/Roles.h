@@ -1,4 +1,4 @@
-// Gives frames the role of our side before they are written in a form that needs it.
+// Adds the role of our side to frames before they are written in a form that needs it.
 #ifndef READER_ROLES_H
 #define READER_ROLES_H
 
@@ -10,13 +10,13 @@
 
 namespace reader {
 
-// Frames that come before anything tells the role wait for one that does, a thousand items at most. Then, or
-// at the end, they go on as they are, and standard error says so.
+// Frames that come before the role is known wait until a frame shows it. When a thousand items wait, and at
+// the end, they go on without a role, and a note on standard error says so.
 class Roles {
   public:
     explicit Roles(Chatter& chatter) : chatter_(chatter) {}
 
-    // Calls `give` with the items that are ready, in their order.
+    // Takes an item, and calls `give` with the items that are ready, in their order.
     template <class Give>
     void take(const Seen& seen, Give give) {
         capture::Item item = *seen.item;

@@ -1,4 +1,4 @@
-// The files that one D channel is recorded in, one after another.
+// Writes the recordings of one D channel, one file after another.
 #ifndef READER_ROTATING_FILE_H
 #define READER_ROTATING_FILE_H
 
@@ -18,12 +18,12 @@ namespace reader {
 
 struct RotationRules {
     std::string folder;
-    const Form* form = nullptr;  // one with a writer
-    std::uint64_t size = 0;      // a file of so many octets is finished; 0: whatever its size
+    const Form* form = nullptr;  // the form of the files; it must have a writer
+    std::uint64_t size = 0;      // a file that has so many octets is finished; 0: no limit
     std::int64_t period = 0;     // seconds; a new file at each multiple of it in local time; 0: never
     unsigned kept = 0;           // how many finished files stay; 0: all
     std::int64_t span = 0;       // seconds; files that hold only what is older than this are removed; 0: none
-    std::string mark{};          // stands in the names of the files, if it is not empty
+    std::string mark{};          // a word in the names of the files; may be empty
 };
 
 // Writes TRUNK.START.FORM, which is named TRUNK.START.FORM.part until it is finished. START is the time of
@@ -34,7 +34,7 @@ class RotatingFile {
   public:
     using HostClock = std::chrono::steady_clock;
 
-    // References are kept.
+    // Keeps references to its arguments.
     RotatingFile(const RotationRules& rules, const std::string& trunk, Chatter& chatter);
     // Finishes the file.
     ~RotatingFile();
@@ -42,14 +42,15 @@ class RotatingFile {
     RotatingFile(const RotatingFile&) = delete;
     RotatingFile& operator=(const RotatingFile&) = delete;
 
-    // What tells of the recorder and has no time waits for the next item, whose time names the file.
+    // Writes an item. An item without a time that would begin a file waits for the next one, whose time names
+    // the file.
     void write(const capture::Item& item);
-    // Everything is handed to the system, and a file that has its size is finished.
+    // Hands everything to the system, and finishes a file that has reached its size.
     void flush();
-    // Nothing has come for a while, and the host's clock says `second`: a file whose period is over is
-    // finished.
+    // Nothing has come for a while, and the host's clock shows `second`. Finishes a file whose period is
+    // over.
     void passTime(std::int64_t second);
-    // The next item begins a new file.
+    // Finishes the file, so that the next item begins a new one.
     void finish();
 
     std::uint64_t lostInAll() const { return lostInAll_; }
@@ -58,7 +59,7 @@ class RotatingFile {
     const std::string& newest() const { return newest_; }
     std::uint64_t begun() const { return begun_; }
 
-    // How long after a failure another file is tried; a second, unless a test wants it otherwise.
+    // How long after a failure another file is tried: a second, or as a test sets it.
     void retryEvery(HostClock::duration time) { betweenAttempts_ = time; }
 
   private:
@@ -83,21 +84,21 @@ class RotatingFile {
     const RotationRules& rules_;
     Chatter& chatter_;
     std::string trunk_;
-    std::string path_;    // of the finished file
-    std::string newest_;  // its name, also when it is closed
+    std::string path_;    // the path of the file once it is finished
+    std::string newest_;  // its name, kept when the file is closed
     std::uint64_t begun_ = 0;
     int descriptor_ = -1;
     std::unique_ptr<capture::Writer> writer_;
-    std::vector<HeldItem> early_;  // what waits for the item that begins a file
+    std::vector<HeldItem> early_;  // items that wait for the item that begins a file
     std::int64_t period_ = 0;      // the multiple of the period that the file belongs to
     std::uint64_t size_ = 0;       // octets that are safely in the file
-    std::uint64_t pending_ = 0;    // octets of items since
+    std::uint64_t pending_ = 0;    // octets of the items written since
     std::uint64_t pendingFrames_ = 0;
     std::uint64_t lost_ = 0;  // frames that the next file has to report
     std::uint64_t lostInAll_ = 0;
-    std::uint64_t unsaid_ = 0;       // frames lost since the failure was said
-    std::int64_t newestSecond_ = 0;  // of the newest item
-    bool failing_ = false;           // the failure was said
+    std::uint64_t unsaid_ = 0;       // frames lost since the user was told of the failure
+    std::int64_t newestSecond_ = 0;  // the second of the newest item
+    bool failing_ = false;           // the user was told of the failure
     HostClock::time_point retryAt_;
     HostClock::duration betweenAttempts_ = std::chrono::seconds(1);
 };

@@ -1,4 +1,4 @@
-// An item of the input as the commands see it: with its number, its headers read, and what the link says.
+// An item of the input as the commands see it, with its number, its headers, and what it means for its link.
 #ifndef READER_SEEN_H
 #define READER_SEEN_H
 
@@ -20,20 +20,21 @@ namespace reader {
 // Views point into the item, which must outlive this.
 struct Seen {
     const capture::Item* item = nullptr;
-    // When it passed. Of an input that has ticks alone, seconds since its first frame.
+    // When the item passed. For an input that has only ticks, seconds since its first frame.
     Instant when;
-    std::int64_t at = 0;          // nanoseconds on a clock that goes by ticks and never back: for durations
+    std::int64_t at = 0;  // nanoseconds on a clock that follows the ticks and never goes back, for durations
     std::int64_t sinceFirst = 0;  // nanoseconds of that clock since the first frame of the run
-    bool timeGoesBack = false;    // `when` is earlier than that of the frame before it on its D channel
-    std::uint64_t number = 0;  // frames and what stands for one are counted from 1 over all inputs of a run
+    bool timeGoesBack = false;    // `when` is earlier than that of the frame before on the same D channel
+    // numbers frames, and items that stand for one, from 1 over all inputs of a run
+    std::uint64_t number = 0;
     isdn::Variant variant = isdn::Variant::net5;
     isdn::Layer2 link;
     isdn::Layer3 message;  // read only if hasMessage
     bool hasMessage = false;
     capture::Role role = capture::Role::unknown;  // of our side
-    std::optional<bool> command;                  // nothing while the role is unknown
-    calls::Marks marks;                           // what the frame is to its link
-    // A poll or an answer that only says that nothing has happened, and that has its counterpart.
+    std::optional<bool> command;  // whether the frame is a command; empty while that is not known
+    calls::Marks marks;           // what the frame means for its link
+    // A poll with its answer, or such an answer, that only shows that the link is alive.
     bool keepAlive = false;
 
     bool isFrame() const { return item->isFrame(); }
@@ -50,7 +51,7 @@ struct MarkRow {
 };
 std::span<const MarkRow> markRows();
 
-// "retransmitted, link up": what the link says of the frame, in words; nothing of most frames.
+// Appends the marks in words: "retransmitted, link up". Most frames have none.
 void appendMarks(std::string& to, const Seen& seen);
 
 }  // namespace reader

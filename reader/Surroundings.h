@@ -1,4 +1,4 @@
-// What surrounds a trigger of one D channel, in files that stay when the others go.
+// Keeps what surrounds the triggers of one D channel, in files that stay when other recordings are removed.
 #ifndef READER_SURROUNDINGS_H
 #define READER_SURROUNDINGS_H
 
@@ -15,28 +15,28 @@
 namespace reader {
 
 struct SurroundingsRules {
-    std::int64_t before = 0;  // nanoseconds that are kept of the time before a trigger
-    std::int64_t after = 0;   // and after it
+    std::int64_t before = 0;  // how much of the time before a trigger is kept, in nanoseconds
+    std::int64_t after = 0;   // how much of the time after it
     RotationRules files;
 };
 
-// Holds the newest items in memory, no more than `mostItems` and `mostOctets` of them. Time is that of the
-// items; when none come, the host's clock goes on.
+// Holds the newest items in memory, at most `mostItems` items and `mostOctets` octets. Time is the time of
+// the items; while none come, the host's clock is used.
 class Surroundings {
   public:
     static constexpr std::size_t mostItems = 200'000;
     static constexpr std::size_t mostOctets = std::size_t{16} << 20;
 
-    // References are kept.
+    // Keeps references to its arguments.
     Surroundings(const SurroundingsRules& rules, const std::string& trunk, Chatter& chatter);
 
-    // The interface and the file's name stay with whoever owns them.
+    // Takes an item. Its interface and its file's name must outlive this object.
     void take(const capture::Item& item);
-    // Keeps what is held, and what comes in the time after. Again in that time: prolongs it. `why` is said,
-    // and written down where the form has a place for comments.
+    // Writes the items that are held, and those that come in the time after. A further trigger in that time
+    // prolongs it. `why` is told to the user, and written to the file if its form has comments.
     void trigger(const std::string& why);
     void flush();
-    // Nothing has come since the last flush: the time after a trigger may be over.
+    // Nothing has come since the last flush. Ends the file if the time after the trigger is over.
     void idle();
     // Ends a file that is open.
     void finish();
@@ -56,7 +56,7 @@ class Surroundings {
     std::deque<HeldItem> held_;
     std::int64_t newest_ = 0;  // time of the newest item that has one
     std::size_t octets_ = 0;
-    bool isCut_ = false;  // it was said that memory ends before `before`
+    bool isCut_ = false;  // the user was told that memory does not suffice for `before`
     bool isOpen_ = false;
     std::int64_t until_ = 0;  // on the items' clock
     HostClock::time_point hostUntil_;

@@ -22,7 +22,7 @@ class FileError : public std::runtime_error {
 // A signal ended the program before it had anything to write: what the output held stays. Exit status 0.
 class StoppedEarly {};
 
-// Whoever read the output is gone. The program ends without a word, exit status 0.
+// The reader of the output has closed the pipe. The program ends silently with exit status 0.
 class ReaderGone {};
 
 }  // namespace reader

@@ -1,4 +1,5 @@
-// What a recorder has to know about a trunk when it is started anew: a small file beside the recordings.
+// The small file beside the recordings from which a recorder that is started again learns how far it had come
+// on a trunk.
 #ifndef RECORDING_RECORDSTATE_H
 #define RECORDING_RECORDSTATE_H
 
@@ -11,12 +12,14 @@
 
 namespace recording {
 
-// A log and the run of frames that it holds, so that the same run is known again. The path is for people.
+// Identifies a log and the run of frames in it, so that the run can be recognised later. The path is only for
+// messages.
 struct RecordedLog {
     std::string path;
     std::uint64_t device = 0;
     std::uint64_t inode = 0;
-    // Of its first frame of this trunk: nanoseconds as the frame's clock counts, board ticks, octets as hex.
+    // The first frame of this trunk in the log: its time in nanoseconds on the frame's clock, its board
+    // ticks, and its octets in hexadecimal.
     std::int64_t time = 0;
     std::optional<std::uint32_t> ticks;
     std::string hex;
@@ -27,38 +30,41 @@ struct RecordedLog {
     }
 };
 
-// Nothing if the frame was read from what is no regular file, and so cannot be read a second time.
+// Describes the log that a frame was read from. Returns nothing if that is no regular file, because it could
+// not be read a second time.
 std::optional<RecordedLog> logOf(const capture::Frame& first);
 
-// The frames of one recording are numbered without gaps: those of no other run are in it.
+// A recording that was finished. It holds frames of one run only, numbered without gaps.
 struct RecordedFile {
-    std::string name;  // the finished one
+    std::string name;  // the file's name once it is finished
     std::uint64_t run = 0;
-    std::uint64_t first = 0;  // number of its first frame
+    std::uint64_t first = 0;  // number of its first frame within the run
 };
 
-// docs/user/recorder-state.md describes the file. Frames of a run are counted from 1; frames too long for a
-// log count as well, what is no frame does not.
+// docs/user/recorder-state.md describes the file. The frames of a run are numbered from 1. Frames that are
+// too long for a log count as well; items that are no frames do not.
 struct RecordState {
     static constexpr std::size_t mostFiles = 1000;
 
     std::string trunk;
-    std::uint64_t run = 0;            // microseconds since 1970 when its log was met; 0: none yet
-    std::uint64_t next = 1;           // the number that its next frame gets
-    std::uint64_t besides = 0;        // recorded items behind the frame before that, which are no frames
-    std::optional<RecordedLog> log;   // that the run is read from
+    // identifies the run: microseconds since 1970 when its log was first seen; 0: none yet
+    std::uint64_t run = 0;
+    std::uint64_t next = 1;     // the number of the run's next frame
+    std::uint64_t besides = 0;  // how many items that are no frames were recorded after the frame before that
+    std::optional<RecordedLog> log;   // the log that the run is read from
     std::vector<RecordedFile> files;  // the newest ones, oldest first
 };
 
 std::string statePath(const std::string& folder, const std::string& trunk);
 
-// Nothing if there is no such file. Throws std::runtime_error, which names the file, if it is damaged.
+// Returns nothing if the file does not exist. Throws std::runtime_error, which names the file, if it is
+// damaged.
 std::optional<RecordState> readState(const std::string& path);
 
-// Puts it in the place of the old one in one step (rename). Returns what is wrong, or nothing.
+// Replaces the file in one step (rename). Returns words that say what went wrong, or nothing.
 std::optional<std::string> writeState(const RecordState& state, const std::string& path);
 
-// Makes a new run, numbered behind all that were before.
+// Begins a new run, whose number is higher than those of all runs before.
 void beginRun(RecordState& state, std::optional<RecordedLog> log);
 
 }  // namespace recording
