@@ -39,7 +39,7 @@ class Log {
     void framesMissing(unsigned long frames);
 
     // Both write the text that is held; call them when no frame waits to be shown. flushIfDue writes only if
-    // the last write was more than DueAfter ago, so that it may be called after each frame. Its caller must
+    // the last write was more than dueAfter ago, so that it may be called after each frame. Its caller must
     // call flush when nothing has come for a while.
     void flush();
     void flushIfDue();

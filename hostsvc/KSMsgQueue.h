@@ -58,7 +58,7 @@ class KSMsgQueue : private KSRunnable {
     void registerLost(void (*callback)(void*), void* argument);
 
     // Sends msg with this queue as its source. Takes the message over: the handle becomes empty. If timeoutMs
-    // is not 0, waits for a reply with the same transaction and with replyType, type 0 or GeneralReply. The
+    // is not 0, waits for a reply with the same transaction and with replyType, type 0 or generalReply. The
     // reply must come from msg's target, unless anySource is not 0. Returns an empty handle when no reply
     // came in time. If timeoutMs is 0, returns a new message with an empty body at once. The caller frees the
     // returned message. Throws KSMsgRef::AllocationError.

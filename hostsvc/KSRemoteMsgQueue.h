@@ -28,7 +28,7 @@ class KSRemoteMsgQueue : public KSAbstractMsgQueue {
     ~KSRemoteMsgQueue() override;
 
     // Reports each failure on the standard error stream. A failure in the middle of a frame pauses for six
-    // seconds, so that the relay can recover. Throws KSRemoteService_ComFailure when RetryBudget reads in a
+    // seconds, so that the relay can recover. Throws KSRemoteService_ComFailure when retryBudget reads in a
     // row have failed.
     std::uint32_t msgRead(NvMsg32Bit** out) override;
     // The caller keeps a message that could not be sent, and frees it with freeUnsent.

@@ -10,7 +10,7 @@
 #include "hostsvc/KSMutex.h"
 #include "hostsvc/KSRunnable.h"
 
-// Stopped means that the thread does not run, or that it has been asked to stop.
+// `stopped` means that the thread does not run, or that it has been asked to stop.
 enum class KSThreadStatus : std::uint32_t { running = 0, stopped = 1 };
 
 // Also named KSThread::control. The clean-up routines form a stack: the last one pushed is the first to run.

@@ -161,7 +161,7 @@ class keyedList : public virtualObject {
         return i == noIndex ? nullptr : &entries_.element(i).value;
     }
 
-    // Both throw OutOfBoundsError, with NoIndex, when the key is not present.
+    // Both throw OutOfBoundsError, with noIndex, when the key is not present.
     V& element(const K& key) { return entries_.element(indexOf(key)).value; }
     V& operator[](const K& key) { return element(key); }
     void unset(const K& key) { entries_.remove(indexOf(key)); }

@@ -62,7 +62,7 @@ TEST(Arrivals, AsManyAsTheQueueHoldsMayComeBeforeTheirTurn) {
 }
 
 // A record that the queue refuses may be the one that tells how many were lost before it.
-TEST(Arrivals, TheNextRecordTellsWhatARefusedOneWasToTell) {
+TEST(Arrivals, TheNextRecordTellsOfLossesThatARefusedRecordShouldHaveTold) {
     Arrivals arrivals;
     const auto refuse = [&](std::unique_ptr<Record> rec) { arrivals.refused(*rec); };
     std::vector<std::uint64_t> missing;

@@ -88,7 +88,7 @@ TEST_F(LogTest, HoldsLessThanABlockUntilTheEnd) {
     EXPECT_TRUE(log_.complete());
 }
 
-TEST_F(LogTest, TakesBackWhatIsInTheFileOfAFrameAndSaysWhereFramesAreMissing) {
+TEST_F(LogTest, RemovesAFrameThatIsInTheFileInPartAndSaysWhereFramesAreMissing) {
     ASSERT_NE(log_.open(path_.c_str()), nullptr);
     frame('a', 5000);
     limitFileSize(7000);
@@ -104,7 +104,7 @@ TEST_F(LogTest, TakesBackWhatIsInTheFileOfAFrameAndSaysWhereFramesAreMissing) {
     EXPECT_FALSE(log_.complete());
 }
 
-TEST_F(LogTest, SaysWhereFramesAreMissingThatNeverCameToIt) {
+TEST_F(LogTest, SaysWhereFramesAreMissingThatWereLostBeforeTheyCameToTheLog) {
     ASSERT_NE(log_.open(path_.c_str()), nullptr);
     frame('a', 100);
     log_.framesMissing(7);
@@ -115,7 +115,7 @@ TEST_F(LogTest, SaysWhereFramesAreMissingThatNeverCameToIt) {
     EXPECT_TRUE(log_.complete());
 }
 
-TEST_F(LogTest, SaysThemWithItsOwnWhenTheirLineCannotBeWritten) {
+TEST_F(LogTest, AddsFramesLostEarlierToItsOwnWhenTheirLineCannotBeWritten) {
     ASSERT_NE(log_.open(path_.c_str()), nullptr);
     limitFileSize(1000);
     frame('a', 995);
@@ -194,7 +194,7 @@ TEST_F(LogTest, KeepsWholeFramesAndCountsTheOthersWhereverTheFileEndsForAWhile) 
     std::cerr.clear();  // its file was under the limit as well
 }
 
-TEST_F(LogTest, AddsUpWhatIsMissingAtOnePlace) {
+TEST_F(LogTest, AddsUpFramesThatAreMissingAtOnePlace) {
     ASSERT_NE(log_.open(path_.c_str()), nullptr);
     log_.framesMissing(7);
     log_.framesMissing(5);
@@ -222,7 +222,7 @@ TEST_F(LogTest, WritesALoneFrameAsSoonAsItHasCome) {
     EXPECT_EQ(saidAtTheEnd(), "");
 }
 
-TEST_F(LogTest, TriesNoMoreThanOnceWhatAPipeHasRefusedOfAFrameWhileNothingNewComes) {
+TEST_F(LogTest, RetriesTheRestOfAFrameOnceWhenAPipeHasRefusedItAndNothingNewComes) {
     ASSERT_EQ(mkfifo(path_.c_str(), 0600), 0);
     const int reader = open(path_.c_str(), O_RDONLY | O_NONBLOCK);
     ASSERT_EQ(fcntl(reader, F_SETPIPE_SZ, 4096), 4096);
@@ -298,7 +298,7 @@ TEST_F(LogTest, TakesOnlyTheNextEntryForTheFrameThatWasAnnounced) {
     EXPECT_EQ(saidAtTheEnd(), "/dev/full: No space left on device\n/dev/full: frames lost: 1\n");
 }
 
-TEST_F(LogTest, DoesNotCountWhatIsNoFrame) {
+TEST_F(LogTest, CountsOnlyFramesAsLost) {
     ASSERT_NE(log_.open("/dev/full"), nullptr);
     log_.write("head\n");
     frame('a', 10);

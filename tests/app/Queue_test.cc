@@ -44,7 +44,7 @@ TEST(Queue, LeavesTheCallersPointerAloneWhenItIsEmpty) {
     EXPECT_EQ(queue.queuecount(), 0);
 }
 
-TEST(Queue, IsAsNewOnceItWasEmptied) {
+TEST(Queue, WorksAfterItWasEmptied) {
     std::array<Record, 2> records;
     Record* out = nullptr;
     Queue queue(2);
@@ -61,7 +61,7 @@ TEST(Queue, IsAsNewOnceItWasEmptied) {
     }
 }
 
-TEST(Queue, LeavesTheRecordsToTheirHoldersWhenItGoes) {
+TEST(Queue, DoesNotDestroyTheRecordsWhenItIsDestroyed) {
     Record rec;
     rec.Timestamp = 1001;
     {
@@ -72,7 +72,7 @@ TEST(Queue, LeavesTheRecordsToTheirHoldersWhenItGoes) {
     EXPECT_EQ(rec.Timestamp.value(), 1001U);
 }
 
-TEST(Queue, OfGreatLengthGoesWithoutRunningOutOfStack) {
+TEST(Queue, IsDestroyedWithoutRecursionHoweverLongItIs) {
     Record rec;
     Queue queue(1000000);
     while (queue.enqueue(&rec)) {

@@ -97,7 +97,7 @@ TEST_F(StreamWriterTest, KeepsTheOrderOfStreamsThatLeadToOnePlace) {
     EXPECT_EQ(out_.read(expected.size()), expected);
 }
 
-TEST_F(StreamWriterTest, LosesNothingThatFindsRoom) {
+TEST_F(StreamWriterTest, WritesAllTextsForWhichThereIsRoom) {
     StreamWriter writer({out_.writer()}, 30000);
     stall(writer, 0, out_, textOf('a', 10000));
     writer.write(0, textOf('b', 10000));
@@ -107,7 +107,7 @@ TEST_F(StreamWriterTest, LosesNothingThatFindsRoom) {
     EXPECT_TRUE(out_.isEmpty());
 }
 
-TEST_F(StreamWriterTest, DropsWhatFindsNoRoomAndSaysHowMuchOnceTheStreamIsRead) {
+TEST_F(StreamWriterTest, DropsTextsForWhichThereIsNoRoomAndSaysHowManyLinesOnceTheStreamIsRead) {
     StreamWriter writer({out_.writer()}, 30000);
     stall(writer, 0, out_, textOf('a', 10000));
     writer.write(0, textOf('b', 20000));
@@ -119,7 +119,7 @@ TEST_F(StreamWriterTest, DropsWhatFindsNoRoomAndSaysHowMuchOnceTheStreamIsRead) 
     EXPECT_EQ(out_.readLine(), "four\n");
 }
 
-TEST_F(StreamWriterTest, DropsAllThatComesUntilWhatWaitedIsWritten) {
+TEST_F(StreamWriterTest, DropsNewTextsUntilTheWaitingOnesAreWritten) {
     StreamWriter writer({out_.writer()}, 20000);
     stall(writer, 0, out_, textOf('a', 10000));
     writer.write(0, textOf('b', 10000));
@@ -137,7 +137,7 @@ TEST_F(StreamWriterTest, TakesATextThatIsLargerThanTheBoundWhenNothingWaits) {
     EXPECT_EQ(out_.read(10000), textOf('a', 10000));
 }
 
-TEST_F(StreamWriterTest, AStreamThatNobodyReadsHoldsUpNoOther) {
+TEST_F(StreamWriterTest, AStreamThatNobodyReadsDoesNotDelayTheOthers) {
     StreamWriter writer({out_.writer(), err_.writer()});
     stall(writer, 0, out_, textOf('a', 10000));
     writer.write(1, "here\n");
@@ -181,14 +181,14 @@ TEST_F(StreamWriterTest, TheEndWaitsNoLongerThanItsLimit) {
     EXPECT_EQ(err_.readLine(), "finds room\n");
 }
 
-TEST_F(StreamWriterTest, AwaitsWhatIsToBeWritten) {
+TEST_F(StreamWriterTest, AwaitWrittenWaitsForAllText) {
     StreamWriter writer({out_.writer()});
     writer.write(0, "a\n");
     writer.awaitWritten(hours(1));
     EXPECT_FALSE(out_.isEmpty());
 }
 
-TEST_F(StreamWriterTest, AwaitsItNoLongerThanTheLimit) {
+TEST_F(StreamWriterTest, AwaitWrittenWaitsNoLongerThanItsLimit) {
     StreamWriter writer({out_.writer()});
     stall(writer, 0, out_, textOf('a', 10000));
     writer.awaitWritten(milliseconds(3));

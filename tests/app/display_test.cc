@@ -125,7 +125,7 @@ TEST_F(Display, DestroysARecordOfAnotherKindToo) {
     EXPECT_EQ(log_.text(), "");
 }
 
-TEST_F(Display, PassesOverACountWithoutARecord) {
+TEST_F(Display, IgnoresACountWithoutARecord) {
     sema.post();
     arrives(CountedRecord::make(destroyed_));
     displayUntilGone(1);
@@ -150,7 +150,7 @@ TEST_F(Display, LeavesTheQueueUnlockedWhenItIsCancelled) {
     queueGuard.unlock();
 }
 
-TEST_F(Display, DiscardsWhatWasStillQueued) {
+TEST_F(Display, DiscardsTheRecordsThatAreStillQueued) {
     for (int i = 0; i < 50; ++i)
         arrives(CountedRecord::make(destroyed_));
     discardQueued();

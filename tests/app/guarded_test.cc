@@ -34,7 +34,7 @@ TEST(Guarded, ReportsADerivedExceptionByItsOwnWords) {
     EXPECT_EQ(screen.text(), "vela Exception caught\nderived 1001\n");
 }
 
-TEST(Guarded, ReportsAThrownMessageWholeAndEndsThere) {
+TEST(Guarded, ReportsAThrownMessageAndDoesNotThrowItOn) {
     const testing::Screen screen;
     guarded(749, [] {
         auto msg = std::make_unique<vela::Msg>(2U);

@@ -242,7 +242,7 @@ TEST_F(Road, ACancelledDisplayShowsWhatHasArrivedWhenTheArrivalsAreClosed) {
     EXPECT_EQ(screen_.text(), "general Exception caught in lapdmon(215)\n");
 }
 
-TEST_F(Road, WhatComesAfterTheArrivalsWereClosedIsDroppedWithoutAWord) {
+TEST_F(Road, RecordsThatComeAfterTheArrivalsWereClosedAreDroppedSilently) {
     send(0, 3);
     arrivals->close();
     send(3, 3);
@@ -251,7 +251,7 @@ TEST_F(Road, WhatComesAfterTheArrivalsWereClosedIsDroppedWithoutAWord) {
     EXPECT_EQ(arrivals->losses().all(), 0U);
 }
 
-TEST_F(Road, TheEndOfTheChannelDropsWhatWaits) {
+TEST_F(Road, TheEndOfTheChannelDropsTheRecordsThatWait) {
     send(0, 500);
     ccs_.reset();  // would wait for ever for deliveries whose room nobody frees
     EXPECT_EQ(arrivals->waiting(), 0U);

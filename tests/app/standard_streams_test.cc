@@ -62,7 +62,7 @@ TEST_F(StandardStreamsDeathTest, WhatIsSaidAfterTheEndIsWrittenAtOnce) {
                 testing::ExitedWithCode(4), "said behind the end");
 }
 
-TEST_F(StandardStreamsDeathTest, AFullPipeEndsNothing) {
+TEST_F(StandardStreamsDeathTest, AFullPipeDoesNotStopTheProgram) {
     EXPECT_EXIT(decoupled([] {
                     readsWhatIsWrittenTo(STDOUT_FILENO);  // which nobody does
                     for (int i = 0; i < 100000; ++i)
@@ -113,7 +113,7 @@ TEST_F(StandardStreamsDeathTest, LinesOfSeveralThreadsDoNotMixThoughTheyComeInPi
                 testing::ExitedWithCode(5), "");
 }
 
-TEST_F(StandardStreamsDeathTest, AForkedChildSaysWhatItHasToSay) {
+TEST_F(StandardStreamsDeathTest, AForkedChildWritesItsTexts) {
     EXPECT_EXIT(decoupled([] {
                     const pid_t child = fork();
                     if (child == 0) {

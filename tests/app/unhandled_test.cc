@@ -26,7 +26,7 @@ namespace {
     std::abort();
 }
 
-TEST(UnhandledDeathTest, ClosesTheLogAndSaysWhatAndWhere) {
+TEST(UnhandledDeathTest, ClosesTheLogAndNamesTheExceptionAndItsPlace) {
     GTEST_FLAG_SET(death_test_style, "threadsafe");
     const std::string name = testing::TempDir() + "unhandled.log";
     EXPECT_EXIT(endByAnException(name), testing::ExitedWithCode(1),
@@ -50,7 +50,7 @@ struct Unspeakable : vela::Exception {
     std::abort();
 }
 
-TEST(UnhandledDeathTest, EndsInOrderEvenWhenThereIsNoMemoryToSayWhat) {
+TEST(UnhandledDeathTest, EndsInOrderEvenWithoutMemoryForTheReport) {
     GTEST_FLAG_SET(death_test_style, "threadsafe");
     const std::string name = testing::TempDir() + "unspeakable.log";
     EXPECT_EXIT(endByAnExceptionThatCannotBeNamed(name), testing::ExitedWithCode(1),

@@ -29,7 +29,7 @@ class Hardening(unittest.TestCase):
             self.assertRegex(readelf("--file-header", file), r"Type: +DYN ")
             self.assertRegex(readelf("--dynamic", file), r"FLAGS_1\).*\bPIE\b")
 
-    def test_what_the_loader_has_filled_in_is_read_only(self):
+    def test_the_tables_that_the_loader_fills_in_are_read_only(self):
         for file in self.each():
             self.assertIn("GNU_RELRO", readelf("--program-headers", file))
             self.assertRegex(readelf("--dynamic", file), r"FLAGS_1\).*\bNOW\b")

@@ -81,7 +81,7 @@ TEST_F(AnalysisTest, PutsSegmentsTogetherBeforeAnythingLooksAtThem) {
     EXPECT_EQ(told.foundLines, "");
 }
 
-TEST_F(AnalysisTest, FindsSegmentsThatDoNotGoOn) {
+TEST_F(AnalysisTest, FindsSegmentsWhoseNextOneDoesNotCome) {
     CallScript script;
     script.at(0).us(m::segment, 9, false, {Bytes{0x00, 0x02, 0x81, 0x05}, Bytes{0x04, 0x03, 0x80}});
     script.at(5000).peer(m::information, 8, true);
@@ -149,7 +149,7 @@ TEST_F(AnalysisTest, FollowsTheRecordedCallsAndFindsNothingWrongInThem) {
     }
 }
 
-TEST_F(AnalysisTest, FindsWhatIsWrongWithLinks) {
+TEST_F(AnalysisTest, ReportsFindingsAboutLinks) {
     const capture::Interface standby{"standby"}, trunk{"trunk"};
     const std::vector<testing::ScriptFrame> refused = testing::script("0 > SABME\n0.01 < DM F\n");
     Options options;

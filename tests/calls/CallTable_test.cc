@@ -164,7 +164,7 @@ TEST_F(CallTableTest, GivesStragglersToTheOldLife) {
     EXPECT_EQ(belongs.back(), 1U);
 }
 
-TEST_F(CallTableTest, CallsWhatComesLongAfterTheEndAStray) {
+TEST_F(CallTableTest, CallsAMessageThatComesLongAfterTheEndAStray) {
     CallScript script = answeredCall();
     script.at(5000).us(m::releaseComplete, 9, false, {cause(16)});
     script.at(15000).peer(m::disconnect, 9, true, {cause(16)});
@@ -180,7 +180,7 @@ TEST_F(CallTableTest, KnowsACallFromBeforeTheTrace) {
     EXPECT_FALSE(hasFailed(seen.calls.at(0)));
 }
 
-TEST_F(CallTableTest, HandsOutWhatIsOpenAtTheEndLast) {
+TEST_F(CallTableTest, ReportsOpenCallsLastAtTheEnd) {
     CallScript script;
     script.at(0).us(m::setup, 1, false);
     script.at(1).us(m::setup, 2, false);
@@ -308,7 +308,7 @@ TEST_F(CallTableTest, KeepsTheCauseOfTheFirstClearingMessageAndTheOthersBesideIt
     EXPECT_EQ(madeBy(call.laterCauses[1]), Made::here);
 }
 
-TEST_F(CallTableTest, BelongsToNoCallWhatHasTheGlobalOrTheDummyReference) {
+TEST_F(CallTableTest, MessagesOfTheGlobalOrTheDummyReferenceBelongToNoCall) {
     CallScript script;
     script.at(0)
         .us(m::restart, 0, false, {restartIndicator(7)})
@@ -317,7 +317,7 @@ TEST_F(CallTableTest, BelongsToNoCallWhatHasTheGlobalOrTheDummyReference) {
     EXPECT_EQ(belongs, (std::vector<std::uint64_t>{0, 0}));
 }
 
-TEST_F(CallTableTest, LetsTheOldestCallGoWhenTooManyAreAlive) {
+TEST_F(CallTableTest, DropsTheOldestCallWhenTooManyAreAlive) {
     CallScript script;
     script.us(m::setup, 1, false);
     Message message = script.toMessage(script.frames().front());

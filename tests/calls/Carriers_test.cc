@@ -97,13 +97,13 @@ TEST(Carriers, SegmentsBelongToTheCallOfTheWholeMessage) {
     EXPECT_EQ(Owners().of(script), "1 of 1*\n2 of 1\n");
 }
 
-TEST(Carriers, WhatIsNeverCompletedBelongsToNone) {
+TEST(Carriers, SegmentsThatAreNeverCompletedBelongToNoCall) {
     CallScript script;
     script.peer(type::segment, 5, false, {{0x00, 0x02, 0x81, 0x05}, {0x04, 0x03, 0x80, 0x90, 0xA3}});
     EXPECT_EQ(Owners().of(script), "1 of none*\n");
 }
 
-TEST(Carriers, EachFrameThatCarriesAMessageIsToldOfOnceWhateverTheFramesAre) {
+TEST(Carriers, ReportsEachFrameThatCarriesAMessageOnceWhateverTheFramesAre) {
     for (unsigned seed = 1; seed <= 300; ++seed) {
         std::mt19937 random(seed);
         CallScript script;

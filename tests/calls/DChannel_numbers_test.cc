@@ -67,7 +67,7 @@ TEST_F(DChannelTest, BlamesTheRecorderForAHoleThatTheReceiverAcknowledges) {
     EXPECT_EQ(told.atEnd(), "");
 }
 
-TEST_F(DChannelTest, LeavesAHoleUndecidedOfWhichNobodySpeaks) {
+TEST_F(DChannelTest, DoesNotDecideAboutAHoleThatNoFrameExplains) {
     EXPECT_EQ(told("1 < I 0 0\n1.1 < I 2 0\n"),
               "1 user command accepted unknown\n2 user command early unknown\n");
     EXPECT_EQ(told.atEnd(), " [hole at 2: 1 from 1 by unknown]");

@@ -26,7 +26,7 @@ TEST_F(DChannelTest, LearnsNothingFromPollsThatAreFarApart) {
     EXPECT_EQ(told("0 < RR 5 P\n2 > RR 7 F\n"), "1 unknown\n2 up\n");
 }
 
-TEST_F(DChannelTest, GivesWhatOneLinkHasShownToTheOthers) {
+TEST_F(DChannelTest, UsesTheRoleThatOneLinkHasShownForTheOthers) {
     EXPECT_EQ(told("0 < sapi 63 UI = 0F 00 01 04 FF\n1 > tei 64 RR 0\n"),
               "1 user command accepted unknown\n2 user response unknown\n");
 }

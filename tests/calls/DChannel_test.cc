@@ -60,7 +60,7 @@ TEST_F(DChannelTest, SaysThatALinkIsSetUpAgainWhileItIsUp) {
               "4 user response link-up up\n");
 }
 
-TEST_F(DChannelTest, DoesNotPassOnWhatArrivesBeforeTheLinkIsUp) {
+TEST_F(DChannelTest, DoesNotPassOnFramesThatArriveBeforeTheLinkIsUp) {
     EXPECT_EQ(told("0 > SABME\n0.005 < I 9 9\n0.01 < UA\n0.02 < I 0 0\n"),
               "1 user command establishing\n"
               "2 user command refused establishing\n"
@@ -68,14 +68,14 @@ TEST_F(DChannelTest, DoesNotPassOnWhatArrivesBeforeTheLinkIsUp) {
               "4 user command accepted up\n");
 }
 
-TEST_F(DChannelTest, KnowsThatALinkIsUpWhoseAnswerIsMissing) {
+TEST_F(DChannelTest, KnowsThatALinkIsUpAlthoughTheAnswerToSabmeIsMissing) {
     EXPECT_EQ(told("0 > SABME\n1 > I 0 0\n1.1 < RR 1\n"),
               "1 user command establishing\n"
               "2 user command accepted up\n"
               "3 user response up\n");
 }
 
-TEST_F(DChannelTest, MarksAPollBehindOneThatWasNotAnswered) {
+TEST_F(DChannelTest, MarksAPollAfterOneThatWasNotAnswered) {
     EXPECT_EQ(told("0 > I 0 0\n0.1 < RR 1\n20 > RR 0 P\n21 > RR 0 P\n21.01 < RR 1 F\n"),
               "1 user command accepted unknown\n"
               "2 user response up\n"

@@ -48,7 +48,7 @@ TEST(FrameRejected, IsFoundWithWhatTheFrameSays) {
         << trunk.findings().front().sentence;
 }
 
-TEST(NsGap, IsTheLinesAfterReject) {
+TEST(NsGap, BlamesTheLineAfterReject) {
     Trunk trunk;
     trunk.tell("1 < I 0 0\n1.1 < I 2 0\n1.2 > REJ 1\n1.3 < I 1 0\n1.4 < I 2 0\n1.5 > RR 3\n");
     EXPECT_EQ(trunk.found(), "warning ns-gap-line 2\n");
@@ -56,19 +56,19 @@ TEST(NsGap, IsTheLinesAfterReject) {
               "TEI 0: of what the other side sent, 1 frame is missing from N(S) 1 on");
 }
 
-TEST(NsGap, IsTheRecordersWhenTheReceiverAcknowledges) {
+TEST(NsGap, BlamesTheRecorderWhenTheReceiverAcknowledges) {
     EXPECT_EQ(found("1 < I 0 0\n1.1 < I 3 0\n1.2 > RR 4\n"), "warning ns-gap-recorder 2\n");
 }
 
-TEST(NsGap, IsTheRecordersInWhatOurSideSent) {
+TEST(NsGap, BlamesTheRecorderForFramesThatOurSideSent) {
     EXPECT_EQ(found("1 > I 0 0\n1.05 < RR 1\n1.1 > I 2 0\n1.2 < RR 3\n"), "warning ns-gap-recorder 3\n");
 }
 
-TEST(NsGap, IsUnknownWhenNobodySpeaksOfIt) {
+TEST(NsGap, BlamesNobodyWhenNoFrameExplainsIt) {
     EXPECT_EQ(found("1 > I 0 0\n1.05 < RR 1\n1.1 < I 0 1\n1.2 < I 2 1\n"), "note ns-gap-unknown 4\n");
 }
 
-TEST(NsGap, IsNoneWhereFramesAreRepeatedAfterReject) {
+TEST(NsGap, IsNotFoundWhereFramesAreRepeatedAfterReject) {
     // Our own frames, which the recorder has all seen.
     EXPECT_EQ(found(std::string(up) +
                     "1 > I 0 0\n1.01 > I 1 0\n1.02 > I 2 0\n1.1 < REJ 1\n1.2 > I 1 0\n1.3 > I 2 0\n"
@@ -91,7 +91,7 @@ TEST(NrInvalid, IsNotFoundBehindALossOfTheRecorder) {
               "warning frames-lost 2\nwarning ns-gap-recorder 3\n");
 }
 
-TEST(BoardRestarted, ForgetsWhatWasOpen) {
+TEST(BoardRestarted, ForgetsWaitsThatWereOpen) {
     EXPECT_EQ(
         Trunk().tell(std::string(up) + "1 > I 0 0\n").restarted().tell("0 > I 40 7\n0.1 < RR 41\n").found(),
         "note board-restarted 3\n");
@@ -112,7 +112,7 @@ TEST(SameRole, IsNotFoundWhenSetUpsCross) {
     EXPECT_EQ(found("0 > SABME\n0.001 < SABME\n0.01 > UA\n0.011 < UA\n"), "");
 }
 
-TEST(LineLooped, IsFoundWhenWhatComesInWentOut) {
+TEST(LineLooped, IsFoundWhenTheFramesThatComeInAreThoseThatWentOut) {
     Trunk trunk;
     // What the other side sends has the octets of what ours has sent.
     for (int at = 0; at < 4; ++at)
@@ -149,7 +149,7 @@ TEST(RoleContradicted, IsFoundWhenOneSideChangesItsCoding) {
               "warning role-contradicted 3\n");
 }
 
-TEST(Tei, FindsWhatManagementSays) {
+TEST(Tei, FindsDeniedAndRemovedTeis) {
     EXPECT_EQ(found("0 > sapi 63 UI = 0F 12 34 01 FF\n0.1 < sapi 63 UI = 0F 12 34 03 FF\n"),
               "warning tei-denied 2\n");
     EXPECT_EQ(found("0 < sapi 63 UI = 0F 00 00 06 81\n"), "note tei-removed 1\n");

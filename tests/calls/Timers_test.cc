@@ -24,7 +24,7 @@ TEST(Timers, OfBothSidesAreSetTogether) {
     EXPECT_EQ(timers.t310Network, 11 * second);
 }
 
-TEST(Timers, RefuseWhatIsNoTimerOrNoDuration) {
+TEST(Timers, RefuseUnknownTimersAndDurations) {
     Timers timers;
     for (const char* bad :
          {"", "T305", "T305=", "T305=soon", "T305=-1", "T305=0", "T305=1h", "T99=1", "=1", "T305=1e30"})

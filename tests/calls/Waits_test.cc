@@ -132,7 +132,7 @@ TEST(Waits, TakeACollisionOfReleasesForAnswers) {
     EXPECT_EQ(findingsOf(script, 60000), "");
 }
 
-TEST(Waits, FindACallThatProceedsToNothing) {
+TEST(Waits, FindACallThatStopsAfterCallProceeding) {
     CallScript script = afterACall();
     script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
     script.at(10100).peer(m::callProceeding, 2, true);

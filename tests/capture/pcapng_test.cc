@@ -136,7 +136,7 @@ TEST(PcapngTest, NamesAndVariantsAreThoseOfTheInterface) {
     }
 }
 
-TEST(PcapngTest, DropsAndCommentsOfOthersAreSaid) {
+TEST(PcapngTest, DropsAndForeignCommentsBecomeItems) {
     Octets file = section();
     file.block(1, interface(file, 203, file.body()));
     file.block(
@@ -162,7 +162,7 @@ TEST(PcapngTest, CheckSequencesAreLeftOut) {
     EXPECT_EQ(itemsOf(file), "frame 1 RX user 0ms 02017f\n");
 }
 
-TEST(PcapngTest, PacketsOfOtherLinksAreSaidAndPassedOver) {
+TEST(PcapngTest, PacketsOfOtherLinkTypesAreReportedAndSkipped) {
     Octets file = section();
     file.block(1, interface(file, 203, file.body())).block(1, interface(file, 1, file.body()));
     file.block(6, packet(file, 1, 0, "0123", file.body())).block(6, packet(file, 0, 0, sabme, file.body()));
@@ -176,7 +176,7 @@ TEST(PcapngTest, PacketsOfOtherLinksAreSaidAndPassedOver) {
               "!: link type 1 (EN10MB); a D-channel capture has 177 (LINUX_LAPD) or 203 (LAPD)\n");
 }
 
-TEST(PcapngTest, DamageIsSaidWithItsPlace) {
+TEST(PcapngTest, DamageIsReportedWithItsPlace) {
     Octets file = section();
     file.block(1, interface(file, 203, file.body())).block(6, packet(file, 0, 0, sabme, file.body()));
     const std::string frame = "frame 1 TX user 0ms 00017f\n";

@@ -36,7 +36,7 @@ TEST_F(TextForms, AHexLineIsADirectionAndOctets) {
               "frame 6 RX 0001\n");
 }
 
-TEST_F(TextForms, ATimeMayStandBetween) {
+TEST_F(TextForms, AHexLineMayHaveATime) {
     EXPECT_EQ(read("RX 2026-11-21T11:25:33.3Z 0001\n"
                    "RX 2026-11-21T11:25:33.004+02:00 00 01\n"
                    "RX 2026-11-21T11:25:33 0001\n"
@@ -57,7 +57,7 @@ TEST_F(TextForms, BlankLinesAndCommentsStandBetweenHexLines) {
     EXPECT_EQ(read("# recorded yesterday\n\n  \nTX 0001  # the first\r\n# end"), "frame 4 TX 0001\n");
 }
 
-TEST_F(TextForms, AHexLineThatIsNoneIsNamed) {
+TEST_F(TextForms, ALineThatIsNoHexLineIsReported) {
     const std::string none = " x1 \"this line is no direction, time and octets; it is passed over\"\n";
     EXPECT_EQ(read("TX 0001\nsomething\nTX 000\nTX 00 0g\nTX\nRX 0001\n"),
               "frame 1 TX 0001\nunproved 2" + none + "unproved 3" + none + "unproved 4" + none +
@@ -104,7 +104,7 @@ TEST_F(TextForms, ADumpHasTheTimeAtTheBeginningOfItsLine) {
               "frame 1 TX +0ms 00017f\nframe 2 RX +2000ms 000173\n");
 }
 
-TEST_F(TextForms, WhatHasNoFrameIsOfNoKnownForm) {
+TEST_F(TextForms, AnInputWithoutAFrameHasNoKnownForm) {
     EXPECT_EQ(read("once upon a time\n"), "!: unknown file format\n");
     EXPECT_EQ(read(""), "!: it is empty\n");
     EXPECT_EQ(read("# nothing\n"), "!: unknown file format\n");

@@ -91,7 +91,7 @@ TEST(PcapngWriterTest, TicksAndHostSecondComeBack) {
               "frame 1 RX user 1795260333300ms t4294967295 w1795260333 000173\n");
 }
 
-TEST(PcapngWriterTest, WhatStandsBetweenFramesComesBackInItsPlace) {
+TEST(PcapngWriterTest, ItemsBetweenFramesComeBackInTheirPlace) {
     EXPECT_EQ(roundTrip(makePcapngWriter, itemOf(trunk, Kind::run), itemOf(trunk, Kind::lost, 17),
                         frameOf(trunk, true, then, sabme), itemOf(trunk, Kind::notQueued),
                         itemOf(trunk, Kind::dropped, 3), itemOf(trunk, Kind::restart),
@@ -117,7 +117,7 @@ TEST(PcapngWriterTest, AHeadWithoutVariantStaysInFrontOfItsFrames) {
               "run 1 \nframe 1 TX user 1795260333300ms 00017f\n");
 }
 
-TEST(PcapngWriterTest, FramesThatWereNotCapturedWholeStaySo) {
+TEST(PcapngWriterTest, FramesThatWereNotCapturedWholeComeBackAsSuch) {
     Item oversized = frameOf(trunk, true, then, {});
     oversized.kind = Kind::oversized;
     Item cut = frameOf(trunk, false, then, ua);

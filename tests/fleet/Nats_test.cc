@@ -172,7 +172,7 @@ TEST_F(Nats, AServerThatSaysNothingIsNoAnswer) {
     EXPECT_TRUE(publisher.answer(longEnough));
 }
 
-TEST_F(Nats, WhatCannotBeDoneSaysWhy) {
+TEST_F(Nats, AFailureSaysWhy) {
     ConsumerRules rules = allFrames();
     rules.stream = "NONE";
     EXPECT_THROW(NatsConsumer(connection, rules), NatsError);

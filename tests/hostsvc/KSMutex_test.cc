@@ -114,7 +114,7 @@ TEST(KSMutex, AnUnlockEndsThePauseAndLetsTheWaiterIn) {
     mutex.unlock();
 }
 
-TEST(KSMutex, APauseThatNobodyEndsPasses) {
+TEST(KSMutex, APauseEndsByItself) {
     KSMutex mutex;
     mutex.lock();
     EXPECT_FALSE(mutex.tryLock(2, 1));

@@ -108,7 +108,7 @@ TEST(KSSemaphore, APostEndsThePauseAndIsTaken) {
     EXPECT_FALSE(semaphore.tryWait());
 }
 
-TEST(KSSemaphore, APauseThatNobodyEndsPasses) {
+TEST(KSSemaphore, APauseEndsByItself) {
     KSSemaphore semaphore(1, 0);
     EXPECT_FALSE(semaphore.tryWait(2, 1));
 }

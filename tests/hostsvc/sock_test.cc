@@ -210,7 +210,7 @@ TEST_F(SockTest, ReadinessIsThatOfTheMode) {
     EXPECT_EQ(sock_.ready(0, 0), 1);
 }
 
-TEST_F(SockTest, WhatCannotBeWaitedForCountsAsReady) {
+TEST_F(SockTest, ADescriptorThatCannotBeWaitedForCountsAsReady) {
     EXPECT_EQ(sock_.ready('r', -2, 0), 1);
     sock nothing(-1);
     EXPECT_EQ(nothing.ready('r', -1, -1), 1);

@@ -63,7 +63,7 @@ TEST(BoardClockTest, AFallThatTheHostsTimeDoesNotAgreeWithIsARestart) {
     EXPECT_EQ(clock.time(), (500 + 86400) * second);
 }
 
-TEST(BoardClockTest, AFallOf8MillisecondsIsNone) {
+TEST(BoardClockTest, AFallOf8MillisecondsIsNoRestart) {
     BoardClock clock;
     clock.take(1000, 500);
     EXPECT_EQ(clock.take(998, 500), Verdict::goesOn);

@@ -79,7 +79,7 @@ TEST_F(LogWriterTest, ALogOfRandomFramesComesBackOctetByOctet) {
     }
 }
 
-TEST_F(LogWriterTest, WhatStandsBetweenFramesComesBack) {
+TEST_F(LogWriterTest, ItemsBetweenFramesComeBack) {
     const std::string log = net5Head + "Frames Lost: 3 \n" + textOf(true, 1, sabme) +
                             textOf(false, 2, Octets(258, 0)) + "Enqueue Failed \nFrames Lost: 9 \n" +
                             headText + "NI2 Switch \n" + textOf(false, 1, setup, 10) + "Get iemsg failed \n";
@@ -97,7 +97,7 @@ TEST_F(LogWriterTest, AHeadWithoutVariantStaysSo) {
     EXPECT_EQ(throughPcapng(headText + textOf(true, 1, sabme)), headText + textOf(true, 1, sabme));
 }
 
-TEST_F(LogWriterTest, WhatProvesNothingIsLeftOut) {
+TEST_F(LogWriterTest, LinesThatProveNothingAreLeftOut) {
     EXPECT_EQ(
         logAgain(net5Head + "rubbish\n" + textOf(true, 1, sabme) + textOf(false, 2, setup).substr(0, 100)),
         net5Head + textOf(true, 1, sabme));

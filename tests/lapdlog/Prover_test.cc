@@ -50,7 +50,7 @@ TEST(ProverTest, ADumpOfWholeLinesIsDoubtfulAtTheEndOfTheText) {
     EXPECT_FALSE(prover.prove(body + "\n", false, Variant::net5, false).isDoubtful);
 }
 
-TEST(ProverTest, ATitleIsNotLookedForWhereThereIsNone) {
+TEST(ProverTest, SearchesForATitleOnlyWhereOneMayBe) {
     Prover prover;
     const std::string body = bodyOf(false, setup);
     const std::size_t title = body.find("Hex Dump: ");

@@ -66,7 +66,7 @@ TEST_F(FollowTest, ALogMayGrowFromNothingOctetByOctet) {
     EXPECT_EQ(words, "run frame lost frame ");
 }
 
-TEST_F(FollowTest, WhatIsWholeComesAtOnce) {
+TEST_F(FollowTest, AWholeFrameIsGivenAtOnce) {
     write(net5Head + frame + other.substr(0, 200));
     open();
     EXPECT_EQ(more(), "run frame ");

@@ -130,7 +130,7 @@ TEST_F(LogTest, ADisplayThatImitatesAFrameIsText) {
               std::string::npos);
 }
 
-TEST_F(LogTest, ADisplayWithDumpsAloneDoesNotHideTheFramesOwn) {
+TEST_F(LogTest, ADumpInADisplayTextDoesNotHideTheFramesDump) {
     std::string dumps;
     while (dumps.size() + 12 < 240)
         dumps += "Hex Dump: \n";
@@ -162,7 +162,7 @@ TEST_F(LogTest, TwoBadFramesAreTwoItems) {
               "cut 15 RX t1 w1795260333  \"the log ends within this frame\"\n");
 }
 
-TEST_F(LogTest, LinesThatNobodyWritesAreCounted) {
+TEST_F(LogTest, LinesThatLapdmonCannotHaveWrittenAreCounted) {
     EXPECT_EQ(itemsIn(net5Head + "one\ntwo\n\nthree\n" + textOf(false, 2, ua) + "four"),
               "run 1 net5\n"
               "unproved 6 x4 \"these lines are none that the recorder writes\"\n"

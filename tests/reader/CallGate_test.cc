@@ -74,7 +74,7 @@ TEST(CallGate, HoldsFramesUntilTheEndOfTheirCallTells) {
     EXPECT_EQ(Passed({{"failed", "", true}, {"call", "2"}}, ofInput).of(twoCalls()), "||||||||23567");
 }
 
-TEST(CallGate, GivesOnWhatWasHeldInTheOrderOfTheInput) {
+TEST(CallGate, LetsHeldItemsThroughInTheOrderOfTheInput) {
     CallScript script = twoCalls();
     using namespace calls::test;
     script.at(70).us(type::setup, 3, false, {bearerSpeech(), channel(3)});
@@ -93,7 +93,7 @@ TEST(CallGate, GivesOnACallAtItsEndWhereDecisionsAreTheOrder) {
     EXPECT_EQ(Passed({{"failed", "", true}}, ofDecision).of(script), "|||||||8|235679|10|");
 }
 
-TEST(CallGate, LetsWhatBelongsToNoCallThroughIfOnlyCallsAreRefused) {
+TEST(CallGate, LetsItemsOfNoCallThroughIfOnlyCallsAreRefused) {
     EXPECT_EQ(Passed({{"call", "2", true}}, ofInput).of(twoCalls()), "1|||4||||8|");
 }
 

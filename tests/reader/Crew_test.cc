@@ -59,7 +59,7 @@ TEST(Crew, LosesNothingHoweverManyWork) {
     EXPECT_EQ(next, 2000);
 }
 
-TEST(Crew, HandsOnWhatAJobThrows) {
+TEST(Crew, ThrowsTheExceptionsOfItsJobs) {
     const auto job = [](Chunk& chunk) {
         if (chunk.text == "bad")
             throw std::runtime_error("no good");

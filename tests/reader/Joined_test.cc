@@ -82,7 +82,7 @@ TEST(Merge, LeavesItemsOfOneTimeInTheOrderOfTheInputs) {
     EXPECT_EQ(all(merge), "x@1 a:1, y@1 b:1");
 }
 
-TEST(Merge, WaitsForNobodyWhoHasNothingJustNow) {
+TEST(Merge, DoesNotWaitForAnInputThatHasNothingJustNow) {
     Merge merge({scripted("a", {{"pause"}, {"x", 1 * second}}), scripted("b", {{"y", 2 * second}})});
     EXPECT_EQ(all(merge), "y@2 b:1, x@1 a:1");
 }

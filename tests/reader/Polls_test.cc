@@ -59,13 +59,13 @@ TEST(KeepAlives, AreHiddenWithTheirAnswers) {
               "1 2 |");
 }
 
-TEST(KeepAlives, AloneAreShownIfNotStandsInFront) {
+TEST(KeepAlives, AreTheOnlyFramesShownIfTheFilterIsNegated) {
     EXPECT_EQ(
         shown(with(linkUp(), {{"x", 20 * second, poll, true}, {"x", 20 * second + 1, answer, false}}), true),
         "3 4 |");
 }
 
-TEST(KeepAlives, AreShownIfNobodyAnswers) {
+TEST(KeepAlives, AreShownIfNoAnswerComes) {
     EXPECT_EQ(shown(with(linkUp(), {{"x", 20 * second, poll, true}, {"x", 22 * second, poll, true}})),
               "1 2 3 4 |");
 }

@@ -163,7 +163,7 @@ TEST_F(RotatingFileTest, BeginsNoFileForAFrameThatIsALittleLate) {
     EXPECT_EQ(files(), (Files{"t.20261121T112600Z.txt=[4][5].", "t.20261121T112459Z.txt=[6]."}));
 }
 
-TEST_F(RotatingFileTest, EndsWithItsPeriodThoughNothingComes) {
+TEST_F(RotatingFileTest, EndsWithItsPeriodAlthoughNothingComes) {
     rules_.period = 60;
     RotatingFile file(rules_, "t", chatter_);
     file.write(frame(november));  // 11:25:33
@@ -175,7 +175,7 @@ TEST_F(RotatingFileTest, EndsWithItsPeriodThoughNothingComes) {
     EXPECT_EQ(files(), Files{"t.20261121T112533Z.txt=[4]."});
 }
 
-TEST_F(RotatingFileTest, KeepsWhatIsNotOlderThanTheSpan) {
+TEST_F(RotatingFileTest, KeepsFilesThatAreNotOlderThanTheSpan) {
     rules_.span = 60;
     RotatingFile file(rules_, "t", chatter_);
     for (const int at : {0, 20, 40, 80}) {
@@ -189,7 +189,7 @@ TEST_F(RotatingFileTest, KeepsWhatIsNotOlderThanTheSpan) {
                               "t.20261121T112653Z.txt=[4].", "t.20261121T112654Z.txt=[4]."}));
 }
 
-TEST_F(RotatingFileTest, WithAMarkIsLeftAloneByThoseWithout) {
+TEST_F(RotatingFileTest, WithAMarkIsNotRemovedByOnesWithoutAMark) {
     RotationRules marked = rules_;
     marked.mark = "kept";
     {
@@ -208,7 +208,7 @@ TEST_F(RotatingFileTest, WithAMarkIsLeftAloneByThoseWithout) {
                               "t.20261121T112533Z.2.txt=[7]."}));
 }
 
-TEST_F(RotatingFileTest, KeepsWhatItHasWhenTheDiskIsFull) {
+TEST_F(RotatingFileTest, KeepsTheRecordsInTheFileWhenTheDiskIsFull) {
     RotatingFile file(rules_, "t", chatter_);
     file.write(frame(november));
     file.flush();

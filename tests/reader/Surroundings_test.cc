@@ -119,7 +119,7 @@ TEST_F(SurroundingsTest, AreProlongedByATriggerWithinThem) {
              "<lapdread: kept because of one> 1/4 2/4 3/4 4/4<lapdread: kept because of two> 5/4 6/4 7/4"}}));
 }
 
-TEST_F(SurroundingsTest, AreNothingWithoutATrigger) {
+TEST_F(SurroundingsTest, WriteNothingWithoutATrigger) {
     Surroundings surroundings(rules_, "t", chatter_);
     surroundings.trigger("nothing has come yet");
     pass(surroundings, 1, 20);

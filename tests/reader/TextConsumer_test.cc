@@ -100,7 +100,7 @@ TEST(Pipeline, GivesTheSameTextWhateverTheNumberOfThreads) {
     EXPECT_EQ(run(3000, {}, 700, 4), run(3000, {}, 700, 1));
 }
 
-TEST(Output, TellsThatNobodyReadsAnyMore) {
+TEST(Output, ReportsThatTheReaderHasGone) {
     std::signal(SIGPIPE, SIG_IGN);
     Pipe pipe;
     Output out(pipe.writeEnd(), "pipe");
@@ -109,7 +109,7 @@ TEST(Output, TellsThatNobodyReadsAnyMore) {
     EXPECT_THROW(out.flush(), ReaderGone);
 }
 
-TEST(Output, NamesWhatCannotBeWritten) {
+TEST(Output, NamesTheFileThatCannotBeWritten) {
     Output out(std::string("/dev/full"));
     out.write("text");
     try {

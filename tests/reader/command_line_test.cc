@@ -45,7 +45,7 @@ TEST(CommandLine, TakesLettersThatPeopleHaveInTheirFingers) {
     EXPECT_EQ(parseCommandLine({"-v", "a"}).options.loudness, Loudness::verbose);
 }
 
-TEST(CommandLine, KeepsFiltersAndWhetherNotStandsInFront) {
+TEST(CommandLine, KeepsFiltersAndWhetherTheyAreNegated) {
     EXPECT_EQ(filters({"--message", "SETUP,CONNECT", "--not", "--callref", "5", "a.log"}),
               (Set{"message=SETUP,CONNECT", "!callref=5"}));
     EXPECT_EQ(filters({"--not", "--callref=5", "--callref=6", "a.log"}), (Set{"!callref=5", "callref=6"}));
@@ -102,7 +102,7 @@ TEST(CommandLine, RefusesWhatItDoesNotKnow) {
         EXPECT_THROW(parseCommandLine(words), UsageError) << words[0];
 }
 
-TEST(CommandLine, TellsHelpAndVersionOfAllAndOfEachCommand) {
+TEST(CommandLine, HasHelpAndVersionForTheProgramAndEachCommand) {
     EXPECT_EQ(parseCommandLine({"--version"}).told.substr(0, 9), "lapdread ");
     const std::string all = parseCommandLine({"--help"}).told;
     for (const Command& command : commands()) {

@@ -30,7 +30,7 @@ class Frames(unittest.TestCase):
                 rest = numbers("--quiet", *(["--not", "--call", ",".join(calls)] if calls else []), path)
                 self.assertEqual(sorted(sum(parts, rest)), numbers("--quiet", path))
 
-    def test_those_that_calls_names_are_those_of_the_call(self):
+    def test_the_frames_that_calls_names_are_those_of_the_call(self):
         for path in INPUTS:
             for call in all_calls(path):
                 with self.subTest(path.name, call=call["call"]):

@@ -11,7 +11,7 @@ ROW = re.compile(r"^\| `([^`]+)` \| (\d+) \| `([^`]+)` \| \S", re.M)
 
 
 class Findings(unittest.TestCase):
-    def test_of_the_examples_are_explained(self):
+    def test_messages_of_the_examples_are_explained(self):
         explained = [(file, int(frame), name) for file, frame, name in ROW.findall(PAGE.read_text())]
         found = []
         for path in [*EXAMPLES.values(), *RECORDED]:

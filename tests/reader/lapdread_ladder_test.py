@@ -62,7 +62,7 @@ class Texts(Folder):
     # A SETUP whose display text is a command to a terminal, markup, and what Mermaid would obey.
     DISPLAY = b"\x1b[31m</text>&\"#;end\x9b\n%%{x}%%"
 
-    def test_of_frames_do_no_harm(self):
+    def test_texts_of_frames_do_no_harm(self):
         setup = bytes([0x02, 0x01, 0, 0, 8, 1, 1, 5, 0x28, len(self.DISPLAY)]) + self.DISPLAY
         (self.folder / "evil.hex").write_text(f"RX 2026-11-21T11:25:33Z {setup.hex()}\n")
         text = output("ladder", "--quiet", "--width", "120", "evil.hex", cwd=self.folder)

@@ -193,7 +193,7 @@ class Time(Recording):
         self.assertIsNone(recorder.poll())
         self.stop(recorder)
 
-    def test_what_is_older_than_the_span_goes(self):
+    def test_files_older_than_the_span_are_removed(self):
         self.write("t.hex", *[numbered(minute, second=60 * minute) for minute in range(60)])
         recorder = self.record("--keep", "10min")
         until(lambda: any(path.name == "t.20261121T122433Z.pcapng" for path in self.recorded()), "the last minute")
@@ -205,7 +205,7 @@ class Time(Recording):
 class Trigger(Recording):
     DISCONNECT = "00010200080200014508028290"  # cause 16
 
-    def test_what_surrounds_a_cause_stays_while_the_rest_goes(self):
+    def test_frames_around_a_cause_are_kept_while_others_are_removed(self):
         lines = [numbered(minute, second=60 * minute) for minute in range(60)]
         lines.insert(30, frame(30 * 60 - 30, self.DISCONNECT.replace("8290", "82a2")))
         lines.insert(10, frame(10 * 60 - 30, self.DISCONNECT))
@@ -257,7 +257,7 @@ class Trigger(Recording):
                 self.stop(recorder)
                 self.assertEqual(len(self.recorded(kept=True)), expected, self.said())
 
-    def test_what_is_recorded_already_triggers_nothing_again(self):
+    def test_frames_that_are_recorded_already_trigger_nothing_again(self):
         self.write("t.hex", frame(0, self.DISCONNECT))
         for expected in (1, 1):
             recorder = self.record("--on", "cause:16")

@@ -169,7 +169,7 @@ class Redact(Folder):
         self.assertEqual(status, 1)
         self.assertIn("--to FORM", error)
 
-    def test_gives_the_same_tomorrow_and_another_thing_by_another_key(self):
+    def test_one_key_always_gives_the_same_pseudonyms_and_another_key_others(self):
         one, other = self.folder / "one", self.folder / "other"
         first = output("redact", "--to", "hex", "--key", one, EXAMPLES["net5"])
         self.assertEqual(output("redact", "--to", "hex", "--key", one, EXAMPLES["net5"]), first)

@@ -122,13 +122,13 @@ class Tshark(Folder):
         channels = [f["value"] for f in fields(line, 0x18, "channel number")]
         self.same("channel", [c & 0x7F for c in numbers(row["q931.channel.number"])], channels, where)
 
-    def test_sees_the_same_in_the_examples(self):
+    def test_wireshark_and_we_agree_on_the_examples(self):
         for variant, path in EXAMPLES.items():
             with self.subTest(variant):
                 self.assertGreater(self.compare(path, variant), 50)
         self.all_was_compared()
 
-    def test_sees_the_same_in_frames_made_at_random(self):
+    def test_wireshark_and_we_agree_on_frames_made_at_random(self):
         for seed, variant in enumerate(EXAMPLES):
             for role in (USER, NETWORK):
                 with self.subTest(variant=variant, role=role):

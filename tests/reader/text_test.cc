@@ -5,7 +5,7 @@
 namespace reader {
 namespace {
 
-TEST(SafeText, ShowsWhatATerminalWouldObeyAsItsCode) {
+TEST(SafeText, ShowsControlCharactersAsTheirCodes) {
     EXPECT_EQ(safe("\x1b[2Jred"), "\\x1b[2Jred");
     EXPECT_EQ(safe("a\nb\tc\x7f"), "a\\x0ab\\x09c\\x7f");
     EXPECT_EQ(safe("\x9b\xc3\xa4"), "\\x9b\\xc3\\xa4");  // 9B begins a sequence on some terminals
@@ -31,7 +31,7 @@ TEST(Xml, HasNoMarkupAndNothingThatIsNotAscii) {
     EXPECT_EQ(text, "\\x1b &lt;i&gt;");
 }
 
-TEST(Padding, StandsBehindOrInFront) {
+TEST(Padding, IsAddedAfterOrBeforeTheText) {
     std::string text = "ab";
     padTo(text, 1, 3);
     EXPECT_EQ(text, "ab  ");
@@ -43,7 +43,7 @@ TEST(Padding, StandsBehindOrInFront) {
     EXPECT_EQ(text, "abcdef");
 }
 
-TEST(PlainName, IgnoresCaseAndWhatPartsWords) {
+TEST(PlainName, IgnoresCaseBlanksHyphensAndUnderscores) {
     EXPECT_EQ(plainName("RELEASE COMPLETE"), "releasecomplete");
     EXPECT_EQ(plainName("release-complete"), plainName("Release_Complete"));
 }

@@ -41,7 +41,7 @@ RecordState example() {
     return state;
 }
 
-TEST_F(RecordStateTest, StandsInTheFileAsThePageSays) {
+TEST_F(RecordStateTest, IsWrittenAsThePageDescribes) {
     EXPECT_EQ(writeState(example(), path_), std::nullopt);
     EXPECT_EQ(
         written(),
@@ -87,7 +87,7 @@ TEST_F(RecordStateTest, MayHaveNoLogAndNoFiles) {
     EXPECT_TRUE(read->files.empty());
 }
 
-TEST_F(RecordStateTest, IsNothingWhereThereIsNoFile) { EXPECT_FALSE(readState(path_)); }
+TEST_F(RecordStateTest, IsEmptyIfThereIsNoFile) { EXPECT_FALSE(readState(path_)); }
 
 TEST_F(RecordStateTest, ThatIsCutOffIsRefusedWithTheFilesName) {
     EXPECT_EQ(writeState(example(), path_), std::nullopt);

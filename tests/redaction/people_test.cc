@@ -25,7 +25,7 @@ void forEachTrace(Test test) {
     }
 }
 
-TEST(People, ofTracesThatDifferInNothingElseCannotBeTold) {
+TEST(People, ofTracesThatDifferOnlyInThemCannotBeRecovered) {
     forEachTrace([](unsigned structure, Variant variant) {
         test::ConstantPseudonyms constant;
         const People one = peopleOf(structure, 1, variant);

@@ -141,7 +141,7 @@ TEST(RelayCidr, ContainsTheAddressesOfItsNetwork) {
     }
 }
 
-TEST(RelayCidr, OtherTextIsNone) {
+TEST(RelayCidr, OtherTextIsRefused) {
     for (const char* text : {"", "/", "192.168.1.0/", "192.168.1.0/33", "192.168.1.0/-1", "192.168.1/24",
                              "relay/24", "192.168.1.0/24x", "192.168.1.0/24/24", "::1/128"})
         EXPECT_FALSE(Cidr::parse(text)) << text;

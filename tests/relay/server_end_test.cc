@@ -56,7 +56,7 @@ TEST_F(RelayEndTest, WithoutMemoryToWakeItsThreadTheQueueIsGivenBackAllTheSame) 
     expectService();
 }
 
-TEST_F(RelayEndTest, StoppingSendsWhatIsOnItsWayAndSaysThatTheRelayCloses) {
+TEST_F(RelayEndTest, StoppingSendsMessagesThatAreOnTheirWayAndThenACloseRequest) {
     start();
     fake_norv::onWrite([](const fake_norv::Message& heard) {
         if (heard.type == 8)
@@ -74,7 +74,7 @@ TEST_F(RelayEndTest, StoppingSendsWhatIsOnItsWayAndSaysThatTheRelayCloses) {
     EXPECT_EQ(connect().get(), -1);
 }
 
-TEST_F(RelayEndTest, StoppingTwiceWaitsForNobody) {
+TEST_F(RelayEndTest, StoppingTwiceReturnsAtOnce) {
     start();
     const Connection host = open();
     for (int i = 0; i < 300; ++i)  // more than the connection holds

@@ -194,7 +194,7 @@ TEST_F(RelayTest, AHostThatWaitsForEventsMayBeSilent) {
     EXPECT_EQ(host.read(headerSize + blockSize + 1).size(), headerSize + blockSize + 1);
 }
 
-TEST_F(RelayTest, AHostThatTakesNothingIsEnded) {
+TEST_F(RelayTest, AHostThatDoesNotReadIsDisconnected) {
     relay::Options options;
     options.patience.write = std::chrono::milliseconds(50);
     start(options);

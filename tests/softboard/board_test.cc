@@ -227,7 +227,7 @@ TEST_F(BoardTest, TheOrderOfSubscriptionAndTraceDoesNotMatter) {
     EXPECT_EQ(host_.read().type, 32U);
 }
 
-TEST_F(BoardTest, ASubscriptionOrTheTraceAloneSendsNothing) {
+TEST_F(BoardTest, WithOnlyTheSubscriptionOrOnlyTheTraceNothingIsSent) {
     EXPECT_EQ(host_.ask(8, ccs, traceOn).type, 9U);
     EXPECT_EQ(host_.ask(22, secondCcs, detectBody(host_)).type, 23U);
     const Octets anotherGroup = BodyWriter().address(host_.address()).u32(3).u32(2).take();

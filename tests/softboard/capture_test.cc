@@ -123,7 +123,7 @@ TEST(CaptureTest, ABadFileIsRefusedWithItsPlaceAndTheReason) {
     }
 }
 
-TEST(CaptureTest, WhatIsNoCaptureIsRefused) {
+TEST(CaptureTest, AFileThatIsNoCaptureIsRefused) {
     EXPECT_EQ(complaint("/nowhere/day.pcap"), "/nowhere/day.pcap: No such file or directory");
     EXPECT_EQ(complaint("/dev/null"), "/dev/null: it is empty");
     EXPECT_EQ(complaint(LAPDMON_SOURCE_DIR "/CMakeLists.txt"),

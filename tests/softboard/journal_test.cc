@@ -52,7 +52,7 @@ TEST(JournalTest, AFileThatCannotBeWrittenIsRefused) {
     EXPECT_EQ(errno, ENOENT);
 }
 
-TEST(JournalTest, AFileThatTakesNothingMoreLosesLinesAndStopsNobody) {
+TEST(JournalTest, AFullFileLosesLinesButDelaysNobody) {
     Journal journal;
     ASSERT_TRUE(journal.writeTo("/dev/full"));
     journal.note("first");

@@ -137,7 +137,7 @@ TEST_F(LauncherTest, AMissingProgramGivesTheStatusThatAShellGives) {
     EXPECT_EQ(ran.err, "softboard: /: Permission denied\n");
 }
 
-TEST_F(LauncherTest, TheProgramsStatusIsTheLaunchersAndItsArgumentsAreItsOwn) {
+TEST_F(LauncherTest, TheLauncherPassesArgumentsOnAndReturnsTheProgramsStatus) {
     EXPECT_EQ(run({"--", "true"}).status, 0);
     EXPECT_EQ(run({"--", "false"}).status, 1);
     const Ran ran = run({"--", "echo", "--help", "--", "-b1"});

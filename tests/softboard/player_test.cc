@@ -21,7 +21,7 @@ TEST(PlayerTest, AtRecordedRateAFrameIsDueWhenItsTicksOfFourMillisecondsHavePass
     EXPECT_EQ(player.due(), now + milliseconds(248));
 }
 
-TEST(PlayerTest, FramesPerSecondAreEvenWhateverWasRecorded) {
+TEST(PlayerTest, AtARateFramesComeEvenlyWhateverTheirRecordedTimes) {
     Player player(frames, {Rate::Kind::perSecond, 4}, false);
     player.start(now);
     EXPECT_EQ(player.due(), now);

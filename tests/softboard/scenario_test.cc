@@ -180,7 +180,7 @@ TEST(ScenarioTest, ABadFileIsRefusedWithItsPlaceAndTheReason) {
     EXPECT_EQ(complaint([] { readScenarioFile("/"); }), "/: Is a directory");
 }
 
-TEST(ScenarioTest, WhatDoesNotFitTogetherIsRefused) {
+TEST(ScenarioTest, SettingsThatContradictEachOtherAreRefused) {
     std::string path = write("[[dchannel]]\n[[dchannel]]\nnumber = 1\n");
     const ScenarioFile twice = readScenarioFile(path);
     EXPECT_EQ(complaint([&] { resolve({}, {}, &twice); }), path + ":2: board 1 has D channel 1 already");

@@ -24,7 +24,7 @@ TEST(WireTest, FieldsAreLittleEndianPackedAndInOrder) {
     EXPECT_EQ(reader.left(), 0U);
 }
 
-TEST(WireTest, AFieldThatIsNotThereWholeIsZeroAndTheRestIsGone) {
+TEST(WireTest, AFieldThatIsNotWholeIsZeroAndTheRestIsSkipped) {
     const Octets body{1, 2, 3};
     BodyReader reader(body);
     EXPECT_EQ(reader.u32(), 0U);

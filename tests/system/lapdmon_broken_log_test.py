@@ -222,7 +222,7 @@ class StalledLog(SystemTest):
         program.quits()
         self.assert_whole(program, text)
 
-    def test_the_end_is_answered_at_once_and_writes_what_has_arrived(self):
+    def test_the_end_comes_at_once_and_writes_the_frames_that_have_arrived(self):
         program = self.stalled()
         program.types("q")
         program.journal.wait("SetParmCmplt", times=2)  # nothing on its way has held up the replies

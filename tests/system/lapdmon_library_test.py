@@ -85,7 +85,7 @@ class InstalledTree(SystemTest):
         program.screen.wait("NET5 Switch")
         program.quits()
 
-    def test_it_holds_no_test(self):
+    def test_no_test_program_is_installed(self):
         installed = [str(path.relative_to(self.prefix)) for path in self.prefix.rglob("*") if path.is_file()]
         self.assertEqual([name for name in installed if "test" in pathlib.Path(name).name], [])
 

@@ -41,7 +41,7 @@ class Lifecycle(SystemTest):
         self.assertIn(f" from {host} ", subscribed)
         self.assertIn(f" to {host} ", event)
 
-    def test_everything_is_given_back(self):
+    def test_buffers_and_queues_are_given_back(self):
         program = self.traces("--rate", "max", "--loop")
         program.screen.wait("Frame Error", times=100)
         program.quits()
@@ -98,7 +98,7 @@ class Lifecycle(SystemTest):
         self.assertEqual(program.talk.lines()[-2:], ["heard 26", "heard 8"])
         self.assertTrue(program.log().endswith("Frame Error \n"))
 
-    def test_whoever_leaves_by_exit_switches_the_trace_off_too(self):
+    def test_an_exit_switches_the_trace_off_too(self):
         program = self.on_other_library("exits")
         program.screen.wait("Frame Error")
         program.gets(signal.SIGUSR1)

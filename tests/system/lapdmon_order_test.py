@@ -9,7 +9,7 @@ class Order(unittest.TestCase):
     def test_no_frame_is_lost_or_out_of_order_at_line_rate(self):
         self.assertEqual(order.main(["--frames", "5000", "--busy", "2"]), 0)
 
-    def test_a_tool_that_sees_no_inversion_sees_none_because_there_is_none(self):
+    def test_the_tool_finds_an_inversion_if_there_is_one(self):
         figures = order.Figures()
         for number in (0, 1, 3, 2, 4, 7):
             figures.frame(number)

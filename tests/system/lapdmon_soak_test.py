@@ -32,7 +32,7 @@ class Soak(unittest.TestCase):
     def test_nothing_grows_is_lost_or_out_of_order_while_faults_come_and_go(self):
         self.soak("--long-stall", "10")
 
-    def test_so_it_is_with_a_board_in_another_machine(self):
+    def test_the_same_holds_for_a_board_in_another_machine(self):
         self.soak("--long-stall", "10", "--relay")
 
     def test_what_is_lost_repeated_or_out_of_order_is_told_apart(self):
@@ -53,7 +53,7 @@ class Soak(unittest.TestCase):
             checker.end()
             self.assertEqual((checker.frames, checker.wrong), expected)
 
-    def test_each_thing_that_grows_is_said(self):
+    def test_everything_that_grows_is_reported(self):
         for name, by, complaint in (("used", 600, "memory grew"), ("descriptors", 1, "descriptors grew"),
                                     ("threads", 101, "threads grew"), ("held", 100, "messages still waited"),
                                     ("used", 0, None)):

@@ -201,7 +201,7 @@ TEST(LinkedList, CopiesAreIndependent) {
     EXPECT_EQ(printed(list), "{1 2}");
 }
 
-TEST(LinkedList, OfAHundredThousandElementsGoesWithoutRecursion) {
+TEST(LinkedList, IsDestroyedWithoutRecursion) {
     linkedList<int> list;
     for (int i = 0; i < 100000; ++i)
         list.append(i);

@@ -10,7 +10,7 @@ using namespace lanes;  // NOLINT(google-build-using-namespace): the words of th
 
 using LaneEndTest = LaneTest;
 
-TEST_F(LaneEndTest, TheObjectsEndWaitsForWhatWaits) {
+TEST_F(LaneEndTest, TheObjectsEndWaitsForDeliveriesThatWait) {
     traceInto({.atWork = 1});
     sendTraces(0, 20);
     slow_.given(1);
@@ -19,7 +19,7 @@ TEST_F(LaneEndTest, TheObjectsEndWaitsForWhatWaits) {
     EXPECT_EQ(slow_.given(20).size(), 20U);
 }
 
-TEST_F(LaneEndTest, AClosedOneDropsWhatComesWithoutCountingIt) {
+TEST_F(LaneEndTest, AClosedLaneDropsDeliveriesWithoutCountingThem) {
     traceInto({.atWork = 1});
     sendTraces(0, 3);
     lane_->close();
@@ -31,7 +31,7 @@ TEST_F(LaneEndTest, AClosedOneDropsWhatComesWithoutCountingIt) {
     EXPECT_EQ(lane_->losses().all(), 0U);
 }
 
-TEST_F(LaneEndTest, WhatWaitsCanBeGivenUp) {
+TEST_F(LaneEndTest, WaitingDeliveriesCanBeDropped) {
     traceInto({.atWork = 2});
     sendTraces(0, 30);
     slow_.given(2);
@@ -62,7 +62,7 @@ class Gated : public Lane {
     std::atomic<unsigned int> held_{2};
 };
 
-TEST_F(LaneEndTest, WhatItsOwnerHoldsCountsAsAtWork) {
+TEST_F(LaneEndTest, BodiesThatTheOwnerHoldsCountAsAtWork) {
     const auto gated = std::make_shared<Gated>();
     traceInto(gated);
     sendTraces(0, 4);
@@ -78,7 +78,7 @@ TEST_F(LaneEndTest, WhatItsOwnerHoldsCountsAsAtWork) {
     slow_.given(4);
 }
 
-TEST_F(LaneEndTest, ItsOwnerIsToldOnceThatItIsFullAndHowManyWereLostWhenNoneWaits) {
+TEST_F(LaneEndTest, TheOwnerIsToldOnceThatTheLaneIsFullAndHowManyWereLostWhenItIsEmptyAgain) {
     const auto gated = std::make_shared<Gated>();
     traceInto(gated);
     sendTraces(0, 9);  // one at work, five wait

@@ -11,7 +11,7 @@ namespace {
 using namespace lanes;  // NOLINT(google-build-using-namespace): the words of these tests
 using testing::ElementsAre;
 
-TEST_F(LaneTest, SoManyAreAtWorkAndTheOthersFollowInOrderEachOnAThreadOfItsOwn) {
+TEST_F(LaneTest, ALimitedNumberIsAtWorkAndTheOthersFollowInOrder) {
     traceInto({.atWork = 3});
     sendTraces(0, 10);
     EXPECT_EQ(slow_.given(3).size(), 3U);
@@ -39,7 +39,7 @@ TEST_F(LaneTest, AboutAHundredAreAtWorkUnlessSomebodySaysOtherwise) {
     EXPECT_EQ(Lane::Bounds().octets, 512U << 20);
 }
 
-TEST_F(LaneTest, WhatIsDeliveredIsNumberedInTheOrderOfArrival) {
+TEST_F(LaneTest, DeliveriesAreNumberedInTheOrderOfArrival) {
     traceInto({.atWork = 2});
     sendTraces(0, 50);
     slow_.letEnd(all);
@@ -123,7 +123,7 @@ TEST_F(LaneTest, OneThatTheSystemRefusesAThreadIsLostAndTheNextOneSaysSo) {
     EXPECT_EQ(lane_->losses().noMeans, 3U);
 }
 
-TEST_F(LaneTest, WhatWaitsIsNotLostWhileSomethingIsAtWorkAndThreadsAreRefused) {
+TEST_F(LaneTest, WaitingDeliveriesAreKeptWhenThreadsAreRefusedWhileSomeAreAtWork) {
     traceInto({.atWork = 2});
     sendTraces(0, 6);
     slow_.given(2);
@@ -154,7 +154,7 @@ TEST_F(LaneTest, NothingWaitsForEverWhenThreadsAreRefusedAndNothingIsAtWork) {
     EXPECT_EQ(lane_->missing(), 3U);
 }
 
-TEST_F(LaneTest, OneWhoseBodyCannotBeMadeIsLostAndTheNextOneSaysSo) {
+TEST_F(LaneTest, ADeliveryWhoseBodyCannotBeMadeIsLostAndTheNextOneSaysSo) {
     class NoBodyFor7 : public CCS {
       public:
         using CCS::CCS;

@@ -170,7 +170,7 @@ TEST_F(RequestTest, AnotherSourceAnswersNothingUnlessAnyMay) {
     EXPECT_THAT(errors_.text(), testing::HasSubstr("Unregisterd Source sent to MsgQueue"));
 }
 
-TEST_F(RequestTest, AReplyThatIsLateGoesWhereUnsolicitedMessagesGo) {
+TEST_F(RequestTest, ALateReplyGoesToTheHandlerForUnsolicitedMessages) {
     ccs_.setResponseTimeout(soon);
     Message late;
     board_.script(8, [&](const Message& m) { late = replyTo(m, 9); });

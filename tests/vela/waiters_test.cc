@@ -59,7 +59,7 @@ TEST_F(WaiterTest, AnEventThatDoesNotComeIsATimeoutToo) {
     }
 }
 
-TEST_F(WaiterTest, WhatArrivesIsReadIntoTheBody) {
+TEST_F(WaiterTest, TheMessageIsReadIntoTheBody) {
     whenAsleep([&] { EXPECT_TRUE(sendReply()); });
     StdResource::MsgGetParmCmplt_t reply;
     ccs_->asyncWaitMsg(replyType, &reply, longWait);
@@ -83,7 +83,7 @@ TEST_F(WaiterTest, TheMessageItselfIsTheCallers) {
     EXPECT_EQ(event->getMsgType(), 32U);
 }
 
-TEST_F(WaiterTest, WhatCameBeforeTheWaitIsWaitingForIt) {
+TEST_F(WaiterTest, AMessageThatCameBeforeTheWaitIsReturnedAtOnce) {
     const auto waiter = ccs_->getNewEvtWait(2);
     ASSERT_TRUE(sendTrace());
     const std::unique_ptr<Msg> msg(waiter->waitMsg(0));
@@ -118,7 +118,7 @@ TEST_F(WaiterTest, OneThatTimedOutMayGoOnWaiting) {
     EXPECT_NO_THROW(waiter->wait(nullptr, 0));
 }
 
-TEST_F(WaiterTest, AnIdleOneHasNothingToWaitFor) {
+TEST_F(WaiterTest, WaitingWithoutEnablingTimesOut) {
     EvtCallback dispatcher(ccs_.get());
     EvtCallback::MsgWait waiter(&dispatcher);
     EXPECT_THROW(waiter.wait(nullptr, 25), EvtCallback::MsgWait::Timeout);
@@ -134,7 +134,7 @@ TEST_F(WaiterTest, MadeWithATimeItWaitsAtOnce) {
     EXPECT_NO_THROW(EvtCallback::MsgWait(&dispatcher, replyType, longWait));
 }
 
-TEST_F(WaiterTest, MadeWithATimeItHandsOutWhatCame) {
+TEST_F(WaiterTest, MadeWithATimeOutItReturnsTheMessageThatCame) {
     EvtCallback dispatcher(ccs_.get());
     whenAsleep([&] { EXPECT_TRUE(sendReply()); });
     EvtCallback::MsgWait returned(&dispatcher, replyType, longWait);
@@ -148,7 +148,7 @@ TEST_F(WaiterTest, MadeWithATimeItHandsOutWhatCame) {
     EXPECT_EQ(trace.Timestamp, 1003U);
 }
 
-TEST_F(WaiterTest, MadeWithATimeAndNotAskedAgainItDropsWhatCame) {
+TEST_F(WaiterTest, MadeWithATimeOutAndNotAskedAgainItDropsTheMessage) {
     EvtCallback dispatcher(ccs_.get());
     dispatcher.unregisteredMsgType(vela::Handler(&recorder_, &Recorder::onMsg), onDispatcher);
     whenAsleep([&] { EXPECT_TRUE(sendReply()); });
@@ -173,7 +173,7 @@ TEST_F(WaiterTest, OfMessagesThatComeTogetherItTakesTheOneThatArrivedFirst) {
     }
 }
 
-TEST_F(WaiterTest, WhatComesAtTheTimeOutIsWaitedForAgainOrGoesToTheHandlerForUnregisteredOnes) {
+TEST_F(WaiterTest, AMessageThatComesAtTheTimeOutGoesToTheNextWaitOrToTheUnregisteredHandler) {
     ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, 0);
     auto waiter = ccs_->getNewMsgWait(replyType);
     EXPECT_THROW(waiter->wait(nullptr, 25), EvtCallback::MsgWait::Timeout);
@@ -186,7 +186,7 @@ TEST_F(WaiterTest, WhatComesAtTheTimeOutIsWaitedForAgainOrGoesToTheHandlerForUnr
     EXPECT_THAT(recorder_.texts(1), testing::ElementsAre("message 19 12 octets"));
 }
 
-TEST_F(WaiterTest, OneThatIsEnabledAgainHandsOnWhatNobodyWaitedFor) {
+TEST_F(WaiterTest, EnabledAgainItPassesOnAMessageThatNobodyWaitedFor) {
     ccs_->asyncUnregisteredMsgType(&recorder_, &Recorder::onMsg, 0);
     const auto waiter = ccs_->getNewMsgWait(replyType);
     ASSERT_TRUE(sendReply());
@@ -202,7 +202,7 @@ TEST_F(WaiterTest, ADisabledOneIsRegisteredNoMore) {
     EXPECT_EQ(recorder_.entries(1).size(), 1U);
 }
 
-TEST_F(WaiterTest, OneThatSomebodyElseCancelledGoesQuietly) {
+TEST_F(WaiterTest, CancelledBySomebodyElseItIsDestroyedQuietly) {
     auto waiter = ccs_->getNewMsgWait(replyType);
     ccs_->asyncCancelMsgType(replyType);
     EXPECT_THROW(waiter->wait(nullptr, 25), EvtCallback::MsgWait::Timeout);

@@ -98,7 +98,7 @@ TEST_F(WireTest, ATraceRecordOf300OctetsIs16OctetsOfFieldsAChunkOf45AndOneOf255)
               "@0 0x380000\n@4 0x380000 0x380000 0x380000\n@16 0x216000\n@61 0x27f000\n");
 }
 
-TEST_F(WireTest, ABodyEndsBehindItselfWhetherOrNotTheLibraryMovesTheFirstOffset) {
+TEST_F(WireTest, ABodyEndsAfterItsLastFieldWhetherOrNotTheLibraryMovesTheFirstOffset) {
     for (const bool stuck : {false, true}) {
         fake_norv::reset();
         fake_norv::leaveFirstOffsetAtZero(stuck);
@@ -217,7 +217,7 @@ TEST_F(WireTest, ACountThatSaysMoreThanIsThereReadsWhatIsThere) {
     }
 }
 
-TEST_F(WireTest, HalfAnEntryAtTheEndOfAListIsNone) {
+TEST_F(WireTest, HalfAnEntryAtTheEndOfAListIsDropped) {
     Octets payload = fake_norv::words({2, 1001, 1002});
     payload.resize(payload.size() + 7, 7);
     const auto msg = messageOf(payload);
