@@ -40,8 +40,8 @@ struct Item {
     bool isFrame() const { return kind == Kind::frame; }
 };
 
-// "frame", "oversized", "frames-lost", ...: the names of kinds wherever programs read them. `kindNamed` is the
-// reverse; nothing for any other name.
+// "frame", "oversized", "frames-lost", ...: the names of kinds wherever programs read them. `kindNamed` is
+// the reverse; nothing for any other name.
 std::string_view kindName(Item::Kind kind);
 std::optional<Item::Kind> kindNamed(std::string_view name);
 
