@@ -14,6 +14,7 @@
 #include "reader/errors.h"
 #include "reader/session.h"
 #include "reader/text.h"
+#include "service/notify.h"
 
 namespace reader {
 
@@ -40,6 +41,7 @@ class Recorder : public Consumer {
     bool wantsAll() const override { return triggers_.areThere(); }
 
     void take(Chunk& chunk, std::size_t count) override {
+        heartbeat_.beat();
         obeySignals();
         isIdle_ = isIdle_ && chunk.size() == 0;
         std::size_t piece = 0;
@@ -55,6 +57,7 @@ class Recorder : public Consumer {
     }
 
     void flush() override {
+        heartbeat_.beat();
         obeySignals();
         if (isIdle_) {
             for (auto& [name, trunk] : trunks_)
@@ -121,6 +124,7 @@ class Recorder : public Consumer {
     std::map<std::string, RecordedTrunk> trunks_;  // by the name of the D channel
     bool isIdle_ = false;                          // nothing has come since the last flush
     HostClock::time_point lastLook_ = HostClock::now();
+    service::Heartbeat heartbeat_;
 };
 
 struct Unit {
@@ -233,6 +237,7 @@ int runRecord(const Options& given, Chatter& chatter) {
     Session session(options, chatter);
     heedSignals();
     Recorder recorder(rules, options, chatter);
+    service::notify("READY=1");
     try {
         session.run(recorder, [] { return std::make_unique<NoComposer>(); });
     } catch (...) {

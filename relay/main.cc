@@ -10,8 +10,8 @@
 
 #include "norv/norv.h"
 #include "relay/command_line.h"
-#include "relay/notify.h"
 #include "relay/server.h"
+#include "service/notify.h"
 
 namespace {
 
@@ -62,8 +62,8 @@ void serve(const relay::Options& options) {
         throw std::runtime_error("the transport library does not start");
     relay::Server server(options, logLine);
     std::cout << "kv9relayd: listening on " << server.endpoint().text() << std::endl;
-    relay::notify("READY=1");
-    server.run(signals.get(), [] { relay::notify("STOPPING=1"); });
+    service::notify("READY=1");
+    server.run(signals.get(), [] { service::notify("STOPPING=1"); });
 }
 
 }  // namespace

@@ -80,12 +80,22 @@ void Server::run(int stop, const std::function<void()>& stopping) {
     drain(stop);
 }
 
+// The earlier of a timeout of poll() and the next beat.
+int Server::orNextBeat(int timeoutMs) const {
+    const auto interval = heartbeat_.interval();
+    if (!interval)
+        return timeoutMs;
+    const auto beatMs = static_cast<int>(interval->count());
+    return timeoutMs == forEver ? beatMs : std::min(timeoutMs, beatMs);
+}
+
 // Waits for a new connection, for the end of one, or for `stop`, and deals with it.
 void Server::awaitChange(int stop, int timeoutMs) {
     std::array<pollfd, 3> waited{pollfd{stop, POLLIN, 0}, pollfd{ended_.get(), POLLIN, 0},
                                  pollfd{full_ ? -1 : listener_.get(), POLLIN, 0}};
     full_ = false;
-    if (poll(waited.data(), waited.size(), timeoutMs) < 0)
+    heartbeat_.beat();
+    if (poll(waited.data(), waited.size(), orNextBeat(timeoutMs)) < 0)
         return;
     if (waited[0].revents != 0) {
         empty(stop);

@@ -10,6 +10,7 @@
 
 #include "relay/cidr.h"
 #include "relay/client.h"
+#include "service/notify.h"
 
 namespace relay {
 
@@ -33,12 +34,14 @@ class Server {
 
     // Accepts connections until the descriptor `stop` can be read, and reads from it. Then calls `stopping`,
     // lets every connection drain, and returns when all have ended, when the patience for a frame is over, or
-    // when `stop` can be read again. Connections that are left are ended at once.
+    // when `stop` can be read again. Connections that are left are ended at once. All the while it tells a
+    // service manager that asks for it that it still serves.
     void run(
         int stop, const std::function<void()>& stopping = [] {});
 
   private:
     void awaitChange(int stop, int timeoutMs);
+    int orNextBeat(int timeoutMs) const;
     void accept();
     bool admit(const Endpoint& peer);
     void reap();
@@ -46,6 +49,7 @@ class Server {
 
     Options options_;
     Log log_;
+    service::Heartbeat heartbeat_;
     Descriptor listener_;
     Descriptor ended_;  // an event counter: clients count it up as they end
     std::list<std::unique_ptr<Client>> clients_;

@@ -79,6 +79,11 @@ class Trace(unittest.TestCase):
                          f"no board\nand why\n{NOTE}no relay\nand why\n{NOTE}CCS protocol type is 7\nNET5 Switch\n")
         self.assertEqual(len((self.folder / "runs").read_text().splitlines()), 5)
 
+    def test_a_reason_is_the_same_when_only_its_numbers_differ(self):
+        process = self.start("fail Timeout: {Instance 9 Trans: 0x80003d}", "fail Timeout: {Instance 10 Trans: 0x8f003e}", "trace 0")
+        self.assertEqual(self.lines_until(process, "NET5 Switch\n"),
+                         f"Timeout: {{Instance 9 Trans: 0x80003d}}\nand why\n{NOTE}CCS protocol type is 7\nNET5 Switch\n")
+
     def test_a_trace_that_breaks_is_started_again_and_its_words_are_all_shown(self):
         process = self.start("break", "fail no board", "fail no board", "trace 0")
         self.assertEqual(self.lines_until(process, "NET5 Switch\n"),

@@ -4,6 +4,7 @@ a trigger stays. Tests wait for what they expect; LIMIT only ends a test that wo
 import json
 import os
 import signal
+import socket
 import subprocess
 import unittest
 
@@ -324,6 +325,21 @@ class FullDisk(Recording):
         for file in state["files"]:
             found = self.numbers(self.disk / file["name"])
             self.assertEqual(found, [(file["first"] + i) % 65536 for i in range(len(found))])
+
+
+class Service(Recording):
+    def test_the_service_manager_hears_that_the_recorder_is_ready_and_records_on(self):
+        manager = socket.socket(socket.AF_UNIX, socket.SOCK_DGRAM)
+        self.addCleanup(manager.close)
+        manager.settimeout(LIMIT)
+        name = "lapdread-record-" + str(os.getpid())
+        manager.bind("\0" + name)
+        self.write("t.hex", numbered(1))
+        recorder = self.start("env", "NOTIFY_SOCKET=@" + name, "WATCHDOG_USEC=300000",
+                              LAPDREAD, "record", "--trunk", "t", "t.hex")
+        told = [manager.recv(100) for _ in range(4)]
+        self.assertEqual(told, [b"READY=1"] + 3 * [b"WATCHDOG=1"])
+        self.stop(recorder)
 
 
 if __name__ == "__main__":

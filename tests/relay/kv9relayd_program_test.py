@@ -86,6 +86,17 @@ class TheProgram(RelayTest):
             relay.stops()
             self.assertEqual(manager.recv(100), b"STOPPING=1")
 
+    def test_the_service_manager_hears_that_the_relay_serves_on(self):
+        manager = socket.socket(socket.AF_UNIX, socket.SOCK_DGRAM)
+        self.addCleanup(manager.close)
+        manager.settimeout(60)
+        name = "kv9relayd-beat-" + str(os.getpid())
+        manager.bind("\0" + name)
+        relay = Relay(self, NOTIFY_SOCKET="@" + name, WATCHDOG_USEC="300000")
+        told = [manager.recv(100) for _ in range(4)]
+        self.assertEqual(told, [b"READY=1"] + 3 * [b"WATCHDOG=1"])
+        relay.stops()
+
 
 if __name__ == "__main__":
     unittest.main()

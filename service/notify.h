@@ -1,0 +1,37 @@
+// What a program tells the service manager that started it (systemd; sd_notify(3) describes the lines).
+// Without a service manager nothing is sent.
+#ifndef SERVICE_NOTIFY_H
+#define SERVICE_NOTIFY_H
+
+#include <chrono>
+#include <optional>
+#include <string>
+
+namespace service {
+
+// Sends a line such as "READY=1" or "STOPPING=1" to the socket that NOTIFY_SOCKET names.
+void notify(const std::string& line);
+
+// Tells the service manager, which restarts a program that falls silent, that the program's main loop still
+// turns. The loop calls beat() at least once in each interval. Used by one thread.
+class Heartbeat {
+  public:
+    using Clock = std::chrono::steady_clock;
+
+    // Reads WATCHDOG_USEC and WATCHDOG_PID. Beats three times in the time that the service manager allows.
+    Heartbeat();
+
+    // How long the loop may wait before it beats again; nothing if nobody listens.
+    std::optional<std::chrono::milliseconds> interval() const { return interval_; }
+
+    // Sends "WATCHDOG=1" if half of the interval has passed since it was last sent.
+    void beat();
+
+  private:
+    std::optional<std::chrono::milliseconds> interval_;
+    Clock::time_point last_ = Clock::time_point::min();
+};
+
+}  // namespace service
+
+#endif
