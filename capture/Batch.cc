@@ -11,7 +11,7 @@ void Batch::add(const Item& item) {
     areBound_ = false;
 }
 
-// Octets move while the batch grows, so items find theirs when they are asked for.
+// Octets move while the batch grows, so items get their views only when they are asked for.
 std::span<const Item> Batch::items() const {
     if (!areBound_) {
         std::span<const std::uint8_t> rest = octets_;

@@ -16,7 +16,7 @@ namespace capture {
 namespace {
 
 constexpr std::size_t readSize = std::size_t{1} << 18;
-constexpr std::size_t lastSize = 64;             // of the octets that tell one content from another
+constexpr std::size_t lastSize = 64;             // how many octets are kept to recognise another content
 constexpr std::chrono::milliseconds glance{20};  // how often a growing file is looked at
 
 [[noreturn]] void fail(const std::string& name) { throw BadInput(name + ": " + std::strerror(errno)); }
@@ -66,7 +66,7 @@ Source::State Source::want(std::size_t octets) {
     return State::ready;
 }
 
-// For what is wanted, and for a whole read behind what is held.
+// Makes room for the octets that are wanted, and for a whole read after those that are held.
 void Source::makeRoom(std::size_t octets) {
     const std::size_t held = end_ - begin_;
     const std::size_t needed = std::max(octets, held) + readSize + 1;  // and for heldReturn_

@@ -47,7 +47,8 @@ bool CallFilter::wantsRest() const {
     return std::ranges::all_of(groups_, [](const auto& group) { return group.negated; });
 }
 
-// One group that says no decides; otherwise one that cannot tell yet leaves it open.
+// If one group refuses the call, it is not wanted. Otherwise the answer is open as long as one group cannot
+// tell yet.
 std::optional<bool> CallFilter::wants(std::uint64_t number) const {
     bool isOpen = false;
     for (const auto& group : groups_) {

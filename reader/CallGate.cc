@@ -101,7 +101,7 @@ void CallGate::gone(const calls::Call& call) {
     }
 }
 
-// What is wanted goes on, up to the first item that is not decided yet.
+// Releases the wanted items, up to the first item that is not decided yet.
 void CallGate::release() {
     while (!held_.empty()) {
         const auto first = held_.begin();

@@ -14,7 +14,7 @@ namespace {
 
 using calls::Side;
 
-// Elements in words stand two blanks apart.
+// The words of elements are separated by two blanks.
 std::vector<std::string> split(std::string_view words) {
     std::vector<std::string> parts;
     while (!words.empty()) {
@@ -48,7 +48,7 @@ std::string dateOf(Instant when, TimeText& times) {
     return text.substr(0, text.find('T'));
 }
 
-// A line with the date before the first rung of each new day.
+// Inserts a line with the date before the first rung of each new day.
 void insertDates(std::vector<Rung>& rungs, const calls::Call& call, TimeText& times) {
     std::string date = dateOf({call.begin.clock, call.begin.time}, times);
     for (std::size_t i = 0; i < rungs.size(); ++i) {
@@ -144,7 +144,8 @@ Rung Ladders::rungOf(const calls::Message& message) const {
         rung.dChannel = message.frame->interface->name;
     rung.when = when_;
     rung.at = at_;
-    // A message may be certain only after later frames: then it passed before the one that is seen now.
+    // Some messages are certain only after later frames. Such a message passed before the item that is seen
+    // now.
     if (message.number != number_) {
         rung.when = {message.frame->clock, message.frame->time};
         rung.at =
@@ -198,8 +199,8 @@ void Ladders::restarted(const calls::Message& message) {
         links_.pop_front();
 }
 
-// What happened to a link of the call while the call was alive: of frames those of its terminals, of RESTART
-// the one that has ended it.
+// Adds what happened to the links of the call while it was alive: the frames of its terminals, and the
+// RESTART that ended it.
 void Ladders::addLinkRungs(const calls::Call& call, std::vector<Rung>& rungs) const {
     if (rungs.empty())
         return;

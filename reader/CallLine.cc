@@ -12,10 +12,10 @@ namespace {
 
 using calls::Call;
 
-// Columns of the line for people: what they are called, how wide, and what stands in them.
+// A column of the line: its heading, its width, and the function that fills it in.
 struct LineColumn {
     std::string_view heading;
-    std::string_view before;  // in a headline, where no heading stands above it
+    std::string_view before;  // the word that names the value in a headline, which has no headings
     unsigned width;
     bool right;
     void (*put)(std::string& to, const Call& call, TimeText& times);

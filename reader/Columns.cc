@@ -13,7 +13,7 @@ namespace {
 constexpr std::string_view bold = "\x1b[1m", green = "\x1b[32m", cyan = "\x1b[36m", yellow = "\x1b[33m",
                            plain = "\x1b[0m";
 
-// Puts text in a colour; nothing at all if there is no text.
+// Appends text in a colour. Appends nothing at all if there is no text.
 template <class Put>
 void inColor(Cell& cell, std::string_view color, Put put) {
     if (!cell.colors) {
@@ -41,7 +41,7 @@ void putTime(Cell& cell) {
         cell.times.append(cell.line, cell.seen.when);
 }
 
-// Filled in by whoever puts the lines in order.
+// Appends nothing: the code that puts the lines in order fills this column in.
 void putDelta(Cell& /*cell*/) {}
 
 void putDirection(Cell& cell) {
@@ -91,7 +91,8 @@ void putNr(Cell& cell) {
         appendNumber(cell.line, cell.seen.link.nr);
 }
 
-// P in a command, F in a response; the bit itself while nobody knows which it is.
+// Appends P for a command and F for a response, or the bit itself while it is not known which of them the
+// frame is.
 void putPollFinal(Cell& cell) {
     if (!cell.seen.link.hasPf() || !hasOctets(cell.seen))
         return;

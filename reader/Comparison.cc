@@ -18,9 +18,9 @@ namespace {
 using Part = ComparedMessage::Part;
 
 constexpr std::int64_t clockSteps =
-    8 * calls::millisecond;  // the board's clock has ticks of 4 ms, at both ends
+    8 * calls::millisecond;  // because the board's clock is exact only to a tick of 4 ms at both ends
 
-// Fields that name a channel or an interface, of the elements that do.
+// Whether the field names a channel or an interface.
 bool namesChannel(const isdn::Element& element, const isdn::Field& field) {
     namespace id = isdn::element;
     constexpr std::array<std::string_view, 3> always{"channel number", "slot map", "interface"};
@@ -56,7 +56,7 @@ bool isCompared(const isdn::Field& field) {
     return field.kind != extension && field.kind != header && (field.kind != spare || field.value != 0);
 }
 
-// "name", and "name (2)" when it comes for the second time.
+// Returns "name", or "name (2)" when the name comes for the second time.
 std::string counted(std::map<std::string, unsigned>& seen, const std::string& name) {
     const unsigned times = ++seen[name];
     return times == 1 ? name : name + " (" + std::to_string(times) + ")";
@@ -102,7 +102,8 @@ std::string directionOf(const ComparedMessage& message, bool byRole) {
     return message.role == capture::Role::user ? "U>N" : "N>U";
 }
 
-// What makes two messages of one kind: a number for each direction and name, of both series.
+// Numbers the kinds of messages. Two messages, also of different series, are of one kind if they have the
+// same direction and name.
 class Kinds {
   public:
     explicit Kinds(bool byRole) : byRole_(byRole) {}
@@ -165,7 +166,7 @@ class Comparer {
         if (also_.times && std::abs(a.since - b.since) > clockSteps)
             add(in, Difference::Kind::time, {}, std::to_string(a.since / calls::millisecond) + " ms",
                 std::to_string(b.since / calls::millisecond) + " ms");
-        // In the order of the elements, those of A first.
+        // Sorts the differences in the order of the elements, those of A first.
         const auto rank = [&](const Difference& each) {
             const auto place = [&](const ComparedMessage& message) {
                 return static_cast<std::size_t>(find(message, each.element) - message.elements.data());
@@ -195,7 +196,7 @@ class Comparer {
         std::string element, field;
     };
 
-    // The frames are 0 where there is none.
+    // A frame number is 0 if that series has no such frame.
     Difference about(const ComparedMessage& message, std::uint64_t frameA, std::uint64_t frameB) const {
         Difference difference;
         difference.message = message.name;
@@ -212,8 +213,8 @@ class Comparer {
         in.b = std::move(b);
         result.differences.push_back(std::move(in));
     }
-    // A part of one message beside the other message. An element that is not there at all is told as a whole.
-    // With `turned` the part is of B, and only what A lacks is told.
+    // Compares a part of one message with the other message. If the other message lacks the element, the
+    // element is reported as a whole. `turned`: the part belongs to B, and only what A lacks is reported.
     void parts(const Difference& in, const Part& part, const ComparedMessage& other, bool turned) {
         const Part* const its = find(other, part);
         if (its != nullptr && (turned || its->value == part.value))

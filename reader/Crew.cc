@@ -29,7 +29,7 @@ Crew::Entry* Crew::claim() {
     return &*waiting;
 }
 
-// Called, and left, with the lock held.
+// The caller holds the lock; it is released during the work and held again on return.
 void Crew::workOn(Entry& entry, const Job& job, std::unique_lock<std::mutex>& lock) {
     lock.unlock();
     std::exception_ptr thrown;
@@ -67,7 +67,7 @@ std::unique_ptr<Chunk> Crew::takeBack() {
     std::unique_lock lock(mutex_);
     if (entries_.empty())
         return nullptr;
-    // Work that nobody has begun is done here, so that waiting is left for the moment when nothing else is.
+    // The owner does work that no thread has begun, and waits only if there is none.
     while (entries_.front().state != State::done) {
         if (Entry* entry = claim(); entry != nullptr)
             workOn(*entry, own_, lock);

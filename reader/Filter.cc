@@ -70,7 +70,8 @@ std::unique_ptr<Condition> byCallReference(const std::string& value) {
     std::optional<bool> flag;
     if (digits.starts_with("0x"))
         digits.remove_prefix(2);
-    // "0378o" and "0378d" as a line shows them; "d" alone is a digit as well.
+    // Accepts "0378o" and "0378d", as a list shows them. A final "d" counts as the direction only if the
+    // number of characters is odd, because it may be a digit.
     if (digits.size() % 2 == 1 && (digits.ends_with('o') || digits.ends_with('d'))) {
         flag = digits.ends_with('d');
         digits.remove_suffix(1);

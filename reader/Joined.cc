@@ -7,7 +7,8 @@ namespace reader {
 
 void Names::keep(capture::Item& item) {
     capture::Frame& frame = item.frame;
-    // An interface may learn its variant while it is read, so that its address alone tells nothing.
+    // Compare the interface's contents and not only its address, because it may learn its variant while the
+    // input is read.
     if (frame.interface != nullptr) {
         if (frame.interface != lastGiven_ || !(*frame.interface == lastSeen_)) {
             lastGiven_ = frame.interface;
@@ -17,7 +18,7 @@ void Names::keep(capture::Item& item) {
         }
         frame.interface = lastKept_;
     }
-    // The name of a file stays where it is as long as its reader.
+    // A file's name keeps its address as long as its reader exists.
     const std::string_view file = frame.place.file;
     if (file.data() != lastFileGiven_.data() || file.size() != lastFileGiven_.size()) {
         lastFile_ = *files_.emplace(file).first;
@@ -85,7 +86,8 @@ capture::Reader::Next Merge::next(capture::Item& item) {
     return Next::item;
 }
 
-// The first that is waiting may not be the first to have something: look at the others now and then.
+// Waits for the first input that has nothing. Wakes now and then, because another input may have something
+// earlier.
 void Merge::wait(std::chrono::milliseconds most) {
     const auto pausing = std::count_if(inputs_.begin(), inputs_.end(),
                                        [](const Input& input) { return input.state == Next::pause; });

@@ -10,7 +10,7 @@ namespace {
 
 using calls::Side;
 
-// Characters that mean something to Mermaid, or to the HTML that it makes, are written by their numbers.
+// Writes characters that have a meaning in Mermaid, or in the HTML that it makes, as their numbers.
 void appendPlain(std::string& to, std::string_view text) {
     constexpr std::string_view harmless = " .,:?!()/+-*=[]'_";
     for (const char character : safe(text)) {

@@ -9,7 +9,7 @@ namespace {
 
 using calls::Side;
 
-// Pixels, and characters of a monospaced font of 12 pixels.
+// Sizes are in pixels. Texts use a monospaced font of 12 pixels.
 constexpr int pageWidth = 1000;
 constexpr int margin = 16;
 constexpr int lineHeight = 16;
@@ -37,7 +37,7 @@ void appendAttribute(std::string& to, std::string_view name, int value) {
     to += '"';
 }
 
-// Blanks stay as they are.
+// Appends a text element that keeps blanks as they are.
 void appendText(std::string& to, std::string_view kind, int x, int y, std::string_view text) {
     if (text.empty())
         return;

@@ -10,7 +10,7 @@ namespace {
 
 using calls::Side;
 
-// What arrows and life lines are drawn with.
+// The characters for arrows and life lines.
 struct Pen {
     std::string_view line, dotted, toPeer, toUs, life;
 };
@@ -74,7 +74,7 @@ class Drawing {
         to_ += '\n';
     }
 
-    // Each name at its life line.
+    // Appends the name of each side at its life line.
     void putSides() {
         std::string line(start_, ' ');
         line += ladder_.us;
@@ -141,7 +141,7 @@ class Drawing {
         line += pen_.life;
     }
 
-    // Between the life lines.
+    // Appends words between the life lines.
     void putWords(const Rung& rung) {
         bool first = true;
         for (const std::string& words : wrapped({safe(rung.name)}, arrow_ - 2)) {

@@ -42,7 +42,7 @@ void Output::flush() {
     try {
         writeThrough(buffer_);
     } catch (...) {
-        buffer_.clear();  // what cannot be written is not tried again
+        buffer_.clear();  // text that could not be written is not tried again
         throw;
     }
     buffer_.clear();

@@ -12,11 +12,12 @@ namespace reader {
 
 namespace {
 
-// Large enough that handing over costs nothing, small enough that a few of them fit into the cache.
+// Large enough that handing chunks over costs little, small enough that a few of them fit into the cache.
 constexpr std::size_t itemsInChunk = 256;
 constexpr std::size_t chunksForEachThread = 3;
 constexpr std::chrono::milliseconds longestWait{500};
-// A recorder may write a frame so much later than it passed. Time that passes here counts after that.
+// How much later than a frame passed a recorder may write it. Time on this host's clock counts only after
+// that.
 constexpr std::chrono::seconds recorderMayLag{2};
 
 // Where links are left alone nobody asks for headers either.
@@ -91,7 +92,7 @@ class Run {
 
     bool isStopped() const { return work_.stopped != nullptr && work_.stopped->load(); }
 
-    // Reads a chunk and hands it in. Returns why it holds no more.
+    // Reads a chunk and hands it in. Returns why reading stopped.
     Next readChunk() {
         std::unique_ptr<Chunk> chunk = heldBack_ != nullptr ? std::move(heldBack_) : freeChunk();
         std::size_t room = work_.eachAtOnce ? 1 : itemsInChunk;
@@ -129,7 +130,7 @@ class Run {
             add(chunk, *seen);
     }
 
-    // What was held goes on, as far as it is wanted.
+    // Hands in the items that were held, as far as they are wanted.
     void handInRest() {
         std::unique_ptr<Chunk> chunk = heldBack_ != nullptr ? std::move(heldBack_) : freeChunk();
         work_.gate->finish();
@@ -138,7 +139,7 @@ class Run {
         crew_.handIn(std::move(chunk));
     }
 
-    // Nothing has come: time goes on by this host's clock.
+    // Nothing has come. Lets time pass by this host's clock.
     void passTime() {
         if (!work_.clockRuns)
             return;
@@ -154,7 +155,8 @@ class Run {
             work_.gate->advance(passed);
     }
 
-    // Keeps the items from a poll on whose answer may still come: whether the poll is shown depends on that.
+    // Keeps back the items from the first poll on whose answer may still come, because the answer decides
+    // whether the poll is shown.
     void holdBack(Chunk& chunk, Next next) {
         const std::size_t from = polls_.open(chunk, next == Next::end);
         if (from == chunk.size())
@@ -163,8 +165,8 @@ class Run {
         chunk.split(from, *heldBack_);
     }
 
-    // Tells the filter what the first time of the stream is, while no other thread asks it. A stream whose
-    // first chunk has no time is one without times.
+    // Tells the filter the first time of the stream, before another thread uses the filter. A stream whose
+    // first chunk has no times counts as one without times.
     void begin(Instant first) {
         if (begun_ || first.clock == capture::Clock::none)
             return;
@@ -209,8 +211,8 @@ class Run {
     std::uint64_t first_;
     std::uint64_t left_;
     std::uint64_t passed_ = 0;
-    bool hasCome_ = true;              // an item, since time was counted last
-    HostClock::time_point timeUntil_;  // time has been counted up to then
+    bool hasCome_ = true;              // an item has come since time was counted last
+    HostClock::time_point timeUntil_;  // the moment up to which time has been counted
     bool begun_ = false;
     capture::Item item_;
     Polls polls_;

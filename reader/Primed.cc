@@ -21,7 +21,7 @@ bool Primed::awaitFirst(const std::atomic<bool>& stopped) {
     return true;
 }
 
-// The reader is not asked while its first item is held, so the item is still valid.
+// The first item is still valid, because the reader was not asked for another one since.
 capture::Reader::Next Primed::next(capture::Item& item) {
     if (!held_)
         return reader_->next(item);

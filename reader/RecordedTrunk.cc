@@ -20,8 +20,8 @@ using Kind = capture::Item::Kind;
 
 constexpr std::size_t mostWaiting = 1000;
 
-// Frames that every form with a place for losses holds. A frame that was cut off has no number: a log that is
-// written anew does not hold it.
+// Whether the item gets a number. A frame that was cut off gets none, because a log that is written from the
+// recording does not contain it.
 bool isNumbered(const capture::Item& item) { return item.isFrame() || item.kind == Kind::oversized; }
 
 std::uint64_t framesIn(const std::string& path) {
@@ -33,7 +33,7 @@ std::uint64_t framesIn(const std::string& path) {
     return frames;
 }
 
-// Whether another recorder is writing the file just now.
+// Whether another recorder is writing the file now.
 bool isBeingWritten(const std::string& path) {
     const int descriptor = open(path.c_str(), O_RDONLY | O_CLOEXEC);
     if (descriptor < 0)
@@ -88,7 +88,7 @@ void RecordedTrunk::adoptUnfinished() {
     }
 }
 
-// The file itself knows better than the state how far a recorder came that was killed.
+// If a recorder was killed, its last file shows how far it came, and not the state.
 void RecordedTrunk::continueBehind(const recording::RecordedFile& file, const std::string& path) {
     if (file.run != state_.run)
         return;
@@ -98,7 +98,7 @@ void RecordedTrunk::continueBehind(const recording::RecordedFile& file, const st
             state_.besides = 0;
         state_.next = next;
     } catch (const std::exception& error) {
-        // Not even a head was written.
+        // The file does not even have a head.
         chatter_.detail(error.what());
         state_.next = file.first;
         state_.besides = 0;
@@ -108,7 +108,8 @@ void RecordedTrunk::continueBehind(const recording::RecordedFile& file, const st
 void RecordedTrunk::take(const capture::Item& item) {
     if (source_ != item.frame.place.file) {
         if (isMet_)
-            state_.log.reset();  // a trunk of two logs at once: nobody can read the same again
+            // two logs have this trunk at once, so this run cannot be read again in the same way
+            state_.log.reset();
         source_ = item.frame.place.file;
     }
     if (!isMet_ && !isNumbered(item)) {
@@ -146,7 +147,7 @@ void RecordedTrunk::meet(const capture::Item& first) {
     isListed_ = false;
 }
 
-// Counts the item where it stands in the log, and records it unless that has been done.
+// Counts the item at its place in the log, and records it unless that has been done before.
 void RecordedTrunk::place(const capture::Item& item) {
     const bool numbered = isNumbered(item);
     if (numbered) {
@@ -179,13 +180,14 @@ void RecordedTrunk::record(const capture::Item& item, bool numbered) {
     isChanged_ = true;
 }
 
-// A file that begins with an item that is no frame has the number of the frame that follows.
+// Lists a new file in the state. If it begins with an item that is no frame, it has the number of the frame
+// that follows.
 void RecordedTrunk::enlist() {
     if (std::exchange(enlisted_, file_.begun()) == file_.begun())
         return;
     std::vector<recording::RecordedFile>& files = state_.files;
     if (!files.empty() && files.back().name == file_.newest())
-        files.pop_back();  // it came to nothing, since the disk was full
+        files.pop_back();  // the file was never finished, because the disk was full
     files.push_back({file_.newest(), state_.run, state_.next});
     const auto isGone = [&](const recording::RecordedFile& file) {
         const std::string path = rules_.files.folder + "/" + file.name;
@@ -199,7 +201,7 @@ void RecordedTrunk::enlist() {
 
 void RecordedTrunk::logIsGone(const capture::Item& item) {
     if (!isMet_) {
-        waiting_.clear();  // a head of which no frame came
+        waiting_.clear();  // a head that no frame followed
         return;
     }
     place(item);
@@ -238,7 +240,7 @@ void RecordedTrunk::finish() {
         saveState();
 }
 
-// What is written to the files is behind this, or no longer to be had: the state may be told.
+// Writes the state. Call this only after the items before it are in the files, or are lost.
 void RecordedTrunk::saveState() {
     if (const auto wrong = recording::writeState(state_, statePath_)) {
         if (!std::exchange(stateFails_, true))

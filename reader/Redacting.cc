@@ -104,7 +104,7 @@ void Redacting::look(const Seen& seen, bool passes) {
     release();
 }
 
-// Up to the first item that waits for the rest of its message.
+// Releases items, up to the first that waits for the rest of its message.
 void Redacting::release() {
     while (!waiting_.empty() && waiting_.front().isReady) {
         Waiting& ready = waiting_.front();
@@ -131,7 +131,7 @@ void Redacting::redact(Waiting& waiting) {
     settle(done);
 }
 
-// Frames that are done stand near the end, most of them at the end.
+// Searches from the end, because frames that are done are mostly the last ones.
 void Redacting::settle(std::vector<redaction::Rebuilt>& done) {
     for (redaction::Rebuilt& rebuilt : done) {
         const auto found = std::find_if(waiting_.rbegin(), waiting_.rend(), [&](const Waiting& each) {
@@ -181,7 +181,7 @@ void Redacting::handOn() {
     passes_.clear();
 }
 
-// Redaction comes first: it needs the frames of all calls, whichever are wanted.
+// Passes redacted items through the gate. Redaction comes first, because it needs the frames of all calls.
 void Redacting::passGate() {
     for (std::size_t i = 0; i < out_.size(); ++i)
         gate_->take(out_.seen()[i], passes_[i]);

@@ -30,7 +30,7 @@ std::int64_t secondOf(const capture::Item& item) {
     return std::time(nullptr);
 }
 
-// It tells of the recorder, and not when.
+// Whether the item tells of the recorder and has no time.
 bool isWithoutTime(const capture::Item& item) {
     return item.frame.clock == capture::Clock::none &&
            (item.kind == Kind::run || item.kind == Kind::restart || item.kind == Kind::replaced ||
@@ -53,7 +53,7 @@ RotatingFile::RotatingFile(const RotationRules& rules, const std::string& trunk,
 
 RotatingFile::~RotatingFile() { finish(); }
 
-// Local time, so that a period of a day ends at midnight.
+// Uses local time, so that a period of a day ends at midnight.
 std::int64_t RotatingFile::periodOf(std::int64_t second) const {
     if (rules_.period == 0)
         return 0;
@@ -63,7 +63,8 @@ std::int64_t RotatingFile::periodOf(std::int64_t second) const {
     return (second + local.tm_gmtoff) / rules_.period;
 }
 
-// Frames of two directions may come in the wrong order: one that is a little late begins no file.
+// A frame that is a little late does not begin a file, because frames of the two directions may come in the
+// wrong order.
 bool RotatingFile::isAnotherPeriod(std::int64_t second) const {
     return periodOf(second) > period_ || periodOf(second + lateness) < period_;
 }
@@ -72,8 +73,7 @@ recording::RecordingKind RotatingFile::kind() const {
     return {rules_.folder, trunk_, rules_.mark, std::string(rules_.form->name)};
 }
 
-// After a failure: so much that an attempt is worth while, and no file is made that holds nothing but its
-// head.
+// After a failure: whether the disk has so much room again that a new file would hold more than its head.
 bool RotatingFile::hasRoom() const {
     struct statvfs disk {};
     return statvfs(rules_.folder.c_str(), &disk) != 0 || disk.f_bavail * disk.f_frsize >= leastRoom;
@@ -108,7 +108,7 @@ bool RotatingFile::begin(const capture::Item& item) {
     return true;
 }
 
-// A new file begins with what is missing before it.
+// Begins a new file with the number of frames that are missing before it.
 void RotatingFile::writeLoss(const capture::Item& item) {
     if (lost_ == 0)
         return;
@@ -194,9 +194,9 @@ void RotatingFile::finish() {
     sayWritingWorks();
 }
 
-// What has its name is to survive a power failure as well.
+// Makes the system write the file to the disk, so that it survives a power failure.
 void RotatingFile::synchronise() const {
-    constexpr int cannot = EINVAL;  // of what is no disk
+    constexpr int cannot = EINVAL;  // the error of a file that is not on a disk
     if (fdatasync(descriptor_) != 0 && errno != cannot)
         throw capture::WriteError(path_ + ": " + std::strerror(errno), errno);
 }
@@ -206,7 +206,8 @@ void RotatingFile::passTime(std::int64_t second) {
         finish();
 }
 
-// The file keeps what it safely has; the rest is counted. Another file is tried after a while.
+// Cuts the file back to what is safely in it, and counts the rest as lost. Another file is tried after a
+// while.
 void RotatingFile::fail(const std::string& why) {
     lose(pendingFrames_);
     pending_ = 0;
@@ -241,7 +242,7 @@ void RotatingFile::nameFinished() {
     removeOldest();
 }
 
-// A file holds what is older than the beginning of the next one.
+// Removes the oldest files. A file is as old as the beginning of the next one.
 void RotatingFile::removeOldest() const {
     const std::vector<recording::Recording> finished = recording::finishedRecordings(kind());
     for (std::size_t i = 0; i < finished.size(); ++i) {

@@ -37,7 +37,7 @@ void Surroundings::hold(const capture::Item& item) {
     }
 }
 
-// An item without a time goes with the one behind it.
+// An item without a time belongs to the item after it.
 bool Surroundings::beginsTooEarly() const {
     const auto first =
         std::find_if(held_.begin(), held_.end(), [](const HeldItem& held) { return hasTime(held.bare); });
@@ -51,7 +51,7 @@ void Surroundings::dropOldest() {
 
 void Surroundings::trigger(const std::string& why) {
     if (held_.empty())
-        return;  // nothing has come from this trunk
+        return;  // no item has come from this trunk yet
     chatter_.note(trunk_ + ": trigger, what surrounds it is kept: " + why);
     until_ = newest_ + rules_.after;
     hostUntil_ = HostClock::now() + std::chrono::nanoseconds(rules_.after);
@@ -65,7 +65,7 @@ void Surroundings::trigger(const std::string& why) {
         file_.write(held.item());
 }
 
-// Stands in front of the first frame of a file, or behind the one that prolongs it.
+// Writes a comment before the first frame of a file, or after the frame that prolongs it.
 void Surroundings::comment(const std::string& why, const capture::Item& at) {
     const std::string text = "lapdread: kept because of " + why;
     capture::Item item = at;

@@ -35,7 +35,7 @@ void TextConsumer::fillInTimes(Chunk& chunk, std::size_t count) {
     }
 }
 
-// More than a day between two lines needs more room than there is.
+// Makes more room for the time between two lines, which is needed if it is more than a day.
 void TextConsumer::widen(Chunk& chunk, std::size_t first, std::size_t more) {
     chunk.text.insert(chunk.pieces[first].deltaAt, more, ' ');
     chunk.pieces[first].deltaSize += more;

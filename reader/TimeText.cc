@@ -98,10 +98,10 @@ void appendSeconds(std::string& to, std::int64_t nanoseconds) {
 
 namespace {
 
-// What the parentheses of a match hold; a part that is absent is 0.
+// The number in a part of a match; 0 if the part is absent.
 int numberIn(const std::ssub_match& part) { return part.matched ? std::stoi(part.str()) : 0; }
 
-// "250" of ".25" is 250 ms.
+// Nanoseconds of the digits after a decimal point: 250 ms for ".25".
 std::int64_t fractionIn(const std::ssub_match& part) {
     std::string digits = part.matched ? part.str() : "0";
     digits.resize(9, '0');

@@ -58,7 +58,8 @@ capture::Variant Tracker::variantOf(const capture::Item& item) {
     return capture::Variant::unknown;
 }
 
-// Channels are told apart by name: readers come and go, and an address may lead to another interface later.
+// Channels are identified by name, because an address may belong to another interface after its reader has
+// gone.
 Tracker::Channel& Tracker::channelOf(const capture::Frame& frame) {
     const std::string_view name =
         frame.interface == nullptr ? std::string_view() : std::string_view(frame.interface->name);

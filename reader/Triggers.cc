@@ -12,7 +12,7 @@ namespace reader {
 namespace {
 
 constexpr std::string_view check = "check";
-// Filters that tell one frame from another, whatever the time.
+// Filters that look at the frame itself and not at its time.
 constexpr std::string_view filters[] = {"cause",   "message", "number", "callref",
                                         "channel", "tei",     "type",   "mark"};
 

@@ -8,7 +8,7 @@ namespace {
 
 constexpr std::uint64_t mostCells = 400'000'000;
 
-// Any pair is worth more than all equal pairs together.
+// One pair more is worth more than any number of equal pairs.
 constexpr std::uint64_t pairWorth = std::uint64_t{1} << 32U;
 
 std::uint64_t worth(const Token& a, const Token& b) {
@@ -17,8 +17,8 @@ std::uint64_t worth(const Token& a, const Token& b) {
     return pairWorth + (a.content == b.content ? 1 : 0);
 }
 
-// Hirschberg's way: the best split of B for the first half of A, found with two rows of the table; then the
-// two halves alike. The depth is the logarithm of A's length.
+// Hirschberg's algorithm: finds the best split of B for the first half of A with two rows of the table, and
+// then aligns each half in the same way. The depth is the logarithm of A's length.
 class Aligner {
   public:
     Aligner(std::span<const Token> a, std::span<const Token> b) : a_(a), b_(b) {}
@@ -55,8 +55,8 @@ class Aligner {
             pairs.push_back({a, best});
     }
 
-    // For each i the worth of these members of A beside the first i of B; backwards: beside all but the first
-    // i.
+    // For each i: the worth of these members of A aligned with the first i members of B, or, backwards, with
+    // all but the first i.
     std::vector<std::uint64_t> scores(std::size_t fromA, std::size_t toA, std::size_t fromB, std::size_t toB,
                                       bool backwards) const {
         const std::size_t width = toB - fromB;

@@ -15,7 +15,7 @@ namespace reader {
 
 namespace {
 
-// What calls can be put in order by.
+// A key by which calls can be sorted.
 struct SortKey {
     std::string_view name;
     std::int64_t (*value)(const calls::Call& call);
@@ -57,7 +57,7 @@ class CallPrinter : public Analysed {
     bool countsItself() const override { return true; }
     void flush() override { out_.flush(); }
 
-    // After the end: the calls that were kept to be sorted.
+    // Prints the calls that were kept for sorting. Called after the end of the input.
     void printSorted() {
         if (options_.calls.sort.empty())
             return;

@@ -34,7 +34,7 @@ class FindingPrinter : public Analysed {
     bool countsItself() const override { return true; }
     void flush() override { out_.flush(); }
 
-    // How many findings of each severity there were, in words.
+    // The number of findings of each severity, in words.
     std::string summary() const {
         std::string words;
         for (const calls::Severity severity :
@@ -64,7 +64,7 @@ class FindingPrinter : public Analysed {
         out_.write(text_);
     }
 
-    // A line with what happened, and below it what that means and what to look at.
+    // Writes a line that says what happened, and below it what that means and what to look at.
     void putText(const calls::Finding& finding) {
         if (colors_)
             text_ += colorOf(finding.severity);

@@ -41,7 +41,7 @@ class Help : public CLI::Formatter {
                std::string(command == nullptr ? "" : command->words) + "\n";
     }
 
-    // The words behind the options are told by the usage.
+    // The usage describes the words after the options.
     std::string make_positionals(const CLI::App* /*app*/) const override { return ""; }
 };
 
@@ -96,7 +96,7 @@ constexpr OptionRow filterRowsBesides[] = {
      [](Options&, const std::string&) {}},
 };
 
-// They decide which call a frame belongs to, and so count for filters on calls as well.
+// These options decide which call a frame belongs to, so filters on calls need them as well.
 constexpr OptionRow callRows[] = {
     {"--timer", "NAME=TIME", "Another value of a timer: T305=4s, T316=500ms",
      [](Options& to, const std::string& value) {
@@ -118,7 +118,7 @@ constexpr OptionGroup common[] = {
 };
 // clang-format on
 
-// CLI11 knows options and their values; what they mean is called for each time one is given.
+// CLI11 knows the options and their values. It calls `set` each time an option is given.
 CLI::Option* add(CLI::App& app, std::string_view names, std::string_view form, std::string_view help,
                  const std::function<void(const std::string&)>& set) {
     const std::string all(names);
@@ -163,7 +163,7 @@ void addGroup(CLI::App& app, const OptionGroup& group, Options& options) {
 void addFilters(CLI::App& app, Options& options) {
     for (const FilterRow& row : filterRows()) {
         for (const bool negated : {false, true}) {
-            // How `--not --NAME` is handed to CLI11; --help does not show it.
+            // The form in which CLI11 gets `--not --NAME`. --help does not show it.
             const std::string name = (negated ? "--not-" : "--") + std::string(row.name);
             add(app, name, row.form, row.help, [&options, &row, negated](const std::string& value) {
                 options.filters.push_back({std::string(row.name), value, negated});
@@ -185,7 +185,7 @@ void addCommand(CLI::App& app, const Command& command, Options& options) {
         addGroup(*sub, group, options);
 }
 
-// `--not` belongs to the filter behind it, whatever CLI11 thinks of their order.
+// Joins each `--not` to the filter after it, because CLI11 does not keep the order of options.
 std::vector<std::string> joinNegations(const std::vector<std::string>& words) {
     std::vector<std::string> joined;
     bool negated = false;

@@ -9,7 +9,7 @@ namespace reader {
 
 namespace {
 
-// Two words are IN and OUT; with -o all of them are inputs.
+// Without -o, the two words are IN and OUT. With -o, all words are inputs.
 Options withOutput(Options options) {
     const std::size_t inputs = options.input.files.size() + options.words.size();
     if (!options.output.path.empty() || inputs < 2)

@@ -36,7 +36,7 @@ int switchOf(isdn::Variant variant) {
     return 7;
 }
 
-// The board's time stamp; of a capture without one the time since its first frame.
+// The board's time stamp, or the time since the first frame if a capture has none.
 std::uint32_t ticksOf(const Seen& seen) {
     if (seen.frame().ticks)
         return *seen.frame().ticks;
@@ -44,7 +44,7 @@ std::uint32_t ticksOf(const Seen& seen) {
                                       capture::nanosecondsPerTick);
 }
 
-// The second in which the recorder wrote the frame down, or else that in which it passed.
+// The second in which the recorder wrote the frame, or else the second in which it passed.
 std::time_t secondOf(const capture::Frame& frame) {
     return frame.written ? *frame.written : frame.time / 1'000'000'000;
 }

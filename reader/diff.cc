@@ -19,7 +19,7 @@ namespace {
 
 constexpr std::size_t mostMessages = 50'000;
 
-// A file, or a call of it: "day.pcapng#3" is the call that `lapdread calls day.pcapng` numbers 3.
+// A file, or one call in a file: "day.pcapng#3" is the call that `lapdread calls day.pcapng` numbers 3.
 struct Operand {
     std::string file;
     std::optional<std::uint64_t> call;
@@ -40,7 +40,7 @@ class MessageTaker : public Analysed {
         : Analysed(options), also_(options.compareAlso), operand_(operand) {}
 
     void flush() override {}
-    // After the end of the trace.
+    // The messages to compare. Called after the end of the trace.
     std::vector<ComparedMessage> messages() {
         std::vector<ComparedMessage> wanted;
         for (std::size_t i = 0; i < messages_.size(); ++i) {
@@ -77,8 +77,8 @@ class MessageTaker : public Analysed {
     const Operand& operand_;
     std::vector<ComparedMessage> messages_;
     std::vector<std::uint64_t> calls_;   // by message: the number of its call, or 0
-    std::set<std::uint64_t> undecided_;  // calls that are alive, and whose end tells whether they are wanted
-    std::set<std::uint64_t> unwanted_;   // calls of which that has told
+    std::set<std::uint64_t> undecided_;  // calls that are alive; only their end tells whether they are wanted
+    std::set<std::uint64_t> unwanted_;   // calls that turned out not to be wanted
     std::int64_t first_ = 0;
 };
 

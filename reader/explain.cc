@@ -223,7 +223,7 @@ std::span<const OptionRow> explainOptions() {
 
 namespace {
 
-// The octets that the words are, unless they name files.
+// The octets that the words on the command line stand for, unless the words name files.
 std::optional<std::vector<std::uint8_t>> octetsOf(const Options& options) {
     std::string digits;
     for (const std::string& word : options.words) {

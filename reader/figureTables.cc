@@ -24,7 +24,7 @@ std::string seconds(std::int64_t nanoseconds) {
     return text;
 }
 
-// A number with a few digits behind the point: "0.875", "41.7".
+// A number with this many digits after the point: "0.875", "41.7".
 std::string decimal(double value, int digits) {
     char text[64];
     const auto [end, error] =
@@ -62,7 +62,7 @@ FigureTable messages(const calls::Figures& figures) {
     return table;
 }
 
-// What there is to say of the calls of one direction.
+// A row of the table about the calls of one direction.
 struct TrafficRow {
     std::string_view name;
     std::string (*value)(const calls::Traffic& traffic);
@@ -206,7 +206,7 @@ std::string_view nameOf(calls::TrunkSize size) {
     return "unknown";
 }
 
-// "1 to 15, 17": numbers that follow one another are put together.
+// The channels as ranges of numbers: "1 to 15, 17".
 std::string rangesOf(const std::vector<calls::ChannelKey>& channels) {
     std::string text;
     for (std::size_t i = 0; i < channels.size();) {

@@ -61,7 +61,7 @@ std::string knownForms() {
     return known;
 }
 
-// What a writer reports, in the words of this program.
+// Runs `act`, and turns the exceptions of a writer into those of this program.
 template <class Act>
 void reporting(Act act) {
     try {

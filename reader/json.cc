@@ -43,7 +43,7 @@ void putHex(std::string& to, std::string_view key, std::span<const std::uint8_t>
     to += '"';
 }
 
-// A number that is only there in some frames.
+// Appends a number that only some frames have.
 template <std::integral Number>
 void putNumberIf(std::string& to, std::string_view key, bool present, Number value) {
     if (present)

@@ -20,10 +20,10 @@ namespace {
 constexpr unsigned usualWidth = 80;
 constexpr unsigned mostWidth = 1000;
 
-// More would be a picture that nobody can look at.
+// A picture of more calls would be too large to look at.
 constexpr std::uint64_t mostInPicture = 500;
 
-// That of the option, of the environment, of the terminal, or 80.
+// The width of a line: that of the option, of the environment, or of the terminal, or else 80.
 unsigned widthOf(const Options& options, const Output& out) {
     if (options.ladder.width != 0)
         return options.ladder.width;
@@ -37,7 +37,7 @@ unsigned widthOf(const Options& options, const Output& out) {
     return usualWidth;
 }
 
-// What the environment says of characters: the first of these that is set counts (POSIX, 8.2).
+// Whether the locale has UTF-8. The first of these variables that is set decides (POSIX, 8.2).
 bool localeHasUtf8() {
     for (const char* const name : {"LC_ALL", "LC_CTYPE", "LANG"}) {
         const char* const value = std::getenv(name);
@@ -60,7 +60,7 @@ class LadderPrinter : public Analysed {
     bool countsItself() const override { return true; }
     void flush() override { out_.flush(); }
 
-    // After the end: a picture is written as a whole.
+    // Writes the picture. Called after the end of the input.
     void finishPicture() {
         if (options_.ladder.form != LadderForm::svg)
             return;

@@ -19,7 +19,7 @@ constexpr std::string_view wide[] = {"n",      "time", "delta",   "trunk",   "pl
 
 constexpr unsigned secondsWidth = 10;
 
-// Seconds are shorter than dates, and stand to the right.
+// Adapts the time column: seconds are shorter than dates, and are aligned to the right.
 Column placed(std::string_view name, TimeForm time) {
     Column column = columnNamed(name);
     if (column.name == "time" && time == TimeForm::relative) {
@@ -37,7 +37,7 @@ std::vector<Column> chosenColumns(const ListOptions& options) {
         return chosen;
     }
     for (const std::string_view name : options.wide ? std::span<const std::string_view>(wide) : usual) {
-        // The time since the line before takes the place of the time, when that is what the time is.
+        // If the time that is shown is the time since the line before, its column replaces the time column.
         if (options.time != TimeForm::delta || name != "time")
             chosen.push_back(placed(name, options.time));
     }
@@ -57,7 +57,7 @@ LineComposer::LineComposer(const ListOptions& options, bool colors)
 void LineComposer::compose(const Seen& seen, std::string& text, Piece& piece) {
     const std::size_t lineStart = text.size();
     Cell cell{seen, text, times_, relative_, colors_};
-    // One blank between columns; two behind a message and other texts that have blanks themselves.
+    // One blank between columns, but two after a message and after other texts that contain blanks.
     std::string_view separator;
     for (const Column& column : columns_) {
         text += separator;

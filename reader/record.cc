@@ -20,7 +20,7 @@ namespace reader {
 
 namespace {
 
-// What signals ask for: SIGHUP begins new files, SIGUSR1 keeps what surrounds this moment.
+// Set by signal handlers. SIGHUP begins new files; SIGUSR1 keeps what surrounds this moment.
 std::atomic<bool> beginAnew = false;
 std::atomic<bool> keepNow = false;
 
@@ -37,7 +37,7 @@ class Recorder : public Consumer {
     Recorder(const RecordRules& rules, const Options& options, Chatter& chatter)
         : rules_(rules), chatter_(chatter), roles_(chatter), triggers_(options) {}
 
-    // Triggers see what the filters leave out, too.
+    // Triggers also see the items that the filters leave out.
     bool wantsAll() const override { return triggers_.areThere(); }
 
     void take(Chunk& chunk, std::size_t count) override {
@@ -165,7 +165,7 @@ std::int64_t readPeriod(const std::string& text) {
 
 namespace {
 
-// What surrounds a trigger is held in memory.
+// Reads a time around a trigger. It is limited, because what surrounds a trigger is held in memory.
 std::int64_t readSpan(const std::string& text) {
     constexpr std::int64_t most = 86400;
     const std::int64_t seconds = readPeriod(text);

@@ -26,7 +26,7 @@ void checkManner(const Options& options, const Key& key) {
                          " was made without --blank-short: another manner needs another key");
 }
 
-// That of the first input, if nothing else tells.
+// The form of the output. If nothing else decides it, it is that of the first input.
 const Form& formOf(const Options& options) {
     if (!options.form.empty())
         return formNamed(options.form);

@@ -18,7 +18,7 @@ namespace {
 
 std::atomic<bool> stopped = false;
 
-// SIGINT and SIGTERM let the program end what it writes; a second one kills it.
+// After SIGINT or SIGTERM the program completes its output and ends. A second signal kills it.
 void stopOnSignals() {
     struct sigaction action {};
     action.sa_handler = [](int) { stopped = true; };
@@ -93,7 +93,7 @@ void Session::run(Consumer& consumer, const std::function<std::unique_ptr<Compos
                       std::to_string(gate->letGo()));
 }
 
-// Silence could also mean a trunk on which nothing happens.
+// Says that nothing was found, because an empty output could also mean a trunk on which nothing happens.
 void Session::tellWhatWasNotFound(const Outcome& outcome, const CallGate* gate) {
     const bool isNothing = outcome.passed == 0 && tracker_.frames() != 0;
     if (isNothing && gate != nullptr)

@@ -16,7 +16,7 @@ void appendEscaped(std::string& to, char character) {
     to.append(escape, sizeof escape);
 }
 
-// Appends the text, each character that is not plain as `escape` shows it.
+// Appends the text. Characters that are not plain are appended as `escape` shows them.
 template <class IsPlain>
 void appendEscaping(std::string& to, std::string_view text, IsPlain isPlain) {
     auto at = text.begin();

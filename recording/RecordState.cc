@@ -32,7 +32,7 @@ std::string hexOf(std::span<const std::uint8_t> octets) {
     return hex;
 }
 
-// The library would convert another value, such as a fraction.
+// Reads an integer. The JSON library itself would convert other values, such as a fraction.
 template <class Number>
 Number numberIn(const json& from) {
     const bool isSigned = std::numeric_limits<Number>::is_signed;
@@ -81,9 +81,9 @@ RecordState stateFrom(const json& from) {
     return state;
 }
 
-// One file a line, so that people can read it, and shell scripts can.
+// The state as text, with one file a line, so that people and shell scripts can read it.
 std::string textOf(const RecordState& state) {
-    // Names are octets to the system; those that are no UTF-8 are replaced.
+    // To the system, names are any octets. Those that are no valid UTF-8 are replaced.
     const auto text = [](const json& value) {
         return value.dump(-1, ' ', false, json::error_handler_t::replace);
     };

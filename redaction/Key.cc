@@ -63,7 +63,7 @@ bool readSecret(std::string_view text, Key& key) {
     return true;
 }
 
-// A key reads back as it was written, and nothing else is one.
+// Reads exactly the form that writeKey writes.
 std::optional<Key> parse(const std::string& text) {
     std::istringstream lines(text);
     std::string line;
@@ -87,7 +87,7 @@ Key randomKey(const Manner& manner) {
 }
 
 std::optional<Key> readKey(const std::string& path) {
-    // A FIFO would wait for a writer.
+    // Without O_NONBLOCK, opening a FIFO would wait for a writer.
     const Descriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
     if (file.get() < 0 && errno == ENOENT)
         return std::nullopt;
@@ -119,7 +119,7 @@ void writeKey(const std::string& path, const Key& key) {
         fsync(file.get()) == 0)
         return;
     const int reason = errno;
-    unlink(path.c_str());  // half a key is none
+    unlink(path.c_str());  // do not leave half a key
     errno = reason;
     fail(path, "write the key");
 }

@@ -13,7 +13,8 @@ namespace redaction {
 
 namespace {
 
-// Sets of octets that are replaced by each other. Their numbers are part of what a pseudonym depends on.
+// Sets of octets. An octet is replaced by one of the same set. Pseudonyms depend on these numbers, so do not
+// change them.
 enum class Alphabet : std::uint8_t {
     digits,
     capitals,
@@ -26,7 +27,7 @@ enum class Alphabet : std::uint8_t {
     none
 };
 
-constexpr std::size_t largest = 128;  // symbols of an alphabet
+constexpr std::size_t largest = 128;  // the most symbols that an alphabet has
 
 struct Symbols {
     std::array<Alphabet, 256> alphabetOf{};
@@ -102,7 +103,7 @@ class Mac {
     std::unique_ptr<EVP_MAC_CTX, Free> context_;
 };
 
-// Numbers that look random, drawn from digests of one text: 16 bits each.
+// Numbers of 16 bits that look random, taken from digests of one text.
 class Draws {
   public:
     Draws(Mac& mac, Alphabet alphabet, std::string_view before)
@@ -139,7 +140,7 @@ class KeyedPseudonyms final : public Pseudonyms {
         }
     }
 
-    // Half an octet at a time: an octet of user data may hold two digits.
+    // Replaces half an octet at a time, because an octet of user data may hold two digits.
     void replaceOctets(std::span<std::uint8_t> octets) override {
         std::string before;
         for (std::uint8_t& octet : octets) {
@@ -174,8 +175,8 @@ class KeyedPseudonyms final : public Pseudonyms {
         return octets[original];
     }
 
-    // What a symbol becomes, and what it is without pseudonym. A cycle of all symbols, made by Sattolo's
-    // algorithm, leaves none as it is.
+    // Returns the replacement of a symbol, and the symbol without pseudonym. Sattolo's algorithm makes a
+    // cycle of all symbols, so every symbol is replaced by another one.
     std::pair<std::uint8_t, std::uint8_t> substitute(Alphabet alphabet, std::size_t size, std::uint8_t symbol,
                                                      std::string_view before) {
         std::array<std::uint8_t, largest> cycle{};

@@ -11,10 +11,11 @@ namespace {
 
 namespace type = isdn::message;
 
-constexpr std::size_t fewDigits = 6;        // a number of fewer is short
+constexpr std::size_t fewDigits = 6;        // a number with fewer digits is short
 constexpr std::size_t longestNumber = 256;  // nobody dials more digits
 
-// What a number may hold besides, it keeps: a blank number counts as many digits as it did before.
+// `*` and `#` are no digits and are kept when a number is blanked, so that the blanked number has as many
+// digits as before.
 bool countsAsDigit(std::uint8_t octet) { return octet != '*' && octet != '#'; }
 
 void blankNumber(std::span<std::uint8_t> octets) {
@@ -35,7 +36,7 @@ void Redactor::expect(std::uint64_t number) {
 
 void Redactor::heard(const calls::Message& message, const calls::Call* call) {
     if (message.number != expected_) {
-        mayMiss();  // it was accepted late, since frames before it are missing
+        mayMiss();  // it was accepted late because frames before it are missing
         return;
     }
     heard_.isAccepted = true;
@@ -80,7 +81,8 @@ std::vector<std::uint8_t> Redactor::cut(isdn::Octets frame, isdn::Variant varian
     return octets;
 }
 
-// The analysis has either kept the segment, put a message together with it, or found that it follows nothing.
+// By now the analysis has either kept the segment, completed a message with it, or found that it follows no
+// other segment.
 void Redactor::takeSegment(const Segment& segment, isdn::Variant variant, std::vector<Rebuilt>& done) {
     Rebuilt rebuilt{expected_, {segment.frame->octets.begin(), segment.frame->octets.end()}};
     if (!heard_.isAccepted) {
@@ -129,7 +131,7 @@ void Redactor::apply(const Plan& plan, std::span<std::uint8_t> octets, std::uint
     }
 }
 
-// Digits of SETUP begin a number, those of INFORMATION go on with it.
+// Digits in SETUP begin a number, and digits in INFORMATION continue it.
 void Redactor::replaceDialled(std::span<std::uint8_t> octets, std::uint8_t messageType) {
     const bool begins = messageType == type::setup;
     std::optional<std::string> before = begins ? std::string() : digitsBefore();
@@ -146,10 +148,10 @@ void Redactor::replaceDialled(std::span<std::uint8_t> octets, std::uint8_t messa
         dialled_.erase({heard_.call, heard_.from});
 }
 
-// The digits of the number that precede this frame; nothing if they are not all known.
+// Returns the digits of the number that came before this frame, or nothing if they are not all known.
 std::optional<std::string> Redactor::digitsBefore() {
     if (!heard_.isAccepted) {
-        // A frame that is sent again has the pseudonyms that it had before.
+        // A frame that is sent again gets the same pseudonyms as before.
         const auto sent = sent_.find(place_);
         const bool isAgain =
             sent != sent_.end() && std::ranges::equal(sent->second.information, information_);
@@ -166,7 +168,7 @@ std::optional<std::string> Redactor::digitsBefore() {
     return known->second.digits;
 }
 
-// False if the number was blanked.
+// Returns false if the number was blanked.
 bool Redactor::replaceNumber(std::span<std::uint8_t> octets, std::string& before) {
     const auto digits =
         std::ranges::count_if(before, countsAsDigit) + std::ranges::count_if(octets, countsAsDigit);

@@ -18,7 +18,8 @@ using isdn::Variant;
 namespace element = isdn::element;
 
 constexpr std::uint8_t extensionBit = 0x80;
-constexpr std::uint8_t tooLong = 0xFF;  // set in a length that is too long, it stays so
+// set in a wrong length octet that is too long, so that it stays too long
+constexpr std::uint8_t tooLong = 0xFF;
 
 class Planner {
   public:
@@ -49,7 +50,7 @@ class Planner {
         const isdn::CallReference& reference = message.callReference;
         if (reference.octets.size() < reference.length)
             add(reference.octets, Treatment::blank);
-        // A call reference whose length is wrong keeps its length octet, which says so.
+        // If the length of a call reference is wrong, its length octet is kept, because that shows the error.
         const bool wrongLength = message.problem == isdn::Problem::invalid;
         add(behind(message.raw, wrongLength ? 1 : 0), Treatment::blank);
     }
@@ -66,8 +67,9 @@ class Planner {
             plan_.push_back({static_cast<std::size_t>(octets.data() - whole_.data()), octets.size(),
                              treatment, keptBits, setBits});
     }
-    // Blanks a field of an element so that what is around it is read as before: bit 8 says where a group
-    // ends, other bits of an octet are other fields, and in a display a length that is too long must stay so.
+    // Blanks a field of an element so that the fields around it are read as before: bit 8 says where a group
+    // ends, the other bits of an octet are other fields, and in a display a length that is too long must stay
+    // too long.
     void addDoubtful(const Field& field, const Element& each) {
         if (field.kind == Field::Kind::extension)
             return;
@@ -75,7 +77,7 @@ class Planner {
         add(field.at, Treatment::blank, keepsEnd ? extensionBit : bitsBeside(field),
             isDisplay(each) ? tooLong : std::uint8_t{0});
     }
-    // The bits of its octet that are not the field's; none of a field of several octets.
+    // The bits of the octet that do not belong to the field; no bits if the field has several octets.
     static std::uint8_t bitsBeside(const Field& field) {
         if (field.at.size() != 1)
             return 0;
@@ -83,8 +85,8 @@ class Planner {
         return static_cast<std::uint8_t>(~(upTo & ~below));
     }
 
-    // Octets behind the last action indicator belong to nothing. If none says that it is the last, the first
-    // is taken for it.
+    // Octets after the last action indicator are blanked. If no indicator says that it is the last, the first
+    // counts as the last.
     void planTeiMessage(Octets information) {
         constexpr std::uint8_t teiManagement = 0x0F;
         constexpr std::size_t header = 4;
@@ -97,8 +99,9 @@ class Planner {
         }
     }
 
-    // Groups of ISO/IEC 8885: the parameters of the link stay; user data (FF) has no length. Of a group with
-    // a wrong length, its own or one within it, the identifier alone stays, and so of all that follows.
+    // Plans the groups of ISO/IEC 8885. The parameters of the link are kept; user data (FF) has no length and
+    // is blanked. If a length is wrong, of a group or within it, only the identifier of the group is kept,
+    // and everything after it is blanked.
     void planIdentification(Octets information) {
         constexpr std::uint8_t generalPurpose = 0x82, linkParameters = 0x80;
         constexpr std::size_t header = 3;
@@ -118,7 +121,7 @@ class Planner {
         add(behind(rest, 1), Treatment::blank);
     }
 
-    // Identifier, length and value, again and again.
+    // Whether the octets are a sequence of identifier, length and value.
     static bool areParameters(Octets octets) {
         constexpr std::size_t header = 2;
         while (octets.size() >= header && octets[1] <= octets.size() - header)
@@ -126,8 +129,7 @@ class Planner {
         return octets.empty();
     }
 
-    // The element that holds digits as the caller dials them: the called number if it has any, else the
-    // keypad.
+    // The element with the digits that the caller dials: the called number if it has any, or else the keypad.
     static Element dialledIn(const isdn::Layer3& message) {
         const bool dials =
             message.discriminator == isdn::callControl && !message.national &&
@@ -155,7 +157,7 @@ class Planner {
         isdn::fieldsOf(each, variant_, fields_);
         const bool isDialled = each.octets.data() == dialled.octets.data();
         const bool ofInformation = message.type == isdn::message::information;
-        bool isOpen = false;  // an octet before says that its group goes on
+        bool isOpen = false;  // an octet before it says that its group goes on
         for (const Field& field : fields_) {
             if (field.kind == Field::Kind::extension)
                 isOpen = field.value == 0;
@@ -180,7 +182,8 @@ class Planner {
         return each.codeset == 0 && (each.id == element::calledNumber || each.id == element::keypad);
     }
 
-    // Raw octets that no table marks are nobody's but those of charges, and of what stands beside a display.
+    // Whether raw octets that no table marks may identify a person: all may, except those of charges and
+    // those beside a display.
     static bool names(const Field& field, const Element& each) {
         const bool isOpaque =
             field.kind == Field::Kind::raw && each.id != element::changeStatus && !isDisplay(each);
@@ -195,15 +198,17 @@ class Planner {
                 isdn::partyNumber(each) || (each.codeset == 0 && each.id == element::keypad);
             return isNumber ? Treatment::number : Treatment::text;
         }
-        // Bit 8 of a pseudonym would end the group elsewhere.
+        // A pseudonym could set bit 8 and so end the group at another octet.
         return isOpen ? Treatment::blank : Treatment::octets;
     }
 
-    // Whether a value spells something must not matter, so its type alone decides.
+    // Only the type of a value decides. Its contents must not, because the plan of the redacted frame must be
+    // the same.
     void planFacility(Octets contents) {
         const isdn::Facility facility(contents, variant_);
         const isdn::BerTree& tree = facility.tree();
-        // The profile has one octet. More of them are known to nobody, but their end has to stay.
+        // The profile has one octet. More octets of it are blanked, but the last one must still end the
+        // profile.
         const auto last =
             std::ranges::find_if(contents, [](std::uint8_t octet) { return (octet & extensionBit) != 0; });
         const auto profile = std::min(contents.size(), static_cast<std::size_t>(last - contents.begin()) + 1);
