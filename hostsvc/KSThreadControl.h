@@ -1,4 +1,4 @@
-// The control that a thread's body gets: it learns from it of a request to stop, and pushes clean-up
+// The control that a thread's body gets. Through it the body learns that it must stop, and registers clean-up
 // routines.
 #ifndef HOSTSVC_KSTHREADCONTROL_H
 #define HOSTSVC_KSTHREADCONTROL_H

@@ -1,5 +1,5 @@
-// How an element is described: a table of rows, each a field at its place. One engine reads every table
-// (isdn/engine.cc).
+// The tables that describe elements. A row describes a field at its place. One engine (isdn/engine.cc) reads
+// all tables.
 //
 //     inline constexpr Row progressRows[] = {
 //         {"3", bits(7, 6), "coding standard", codingStandards},
@@ -8,9 +8,9 @@
 //     };
 //
 // A row with a label begins an octet, or octets; one without a label is another field of the same octet. Bits
-// that no row names need no row: bit 8 is then the extension bit, and any other is spare. What a row's `when`
-// asks for decides in the first row of an octet whether the octet is there, and in any other row whether the
-// field is.
+// that no row names need no row: bit 8 is then the extension bit, and any other is spare. The condition
+// `when` in the first row of an octet decides whether the octet is present. In any other row it decides
+// whether the field is.
 #ifndef ISDN_TABLE_H
 #define ISDN_TABLE_H
 
@@ -78,7 +78,7 @@ struct Place {
         bits,      // of one octet
         heading,   // bits that hold the identifier
         reserved,  // bits that are spare even where bit 8 would be the extension bit
-        nothing,   // no field: the octet's fields are those of the rows that follow
+        nothing,   // the row itself is no field; the following rows describe the octet's fields
         octets,
     };
     enum class Repeat : std::uint8_t { once, whileExtended, toEnd };
@@ -87,9 +87,9 @@ struct Place {
     std::uint8_t high = 8;
     std::uint8_t low = 1;
     Repeat repeat = Repeat::once;
-    std::uint8_t count = 0;           // of octets; 0 stands for all that are left
+    std::uint8_t count = 0;           // the number of octets; 0 stands for all that are left
     std::string_view countedBy;       // the label of the octet that holds the number of octets, if any
-    std::uint8_t alreadyCounted = 0;  // octets that this number includes and that other rows have taken
+    std::uint8_t alreadyCounted = 0;  // how many of these octets other rows have taken
     ContentsReader reader = nullptr;  // null reads octets as they are
 };
 

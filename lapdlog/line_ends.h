@@ -1,4 +1,4 @@
-// The line ends of a log that went through another system.
+// Recognises the line ends of a log that was copied through another system.
 #ifndef LAPDLOG_LINE_ENDS_H
 #define LAPDLOG_LINE_ENDS_H
 
@@ -6,7 +6,7 @@
 
 namespace lapdlog {
 
-// Whether the text is that of a log only when one carriage return in front of each line feed is left out.
+// Whether the text is a log if, and only if, one carriage return before each line feed is left out.
 bool hasDosLineEnds(std::string_view beginning);
 
 }  // namespace lapdlog

@@ -1,4 +1,4 @@
-// Counts what the figures of a trace are made of.
+// Counts the figures of a trace.
 #ifndef READER_FIGURETAKER_H
 #define READER_FIGURETAKER_H
 
@@ -13,14 +13,15 @@
 
 namespace reader {
 
-// Filters choose messages and calls. Channels count in full: a channel is no less in use because one looks at
-// some calls alone. Derived classes that hear of messages, calls or findings call these in their own.
+// Filters choose messages and calls. Channels are always counted in full, because a channel is no less busy
+// when the user looks at some calls only. A derived class that overrides one of the protected functions must
+// call it from its own function.
 class FigureTaker : public Analysed {
   public:
     explicit FigureTaker(const Options& options) : Analysed(options) {}
 
     void flush() override {}
-    // After the end of the trace, once.
+    // The tables. Call this once, after the end of the trace.
     std::vector<FigureTable> tables(calls::TrunkSize size);
     const calls::Figures& figures() const { return figures_; }
 

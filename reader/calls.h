@@ -1,4 +1,4 @@
-// A line a call.
+// lapdread calls: lists the calls, one a line.
 #ifndef READER_CALLS_H
 #define READER_CALLS_H
 

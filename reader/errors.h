@@ -1,4 +1,4 @@
-// What ends lapdread early, and the exit status that goes with it.
+// Exceptions that end lapdread early, and the exit status of each.
 #ifndef READER_ERRORS_H
 #define READER_ERRORS_H
 
@@ -8,7 +8,7 @@ namespace reader {
 
 enum ExitStatus { good = 0, badUsage = 1, cannotRead = 2, found = 3 };
 
-// The command line cannot be obeyed; exit status 1.
+// The command line is wrong; exit status 1.
 class UsageError : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
@@ -19,7 +19,7 @@ class FileError : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
-// A signal ended the program before it had anything to write: what the output held stays. Exit status 0.
+// A signal ended the program before it had anything to write. The output is left as it was. Exit status 0.
 class StoppedEarly {};
 
 // The reader of the output has closed the pipe. The program ends silently with exit status 0.

@@ -1,4 +1,4 @@
-// Which file a command may write over.
+// Decides which file a command may overwrite.
 #ifndef READER_OUTPUTS_H
 #define READER_OUTPUTS_H
 
@@ -8,20 +8,21 @@
 
 namespace reader {
 
-// Throws FileError if the file exists, is a regular one, and is neither empty nor begins with what
-// `looksRight` accepts; or if it is one of the inputs. `form` is for the message: "a pcapng file". True if
-// the file is new or a regular one, so that opening it leaves it empty.
+// Throws FileError if the path leads to a regular file that is one of the inputs, or that is not empty and
+// does not begin as `looksRight` wants. `form` names that beginning in the message: "a pcapng file". Returns
+// true if there is no such file yet or it is a regular one, so that opening it for output empties it; false
+// for a device or a FIFO.
 bool checkOutput(const std::string& path, std::span<const std::string> inputs, std::string_view form,
                  bool (*looksRight)(std::string_view beginning));
 
-// Throws FileError if the descriptor leads to a regular file that is one of the inputs, by whatever name:
-// what is read would grow as it is written.
+// Throws FileError if the descriptor leads to a regular file that is one of the inputs, whatever its name,
+// because that file would grow while it is read.
 void checkNoInput(int descriptor, const std::string& name, std::span<const std::string> inputs);
 
-// The first octets of a file, as far as they tell its form; nothing of one that cannot be read.
+// The first octets of a file, enough to recognise its form; empty if the file cannot be read.
 std::string beginningOf(const std::string& path);
 
-// For outputs whose form nobody can tell from their beginning: such a file must be empty.
+// The `looksRight` of outputs that cannot be recognised by their beginning. Such a file must be empty.
 inline bool looksLikeNothing(std::string_view /*beginning*/) { return false; }
 
 }  // namespace reader

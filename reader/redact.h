@@ -1,4 +1,4 @@
-// Frames without what names a person.
+// lapdread redact: writes frames without what identifies a person.
 #ifndef READER_REDACT_H
 #define READER_REDACT_H
 
@@ -11,8 +11,8 @@
 namespace reader {
 
 std::span<const OptionRow> redactOptions();
-// The key that the options name, or one that nobody keeps. Makes the file if there is none, and says so.
-// Throws UsageError, FileError or redaction::KeyError.
+// Reads the key file that the options name. If the file does not exist, makes it and says so; if the options
+// name none, makes a random key that is not stored. Throws UsageError, FileError or redaction::KeyError.
 redaction::Key redactionKey(const Options& options, Chatter& chatter);
 
 int runRedact(const Options& options, Chatter& chatter);

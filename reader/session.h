@@ -1,4 +1,4 @@
-// What every command begins with: its inputs, its output, and the way between them.
+// Opens the inputs and the output of a command, and moves the items between them.
 #ifndef READER_SESSION_H
 #define READER_SESSION_H
 
@@ -18,11 +18,10 @@
 
 namespace reader {
 
-// What the options and the terminal say about colours on this output.
+// Whether the options and the terminal allow colours on this output.
 bool useColors(const OutputOptions& options, const Output& out);
 
-// Holds what the options name. There is one in the process; the signals that end a program end its work in
-// order.
+// Owns the inputs and the output that the options name. There is one in the process.
 class Session {
   public:
     // Opens the inputs. Throws UsageError or FileError. From now on SIGINT and SIGTERM end the work in order.
@@ -38,14 +37,14 @@ class Session {
     // Says so once if frames are `done` ("decoded") by the rules of a variant that nobody has named.
     void tellGuessedVariant(std::string_view done) { tracker_.tellGuessedVariant(chatter_, done); }
 
-    // The command looks at octets and times alone: without filters nothing else has to be found out.
+    // Says that the command uses only octets and times. Without filters, the links need not be followed then.
     void needOnlyOctets() {
         if (options_.filters.empty())
             tracker_.leaveLinksAlone();
     }
 
-    // Hands all that passes the filters on to the consumer. Throws FileError for an input that cannot be
-    // read.
+    // Hands the items that pass the filters to the consumer, up to the end of the inputs. Throws FileError if
+    // an input cannot be read.
     void run(Consumer& consumer, const std::function<std::unique_ptr<Composer>()>& makeComposer);
 
   private:

@@ -28,8 +28,8 @@ struct CommandLine {
 // Throws BadCommandLine.
 CommandLine parseCommandLine(int argc, const char* const* argv);
 
-// Shows `visit` the description that parser and --help are made from; the manual page and completion are made
-// from it.
+// Calls `visit` with the description of the options. Parser and --help are made from it, and so are the
+// manual page and completion.
 void showDescription(const std::function<void(const CLI::App&)>& visit);
 
 }  // namespace relay
