@@ -17,7 +17,7 @@
 
 namespace calls {
 
-inline constexpr std::size_t outcomes = 11;  // values of Outcome
+inline constexpr std::size_t outcomes = 11;  // the number of values of Outcome
 
 // A kind of message. Those of protocols that are not known are one kind.
 struct MessageKind {
@@ -44,7 +44,7 @@ struct CauseCounts {
     std::uint64_t before = 0;  // in PROGRESS, or from a terminal that refused a call to all
 };
 
-// A time that calls are measured by.
+// A duration that is measured in each call.
 struct Measure {
     std::string_view name;  // "alerting"
     std::string_view meaning;
@@ -55,13 +55,14 @@ inline constexpr std::size_t measureCount = 7;
 
 // The calls that one side began.
 struct Traffic {
-    // Attempts to take a B channel whose result is in the trace. A SETUP that is repeated is one attempt. Not
-    // among them: calls that gave way to one of the other side (they are tried again), connections without a
-    // B channel, calls whose SETUP is not in the trace, and calls that are still being set up at its end.
+    // Attempts to take a B channel whose result is in the trace. A SETUP and its repetition are one attempt.
+    // Not counted are calls that gave way to a call of the other side (they are tried again), connections
+    // without a B channel, calls whose SETUP is not in the trace, and calls that are still being set up at
+    // its end.
     std::uint64_t seizures = 0;
     std::uint64_t answered = 0;
-    // Answered, or not for a reason that lies with the called party: busy, no answer, rejected, or hung up
-    // while it rang (E.425).
+    // Calls that were answered, or were not because of the called party: busy, no answer, rejected, or hung
+    // up while it rang (E.425).
     std::uint64_t reached = 0;
     std::uint64_t failed = 0;
     std::array<std::uint64_t, outcomes> byOutcome{};
@@ -71,7 +72,7 @@ struct Traffic {
     std::uint64_t open = 0;
     std::uint64_t setupRepeated = 0;  // calls whose SETUP was repeated
 
-    // Shares of the seizures, 0 to 1: answer-seizure ratio and network effectiveness ratio. Nothing without
+    // answer-seizure ratio and network effectiveness ratio: shares of the seizures, 0 to 1; empty without
     // seizures.
     std::optional<double> answerSeizureRatio() const;
     std::optional<double> networkEffectivenessRatio() const;
@@ -82,7 +83,7 @@ struct HourFigures {
     std::uint64_t failed = 0;
 };
 
-// Takes what a Listener hears. Memory is bounded whatever the calls are.
+// Counts what a calls::Listener is told. Memory is bounded whatever the calls are.
 class Figures {
   public:
     // The number of messages of each kind, by side.
@@ -98,7 +99,7 @@ class Figures {
 
     const Messages& messages() const { return messages_; }
     const std::map<CauseKey, CauseCounts>& causes() const { return causes_; }
-    // Calls that were cleared without a cause in the message that should have had one.
+    // How many calls were cleared without a cause in the message that should have had one.
     std::uint64_t withoutCause() const { return withoutCause_; }
     // The values of a measure, of the calls that `origin` began.
     const Durations& times(std::size_t measure, Side origin) const {

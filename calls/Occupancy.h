@@ -40,11 +40,11 @@ class Occupancy {
         std::string dChannels;  // their names
         std::map<ChannelKey, Channel> channels{};
         unsigned inUse = 0;
-        unsigned most = 0;               // channels in use at once
-        std::optional<Moment> mostAt{};  // when that was so first
+        unsigned most = 0;               // the largest number of channels in use at the same time
+        std::optional<Moment> mostAt{};  // when that number was reached first
         std::int64_t used = 0;           // nanoseconds, of all channels together
         std::int64_t heard = 0;          // nanoseconds from the first frame to the last
-        std::uint64_t unknown = 0;       // calls whose channel no message in the trace names
+        std::uint64_t unknown = 0;       // how many calls have a channel that no message in the trace names
         bool primary = false;            // there are channels of a primary rate
         bool ofT1 = false;               // the variant is one of trunks with 24 channels
 
@@ -84,8 +84,8 @@ class Occupancy {
 enum class TrunkSize : std::uint8_t { unknown, e1, t1, basic };
 // The size that the channels in use and the variant suggest; unknown if no call has used a channel.
 TrunkSize learntSize(const Occupancy::Group& group);
-// The B channels of a trunk of this size on which no call was, for each interface that calls have named: 1 to
-// 15 and 17 to 31, 1 to 23, or 1 and 2. None of an unknown size.
+// The B channels of a trunk of this size that no call has used, for each interface that calls have named. The
+// channels are 1 to 15 and 17 to 31, 1 to 23, or 1 and 2. Returns none if the size is unknown.
 std::vector<ChannelKey> neverUsed(TrunkSize size, const Occupancy::Group& group);
 
 }  // namespace calls

@@ -50,15 +50,15 @@ class sock {
     long writeblock(const void* buf, long len);
 
     // Returns 0 when the frame has been sent. Returns -1 and sends nothing if the size of a part is below 0
-    // or above msg_t::Largest.
+    // or above msg_t::largest.
     long snd_msg(const msg_t& m);
     // Receives a frame. Returns 0 for a good frame and -1 otherwise. In both cases the caller owns the parts
     // and frees them with free_msg; a part that is missing is a null pointer.
     //
-    // A part above msg_t::Largest is read, so that the next frame is found, and the result is -1. If a size
+    // A part above msg_t::largest is read, so that the next frame is found, and the result is -1. If a size
     // is negative or there is no memory for a part, this is reported on the standard error stream, and the
     // result is -1; the parts are not read, so the next call takes them for a frame. A part above ten times
-    // msg_t::Largest is treated like that as well, and the error flag is set.
+    // msg_t::largest is treated like that as well, and the error flag is set.
     long get_msg(msg_t& m);
 
     bool failed() const { return error_.load() != 0; }

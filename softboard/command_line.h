@@ -27,8 +27,8 @@ struct CommandLine {
 // `arguments` are those of the launcher, without argv[0]. Throws BadInput.
 CommandLine parseCommandLine(const std::vector<std::string>& arguments);
 
-// Shows `visit` the description that parser and --help are made from; the manual page and completion are made
-// from it.
+// Calls `visit` with the description of the options. Parser and --help are made from it, and so are the
+// manual page and completion.
 void showDescription(const std::function<void(const CLI::App&)>& visit);
 
 // Makes the scenario that the command line asks for: reads the scenario file and the captures, and makes the

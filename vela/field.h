@@ -114,7 +114,7 @@ concept ScalarField = requires {
     T::wire;
 }
 &&!requires { T::isArray; };
-// Its value is handed to the field behind it, which depends on it.
+// A field whose value the next field depends on. It is handed to that field.
 template <typename T>
 concept AnnouncingField = requires {
     T::announces;
