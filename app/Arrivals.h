@@ -62,8 +62,8 @@ class Arrivals : public vela::Lane {
     // How many records wait, are delivered, are queued or are being written; 0 when all that have arrived are
     // written.
     std::uint64_t unwritten() const { return pending() + alsoAtWork(); }
-    // How many records were lost of which no record tells (MsgBody::arrival). Those that the queue has
-    // refused are not among them. Call it when no delivery runs any more.
+    // How many records were lost without a record that tells of them (MsgBody::arrival). Those that the queue
+    // has refused are not counted. Call it when no delivery runs any more.
     std::uint64_t untold() const { return missing() + untold_; }
     // How many records were lost because the system had no thread or no memory.
     std::uint64_t lostForWantOfMeans() const { return losses().noMeans + refused_; }

@@ -1,4 +1,5 @@
-// Which elements a message must have, and which may stand in it more than once (Q.931 3.1, 4.5).
+// The rules for the elements of a message: which it must have, and which may occur more than once (Q.931 3.1,
+// 4.5).
 #ifndef CALLS_ELEMENTRULES_H
 #define CALLS_ELEMENTRULES_H
 

@@ -72,7 +72,7 @@ struct Traffic {
     std::uint64_t open = 0;
     std::uint64_t setupRepeated = 0;  // calls whose SETUP was repeated
 
-    // answer-seizure ratio and network effectiveness ratio: shares of the seizures, 0 to 1; empty without
+    // Answer-seizure ratio and network effectiveness ratio: shares of the seizures, 0 to 1; empty without
     // seizures.
     std::optional<double> answerSeizureRatio() const;
     std::optional<double> networkEffectivenessRatio() const;

@@ -20,7 +20,7 @@ namespace calls {
 
 // An answer counts as missing only if the timer ran out within the trace, the link was up all the time, the
 // receiver's link layer acknowledged the question, and no frame of the answering side is missing. Otherwise
-// it cannot be told, and a note says why. Nothing is said while only one direction has been seen.
+// it cannot be told, and a note says why. Nothing is reported while only one direction has been seen.
 class Waits : public CallObserver {
   public:
     Waits(const Timers& timers, const LinkWitnesses& links, FindingSink& sink)

@@ -46,8 +46,8 @@ std::string toString(const Place& place);
 inline constexpr std::int64_t nanosecondsPerTick = 4'000'000;  // of the board's clock
 
 struct Frame {
-    // Address, control and information, without the check sequence. They belong to whoever gave the frame
-    // and are valid until the next one is asked for; Batch keeps copies.
+    // Address, control and information, without the check sequence. The reader that gave the frame owns them,
+    // and they are valid until it is asked for the next item; Batch keeps copies.
     std::span<const std::uint8_t> octets;
     // Whether our side sent the frame. If the input does not tell directions, the user side counts as ours
     // (Directions), and `role` is user.

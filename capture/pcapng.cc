@@ -197,7 +197,7 @@ void PcapngParser::readSimple() {
     readPacket(*on, {packetOctets(fields, captured), original, std::nullopt, 0}, {});
 }
 
-// What stands in comments comes before the frame.
+// Items in the comments of a packet come before its frame.
 void PcapngParser::readPacket(DescribedInterface& on, const Packet& packet, std::string_view optionOctets) {
     std::optional<bool> told;
     Note ofFrame;

@@ -33,7 +33,7 @@ Framing::Next Framing::next() {
     return Next::block;
 }
 
-// The order of a section's length is known only from what stands behind it.
+// The order of octets in a section's length is known only from the word after it.
 Framing::Next Framing::readHeader(std::size_t& size) {
     Source::State state = source_.want(headerSize);
     if (state == Source::State::ready && numberAt<std::uint32_t>(source_.held(), 0, order_) == sectionHeader)

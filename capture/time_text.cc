@@ -22,7 +22,7 @@ bool take(std::string_view& text, char c) {
     return true;
 }
 
-// ".300" as nanoseconds; digits beyond the ninth are passed over. 0 when there is none.
+// ".300" as nanoseconds; digits after the ninth are ignored. 0 if there is no fraction.
 std::int64_t takeFraction(std::string_view& text) {
     if (text.size() < 2 || text[0] != '.' || !isDigit(text[1]))
         return 0;

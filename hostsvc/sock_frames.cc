@@ -13,7 +13,7 @@ namespace {
 constexpr int convertedSize = 24;  // octets to convert: the header, and a word that is not sent
 using Header = std::array<char, convertedSize>;
 
-// A part above msg_t::Largest is read, so that the next frame is found. A part above this size is not: it is
+// A part above msg_t::largest is read, so that the next frame is found. A part above this size is not: it is
 // an attack, or the two ends have lost the boundary of frames.
 constexpr std::int32_t largestRead = 10 * msg_t::largest;
 

@@ -23,7 +23,8 @@ std::string_view toString(BerProblem problem) {
 // A value whose contents are being read.
 struct BerTree::Container {
     std::size_t index;  // of the value
-    std::size_t end;    // where its octets end; for indefinite lengths where those of the value around it do
+    // where its octets end; if its length is indefinite, where those of the enclosing value end
+    std::size_t end;
 };
 
 struct BerTree::Parser {
@@ -80,7 +81,7 @@ void BerTree::Parser::value() {
     value.depth = static_cast<std::uint16_t>(open.size());
     value.problem = problemOf(value);
     if (value.problem != BerProblem::none) {
-        // Nothing behind it can be found: it takes what is left.
+        // The values after it cannot be found, so it takes all octets that are left.
         value.contents = at;
         value.length = limit() - at;
         at = limit();

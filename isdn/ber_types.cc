@@ -58,13 +58,14 @@ std::string numberWords(Octets contents, std::span<const BerName> names) {
 
 std::string characters(Octets contents) { return {contents.begin(), contents.end()}; }
 
-// Octets that spell something: nobody can be told what a value is without a type, but a name shows.
+// Whether the octets look like characters. Without a type the meaning of a value is not known, but a name can
+// be recognised.
 bool spell(Octets contents) {
     return contents.size() >= 3 &&
            std::ranges::all_of(contents, [](std::uint8_t octet) { return octet >= 0x20 && octet < 0x7F; });
 }
 
-// The kind of type that a universal tag names, for values of which nothing else is known.
+// The kind of type that a universal tag names. It is used if nothing else is known about the value.
 std::optional<Kind> kindOf(BerTag tag) {
     if (tag.tagClass != BerClass::universal)
         return std::nullopt;
@@ -134,7 +135,7 @@ void BerMeanings::tellContents(std::size_t index, const BerType& type) {
     }
 }
 
-// Each value is the next member that it can be; the members between are absent.
+// Assigns each value to the next member that it can be. The members before that one are absent.
 void BerMeanings::tellSequence(std::size_t index, std::span<const BerMember> members) {
     auto next = members.begin();
     for (const std::size_t child : tree_->childrenOf(index)) {

@@ -65,14 +65,14 @@ class Engine {
                  (first.place.repeat == Place::Repeat::toEnd && !rest_.empty()));
     }
 
-    // A group that does not end may have swallowed what follows it.
+    // Marks fields as doubtful: if a group does not end, its octets may belong to what follows.
     void doubtFrom(std::size_t index) {
         for (auto field = fields_.begin() + static_cast<std::ptrdiff_t>(index); field != fields_.end();
              ++field)
             field->doubtful = true;
     }
-    // The octet of this label announces more octets than there are. It is wrong, and what follows it may be
-    // anything.
+    // The octet with this label announces more octets than there are. It is wrong, so the fields after it are
+    // marked as doubtful.
     void doubtBehind(std::string_view label) {
         for (auto field = fields_.end(); field != fields_.begin() && (--field)->octet != label;)
             field->doubtful = true;
@@ -198,7 +198,8 @@ class Engine {
         note(row.place.reader(contents, fields_));
     }
 
-    // What is left when the rows are used up, or not to be used. It is numbered on from the last octet.
+    // Appends the octets that are left after the rows, or all octets if the rows must not be used. Their
+    // numbers continue that of the last octet.
     Problem takeRest(bool isPersonal) {
         if (rest_.empty())
             return problem_;
@@ -240,7 +241,7 @@ class Engine {
     Seen seen_;
     Problem problem_ = Problem::none;
     bool open_ = false;       // the last octet said that its group goes on
-    bool understood_ = true;  // the coding standard is one that the names are of
+    bool understood_ = true;  // the names belong to the coding standard of the element
 };
 
 }  // namespace

@@ -81,7 +81,7 @@ void Facility::readValues() {
         const BerValue& value = values[index];
         if (value.tag.tagClass != BerClass::context)
             continue;
-        // Components of private networks stand behind these whatever the profile says.
+        // After these, the components belong to private networks, whatever the profile is.
         if (value.tag.number == extensionTag || value.tag.number == interpretationTag)
             family_ = facility::Family::privateNetwork;
         if (value.tag.number >= 1 && value.tag.number <= 4 && value.constructed)
@@ -170,7 +170,7 @@ void Facility::readInvoke(Component& component, const std::vector<std::size_t>& 
         meanings_.tell(*next, {"", component.operation->argument});
 }
 
-// X.880 9.3 and 9.4: a result stands in a SEQUENCE with its operation, an error has its parameter beside it.
+// X.880 9.3 and 9.4: a result is in a SEQUENCE with its operation, and an error is followed by its parameter.
 void Facility::readAnswer(Component& component, const std::vector<std::size_t>& children) {
     std::vector<std::size_t> parts = children;
     const bool isError = component.kind == Component::Kind::error;

@@ -23,7 +23,7 @@ std::string nameOf(const BerMeaning& meaning, BerTag tag) {
 struct Facility::Fielder {
     const Facility& facility;
     Fields& fields;
-    std::string_view clause = ofComponents;  // of the value that is being appended
+    std::string_view clause = ofComponents;  // the clause for the value that is being appended
 
     // Octets of the contents from `from` to `to`; octet 3 of the element is the first of them.
     Field field(std::size_t from, std::size_t to, std::string_view name, Field::Kind kind) {
@@ -106,7 +106,7 @@ void Facility::Fielder::contents(const BerValue& value, const BerMeaning& meanin
 void Facility::Fielder::value(const BerValue& value, const BerMeaning& meaning) {
     if (value.contents > value.offset)
         header(value, meaning);
-    // The contents of a constructed value are values themselves, unless it could not be looked into.
+    // The contents of a constructed value are values themselves, unless they could not be read.
     const bool lookedInto =
         value.constructed && (value.problem == BerProblem::none || value.problem == BerProblem::noEnd);
     if (!lookedInto && value.length > 0)

@@ -6,7 +6,7 @@
 
 namespace isdn::facility {
 
-// A BOOLEAN; an INTEGER, of which the operation's name says what it counts.
+// A BOOLEAN, and an INTEGER; the operation's name says what the number counts.
 extern const BerType truth, number;
 
 // Advice of charge (EN 300 182-1).

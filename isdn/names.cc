@@ -1,4 +1,4 @@
-// Names of values that others than tables ask for as well.
+// Names of values that not only the tables use.
 #include "isdn/Table.h"
 #include "isdn/values.h"
 
@@ -83,7 +83,8 @@ constexpr Name causes[] = {
     {127, "interworking, unspecified"},
 };
 
-// Q.850 2.2.3. "Local" and "remote" are as the user sees it to whom the network speaks.
+// Q.850 2.2.3. "Local" and "remote" are meant from the point of view of the user to whom the network sends
+// the cause.
 constexpr Name locations[] = {
     {0, "user"},
     {1, "local private network"},

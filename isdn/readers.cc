@@ -146,7 +146,7 @@ constexpr Row displayTypeRows[] = {
     personal({"4", rest(readCharacters), "display", {}, optional}),
 };
 
-constexpr std::uint8_t callAppearance = 0x94;  // of the tags: no characters, and nobody's name
+constexpr std::uint8_t callAppearance = 0x94;  // the tag whose contents are no characters and identify nobody
 constexpr Row displayKindRows[] = {{"3", bits(7, 1), "kind of display"}};
 
 // The fields of a display, as North American switches send them to their terminals.

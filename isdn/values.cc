@@ -36,7 +36,8 @@ unsigned groupSize(std::uint8_t id) {
     }
 }
 
-// Octets of a group that no table knows, as the engine skips them: up to one with bit 8 set, if it is near.
+// The number of octets of a group that no table knows: up to the next one with bit 8 set, if it is near. The
+// engine skips the same octets.
 std::size_t unknownExtensions(Octets rest) {
     constexpr std::size_t most = 4;
     for (std::size_t i = 0; i < std::min(rest.size(), most); ++i) {
@@ -46,7 +47,7 @@ std::size_t unknownExtensions(Octets rest) {
     return 0;
 }
 
-// What follows the octets of a group whose last known octet is the first of `octets`.
+// The octets after a group. The first of `octets` is the last octet of the group that is known.
 Octets behindGroup(Octets octets) {
     const Octets rest = octets.subspan(1);
     return goesOn(octets[0]) ? rest.subspan(unknownExtensions(rest)) : rest;

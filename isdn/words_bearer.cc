@@ -11,14 +11,14 @@ namespace isdn::wording {
 
 namespace {
 
-// What follows a group of octets, of which all but the last have bit 8 clear.
+// The octets after a group, whose last octet has bit 8 set.
 Octets behindGroup(Octets octets) {
     const auto last = std::ranges::find_if(octets, [](std::uint8_t octet) { return (octet & 0x80U) != 0; });
     return last == octets.end() ? Octets()
                                 : octets.subspan(static_cast<std::size_t>(last - octets.begin()) + 1);
 }
 
-// Octets 4 and following of a bearer, and what they say.
+// The contents of octet 4 and the following octets of a bearer.
 struct Transfer {
     explicit Transfer(Octets contents) : octet4(behindGroup(contents)) {
         if (octet4.empty())

@@ -14,7 +14,7 @@ constexpr std::int64_t ticksPerSecond = perSecond / nanosecondsPerTick;
 constexpr std::int64_t ticksPerMinute = 60 * ticksPerSecond;
 constexpr std::int64_t mostFall = 2;  // 8 ms: frames out of order
 
-// In ticks: how far host and board may part between two frames of one trace, and over a wrap.
+// How far host and board clock may differ between two frames of one trace, and over a wrap, in ticks.
 constexpr std::int64_t closeBy = 10 * ticksPerSecond;
 constexpr std::int64_t overAWrap = 3600 * ticksPerSecond;
 
@@ -37,7 +37,7 @@ void BoardClock::Envelope::add(std::int64_t minute, std::int64_t difference) {
     }
 }
 
-// In ticks: forward, or back by a little.
+// The ticks since the last frame: forward, or a few backwards.
 std::int64_t BoardClock::Track::since(std::uint32_t next) const {
     const auto last = static_cast<std::uint32_t>(ticks);
     if (next < last && last - next <= mostFall)
@@ -73,8 +73,8 @@ BoardClock::Verdict BoardClock::take(std::uint32_t ticks, std::int64_t host) {
             verdict = Verdict::otherTrace;
         } else {
             const bool falls = !current_.goesOn(ticks, host);
-            // A clock that stays behind the host's goes on: the text was written late. One that runs ahead
-            // starts anew.
+            // If the board's clock stays behind the host's, it has gone on, and the text was written late. If
+            // it runs ahead, a new offset begins.
             other_ = current_;
             if (falls || current_.lead(ticks, host) > 0)
                 current_ = {};

@@ -15,7 +15,7 @@ constexpr std::array<std::string_view, 12> months{"Jan", "Feb", "Mar", "Apr", "M
                                                   "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
 constexpr std::array<std::string_view, 7> weekdays{"Sun", "Mon", "Tue", "Wed", "Thu", "Fri", "Sat"};
 
-// Where the parts of a date stand.
+// The places of the parts of a date.
 constexpr std::size_t monthAt = 4;
 constexpr std::size_t dayAt = 8;
 constexpr std::size_t hourAt = 11;
@@ -23,7 +23,7 @@ constexpr std::size_t minuteAt = 14;
 constexpr std::size_t secondAt = 17;
 constexpr std::size_t yearAt = 20;
 
-// Below 0 for what is no number.
+// A number of so many digits; negative if the text is no number.
 int numberAt(std::string_view date, std::size_t at, std::size_t digits) {
     int number = 0;
     for (const char c : date.substr(at, digits)) {
@@ -84,7 +84,8 @@ bool isLocally(std::int64_t seconds, const std::tm& wanted) {
 
 }  // namespace
 
-// A time that summer time leaves out was written in another zone: the rules say what becomes of it.
+// A time that does not exist, because summer time leaves it out, was written in another zone. The zone's
+// rules decide what it becomes.
 bool HostTime::setMinute(std::string_view date) {
     const std::optional<std::tm> time = minuteOf(date);
     if (!time)

@@ -38,7 +38,7 @@ class LogParser final : public capture::Parser {
     Reader::Next next(Item& item) override;
 
   private:
-    // What stands at the window's beginning. An item's size is then in found_.
+    // What was found at the beginning of the window. The size of an item is in found_.
     enum class Found : std::uint8_t {
         item,
         more,  // more text could make an item of it
@@ -65,7 +65,7 @@ class LogParser final : public capture::Parser {
     Source& source_;
     capture::Interfaces& interfaces_;
     const capture::Interface* interface_;
-    bool isChosen_;  // the variant, by whoever reads
+    bool isChosen_;  // the user has chosen the variant
     HostTime hostTime_;
     BoardClock clock_;
     Prover prover_;
@@ -75,14 +75,14 @@ class LogParser final : public capture::Parser {
     std::size_t found_ = 0;
     std::size_t toConsume_ = 0;
     bool isDoubtful_ = false;   // the frame found last would be another one if its dump went on
-    std::vector<Item> before_;  // what is to be said before a frame; then, when something is, the frame
+    std::vector<Item> before_;  // items that come before a frame, and then the frame itself
     std::size_t shown_ = 0;
     std::string text_;
     bool saidMixed_ = false;
 
     bool isUnproved_ = false;  // find() has found time lines, and no proof
     Item unproved_;
-    // Lines in front of the window that prove nothing, and what they begin with.
+    // The number of lines before the window that prove nothing, and the text of the first.
     std::uint64_t passedLines_ = 0;
     bool passesFrame_ = false;
     Item passed_;
@@ -153,7 +153,7 @@ LogParser::Found LogParser::findBetween(std::string_view text, bool isAll, Item&
     return Found::item;
 }
 
-// `text` begins behind the time lines.
+// `text` begins after the time lines.
 LogParser::Found LogParser::findFrame(std::string_view text, const Header& header, bool isAll, Item& item) {
     const auto host = hostTime_.of(header.written, clock_.expected(header.ticks));
     if (!host)
@@ -177,8 +177,7 @@ LogParser::Found LogParser::findFrame(std::string_view text, const Header& heade
     return isUnproved_ ? Found::nothing : Found::item;
 }
 
-// A frame that is proved by another variant than the last ones tells that the variant is another one from
-// here on.
+// If another variant than before proves a frame, the log has that variant from here on.
 Prover::Proof LogParser::prove(std::string_view text, const Header& header, bool isAll) {
     const auto proveBy = [&](Variant variant) {
         return prover_.prove(text, header.transmitted, variant, isAll, untitledFrom(header.size));
@@ -197,7 +196,7 @@ Prover::Proof LogParser::prove(std::string_view text, const Header& header, bool
     return proveBy(interface_->variant);
 }
 
-// How far behind this place of the window it is known that no title of a dump begins.
+// Up to which place, counted from this place of the window, it is known that no title of a dump begins.
 std::size_t LogParser::untitledFrom(std::size_t at) const {
     return untitled_ > position_ + at ? static_cast<std::size_t>(untitled_ - position_ - at) : 0;
 }

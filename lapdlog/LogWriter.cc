@@ -77,7 +77,7 @@ void LogWriter::compose(const Item& item) {
     }
 }
 
-// Without the line of the variant where a run did not get as far.
+// Leaves out the line of the variant if it is unknown, because the run did not get so far.
 void LogWriter::composeHead(Variant variant) {
     hasHead_ = true;
     decoder::text("\n", decoder::logTitle, "\n", decoder::logNotice, "\n", decoder::logVersion, "\n",
@@ -108,7 +108,7 @@ Variant LogWriter::variantOf(const Item& item) const {
     return told == Variant::unknown ? fallback_ : told;
 }
 
-// A clock that is set back stands still.
+// If the clock was set back, the ticks do not change.
 std::uint32_t LogWriter::ticksOf(const Frame& frame) {
     if (frame.ticks)
         return *frame.ticks;

@@ -28,7 +28,7 @@ std::size_t findDump(std::string_view text, std::size_t from) {
                             : static_cast<std::size_t>(static_cast<const char*>(found) - text.data());
 }
 
-// What stands in place of layers and dump.
+// Reads the line that an oversized frame has instead of layers and dump.
 Reading readOversized(std::string_view text, bool transmitted, std::size_t& size) {
     const std::string_view before = transmitted ? indent : std::string_view();
     return readPieces(text, {before, decoder::oversizedFrame, " \n", before, decoder::frameError, " \n"},
@@ -37,7 +37,7 @@ Reading readOversized(std::string_view text, bool transmitted, std::size_t& size
 
 }  // namespace
 
-// Reads the octets behind a dump's title, and sets `at` behind them.
+// Reads the octets after a dump's title, and moves `at` past them.
 Prover::Dump Prover::readDump(std::string_view text, std::size_t& at, bool transmitted) {
     constexpr std::size_t octetsInLine = 10;
     constexpr std::size_t octetSize = 3;

@@ -13,7 +13,7 @@ constexpr std::uint64_t ticksPerSecond = 250;
 constexpr std::uint64_t millisecondsPerTick = 4;
 constexpr std::uint64_t mostTicks = 0xffffffff;
 
-// Goes over a text as long as it agrees with what is expected.
+// Reads a text as long as it agrees with what is expected.
 class Scan {
   public:
     explicit Scan(std::string_view text) : rest_(text) {}
@@ -27,7 +27,7 @@ class Scan {
             reading_ = words.starts_with(rest_) ? Reading::cut : Reading::bad;
     }
 
-    // So many characters, none of them a line feed.
+    // Takes this many characters, none of which may be a line feed.
     std::string_view takeText(std::size_t size) {
         if (reading_ != Reading::good)
             return {};
@@ -100,7 +100,8 @@ Reading readPieces(std::string_view text, std::initializer_list<std::string_view
     return Reading::good;
 }
 
-// A counter of 8 bits, which a piece cannot pass, is what the compiler counts 16 at a time with.
+// Counts each piece of the text in 8 bits, which suffice for a piece, because the compiler can then count 16
+// characters at a time.
 std::uint64_t lineEndsIn(std::string_view text) {
     constexpr std::size_t pieceSize = 255;
     std::uint64_t all = 0;

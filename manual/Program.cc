@@ -8,7 +8,7 @@ namespace manual {
 
 namespace {
 
-// "auto|always|never|N": the words that stand for themselves. Words in capitals stand for something else.
+// The words of "auto|always|never|N" that are values. Words in capitals stand for a value.
 std::vector<std::string> choicesOf(const std::string& form) {
     std::vector<std::string> choices;
     std::istringstream words(form);

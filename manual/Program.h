@@ -1,5 +1,5 @@
-// A program as its manual pages and completion tell it: read from the description that also makes its parser
-// and --help.
+// What manual pages and completion need to know about a program. It is read from the description from which
+// parser and --help are made.
 #ifndef MANUAL_PROGRAM_H
 #define MANUAL_PROGRAM_H
 

@@ -8,8 +8,8 @@ namespace manual {
 
 namespace {
 
-// The call references of the first file on the command line, of its first 2000 frames: enough to be of use,
-// and quick with a log of any size.
+// The call references in the first 2000 frames of the first file on the command line. That is enough to be
+// useful, and quick with a log of any size.
 constexpr char callReferences[] = R"(
 _@PROGRAM@_references() {
     local word
@@ -22,7 +22,7 @@ _@PROGRAM@_references() {
 }
 )";
 
-// Behind "--" stand a program and its words.
+// After "--" come a program and its arguments.
 constexpr char anotherProgram[] = R"(
     local i
     for ((i = 1; i < COMP_CWORD; ++i)); do

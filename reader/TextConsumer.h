@@ -1,4 +1,4 @@
-// Writes composed text, with the time between lines filled in.
+// Writes composed text, and fills in the time between lines.
 #ifndef READER_TEXT_CONSUMER_H
 #define READER_TEXT_CONSUMER_H
 
@@ -11,7 +11,8 @@ class TextConsumer : public Consumer {
   public:
     enum class Raw { no, yes };
 
-    // Text that holds octets of frames as they are is raw: a terminal gets them in a readable form.
+    // `raw`: the text contains octets of frames as they are. They are written in a readable form if the
+    // output is a terminal.
     explicit TextConsumer(Output& out, Raw raw = Raw::no)
         : out_(out), harmless_(raw == Raw::yes && out.isTerminal()) {}
 
@@ -24,7 +25,7 @@ class TextConsumer : public Consumer {
 
     Output& out_;
     bool harmless_;
-    Instant before_;  // of the last piece that has a time
+    Instant before_;  // the time of the last piece that has one
 };
 
 }  // namespace reader

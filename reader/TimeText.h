@@ -1,4 +1,4 @@
-// Times as people read them, and times that people type.
+// Writes times for people, and reads times that people type.
 #ifndef READER_TIME_TEXT_H
 #define READER_TIME_TEXT_H
 
@@ -25,12 +25,12 @@ struct Instant {
 // start. Throws UsageError for a zone that the system does not know.
 void useTimeZone(const std::string& zone);
 
-// Writes times in the process's local time. Remembers the last minute, since looking an offset up takes
-// longer than writing the rest. Not shared between threads.
+// Writes times in the process's local time. Remembers the last minute, because looking up its offset takes
+// longer than writing the rest. Used by one thread.
 class TimeText {
   public:
-    // "2026-11-21T11:25:33.300+01:00"; of a relative clock seconds, "12.300"; "-" without a clock.
-    // Parts of a millisecond are cut off.
+    // Appends "2026-11-21T11:25:33.300+01:00", or seconds, "12.300", for a relative clock, or "-" without a
+    // clock. Parts of a millisecond are cut off.
     void append(std::string& to, Instant instant);
 
   private:
@@ -42,7 +42,8 @@ class TimeText {
     char offset_[8] = {};  // "+01:00"
 };
 
-// Signed seconds with three digits: "0.040", "-1.000". Parts of a millisecond are cut off towards zero.
+// Appends signed seconds with three digits: "0.040", "-1.000". Parts of a millisecond are cut off towards
+// zero.
 void appendSeconds(std::string& to, std::int64_t nanoseconds);
 
 // What a user may give as a time: an ISO date with or without time and offset (local time without), a time of
@@ -52,8 +53,8 @@ class TimePoint {
     // Throws UsageError.
     explicit TimePoint(const std::string& text);
 
-    // The point on the clock of a stream whose first frame has this time. Nothing if it cannot be told: a
-    // date, for a stream of relative times.
+    // The point on the clock of a stream whose first frame has the time `first`. Nothing if that is unknown,
+    // as for a date and a stream of relative times.
     std::optional<std::int64_t> on(Instant first) const;
 
   private:

@@ -1,4 +1,4 @@
-// What the frames before it say about a frame: its number, our side's role, the state of its link.
+// Finds out what the earlier frames say about a frame: its number, our side's role, the state of its link.
 #ifndef READER_TRACKER_H
 #define READER_TRACKER_H
 
@@ -20,25 +20,25 @@ namespace reader {
 // Sees every item of a run, in order, before any filter.
 class Tracker {
   public:
-    // Role and variant of the options hold over those of the frames.
+    // A role or a variant in the options replaces those of the frames.
     explicit Tracker(const InputOptions& options) : role_(options.role), variant_(options.variant) {}
 
-    // From now on a variant that neither options nor input name is said to be a guess, once.
+    // From now on, says once if frames have a variant that neither the options nor the input names.
     void tellGuessedVariant(Chatter& chatter, std::string_view done) {
         chatter_ = &chatter;
         done_ = done;
     }
 
-    // From now on frames are numbered and nothing else: links take time, and not every command asks for them.
+    // From now on only numbers frames. Following the links takes time, and not every command needs it.
     void leaveLinksAlone() { followsLinks_ = false; }
     bool followsLinks() const { return followsLinks_; }
 
-    // How many have been numbered.
+    // How many frames have been numbered.
     std::uint64_t frames() const { return frames_; }
-    // Whether something has come from a D channel of this name.
+    // Whether an item has come from a D channel of this name.
     bool knows(const std::string& dChannel) const { return channels_.contains(dChannel); }
 
-    // The headers themselves are left to whoever looks at the frame, see readHeaders.
+    // Does not read the headers of the frame; readHeaders does, on the thread that needs them.
     Seen see(const capture::Item& item);
 
   private:
@@ -61,12 +61,12 @@ class Tracker {
     std::optional<std::int64_t> first_;  // on the clocks of the D channels
     using Channels = std::map<std::string, Channel, std::less<>>;
     Channels channels_;                     // by the name of the D channel
-    Channels::value_type* last_ = nullptr;  // that of the last item
-    Chatter* chatter_ = nullptr;            // null once the guess was told, or if it need not be
+    Channels::value_type* last_ = nullptr;  // the channel of the last item
+    Chatter* chatter_ = nullptr;            // null if nothing has to be said any more
     std::string_view done_;
 };
 
-// Reads link header and message of the octets as they stand now.
+// Reads the link header and the message from the frame's octets.
 void readHeaders(Seen& seen);
 
 }  // namespace reader

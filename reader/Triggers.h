@@ -1,4 +1,4 @@
-// What makes `record` keep the frames around it: findings, and frames that a filter would show.
+// Finds the triggers around which `record` keeps frames: findings, and frames that a filter would show.
 #ifndef READER_TRIGGERS_H
 #define READER_TRIGGERS_H
 
@@ -16,11 +16,10 @@
 
 namespace reader {
 
-// Adds what a value of --on means to the options: "check:warning", "cause:34,38", "number:112". Throws
-// UsageError.
+// Adds a value of --on to the options: "check:warning", "cause:34,38", "number:112". Throws UsageError.
 void readTrigger(const std::string& value, RecordOptions& to);
 
-// Sees every item of a run, with its headers read. Used by one thread.
+// Sees every item of a run. Its headers must have been read. Used by one thread.
 class Triggers : private calls::Listener {
   public:
     struct Fired {
@@ -30,17 +29,17 @@ class Triggers : private calls::Listener {
 
     explicit Triggers(const Options& options);
 
-    // Whether anything can trigger; the functions below need not be called otherwise.
+    // Whether anything can trigger. If not, the functions below need not be called.
     bool areThere() const { return analysis_ != nullptr || !wanted_.empty(); }
 
-    // What this item triggers, or shows to have happened. Valid until the next call.
+    // The triggers that this item is, or that it shows to have happened. Valid until the next call.
     std::span<const Fired> look(const Seen& seen);
-    // No item has come, but so many nanoseconds have passed.
+    // So many nanoseconds have passed without an item. Returns the triggers that this shows.
     std::span<const Fired> advance(std::int64_t nanoseconds);
 
   private:
     struct Wanted {
-        std::string words;  // as they were typed
+        std::string words;  // the words as the user typed them
         Filter filter;
     };
 

@@ -1,4 +1,4 @@
-// Two series side by side.
+// Aligns two series of messages.
 #ifndef READER_ALIGN_H
 #define READER_ALIGN_H
 
@@ -10,7 +10,7 @@
 
 namespace reader {
 
-// A member of a series: only members of one kind can stand beside each other, and preferably equal ones do.
+// A member of a series. Only members of the same kind can be paired, and equal ones are preferred.
 struct Token {
     std::uint32_t kind;
     std::uint32_t content;  // equal for equal members
@@ -22,9 +22,10 @@ struct AlignedPair {
     bool operator==(const AlignedPair&) const = default;
 };
 
-// The pairs, in order, such that their number is the largest, and of all such choices one with most equal
-// pairs (the longest common subsequence, weighted). Memory grows with the length of the series, time with the
-// product of what is left between their common beginning and end; nothing if that is beyond 400 million.
+// Returns the pairs in order. Their number is the largest possible, and among all such choices the number of
+// equal pairs is the largest (a weighted longest common subsequence). Memory grows with the length of the
+// series. Time grows with the product of the lengths between their common beginning and end; returns nothing
+// if that product is above 400 million.
 std::optional<std::vector<AlignedPair>> align(std::span<const Token> a, std::span<const Token> b);
 
 }  // namespace reader

@@ -1,4 +1,4 @@
-// What is wrong with links, calls and channels.
+// lapdread check: shows what is wrong with links, calls and channels.
 #ifndef READER_CHECK_H
 #define READER_CHECK_H
 
@@ -9,12 +9,12 @@
 
 namespace reader {
 
-// "note", "warning", "error". Throws UsageError.
+// Reads "note", "warning" or "error". Throws UsageError for anything else.
 calls::Severity severityNamed(const std::string& name);
 
 class Chatter;
 
-// Returns `found` if a finding is as severe as --fail-on says.
+// Returns the exit status `found` if a finding has the severity of --fail-on or a worse one.
 int runCheck(const Options& options, Chatter& chatter);
 std::span<const OptionRow> checkOptions();
 

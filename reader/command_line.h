@@ -1,4 +1,4 @@
-// The command line of lapdread: what it says, and which options there are.
+// Parses the command line of lapdread.
 #ifndef READER_COMMAND_LINE_H
 #define READER_COMMAND_LINE_H
 
@@ -25,11 +25,12 @@ struct CommandLine {
     Options options;
 };
 
-// Without argv[0]. The first word may name a command; without one it is `list`. Throws UsageError.
+// `words` are without argv[0]. The first word may name a command; if it does not, the command is `list`.
+// Throws UsageError.
 CommandLine parseCommandLine(std::vector<std::string> words);
 
-// Shows `visit` the description that parser and --help are made from; manual pages and completion are made
-// from it.
+// Calls `visit` with the description of the options. Parser and --help are made from it, and so are manual
+// pages and completion.
 void showDescription(const std::function<void(const CLI::App&)>& visit);
 
 }  // namespace reader

@@ -13,18 +13,18 @@ class Chatter;
 
 struct Command {
     std::string_view name;
-    std::string_view words;     // what follows the options: "[FILE...]"
-    std::string_view summary;   // a line
+    std::string_view words;     // the words after the options: "[FILE...]"
+    std::string_view summary;   // one line
     std::string_view examples;  // "  lapdread ...\n      what it does\n"
-    OptionGroup options;        // those that not every command has
+    OptionGroup options;        // the options that not every command has
     // Returns the exit status; throws UsageError, FileError or ReaderGone.
     int (*run)(const Options&, Chatter&);
 };
 
-// In the order in which --help shows them; the first is run when none is named.
+// All commands, in the order in which --help shows them. The first is run if the command line names none.
 std::span<const Command> commands();
 
-// Null if there is none of this name.
+// The command of this name, or null.
 const Command* commandNamed(std::string_view name);
 
 }  // namespace reader

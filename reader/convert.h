@@ -1,4 +1,4 @@
-// Frames in files that other tools read.
+// lapdread convert: writes frames into files for other tools.
 #ifndef READER_CONVERT_H
 #define READER_CONVERT_H
 

@@ -1,4 +1,4 @@
-// One row a frame, for spreadsheets (RFC 4180, but with line feeds alone).
+// Writes a row for each frame, for spreadsheets (RFC 4180, but lines end with a line feed only).
 #ifndef READER_CSV_H
 #define READER_CSV_H
 
@@ -12,10 +12,9 @@ namespace reader {
 // The first line, with its line end.
 std::string_view csvHeader();
 
-// Only frames have rows; numbers are decimal, "callref" and "hex" hexadecimal.
-// Appends a value, quoted if it has to be. What a spreadsheet would take for a formula stays one: numbers
-// like
-// "+49" are data.
+// Only frames have rows; numbers are decimal, "callref" and "hex" hexadecimal. Appends a value, quoted if
+// necessary. Values that a spreadsheet would take for a formula are not changed, because numbers like "+49"
+// are data.
 void appendCsvValue(std::string& to, std::string_view value);
 
 class CsvComposer : public Composer {

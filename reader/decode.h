@@ -1,4 +1,4 @@
-// Frames in the words of lapdmon's log.
+// lapdread decode: writes frames as lapdmon's log has them.
 #ifndef READER_DECODE_H
 #define READER_DECODE_H
 
@@ -7,9 +7,9 @@
 
 namespace reader {
 
-// Composes the text that lapdmon writes for an item, by the same code: a frame's block, or the line that
-// stands for a loss. Other items give no text. One object is used by one thread, and none by two: the
-// decoder's words are the thread's own.
+// Composes the text that lapdmon writes for an item, with the same code: a frame's block, or the line about a
+// loss. Other items give no text. An object must be used by one thread only, because the decoder's variables
+// belong to the thread.
 class LogTextComposer : public Composer {
   public:
     void compose(const Seen& seen, std::string& text, Piece& piece) override;

@@ -1,5 +1,5 @@
-// Every octet of a frame or of an element: its bits, the field they are, its value, what it means, the
-// clause.
+// Explains every octet of a frame or of an element: its bits, their field, its value and meaning, and the
+// clause of the standard.
 #ifndef READER_EXPLAIN_H
 #define READER_EXPLAIN_H
 
@@ -22,7 +22,7 @@ class ExplainComposer : public Composer {
 
     void compose(const Seen& seen, std::string& text, Piece& piece) override;
 
-    // The rows of octets that came without a time or a direction.
+    // Appends the rows of a frame that has no time and no direction.
     void explainFrame(std::span<const std::uint8_t> octets, isdn::Variant variant, std::string& text);
     void explainElement(std::span<const std::uint8_t> octets, isdn::Variant variant, std::string& text);
 
@@ -38,14 +38,14 @@ class ExplainComposer : public Composer {
     bool colors_;
     TimeText times_;
     isdn::Fields fields_;
-    const std::uint8_t* begin_ = nullptr;  // of the octets that positions count from
+    const std::uint8_t* begin_ = nullptr;  // the octet from which positions are counted
 };
 
-// The octets of hexadecimal digits, which blanks, colons, dashes and commas may part, each part with or
-// without "0x"; nothing for any other text. Throws UsageError for a part with half an octet.
+// Reads octets from hexadecimal digits. Blanks, colons, dashes and commas may separate parts, and each part
+// may begin with "0x". Returns nothing for any other text. Throws UsageError for a part with half an octet.
 std::optional<std::vector<std::uint8_t>> readHex(std::string_view text);
 
-// Whether octets that came without further words are an element: the second one tells how many follow.
+// Whether octets look like an element: the second one is the number of octets that follow.
 bool looksLikeElement(std::span<const std::uint8_t> octets);
 
 std::span<const OptionRow> explainOptions();

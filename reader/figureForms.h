@@ -1,4 +1,4 @@
-// Tables of figures as text, CSV and JSON.
+// Writes tables of figures as text, CSV and JSON.
 #ifndef READER_FIGUREFORMS_H
 #define READER_FIGUREFORMS_H
 
@@ -9,12 +9,12 @@
 
 namespace reader {
 
-// The title, the headings, and a line a row.
+// Appends the title, the headings, and a line for each row.
 void appendFigureText(std::string& to, const FigureTable& table);
-// A row a figure, so that tables of different columns go into one file.
+// The CSV has a row for each figure, so that tables with different columns fit into one file.
 inline constexpr std::string_view figureCsvHeader = "table,row,figure,value\n";
 void appendFigureCsv(std::string& to, const FigureTable& table);
-// An object a row, each with its line end.
+// Appends an object for each row of the table, each with its line end.
 void appendFigureJson(std::string& to, const FigureTable& table);
 
 }  // namespace reader

@@ -12,7 +12,7 @@
 namespace reader {
 
 struct FigureColumn {
-    enum class Kind { key, text, number };  // keys tell the rows of a table apart
+    enum class Kind { key, text, number };  // the keys of a row identify it within its table
 
     std::string_view name;     // "median_s", for programs
     std::string_view heading;  // "median s", for people
@@ -23,14 +23,14 @@ struct FigureColumn {
 
 struct FigureTable {
     std::string_view name;   // "times"
-    std::string_view title;  // what it shows, in a line
+    std::string_view title;  // what the table shows, in one line
     std::vector<FigureColumn> columns;
-    // A cell for each column; an empty one has no value. Numbers are decimal.
+    // Each row has a cell for each column. An empty cell means that there is no value. Numbers are decimal.
     std::vector<std::vector<std::string>> rows{};
 };
 
-// Messages, traffic, causes, times, hours, trunks and channels, in this order. `size` is that of the trunks;
-// unknown: as learnt from the channels in use.
+// The tables of messages, traffic, causes, times, hours, trunks and channels, in this order. `size` is the
+// size of the trunks; if it is unknown, it is learnt from the channels in use.
 std::vector<FigureTable> figureTables(const calls::Figures& figures, const calls::Occupancy& occupancy,
                                       calls::TrunkSize size);
 

@@ -15,31 +15,31 @@
 
 namespace reader {
 
-// A form is either text that composers make, a line an item, or what a writer makes of the items.
+// A form is either text, which composers make, a line for each item, or it is made by a writer.
 struct Form {
-    std::string_view name;                           // as --to and the end of a file's name have it
-    std::string_view what;                           // "a pcapng capture"
-    bool binary;                                     // holds octets as they are, and so is not for a terminal
-    bool (*looksRight)(std::string_view beginning);  // of a file of this form
-    std::string_view header;                         // of text
-    std::unique_ptr<Composer> (*makeComposer)();     // null if there is a writer
+    std::string_view name;  // the name for --to, and the ending of files
+    std::string_view what;  // "a pcapng capture"
+    bool binary;            // it contains octets as they are, so it is not written to a terminal
+    bool (*looksRight)(std::string_view beginning);  // whether a file that begins so has this form
+    std::string_view header;                         // the first line of the text
+    std::unique_ptr<Composer> (*makeComposer)();     // null if the form has a writer
     std::unique_ptr<capture::Writer> (*makeWriter)(int descriptor, const std::string& name);
-    bool needsTimeOfDay = false;  // it has no other times
+    bool needsTimeOfDay = false;  // it cannot hold other times
 };
 
 std::span<const Form> forms();
 
-// Throws UsageError for a name that is none.
+// Throws UsageError if no form has this name.
 const Form& formNamed(std::string_view name);
 
-// By the end of a file's name, ".pcapng"; null if it tells nothing.
+// The form that belongs to the ending of a file's name, ".pcapng"; null if none does.
 const Form* formOfFile(std::string_view path);
 
-// For forms with a writer: the items go to it, on the thread of the pipeline. Reports that the reader of a
-// pipe has gone as ReaderGone, and what else cannot be written as FileError.
+// Hands the items to the writer of a form, on the thread of the pipeline. Throws ReaderGone if the reader of
+// a pipe has gone, and FileError if something cannot be written for another reason.
 class WriterConsumer : public Consumer {
   public:
-    // `form` is the writer's. Says once if it needs a time of day that frames do not have.
+    // `form` is the form of the writer. Says once if it needs a time of day that frames do not have.
     WriterConsumer(capture::Writer& writer, const Form& form, Chatter& chatter)
         : writer_(writer), chatter_(chatter), roles_(chatter), needsTimeOfDay_(form.needsTimeOfDay) {}
 
@@ -54,10 +54,10 @@ class WriterConsumer : public Consumer {
     capture::Writer& writer_;
     Chatter& chatter_;
     Roles roles_;
-    bool needsTimeOfDay_;  // until it was said
+    bool needsTimeOfDay_;  // false once that was said
 };
 
-// Composes nothing: the items themselves are wanted.
+// Composes nothing, for consumers that need only the items.
 class NoComposer : public Composer {
   public:
     void compose(const Seen& /*seen*/, std::string& /*text*/, Piece& /*piece*/) override {}

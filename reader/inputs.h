@@ -1,4 +1,4 @@
-// The inputs that the options name, as one stream.
+// Opens the inputs that the options name, as one stream.
 #ifndef READER_INPUTS_H
 #define READER_INPUTS_H
 
@@ -12,19 +12,19 @@
 
 namespace reader {
 
-// Their names; the standard input alone ("-") if none is given and it is no terminal. Throws UsageError if
-// there is nothing to read.
+// The names of the inputs. If none is given, that is only "-", the standard input. Throws UsageError if none
+// is given and the standard input is a terminal.
 std::vector<std::string> inputFiles(const Options& options);
 
-// One input of any form that this program reads.
+// Opens one input of any form that this program reads.
 std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOptions& input);
 
-// One after another, or by time with --merge. Throws FileError for one that cannot be opened or is of no
-// known form, before anything is read.
+// Opens all inputs as one stream: one after another, or in the order of time with --merge. Throws FileError,
+// before anything is read, if one cannot be opened or its form is not known.
 std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& chatter);
 
-// Throws capture::BadInput for a regular file among them that is of no known form. Inputs that are followed
-// may be empty as yet, and are not looked at; nor are pipes, which can be read only once.
+// Throws capture::BadInput if one of the inputs is a regular file whose form is not known. Does not look at
+// inputs that are followed, because they may be empty yet, nor at pipes, because they can be read only once.
 void checkForms(const Options& options);
 
 }  // namespace reader

@@ -1,4 +1,5 @@
-// One JSON object a line: a frame, or what the recorder said between frames. docs/user/jsonl.md describes it.
+// Writes one JSON object a line: a frame, or what the recorder says between frames. docs/user/jsonl.md
+// describes the form.
 #ifndef READER_JSON_H
 #define READER_JSON_H
 
@@ -10,12 +11,12 @@
 
 namespace reader {
 
-// The version of the form, the value of "v". It changes when a key goes or gets another meaning, not when one
-// is added.
+// The version of the form, the value of "v". Increase it when a key is removed or gets another meaning, and
+// not when a key is added.
 inline constexpr int jsonVersion = 1;
 
-// Appends a JSON string. Text of a frame has no known encoding: an octet that is no ASCII becomes the
-// character of that number (ISO 8859-1), so that the line is valid whatever the octets are.
+// Appends a JSON string. The encoding of a frame's text is not known, so an octet that is not ASCII becomes
+// the character of that number (ISO 8859-1). So the line is valid whatever the octets are.
 void appendJsonString(std::string& to, std::string_view text);
 
 class JsonComposer : public Composer {

@@ -1,4 +1,4 @@
-// A line a frame.
+// lapdread list: shows each frame in a line.
 #ifndef READER_LIST_H
 #define READER_LIST_H
 
@@ -14,7 +14,7 @@ namespace reader {
 // Composes lines of the columns that the options ask for.
 class LineComposer : public Composer {
   public:
-    // Throws UsageError for a column that there is none of.
+    // Throws UsageError if a column does not exist.
     LineComposer(const ListOptions& options, bool colors);
 
     void compose(const Seen& seen, std::string& text, Piece& piece) override;

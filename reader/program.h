@@ -1,4 +1,4 @@
-// The program from its arguments to its exit status.
+// Runs lapdread.
 #ifndef READER_PROGRAM_H
 #define READER_PROGRAM_H
 
@@ -7,8 +7,9 @@
 
 namespace reader {
 
-// Without argv[0]. Writes data to standard output and everything else to the standard error stream; throws
-// nothing. Called once, before there are threads: it ignores SIGPIPE and may set the time zone.
+// `words` are the arguments without argv[0]. Returns the exit status. Writes data to standard output and
+// everything else to the standard error stream. Throws nothing. Call it once, before there are other threads,
+// because it ignores SIGPIPE and may set the time zone.
 int runProgram(const std::vector<std::string>& words);
 
 }  // namespace reader

@@ -1,4 +1,4 @@
-// Pieces of text that lines are made of.
+// Functions that compose text.
 #ifndef READER_TEXT_H
 #define READER_TEXT_H
 
@@ -18,16 +18,17 @@ namespace reader {
 void appendSafe(std::string& to, std::string_view text);
 std::string safe(std::string_view text);
 
-// Text that is safe already, as text of XML or HTML, or as an attribute's value between double quotes.
+// Appends text that is safe already, in the form that XML or HTML needs in text and between the double quotes
+// of an attribute.
 void appendEntities(std::string& to, std::string_view text);
-// Both: text that may come from a frame, for XML or HTML.
+// Does both: appends text that may come from a frame in the form that XML or HTML needs.
 void appendXml(std::string& to, std::string_view text);
 
-// What a terminal may get of the text of a log: line feeds and tabs stay, everything else that is no
-// printable ASCII appears as \xHH.
+// Appends the text of a log in a form that is safe for a terminal: line feeds and tabs are kept, and
+// everything else that is not printable ASCII becomes \xHH.
 void appendForTerminal(std::string& to, std::string_view text);
 
-// Octets as lower-case hexadecimal digits, without blanks.
+// Appends octets as lower-case hexadecimal digits, without blanks.
 void appendHex(std::string& to, std::span<const std::uint8_t> octets);
 
 template <std::integral Number>
@@ -36,16 +37,18 @@ void appendNumber(std::string& to, Number number, int base = 10) {
     to.append(digits, std::to_chars(digits, digits + sizeof digits, number, base).ptr);
 }
 
-// Fills up with blanks what was appended since `start`, so that it is `width` characters long.
+// Adds blanks to the text that begins at `start` until it has `width` characters. `right`: the blanks go
+// before it.
 void padTo(std::string& to, std::size_t start, std::size_t width, bool right = false);
 
-// Without blanks, "-" and "_", in small letters: "RELEASE-COMPLETE" and "release complete" are one name.
+// The name in small letters without blanks, "-" and "_", so that "RELEASE-COMPLETE" and "release complete"
+// are the same.
 std::string plainName(std::string_view name);
 
-// The words between commas; no empty ones.
+// The words between commas, without empty ones.
 std::vector<std::string> splitAtCommas(std::string_view words);
 
-// The whole text as a number; false when it is anything else or does not fit.
+// Reads the whole text as a number. Returns false if it is no number or does not fit.
 template <std::integral Number>
 bool readNumber(std::string_view text, Number& number, int base = 10) {
     const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number, base);

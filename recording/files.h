@@ -1,4 +1,4 @@
-// Files written whole.
+// Writes files as a whole.
 #ifndef RECORDING_FILES_H
 #define RECORDING_FILES_H
 
@@ -8,11 +8,12 @@
 
 namespace recording {
 
-// Writes all of it, however often the system writes less or is interrupted. Returns 0 or the error's number.
+// Writes all of the text, even if the system writes less at a time or is interrupted. Returns 0 or the
+// error's number.
 int writeAll(int descriptor, std::string_view text);
 
-// Puts a file with this text in the place of the old one in one step (rename): whoever reads it sees the old
-// text or the new one. Its last step has the name PATH.new. Returns what is wrong, or nothing.
+// Writes the text to PATH.new and renames that file to PATH, so that a reader sees either the old text or the
+// new one. Returns words that say what went wrong, or nothing.
 std::optional<std::string> replaceFile(const std::string& path, std::string_view text);
 
 }  // namespace recording

@@ -1,4 +1,4 @@
-// The files that recordings are kept in: their names, and which of them are there.
+// The names of recordings, and the recordings that a folder has.
 #ifndef RECORDING_RECORDINGS_H
 #define RECORDING_RECORDINGS_H
 
@@ -9,11 +9,13 @@
 
 namespace recording {
 
-// A name that is safe in a path: letters, digits and "-_+@=." stay, anything else becomes "_".
+// The trunk's name in a form that is safe in a path: letters, digits and "-_+@=." are kept, anything else
+// becomes "_".
 std::string fileNameOf(const std::string& trunk);
 
-// Which recordings of a folder are meant: TRUNK.START.FORM, or TRUNK.START.MARK.FORM. START is a second in
-// UTC, 20261121T112533Z, and has a number behind it if that second has several: 20261121T112533Z.2.
+// The recordings of one trunk in one folder that have the names TRUNK.START.FORM, or TRUNK.START.MARK.FORM.
+// START is a second in UTC, 20261121T112533Z. If several recordings begin in one second, a number follows:
+// 20261121T112533Z.2.
 struct RecordingKind {
     std::string folder;
     std::string trunk;  // as fileNameOf gives it
@@ -21,19 +23,19 @@ struct RecordingKind {
     std::string form;   // "pcapng"
 };
 
-// A recording that is being written has this behind its name.
+// The ending of a recording that is being written.
 inline constexpr std::string_view unfinishedEnding = ".part";
 
 struct Recording {
     std::int64_t start = 0;  // seconds since 1970
-    int number = 1;          // among those of one second
-    std::string name;        // without folder, and without `unfinishedEnding`
+    int number = 1;          // the number among the recordings of one second
+    std::string name;        // without its folder, and without `unfinishedEnding`
 };
 
-// A name that no file has yet, finished or not, with its folder.
+// A path that no recording has yet, finished or not.
 std::string newRecording(const RecordingKind& kind, std::int64_t start);
 
-// Oldest first.
+// The finished recordings, oldest first.
 std::vector<Recording> finishedRecordings(const RecordingKind& kind);
 std::vector<Recording> unfinishedRecordings(const RecordingKind& kind);
 

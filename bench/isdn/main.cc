@@ -56,7 +56,7 @@ void headersAndSpans(benchmark::State& state) {
     });
 }
 
-// What stands in a line of a list.
+// The words for one line of a list.
 void words(benchmark::State& state) {
     std::string line;
     eachFrame(state, [&](const std::vector<std::uint8_t>& octets) {

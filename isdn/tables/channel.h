@@ -42,7 +42,7 @@ inline constexpr Row channelIdRows[] = {
     {"3.3", rest(readSlotMap), "slot map", {}, ifSeen("3.2", 5, 5, {1})},
 };
 
-// As channel identification, but the interface stands in it when bit 7 is clear, and there is no preference.
+// Like channel identification, but the interface is present when bit 7 is clear, and there is no preference.
 inline constexpr Name identifiersAbsent[] = {{0, "explicit"}, {1, "implicit"}};
 inline constexpr Row blockingChannelRows[] = {
     {"3", bits(7, 7), "interface identifier", identifiersAbsent},

@@ -60,7 +60,7 @@ inline constexpr Name signals[] = {
 };
 inline constexpr Row signalRows[] = {{"3", bits(8, 1), "signal", signals}};
 
-// Single-octet elements: their value stands in the identifier.
+// Single-octet elements, whose value is in the identifier.
 inline constexpr Name shiftKinds[] = {{0, "locking"}, {1, "for one element"}};
 inline constexpr Row shiftRows[] = {
     {"1", heading(8, 5), "identifier"},

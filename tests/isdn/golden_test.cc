@@ -175,7 +175,7 @@ TEST_P(GoldenFile, SaysWhatTheOctetsMean) {
 INSTANTIATE_TEST_SUITE_P(Isdn, GoldenFile, ::testing::ValuesIn(goldenFiles()),
                          [](const auto& file) { return file.param.stem().string(); });
 
-// A table without a case says what nobody has checked.
+// A table without a case contains something that nobody has checked.
 TEST(Golden, HasACaseForEachTable) {
     std::set<const ElementTable*> seen;
     for (const auto& path : goldenFiles()) {

@@ -16,8 +16,8 @@ struct People {
     std::vector<std::string> secrets;  // numbers of six digits and more, names of four letters and more
 };
 
-// What is said follows from `structure`, of whom from `content`: traces of one structure are alike but for
-// what names a person.
+// `structure` decides what the frames say, and `content` about which people: traces of one structure are
+// alike but for what names a person.
 People peopleOf(unsigned structure, unsigned content, isdn::Variant variant);
 
 }  // namespace redaction::test

@@ -140,7 +140,7 @@ TEST(Thread, AbandonedRunsOnWithoutItsObject) {
     EXPECT_TRUE(job.ended.wait());
 }
 
-// A thread that lets itself go while whoever started it may not know yet that it runs.
+// A thread that abandons itself before the starting thread may know that it runs.
 struct Leaver {
     std::unique_ptr<Thread> thread;
     Signal gone;
