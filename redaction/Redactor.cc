@@ -63,13 +63,13 @@ void Redactor::take(const capture::Frame& frame, const calls::Marks& marks, isdn
     const isdn::Layer3 message = link.carriesMessage() ? isdn::parseLayer3(link.information) : isdn::Layer3();
     place_ = {frame.interface, link.tei, link.ns, frame.transmitted};
     information_ = link.information;
-    if (isSegment(message) && link.problem == isdn::Problem::none && marks.accepted.value_or(false)) {
-        takeSegment({&frame, expected_, message, link.tei}, variant, done);
-        return;
-    }
     Rebuilt rebuilt{expected_, {frame.octets.begin(), frame.octets.end()}};
     apply(planOfFrame(frame.octets, variant), rebuilt.octets, message.type);
-    done.push_back(std::move(rebuilt));
+    const bool isOfMessage =
+        isSegment(message) && link.problem == isdn::Problem::none && marks.accepted.value_or(false);
+    if (!isOfMessage ||
+        !takeSegment({&frame, rebuilt.octets, expected_, message, link.tei}, variant, done, rebuilt))
+        done.push_back(std::move(rebuilt));
 }
 
 std::vector<std::uint8_t> Redactor::cut(isdn::Octets frame, isdn::Variant variant) {
@@ -83,27 +83,22 @@ std::vector<std::uint8_t> Redactor::cut(isdn::Octets frame, isdn::Variant varian
 
 // By now the analysis has either kept the segment, completed a message with it, or found that it follows no
 // other segment.
-void Redactor::takeSegment(const Segment& segment, isdn::Variant variant, std::vector<Rebuilt>& done) {
-    Rebuilt rebuilt{expected_, {segment.frame->octets.begin(), segment.frame->octets.end()}};
+bool Redactor::takeSegment(const Segment& segment, isdn::Variant variant, std::vector<Rebuilt>& done,
+                           Rebuilt& rebuilt) {
     if (!heard_.isAccepted) {
         const auto header =
             isdn::segmentHeader(segment.message.elements.find(isdn::element::segmentedMessage));
-        if (segments_.keep(segment, header && header->first, done))
-            return;
-    } else if (heard_.whole.empty()) {
-        segments_.giveUp(segment, done);
-    } else {
-        const isdn::Layer3 message = isdn::parseLayer3(heard_.whole);
-        const Plan plan = planOfMessage(heard_.whole, variant);
-        std::vector<std::uint8_t> whole = heard_.whole;
-        apply(plan, whole, message.type);
-        if (segments_.finish(segment, whole, done, rebuilt.octets)) {
-            done.push_back(std::move(rebuilt));
-            return;
-        }
+        return segments_.keep(segment, header && header->first, done);
     }
-    apply(planOfFrame(segment.frame->octets, variant), rebuilt.octets, type::segment);
-    done.push_back(std::move(rebuilt));
+    if (heard_.whole.empty()) {
+        segments_.giveUp(segment, done);
+        return false;
+    }
+    const isdn::Layer3 message = isdn::parseLayer3(heard_.whole);
+    std::vector<std::uint8_t> whole = heard_.whole;
+    apply(planOfMessage(heard_.whole, variant), whole, message.type);
+    segments_.finish(segment, whole, done, rebuilt.octets);
+    return false;
 }
 
 void Redactor::apply(const Plan& plan, std::span<std::uint8_t> octets, std::uint8_t messageType) {

@@ -78,7 +78,10 @@ class Redactor : public calls::Listener {
     void replaceDialled(std::span<std::uint8_t> octets, std::uint8_t messageType);
     bool replaceNumber(std::span<std::uint8_t> octets, std::string& before);
     std::optional<std::string> digitsBefore();
-    void takeSegment(const Segment& segment, isdn::Variant variant, std::vector<Rebuilt>& done);
+    // Returns true if the segment waits for the rest of its message. `rebuilt` is its frame, with its piece
+    // blanked; if its message is complete, it gets the redacted piece.
+    bool takeSegment(const Segment& segment, isdn::Variant variant, std::vector<Rebuilt>& done,
+                     Rebuilt& rebuilt);
 
     Pseudonyms& pseudonyms_;
     bool blankShort_;

@@ -12,7 +12,7 @@ SegmentPieces::Key SegmentPieces::keyOf(const Segment& segment) {
 }
 
 SegmentPieces::Piece SegmentPieces::pieceOf(const Segment& segment) {
-    const isdn::Octets octets = segment.frame->octets;
+    const isdn::Octets octets = segment.octets;
     return {{segment.number, {octets.begin(), octets.end()}},
             segment.frame->time,
             octets.size() - segment.message.raw.size()};
@@ -28,7 +28,7 @@ bool SegmentPieces::keep(const Segment& segment, bool isFirst, std::vector<Rebui
     return true;
 }
 
-bool SegmentPieces::finish(const Segment& last, isdn::Octets whole, std::vector<Rebuilt>& done,
+void SegmentPieces::finish(const Segment& last, isdn::Octets whole, std::vector<Rebuilt>& done,
                            std::vector<std::uint8_t>& lastOctets) {
     Pieces pieces;
     if (const auto known = pieces_.find(keyOf(last)); known != pieces_.end()) {
@@ -42,7 +42,7 @@ bool SegmentPieces::finish(const Segment& last, isdn::Octets whole, std::vector<
     if (size != whole.size()) {
         pieces.pop_back();
         blank(pieces, done);
-        return false;
+        return;
     }
     isdn::Octets rest = whole.subspan(last.message.header.size());
     for (Piece& piece : pieces) {
@@ -54,7 +54,6 @@ bool SegmentPieces::finish(const Segment& last, isdn::Octets whole, std::vector<
     pieces.pop_back();
     for (Piece& piece : pieces)
         done.push_back(std::move(piece.frame));
-    return true;
 }
 
 void SegmentPieces::giveUp(const Segment& segment, std::vector<Rebuilt>& givenUp) {

@@ -22,6 +22,7 @@ struct Rebuilt {
 // A SEGMENT message, with the frame that carries it.
 struct Segment {
     const capture::Frame* frame;
+    isdn::Octets octets;  // of the frame, its piece of a message blanked
     std::uint64_t number;
     isdn::Layer3 message;  // a view into the frame
     std::uint8_t tei;
@@ -35,9 +36,9 @@ class SegmentPieces {
     // none.
     bool keep(const Segment& segment, bool isFirst, std::vector<Rebuilt>& givenUp);
     // Writes `whole`, the message that ends with this segment, over its pieces. Appends the frames before the
-    // last to `done`, and puts the octets of the last frame into `lastOctets`. Returns false, and changes
-    // nothing, if the pieces do not belong to this message.
-    bool finish(const Segment& last, isdn::Octets whole, std::vector<Rebuilt>& done,
+    // last to `done`, and puts the octets of the last frame into `lastOctets`. If the pieces do not belong to
+    // this message, they stay blank, and `lastOctets` stays as it is.
+    void finish(const Segment& last, isdn::Octets whole, std::vector<Rebuilt>& done,
                 std::vector<std::uint8_t>& lastOctets);
     // The pieces before this segment belong to no whole message. Blanks them and appends their frames to
     // `givenUp`.

@@ -31,9 +31,9 @@ struct Part {
     bool operator==(const Part&) const = default;
 };
 
-// The parts in their order; none is empty. Octets outside the parts are kept: headers, and codes that a table of
-// the standards knows and that are no longer than the standard allows. A redacted frame has the same plan as the
-// original, so that it can be restored.
+// The parts in their order; none is empty. Octets outside the parts are kept: headers, and codes that a table
+// of the standards knows and that are no longer than the standard allows. A redacted frame has the same plan
+// as the original, so that it can be restored.
 using Plan = std::vector<Part>;
 
 // The plan of a frame. If the frame carries a SEGMENT, the plan blanks the piece of a message in it.

@@ -232,6 +232,16 @@ TEST_F(Segmented, messagesThatDoNotEndAreBlanked) {
     EXPECT_EQ(Bytes(after[0].octets.begin() + 13, after[0].octets.end()), Bytes(10, 0));
 }
 
+// Without its first element a SEGMENT is a message like any other.
+TEST_F(Segmented, messagesThatAreNoneAreRedactedWhileTheyWait) {
+    for (const std::uint8_t id : {0x28, 0x5E}) {
+        CallScript script;
+        script.us(type::segment, 1, false,
+                  {{0xA1, 0x00, 0x02, 0x81, type::setup, id, 0x04, 'J', 'o', 'h', 'n'}});
+        EXPECT_FALSE(test::holds(redacted(script)[0].octets, "John"));
+    }
+}
+
 TEST_F(Segmented, messagesThatLackASegmentAreBlanked) {
     CallScript script;
     script.us(type::segment, 1, false, {segment(0x82, piece(0, 5))})
