@@ -29,13 +29,13 @@ class Output {
     // write() and flush() throw ReaderGone if a pipe has no reader any more, and FileError if the text cannot
     // be written.
     void write(std::string_view text) {
-        if (text.size() >= large_) {
+        if (text.size() >= largeText) {
             flush();
             writeThrough(text);
             return;
         }
         buffer_.append(text);
-        if (buffer_.size() >= most_)
+        if (buffer_.size() >= bufferLimit)
             flush();
     }
     void flush();
@@ -45,8 +45,8 @@ class Output {
     const std::string& name() const { return name_; }
 
   private:
-    static constexpr std::size_t most_ = 256UL * 1024;
-    static constexpr std::size_t large_ = 64UL * 1024;  // worth a write of its own, to save a copy
+    static constexpr std::size_t bufferLimit = 256UL * 1024;
+    static constexpr std::size_t largeText = 64UL * 1024;  // worth a write of its own, to save a copy
 
     void writeThrough(std::string_view text);
 

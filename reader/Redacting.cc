@@ -99,7 +99,7 @@ void Redacting::look(const Seen& seen, bool passes) {
     redact(waiting);
     if (hidesNames_)
         replaceNames(waiting);
-    if (waiting_.size() > mostWaiting_)
+    if (waiting_.size() > mostWaiting)
         giveUp();
     release();
 }

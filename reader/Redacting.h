@@ -46,7 +46,7 @@ class Redacting : public Consumer {
     };
 
     // Items that wait for the end of a message at most.
-    static constexpr std::size_t mostWaiting_ = 4096;
+    static constexpr std::size_t mostWaiting = 4096;
 
     void look(const Seen& seen, bool passes);
     void redact(Waiting& waiting);

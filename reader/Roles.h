@@ -24,7 +24,7 @@ class Roles {
         const bool isOpen = seen.isFrame() && seen.role == capture::Role::unknown && !gaveUp_;
         if (isOpen || (!waiting_.empty() && !seen.isFrame())) {
             waiting_.add(item);
-            if (waiting_.items().size() >= mostWaiting_)
+            if (waiting_.items().size() >= mostWaiting)
                 giveUp(give);
             return;
         }
@@ -43,7 +43,7 @@ class Roles {
     }
 
   private:
-    static constexpr std::size_t mostWaiting_ = 1000;
+    static constexpr std::size_t mostWaiting = 1000;
 
     // Frames of several D channels in one capture mostly have one role.
     template <class Give>

@@ -15,22 +15,22 @@ using EventReportTest = EventTest;
 // ---- What nobody registered for.
 
 constexpr const char* stars = "********************************************\n";
-constexpr const char* For =
+constexpr const char* forText =
     "For {TgtDesc: {Node 0 Board 1 Processor 1 Component 21 Instance 1} "
     "HostDesc: {Node 6 Board 9 Processor 8 Component 7 Instance 4097}\n";
-constexpr const char* Addresses =
+constexpr const char* addressesText =
     " Source: {Node 0 Board 0x1 Processor 0x1 Component 0x15 Instance 0x1} "
     "Target: {Node 0x6 Board 0x9 Processor 0x8 Component 0x7 Instance 0x1001} ";
 
 std::string messageBanner(const std::string& type, const std::string& message) {
-    return std::string("\n") + stars + "Unregisterd MsgType " + type + "\n" + For + message +
+    return std::string("\n") + stars + "Unregisterd MsgType " + type + "\n" + forText + message +
            "You may specify your own handler for unregisted messages using\n"
            "Addressable::asyncUnregisteredMsgType\n" +
            stars + "\n";
 }
 
 std::string eventBanner(const std::string& group, const std::string& message) {
-    return std::string("\n") + stars + "Unregisterd EventGroup " + group + "\n" + For + message +
+    return std::string("\n") + stars + "Unregisterd EventGroup " + group + "\n" + forText + message +
            "You may specify your own handler for unregisted events using\n"
            "Addressable::asyncUnregisteredEvtGroup\n" +
            stars + "\n";
@@ -49,7 +49,7 @@ TEST_F(EventReportTest, AnUnregisteredMessageIsReportedDecodedAndFreed) {
     EXPECT_EQ(fake_norv::outstanding(), 0U);
     EXPECT_EQ(
         errors_.text(),
-        messageBanner("19", std::string("{MsgType: 0x13") + Addresses +
+        messageBanner("19", std::string("{MsgType: 0x13") + addressesText +
                                 "Size: 12 Trans: 1001 Body: {Num 0x7 Val 0x3e9 TextSize 0 Text {}}}\n"));
 }
 
@@ -58,7 +58,7 @@ TEST_F(EventReportTest, AnUnregisteredEventGoesToTheEventDefault) {
     ASSERT_TRUE(sendTrace());
     end();
     EXPECT_EQ(errors_.text(),
-              eventBanner("2", std::string("{MsgType: 0x20") + Addresses +
+              eventBanner("2", std::string("{MsgType: 0x20") + addressesText +
                                    "Size: 17 Trans: 1001 Body: {Label 0x2 Direction 0x1 Timestamp 0x3eb "
                                    "Length 0x1 List {x}}}\n"));
 }
@@ -68,7 +68,7 @@ TEST_F(EventReportTest, ATypeThatNoLookUpKnowsIsReportedAsItsOctets) {
     ASSERT_TRUE(send(0x7FFFFFFF, {0, 10}));
     end();
     EXPECT_EQ(errors_.text(),
-              messageBanner("2147483647", std::string("{MsgType: 0x7fffffff") + Addresses +
+              messageBanner("2147483647", std::string("{MsgType: 0x7fffffff") + addressesText +
                                               "Size: 2 Trans: 1001 Body: {ByteData {0 0xa }}}\n"));
 }
 
@@ -77,7 +77,7 @@ TEST_F(EventReportTest, AGroupThatNoLookUpKnowsIsReportedAsItsOctets) {
     ASSERT_TRUE(sendEvent(1001, {7}));
     end();
     EXPECT_EQ(errors_.text(),
-              eventBanner("1001", std::string("{MsgType: 0x20") + Addresses +
+              eventBanner("1001", std::string("{MsgType: 0x20") + addressesText +
                                       "Size: 5 Trans: 1001 Body: {ByteData {0xe9 0x3 0 0 0x7 }}}\n"));
 }
 
@@ -85,7 +85,7 @@ TEST_F(EventReportTest, AnEventTooShortForAGroupIsOfGroup0) {
     makeDispatcher(*ccs_);
     ASSERT_TRUE(send(32, {2}));
     end();
-    EXPECT_EQ(errors_.text(), eventBanner("0", std::string("{MsgType: 0x20") + Addresses +
+    EXPECT_EQ(errors_.text(), eventBanner("0", std::string("{MsgType: 0x20") + addressesText +
                                                    "Size: 1 Trans: 1001 Body: {ByteData {0x2 }}}\n"));
 }
 
