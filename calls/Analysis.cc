@@ -1,6 +1,7 @@
 #include "calls/Analysis.h"
 
 #include <algorithm>
+#include <limits>
 #include <optional>
 #include <utility>
 
@@ -68,26 +69,39 @@ struct Analysis::Channel {
     void accept(Message message, const Timers& timers) {
         WitnessKeeper& keeper = keepers[message.layer2.tei];
         Segments& pieces = segments[message.layer2.tei];
+        expireSegments(message.at, timers);
         const Segments::Taken taken = pieces.take(message);
-        reportUnfinished(pieces, message, timers);
         if (taken == Segments::Taken::kept) {
+            segmentsDue = std::min(segmentsDue, message.at + timers.t314 + timers.slack);
             carriers.take(message, links.marks(), group.table(), group.carried());
             return;
         }
         if (taken == Segments::Taken::outOfOrder)
-            report(findings::segmentsUnfinished, message, message.number,
-                   "a SEGMENT does not follow those before it");
+            reportSegments(momentOf(message), message.from(), message.at - timers.t314, keeper.witness(),
+                           "a SEGMENT does not follow those before it");
         message.at = group.now();
         group.take(message, keeper.witness(), carriers);
     }
-    void reportUnfinished(Segments& pieces, const Message& message, const Timers& timers) {
-        while (const std::uint64_t frame = pieces.unfinished(message.at, timers.t314 + timers.slack))
-            report(findings::segmentsUnfinished, message, frame, "the next SEGMENT did not come");
+    // Gives up messages whose next segment has not come in time.
+    void expireSegments(std::int64_t at, const Timers& timers) {
+        if (at <= segmentsDue)
+            return;
+        segmentsDue = never;
+        for (auto& [tei, pieces] : segments) {
+            while (const auto late = pieces.unfinished(at, timers.t314 + timers.slack))
+                reportSegments(late->moment, late->from, late->moment.at, keepers[tei].witness(),
+                               "the next SEGMENT did not come within T314");
+            if (!pieces.empty())
+                segmentsDue = std::min(segmentsDue, pieces.oldest() + timers.t314 + timers.slack);
+        }
     }
-    void report(const FindingKind& kind, const Message& message, std::uint64_t frame, std::string sentence) {
-        Finding finding = findingOf(kind, message, nullptr, std::move(sentence));
-        finding.frame = frame;
-        group.report(std::move(finding));
+    void reportSegments(const Moment& moment, Side from, std::int64_t since, const LinkWitness& witness,
+                        std::string sentence) {
+        const bool isWhole = witness.isWholeSince(since, from);
+        if (!isWhole)
+            sentence += ", but a frame is missing in the trace";
+        group.report(findingOf(isWhole ? findings::segmentsUnfinished : findings::cannotBeTold, moment, name,
+                               std::move(sentence)));
     }
 
     std::string name;
@@ -100,6 +114,8 @@ struct Analysis::Channel {
     isdn::Variant variant;
     std::map<std::uint8_t, WitnessKeeper> keepers;  // by TEI, of call control
     std::map<std::uint8_t, Segments> segments;      // by TEI
+    static constexpr std::int64_t never = std::numeric_limits<std::int64_t>::max();
+    std::int64_t segmentsDue = never;  // when the next segment of some message is overdue
     Carriers carriers;
 };
 
@@ -147,13 +163,16 @@ const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
     if (channel.clock.hasRestarted())
         channel.restarted();
     channel.group.advance(at);
+    channel.expireSegments(at, options_.timers);
     const Marks& marks = channel.links.take(frame, number, at);
     channel.linkFindings.take(channel.links);
     const isdn::Layer2& layer2 = channel.links.layer2();
     if (layer2.sapi != isdn::callControlSapi || layer2.header.size() < 3)
         return marks;
-    channel.keepers[layer2.tei].take(layer2, frame.transmitted ? Side::us : Side::peer, number, at, marks,
-                                     channel.links.events());
+    WitnessKeeper& keeper = channel.keepers[layer2.tei];
+    keeper.take(channel.links);
+    if (marks.unseenSetUp || keeper.witness().isShortAt(at))
+        channel.group.table().framesLost(layer2.tei);
     if (marks.linkUp || marks.linkDown)
         channel.group.linkChanged(layer2.tei, {number, channel.group.now(), frame.clock, frame.time},
                                   channel.name, marks.linkUp);
@@ -176,11 +195,18 @@ const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
 void Analysis::mayMiss(const capture::Interface& interface, std::string_view reason) {
     Channel& channel = channelOf(interface);
     channel.links.mayMiss(reason);
+    for (auto& [tei, keeper] : channel.keepers)
+        keeper.mayMiss(channel.clock.now());
     channel.linkFindings.lost(std::string(reason));
 }
 
 void Analysis::mayLack(const capture::Interface& interface, Side side) {
-    channelOf(interface).links.mayLack(side);
+    Channel& channel = channelOf(interface);
+    channel.links.mayLack(side);
+    for (auto& [tei, keeper] : channel.keepers) {
+        keeper.lacks(side, channel.clock.now());
+        channel.group.table().framesLost(tei);
+    }
 }
 
 void Analysis::restarted(const capture::Interface& interface) { channelOf(interface).restarted(); }
@@ -189,6 +215,7 @@ void Analysis::advance(std::int64_t nanoseconds) {
     for (const auto& [name, channel] : channels_) {
         channel->clock.advance(nanoseconds);
         channel->group.advance(channel->clock.now());
+        channel->expireSegments(channel->clock.now(), options_.timers);
         channel->linkFindings.advance(channel->clock.now());
         channel->carriers.advance(channel->clock.now(), channel->group.table(), channel->group.carried());
     }
@@ -196,6 +223,7 @@ void Analysis::advance(std::int64_t nanoseconds) {
 
 void Analysis::finish() {
     for (const auto& [name, channel] : channels_) {
+        channel->expireSegments(channel->clock.now(), options_.timers);
         channel->links.finish();
         channel->linkFindings.finish(channel->links);
         channel->carriers.finish(channel->group.table(), channel->group.carried());

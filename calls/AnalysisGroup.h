@@ -34,8 +34,9 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
           waits_(timers, *this, *this),
           findings_(timers, *this),
           maintenance_(timers, *this, *this),
-          channels_(timers, maintenance_, *this),
-          patterns_(*this) {}
+          stuck_(timers, *this),
+          channels_(timers, maintenance_, stuck_, *this),
+          patterns_(stuck_, *this) {}
 
     // The time of `message` is on the group's clock.
     void take(const Message& message, const LinkWitness& link, Carriers& carriers) {
@@ -62,8 +63,9 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
         now_ = std::max(now_, at);
         waits_.advance(now_);
         maintenance_.advance(now_);
-        channels_.advance(now_);
         patterns_.advance(now_);
+        channels_.advance(now_);
+        stuck_.advance(now_);
         table_.advance(now_);
     }
     std::int64_t now() const { return now_; }
@@ -75,15 +77,19 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
             table_.linkDown(tei, moment.at);
     }
     void finish() {
-        channels_.finish();
-        table_.finish();
+        waits_.finish();
+        maintenance_.finish();
         patterns_.finish();
+        stuck_.finish();
+        table_.finish();
     }
     // The board of one of its D channels restarted.
     void boardRestarted() {
         table_.boardRestarted();
         waits_.boardRestarted();
+        maintenance_.boardRestarted();
         channels_.boardRestarted();
+        stuck_.boardRestarted();
     }
     CallTable& table() { return table_; }
     const CallTable& table() const { return table_; }
@@ -142,6 +148,7 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
     Waits waits_;
     CallFindings findings_;
     Maintenance maintenance_;
+    StuckChannels stuck_;
     Channels channels_;
     Patterns patterns_;
 };

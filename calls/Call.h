@@ -60,6 +60,9 @@ std::string_view nameOf(EndedBy endedBy);
 std::string_view nameOf(ClearedBy clearedBy);
 std::string_view nameOf(Outcome outcome);
 
+// What the trace lacks since a call's last message, so that it may have ended unseen.
+enum class Lack : std::uint8_t { nothing, frames, board };
+
 // A cause as a message of the call gave it.
 struct CauseGiven {
     std::uint64_t frame = 0;
@@ -116,6 +119,8 @@ struct Call {
     std::optional<std::int64_t> lastDigit;  // of overlap sending
     std::optional<std::int64_t> duration;   // from CONNECT to the first clearing message
 
+    Lack lack = Lack::nothing;
+    bool incomplete = false;  // some of its messages may be missing in the trace
     EndedBy endedBy = EndedBy::open;
     ClearedBy clearedBy = ClearedBy::unknown;
     Outcome outcome = Outcome::open;

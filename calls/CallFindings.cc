@@ -15,8 +15,7 @@ namespace {
 namespace element = isdn::element;
 namespace type = isdn::message;
 
-constexpr std::uint8_t statusEnquiryAnswer = 30, invalidReference = 81, timerExpired = 102;
-constexpr std::uint8_t numberIncomplete = 28;
+constexpr std::uint8_t statusEnquiryAnswer = 30, invalidReference = 81;
 
 std::string wordsOf(const isdn::Element& found, const Message& message) {
     std::string words;
@@ -43,8 +42,6 @@ const FindingKind* protocolFinding(std::uint8_t cause) {
         case 101:
         case 111:
             return &findings::protocolError;
-        case timerExpired:
-            return &findings::timer102;
         default:
             return nullptr;
     }
@@ -59,11 +56,12 @@ void CallFindings::heard(Call& call, const Message& message) {
     }
     Notes& notes = notes_[call.number];
     // A transaction (REGISTER) may end without a cause (Q.932 6.3.2.3).
-    const bool clearsFirst = isClearing(message.layer3.type) && !notes.cleared && !call.beforeTrace &&
-                             call.kind != Kind::signalling;
+    // What came before the trace, or is missing in it, may have cleared the call already.
+    const bool isFirst = !notes.cleared && !call.incomplete && !(call.beforeTrace && call.messages == 1);
+    const bool clearsFirst = isClearing(message.layer3.type) && isFirst && call.kind != Kind::signalling;
     checkElements(&call, message, clearsFirst);
     checkDigits(call, notes, message);
-    checkCause(call, message);
+    checkCause(&call, message);
     checkStatus(call, notes, message);
     checkChannel(call, notes, message);
     notes.cleared = notes.cleared || isClearing(message.layer3.type);
@@ -73,6 +71,8 @@ void CallFindings::heardWithoutCall(const Message& message) {
     if (message.layer3.discriminator == isdn::callControl ||
         isdn::isMaintenance(message.layer3.discriminator))
         checkElements(nullptr, message, false);
+    if (message.layer3.discriminator == isdn::callControl && message.layer3.type == type::status)
+        checkCause(nullptr, message);
 }
 
 void CallFindings::checkElements(const Call* call, const Message& message, bool clearsFirst) {
@@ -80,13 +80,18 @@ void CallFindings::checkElements(const Call* call, const Message& message, bool 
         report(*broken.kind, call, message, std::move(broken.sentence));
 }
 
-void CallFindings::checkCause(const Call& call, const Message& message) {
+// STATUS of the global or the dummy reference is about RESTART or another message without a call; there is no
+// reference then that could be unknown.
+void CallFindings::checkCause(const Call* call, const Message& message) {
     const isdn::Element found = message.layer3.elements.find(element::cause);
     const auto cause = isdn::cause(found);
     if (!cause || cause->codingStandard != 0)
         return;
-    if (const FindingKind* const kind = protocolFinding(cause->value); kind != nullptr)
-        report(*kind, &call, message, nameOf(message) + " says " + wordsOf(found, message));
+    const FindingKind* kind = protocolFinding(cause->value);
+    if (call == nullptr && kind == &findings::unknownReference)
+        kind = &findings::protocolError;
+    if (kind != nullptr)
+        report(*kind, call, message, nameOf(message) + " says " + wordsOf(found, message));
 }
 
 void CallFindings::checkStatus(const Call& call, Notes& notes, const Message& message) {
@@ -102,11 +107,17 @@ void CallFindings::checkStatus(const Call& call, Notes& notes, const Message& me
     const isdn::Element state = message.layer3.elements.find(element::callState);
     const auto value = isdn::callState(state);
     if (value && value->codingStandard == 0 && value->value == 0 && !notes.cleared) {
-        report(findings::statusIncompatible, &call, message, "STATUS names state 0 for a call that is alive");
+        std::string sentence = "STATUS names state 0 for a call that is alive";
+        if (call.incomplete)
+            report(findings::cannotBeTold, &call, message,
+                   sentence + " as far as the trace shows: frames are missing");
+        else
+            report(findings::statusIncompatible, &call, message, std::move(sentence));
         return;
     }
     const auto cause = isdn::cause(message.layer3.elements.find(element::cause));
-    if (!asked && cause && cause->codingStandard == 0 && cause->value == statusEnquiryAnswer)
+    if (!asked && !call.incomplete && cause && cause->codingStandard == 0 &&
+        cause->value == statusEnquiryAnswer)
         report(findings::statusUnasked, &call, message, "STATUS answers an enquiry that is not in the trace");
 }
 
@@ -127,18 +138,13 @@ void CallFindings::checkDigits(const Call& call, Notes& notes, const Message& me
     const std::int64_t waited = message.at - notes.lastDigit;
     constexpr std::int64_t shortestT302 = 10 * second;
     const bool inTime = waited >= shortestT302 && waited <= timers_.t302 + timers_.slack;
-    const bool goesOn = messageType == type::callProceeding || messageType == type::alerting;
+    const bool goesOn = messageType == type::callProceeding || messageType == type::alerting ||
+                        messageType == type::progress || messageType == type::connect;
     if (goesOn && inTime && !notes.sendingComplete && !call.beforeTrace && !notes.cleared &&
         (notes.acknowledged || call.firstResponse == message.at - call.begin.at))
         report(findings::waitsForDigits, &call, message,
                nameOf(message) + " came " + std::to_string(waited / second) + " s after the last digit");
-    const auto cause = isdn::cause(message.layer3.elements.find(element::cause));
-    if (isClearing(messageType) && !notes.cleared && notes.acknowledged && cause && waited >= shortestT302 &&
-        (cause->value == numberIncomplete || cause->value == timerExpired))
-        report(findings::setupAcknowledgeUnanswered, &call, message,
-               "no further digit came for " + std::to_string(waited / second) + " s after \"" +
-                   call.called.digits + "\"");
-    if (goesOn || messageType == type::connect)
+    if (goesOn)
         notes.acknowledged = false;
 }
 
@@ -170,11 +176,15 @@ void CallFindings::ended(Call& call, const Message* by) {
 }
 
 void CallFindings::replaced(Call& old, Call& by, const Message& message) {
-    if (old.uncertain)
-        return;  // perhaps only its end is missing in the trace
-    report(findings::referenceInUse, &by, message,
-           nameOf(message) + " takes the reference of call " + std::to_string(old.number) +
-               ", which had not ended");
+    std::string sentence = nameOf(message) + " takes the reference of call " + std::to_string(old.number) +
+                           ", which had not ended";
+    if (old.lack == Lack::board)
+        return;  // that was said
+    if (old.lack == Lack::frames)
+        report(findings::cannotBeTold, &by, message,
+               sentence + " as far as the trace shows: frames are missing");
+    else
+        report(findings::referenceInUse, &by, message, std::move(sentence));
 }
 
 void CallFindings::stray(const Message& message) {

@@ -37,7 +37,7 @@ class CallFindings : public CallObserver {
     };
 
     void checkElements(const Call* call, const Message& message, bool clearsFirst);
-    void checkCause(const Call& call, const Message& message);
+    void checkCause(const Call* call, const Message& message);
     void checkStatus(const Call& call, Notes& notes, const Message& message);
     void checkDigits(const Call& call, Notes& notes, const Message& message);
     void checkChannel(const Call& call, Notes& notes, const Message& message);

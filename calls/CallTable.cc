@@ -196,13 +196,18 @@ Life* CallTable::belongsTo(const Message& message, const CallKey& key) {
     const bool onlyEndsOrAsks = messageType == type::release || messageType == type::releaseComplete ||
                                 messageType == type::disconnect || messageType == type::status ||
                                 messageType == type::statusEnquiry;
-    if (onlyEndsOrAsks && remembered_.contains(key))
-        return nullptr;
+    if (const auto old = remembered_.find(key); onlyEndsOrAsks && old != remembered_.end()) {
+        // Its SETUP may be among what the recorder has missed.
+        const auto lost = lostAt_.find(key.tei);
+        if (lost == lostAt_.end() || lost->second < old->second)
+            return nullptr;
+    }
     return &begin(message, key);
 }
 
 void CallTable::hear(Life& life, const Message& message) {
     const bool hadEnded = life.ended;
+    noteHeard(life);
     learn(life, message);
     if (!hadEnded && message.layer3.type == type::suspend)
         life.identity = identityIn(message);
@@ -307,7 +312,35 @@ void CallTable::dropOldest() {
     forget(life);
 }
 
+void CallTable::noteHeard(Life& life) {
+    if (std::exchange(life.heardSinceLoss, true))
+        return;
+    constexpr std::size_t few = 64;
+    if (heardSinceLoss_.size() > 2 * lives_.size() + few)
+        std::erase_if(heardSinceLoss_, [&](std::uint64_t number) { return !inOrder_.contains(number); });
+    heardSinceLoss_.push_back(life.call.number);
+}
+
+void CallTable::framesLost(std::uint8_t tei) {
+    lostAt_[tei] = now_;
+    std::erase_if(heardSinceLoss_, [&](std::uint64_t number) {
+        const auto key = inOrder_.find(number);
+        if (key == inOrder_.end())
+            return true;
+        Life& life = *find(key->second);
+        if (life.call.tei != tei && !life.call.broadcast)
+            return false;
+        life.heardSinceLoss = false;
+        if (!life.ended) {
+            life.call.lack = Lack::frames;
+            life.call.incomplete = true;
+        }
+        return true;
+    });
+}
+
 void CallTable::advance(std::int64_t at) {
+    now_ = at;
     while (!deadlines_.empty() && deadlines_.begin()->first <= at) {
         const auto [key, generation] = deadlines_.begin()->second;
         deadlines_.erase(deadlines_.begin());
@@ -365,8 +398,13 @@ void CallTable::restarted(const Message& acknowledge) {
 }
 
 void CallTable::boardRestarted() {
-    for (const auto& [key, life] : lives_)
-        life->call.uncertain = !life->ended || life->call.uncertain;
+    for (const auto& [key, life] : lives_) {
+        if (!life->ended) {
+            life->call.lack = Lack::board;
+            life->call.incomplete = true;
+            life->call.uncertain = true;
+        }
+    }
 }
 
 void CallTable::finish() {

@@ -81,6 +81,8 @@ class CallTable {
     // The link of a TEI went down, or came up again.
     void linkDown(std::uint8_t tei, std::int64_t at);
     void linkUp(std::uint8_t tei);
+    // Messages of this TEI are missing in the trace: its calls may have ended unseen.
+    void framesLost(std::uint8_t tei);
     // The board restarted. Marks the calls that are open as uncertain.
     void boardRestarted();
 
@@ -115,6 +117,7 @@ class CallTable {
     void due(Life& life, std::int64_t at);
     void schedule(Life& life, std::int64_t at);
     void endLostLinks(std::int64_t at);
+    void noteHeard(Life& life);
     void joinSuspended(Life& life, const Message& message);
 
     const Timers& timers_;
@@ -126,6 +129,11 @@ class CallTable {
     std::map<std::uint8_t, std::int64_t> downSince_;  // by TEI
     std::map<CallKey, std::int64_t> remembered_;      // keys of calls that are gone, and when they ended
     std::list<CallKey> rememberedInOrder_;            // oldest first
+
+    // Numbers of the calls that were heard since frames were lost last, and when that was, by TEI.
+    std::vector<std::uint64_t> heardSinceLoss_;
+    std::map<std::uint8_t, std::int64_t> lostAt_;
+    std::int64_t now_ = 0;
 
     struct Suspended {
         std::uint64_t call;

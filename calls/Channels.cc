@@ -1,7 +1,6 @@
 #include "calls/Channels.h"
 
 #include <algorithm>
-#include <limits>
 #include <utility>
 
 #include "calls/FindingKinds.h"
@@ -43,7 +42,7 @@ void Channels::heard(Call& call, const Message& message) {
         return;
     const auto [entry, isNew] = seizures_.try_emplace(call.number);
     Seizure& seizure = entry->second;
-    seizure.origin = call.origin;
+    seizure.call = &call;
     const std::uint8_t messageType = message.layer3.type;
     if (messageType == type::setup && isNew) {
         setUp(call, seizure, message);
@@ -68,14 +67,26 @@ void Channels::setUp(Call& call, Seizure& seizure, const Message& message) {
     seizure.asked = channelsOf(call.asked);
     seizure.numbered = message.layer2.hasNs();
     seizure.setupNs = message.layer2.ns;
-    for (const ChannelKey& key : seizure.asked) {
+    for (const ChannelKey& key : seizure.asked)
         static_cast<void>(stateOf(key));
-        if (maintenance_.serviceOf(key) != Service::in)
-            sink_.report(findingOf(findings::serviceChannelSeized, message, &call,
-                                   "SETUP asks for channel " + toString(key) + ", which is out of service"));
-    }
+    checkService(call, seizure, seizure.asked, message);
     findGlare(call, seizure, message);
     hunt(call, seizure, message);
+}
+
+// Once a call, whether SETUP or the answer takes the channel.
+void Channels::checkService(const Call& call, Seizure& seizure, const std::vector<ChannelKey>& channels,
+                            const Message& message) {
+    for (const ChannelKey& key : channels) {
+        if (maintenance_.serviceOf(key) == Service::in || seizure.outOfServiceSaid)
+            continue;
+        seizure.outOfServiceSaid = true;
+        const bool asks = message.layer3.type == type::setup;
+        sink_.report(findingOf(findings::serviceChannelSeized, message, &call,
+                               std::string(isdn::messageName(message.layer3)) +
+                                   (asks ? " asks for" : " takes") + " channel " + toString(key) +
+                                   ", which is out of service"));
+    }
 }
 
 // Two SETUPs cross if neither side had received the other's: the N(R) of this one does not acknowledge the
@@ -84,7 +95,7 @@ void Channels::findGlare(Call& call, Seizure& seizure, const Message& message) {
     if (!seizure.numbered)
         return;
     for (auto& [number, opposite] : seizures_) {
-        if (opposite.origin == call.origin || opposite.answered || !opposite.numbered ||
+        if (opposite.call->origin == call.origin || opposite.answered || !opposite.numbered ||
             opposite.glare != 0 || !share(opposite.asked, seizure.asked) ||
             isAhead(message.layer2.nr, opposite.setupNs))
             continue;
@@ -120,22 +131,35 @@ void Channels::hunt(const Call& call, const Seizure& seizure, const Message& mes
 void Channels::hold(Call& call, Seizure& seizure, const Message& message) {
     release(call.number, seizure);
     seizure.held = channelsOf(call.held());
+    checkService(call, seizure, seizure.held, message);
     for (const ChannelKey& key : seizure.held) {
         State* const state = stateOf(key);
         if (state == nullptr)
             continue;
-        orphans_.erase(key);
+        stuck_.freed(key);
         state->refusals = 0;
-        for (const std::uint64_t holder : state->holders) {
-            if (seizure.glare == holder)
-                continue;  // reported as glare
-            conflicts_.push_back(
-                {key, holder, call.number, message.at + timers_.slack,
-                 findingOf(findings::doubleSeizure, message, &call,
-                           "channel " + toString(key) + " is given to " + callName(call.number) + " while " +
-                               callName(holder) + " holds it")});
-        }
+        findDoubleSeizure(call, key, *state, message);
         state->holders.push_back(call.number);
+    }
+}
+
+void Channels::findDoubleSeizure(const Call& call, const ChannelKey& key, State& state,
+                                 const Message& message) {
+    const std::vector<std::uint64_t> holders = state.holders;
+    for (const std::uint64_t holder : holders) {
+        const auto found = seizures_.find(holder);
+        if (found == seizures_.end() || found->second.glare == call.number)
+            continue;  // said as glare
+        std::string sentence = "channel " + toString(key) + " is given to " + callName(call.number) +
+                               " while " + callName(holder) + " holds it";
+        if (found->second.call->lack == Lack::nothing) {
+            conflicts_.push_back({key, holder, call.number, message.at + timers_.slack,
+                                  findingOf(findings::doubleSeizure, message, &call, std::move(sentence))});
+            continue;
+        }
+        sink_.report(findingOf(findings::cannotBeTold, message, &call,
+                               sentence + " as far as the trace shows: frames are missing"));
+        release(holder, found->second);
     }
 }
 
@@ -189,9 +213,9 @@ void Channels::ended(Call& call, const Message*) {
     settleGlare(call, seizure, nullptr);
     const std::vector<ChannelKey> held = seizure.held;
     release(call.number, seizure);
-    seizure.held = held;
-    noteOrphan(call, seizure);
-    seizure.held.clear();
+    const bool lost = call.endedBy == EndedBy::replaced || call.endedBy == EndedBy::link;
+    if (lost && !call.clearingSeen && call.lack == Lack::nothing)
+        stuck_.left(call, held);
     seizure.asked.clear();
 }
 
@@ -211,7 +235,8 @@ void Channels::noteRefusal(const Call& call, const Seizure& seizure) {
     const std::uint8_t value = call.cause->value;
     const Made made = madeBy(*call.cause);
     const bool aboutThisChannel = value == requestedNotAvailable || value == doesNotExist;
-    if (!aboutThisChannel && (value != noChannel || made != Made::thisExchange))
+    const bool madeHere = made == Made::here || made == Made::thisExchange;
+    if (!aboutThisChannel && (value != noChannel || !madeHere))
         return;
     const ChannelKey& key = seizure.asked.front();
     State& state = *stateOf(key);
@@ -225,50 +250,6 @@ void Channels::noteRefusal(const Call& call, const Seizure& seizure) {
     } else {
         sink_.report(findingOf(findings::channelRefused, call.end, call, std::move(sentence)));
     }
-}
-
-// The call went away without clearing. One end may still hold the channel.
-void Channels::noteOrphan(const Call& call, const Seizure& seizure) {
-    const bool lost = call.endedBy == EndedBy::replaced || call.endedBy == EndedBy::link;
-    if (!lost || call.clearingSeen || call.uncertain)
-        return;
-    for (const ChannelKey& key : seizure.held) {
-        Finding stuck = findingOf(findings::stuckChannel, call.end, call,
-                                  "channel " + toString(key) + " of " + callName(call.number) +
-                                      " was neither cleared nor restarted");
-        stuck.channels = {toString(key)};
-        orphans_[key] = {call.end.at, call.number, call.endedBy == EndedBy::link, std::move(stuck)};
-    }
-}
-
-// Reports the channels whose calls went away before this moment. Calls that went away with a link have one
-// cause, so they are reported in one finding.
-void Channels::reportOrphans(std::int64_t before) {
-    std::vector<Orphan> lost;
-    for (auto orphan = orphans_.begin(); orphan != orphans_.end();) {
-        if (orphan->second.at >= before) {
-            ++orphan;
-            continue;
-        }
-        if (orphan->second.withLink)
-            lost.push_back(std::move(orphan->second));
-        else
-            sink_.report(std::move(orphan->second.finding));
-        orphan = orphans_.erase(orphan);
-    }
-    if (lost.empty())
-        return;
-    Finding all = std::move(lost.front().finding);
-    if (lost.size() > 1) {
-        std::vector<std::string> calls{std::to_string(lost.front().call)};
-        for (std::size_t i = 1; i < lost.size(); ++i) {
-            all.channels.push_back(lost[i].finding.channels.front());
-            calls.push_back(std::to_string(lost[i].call));
-        }
-        all.sentence = "channels " + listOf(all.channels) + " of calls " + listOf(calls) +
-                       " were neither cleared nor restarted after the link was lost";
-    }
-    sink_.report(std::move(all));
 }
 
 void Channels::restarted(const Message& acknowledge) {
@@ -288,7 +269,7 @@ void Channels::restarted(const Message& acknowledge) {
     for (auto& [key, state] : states_) {
         if (!isMeant(key))
             continue;
-        orphans_.erase(key);
+        stuck_.freed(key);
         state.refusals = 0;
         state.seenFree = state.seenFree || state.holders.empty();
     }
@@ -298,7 +279,6 @@ void Channels::boardRestarted() {
     for (auto& [key, state] : states_)
         state = {};
     seizures_.clear();
-    orphans_.clear();
     conflicts_.clear();
 }
 
@@ -317,10 +297,7 @@ void Channels::advance(std::int64_t at) {
         if (holds(conflict.first) && holds(conflict.second))
             sink_.report(std::move(conflict.finding));
     }
-    reportOrphans(at - timers_.t316);
 }
-
-void Channels::finish() { reportOrphans(std::numeric_limits<std::int64_t>::max()); }
 
 std::map<ChannelKey, std::vector<std::uint64_t>> Channels::holders() const {
     std::map<ChannelKey, std::vector<std::uint64_t>> all;

@@ -10,6 +10,7 @@
 #include "calls/CallTable.h"
 #include "calls/FindingSink.h"
 #include "calls/Maintenance.h"
+#include "calls/StuckChannels.h"
 #include "calls/Timers.h"
 
 namespace calls {
@@ -18,8 +19,9 @@ namespace calls {
 // on hold. A channel that was only asked for is not held.
 class Channels : public CallObserver {
   public:
-    Channels(const Timers& timers, const Maintenance& maintenance, FindingSink& sink)
-        : timers_(timers), maintenance_(maintenance), sink_(sink) {}
+    // `stuck` is told of channels whose calls went without clearing.
+    Channels(const Timers& timers, const Maintenance& maintenance, StuckChannels& stuck, FindingSink& sink)
+        : timers_(timers), maintenance_(maintenance), stuck_(stuck), sink_(sink) {}
 
     void heard(Call& call, const Message& message) override;
     void ended(Call& call, const Message* by) override;
@@ -30,9 +32,6 @@ class Channels : public CallObserver {
     void boardRestarted();
     // The clock has come to `at`. Call this before handing in what happened at that time.
     void advance(std::int64_t at);
-    // The end of the trace.
-    void finish();
-
     // The numbers of the calls that hold a channel, by channel. Has an entry, perhaps an empty one, for each
     // channel that was ever named.
     std::map<ChannelKey, std::vector<std::uint64_t>> holders() const;
@@ -45,7 +44,7 @@ class Channels : public CallObserver {
     };
     // What is remembered about a call that is alive.
     struct Seizure {
-        Side origin = Side::us;
+        const Call* call = nullptr;  // there as long as this is
         std::vector<ChannelKey> asked;
         std::vector<ChannelKey> held;
         bool answered = false;  // the other side has answered SETUP
@@ -53,6 +52,7 @@ class Channels : public CallObserver {
         std::uint8_t setupNs = 0;
         std::uint64_t glare = 0;  // the number of the call that crosses this one, or 0
         bool glareSettled = false;
+        bool outOfServiceSaid = false;
     };
     // Two calls on one channel. Reported only if both are still there a moment later, because the recorder
     // may give frames of the two directions in the wrong order.
@@ -61,13 +61,6 @@ class Channels : public CallObserver {
         std::uint64_t first;
         std::uint64_t second;
         std::int64_t deadline;
-        Finding finding;
-    };
-    // A channel whose call went away without clearing. One end may still hold it.
-    struct Orphan {
-        std::int64_t at = 0;
-        std::uint64_t call = 0;
-        bool withLink = false;  // the call went away because its link did
         Finding finding;
     };
     // The order in which a side takes channels.
@@ -81,11 +74,12 @@ class Channels : public CallObserver {
     void findGlare(Call& call, Seizure& seizure, const Message& message);
     void hunt(const Call& call, const Seizure& seizure, const Message& message);
     void hold(Call& call, Seizure& seizure, const Message& message);
+    void findDoubleSeizure(const Call& call, const ChannelKey& key, State& state, const Message& message);
+    void checkService(const Call& call, Seizure& seizure, const std::vector<ChannelKey>& channels,
+                      const Message& message);
     void release(std::uint64_t call, Seizure& seizure);
     void settleGlare(Call& call, Seizure& seizure, const Message* message);
     void noteRefusal(const Call& call, const Seizure& seizure);
-    void noteOrphan(const Call& call, const Seizure& seizure);
-    void reportOrphans(std::int64_t before);
     bool isKnownIdle(const std::vector<ChannelKey>& channels) const;
     State* stateOf(const ChannelKey& key);
 
@@ -93,10 +87,10 @@ class Channels : public CallObserver {
 
     const Timers& timers_;
     const Maintenance& maintenance_;
+    StuckChannels& stuck_;
     FindingSink& sink_;
     std::map<ChannelKey, State> states_;
     std::map<std::uint64_t, Seizure> seizures_;  // by number of the call
-    std::map<ChannelKey, Orphan> orphans_;       // reported unless somebody restarts or takes the channel
     std::vector<Conflict> conflicts_;
     std::array<Hunting, 2> hunting_;
     bool glareProneSaid_ = false;

@@ -88,9 +88,12 @@ std::vector<BrokenRule> brokenElementRules(const Message& message, bool clearsFi
             broken.push_back({&findings::elementAbsent, name + " has no " + nameOf(id, message.variant)});
     };
     for (const Mandatory& each : mandatory) {
-        if (each.message == layer3.type && !(each.message == type::disconnect && !clearsFirst))
+        if (each.message == layer3.type)
             demand(each.element);
     }
+    // The user may leave the channel to the network, which has to choose one (Q.931 table 3-15).
+    if (layer3.type == type::setup && message.sender() == isdn::Sender::network)
+        demand(element::channelIdentification);
     if (clearsFirst && (layer3.type == type::release || layer3.type == type::releaseComplete))
         demand(element::cause);
     if (layer3.type == type::facility && !seen.test(element::facility) &&

@@ -38,7 +38,8 @@ struct Finding {
     Severity severity = Severity::note;  // the severity of its kind, or a milder one
     std::uint64_t frame = 0;             // the frame's number in the input, from 1
     capture::Clock clock = capture::Clock::none;
-    std::int64_t time = 0;  // nanoseconds, as `clock` says
+    std::int64_t time = 0;    // nanoseconds, as `clock` says
+    std::string_view clause;  // that of its kind, unless the case falls under another one
     std::string dChannel;
     std::optional<std::uint64_t> call;  // the call's number, if the finding is about a call
     std::string sentence;               // what happened, with the values of this case; no full stop

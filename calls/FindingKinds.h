@@ -85,7 +85,7 @@ inline constexpr FindingKind setupUnanswered{"setup-unanswered", Severity::error
 inline constexpr FindingKind setupRepeated{"setup-repeated", Severity::note, "Q.931 5.1.1, T303",
     "SETUP was repeated, since no answer had come",
     "the load of the other end"};
-inline constexpr FindingKind setupAcknowledgeUnanswered{"overlap-timeout", Severity::warning, "Q.931 5.1.3, T302, T304",
+inline constexpr FindingKind overlapTimeout{"overlap-timeout", Severity::warning, "Q.931 5.1.3, T302, T304",
     "overlap sending ended because no further digit came",
     "the dial plan: how many digits the network expects"};
 inline constexpr FindingKind waitsForDigits{"waits-for-digits", Severity::note, "Q.931 5.1.3, T302",
@@ -94,6 +94,9 @@ inline constexpr FindingKind waitsForDigits{"waits-for-digits", Severity::note, 
 inline constexpr FindingKind proceedingUnanswered{"proceeding-unanswered", Severity::warning, "Q.931 5.1.7, T310",
     "CALL PROCEEDING was followed by nothing",
     "the network beyond the other end"};
+inline constexpr FindingKind alertingUnanswered{"alerting-unanswered", Severity::note, "Q.931 5.1.8, T301",
+    "ALERTING was followed by nothing for longer than T301",
+    "whether somebody is meant to answer: a queue may let a call ring as long"};
 inline constexpr FindingKind connectNotAcknowledged{"connect-not-acknowledged", Severity::warning, "Q.931 5.2.8, T313",
     "the network did not acknowledge the user's CONNECT",
     "the network side: the call may be cleared, or stay one-way"};
@@ -109,6 +112,12 @@ inline constexpr FindingKind releaseUnanswered{"release-unanswered", Severity::e
 inline constexpr FindingKind releaseRepeated{"release-repeated", Severity::note, "Q.931 5.3.3, T308",
     "RELEASE was repeated, since no answer had come",
     "the load of the other end"};
+inline constexpr FindingKind suspendUnanswered{"suspend-unanswered", Severity::warning, "Q.931 5.6.2, T319",
+    "SUSPEND was not answered",
+    "the network's call control: whether it offers to suspend calls"};
+inline constexpr FindingKind resumeUnanswered{"resume-unanswered", Severity::warning, "Q.931 5.6.4, T318",
+    "RESUME was not answered",
+    "the network's call control: whether it still has the suspended call"};
 inline constexpr FindingKind statusEnquiryUnanswered{"status-enquiry-unanswered", Severity::warning, "Q.931 5.8.10, T322",
     "STATUS ENQUIRY was not answered",
     "the call control of the other end"};
@@ -184,7 +193,7 @@ inline constexpr FindingKind massClear{"mass-clear", Severity::error, "Q.931 5.8
 inline constexpr FindingKind interfaceMismatch{"interface-mismatch", Severity::warning, "Q.931 4.5.13",
     "the two ends name different interfaces",
     "the interface numbers of the NFAS group"};
-inline constexpr FindingKind timer102{"timer-expired", Severity::warning, "Q.850 102",
+inline constexpr FindingKind timer102{"timer-102", Severity::warning, "Q.850 102",
     "a call was cleared because a timer ran out",
     "the timer that the diagnostic names"};
 inline constexpr FindingKind sameDuration{"same-duration", Severity::note, "",
@@ -231,14 +240,17 @@ inline constexpr const FindingKind* kinds[] = {
     &boardRestarted,
     &setupUnanswered,
     &setupRepeated,
-    &setupAcknowledgeUnanswered,
+    &overlapTimeout,
     &waitsForDigits,
     &proceedingUnanswered,
+    &alertingUnanswered,
     &connectNotAcknowledged,
     &connectNeverAcknowledged,
     &disconnectUnanswered,
     &releaseUnanswered,
     &releaseRepeated,
+    &suspendUnanswered,
+    &resumeUnanswered,
     &statusEnquiryUnanswered,
     &statusIncompatible,
     &statusUnasked,

@@ -1,6 +1,7 @@
 #include "calls/Life.h"
 
 #include <algorithm>
+#include <utility>
 
 #include "calls/causes.h"
 #include "isdn/words.h"
@@ -25,7 +26,8 @@ void learnNumber(Number& number, const Element& found) {
         number = numberOf(*party);
 }
 
-// The digits of the called party come in SETUP and, one by one, in INFORMATION.
+// The digits of the called party come in SETUP and, one by one, in INFORMATION: each time in CALLED PARTY NUM
+// or else in KEYPAD. The first of the former gives type and plan.
 void learnDigits(Life& life, const Message& message) {
     Call& call = life.call;
     const isdn::Layer3& layer3 = message.layer3;
@@ -34,15 +36,11 @@ void learnDigits(Life& life, const Message& message) {
         return;
     const auto party = isdn::partyNumber(layer3.elements.find(element::calledNumber));
     const std::string_view keypad = isdn::keypadDigits(layer3.elements.find(element::keypad));
-    std::string_view digits;
-    if (party && !life.digitsFromKeypad) {
-        if (call.called.digits.empty())
-            call.called = numberOf(*party);
-        else
-            digits = party->digits;
-    } else if (!keypad.empty() && (life.digitsFromKeypad || call.called.digits.empty())) {
-        life.digitsFromKeypad = true;
-        digits = keypad;
+    const std::string_view digits = party ? party->digits : keypad;
+    if (party && !std::exchange(life.numberTyped, true)) {
+        std::string before = std::move(call.called.digits);  // from KEYPAD
+        call.called = numberOf(*party);
+        call.called.digits = std::move(before);
     }
     constexpr std::size_t most = 256;  // nobody dials a longer number
     if (call.called.digits.size() + digits.size() <= most)
@@ -75,6 +73,9 @@ void learnChannel(Life& life, const Message& message) {
     if (!channel)
         return;
     Call& call = life.call;
+    // A connection on the D channel itself; "no channel" alone is a call that waits for one.
+    if (channel->dChannel && channel->channels.none())
+        call.kind = Kind::signalling;
     if (message.layer3.type == type::retrieveAcknowledge || message.layer3.type == type::resumeAcknowledge)
         call.moved = channel;
     if (message.from() == call.origin) {
@@ -237,6 +238,7 @@ void learn(Life& life, const Message& message) {
         return;
     }
     call.end = momentOf(message);
+    call.lack = Lack::nothing;
     const isdn::Elements& elements = message.layer3.elements;
     learnNumber(call.calling, elements.find(element::callingNumber));
     learnNumber(call.connected, elements.find(element::connectedNumber));

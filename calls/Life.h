@@ -18,8 +18,9 @@ struct Life {
     std::int64_t lastSetup = 0;       // when it was sent last
     bool answered = false;            // any message from the other side
     bool proceeding = false;          // CALL PROCEEDING or later: no more digits come
-    bool digitsFromKeypad = false;
+    bool numberTyped = false;         // the called number has its type and plan
     bool ended = false;
+    bool heardSinceLoss = false;   // some message of it came since frames were lost last
     std::uint64_t generation = 0;  // the generation of its deadlines that count; older deadlines are ignored
     std::optional<Side> releasedBy;    // who sent RELEASE first
     std::optional<Side> clearedFirst;  // who sent the first clearing message

@@ -96,6 +96,11 @@ class Link {
     bool sawSetUp() const { return sawSetUp_; }
     const CommandBits& commands() const { return commands_; }
     const Stream& sentBy(Side side) const { return streams_[indexOf(side)]; }
+    // The numbers suggest that I frames of this side are missing in the trace; what comes next decides.
+    bool mayLackFramesOf(Side side) const {
+        const std::optional<PendingNr>& nr = beyond_[indexOf(other(side))];
+        return sentBy(side).hasOpenHole() || (nr && !nr->behind);
+    }
 
   private:
     struct Poll {
@@ -111,6 +116,7 @@ class Link {
         std::uint8_t nr;
         std::uint64_t frame;
         std::int64_t at;
+        bool behind;  // it names frames that were acknowledged long before
     };
 
     void setUp(const Sample& sample, Marks& marks, std::vector<LinkEvent>& events);
@@ -123,7 +129,7 @@ class Link {
     void polled(const Sample& sample, Marks& marks);
     void isAlive(const Sample& sample);
     bool beginsAgain(const Sample& sample) const;
-    void settleNr(const Sample& sample, std::vector<LinkEvent>& events);
+    void settleNr(const Sample& sample, const Stream::Taken& taken, std::vector<LinkEvent>& events);
     void report(const Sample& sample, Side sender, const Stream::Taken& taken,
                 std::vector<LinkEvent>& events);
     void giveUpHoles(std::vector<LinkEvent>& events);

@@ -195,6 +195,7 @@ void LinkFindings::observe(Observation observation, std::uint8_t tei) {
     Finding finding;
     finding.kind = observation.kind;
     finding.severity = observation.severity;
+    finding.clause = observation.kind->clause;
     finding.frame = observation.frame;
     finding.clock = clock_;
     finding.time = observation.at + offset_;

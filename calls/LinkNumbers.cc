@@ -24,8 +24,9 @@ void Link::supervise(const Sample& sample, std::vector<LinkEvent>& events, std::
         return;
     Stream& stream = streams_[indexOf(sender)];
     std::optional<PendingNr>& pending = beyond_[indexOf(sample.from())];
-    if (stream.isBeyond(sample.layer2.nr) && missing_[indexOf(sender)].reason.empty() && !pending)
-        pending = PendingNr{sample.layer2.nr, sample.number, sample.at};
+    const bool behind = stream.isLongAcknowledged(sample.layer2.nr);
+    if ((behind || stream.isBeyond(sample.layer2.nr)) && missing_[indexOf(sender)].reason.empty() && !pending)
+        pending = PendingNr{sample.layer2.nr, sample.number, sample.at, behind};
     report(sample, sender, stream.acknowledged(sample, missing_[indexOf(sender)].reason, late), events);
 }
 
@@ -69,24 +70,28 @@ void Link::information(const Sample& sample, Marks& marks, std::vector<LinkEvent
         marks.accepted = taken.verdict == Stream::Verdict::accepted;
     report(sample, from, taken, events);
     missing_[indexOf(from)].seen = 0;
-    settleNr(sample, events);
+    settleNr(sample, taken, events);
 }
 
 // Decides about an N(R) that acknowledged more than was seen, now that the sender has shown how far it was.
 // It waits for that because the two directions are recorded up to 8 ms out of order.
-void Link::settleNr(const Sample& sample, std::vector<LinkEvent>& events) {
+void Link::settleNr(const Sample& sample, const Stream::Taken& taken, std::vector<LinkEvent>& events) {
     std::optional<PendingNr>& pending = beyond_[indexOf(other(sample.from()))];
     if (!pending)
         return;
+    const bool goesOn = taken.verdict == Stream::Verdict::accepted && !taken.again;
     const Stream& stream = streams_[indexOf(sample.from())];
     const bool covered = !isAhead(pending->nr, stream.next());
     const bool prompt = sample.at - pending->at <= timers_->slack;
     if (!covered && prompt)
         return;
+    // Numbers that do not go on show that a new set-up is missing, and nothing about this N(R).
+    if (pending->behind && !goesOn)
+        return pending.reset();
     // Whether a hole up to this number has been reported already, as one that the recorder made.
     const bool holeWasReported = !events.empty() && events.back().kind == LinkEvent::Kind::hole &&
                                  events.back().frame == sample.number;
-    if (!(covered && prompt) && !holeWasReported)
+    if ((pending->behind || !(covered && prompt)) && !holeWasReported)
         events.push_back({.kind = LinkEvent::Kind::nrInvalid,
                           .from = other(sample.from()),
                           .frame = pending->frame,

@@ -242,11 +242,20 @@ void LinkWatch::expire(std::int64_t at, const Circumstances& around) {
     schedule(around);
 }
 
-// When the last repetition's answer is overdue.
+void LinkWatch::Asked::add(const Sample& sample) {
+    if (count == 0)
+        *this = {0, sample.number, sample.at, sample.at};
+    ++count;
+    last = sample.at;
+    if (count == repetitions200 + 1)
+        exhausted = sample.at;
+}
+
+// When the answer to the last allowed repetition is overdue. Some equipment repeats for ever.
 std::int64_t LinkWatch::dueOf(const Asked& asked, const Circumstances& around) {
     if (asked.count <= repetitions200 || asked.reported)
         return never;
-    return asked.last + around.timers->t200 + around.timers->slack;
+    return asked.exhausted + around.timers->t200 + around.timers->slack;
 }
 
 std::int64_t LinkWatch::dueOf(const Idle& idle, const Circumstances& around) const {

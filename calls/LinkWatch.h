@@ -63,15 +63,11 @@ class LinkWatch {
         std::uint64_t frame = 0;  // the first of them
         std::int64_t first = 0;
         std::int64_t last = 0;
-        bool heard = false;  // something else came from the other side
+        std::int64_t exhausted = 0;  // when the last repetition that is allowed was sent
+        bool heard = false;          // something else came from the other side
         bool reported = false;
 
-        void add(const Sample& sample) {
-            if (count == 0)
-                *this = {0, sample.number, sample.at, sample.at};
-            ++count;
-            last = sample.at;
-        }
+        void add(const Sample& sample);
     };
     struct Since {  // something that lasts
         bool holds = false;

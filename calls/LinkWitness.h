@@ -12,7 +12,8 @@
 
 namespace calls {
 
-// Describes the link of one TEI of one D channel after the last frame. WitnessKeeper keeps it up to date.
+// Describes the link of one TEI of one D channel after the last frame. Arrays are by side. WitnessKeeper
+// keeps it up to date.
 struct LinkWitness {
     static constexpr std::int64_t never = std::numeric_limits<std::int64_t>::min();
 
@@ -20,24 +21,33 @@ struct LinkWitness {
     // always been up.
     std::int64_t lastDown = never;
     bool up = true;
-    // By side: the number of its last I frame that the other side's N(R) has acknowledged, 0 for none, and
-    // the last moment at which one of its I frames was found to be missing in the trace.
+    // Some frame of the side is in the trace, of whichever layer.
+    std::array<bool, 2> heard{};
+    // The number of its last I frame that the other side's N(R) has acknowledged, 0 for none.
     std::array<std::uint64_t, 2> acknowledged{};
+    // The last moment at which one of its I frames was found to be missing in the trace; and whether one is
+    // thought to be missing now, since the next numbers decide.
     std::array<std::int64_t, 2> lastHole{never, never};
+    std::array<bool, 2> holeOpen{};
+    // The last moment at which the recorder said that it may have missed frames.
+    std::array<std::int64_t, 2> lastLoss{never, never};
+    // The last moment at which its numbers, or the other side's N(R), showed that none is missing.
+    std::array<std::int64_t, 2> wholeUntil{never, never};
+
+    // Something was found to be missing at `at`.
+    bool isShortAt(std::int64_t at) const { return lastHole[0] == at || lastHole[1] == at; }
+    bool heardBoth() const { return heard[0] && heard[1]; }
 
     bool hasArrived(std::uint64_t frame, Side from) const {
         return acknowledged[static_cast<std::size_t>(from)] >= frame;
     }
     bool wasUpSince(std::int64_t at) const { return up && lastDown < at; }
     bool isWholeSince(std::int64_t at, Side from) const {
-        return lastHole[static_cast<std::size_t>(from)] < at;
+        const auto side = static_cast<std::size_t>(from);
+        return lastHole[side] < at && !holeOpen[side] &&
+               (lastLoss[side] < at || wholeUntil[side] > lastLoss[side]);
     }
 };
-
-// Why it cannot be told whether a question of `asker`, asked in `frame` at `at`, was answered; empty if it
-// can. `link` may be null.
-std::string_view doubtAbout(const LinkWitness* link, std::uint64_t frame, std::int64_t at, Side asker,
-                            Side answering);
 
 // Gives the witness of the link that carries the calls of a TEI, or null if nothing is known of that link.
 class LinkWitnesses {

@@ -1,6 +1,7 @@
 #include "calls/Maintenance.h"
 
 #include <algorithm>
+#include <limits>
 
 #include "calls/FindingKinds.h"
 #include "calls/findingOf.h"
@@ -58,7 +59,6 @@ std::string toString(const ChannelKey& channel) {
 }
 
 void Maintenance::take(const Message& message) {
-    heard_ |= message.from() == Side::us ? 1U : 2U;
     const isdn::Layer3& layer3 = message.layer3;
     if (!layer3.hasType)
         return;
@@ -184,42 +184,41 @@ void Maintenance::serviceAcknowledge(const Message& message) {
     });
 }
 
-bool Maintenance::isDue(const Asked& asked, std::int64_t at) const {
+std::int64_t Maintenance::dueAt(const Asked& asked) const {
     if (asked.service)
-        return asked.repetitions > 0 && at - asked.first.at > servicePatience + timers_.slack;
-    const std::int64_t limit =
-        asked.repetitions == 0 ? asked.first.at + 2 * timers_.t316 : asked.last.at + timers_.t316;
-    return at > limit + timers_.slack;
+        return asked.repetitions == 0 ? std::numeric_limits<std::int64_t>::max()
+                                      : asked.first.at + servicePatience + timers_.slack;
+    return (asked.repetitions == 0 ? asked.first.at + 2 * timers_.t316 : asked.last.at + timers_.t316) +
+           timers_.slack;
 }
 
 void Maintenance::advance(std::int64_t at) {
     for (std::size_t i = 0; i < asked_.size();) {
-        if (!isDue(asked_[i], at)) {
+        if (at <= dueAt(asked_[i])) {
             ++i;
             continue;
         }
-        expire(asked_[i]);
+        expire(asked_[i], dueAt(asked_[i]) - timers_.slack);
         asked_.erase(asked_.begin() + static_cast<std::ptrdiff_t>(i));
     }
+    constexpr std::int64_t never = std::numeric_limits<std::int64_t>::max();
+    verdicts_.advance(at, asked_.empty() ? never : asked_.front().first.at);
 }
 
-void Maintenance::expire(const Asked& asked) {
-    if (heard_ != 3U || (asked.service && !acknowledgesService_[indexOf(other(asked.asker))]))
+void Maintenance::expire(const Asked& asked, std::int64_t until) {
+    if (asked.service && !acknowledgesService_[indexOf(other(asked.asker))])
         return;
     const FindingKind& kind =
         asked.service ? findings::serviceUnacknowledged : findings::restartUnacknowledged;
-    const std::string what = std::string(asked.service ? "SERVICE" : "RESTART") + " of frame " +
-                             std::to_string(asked.first.frame) + " got no acknowledge";
-    const std::string_view doubt = doubtAbout(links_.witness(asked.tei), asked.first.frame, asked.first.at,
-                                              asked.asker, other(asked.asker));
-    if (doubt.empty())
-        report(kind, asked, what);
-    else
-        report(findings::cannotBeTold, asked, what + ", but " + std::string(doubt));
+    std::string what = std::string(asked.service ? "SERVICE" : "RESTART") + " of frame " +
+                       std::to_string(asked.first.frame) + " got no acknowledge";
+    verdicts_.judge({findingOf(kind, asked.last, asked.dChannel, std::move(what)), asked.tei, asked.asker,
+                     other(asked.asker), asked.first.frame, asked.first.at, until});
 }
 
-void Maintenance::report(const FindingKind& kind, const Asked& asked, std::string sentence) {
-    sink_.report(findingOf(kind, asked.last, asked.dChannel, std::move(sentence)));
+void Maintenance::boardRestarted() {
+    asked_.clear();
+    verdicts_.forget();
 }
 
 Service Maintenance::serviceOf(const ChannelKey& channel) const {

@@ -19,6 +19,7 @@
 #include "calls/LinkWitness.h"
 #include "calls/Message.h"
 #include "calls/Timers.h"
+#include "calls/Verdicts.h"
 
 namespace calls {
 
@@ -39,13 +40,16 @@ enum class Service : std::uint8_t { in, maintenance, out };
 class Maintenance {
   public:
     Maintenance(const Timers& timers, const LinkWitnesses& links, FindingSink& sink)
-        : timers_(timers), links_(links), sink_(sink) {}
+        : timers_(timers), sink_(sink), verdicts_(timers, links, sink) {}
 
-    // Takes every message. Messages other than RESTART, SERVICE and their answers only show that their side
-    // is heard.
+    // Takes every message, and passes over those that are not RESTART, SERVICE or their answers.
     void take(const Message& message);
     // The clock has come to `at`. Call this before handing in what happened at that time.
     void advance(std::int64_t at);
+    // The end of the trace. Timers that run are void.
+    void finish() { verdicts_.finish(); }
+    // The board restarted: whether an answer came is not known.
+    void boardRestarted();
 
     Service serviceOf(const ChannelKey& channel) const;
     // The side that has taken the channel furthest out of service; empty if it is in service.
@@ -76,15 +80,13 @@ class Maintenance {
     void serviceAcknowledge(const Message& message);
     void ask(const Message& message, const Target& target, bool isService);
     void countRestart(const Message& message, const Target& target);
-    bool isDue(const Asked& asked, std::int64_t at) const;
-    void expire(const Asked& asked);
-    void report(const FindingKind& kind, const Asked& asked, std::string sentence);
+    std::int64_t dueAt(const Asked& asked) const;
+    void expire(const Asked& asked, std::int64_t until);
 
     const Timers& timers_;
-    const LinkWitnesses& links_;
     FindingSink& sink_;
-    std::vector<Asked> asked_;  // a few: at most `mostAsked`
-    unsigned heard_ = 0;        // bits 1 and 2: sides that have sent
+    Verdicts verdicts_;
+    std::vector<Asked> asked_;  // at most `mostAsked`, the oldest first
     std::array<bool, 2> acknowledgesService_{};
     std::map<std::pair<Side, ChannelKey>, Service> status_;
     // Times of the last restarts by side and channel; class 6 and 7 count as channels of their own.

@@ -30,6 +30,17 @@ bool isOrdinary(std::uint8_t cause) {
     return std::find(ordinary.begin(), ordinary.end(), cause) != ordinary.end();
 }
 
+// "national/ISDN"; empty without a number.
+std::string kindOf(const Number& number) {
+    if (number.digits.empty())
+        return {};
+    const auto named = [](std::string_view name, std::uint8_t value) {
+        return name.empty() ? std::to_string(value) : std::string(name);
+    };
+    return named(isdn::numberTypeName(number.type), number.type) + "/" +
+           named(isdn::numberingPlanName(number.plan), number.plan);
+}
+
 }  // namespace
 
 void Patterns::ended(Call& call, const Message*) {
@@ -38,7 +49,7 @@ void Patterns::ended(Call& call, const Message*) {
     if (endsWithLink(call)) {
         if (lost_.empty())
             lostAt_ = call.end.at;
-        lost_.push_back(std::to_string(call.number));
+        lost_.push_back(call.number);
     }
     findSameDuration(call);
     findCauseBurst(call);
@@ -62,10 +73,16 @@ bool Patterns::endsWithLink(const Call& call) const {
 }
 
 void Patterns::reportMassClear() {
-    if (lost_.size() >= callsThatEndTogether)
-        sink_.report(findingOf(findings::massClear, link_->moment, link_->dChannel,
-                               std::to_string(lost_.size()) + " calls ended with the link, which " +
-                                   (link_->isUp ? "was set up" : "went down") + " here: " + listOf(lost_)));
+    if (lost_.size() >= callsThatEndTogether) {
+        std::vector<std::string> names;
+        for (const std::uint64_t call : lost_)
+            names.push_back(std::to_string(call));
+        stuck_.lostWithLink(
+            findingOf(findings::massClear, link_->moment, link_->dChannel,
+                      std::to_string(lost_.size()) + " calls ended with the link, which " +
+                          (link_->isUp ? "was set up" : "went down") + " here: " + listOf(names)),
+            lost_);
+    }
     lost_.clear();
 }
 
@@ -97,6 +114,22 @@ void Patterns::findSameDuration(const Call& call) {
                                std::to_string((*call.duration + second / 2) / second) + " s"));
 }
 
+// What the cause is about, of the last call.
+std::string Patterns::detailsOf(const Failure& failure) {
+    switch (failure.cause) {
+        case 57:
+        case 58:
+        case 65:
+        case 88:
+            return failure.bearer.empty() ? std::string() : "; bearer " + failure.bearer;
+        case 1:
+        case 28:
+            return failure.numberKind.empty() ? std::string() : "; number " + failure.numberKind;
+        default:
+            return {};
+    }
+}
+
 void Patterns::findCauseBurst(const Call& call) {
     if (!call.cause || call.cause->codingStandard != 0 || isOrdinary(call.cause->value) || !hasFailed(call))
         return;
@@ -105,7 +138,8 @@ void Patterns::findCauseBurst(const Call& call) {
         failures_.pop_front();
     const std::vector<ChannelKey> channels = channelsOf(call.channel());
     failures_.push_back({call.end.at, call.cause->value, call.called.digits.substr(0, prefixDigits),
-                         channels.empty() ? std::string() : toString(channels.front()), call.bearer});
+                         channels.empty() ? std::string() : toString(channels.front()), call.bearer,
+                         kindOf(call.called)});
     const Failure& last = failures_.back();
     if (const auto said = burstSaid_.find(last.cause);
         said != burstSaid_.end() && last.at - said->second < burstSilence)
@@ -129,7 +163,7 @@ void Patterns::findCauseBurst(const Call& call) {
     burstSaid_[last.cause] = last.at;
     sink_.report(findingOf(findings::causeBurst, call.end, call,
                            "cause " + std::to_string(last.cause) + " in " + std::to_string(callsOfABurst) +
-                               " calls within a minute, " + common));
+                               " calls within a minute, " + common + detailsOf(last)));
 }
 
 }  // namespace calls

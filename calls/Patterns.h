@@ -11,6 +11,7 @@
 
 #include "calls/CallTable.h"
 #include "calls/FindingSink.h"
+#include "calls/StuckChannels.h"
 
 namespace calls {
 
@@ -18,7 +19,8 @@ namespace calls {
 // table reports them. Memory is bounded: it remembers the last few calls.
 class Patterns : public CallObserver {
   public:
-    explicit Patterns(FindingSink& sink) : sink_(sink) {}
+    // `stuck` is told of calls that went with their link: some of their channels may stay behind.
+    Patterns(StuckChannels& stuck, FindingSink& sink) : stuck_(stuck), sink_(sink) {}
     void ended(Call& call, const Message* by) override;
     // A link went down, or was set up (again), in this frame.
     void linkChanged(const Moment& moment, const std::string& dChannel, bool isUp);
@@ -34,13 +36,17 @@ class Patterns : public CallObserver {
         std::string prefix;  // the first digits of the number called
         std::string channel;
         std::string bearer;
+        std::string numberKind;  // "national/ISDN"
     };
+
+    static std::string detailsOf(const Failure& failure);
 
     bool endsWithLink(const Call& call) const;
     void reportMassClear();
     void findSameDuration(const Call& call);
     void findCauseBurst(const Call& call);
 
+    StuckChannels& stuck_;
     FindingSink& sink_;
     struct LinkChange {
         Moment moment;
@@ -49,7 +55,7 @@ class Patterns : public CallObserver {
     };
 
     std::optional<LinkChange> link_;      // the last change
-    std::vector<std::string> lost_;       // numbers of the calls that ended with it, within a second
+    std::vector<std::uint64_t> lost_;     // numbers of the calls that ended with it, within a second
     std::int64_t lostAt_ = 0;             // when the first of them ended
     std::deque<std::int64_t> durations_;  // of the last answered calls
     std::deque<std::int64_t> lengthsSaid_;

@@ -34,8 +34,7 @@ Segments::Taken Segments::take(Message& message) {
     Pieces& pieces = pieces_.at(key);
     pieces.octets.insert(pieces.octets.end(), layer3.raw.begin(), layer3.raw.end());
     pieces.remaining = header->remaining;
-    pieces.frame = message.number;
-    pieces.at = message.at;
+    pieces.moment = momentOf(message);
     if (pieces.remaining != 0)
         return Taken::kept;
     whole_ = std::move(pieces.octets);
@@ -44,14 +43,19 @@ Segments::Taken Segments::take(Message& message) {
     return Taken::complete;
 }
 
-std::uint64_t Segments::unfinished(std::int64_t at, std::int64_t limit) {
+std::int64_t Segments::oldest() const {
+    const auto age = [](const auto& each) { return each.second.moment.at; };
+    return age(*std::ranges::min_element(pieces_, {}, age));
+}
+
+std::optional<Segments::Unfinished> Segments::unfinished(std::int64_t at, std::int64_t limit) {
     const auto late = std::find_if(pieces_.begin(), pieces_.end(),
-                                   [&](const auto& each) { return at - each.second.at > limit; });
+                                   [&](const auto& each) { return at - each.second.moment.at > limit; });
     if (late == pieces_.end())
-        return 0;
-    const std::uint64_t frame = late->second.frame;
+        return std::nullopt;
+    const Unfinished found{late->second.moment, late->first.from};
     pieces_.erase(late);
-    return frame;
+    return found;
 }
 
 }  // namespace calls

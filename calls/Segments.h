@@ -5,8 +5,10 @@
 #include <compare>
 #include <cstdint>
 #include <map>
+#include <optional>
 #include <vector>
 
+#include "calls/Call.h"
 #include "calls/Message.h"
 
 namespace calls {
@@ -23,9 +25,17 @@ class Segments {
     };
     Taken take(Message& message);
 
-    // Forgets a message whose next segment has not come for `limit` nanoseconds, and returns the number of
-    // its frame; returns 0 if there is none. Call it until it returns 0.
-    std::uint64_t unfinished(std::int64_t at, std::int64_t limit);
+    // The last segment that came of a message whose next segment did not come in time.
+    struct Unfinished {
+        Moment moment;
+        Side from;
+    };
+    // Forgets a message whose next segment has not come for `limit` nanoseconds, and returns its last one.
+    // Call it until it returns nothing.
+    std::optional<Unfinished> unfinished(std::int64_t at, std::int64_t limit);
+    bool empty() const { return pieces_.empty(); }
+    // When the last segment came of the message that has waited longest; there must be one.
+    std::int64_t oldest() const;
 
   private:
     static constexpr std::size_t mostMessages = 64;
@@ -41,8 +51,7 @@ class Segments {
         std::vector<std::uint8_t> octets;  // of the message before it was divided
         std::uint8_t type = 0;
         unsigned remaining = 0;
-        std::uint64_t frame = 0;
-        std::int64_t at = 0;
+        Moment moment;
     };
 
     std::map<Key, Pieces> pieces_;

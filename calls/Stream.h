@@ -89,11 +89,20 @@ class Stream {
 
     // Closes the hole about which nothing was decided, and returns it.
     std::optional<Hole> giveUp();
+    bool hasOpenHole() const { return hole_.has_value(); }
 
     unsigned outstanding() const { return firm_ ? ahead(next_, acknowledged_) : 0; }
     std::uint8_t acknowledged() const { return acknowledged_; }
     // Whether N(R) acknowledges what this side has not sent, as far as the trace shows.
     bool isBeyond(std::uint8_t nr) const { return firm_ && isAhead(nr, next_); }
+    // N(R) further behind what was acknowledged than a repetition may repeat it. 0 may come of a SABME that
+    // the trace lacks.
+    bool isLongAcknowledged(std::uint8_t nr) const {
+        constexpr unsigned widestWindow = 7;
+        const unsigned behind = ahead(acknowledged_, nr);
+        return firm_ && nr != 0 && ahead(nr, acknowledged_) > ahead(next_, acknowledged_) &&
+               !isAhead(nr, next_) && behind > widestWindow;
+    }
     bool isFirm() const { return firm_; }
     std::uint8_t next() const { return next_; }
 

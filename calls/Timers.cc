@@ -12,6 +12,7 @@ namespace {
 constexpr std::array names{
     TimerName{"T200", &Timers::t200, "Q.921 5.9.1"},
     TimerName{"T201", &Timers::t201, "Q.921 5.9.2"},
+    TimerName{"T203", &Timers::t203, "Q.921 5.9.8"},
     TimerName{"T301", &Timers::t301, "Q.931 9.1"},
     TimerName{"T302", &Timers::t302, "Q.931 9.1"},
     TimerName{"T303", &Timers::t303, "Q.931 9.1"},

@@ -19,6 +19,7 @@ struct Timers {
     // Layer 2
     std::int64_t t200 = 1 * second;
     std::int64_t t201 = 1 * second;
+    std::int64_t t203 = 10 * second;  // without a frame; then a side polls
     // Set-up
     std::int64_t t301 = 180 * second;  // alerting, at least
     std::int64_t t302 = 15 * second;   // between digits, network

@@ -1,9 +1,10 @@
 #include "calls/Waits.h"
 
 #include <algorithm>
-#include <bitset>
 
+#include "calls/WaitRules.h"
 #include "calls/findingOf.h"
+#include "isdn/words.h"
 
 namespace calls {
 
@@ -12,15 +13,8 @@ namespace {
 namespace element = isdn::element;
 namespace type = isdn::message;
 
-using Types = std::bitset<128>;
-Types typesOf(std::initializer_list<std::uint8_t> list) {
-    Types types;
-    for (const std::uint8_t each : list)
-        types.set(each);
-    return types;
-}
-
 constexpr std::uint8_t endToEndNot = 1, destinationNotIsdn = 2, inBandInformation = 8;
+constexpr std::uint8_t numberIncomplete = 28, timerExpired = 102;
 
 bool announces(const Message& message, std::initializer_list<std::uint8_t> descriptions) {
     const auto progress = isdn::progress(message.layer3.elements.find(element::progressIndicator));
@@ -36,57 +30,46 @@ std::string seconds(std::int64_t nanoseconds) {
     return text + " s";
 }
 
-}  // namespace
-
-// A row for each question. The finding comes one timer after the last repetition.
-struct Waits::Rule {
-    std::uint8_t ask;
-    capture::Role asker;            // the role of the side that asks; unknown: either side
-    Types answers;                  // the messages that answer, from the other side
-    bool clearingAnswers;           // a clearing message of either side ends the wait
-    bool sameSideAnswers;           // the side that sent `ask` must send the answer itself
-    std::string_view timer;         // the timer's name, for the sentence of the finding
-    std::int64_t Timers::*user;     // the timer's value if the user waits
-    std::int64_t Timers::*network;  // the timer's value if the network waits
-    bool isRepeated;                // the sender repeats it once
-    const FindingKind* finding;
-    const FindingKind* repetition;
-};
-
-const std::vector<Waits::Rule>& Waits::rules() {
-    using T = Timers;
-    const Types clearing = typesOf({type::disconnect, type::release, type::releaseComplete});
-    static const std::vector<Rule> rows{
-        {type::setup, capture::Role::unknown,
-         typesOf(
-             {type::callProceeding, type::setupAcknowledge, type::alerting, type::progress, type::connect}) |
-             clearing,
-         true, false, "T303", &T::t303, &T::t303, true, &findings::setupUnanswered, &findings::setupRepeated},
-        {type::callProceeding, capture::Role::unknown, typesOf({type::alerting, type::connect}), true, true,
-         "T310", &T::t310User, &T::t310Network, false, &findings::proceedingUnanswered, nullptr},
-        {type::connect, capture::Role::user, typesOf({type::connectAcknowledge}), true, false, "T313",
-         &T::t313, &T::t313, false, &findings::connectNotAcknowledged, nullptr},
-        // The standard leaves this answer to the user. It counts as missing only if this user has given it
-        // before.
-        {type::connect, capture::Role::network, typesOf({type::connectAcknowledge}), true, false, "T313",
-         &T::t313, &T::t313, false, &findings::connectNeverAcknowledged, nullptr},
-        {type::disconnect, capture::Role::unknown, clearing, false, false, "T305", &T::t305, &T::t305, false,
-         &findings::disconnectUnanswered, nullptr},
-        {type::release, capture::Role::unknown, typesOf({type::release, type::releaseComplete}), false, false,
-         "T308", &T::t308, &T::t308, true, &findings::releaseUnanswered, &findings::releaseRepeated},
-        {type::statusEnquiry, capture::Role::unknown, typesOf({type::status}), true, false, "T322", &T::t322,
-         &T::t322, true, &findings::statusEnquiryUnanswered, nullptr},
-    };
-    return rows;
+bool says(const Message& message, std::uint8_t value) {
+    const auto cause = isdn::cause(message.layer3.elements.find(element::cause));
+    return cause && cause->codingStandard == 0 && cause->value == value;
 }
 
+// Cause 102 may name the timer in its diagnostic, in digits: "313".
+bool saysThatItRanOut(const Message& message, std::string_view timer) {
+    if (!says(message, timerExpired))
+        return false;
+    const auto cause = isdn::cause(message.layer3.elements.find(element::cause));
+    const std::string_view digits = timer.substr(1);
+    return cause->diagnostics.empty() ||
+           std::equal(cause->diagnostics.begin(), cause->diagnostics.end(), digits.begin(), digits.end(),
+                      [](std::uint8_t octet, char digit) {
+                          return (octet & 0x7FU) == static_cast<std::uint8_t>(digit);
+                      });
+}
+
+bool isFault(Verdicts::Verdict verdict) {
+    return verdict == Verdicts::Verdict::fault || verdict == Verdicts::Verdict::held;
+}
+
+}  // namespace
+
+Side Waits::Wait::answering() const { return rule->sameSideAnswers ? asker : other(asker); }
+
 void Waits::heard(Call& call, const Message& message) {
-    seen_ |= message.from() == Side::us ? 1U : 2U;
     if (call.phase == Phase::ended)
         return;
     if (message.layer3.type == type::connectAcknowledge && message.senderRole() == capture::Role::user)
         acknowledging_.insert(message.layer2.tei);
-    const bool answersDisconnect = answer(call, message);
+    bool timerTold = false;
+    const bool answersDisconnect = answer(call, message, timerTold);
+    if (!timerTold && says(message, timerExpired)) {
+        std::string words;
+        isdn::appendWords(words, message.layer3.elements.find(element::cause), message.variant,
+                          message.sender());
+        sink_.report(findingOf(findings::timer102, message, &call,
+                               std::string(isdn::messageName(message.layer3)) + " says " + words));
+    }
     // DISCONNECTs that cross answer each other, and either side may go on with RELEASE (Q.931 5.3.5).
     if (!answersDisconnect || message.layer3.type != type::disconnect)
         ask(call, message);
@@ -97,33 +80,69 @@ std::vector<std::uint64_t> Waits::waitsOf(const Call& call) const {
     return found == ofCall_.end() ? std::vector<std::uint64_t>() : found->second;
 }
 
-bool Waits::answer(Call& call, const Message& message) {
-    const std::uint8_t messageType = message.layer3.type;
-    const bool clears = isClearing(messageType);
-    const std::vector<std::uint64_t> pending = waitsOf(call);
+Waits::Effect Waits::effectOf(const Wait& wait, const Message& message) const {
+    const Rule& rule = *wait.rule;
+    const std::uint8_t messageType = message.layer3.type & 127U;
+    const bool byWaiting = message.from() == wait.waiting();
+    // Each terminal of a broadcast call answers for itself, but any of them may go on with the call.
+    if (wait.tei != message.layer2.tei && !rule.sameSideAnswers)
+        return Effect::none;
+    if (!byWaiting && rule.answers.test(messageType))
+        return Effect::answers;
+    if (messageType == type::progress && rule.progressStops &&
+        announces(message, {endToEndNot, destinationNotIsdn, inBandInformation}))
+        return Effect::stops;
+    if (byWaiting && messageType == type::information && rule.digitsRestart)
+        return Effect::restarts;
+    if (!isClearing(messageType))
+        return Effect::none;
+    // Its sender goes on from DISCONNECT to RELEASE. It may do so at any time, without an answer.
+    const bool goesOn = rule.ask == type::disconnect && messageType == type::release;
+    if (!rule.clearingAnswers && !goesOn)
+        return Effect::none;
+    const bool outOfTime = message.at >= wait.deadline - 2 * timers_.slack;
+    if (byWaiting && rule.waitingSideGivesUp &&
+        (outOfTime || saysThatItRanOut(message, wait.timer.name) ||
+         (rule.digitsRestart && says(message, numberIncomplete))))
+        return Effect::timerRanOut;
+    constexpr std::int64_t shortestT302 = 10 * second;
+    const bool incomplete = says(message, numberIncomplete) || says(message, timerExpired);
+    if (!byWaiting && rule.digitsRestart && incomplete && message.at - wait.last.at >= shortestT302)
+        return Effect::noMoreDigits;
+    return byWaiting && goesOn ? Effect::endsIt : rule.clearingAnswers ? Effect::endsIt : Effect::none;
+}
+
+bool Waits::answer(Call& call, const Message& message, bool& timerTold) {
     bool answersDisconnect = false;
-    for (const std::uint64_t id : pending) {
-        const Wait& wait = waits_.at(id);
-        const Rule& rule = *wait.rule;
-        // Each terminal of a broadcast call answers for itself, but any of them may go on with the call.
-        if (wait.tei != message.layer2.tei && !rule.sameSideAnswers)
-            continue;
-        const Side answering = rule.sameSideAnswers ? wait.asker : other(wait.asker);
-        const bool answered = (message.from() == answering && rule.answers.test(messageType & 127U)) ||
-                              (rule.ask == type::callProceeding && messageType == type::progress &&
-                               announces(message, {endToEndNot, destinationNotIsdn, inBandInformation})) ||
-                              (clears && rule.clearingAnswers);
-        if (answered) {
-            answersDisconnect = answersDisconnect || rule.ask == type::disconnect;
-            drop(id);
-        } else if (rule.ask == type::disconnect && messageType == type::release &&
-                   message.from() == wait.asker) {
-            // The asking side goes on by itself. It may do so at any time. If it does so when its timer has
-            // run out, nobody has answered.
-            if (message.at >= wait.deadline - timers_.slack)
-                expire(wait, message.at);
-            drop(id);
+    for (const std::uint64_t id : waitsOf(call)) {
+        Wait& wait = waits_.at(id);
+        switch (effectOf(wait, message)) {
+            case Effect::none:
+                continue;
+            case Effect::restarts:
+                wait.last = momentOf(message);
+                setDeadline(id, wait, message.at + wait.timer.value + timers_.slack);
+                continue;
+            case Effect::stops:
+                setDeadline(id, wait, never);
+                continue;
+            case Effect::answers:
+                answersDisconnect = answersDisconnect || wait.rule->ask == type::disconnect;
+                break;
+            case Effect::endsIt:
+                break;
+            case Effect::timerRanOut:
+                if (wait.deadline != never)
+                    timerTold = isFault(expire(wait, message.at)) || timerTold;
+                break;
+            case Effect::noMoreDigits:
+                timerTold = true;
+                sink_.report(findingOf(findings::overlapTimeout, message, &call,
+                                       "no further digit came for " + seconds(message.at - wait.last.at) +
+                                           " after \"" + call.called.digits + "\""));
+                break;
         }
+        drop(id);
     }
     return answersDisconnect;
 }
@@ -139,7 +158,7 @@ void Waits::ask(Call& call, const Message& message) {
     for (const std::uint64_t id : waitsOf(call)) {
         Wait& wait = waits_.at(id);
         if (wait.rule == &*rule && wait.asker == message.from() && wait.tei == message.layer2.tei) {
-            repeat(wait, message);
+            repeat(id, wait, message);
             return;
         }
     }
@@ -160,28 +179,28 @@ void Waits::ask(Call& call, const Message& message) {
 // The timer of the side that waits. Some timers differ between the user and the network side.
 Waits::Timer Waits::timerOf(const Rule& rule, const Message& message) const {
     if (rule.ask == type::disconnect && announces(message, {inBandInformation}))
-        return {"T306", timers_.t306};
+        return {"T306", timers_.t306, "Q.931 5.3.4.1, T306"};
     const capture::Role sender = message.senderRole();
     const bool networkWaits =
         rule.sameSideAnswers ? sender == capture::Role::user : sender == capture::Role::network;
     return {rule.timer, networkWaits ? timers_.*rule.network : timers_.*rule.user};
 }
 
-void Waits::repeat(Wait& wait, const Message& message) {
+void Waits::setDeadline(std::uint64_t id, Wait& wait, std::int64_t deadline) {
+    deadlines_.erase({wait.deadline, id});
+    wait.deadline = deadline;
+    if (deadline != never)
+        deadlines_.emplace(deadline, id);
+}
+
+void Waits::repeat(std::uint64_t id, Wait& wait, const Message& message) {
     ++wait.repetitions;
-    if (wait.repetitions == 1 && wait.rule->repetition != nullptr) {
-        wait.last = momentOf(message);
-        report(*wait.rule->repetition, wait,
-               std::string(isdn::messageName(message.layer3)) + " repeated after " +
-                   seconds(message.at - wait.first.at));
-    }
     wait.last = momentOf(message);
-    const auto old = std::find_if(deadlines_.begin(), deadlines_.end(),
-                                  [&](const auto& each) { return &waits_.at(each.second) == &wait; });
-    const std::uint64_t id = old->second;
-    deadlines_.erase(old);
-    wait.deadline = message.at + wait.timer.value + timers_.slack;
-    deadlines_.emplace(wait.deadline, id);
+    if (wait.repetitions == 1 && wait.rule->repetition != nullptr)
+        sink_.report(findingOf(*wait.rule->repetition, wait.last, *wait.call,
+                               std::string(isdn::messageName(message.layer3)) + " repeated after " +
+                                   seconds(message.at - wait.first.at)));
+    setDeadline(id, wait, message.at + wait.timer.value + timers_.slack);
 }
 
 void Waits::ended(Call& call, const Message*) { dropAll(call); }
@@ -190,6 +209,7 @@ void Waits::boardRestarted() {
     waits_.clear();
     ofCall_.clear();
     deadlines_.clear();
+    verdicts_.forget();
 }
 
 void Waits::advance(std::int64_t at) {
@@ -199,29 +219,25 @@ void Waits::advance(std::int64_t at) {
         expire(wait, wait.deadline - timers_.slack);
         drop(id);
     }
+    verdicts_.advance(at, waits_.empty() ? never : waits_.begin()->second.first.at);
 }
 
-void Waits::expire(const Wait& wait, std::int64_t until) {
-    if (seen_ != 3U)
-        return;
-    if (wait.rule->finding == &findings::connectNeverAcknowledged && !acknowledging_.contains(wait.tei))
-        return;
+Verdicts::Verdict Waits::expire(const Wait& wait, std::int64_t until) {
     const Rule& rule = *wait.rule;
+    if (rule.finding == &findings::connectNeverAcknowledged && !acknowledging_.contains(wait.tei))
+        return Verdicts::Verdict::nothing;
     const std::string name(isdn::messageName(isdn::callControl, rule.ask));
-    std::string what = name + " of frame " + std::to_string(wait.first.frame) + " got no answer for " +
-                       seconds(until - wait.first.at) + " (" + std::string(wait.timer.name);
+    const bool sinceLastDigit = rule.digitsRestart && wait.last.at != wait.first.at;
+    std::string what = name + " of frame " + std::to_string(wait.first.frame) +
+                       (rule.sameSideAnswers ? " was followed by nothing for " : " got no answer for ") +
+                       seconds(until - (sinceLastDigit ? wait.last : wait.first).at) +
+                       (sinceLastDigit ? " after the last digit" : "") + " (" + std::string(wait.timer.name);
     what += wait.repetitions == 0 ? ")" : ", repeated " + std::to_string(wait.repetitions) + "x)";
-    const Side answering = rule.sameSideAnswers ? wait.asker : other(wait.asker);
-    const std::string_view doubt =
-        doubtAbout(links_.witness(wait.tei), wait.first.frame, wait.first.at, wait.asker, answering);
-    if (!doubt.empty())
-        report(findings::cannotBeTold, wait, what + ", but " + std::string(doubt));
-    else
-        report(*rule.finding, wait, std::move(what));
-}
-
-void Waits::report(const FindingKind& kind, const Wait& wait, std::string sentence) {
-    sink_.report(findingOf(kind, wait.last, *wait.call, std::move(sentence)));
+    Finding finding = findingOf(*rule.finding, wait.last, *wait.call, std::move(what));
+    if (!wait.timer.clause.empty())
+        finding.clause = wait.timer.clause;
+    return verdicts_.judge(
+        {std::move(finding), wait.tei, wait.asker, wait.answering(), wait.first.frame, wait.first.at, until});
 }
 
 void Waits::drop(std::uint64_t id) {

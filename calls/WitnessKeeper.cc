@@ -2,32 +2,65 @@
 
 namespace calls {
 
-void WitnessKeeper::take(const isdn::Layer2& frame, Side from, std::uint64_t number, std::int64_t at,
-                         const Marks& marks, std::span<const LinkEvent> events) {
+void WitnessKeeper::take(const DChannel& channel) {
+    const Sample& sample = channel.sample();
+    const isdn::Layer2& frame = sample.layer2;
+    const Marks& marks = channel.marks();
+    witness_.heard[indexOf(sample.from())] = true;
     const bool isUp = marks.state == LinkState::up || marks.state == LinkState::unknown;
     if (!isUp || marks.linkUp || marks.linkDown || marks.unseenSetUp)
-        witness_.lastDown = at;
+        witness_.lastDown = sample.at;
     witness_.up = isUp;
-    for (const LinkEvent& event : events) {
-        if (event.kind == LinkEvent::Kind::hole)
-            witness_.lastHole[static_cast<std::size_t>(event.from)] = at;
+    for (const LinkEvent& event : channel.events()) {
+        // What the line has lost is sent again.
+        if (event.kind == LinkEvent::Kind::hole && event.by != LostBy::line)
+            witness_.lastHole[indexOf(event.from)] = sample.at;
     }
-    if (marks.linkUp || marks.unseenSetUp)
+    if (marks.linkUp || marks.unseenSetUp) {
         sent_ = {};
+        nrAbout_ = {};
+    }
     if (frame.hasNs() && !marks.retransmitted) {
-        auto& sent = sent_[static_cast<std::size_t>(from)];
-        sent.emplace_back(frame.ns, number);
+        auto& sent = sent_[indexOf(sample.from())];
+        sent.emplace_back(frame.ns, sample.number);
         if (sent.size() > 128)
             sent.pop_front();
     }
     if (frame.hasNr())
-        acknowledge(other(from), frame.nr);
+        acknowledge(other(sample.from()), frame.nr);
+    judgeNumbers(sample, marks, *channel.link());
 }
 
+void WitnessKeeper::judgeNumbers(const Sample& sample, const Marks& marks, const Link& link) {
+    for (const Side side : {Side::us, Side::peer}) {
+        const std::size_t index = indexOf(side);
+        witness_.holeOpen[index] = link.mayLackFramesOf(side);
+        const bool isNext = side == sample.from() && sample.layer2.hasNs() && !marks.retransmitted;
+        if (side == sample.from() || !sample.layer2.hasNr()) {
+            if (isNext && !witness_.holeOpen[index])
+                witness_.wholeUntil[index] = sample.at;
+            continue;
+        }
+        // Before the first I frame of a side, only N(R) tells what it has sent.
+        const std::uint8_t nr = sample.layer2.nr;
+        const Stream& stream = link.sentBy(side);
+        const std::uint8_t known = stream.isFirm() ? stream.next() : nrAbout_[index].value_or(nr);
+        if (nr == known && !witness_.holeOpen[index])
+            witness_.wholeUntil[index] = sample.at;
+        else if (!stream.isFirm() && isAhead(nr, known))
+            witness_.lastHole[index] = sample.at;
+        nrAbout_[index] = nr;
+    }
+}
+
+void WitnessKeeper::mayMiss(std::int64_t at) { witness_.lastLoss = {at, at}; }
+
+void WitnessKeeper::lacks(Side side, std::int64_t at) { witness_.lastHole[indexOf(side)] = at; }
+
 void WitnessKeeper::acknowledge(Side sender, std::uint8_t nr) {
-    auto& sent = sent_[static_cast<std::size_t>(sender)];
+    auto& sent = sent_[indexOf(sender)];
     while (!sent.empty() && isAhead(nr, sent.front().first)) {
-        witness_.acknowledged[static_cast<std::size_t>(sender)] = sent.front().second;
+        witness_.acknowledged[indexOf(sender)] = sent.front().second;
         sent.pop_front();
     }
 }

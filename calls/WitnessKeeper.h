@@ -4,9 +4,10 @@
 
 #include <array>
 #include <deque>
+#include <optional>
 #include <utility>
 
-#include "calls/Link.h"
+#include "calls/DChannel.h"
 #include "calls/LinkWitness.h"
 #include "calls/Message.h"
 
@@ -14,17 +15,22 @@ namespace calls {
 
 class WitnessKeeper {
   public:
-    // Call this after the link has taken the frame. `marks` and `events` are those of this frame.
-    void take(const isdn::Layer2& frame, Side from, std::uint64_t number, std::int64_t at, const Marks& marks,
-              std::span<const LinkEvent> events);
+    // What the channel has said of its last frame, which is of this link.
+    void take(const DChannel& channel);
+    // The recorder may have missed frames by now.
+    void mayMiss(std::int64_t at);
+    // It has seen a frame of this side without its octets.
+    void lacks(Side side, std::int64_t at);
     const LinkWitness& witness() const { return witness_; }
 
   private:
     void acknowledge(Side sender, std::uint8_t nr);
+    void judgeNumbers(const Sample& sample, const Marks& marks, const Link& link);
 
     LinkWitness witness_;
     // By side: N(S) and frame number of the I frames that the other side has not acknowledged, at most 128.
     std::array<std::deque<std::pair<std::uint8_t, std::uint64_t>>, 2> sent_;
+    std::array<std::optional<std::uint8_t>, 2> nrAbout_;  // by side: the last N(R) about its frames
 };
 
 }  // namespace calls

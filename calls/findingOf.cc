@@ -9,6 +9,7 @@ Finding findingOf(const FindingKind& kind, const Moment& moment, const std::stri
     Finding finding;
     finding.kind = &kind;
     finding.severity = kind.severity;
+    finding.clause = kind.clause;
     finding.frame = moment.frame;
     finding.clock = moment.clock;
     finding.time = moment.time;

@@ -1,5 +1,6 @@
 // Names of values that not only the tables use.
 #include "isdn/Table.h"
+#include "isdn/tables/numbers.h"
 #include "isdn/values.h"
 
 namespace isdn {
@@ -162,6 +163,8 @@ constexpr Name notifications[] = {
 
 std::string_view causeName(std::uint8_t value) { return Names(causes)(value); }
 std::string_view locationName(std::uint8_t location) { return Names(locations)(location); }
+std::string_view numberTypeName(std::uint8_t type) { return Names(tables::numberTypes)(type); }
+std::string_view numberingPlanName(std::uint8_t plan) { return Names(tables::numberingPlans)(plan); }
 std::string_view callStateName(std::uint8_t value) { return Names(callStates)(value); }
 std::string_view progressName(std::uint8_t value) { return Names(progresses)(value); }
 std::string_view notificationName(std::uint8_t value) { return Names(notifications)(value); }

@@ -51,6 +51,9 @@ struct PartyNumber {
 };
 
 std::optional<PartyNumber> partyNumber(const Element& element);
+// "national", "ISDN"; empty if reserved.
+std::string_view numberTypeName(std::uint8_t type);
+std::string_view numberingPlanName(std::uint8_t plan);
 
 // The digits of a KEYPAD FACILITY element.
 std::string_view keypadDigits(const Element& element);

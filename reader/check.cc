@@ -94,9 +94,9 @@ class FindingPrinter : public Analysed {
         text_ += finding.kind->meaning;
         text_ += "; look at: ";
         text_ += finding.kind->lookAt;
-        if (!finding.kind->clause.empty()) {
+        if (!finding.clause.empty()) {
             text_ += " [";
-            text_ += finding.kind->clause;
+            text_ += finding.clause;
             text_ += ']';
         }
         text_ += '\n';
@@ -145,7 +145,7 @@ class FindingPrinter : public Analysed {
         putString("sentence", finding.sentence);
         putString("meaning", finding.kind->meaning);
         putString("look_at", finding.kind->lookAt);
-        putString("clause", finding.kind->clause);
+        putString("clause", finding.clause);
         text_ += "}\n";
     }
 

@@ -67,7 +67,7 @@ TEST(CallFindings, FindCausesThatTellOfAnError) {
         const char* found;
     } const causes[] = {{81, "unknown-reference"}, {96, "protocol-error"},  {97, "element-ignored"},
                         {98, "protocol-error"},    {99, "element-ignored"}, {100, "protocol-error"},
-                        {101, "protocol-error"},   {102, "timer-expired"},  {111, "protocol-error"}};
+                        {101, "protocol-error"},   {102, "timer-102"},      {111, "protocol-error"}};
     for (const auto& each : causes) {
         CallScript script = talking();
         script.at(5000).peer(m::status, 9, true, {cause(each.value), callState(10)});
@@ -141,10 +141,67 @@ TEST(CallFindings, FindOverlapSendingThatTimesOut) {
 
 TEST(CallFindings, NoteASetupToAllThatNobodyAnswers) {
     CallScript script(capture::Role::network);
-    script.at(0).broadcast(Side::us, m::setup, 4, {bearerSpeech()});
+    script.at(0).broadcast(Side::us, m::setup, 4, {bearerSpeech(), channel(1)});
     EXPECT_EQ(findingsOf(script, 7000), "1 broadcast-unanswered\n");
     script.at(100).tei(64).peer(m::releaseComplete, 4, true, {cause(17)});
     EXPECT_EQ(findingsOf(script, 7000), "");
+}
+
+TEST(CallFindings, MissTheCauseInEveryDisconnect) {
+    for (const bool sound : {false, true}) {
+        CallScript script;
+        script.at(0).us(m::setup, 9, false, {bearerSpeech()}).peer(m::connect, 9, true);
+        script.at(100).crossing().us(m::disconnect, 9, false, {cause(16)});
+        script.peer(m::disconnect, 9, true, {sound ? cause(16) : Bytes{}});
+        script.us(m::release, 9, false).peer(m::releaseComplete, 9, true);
+        EXPECT_EQ(findingsOf(script, 1000), sound ? "" : "4 element-absent\n");
+    }
+}
+
+TEST(CallFindings, MissTheCauseOfACallFromBeforeTheTraceOnlyIfItWasAlive) {
+    for (const bool alive : {false, true}) {
+        CallScript script;
+        if (alive)
+            script.at(0).us(m::information, 9, false);
+        script.at(100).us(m::release, 9, false).peer(m::releaseComplete, 9, true);
+        EXPECT_EQ(findingsOf(script, 1000), alive ? "2 element-absent\n" : "");
+    }
+    CallScript script;
+    script.at(0).us(m::disconnect, 9, false).peer(m::release, 9, true).us(m::releaseComplete, 9, false);
+    EXPECT_EQ(findingsOf(script, 1000), "1 element-absent\n");
+}
+
+TEST(CallFindings, MissTheChannelInASetupOfTheNetworkAlone) {
+    for (const capture::Role role : {capture::Role::user, capture::Role::network}) {
+        CallScript script(role);
+        script.at(0).us(m::setup, 9, false, {bearerSpeech()}).peer(m::releaseComplete, 9, true, {cause(17)});
+        EXPECT_EQ(findingsOf(script, 1000), role == capture::Role::network ? "1 element-absent\n" : "");
+    }
+}
+
+TEST(CallFindings, FindAStatusOfTheGlobalReferenceThatTellsOfAnError) {
+    for (const auto& [value, found] : {std::pair<std::uint8_t, std::string>{30, ""},
+                                       {97, "2 element-ignored\n"},
+                                       {98, "2 protocol-error\n"},
+                                       {101, "2 protocol-error\n"},
+                                       {81, "2 protocol-error\n"}}) {
+        CallScript script;
+        script.at(0).us(m::restart, 0, false, {channel(1), restartIndicator(0)});
+        script.peer(m::status, 0, true, {cause(value), callState(0)});
+        EXPECT_EQ(findingsOf(script, 1000), found) << int{value};
+    }
+}
+
+TEST(CallFindings, NoteAnyAnswerThatWaitedForMoreDigits) {
+    for (const std::uint8_t answer : {m::callProceeding, m::alerting, m::connect, m::progress}) {
+        CallScript script;
+        script.at(0).us(m::setup, 9, false, {bearerSpeech(), called("1")});
+        script.at(20).peer(m::setupAcknowledge, 9, true, {channel(3)});
+        script.at(2000).us(m::information, 9, false, {called("2")});
+        script.at(14000).peer(answer, 9, true, {progress(2)});
+        script.at(14500).peer(m::releaseComplete, 9, true, {cause(17)});
+        EXPECT_EQ(findingsOf(script, 16000), "4 waits-for-digits\n") << int{answer};
+    }
 }
 
 }  // namespace calls

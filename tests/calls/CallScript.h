@@ -89,6 +89,11 @@ class CallScript {
     CallScript& acknowledge(Side from) { return supervise(from, false, false); }
     // A poll, and the answer of the other side.
     CallScript& poll(Side from) { return supervise(from, true, true).supervise(other(from), false, true); }
+    // The recorder does not see the last frame.
+    CallScript& unrecorded() {
+        frames_.pop_back();
+        return *this;
+    }
     // A frame that layer 2 sends again, octet for octet.
     CallScript& again(std::size_t frame) {
         const Sent& old = frames_.at(frame);

@@ -290,6 +290,36 @@ TEST_F(CallTableTest, JoinsTheDigitsOfOverlapSending) {
     EXPECT_TRUE(seen.calls.at(0).overlap);
 }
 
+TEST_F(CallTableTest, JoinsDigitsThatComeNowAsANumberAndNowFromTheKeypad) {
+    const auto keypad = [](const std::string& text) {
+        Bytes element{0x2C, static_cast<std::uint8_t>(text.size())};
+        element.insert(element.end(), text.begin(), text.end());
+        return element;
+    };
+    CallScript script;
+    script.at(0).us(m::setup, 1, false, {keypad("1")}).peer(m::setupAcknowledge, 1, true);
+    script.us(m::information, 1, false, {called("2")}).us(m::information, 1, false, {keypad("3")});
+    script.us(m::information, 1, false, {called("4")}).peer(m::callProceeding, 1, true);
+    play(script);
+    ASSERT_EQ(seen.calls.size(), 1U);
+    EXPECT_EQ(seen.calls[0].called.digits, "1234");
+    EXPECT_EQ(seen.calls[0].called.plan, 1);
+}
+
+TEST_F(CallTableTest, KnowsAConnectionOnTheDChannelFromItsSetupOn) {
+    CallScript script;
+    std::uint16_t ref = 0;
+    // No channel and the D-channel indicator; no channel yet, of a call that waits.
+    for (const std::uint8_t octet : {0x8C, 0x88}) {
+        script.at(0).us(m::setup, ++ref, false, {bearer64k(), Bytes{0x18, 0x01, octet}});
+        script.peer(m::releaseComplete, ref, true, {cause(17)});
+    }
+    play(script);
+    ASSERT_EQ(seen.calls.size(), 2U);
+    EXPECT_EQ(seen.calls[0].kind, Kind::signalling);
+    EXPECT_EQ(seen.calls[1].kind, Kind::call);
+}
+
 TEST_F(CallTableTest, KeepsTheCauseOfTheFirstClearingMessageAndTheOthersBesideIt) {
     CallScript script;
     script.at(0).us(m::setup, 9, false);

@@ -2,6 +2,7 @@
 #ifndef TESTS_CALLS_FINDINGS_H
 #define TESTS_CALLS_FINDINGS_H
 
+#include <limits>
 #include <string>
 #include <vector>
 
@@ -25,7 +26,11 @@ class Found : public FindingSink {
 // A link that has always been up and acknowledges everything, unless a test changes it.
 class HealthyLink : public LinkWitnesses {
   public:
-    HealthyLink() { own.acknowledged = {~0ULL, ~0ULL}; }
+    HealthyLink() {
+        own.heard = {true, true};
+        own.acknowledged = {~0ULL, ~0ULL};
+        own.wholeUntil = {std::numeric_limits<std::int64_t>::max(), std::numeric_limits<std::int64_t>::max()};
+    }
     const LinkWitness* witness(std::uint8_t) const override { return &own; }
     LinkWitness own;
 };
@@ -69,6 +74,7 @@ inline std::string findingsOf(const CallScript& script, std::int64_t until,
     }
     watched.waits.advance(until * millisecond);
     table.advance(until * millisecond);
+    watched.waits.finish();
     table.finish();
     return found.lines;
 }

@@ -14,7 +14,7 @@ namespace m = isdn::message;
 // An earlier call, so that both directions have been heard.
 CallScript afterACall(capture::Role role = capture::Role::user) {
     CallScript script(role);
-    script.at(0).us(m::setup, 1, false, {bearerSpeech()});
+    script.at(0).us(m::setup, 1, false, {bearerSpeech(), channel(1)});
     script.at(5).peer(m::releaseComplete, 1, true, {cause(17)});
     return script;
 }
@@ -40,7 +40,7 @@ TEST(Waits, AreOverWithAnyAnswerToSetup) {
 
 TEST(Waits, FindAConnectOfTheUserThatTheNetworkDoesNotAcknowledge) {
     CallScript script = afterACall(capture::Role::user);
-    script.at(10000).peer(m::setup, 2, false, {bearerSpeech()});
+    script.at(10000).peer(m::setup, 2, false, {bearerSpeech(), channel(1)});
     script.at(11000).us(m::connect, 2, true);
     EXPECT_EQ(findingsOf(script, 14900), "");
     EXPECT_EQ(findingsOf(script, 15100), "4 connect-not-acknowledged\n");
@@ -156,7 +156,7 @@ TEST(Waits, FindAStatusEnquiryThatIsNotAnswered) {
 TEST(Waits, AreKeptForEachTerminalOfACallToAll) {
     for (const bool faulty : {false, true}) {
         CallScript script = afterACall(capture::Role::network);
-        script.at(10000).broadcast(Side::us, m::setup, 4, {bearerSpeech()});
+        script.at(10000).broadcast(Side::us, m::setup, 4, {bearerSpeech(), channel(1)});
         script.at(10100).tei(64).peer(m::connect, 4, true);
         script.at(10200).tei(65).peer(m::connect, 4, true);
         script.at(10300).tei(64).us(m::connectAcknowledge, 4, false, {channel(1)});
@@ -196,7 +196,116 @@ TEST(Waits, SayThatItCannotBeToldWhenTheLinkLeavesADoubt) {
 TEST(Waits, SayNothingWhileOnlyOneDirectionIsHeard) {
     CallScript script;
     script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
-    EXPECT_EQ(findingsOf(script, 100000), "");
+    HealthyLink link;
+    link.own.heard[1] = false;
+    EXPECT_EQ(findingsOf(script, 100000, link), "");
+    EXPECT_EQ(findingsOf(script, 100000), "1 setup-unanswered\n");
+}
+
+namespace {
+
+Bytes timerRanOut(const std::string& timer = {}) {
+    Bytes element{0x08, static_cast<std::uint8_t>(2 + timer.size()), 0x80, 0x80 | 102};
+    element.insert(element.end(), timer.begin(), timer.end());
+    return element;
+}
+
+CallScript incomingConnected() {
+    CallScript script = afterACall(capture::Role::user);
+    script.at(10000).peer(m::setup, 2, false, {bearerSpeech(), channel(1)});
+    script.at(11000).us(m::connect, 2, true);
+    return script;
+}
+
+CallScript proceeding() {
+    CallScript script = afterACall(capture::Role::user);
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    script.at(11000).peer(m::callProceeding, 2, true);
+    return script;
+}
+
+}  // namespace
+
+TEST(Waits, FindWhatRanOutWhenTheWaitingSideClearsAtTheTimer) {
+    for (const std::int64_t late : {-100, -8, 0, 4, 8}) {
+        CallScript script = incomingConnected();
+        script.at(15000 + late).us(m::disconnect, 2, true, {cause(16)}).peer(m::release, 2, false);
+        script.us(m::releaseComplete, 2, true);
+        EXPECT_EQ(findingsOf(script, 60000), late == -100 ? "" : "4 connect-not-acknowledged\n") << late;
+        script = proceeding();
+        script.at(131000 + late).us(m::disconnect, 2, false, {cause(16)}).peer(m::release, 2, true);
+        script.us(m::releaseComplete, 2, false);
+        EXPECT_EQ(findingsOf(script, 200000), late == -100 ? "" : "4 proceeding-unanswered\n") << late;
+    }
+}
+
+TEST(Waits, FindWhatRanOutWhenTheWaitingSideSaysSo) {
+    struct {
+        Bytes cause;
+        const char* finds;
+    } const cases[] = {
+        {timerRanOut(), "4 connect-not-acknowledged\n"},
+        {timerRanOut("313"), "4 connect-not-acknowledged\n"},
+        {timerRanOut("310"), "5 timer-102\n"},
+    };
+    for (const auto& each : cases) {
+        CallScript script = incomingConnected();
+        script.at(13000).us(m::disconnect, 2, true, {each.cause}).peer(m::release, 2, false);
+        script.us(m::releaseComplete, 2, true);
+        EXPECT_EQ(findingsOf(script, 60000), each.finds);
+    }
+    CallScript script = proceeding();
+    script.at(30000).us(m::disconnect, 2, false, {timerRanOut("310")}).peer(m::release, 2, true);
+    script.us(m::releaseComplete, 2, false);
+    EXPECT_EQ(findingsOf(script, 60000), "4 proceeding-unanswered\n");
+    // The other side, which nobody waits for here.
+    script = proceeding();
+    script.at(30000).peer(m::disconnect, 2, true, {timerRanOut("310")}).us(m::release, 2, false);
+    script.peer(m::releaseComplete, 2, true);
+    EXPECT_EQ(findingsOf(script, 60000), "5 timer-102\n");
+}
+
+TEST(Waits, FindOverlapSendingThatEndsAtT304) {
+    for (const std::uint8_t value : {std::uint8_t{28}, std::uint8_t{102}, std::uint8_t{16}}) {
+        CallScript script = afterACall(capture::Role::user);
+        script.at(10000).us(m::setup, 2, false, {bearerSpeech(), called("1")});
+        script.at(10020).peer(m::setupAcknowledge, 2, true, {channel(3)});
+        script.at(12000).us(m::information, 2, false, {called("2")});
+        script.at(32000).us(m::disconnect, 2, false, {cause(value)});
+        script.at(32100).peer(m::release, 2, true).us(m::releaseComplete, 2, false);
+        EXPECT_EQ(findingsOf(script, 60000), value == 16 ? "" : "5 overlap-timeout\n") << int{value};
+    }
+}
+
+TEST(Waits, AreStoppedByAnAnnouncementInOverlapSending) {
+    for (const bool announced : {false, true}) {
+        CallScript script = afterACall(capture::Role::user);
+        script.at(10000).us(m::setup, 2, false, {bearerSpeech(), called("1")});
+        script.at(10020).peer(m::setupAcknowledge, 2, true, {channel(3)});
+        if (announced)
+            script.at(20000).peer(m::progress, 2, true, {progress(8)});
+        EXPECT_EQ(findingsOf(script, 60000), announced ? "" : "4 overlap-timeout\n");
+    }
+}
+
+TEST(Waits, NameTheTimerOfAnAnnouncementInTheClause) {
+    for (const bool announces : {false, true}) {
+        CallScript script = afterACall();
+        script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+        script.at(11000).peer(m::callProceeding, 2, true);
+        script.at(12000).peer(m::disconnect, 2, true, {cause(1, 2), announces ? progress(8) : Bytes{}});
+        const Timers timers;
+        Found found;
+        CallNumbers numbers;
+        const HealthyLink link;
+        Watched watched(timers, link, found);
+        CallTable table(timers, numbers, watched);
+        for (const Sent& sent : script.frames())
+            table.take(script.toMessage(sent));
+        watched.waits.advance(60000 * millisecond);
+        ASSERT_EQ(found.lines, "5 disconnect-unanswered\n");
+        EXPECT_EQ(found.findings[0].clause, announces ? "Q.931 5.3.4.1, T306" : "Q.931 5.3.3, T305");
+    }
 }
 
 }  // namespace calls

@@ -35,7 +35,7 @@ constexpr Scenario all[] = {
          s.at(14100).peer(m::releaseComplete, 2, true, {cause(17)});
          return found(s, 5);
      }},
-    {&findings::setupAcknowledgeUnanswered,
+    {&findings::overlapTimeout,
      [](bool faulty) {
          CallScript s = begun();
          s.at(10000).us(m::setup, 2, false, {bearerSpeech(), called("1")});
@@ -53,6 +53,42 @@ constexpr Scenario all[] = {
          s.at(24000).peer(m::callProceeding, 2, true);
          s.at(24500).peer(m::releaseComplete, 2, true, {cause(17)});
          return found(s, 5);
+     }},
+    {&findings::overlapTimeout,
+     [](bool faulty) {
+         CallScript s = begun();
+         s.at(10000).us(m::setup, 2, false, {bearerSpeech(), called("1")});
+         s.at(10020).peer(m::setupAcknowledge, 2, true, {channel(3)});
+         s.at(20000).us(m::information, 2, false, {called("2")}).acknowledge(Side::peer);
+         if (!faulty)
+             s.at(49000).us(m::information, 2, false, {called("3")}).acknowledge(Side::peer);
+         return found(s, faulty ? 31 : 29);
+     }},
+    {&findings::alertingUnanswered,
+     [](bool faulty) {
+         CallScript s = begun();
+         s.at(10000).us(m::setup, 2, false, {bearerSpeech()}).at(10100).peer(m::alerting, 2, true);
+         s.acknowledge(Side::us);
+         if (!faulty)
+             s.at(190000).us(m::disconnect, 2, false, {cause(16)});
+         return found(s, 191);
+     }},
+    {&findings::suspendUnanswered,
+     [](bool faulty) {
+         CallScript s = begun();
+         talk(s, 5000, 2, 1);
+         s.at(10000).us(m::suspend, 2, false, {callIdentity(1)}).acknowledge(Side::peer);
+         if (!faulty)
+             s.at(13900).peer(m::suspendAcknowledge, 2, true);
+         return found(s, 15);
+     }},
+    {&findings::resumeUnanswered,
+     [](bool faulty) {
+         CallScript s = begun();
+         s.at(10000).us(m::resume, 2, false, {callIdentity(1)}).acknowledge(Side::peer);
+         if (!faulty)
+             s.at(13900).peer(m::resumeReject, 2, true, {cause(85)});
+         return found(s, 15);
      }},
     {&findings::proceedingUnanswered,
      [](bool faulty) {

@@ -106,6 +106,14 @@ constexpr Scenario all[] = {
                           (faulty ? "" : "3.5 < UA\n") + "5 < RR 0 P\n",
                       5);
      }},
+    {&findings::sabmeUnanswered,  // for ever, each at T200
+     [](bool faulty) {
+         std::string story;
+         for (int i = 0; i < 60; ++i)
+             story += std::to_string(i) + " > SABME\n" +
+                      (faulty || i % 3 != 2 ? "" : std::to_string(i) + ".5 < UA\n");
+         return found(story);
+     }},
     {&findings::linkRefused,
      [](bool faulty) { return found(std::string("0 > SABME\n0.01 < ") + (faulty ? "DM F\n" : "UA\n")); }},
     {&findings::frameRejected,
@@ -139,6 +147,33 @@ constexpr Scenario all[] = {
      [](bool faulty) {
          return found(up + "1 > RR 0 P\n2 > RR 0 P\n2.5 < I 0 0\n3 > RR 1 P\n" +
                       (faulty ? "4 > RR 1 P\n5.1 < I 1 0\n" : ""));
+     }},
+    {&findings::pollUnanswered,  // for ever, each at T200
+     [](bool faulty) {
+         std::string story = up;
+         for (int i = 1; i < 60; ++i) {
+             const std::string second = std::to_string(i);
+             story += second + " > RR 0 P\n" + second + ".5 < RR 0" + (faulty ? "\n" : " F\n");
+         }
+         return found(story);
+     }},
+    {&findings::oneDirectionSilent,  // for ever, each at T200
+     [](bool faulty) {
+         std::string story = up;
+         for (int i = 1; i < 60; ++i) {
+             const std::string second = std::to_string(i);
+             story += second + " > RR 0 P\n" + (faulty ? "" : second + ".5 < RR 0 F\n");
+         }
+         return found(story);
+     }},
+    {&findings::nrInvalid,  // beyond half of all numbers
+     [](bool faulty) {
+         std::string story = up;
+         for (int i = 0; i < 20; ++i) {
+             const std::string second = std::to_string(i + 1), next = std::to_string(i + 1);
+             story += second + " > I " + std::to_string(i) + " 0\n" + second + ".1 < RR " + next + "\n";
+         }
+         return found(story + "30 < RR " + (faulty ? "90" : "20") + "\n31 > I 20 0\n31.1 < RR 21\n");
      }},
     {&findings::windowStalled,
      [](bool faulty) { return found(seven() + (faulty ? "" : "1.5 < RNR 0\n") + "3 < RR 7\n"); }},

@@ -342,7 +342,7 @@ constexpr Trap all[] = {
      &findings::referenceInUse},
     {"segments", "a SETUP in two segments", user, segments, &findings::segmentsUnfinished},
     {"register", "REGISTER, a transaction without a call", user, registration, &findings::unknownReference},
-    {"overlap", "overlap sending in both directions", user, overlap, &findings::setupAcknowledgeUnanswered},
+    {"overlap", "overlap sending in both directions", user, overlap, &findings::overlapTimeout},
     {"polls-of-one-side", "one side alone polls, every 30 s", user, pollsOfOneSide,
      &findings::keepAliveMissing},
     {"basic-access-goes-idle", "a basic access that takes its link down between calls", user,

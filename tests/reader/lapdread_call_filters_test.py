@@ -103,7 +103,8 @@ class Live(Running):
                    self.SETUP.format(31, "0001"), self.REFUSED.format(32, "8001"),
                    "TX 2026-11-21T11:25:33.000Z 00010202080200020504038090a31803a98381",
                    "RX 2026-11-21T11:25:33Z 00010104")
-        lapdread = self.start(LAPDREAD, "check", "--follow", "--timer", "T303=100ms", "grows.hex",
+        lapdread = self.start(LAPDREAD, "check", "--follow", "--timer", "T303=100ms", "--timer", "T203=100ms",
+                              "--level", "error", "grows.hex",
                               stdout=subprocess.PIPE, text=True)
         self.assertIn("setup-unanswered", lapdread.stdout.readline())
         lapdread.kill()

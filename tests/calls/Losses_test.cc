@@ -1,0 +1,194 @@
+// What the recorder has missed: an answer that may be among it is not called missing.
+#include <gtest/gtest.h>
+
+#include <functional>
+
+#include "tests/calls/analysed.h"
+
+namespace calls {
+
+namespace {
+
+using namespace test;
+namespace m = isdn::message;
+
+// A link that is up and has carried a call of ours.
+CallScript begun() {
+    CallScript script;
+    script.at(0).linkUp().at(100).us(m::setup, 1, false, {bearerSpeech()});
+    script.at(105).peer(m::releaseComplete, 1, true, {cause(17)});
+    script.acknowledge(Side::us);
+    return script;
+}
+
+// A question and its answer.
+struct Question {
+    const char* finding;
+    std::int64_t timer;  // milliseconds from the question until the finding, without a repetition
+    std::function<void(CallScript&)> ask;
+    std::function<void(CallScript&)> answer;
+};
+
+void talking(CallScript& s) {
+    s.us(m::setup, 2, false, {bearerSpeech(), channel(1)});
+    s.peer(m::connect, 2, true).us(m::connectAcknowledge, 2, false).acknowledge(Side::peer);
+}
+
+const std::vector<Question> questions{
+    {"setup-unanswered", 8000, [](CallScript& s) { s.us(m::setup, 2, false, {bearerSpeech()}); },
+     [](CallScript& s) { s.peer(m::callProceeding, 2, true); }},
+    {"connect-not-acknowledged", 4000,
+     [](CallScript& s) {
+         s.peer(m::setup, 2, false, {bearerSpeech(), channel(1)});
+         s.us(m::connect, 2, true);
+     },
+     [](CallScript& s) { s.peer(m::connectAcknowledge, 2, false); }},
+    {"disconnect-unanswered", 30000,
+     [](CallScript& s) {
+         talking(s);
+         s.us(m::disconnect, 2, false, {cause(16)});
+     },
+     [](CallScript& s) { s.peer(m::release, 2, true); }},
+    {"release-unanswered", 8000,
+     [](CallScript& s) {
+         talking(s);
+         s.us(m::release, 2, false, {cause(16)});
+     },
+     [](CallScript& s) { s.peer(m::releaseComplete, 2, true); }},
+    {"restart-unacknowledged", 240000,
+     [](CallScript& s) {
+         s.us(m::restart, 0, false, {channel(5), restartIndicator(0)});
+     },
+     [](CallScript& s) {
+         s.peer(m::restartAcknowledge, 0, true, {channel(5), restartIndicator(0)});
+     }},
+};
+
+// The identifiers of what is found in a trace that lasts until then, a line each, but for what is said of the
+// link.
+std::string told(const CallScript& script, std::int64_t until, std::uint64_t lossBehind = 0) {
+    Collected collected;
+    Analysis analysis({}, collected);
+    std::uint64_t number = 0;
+    for (const Sent& sent : script.frames()) {
+        analysis.take(sent.frame, ++number);
+        if (number == lossBehind)
+            analysis.mayMiss(*sent.frame.interface, "Frames Lost");
+    }
+    analysis.advance(until * millisecond - script.frames().back().at);
+    analysis.finish();
+    std::string lines;
+    for (const Finding& finding : collected.findings) {
+        const std::string id(finding.kind->id);
+        if (!id.starts_with("ns-gap") && id != "nr-invalid" && id != "frames-lost")
+            lines += id + "\n";
+    }
+    return lines;
+}
+
+constexpr std::int64_t asked = 10000;
+
+}  // namespace
+
+TEST(Losses, LeaveAFaultWhereNothingIsMissing) {
+    for (const Question& question : questions) {
+        CallScript s = begun();
+        question.ask(s.at(asked));
+        s.at(asked + 50).acknowledge(Side::peer);
+        EXPECT_EQ(told(s, asked + question.timer + 100), std::string(question.finding) + "\n");
+    }
+}
+
+TEST(Losses, OfTheAnswerThatAreSeenInTheNextNumberBeforeTheTimerRunsOut) {
+    for (const Question& question : questions) {
+        CallScript s = begun();
+        question.ask(s.at(asked));
+        s.at(asked + 50).acknowledge(Side::peer);
+        question.answer(s.at(asked + 60));
+        s.unrecorded();
+        s.at(asked + 200).peer(m::status, 9, true, {cause(30), callState(0)});  // of another call
+        s.at(asked + 210).acknowledge(Side::us);
+        EXPECT_EQ(told(s, asked + question.timer + 100), "cannot-be-told\n") << question.finding;
+    }
+}
+
+TEST(Losses, OfTheAnswerThatAreSeenInTheNextNumberAfterTheTimerRanOut) {
+    for (const Question& question : questions) {
+        CallScript s = begun();
+        question.ask(s.at(asked));
+        s.at(asked + 50).acknowledge(Side::peer);
+        question.answer(s.at(asked + 60));
+        s.unrecorded();
+        s.at(asked + question.timer + 500).peer(m::status, 9, true, {cause(30), callState(0)});
+        s.at(asked + question.timer + 600).acknowledge(Side::us);
+        EXPECT_EQ(told(s, asked + question.timer + 700), "cannot-be-told\n") << question.finding;
+    }
+}
+
+TEST(Losses, OfTheAnswerThatTheAskersOwnAcknowledgementShows) {
+    for (const std::int64_t after : {-100, 200}) {  // before and after the timer runs out
+        for (const Question& question : questions) {
+            CallScript s = begun();
+            question.ask(s.at(asked));
+            s.at(asked + 50).acknowledge(Side::peer);
+            question.answer(s.at(asked + 60));
+            s.unrecorded();
+            s.at(asked + question.timer + after).acknowledge(Side::us);
+            EXPECT_EQ(told(s, asked + question.timer + 500), "cannot-be-told\n") << question.finding;
+        }
+    }
+}
+
+TEST(Losses, ThatTheRecorderNamesAreADoubtUntilTheNumbersGoOn) {
+    for (const Question& question : questions) {
+        CallScript s = begun();
+        question.ask(s.at(asked));
+        s.at(asked + 50).acknowledge(Side::peer);
+        const std::uint64_t last = s.frames().size();
+        EXPECT_EQ(told(s, asked + question.timer + 100, last), "cannot-be-told\n") << question.finding;
+        s.at(asked + 100).poll(Side::us);
+        EXPECT_EQ(told(s, asked + question.timer + 100, last), std::string(question.finding) + "\n");
+    }
+}
+
+TEST(Losses, BetweenTwoCallsMayBeTheClearingOfTheFirst) {
+    for (const bool lost : {false, true}) {
+        CallScript s = begun();
+        talking(s.at(asked));
+        if (lost)
+            s.at(asked + 5000).us(m::disconnect, 2, false, {cause(16)}).unrecorded();
+        if (lost)
+            s.peer(m::release, 2, true).unrecorded().us(m::releaseComplete, 2, false).unrecorded();
+        s.at(asked + 9000).us(m::setup, 3, false, {bearerSpeech(), channel(1)});
+        s.peer(m::callProceeding, 3, true, {channel(1)}).acknowledge(Side::us);
+        EXPECT_EQ(told(s, asked + 10000), lost ? "cannot-be-told\n" : "double-seizure\n");
+    }
+}
+
+TEST(Losses, BetweenTwoCallsMayBeTheEndOfTheFirstWithItsReference) {
+    for (const bool lost : {false, true}) {
+        CallScript s = begun();
+        talking(s.at(asked));
+        if (lost)
+            s.at(asked + 5000).us(m::release, 2, false, {cause(16)}).unrecorded();
+        if (lost)
+            s.peer(m::releaseComplete, 2, true).unrecorded();
+        s.at(asked + 9000).us(m::setup, 2, false, {bearerSpeech(), channel(7)});
+        s.peer(m::releaseComplete, 2, true, {cause(17)}).acknowledge(Side::us);
+        EXPECT_EQ(told(s, asked + 10000), lost ? "cannot-be-told\n" : "reference-in-use\nstuck-channel\n");
+    }
+}
+
+TEST(Losses, InAMessageOfSegmentsAreNoFaultOfItsSender) {
+    for (const bool lost : {false, true}) {
+        CallScript s = begun();
+        s.at(asked).peer(m::segment, 2, false, {Bytes{0x00, 0x02, 0x81, 0x05}, Bytes{0x04, 0x03, 0x80}});
+        if (lost)
+            s.peer(m::segment, 2, false, {Bytes{0x00, 0x02, 0x00, 0x05}, Bytes{0x90, 0xA3}}).unrecorded();
+        s.at(asked + 100).acknowledge(Side::us);
+        EXPECT_EQ(told(s, asked + 4100), lost ? "cannot-be-told\n" : "segments-unfinished\n");
+        EXPECT_EQ(told(s, asked + 3900), "");
+    }
+}
+
+}  // namespace calls
