@@ -4,7 +4,7 @@
 
 #include <utility>
 
-#include "hostsvc/KSAssert.h"
+#include "hostsvc/KSSystem.h"
 #include "hostsvc/KSException.h"
 #include "hostsvc/KSMsgRef.h"
 

@@ -9,7 +9,6 @@
 #include "hostsvc/KSRemoteService_ComFailure.h"
 #include "hostsvc/KSSleep.h"
 #include "hostsvc/KSTransportChoice.h"
-#include "hostsvc/descComp.h"
 
 namespace {
 

@@ -6,7 +6,6 @@
 #include <mutex>
 
 #include "hostsvc/KSAbstractMsgQueue.h"
-#include "hostsvc/KSAsyncMsgReceiver.h"
 #include "hostsvc/KSException.h"
 #include "hostsvc/KSMsgRef.h"
 #include "hostsvc/KSMutex.h"
@@ -16,6 +15,10 @@
 // A clean-up routine. `slot` points to an NvMsg32Bit*; the routine frees the message, if there is one, and
 // sets the pointer to null.
 void* KSMsgQueueThread_Cleanup(void* slot);
+
+// The base class of objects that receive messages. It is empty: a receiver derives from it, registers a
+// pointer to this part of its object, and casts its member function to a member of this class.
+class KSAsyncMsgReceiver {};
 
 // The queue's reader thread reads every message from the transport. It gives the message to the request that
 // waits for this reply; otherwise to the registered receiver; and if there is no receiver, it parks the

@@ -2,7 +2,11 @@
 
 #include <cstring>
 
-#include "hostsvc/KSAssert.h"
+#include "hostsvc/KSSystem.h"
+
+std::uint32_t KSHostInit() { return nvDrvSetInterface(0, 0); }
+
+void KSHostCleanup() {}
 
 KSMsgRef::KSMsgRef(unsigned size) {
     nvMsgAllocate(size, &msg_);

@@ -1,4 +1,4 @@
-// A handle: refers to one message buffer of the transport library.
+// Start-up of the transport library, its addresses, and handles to its message buffers.
 #ifndef HOSTSVC_KSMSGREF_H
 #define HOSTSVC_KSMSGREF_H
 
@@ -6,6 +6,19 @@
 
 #include "hostsvc/KSException.h"
 #include "norv/norv.h"
+
+// Starts the host services. Call it once, before any queue is made. Returns the transport library's status, 0
+// for success.
+std::uint32_t KSHostInit();
+
+// Ends the host services. Call it once, at the end.
+void KSHostCleanup();
+
+// Whether two addresses are equal, apart from their two unused octets.
+inline bool descComp(NvCompDesc a, NvCompDesc b) {
+    return a.instance == b.instance && a.board == b.board && a.processor == b.processor &&
+           a.component == b.component && a.node == b.node;
+}
 
 // A handle does not own the buffer and does not count references. Copies refer to the same buffer, and the
 // owner of the message calls free() once. Using an empty handle, except for getMsgRef, assignment and

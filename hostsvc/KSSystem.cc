@@ -3,7 +3,9 @@
 #include <sys/select.h>
 #include <unistd.h>
 
+#undef NDEBUG  // or <cassert> hides __assert_fail
 #include <atomic>
+#include <cassert>
 #include <cerrno>
 #include <ctime>
 #include <memory>
@@ -57,3 +59,7 @@ KSSystem& ks_system() {
 }
 
 void ks_useSystem(KSSystem* other) { standIn.store(other); }
+
+void ks_assertionFailed(const char* expression, const char* source, unsigned line, const char* function) {
+    __assert_fail(expression, source, line, function);
+}

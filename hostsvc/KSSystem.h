@@ -1,4 +1,4 @@
-// The system calls that tests can replace.
+// The system calls that tests can replace, and the end of the process through a failed assertion.
 #ifndef HOSTSVC_KSSYSTEM_H
 #define HOSTSVC_KSSYSTEM_H
 
@@ -38,5 +38,10 @@ KSSystem& ks_system();
 // Makes another object be used; null means the real calls again. The caller keeps the object alive as long as
 // any thread may call it.
 void ks_useSystem(KSSystem* other);
+
+// Ends the process as a failed assertion does, in every build. The report names the place that the caller
+// gives.
+[[noreturn]] void ks_assertionFailed(const char* expression, const char* source, unsigned line,
+                                     const char* function);
 
 #endif

@@ -1,15 +1,10 @@
 #include "reader/Feed.h"
 
-#include <string_view>
-
 #include "calls/standardVariant.h"
 #include "redaction/TraceRedactor.h"
 
 namespace reader {
 
-namespace {
-
-// Why frames may be missing, in a few words, by kind of item; empty if none are.
 std::string_view reasonOf(capture::Item::Kind kind) {
     using Kind = capture::Item::Kind;
     switch (kind) {
@@ -33,8 +28,6 @@ std::string_view reasonOf(capture::Item::Kind kind) {
             return {};
     }
 }
-
-}  // namespace
 
 calls::Options analysisOptions(const Options& options) {
     calls::Options to;

@@ -1,6 +1,8 @@
-// From the items of a run to the analysis of calls.
+// Hands the items of a run to the analysis of calls.
 #ifndef READER_FEED_H
 #define READER_FEED_H
+
+#include <string_view>
 
 #include "calls/Analysis.h"
 #include "reader/Options.h"
@@ -8,13 +10,16 @@
 
 namespace reader {
 
-// What the command line asks of an analysis.
+// The options for the analysis that the command line asks for.
 calls::Options analysisOptions(const Options& options);
 
-// Tells an analysis, or a redaction::TraceRedactor, what the recorder had to say between frames.
+// Why frames may be missing where an item of this kind stands, in a few words; empty if none are missing.
+std::string_view reasonOf(capture::Item::Kind kind);
+
+// Tells an analysis, or a redaction::TraceRedactor, what the recorder says between frames.
 template <typename Hearer>
 void tell(Hearer& hearer, const capture::Item& item);
-// Hands a frame on, or what the recorder says.
+// Hands a frame to the analysis, or tells it what the recorder says.
 void feed(calls::Analysis& analysis, const Seen& seen);
 
 }  // namespace reader

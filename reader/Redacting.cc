@@ -11,20 +11,11 @@ namespace {
 
 using Kind = capture::Item::Kind;
 
-// What an item says, without the words of its input.
+// What an item says, in words of our own instead of the words of its input.
 std::string_view textOf(Kind kind) {
-    switch (kind) {
-        case Kind::cut:
-            return "a frame that is cut off";
-        case Kind::mixed:
-            return "two traces in one file";
-        case Kind::unproved:
-            return "lines that are no recorder's";
-        case Kind::damaged:
-            return "damage of the file";
-        default:
-            return {};
-    }
+    const bool hasText =
+        kind == Kind::cut || kind == Kind::mixed || kind == Kind::unproved || kind == Kind::damaged;
+    return hasText ? reasonOf(kind) : std::string_view();
 }
 
 // "trunk1" for the first name, "trunk2" for the second.

@@ -4,7 +4,7 @@
 #include <string>
 #include <utility>
 
-#include "hostsvc/KSAssert.h"
+#include "hostsvc/KSSystem.h"
 #include "vela/StreamFlags.h"
 #include "vela/vela.h"
 

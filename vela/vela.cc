@@ -2,7 +2,7 @@
 
 #include <atomic>
 
-#include "hostsvc/KSHost.h"
+#include "hostsvc/KSMsgRef.h"
 #include "hostsvc/KSSleep.h"
 
 namespace vela {

@@ -5,7 +5,6 @@
 
 #include "hostsvc/KSException.h"
 #include "hostsvc/KSMsgRef.h"
-#include "hostsvc/descComp.h"
 #include "tests/support/fake_norv.h"
 
 namespace {

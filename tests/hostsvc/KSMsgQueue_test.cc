@@ -9,7 +9,7 @@
 #include <thread>
 #include <vector>
 
-#include "hostsvc/descComp.h"
+#include "hostsvc/KSMsgRef.h"
 #include "tests/hostsvc/msg_queue.h"
 #include "tests/support/test_system.h"
 

@@ -5,7 +5,6 @@
 #include <algorithm>
 #include <cstring>
 
-#include "hostsvc/descComp.h"
 #include "tests/support/fake_norv.h"
 
 namespace {
@@ -230,6 +229,20 @@ TEST(descComp, EachFieldCounts) {
     EXPECT_FALSE(descComp(address, {1, 2, 0, 9, 5, 6, 0}));
     EXPECT_FALSE(descComp(address, {1, 2, 0, 4, 9, 6, 0}));
     EXPECT_FALSE(descComp(address, {1, 2, 0, 4, 5, 9, 0}));
+}
+
+TEST(KSHost, StartUpMakesTheTransportReadyAndReturnsItsStatus) {
+    fake_norv::reset();
+    EXPECT_EQ(KSHostInit(), 0U);
+    fake_norv::fail(fake_norv::Op::setInterface);
+    EXPECT_EQ(KSHostInit(), NVSTATUS_ERROR);
+    EXPECT_THAT(fake_norv::texts(), ElementsAre("nvDrvSetInterface(0, 0)", "nvDrvSetInterface(0, 0)"));
+}
+
+TEST(KSHost, ShutDownCallsNothing) {
+    fake_norv::reset();
+    KSHostCleanup();
+    EXPECT_THAT(fake_norv::texts(), ElementsAre());
 }
 
 }  // namespace

@@ -6,7 +6,7 @@
 #include <thread>
 
 #include "hostsvc/KSException.h"
-#include "hostsvc/descComp.h"
+#include "hostsvc/KSMsgRef.h"
 #include "tests/hostsvc/remote_msg_queue.h"
 #include "tests/support/test_system.h"
 

@@ -10,7 +10,7 @@
 #include <thread>
 
 #include "hostsvc/KSMsgQueue.h"
-#include "hostsvc/descComp.h"
+#include "hostsvc/KSMsgRef.h"
 #include "tests/relay/running_relay.h"
 #include "tests/support/fake_norv.h"
 
