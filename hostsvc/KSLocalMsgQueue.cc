@@ -4,9 +4,9 @@
 
 #include <utility>
 
-#include "hostsvc/KSSystem.h"
 #include "hostsvc/KSException.h"
 #include "hostsvc/KSMsgRef.h"
+#include "hostsvc/KSSystem.h"
 
 namespace {
 
