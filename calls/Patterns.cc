@@ -114,7 +114,7 @@ void Patterns::findSameDuration(const Call& call) {
                                std::to_string((*call.duration + second / 2) / second) + " s"));
 }
 
-// What the cause is about, of the last call.
+// The property of the last call that its cause is about: bearer, channel or number.
 std::string Patterns::detailsOf(const Failure& failure) {
     switch (failure.cause) {
         case 57:

@@ -116,7 +116,7 @@ void Source::joinLineEnds() {
     joinLineEndsFrom(begin_);
 }
 
-// What a carriage return at the end belongs to is known when more has come.
+// A carriage return at the end can only be understood when more octets have come.
 void Source::joinLineEndsFrom(std::size_t from) {
     std::size_t to = from;
     for (std::size_t at = from; at < end_; ++at) {

@@ -138,7 +138,7 @@ class DumpParser final : public Parser {
         time_ = timeOf(line);
     }
 
-    // Of a line's beginning.
+    // The time at the beginning of a line.
     ToldTime timeOf(std::string_view line) {
         const bool inBrackets = take(line, '[');
         constexpr std::size_t dateSize = 10;

@@ -21,7 +21,8 @@ struct OptionRow {
     // Is called each time the option is given, with "" if it takes no value. Throws UsageError without the
     // option's name, which the caller adds.
     void (*set)(Options& options, const std::string& value);
-    // Of the options of a command whose rows have the same word here only one may be given; empty: any.
+    // If several options of a command have the same word here, only one of them may be given. Empty: no such
+    // limit.
     std::string_view oneOf{};
 };
 

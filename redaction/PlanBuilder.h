@@ -1,4 +1,4 @@
-// The parts of a plan while it is made. For the sources of this folder alone.
+// Collects the parts of a plan. Internal to redaction/.
 #ifndef REDACTION_PLANBUILDER_H
 #define REDACTION_PLANBUILDER_H
 
@@ -16,7 +16,7 @@ inline constexpr std::uint8_t allBits = 0xFF;
 
 class PlanBuilder {
   public:
-    // `whole` is what the parts' places count from.
+    // Places of parts are counted from the beginning of `whole`.
     PlanBuilder(isdn::Octets whole, isdn::Variant variant) : whole_(whole), variant_(variant) {}
 
     isdn::Variant variant() const { return variant_; }
@@ -25,7 +25,7 @@ class PlanBuilder {
     }
     std::size_t endOf(isdn::Octets octets) const { return placeOf(octets) + octets.size(); }
 
-    // Octets of `whole`, behind those of the part before.
+    // Adds a part. Its octets must be octets of `whole` that come after those of the part before.
     void add(isdn::Octets octets, Treatment treatment, std::uint8_t keptBits = 0, std::uint8_t setBits = 0) {
         if (!octets.empty())
             plan_.push_back({placeOf(octets), octets.size(), treatment, keptBits, setBits});
@@ -33,7 +33,7 @@ class PlanBuilder {
     void blank(isdn::Octets octets, std::uint8_t keptBits = 0, std::uint8_t setBits = 0) {
         add(octets, Treatment::blank, keptBits, setBits);
     }
-    // Takes back what was said of these octets and all that follow them.
+    // Removes the parts that begin at these octets or after them.
     void dropFrom(isdn::Octets octets) {
         std::erase_if(plan_, [at = placeOf(octets)](const Part& part) { return part.at >= at; });
     }
@@ -51,14 +51,15 @@ inline isdn::Octets behind(isdn::Octets octets, std::size_t count) {
     return octets.subspan(std::min(octets.size(), count));
 }
 
-// The same of an element; `dialled` is that of the message which holds digits as the caller dials them.
+// Adds the parts of an element of a message. `dialled` is the element of the message that holds the digits
+// that the caller dials.
 void planElement(const isdn::Element& element, const isdn::Layer3& message, const isdn::Element& dialled,
                  PlanBuilder& to);
-// Of the contents of FACILITY and EXTENDED FACILITY.
+// Adds the parts of the contents of FACILITY and EXTENDED FACILITY.
 void planFacility(isdn::Octets contents, PlanBuilder& to);
 
-// Whether digits may follow an element whose length is too short: it names a person, or a network, or nobody
-// knows it.
+// Whether digits may follow an element whose length is too short. They may if the element identifies a person
+// or a network, or if no table knows it.
 bool mayBeFollowedByDigits(const isdn::Element& element, isdn::Variant variant);
 
 }  // namespace redaction

@@ -1,4 +1,4 @@
-// Puts pseudonyms into frames, in the order in which they passed.
+// Replaces what identifies a person in frames. The frames must be given in the order in which they passed.
 #ifndef REDACTION_REDACTOR_H
 #define REDACTION_REDACTOR_H
 
@@ -34,17 +34,18 @@ class Redactor : public calls::Listener {
     Redactor(Pseudonyms& pseudonyms, bool blankShort) : pseudonyms_(pseudonyms), blankShort_(blankShort) {}
 
     void expect(std::uint64_t number);
-    // Appends to `done` the frames that are ready by now: mostly this one. A SEGMENT waits for the rest of
-    // its message, so frames may come out of their order.
+    // Appends to `done` the frames that are ready now, which in most cases is this one. A SEGMENT waits for
+    // the rest of its message, so frames may leave in another order.
     void take(const capture::Frame& frame, const calls::Marks& marks, isdn::Variant variant,
               std::vector<Rebuilt>& done);
-    // A frame that the analysis does not see, since it was not recorded whole.
+    // Redacts a frame that was not recorded whole, and that the analysis therefore does not see.
     std::vector<std::uint8_t> cut(isdn::Octets frame, isdn::Variant variant);
     // Frames may be missing from here on, digits with them.
     void mayMiss() { ++losses_; }
-    // Segments that wait are blanked and come out.
+    // Blanks all segments that wait, and appends their frames to `done`.
     void giveUpSegments(std::vector<Rebuilt>& done) { segments_.giveUpAll(done); }
-    // Of messages whose first segment came in a frame before `number`, or before `time`.
+    // Does the same with segments of messages whose first segment came in a frame before `number`, or before
+    // `time`.
     void giveUpOlderSegments(std::uint64_t number, std::int64_t time, std::vector<Rebuilt>& done) {
         segments_.giveUpOlder(number, time, done);
     }
@@ -54,7 +55,7 @@ class Redactor : public calls::Listener {
     void gone(const calls::Call& call) override;
 
   private:
-    // What the analysis said of the frame that is taken.
+    // What the analysis has said about the frame that is being taken.
     struct Heard {
         std::uint64_t call = 0;  // 0: none
         calls::Side from = calls::Side::us;

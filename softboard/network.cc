@@ -263,7 +263,7 @@ bool Network::heard(const Component& component) const {
     return any;
 }
 
-// Of the components whose next frame may be sent, the one whose frame is due first; null when there is none.
+// Returns the component whose next frame is due first among those that may send one; null if there is none.
 Component* Network::nextPlaying() {
     Component* next = nullptr;
     for (auto& [number, board] : boards_) {

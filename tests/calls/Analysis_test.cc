@@ -13,7 +13,7 @@ namespace {
 using namespace test;
 namespace m = isdn::message;
 
-// What a listener is told, a line each.
+// Writes what a listener is told, one line for each.
 class Told : public Listener {
   public:
     void heard(const Message& message, const Call* call) override {

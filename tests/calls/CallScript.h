@@ -159,7 +159,7 @@ class CallScript {
 
     const std::deque<Sent>& frames() const { return frames_; }
 
-    // What the call machine is told of a frame.
+    // The message that the call machine gets for a frame.
     Message toMessage(const Sent& sent) const {
         Message message;
         message.frame = &sent.frame;

@@ -80,7 +80,7 @@ std::string unescape(const std::vector<std::string>& lines);
 // Puts a text in place of the case's own in file.lines; cases after it are not moved.
 void replaceText(File& file, const Case& kase, std::string_view text);
 
-// What is there once the octets are decoded.
+// The state after the octets are decoded.
 struct Outcome {
     std::string text;
     int left = 0;  // octets in the cursor

@@ -46,7 +46,7 @@ class Input {
     std::size_t at_ = 0;
 };
 
-// What the code under test says on its streams is nobody's to read, a million times over.
+// Discards what the code under test writes to its streams, because it runs a million times.
 static const struct Muted {
     Muted() {
         std::cout.rdbuf(nullptr);

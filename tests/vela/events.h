@@ -70,7 +70,7 @@ class EventTest : public TransportTest {
   protected:
     static constexpr unsigned int onDispatcher = vela::EvtCallback::onDispatchingThread;
     static constexpr unsigned int replyType = 19;  // a message type that has a body
-    // What the callbacks are given of sendReply and sendTrace.
+    // How the bodies and messages of sendReply and sendTrace print.
     static constexpr const char* replyBody = "body 19 {Num 7 Val 1001 TextSize 0 Text {}}";
     static constexpr const char* replyMessage = "message 19 12 octets";
     static constexpr const char* traceBody = "body 32 {Label 2 Direction 1 Timestamp 1003 Length 1 List {x}}";

@@ -16,7 +16,7 @@ using vela::Mutex;
 using vela::Semaphore;
 using vela::Thread;
 
-// What the thread functions below are given.
+// The argument of the thread functions below.
 struct Job : Thread::Runnable {
     Signal started, ended;
     std::atomic<bool> mayEnd{false};
