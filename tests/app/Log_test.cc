@@ -64,7 +64,7 @@ class LogTest : public testing::Test {
         log_.write(std::string(size, letter));
     }
 
-    // What was said until the log is closed.
+    // Closes the log and returns what was written to the standard error stream until then.
     std::string saidAtTheEnd() {
         log_.close();
         setrlimit(RLIMIT_FSIZE, &before_);  // standard error is a file meanwhile
@@ -148,7 +148,8 @@ TEST_F(LogTest, WritesAFrameWholeOrNotAtAll) {
     EXPECT_EQ(saidAtTheEnd(), path_ + ": File too large\n" + path_ + ": frames lost: 1\n");
 }
 
-// The text's letters, once each frame is found whole; what a gap says is missing stands in `said`.
+// Checks that each frame in the text is whole, and returns the letters of the frames. Adds the numbers in the
+// lines of gaps to `said`.
 std::string framesIn(const std::string& text, std::size_t size, unsigned long& said) {
     const std::string gap = "Frames Lost: ";
     std::string letters;

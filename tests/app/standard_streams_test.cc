@@ -72,7 +72,7 @@ TEST_F(StandardStreamsDeathTest, AFullPipeDoesNotStopTheProgram) {
                 testing::ExitedWithCode(3), "^the end\n$");
 }
 
-// What is written to standard error is read back in the same process.
+// The test reads in the same process what it writes to standard error.
 std::string saidBy(const std::vector<std::function<void()>>& talkers) {
     const int end = readsWhatIsWrittenTo(STDERR_FILENO);
     std::string text;

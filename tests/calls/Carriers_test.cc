@@ -14,7 +14,7 @@ namespace {
 
 namespace type = isdn::message;
 
-// Whose each frame is: "5 of 1", "6 of none"; a star stands behind frames that carried what was heard of
+// Writes the call of each frame: "5 of 1", "6 of none". A star marks frames that carried what was heard of
 // others.
 class Owners : public Listener {
   public:

@@ -1,4 +1,4 @@
-// What another decoder reads in the captures that are written.
+// Compares what tshark reads in the captures that are written.
 #include <gtest/gtest.h>
 
 #include <array>

@@ -1,4 +1,4 @@
-// Who gets what nobody has asked for, and what happens to it where there is no receiver.
+// Tests which receiver gets an unasked message, and what happens to it if there is no receiver.
 #include <atomic>
 
 #include "tests/hostsvc/msg_queue.h"

@@ -208,7 +208,7 @@ TEST_F(LogTest, ALogCutAnywhereGivesTheFramesThatAreWhole) {
     const std::string all = itemsIn(whole);
     for (std::size_t size = net5Head.size(); size < whole.size(); ++size) {
         const std::string items = itemsIn(whole.substr(0, size));
-        // What is whole is read as in the whole log; the rest is one item, or none.
+        // Frames that are whole are read as in the whole log; the rest gives one item, or none.
         const std::size_t last = items.rfind('\n', items.size() - 2);
         const std::string before = items.substr(0, last == std::string::npos ? 0 : last + 1);
         EXPECT_TRUE(all.starts_with(before)) << size << "\n" << items;

@@ -1,4 +1,4 @@
-// What a scenario is made of: settings, the scenario file, and the form in which it is handed over.
+// Tests the sources of a scenario: settings, the scenario file, and the form in which it is handed over.
 #include "softboard/scenario.h"
 
 #include <gtest/gtest.h>

@@ -1,4 +1,5 @@
-// How deliveries get their threads: so many at a time, the others in order of arrival, and what is lost.
+// Tests how deliveries get their threads: a limited number at a time, the others in order of arrival, and
+// which are lost.
 #include <atomic>
 #include <functional>
 #include <set>

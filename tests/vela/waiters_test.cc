@@ -21,7 +21,7 @@ class WaiterTest : public EventTest {
             std::this_thread::yield();
         };
     }
-    // Time goes by again while the queue is closed; its reader does not sleep while it reads.
+    // Lets time pass again while the queue is closed, because its reader does not sleep while it reads.
     ~WaiterTest() override {
         EXPECT_TRUE(fake_norv::waitForIdleReader());
         system_.reset();
