@@ -14,14 +14,15 @@
 
 namespace fleet {
 
-// What NATS refused, or did not do in time. what() says what was wanted, and why it failed.
+// Thrown when NATS refuses something or does not do it in time. what() says what was wanted, and why it
+// failed.
 class NatsError : public std::runtime_error {
   public:
     enum class Reason : std::uint8_t {
-        unreachable,  // no server answers; it may later
+        unreachable,  // no server answers now
         refused,      // a server does not accept the certificate or the permission is missing
-        full,         // the stream takes no more
-        timeout,      // no answer; what was sent may have been kept
+        full,         // the stream has no room
+        timeout,      // no answer came; the stream may have stored the message
         other
     };
 
@@ -31,16 +32,17 @@ class NatsError : public std::runtime_error {
 
 struct NatsOptions {
     std::vector<std::string> servers;  // "tls://host:4222" or "nats://host:4222"; one suffices
-    std::string name;                  // of the program, as the servers' monitoring shows it
+    std::string name;                  // the program's name in the servers' monitoring
     // Files in PEM. Empty: no TLS, for a test on one machine.
-    std::string authority;    // certificates of who signs the servers'
+    std::string authority;    // certificates of the authority that signs those of the servers
     std::string certificate;  // the client's own
     std::string key;
     std::chrono::milliseconds timeout{5000};  // of each request
 };
 
-// Connected as long as it lives: when a server goes, the library looks for one again, for ever. Used by one
-// thread at a time; the library has threads of its own and calls nothing of ours.
+// A connection that lasts as long as the object. If a server is lost, the library looks for a server again,
+// without limit. Used by one thread at a time. The library has its own threads, which call none of our
+// functions.
 class NatsConnection {
   public:
     // Throws NatsError if no server takes the connection within the time.
@@ -54,7 +56,7 @@ class NatsConnection {
     std::string server() const;
 
     using Headers = std::span<const std::pair<std::string, std::string>>;
-    // Puts a message into the stream that takes the subject, and waits until the stream has it. Throws
+    // Sends a message to the stream that takes the subject, and waits until the stream has stored it. Throws
     // NatsError.
     void publish(const std::string& subject, std::string_view text, const std::string& id,
                  Headers headers = {});

@@ -1,4 +1,4 @@
-// Messages out of a stream, each until it is acknowledged.
+// Fetches messages from a stream, which delivers each again until it is acknowledged.
 #ifndef FLEET_NATSCONSUMER_H
 #define FLEET_NATSCONSUMER_H
 
@@ -13,8 +13,8 @@
 
 namespace fleet {
 
-// A message that was fetched. It owns what its views look into. One that is destroyed without a word to the
-// stream is delivered again, once the consumer's time for acknowledging is over.
+// A message that was fetched. It owns the octets of its views. If it is destroyed without an answer to the
+// stream, the stream delivers it again after the consumer's time for acknowledging.
 class NatsMessage {
   public:
     struct Handle;
@@ -30,12 +30,12 @@ class NatsMessage {
     std::uint64_t deliveries() const;           // 1 when it is delivered for the first time
     std::chrono::nanoseconds storedAt() const;  // when the stream took it, since 1970
 
-    // Each tells the stream, and throws NatsError if that cannot be sent. acknowledge() is done once it
-    // returns: the server has confirmed it. The others are not confirmed.
+    // Answers to the stream. They throw NatsError if the answer cannot be sent. acknowledge() waits for the
+    // server's confirmation; the others do not.
     void acknowledge();
     void acknowledgeLater();                             // without waiting
     void deliverAgain(std::chrono::milliseconds delay);  // not before the delay is over
-    void keepWaiting();                                  // starts the time for acknowledging anew
+    void keepWaiting();                                  // restarts the time for acknowledging
     void giveUp();                                       // never deliver it again
 
   private:
@@ -44,26 +44,26 @@ class NatsMessage {
 
 struct ConsumerRules {
     std::string stream;
-    std::string durable;  // its name, which no "." is in
-    std::string filter;   // the subjects, "lapd.17.>"
+    std::string durable;  // the consumer's name, without "."
+    std::string filter;   // the subjects of its messages, "lapd.17.>"
     std::chrono::milliseconds forAcknowledging{30'000};
     std::uint32_t mostUnacknowledged = 10'000;
 };
 
-// A durable consumer that is asked for messages. Used by one thread at a time, the one that uses the
-// connection.
+// A durable consumer from which messages are fetched. Used only by the thread that uses the connection.
 class NatsConsumer {
   public:
-    // Makes the consumer unless it is there with the same rules. The connection outlives it. Throws
-    // NatsError.
+    // Makes the consumer in the server, unless it exists with the same rules. The connection must outlive
+    // this object. Throws NatsError.
     NatsConsumer(NatsConnection& connection, const ConsumerRules& rules);
     ~NatsConsumer();
     NatsConsumer(const NatsConsumer&) = delete;
     NatsConsumer& operator=(const NatsConsumer&) = delete;
 
-    // At least one message, at most `most`; none if none comes within the time. Throws NatsError.
+    // Waits for messages and returns at least one and at most `most`; returns none if none comes within the
+    // time. Throws NatsError.
     std::vector<NatsMessage> fetch(std::size_t most, std::chrono::milliseconds wait);
-    // How many messages the stream has for it that were not delivered yet. Throws NatsError.
+    // How many messages of the stream have not been delivered to this consumer yet. Throws NatsError.
     std::uint64_t waiting();
 
   private:

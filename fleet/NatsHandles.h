@@ -1,4 +1,4 @@
-// The NATS library's objects, owned. For the sources of this folder that call the library.
+// Owners of the NATS library's objects. Internal to the sources that call the library.
 #ifndef FLEET_NATSHANDLES_H
 #define FLEET_NATSHANDLES_H
 
@@ -37,7 +37,7 @@ struct NatsConnection::Handles {
 // Throws NatsError unless the status is good; `wanted` is "connect to NATS" and the like.
 void require(natsStatus status, const std::string& wanted, int jetStreamError = 0);
 
-// A message ready to be sent. Throws NatsError.
+// Makes a message that can be sent. Throws NatsError.
 OwnedMessage makeMessage(const std::string& subject, const std::string& reply, std::string_view text,
                          const std::string& id, NatsConnection::Headers headers);
 

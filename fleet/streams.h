@@ -1,4 +1,4 @@
-// The streams of a fleet, made where they are missing.
+// Makes the streams of a fleet.
 #ifndef FLEET_STREAMS_H
 #define FLEET_STREAMS_H
 
@@ -16,19 +16,20 @@ inline constexpr char centreStream[] = "LAPD";
 inline constexpr char siteStream[] = "LAPD_SITE";
 inline constexpr char deadStream[] = "LAPD_DEAD";
 
-// A stream refuses what it has no room for: whoever sends keeps it. It forgets what is older than its age.
+// A stream refuses messages for which it has no room, so the sender must keep them. It removes messages that
+// are older than `age`.
 struct StreamRules {
     std::string name;
     std::vector<std::string> subjects;
     std::uint32_t replicas = 1;
     std::uint64_t mostOctets = 0;  // on each server's disk; 0: as much as the server allows
     std::chrono::hours age{7 * 24};
-    std::chrono::seconds duplicates{120};  // so long the server knows the ids of messages
+    std::chrono::seconds duplicates{120};  // how long the server remembers the ids of messages
     // JetStream domains of sites, whose LAPD_SITE is copied into this stream.
     std::vector<std::string> sites;
 };
 
-// Makes the stream, or gives it these rules. Throws NatsError.
+// Makes the stream, or sets the rules of the existing one. Throws NatsError.
 void makeStream(NatsConnection& connection, const StreamRules& rules);
 
 struct StreamFilling {

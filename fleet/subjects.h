@@ -1,4 +1,4 @@
-// Where a D channel stands in the fleet, and the subject that its frames travel under.
+// The address of a D channel in the fleet, and the subject of its messages.
 #ifndef FLEET_SUBJECTS_H
 #define FLEET_SUBJECTS_H
 
@@ -33,7 +33,7 @@ inline constexpr unsigned partitions = 64;
 // combined by XOR, modulo 64. It must never change: a partition's consumer keeps the order of its trunks.
 unsigned partitionOf(const Address& address, std::string_view group);
 
-// A subject that no shipper has made. what() says why.
+// Thrown for a subject that no shipper can have made. what() says why.
 class BadSubject : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
@@ -49,7 +49,7 @@ struct Subject {
 // "lapd.17.london.h1.0.1", its names written as in an address's text. So no name holds what has a meaning in
 // a subject (".", "*", ">", blanks).
 std::string toText(const Subject& subject);
-// Takes exactly what toText gives. Throws BadSubject.
+// Reads a subject in exactly the form that toText writes. Throws BadSubject.
 Subject subjectIn(std::string_view text);
 
 // All subjects, and those of one partition: "lapd.>", "lapd.17.>".

@@ -1,4 +1,4 @@
-// What a program tells the service manager that started it (systemd; sd_notify(3) describes the lines).
+// Sends messages to the service manager that started the program (systemd; sd_notify(3) describes the lines).
 // Without a service manager nothing is sent.
 #ifndef SERVICE_NOTIFY_H
 #define SERVICE_NOTIFY_H
@@ -12,8 +12,8 @@ namespace service {
 // Sends a line such as "READY=1" or "STOPPING=1" to the socket that NOTIFY_SOCKET names.
 void notify(const std::string& line);
 
-// Tells the service manager, which restarts a program that falls silent, that the program's main loop still
-// turns. The loop calls beat() at least once in each interval. Used by one thread.
+// Tells the service manager that the main loop still runs; the manager restarts a program that does not say
+// so. The loop must call beat() at least once in each interval. Used by one thread.
 class Heartbeat {
   public:
     using Clock = std::chrono::steady_clock;
@@ -21,7 +21,8 @@ class Heartbeat {
     // Reads WATCHDOG_USEC and WATCHDOG_PID. Beats three times in the time that the service manager allows.
     Heartbeat();
 
-    // How long the loop may wait before it beats again; nothing if nobody listens.
+    // How long the loop may wait before it calls beat() again; nothing if the service manager expects no
+    // beats.
     std::optional<std::chrono::milliseconds> interval() const { return interval_; }
 
     // Sends "WATCHDOG=1" if half of the interval has passed since it was last sent.
