@@ -90,6 +90,7 @@ void Occupancy::begin(const Message& message, const Call& call) {
             group.most = group.inUse;
             group.mostAt = moment;
         }
+        group.overTime.set(moment, group.inUse);
     }
 }
 
@@ -112,6 +113,7 @@ void Occupancy::stop(Group& group, Channel& channel, const Moment& moment) {
     channel.used += used;
     group.used += used;
     --group.inUse;
+    group.overTime.set(moment, group.inUse);
     spread(channel.since, channel.since.time + used);
 }
 
@@ -166,6 +168,7 @@ void Occupancy::finish(const std::vector<Span>& spans) {
             channel.usedAtEnd = true;
             Moment end = channel.since;
             end.at = std::max(until, channel.since.at);
+            end.time += end.at - channel.since.at;
             stop(group, channel, end);
         }
     }

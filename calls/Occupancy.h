@@ -12,6 +12,7 @@
 
 #include "calls/Analysis.h"
 #include "calls/Maintenance.h"
+#include "calls/UseOverTime.h"
 
 namespace calls {
 
@@ -45,6 +46,7 @@ class Occupancy {
         std::int64_t used = 0;           // nanoseconds, of all channels together
         std::int64_t heard = 0;          // nanoseconds from the first frame to the last
         std::uint64_t unknown = 0;       // how many calls have a channel that no message in the trace names
+        UseOverTime overTime{};
         bool primary = false;            // there are channels of a primary rate
         bool ofT1 = false;               // the variant is one of trunks with 24 channels
 
