@@ -4,9 +4,41 @@
 
 namespace reader {
 
-std::vector<FigureTable> FigureTaker::tables(calls::TrunkSize size) {
-    occupancy_.finish(analysis().spans());
-    return figureTables(figures_, occupancy_, size);
+namespace {
+
+// What the recorder says of the link, or of frames that it may have missed.
+std::optional<calls::LinkNews> newsOf(capture::Item::Kind kind) {
+    using Kind = capture::Item::Kind;
+    switch (kind) {
+        case Kind::run:
+        case Kind::restart:
+        case Kind::replaced:
+            return calls::LinkNews::started;
+        case Kind::cut:
+        case Kind::lost:
+        case Kind::notQueued:
+        case Kind::notTaken:
+        case Kind::dropped:
+        case Kind::mixed:
+        case Kind::unproved:
+        case Kind::damaged:
+            return calls::LinkNews::lost;
+        default:
+            return std::nullopt;
+    }
+}
+
+}  // namespace
+
+void FigureTaker::see(const Seen& seen) {
+    const capture::Frame& frame = seen.frame();
+    const calls::Moment moment{
+        .frame = seen.number, .at = seen.at, .clock = seen.when.clock, .time = seen.when.time};
+    if (seen.isFrame())
+        links_.take(frame.interface->name, seen.link, frame.transmitted ? calls::Side::us : calls::Side::peer,
+                    seen.marks, moment);
+    else if (const std::optional<calls::LinkNews> news = newsOf(seen.item->kind))
+        links_.note(frame.interface->name, *news, moment);
 }
 
 void FigureTaker::heard(const calls::Message& message, const calls::Call* call) {

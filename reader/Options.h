@@ -75,6 +75,7 @@ struct CallOptions {
     CallForm form = CallForm::text;
     std::string sort;                                      // empty: in the order of their end
     calls::TrunkSize trunk = calls::TrunkSize::unknown;    // of the figures; unknown: learnt
+    bool overTime = false;                                 // of the figures: what happened when
     calls::Severity least = calls::Severity::note;         // milder findings are not shown
     std::optional<calls::Severity> failOn = std::nullopt;  // exit status 3 for such a finding or a worse one
 };

@@ -24,14 +24,6 @@ std::string seconds(std::int64_t nanoseconds) {
     return text;
 }
 
-// A number with this many digits after the point: "0.875", "41.7".
-std::string decimal(double value, int digits) {
-    char text[64];
-    const auto [end, error] =
-        std::to_chars(text, text + sizeof text, value, std::chars_format::fixed, digits);
-    return error == std::errc() ? std::string(text, end) : std::string();
-}
-
 std::string percent(std::optional<double> share) { return share ? decimal(*share * 100, 1) : std::string(); }
 
 std::string instant(calls::HourKey key) {

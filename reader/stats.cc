@@ -1,6 +1,10 @@
 #include "reader/stats.h"
 
+#include <algorithm>
+#include <iterator>
 #include <string>
+#include <utility>
+#include <vector>
 
 #include "reader/FigureTaker.h"
 #include "reader/errors.h"
@@ -15,6 +19,8 @@ std::span<const OptionRow> statsOptions() {
          [](Options& to, const std::string&) { to.calls.form = CallForm::csv; }, "form"},
         {"--jsonl", "", "A JSON object a row",
          [](Options& to, const std::string&) { to.calls.form = CallForm::jsonLines; }, "form"},
+        {"--over-time", "", "Also: channels in use over time, links, and link events",
+         [](Options& to, const std::string&) { to.calls.overTime = true; }},
         {"--e1", "", "The trunks have the channels of E1 (default: learnt)",
          [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::e1; }, "trunk"},
         {"--t1", "", "The trunks have the channels of T1",
@@ -30,11 +36,15 @@ int runStats(const Options& options, Chatter& chatter) {
     Output& out = session.output();
     FigureTaker taker(options);
     taker.run(session, chatter);
+    taker.finish();
+    std::vector<FigureTable> tables = taker.tables(options.calls.trunk);
+    if (options.calls.overTime)
+        std::ranges::move(taker.overTime(), std::back_inserter(tables));
     std::string text;
     if (options.calls.form == CallForm::csv)
         text = figureCsvHeader;
     bool first = true;
-    for (const FigureTable& table : taker.tables(options.calls.trunk)) {
+    for (const FigureTable& table : tables) {
         if (options.calls.form == CallForm::csv) {
             appendFigureCsv(text, table);
         } else if (options.calls.form == CallForm::jsonLines) {

@@ -84,6 +84,13 @@ void appendHex(std::string& to, std::span<const std::uint8_t> octets) {
     }
 }
 
+std::string decimal(double value, int digits) {
+    char text[64];
+    const auto [end, error] =
+        std::to_chars(text, text + sizeof text, value, std::chars_format::fixed, digits);
+    return error == std::errc() ? std::string(text, end) : std::string();
+}
+
 void padTo(std::string& to, std::size_t start, std::size_t width, bool right) {
     const std::size_t length = to.size() - start;
     if (length < width)

@@ -37,6 +37,9 @@ void appendNumber(std::string& to, Number number, int base = 10) {
     to.append(digits, std::to_chars(digits, digits + sizeof digits, number, base).ptr);
 }
 
+// A number with this many digits after the point: "0.875", "41.7".
+std::string decimal(double value, int digits);
+
 // Adds blanks to the text that begins at `start` until it has `width` characters. `right`: the blanks go
 // before it.
 void padTo(std::string& to, std::size_t start, std::size_t width, bool right = false);
