@@ -45,6 +45,7 @@ void LinkHistory::take(const std::string& dChannel, const isdn::Layer2& frame, S
 }
 
 void LinkHistory::note(const std::string& dChannel, LinkNews news, const Moment& moment) {
+    losses_ += news == LinkNews::lost ? 1 : 0;
     add({news, dChannel, std::nullopt, std::nullopt, moment});
 }
 

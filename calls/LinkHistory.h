@@ -64,6 +64,8 @@ class LinkHistory {
     const std::deque<Entry>& entries() const { return entries_; }
     // Entries that are not there any more.
     std::uint64_t gone() const { return gone_; }
+    // How often the recorder said that frames are missing.
+    std::uint64_t losses() const { return losses_; }
     const std::map<Key, Standing>& links() const { return links_; }
 
   private:
@@ -72,6 +74,7 @@ class LinkHistory {
 
     std::deque<Entry> entries_;
     std::uint64_t gone_ = 0;
+    std::uint64_t losses_ = 0;
     std::map<Key, Standing> links_;
 };
 

@@ -15,6 +15,10 @@ Analysed::Analysed(const Options& options)
 
 void Analysed::run(Session& session, Chatter& chatter) {
     session.run(*this, [] { return std::make_unique<NoComposer>(); });
+    end(chatter);
+}
+
+void Analysed::end(Chatter& chatter) {
     analysis_.finish();
     if (!callFilter_.isEmpty() && !isAnyWanted_ && analysis_.begun() != 0)
         chatter.note("no call passes the filters; calls: " + std::to_string(analysis_.begun()));

@@ -30,6 +30,8 @@ class Analysed : public Consumer, protected calls::Listener {
 
     // Reads all inputs to their end. Says on the standard error stream what was dropped.
     void run(Session& session, Chatter& chatter);
+    // What run() does at the end, for those who hand items in by take().
+    void end(Chatter& chatter);
 
     void take(Chunk& chunk, std::size_t count) final;
     bool wantsAll() const final { return true; }

@@ -91,6 +91,7 @@ struct LadderOptions {
 struct RedactOptions {
     std::string key;  // the key's file; empty: a key that nobody keeps
     bool undo = false;
+    bool inReport = false;  // of a command that shows things rather than writes frames
     std::optional<unsigned> keepPrefix = std::nullopt;
     bool blankShort = false;
 };

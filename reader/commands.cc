@@ -13,6 +13,7 @@
 #include "reader/list.h"
 #include "reader/record.h"
 #include "reader/redact.h"
+#include "reader/report/report.h"
 #include "reader/stats.h"
 
 namespace reader {
@@ -94,6 +95,12 @@ constexpr char statsExamples[] = R"(  lapdread stats lapdmon.log
       a row a figure, for a spreadsheet
 )";
 
+constexpr char reportExamples[] = R"(  lapdread report lapdmon.log -o report.html
+      a page to open in a browser: summary, charts, calls, ladders of those that failed, findings
+  lapdread report --redact --since 2026-11-21T11:00 --until 2026-11-21T13:00 lapdmon.log -o noon.html
+      two hours, for the carrier: pseudonyms in place of numbers and names
+)";
+
 constexpr char redactExamples[] = R"(  lapdread redact lapdmon.log -o for-the-carrier.log
       numbers, names and user data are replaced; nobody can undo it
   lapdread redact --key trunk.key --callref 0378 --to pcapng lapdmon.log -o call.pcapng
@@ -142,6 +149,12 @@ const std::array table{
             statsExamples,
             {"Figures", statsOptions()},
             runStats},
+    Command{"report",
+            "[FILE...]",
+            "a page for a browser: summary, charts, calls, findings",
+            reportExamples,
+            {"Report", reportOptions()},
+            runReport},
     Command{"convert",
             "IN [OUT]",
             "frames in files that other tools read",

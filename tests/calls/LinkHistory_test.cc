@@ -100,6 +100,9 @@ TEST(LinkHistory, KeepsTheNewestEntriesAndCountsTheOthers) {
     EXPECT_EQ(history.entries().size(), LinkHistory::mostEntries);
     EXPECT_EQ(history.entries().front().moment.frame, 3U);
     EXPECT_EQ(history.gone(), 3U);
+    EXPECT_EQ(history.losses(), LinkHistory::mostEntries + 3);
+    history.note("d", LinkNews::started, {});
+    EXPECT_EQ(history.losses(), LinkHistory::mostEntries + 3);
 }
 
 TEST(LinkHistory, KeepsSoManyLinksAndNoMore) {

@@ -1,0 +1,76 @@
+#include "reader/report/report.h"
+
+#include <optional>
+
+#include "reader/Redacting.h"
+#include "reader/errors.h"
+#include "reader/forms.h"
+#include "reader/inputs.h"
+#include "reader/redact.h"
+#include "reader/report/ReportTaker.h"
+#include "reader/session.h"
+
+namespace reader {
+
+namespace {
+
+// Names of files name people and places as well.
+std::string titleOf(const Options& options) {
+    if (options.redact.inReport)
+        return "Report of a trace, redacted";
+    std::string title = "Report of";
+    for (const std::string& file : inputFiles(options))
+        title += " " + (file == "-" ? "the standard input" : file.substr(file.rfind('/') + 1));
+    return title;
+}
+
+// Pseudonyms come before anything is composed or counted.
+void takeRedacted(ReportTaker& taker, Session& session, const Options& options, const redaction::Key& key,
+                  Chatter& chatter) {
+    Redacting redacting(options, key, redaction::Direction::redact, nullptr, taker);
+    session.run(redacting, [] { return std::make_unique<NoComposer>(); });
+    redacting.finish();
+    taker.end(chatter);
+}
+
+}  // namespace
+
+std::span<const OptionRow> reportOptions() {
+    static const OptionRow rows[] = {
+        {"--redact", "", "Put pseudonyms in place of numbers, names and user data",
+         [](Options& to, const std::string&) { to.redact.inReport = true; }},
+        {"--key", "FILE", "Make them by this key, and make the key if there is none; implies --redact",
+         [](Options& to, const std::string& value) {
+             to.redact.inReport = true;
+             to.redact.key = value;
+         }},
+        {"--e1", "", "The trunks have the channels of E1 (default: learnt)",
+         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::e1; }, "trunk"},
+        {"--t1", "", "The trunks have the channels of T1",
+         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::t1; }, "trunk"},
+        {"--bri", "", "The trunks are basic accesses",
+         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::basic; }, "trunk"},
+    };
+    return rows;
+}
+
+int runReport(const Options& options, Chatter& chatter) {
+    Session session(options, chatter);
+    std::optional<redaction::Key> key;  // before an output is emptied
+    if (options.redact.inReport)
+        key = redactionKey(options, chatter);
+    Output& out = session.output("a report", looksLikeReport);
+    if (out.isTerminal())
+        throw UsageError("a report is not for a terminal: name a file with -o, or send it through a pipe");
+    ReportTaker taker(options);
+    if (key)
+        takeRedacted(taker, session, options, *key, chatter);
+    else
+        taker.run(session, chatter);
+    taker.finish();
+    out.write(htmlOf(taker.page(titleOf(options), options.calls.trunk)));
+    out.flush();
+    return good;
+}
+
+}  // namespace reader
