@@ -2,30 +2,19 @@
 
 #include <optional>
 
+#include "reader/Feed.h"
+
 namespace reader {
 
 namespace {
 
-// What the recorder says of the link, or of frames that it may have missed.
+// What an item that is no frame says about the links: that the recorder or the board was started, or that
+// frames may be missing.
 std::optional<calls::LinkNews> newsOf(capture::Item::Kind kind) {
     using Kind = capture::Item::Kind;
-    switch (kind) {
-        case Kind::run:
-        case Kind::restart:
-        case Kind::replaced:
-            return calls::LinkNews::started;
-        case Kind::cut:
-        case Kind::lost:
-        case Kind::notQueued:
-        case Kind::notTaken:
-        case Kind::dropped:
-        case Kind::mixed:
-        case Kind::unproved:
-        case Kind::damaged:
-            return calls::LinkNews::lost;
-        default:
-            return std::nullopt;
-    }
+    if (kind == Kind::run || kind == Kind::restart || kind == Kind::replaced)
+        return calls::LinkNews::started;
+    return reasonOf(kind).empty() ? std::nullopt : std::optional(calls::LinkNews::lost);
 }
 
 }  // namespace

@@ -90,9 +90,10 @@ class LongTable {
         this.body.replaceChildren(...shown);
         const isPart = shown.length < this.matching.length;
         this.more.hidden = this.all.hidden = !isPart;
+        const what = this.matching.length === 1 ? this.table.dataset.what.slice(0, -1) : this.table.dataset.what;
         const of = this.matching.length === this.rows.length ? "" : ` of ${this.rows.length}`;
         this.status.textContent =
-            `${this.matching.length}${of} ${this.table.dataset.what}` + (isPart ? `, ${shown.length} shown` : "");
+            `${this.matching.length}${of} ${what}` + (isPart ? `, ${shown.length} shown` : "");
     }
 }
 
