@@ -1,4 +1,4 @@
-// What happened to the links of call control, in order, and how they stand.
+// Records what happened to the links of call control, and the present state of each.
 #ifndef CALLS_LINKHISTORY_H
 #define CALLS_LINKHISTORY_H
 
@@ -27,13 +27,13 @@ enum class LinkNews : std::uint8_t {
     released,  // DISC
     asked,     // SABME
     up,        // by UA
-    unseen     // numbers began anew: the link was set up, but the trace does not show it
+    unseen     // numbers began again: the link was set up, but the trace does not show it
 };
 inline constexpr std::size_t linkNewsKinds = 9;
 // "up", "SABME", "poll unanswered".
 std::string_view nameOf(LinkNews news);
 
-// Takes frames with what their links say of them. Memory is bounded.
+// Takes frames, and what they mean for their links. Memory is bounded.
 class LinkHistory {
   public:
     struct Entry {
@@ -52,7 +52,7 @@ class LinkHistory {
     };
     using Key = std::pair<std::string, std::uint8_t>;  // D channel and TEI
 
-    // Beyond these, the oldest entry goes; links that are new are not told apart and not kept.
+    // Limits. If there are more entries, the oldest is dropped. Further links are ignored.
     static constexpr std::size_t mostEntries = 2000;
     static constexpr std::size_t mostLinks = 1000;
 
@@ -62,7 +62,7 @@ class LinkHistory {
     void note(const std::string& dChannel, LinkNews news, const Moment& moment);
 
     const std::deque<Entry>& entries() const { return entries_; }
-    // Entries that are not there any more.
+    // How many entries were dropped.
     std::uint64_t gone() const { return gone_; }
     // How often the recorder said that frames are missing.
     std::uint64_t losses() const { return losses_; }

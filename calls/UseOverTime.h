@@ -1,4 +1,4 @@
-// How many channels were in use as time went by, in steps that grow with the trace.
+// Counts how many channels were in use over time, in steps whose width grows with the trace.
 #ifndef CALLS_USEOVERTIME_H
 #define CALLS_USEOVERTIME_H
 
@@ -11,15 +11,15 @@
 
 namespace calls {
 
-// Is told of each change of the number of channels in use. Memory is bounded: when the steps would be too
-// many, they become longer, and steps that were counted are put together. Steps begin at whole multiples of
-// their width, so those of several objects can be compared.
+// Takes each change of the number of channels in use. Memory is bounded: when there would be too many steps,
+// the width grows and steps are joined. Steps begin at multiples of their width, so the steps of several
+// objects can be compared.
 class UseOverTime {
   public:
-    // On one clock there are at most so many steps, empty ones among them.
+    // The largest number of steps on one clock, including empty ones.
     static constexpr std::int64_t mostSteps = 400;
 
-    // Which step: time divided by the width.
+    // Identifies a step: its clock, and the time divided by the width.
     struct Key {
         capture::Clock clock = capture::Clock::none;
         std::int64_t step = 0;
@@ -27,16 +27,17 @@ class UseOverTime {
     };
     struct Step {
         std::int64_t used = 0;  // nanoseconds, of all channels together
-        unsigned most = 0;      // channels in use at once
+        unsigned most = 0;      // the largest number of channels in use at the same time
     };
 
-    // From now on so many are in use. A moment that no clock has told is passed over; one that is earlier
-    // than the moment before takes nothing back.
+    // From this moment on, `inUse` channels are in use. A moment without a time is ignored. An earlier moment
+    // than the one before takes nothing back.
     void set(const Moment& moment, unsigned inUse);
 
-    // Of a step, in nanoseconds: 1, 5, 15 s, 1, 5, 15 min, 1, 6 h, 1 day, and from there on the double.
+    // The width of a step in nanoseconds: 1, 5, 15 s, 1, 5, 15 min, 1, 6 h, 1 day, and then twice the last
+    // one each time.
     std::int64_t width() const { return width_; }
-    // Those in which a channel was in use.
+    // The steps in which a channel was in use.
     const std::map<Key, Step>& steps() const { return steps_; }
 
   private:

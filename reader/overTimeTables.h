@@ -1,4 +1,4 @@
-// What happened in a trace as time went by, as tables.
+// Tables that show what happened in a trace over time.
 #ifndef READER_OVERTIMETABLES_H
 #define READER_OVERTIMETABLES_H
 

@@ -10,7 +10,7 @@
 
 namespace reader {
 
-// What is in it. Texts that are not called markup may hold anything.
+// The contents of the page. Texts may hold any characters, except those that are said to be markup.
 struct Page {
     std::string title;
     std::vector<std::string> summary;    // sentences; safe
@@ -24,7 +24,7 @@ struct Page {
 
 std::string htmlOf(const Page& page);
 
-// A page of a report may be written over: whether a file begins like one.
+// Whether a file begins like the page of a report, and so may be overwritten.
 bool looksLikeReport(std::string_view beginning);
 
 }  // namespace reader

@@ -1,4 +1,4 @@
-// Gathers what a report shows.
+// Collects the contents of a report.
 #ifndef READER_REPORT_REPORTTAKER_H
 #define READER_REPORT_REPORTTAKER_H
 
@@ -13,8 +13,8 @@
 
 namespace reader {
 
-// Figures as `stats` has them, a row for each call and finding, a ladder for each call that failed. Memory is
-// bounded: what there is no room for is counted.
+// Collects the figures that `stats` shows, a row for each call and finding, and a ladder for each call that
+// failed. Memory is bounded: pieces for which there is no room are counted.
 class ReportTaker : public FigureTaker {
   public:
     // Rows of calls that failed and of all others, each; findings; ladders, and their octets.

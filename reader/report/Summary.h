@@ -1,4 +1,4 @@
-// What a report says first, in sentences.
+// Composes the sentences at the beginning of a report.
 #ifndef READER_REPORT_SUMMARY_H
 #define READER_REPORT_SUMMARY_H
 
@@ -15,7 +15,7 @@
 
 namespace reader {
 
-// What the sentences are made of. All references outlive this.
+// The facts for the sentences. All references must outlive this object.
 struct Overview {
     std::uint64_t frames = 0;
     Instant from{};  // of the first frame
@@ -27,8 +27,8 @@ struct Overview {
     std::optional<calls::Finding> worst{};    // the first of the worst ones
 };
 
-// The trace, its links, its calls, its findings: a sentence or a few each. Nothing in them commands a
-// terminal; they are no markup.
+// Sentences about the trace, its links, its calls and its findings. Control characters are made harmless. The
+// sentences are plain text, not markup.
 std::vector<std::string> summaryOf(const Overview& overview);
 
 }  // namespace reader

@@ -1,4 +1,5 @@
-// What the page of `lapdread report` is made of. The build makes the strings of the files in this folder.
+// The fixed parts of the page of `lapdread report`. The build makes these strings from the files in this
+// folder.
 #ifndef READER_REPORT_ASSETS_H
 #define READER_REPORT_ASSETS_H
 

@@ -1,4 +1,4 @@
-// Pieces of HTML. Whatever text they hold, it stays text.
+// Composes HTML. Text in it is escaped, so that it is never taken for markup.
 #ifndef READER_REPORT_MARKUP_H
 #define READER_REPORT_MARKUP_H
 
@@ -25,7 +25,7 @@ void appendTable(std::string& to, const FigureTable& table);
 // The same for a script, as it may stand in <script type="application/json">: {"messages":[{...},...],...}.
 std::string jsonOf(const std::vector<FigureTable>& tables);
 
-// Pieces that follow one another, as many as there is room for.
+// Collects pieces of HTML up to a limit.
 class Pieces {
   public:
     explicit Pieces(std::uint64_t most, std::size_t mostOctets = std::string::npos)
@@ -34,7 +34,7 @@ class Pieces {
     bool hasRoom() const { return count_ < most_ && text_.size() < mostOctets_; }
     // Adds the piece, or counts it if there is no room.
     void add(std::string_view piece);
-    // One that nobody has made, since there is no room.
+    // Counts a piece that was not made, because there is no room.
     void leaveOut() { ++leftOut_; }
 
     const std::string& text() const { return text_; }
