@@ -6,6 +6,7 @@
 
 #include "capture/hex_digits.h"
 #include "capture/lines.h"
+#include "capture/notes.h"
 #include "capture/text_forms.h"
 #include "capture/time_text.h"
 
@@ -73,6 +74,14 @@ bool parse(std::string_view rest, HexLine& line, std::vector<std::uint8_t>& octe
     return !octets.empty();
 }
 
+// The comment that says with which key the lines were redacted; empty if the line is none.
+std::string_view redactionIn(std::string_view line) {
+    constexpr std::string_view sign = "# ";
+    return line.starts_with(sign) && line.substr(sign.size()).starts_with(redactedPrefix)
+               ? line.substr(sign.size())
+               : std::string_view();
+}
+
 bool isBlank(std::string_view line) { return line.find_first_not_of(blanks) == std::string_view::npos; }
 
 class HexParser final : public Parser {
@@ -86,6 +95,11 @@ class HexParser final : public Parser {
             const Source::State state = lines_.next(line);
             if (state != Source::State::ready)
                 return state == Source::State::pause ? Reader::Next::pause : Reader::Next::end;
+            if (const std::string_view note = redactionIn(line); !note.empty()) {
+                item = itemHere(Item::Kind::comment);
+                item.text = note;
+                return Reader::Next::item;
+            }
             line = withoutComment(line);
         } while (isBlank(line));
         take(line, item);
@@ -96,11 +110,8 @@ class HexParser final : public Parser {
     void take(std::string_view line, Item& item) {
         HexLine parsed;
         const bool isGood = parse(line, parsed, octets_);
-        item = {};
-        item.frame.interface = interface_;
-        item.frame.place = {file_, lines_.number(), Place::Unit::line};
+        item = itemHere(isGood ? Item::Kind::frame : Item::Kind::unproved);
         if (!isGood) {
-            item.kind = Item::Kind::unproved;
             item.count = 1;
             item.text = "this line is no direction, time and octets; it is passed over";
             return;
@@ -110,6 +121,14 @@ class HexParser final : public Parser {
         item.frame.clock = parsed.time.clock;
         item.frame.time = parsed.time.time;
         item.frame.ticks = parsed.ticks;
+    }
+
+    Item itemHere(Item::Kind kind) const {
+        Item item;
+        item.kind = kind;
+        item.frame.interface = interface_;
+        item.frame.place = {file_, lines_.number(), Place::Unit::line};
+        return item;
     }
 
     Lines lines_;

@@ -3,7 +3,10 @@
 #include <algorithm>
 #include <utility>
 
+#include "capture/notes.h"
 #include "reader/Feed.h"
+#include "reader/errors.h"
+#include "reader/text.h"
 
 namespace reader {
 
@@ -32,6 +35,7 @@ const std::string& numbered(std::map<std::string, std::string, std::less<>>& kno
 Redacting::Redacting(const Options& options, const redaction::Key& key, redaction::Direction direction,
                      std::unique_ptr<Composer> composer, Consumer& next)
     : redactor_(key, direction, analysisOptions(options)),
+      keyCheck_(redaction::checkOf(key)),
       hidesNames_(direction == redaction::Direction::redact),
       composer_(std::move(composer)),
       next_(next),
@@ -82,6 +86,11 @@ void Redacting::giveUp() {
 void Redacting::look(const Seen& seen, bool passes) {
     if (seen.item->kind == Kind::comment && hidesNames_)
         return;
+    if (seen.item->kind == Kind::comment && seen.item->text.starts_with(capture::redactedPrefix)) {
+        checkKey(seen.item->text.substr(capture::redactedPrefix.size()));
+        knowsKey_ = true;
+        return;
+    }
     Waiting& waiting = waiting_.emplace_back();
     waiting.seen = seen;
     waiting.item = *seen.item;
@@ -93,6 +102,12 @@ void Redacting::look(const Seen& seen, bool passes) {
     if (waiting_.size() > mostWaiting)
         giveUp();
     release();
+}
+
+void Redacting::checkKey(std::string_view check) const {
+    if (check != keyCheck_)
+        throw FileError("the input was redacted with another key: its check is " + safe(check) +
+                        ", that of this key " + keyCheck_);
 }
 
 // Releases items, up to the first that waits for the rest of its message.

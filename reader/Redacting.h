@@ -23,6 +23,8 @@ namespace reader {
 // our own. While pseudonyms are undone all these stay as they are.
 class Redacting : public Consumer {
   public:
+    static constexpr const char* firstTrunk = "trunk1";  // the name that the first D channel gets
+
     // `composer` may be null if the next consumer wants no text. All references outlive this.
     Redacting(const Options& options, const redaction::Key& key, redaction::Direction direction,
               std::unique_ptr<Composer> composer, Consumer& next);
@@ -33,6 +35,9 @@ class Redacting : public Consumer {
     void flush() override { next_.flush(); }
     // The input has ended.
     void finish();
+    // Whether the input says that it was redacted with this key. While pseudonyms are undone, take() throws
+    // FileError if it was another one.
+    bool knowsKey() const { return knowsKey_; }
 
   private:
     // A frame that waits for the end of its message, or an item behind one.
@@ -57,7 +62,11 @@ class Redacting : public Consumer {
     void handOn();
     void passGate();
 
+    void checkKey(std::string_view check) const;
+
     redaction::TraceRedactor redactor_;
+    std::string keyCheck_;
+    bool knowsKey_ = false;
     bool hidesNames_;
     std::unique_ptr<Composer> composer_;
     Consumer& next_;

@@ -1,5 +1,7 @@
 #include "reader/redact.h"
 
+#include "capture/Writer.h"
+#include "capture/notes.h"
 #include "reader/Redacting.h"
 #include "reader/TextConsumer.h"
 #include "reader/errors.h"
@@ -40,6 +42,17 @@ const Form& formOf(const Options& options) {
     throw UsageError("redact needs --to FORM, since the input's own form cannot be seen or written");
 }
 
+// Says in the output with which key it was made, if its form has a place for that.
+void noteKey(capture::Writer& writer, const Key& key) {
+    const capture::Interface first{Redacting::firstTrunk};
+    const std::string text = std::string(capture::redactedPrefix) + redaction::checkOf(key);
+    capture::Item note;
+    note.kind = capture::Item::Kind::comment;
+    note.frame.interface = &first;
+    note.text = text;
+    writer.write(note);
+}
+
 void write(Session& session, const Options& options, const Form& form, Output& out, const Key& key,
            Chatter& chatter) {
     const Direction direction = options.redact.undo ? Direction::restore : Direction::redact;
@@ -47,6 +60,10 @@ void write(Session& session, const Options& options, const Form& form, Output& o
         Redacting redacting(options, key, direction, std::move(composer), next);
         session.run(redacting, [] { return std::make_unique<NoComposer>(); });
         redacting.finish();
+        if (direction == Direction::restore && !redacting.knowsKey())
+            chatter.note(
+                "the input does not say with which key it was redacted: with another one, the numbers are "
+                "wrong");
     };
     if (form.makeComposer != nullptr) {
         TextConsumer consumer(out);
@@ -56,6 +73,8 @@ void write(Session& session, const Options& options, const Form& form, Output& o
         return;
     }
     const auto writer = form.makeWriter(out.descriptor(), out.name());
+    if (direction == Direction::redact)
+        noteKey(*writer, key);
     WriterConsumer consumer(*writer, form, chatter);
     run(consumer, nullptr);
     consumer.finish();

@@ -204,4 +204,17 @@ std::unique_ptr<Pseudonyms> makePseudonyms(const Key& key, Direction direction) 
     return std::make_unique<KeyedPseudonyms>(key, direction);
 }
 
+std::string checkOf(const Key& key) {
+    constexpr std::string_view digits = "0123456789abcdef";
+    constexpr std::size_t octets = 8;
+    // No pseudonym is made of a text that begins like this.
+    const std::string text =
+        "check " + std::to_string(key.manner.keepPrefix) + (key.manner.blankShort ? "s" : "");
+    const Mac::Digest digest = Mac(key.secret).of(text);
+    std::string check;
+    for (const std::uint8_t octet : std::span(digest).first(octets))
+        check += {digits[octet >> 4U], digits[octet & 15U]};
+    return check;
+}
+
 }  // namespace redaction

@@ -38,6 +38,10 @@ enum class Direction : std::uint8_t { redact, restore };
 // pseudonyms with the same beginning.
 std::unique_ptr<Pseudonyms> makePseudonyms(const Key& key, Direction direction);
 
+// Sixteen hexadecimal digits that tell keys apart and say nothing else about them. Different keys have
+// different ones, except with a chance of 1 in 2^64; so have different manners.
+std::string checkOf(const Key& key);
+
 }  // namespace redaction
 
 #endif

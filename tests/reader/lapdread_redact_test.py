@@ -101,6 +101,7 @@ class Redact(Folder):
                 "message", "code", "marks", "retransmission", "accepted")
         for variant, path in EXAMPLES.items():
             before, after = lines(variant, path), lines(variant, self.redact(variant, path, "pcapng"))
+            self.assertIn("redacted with key", after.pop(0)["text"])
             self.assertEqual(len(before), len(after))
             for one, other in zip(before, after):
                 self.assertEqual([one.get(key) for key in kept], [other.get(key) for key in kept])
@@ -159,7 +160,7 @@ class Redact(Folder):
 
     def test_takes_the_form_of_the_input(self):
         key = self.folder / "key"
-        for form, beginning in (("pcapng", b"\x0a\x0d\x0d\x0a"), ("hex", b"TX 20"), ("log", b"\nOrvane KV9")):
+        for form, beginning in (("pcapng", b"\x0a\x0d\x0d\x0a"), ("hex", b"# lapdread: redacted with key "), ("log", b"\nOrvane KV9")):
             source = self.folder / f"source-{form}"
             output("convert", "--to", form, EXAMPLES["net5"], "-o", source)
             status, out, _ = run("redact", "--key", key, source)
@@ -233,6 +234,28 @@ class Redact(Folder):
         gone = self.folder / "gone"
         self.assertEqual(run("redact", "--to", "hex", "--undo", "--key", gone, EXAMPLES["net5"])[0], 2)
         self.assertFalse(gone.exists())
+
+    def test_undoes_nothing_with_another_key(self):
+        other = self.folder / "other"
+        output("redact", "--to", "hex", "--key", other, EXAMPLES["net5"])
+        for form in ("pcapng", "hex"):
+            redacted, to = self.folder / f"redacted.{form}", self.folder / f"undone.{form}"
+            output("redact", "--key", self.key, EXAMPLES["net5"], "-o", redacted)
+            status, out, error = run("redact", "--undo", "--key", other, redacted, "-o", to)
+            self.assertEqual(status, 2)
+            self.assertIn("another key", error)
+            self.assertEqual(lines("net5", to) if to.stat().st_size else [], [])
+            status, _, error = run("redact", "--undo", "--key", self.key, redacted, "-o", to)
+            self.assertEqual((status, "which key" in error), (0, False), error)
+            self.assertNotIn("redacted with key", output("convert", "--to", "jsonl", to))
+
+    def test_says_that_it_cannot_tell_the_key_of_forms_without_comments(self):
+        for form in ("pcap", "log"):
+            redacted = self.folder / f"redacted.{form}"
+            output("redact", "--key", self.key, EXAMPLES["net5"], "-o", redacted)
+            status, _, error = run("redact", "--to", "hex", "--undo", "--key", self.key, redacted)
+            self.assertEqual(status, 0)
+            self.assertIn("does not say with which key", error)
 
     def test_a_key_goes_with_its_manner(self):
         key = self.folder / "key"

@@ -5,6 +5,8 @@
 #include <set>
 #include <vector>
 
+#include "tests/redaction/redacted.h"
+
 namespace redaction {
 namespace {
 
@@ -130,6 +132,18 @@ TEST(Pseudonyms, ofOctetsChangeBothHalvesOfEachAndAreUndone) {
     }
     makePseudonyms(keyOf(4), Direction::restore)->replaceOctets(octets);
     EXPECT_EQ(octets, before);
+}
+
+TEST(CheckOfAKey, tellsKeysAndMannersApart) {
+    Key key = test::keyOf(1);
+    const std::string check = checkOf(key);
+    EXPECT_EQ(check.size(), 16U);
+    EXPECT_EQ(checkOf(test::keyOf(1)), check);
+    EXPECT_NE(checkOf(test::keyOf(2)), check);
+    key.manner.keepPrefix = 3;
+    EXPECT_NE(checkOf(key), check);
+    key.manner = {.blankShort = true};
+    EXPECT_NE(checkOf(key), check);
 }
 
 }  // namespace
