@@ -47,8 +47,8 @@ class Occupancy {
         std::int64_t heard = 0;          // nanoseconds from the first frame to the last
         std::uint64_t unknown = 0;       // how many calls have a channel that no message in the trace names
         UseOverTime overTime{};
-        bool primary = false;            // there are channels of a primary rate
-        bool ofT1 = false;               // the variant is one of trunks with 24 channels
+        bool primary = false;  // there are channels of a primary rate
+        bool ofT1 = false;     // the variant is one of trunks with 24 channels
 
         // Channels in use on average.
         double erlangs() const;
