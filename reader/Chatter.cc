@@ -27,6 +27,7 @@ Chatter::Chatter(Loudness loudness)
 Chatter::~Chatter() { clearBar(); }
 
 void Chatter::say(std::string_view text) {
+    const std::lock_guard lock(mutex_);
     clearBar();
     std::string line = "lapdread: ";
     appendForTerminal(line, text);
@@ -37,8 +38,8 @@ void Chatter::say(std::string_view text) {
 void Chatter::error(std::string_view text) { say(text); }
 
 void Chatter::wrongUsage(std::string_view text) {
-    wrongUsage_ = true;
     say(text);
+    wrongUsage_ = true;
 }
 
 void Chatter::note(std::string_view text) {
@@ -52,7 +53,10 @@ void Chatter::detail(std::string_view text) {
 }
 
 void Chatter::progress(std::uint64_t done, std::uint64_t of) {
-    if (!mayDraw_ || ++calls_ % callsBetweenLooks != 0)
+    if (!mayDraw_)
+        return;
+    const std::lock_guard lock(mutex_);
+    if (++calls_ % callsBetweenLooks != 0)
         return;
     if (const auto now = Clock::now(); now >= next_) {
         next_ = now + betweenTwo;

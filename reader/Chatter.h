@@ -3,15 +3,18 @@
 #ifndef READER_CHATTER_H
 #define READER_CHATTER_H
 
+#include <atomic>
 #include <chrono>
 #include <cstdint>
+#include <mutex>
 #include <string_view>
 
 namespace reader {
 
 enum class Loudness { quiet, usual, verbose };
 
-// Writes lines that begin with "lapdread: ". Used by one thread.
+// Writes lines that begin with "lapdread: ". Any thread may call error(), wrongUsage(), note(), detail() and
+// progress().
 class Chatter {
   public:
     explicit Chatter(Loudness loudness);
@@ -49,8 +52,9 @@ class Chatter {
 
     Loudness loudness_;
     bool mayDraw_;
+    std::mutex mutex_;  // guards the stream and everything below
     bool drawn_ = false;
-    bool wrongUsage_ = false;
+    std::atomic<bool> wrongUsage_ = false;
     unsigned calls_ = 0;
     Clock::time_point next_;
 };

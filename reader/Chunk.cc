@@ -2,14 +2,19 @@
 
 namespace reader {
 
-void Chunk::add(const Seen& seen) {
+Seen& Chunk::add(const Seen& seen) {
     batch_.add(*seen.item);
-    seen_.push_back(seen);
+    return seen_.emplace_back(seen);
+}
+
+Seen& Chunk::add(const capture::Item& item) {
+    batch_.add(item);
+    return seen_.emplace_back();
 }
 
 void Chunk::seal() {
     const std::span<const capture::Item> items = batch_.items();
-    for (std::size_t i = 0; i < items.size(); ++i)
+    for (std::size_t i = 0; i < seen_.size(); ++i)
         seen_[i].item = &items[i];
 }
 

@@ -26,9 +26,11 @@ struct Piece {
 // nothing.
 class Chunk {
   public:
-    // Copies octets and text. The interface and the file's name are not copied; they must outlive the chunk.
-    void add(const Seen& seen);
-    // Ends the adding. From now on views of the items are valid, until clear().
+    // Both copy octets and text. The interface and the file's name are not copied; they must outlive the
+    // chunk. What they return is valid until the next call; the second leaves it to be filled in.
+    Seen& add(const Seen& seen);
+    Seen& add(const capture::Item& item);
+    // Ends the adding. From now on views of the items are valid, until clear(). May be called again.
     void seal();
     // Moves all items from index `from` on to `other`. This chunk must be sealed, and `other` must not be.
     void split(std::size_t from, Chunk& other);

@@ -2,19 +2,22 @@
 
 #include <algorithm>
 #include <chrono>
+#include <csignal>
+#include <exception>
+#include <system_error>
+#include <thread>
 #include <utility>
 #include <vector>
 
-#include "reader/Crew.h"
 #include "reader/Polls.h"
+#include "reader/Turns.h"
 
 namespace reader {
 
 namespace {
 
-// Large enough that handing chunks over costs little, small enough that a few of them fit into the cache.
+// Large enough that taking turns costs little, small enough that octets and text stay in a processor's cache.
 constexpr std::size_t itemsInChunk = 256;
-constexpr std::size_t chunksForEachThread = 3;
 constexpr std::chrono::milliseconds longestWait{500};
 // How much later than a frame passed a recorder may write it. Time on this host's clock counts only after
 // that.
@@ -28,13 +31,36 @@ void composeChunk(Chunk& chunk, const Filter& filter, Composer& composer, bool r
             readHeaders(seen);
         if (!filter.passes(seen))
             continue;
-        Piece piece{.item = i, .instant = {seen.when.clock, seen.at}};
+        // Filled in where it stands: a copy would wait until the processor has stored all of the text.
+        Piece& piece = chunk.pieces.emplace_back();
+        piece.item = i;
+        piece.end = chunk.text.size();
+        piece.instant.clock = seen.when.clock;
+        piece.instant.time = seen.at;
         composer.compose(seen, chunk.text, piece);
         piece.end = chunk.text.size();
-        chunk.pieces.push_back(piece);
     }
 }
 
+// While one exists, threads that are started get no signals. So signals go to the thread that waits for
+// input, and end its waiting.
+class WithoutSignals {
+  public:
+    WithoutSignals() {
+        sigset_t all;
+        sigfillset(&all);
+        pthread_sigmask(SIG_SETMASK, &all, &before_);
+    }
+    ~WithoutSignals() { pthread_sigmask(SIG_SETMASK, &before_, nullptr); }
+    WithoutSignals(const WithoutSignals&) = delete;
+    WithoutSignals& operator=(const WithoutSignals&) = delete;
+
+  private:
+    sigset_t before_{};
+};
+
+// The threads take turns (Turns.h). A member belongs to the thread that reads, or to the one that hands on. A
+// thread whose chunk holds all there is just now reads until it has handed on, so that both are the same.
 class Run {
   public:
     Run(capture::Reader& reader, Tracker& tracker, Filter& filter, Consumer& consumer, Chatter& chatter,
@@ -47,99 +73,157 @@ class Run {
           work_(work),
           first_(consumer.countsItself() ? 0 : work.first),
           left_(first_),
-          crew_(jobs()) {}
+          turns_(std::max(work.jobs, 1U)) {}
 
     Outcome run() {
-        Next next = Next::item;
-        bool more = true;
-        bool isFull = false;
-        while (more && !isStopped()) {
-            next = readChunk();
-            const std::size_t most = work_.jobs == 1 ? 0 : work_.jobs * chunksForEachThread;
-            const bool nowOrNever = next != capture::Reader::Next::item || work_.eachAtOnce;
-            isFull = !handOn(nowOrNever ? 0 : most);
-            more = !isFull && next != capture::Reader::Next::end;
-            if (nowOrNever)
-                consumer_.flush();
-            if (more && next == capture::Reader::Next::pause) {
-                reader_.wait(longestWait);
-                passTime();
-            }
-            const auto [done, of] = reader_.progress();
-            chatter_.progress(done, of);
-        }
-        if (!isFull && work_.gate != nullptr)
-            handInRest();
-        isFull = !handOn(0) || isFull;
+        const std::unique_ptr<Composer> composer = work_.makeComposer();
+        Chunk chunk;
+        takeTurns(chunk, *composer, true);
+        for (std::thread& thread : threads_)
+            thread.join();
+        if (failure_)
+            std::rethrow_exception(failure_);
+        if (!isFull_)
+            handOnRest(chunk, *composer);
         consumer_.flush();
-        return {!isFull && next == Next::end, passed_};
+        return {hasEnded_ && !isFull_, passed_};
     }
 
   private:
     using Next = capture::Reader::Next;
     using HostClock = std::chrono::steady_clock;
 
-    std::vector<Crew::Job> jobs() {
-        std::vector<Crew::Job> jobs;
-        for (unsigned i = 0; i < work_.jobs; ++i) {
-            jobs.emplace_back(
-                [this, composer = std::shared_ptr<Composer>(work_.makeComposer())](Chunk& chunk) {
-                    composeChunk(chunk, filter_, *composer, tracker_.followsLinks());
-                });
+    // The owner is the thread of run().
+    void takeTurns(Chunk& chunk, Composer& composer, bool isOwner) {
+        while (const auto turn = turns_.beginReading(isOwner)) {
+            std::exception_ptr thrown;
+            Next next = Next::end;
+            attempt(thrown, [&] { next = read(chunk, isOwner); });
+            chunk.seal();
+            const bool isAlone = next != Next::item || work_.eachAtOnce;
+            if (!isAlone)
+                turns_.endReading();
+            if (!isAlone && isOwner && threads_.empty())
+                startOthers();
+            attempt(thrown, [&] { compose(chunk, composer); });
+            turns_.await(*turn);
+            attempt(thrown, [&] { handOn(chunk, isAlone); });
+            if (failure_ == nullptr)
+                failure_ = thrown;
+            if (isFull_ || failure_ != nullptr || next == Next::end)
+                turns_.close();
+            turns_.end();
+            if (isAlone)
+                endReading(next);
         }
-        return jobs;
+    }
+
+    // Of several exceptions the first is kept. What was read before it goes on all the same.
+    template <class Act>
+    static void attempt(std::exception_ptr& thrown, Act act) {
+        try {
+            act();
+        } catch (...) {
+            if (thrown == nullptr)
+                thrown = std::current_exception();
+        }
+    }
+
+    void endReading(Next next) {
+        if (next == Next::pause)
+            turns_.endReadingForOwner();
+        else
+            turns_.endReading();
+    }
+
+    // Called once there is more than one chunk. If the system has no thread left, fewer do the work.
+    void startOthers() {
+        const WithoutSignals none;
+        try {
+            for (unsigned i = 1; i < work_.jobs; ++i) {
+                std::shared_ptr<Composer> composer = work_.makeComposer();
+                threads_.emplace_back([this, composer = std::move(composer)] {
+                    Chunk chunk;
+                    takeTurns(chunk, *composer, false);
+                });
+            }
+        } catch (const std::system_error&) {
+        }
     }
 
     bool isStopped() const { return work_.stopped != nullptr && work_.stopped->load(); }
 
-    // Reads a chunk and hands it in. Returns why reading stopped.
-    Next readChunk() {
-        std::unique_ptr<Chunk> chunk = heldBack_ != nullptr ? std::move(heldBack_) : freeChunk();
-        std::size_t room = work_.eachAtOnce ? 1 : itemsInChunk;
-        Next next = Next::item;
-        addReleased(*chunk);
-        for (; room > 0 && (next = reader_.next(item_)) == Next::item; --room) {
-            const Seen seen = tracker_.see(item_);
-            begin(seen.when);
-            hasCome_ = true;
-            if (work_.gate == nullptr) {
-                add(*chunk, seen);
-                continue;
-            }
-            work_.gate->take(seen);
-            addReleased(*chunk);
+    // Fills the chunk. Returns why it holds no more. After a pause the owner waits first.
+    Next read(Chunk& chunk, bool isOwner) {
+        chunk.clear();
+        if (isOwner && std::exchange(isPaused_, false)) {
+            reader_.wait(longestWait);
+            passTime();
         }
-        chunk->seal();
-        begun_ = begun_ || !chunk->empty();
-        if (filter_.hidesKeepAlives())
-            holdBack(*chunk, next);
-        crew_.handIn(std::move(chunk));
+        if (isStopped())
+            return Next::end;
+        const Next next = fill(chunk);
+        isPaused_ = next == Next::pause;
+        hasEnded_ = next == Next::end;
+        const auto [done, of] = reader_.progress();
+        chatter_.progress(done, of);
         return next;
     }
 
-    void add(Chunk& chunk, Seen seen) {
+    Next fill(Chunk& chunk) {
+        std::swap(chunk, heldBack_);
+        std::size_t room = work_.eachAtOnce ? 1 : itemsInChunk;
+        Next next = Next::item;
+        addReleased(chunk);
+        for (; room > 0 && (next = reader_.next(item_)) == Next::item; --room) {
+            hasCome_ = true;
+            if (work_.gate == nullptr) {
+                Seen& seen = chunk.add(item_);
+                tracker_.see(item_, seen);
+                begin(seen.when);
+                lookForPolls(chunk, seen);
+                continue;
+            }
+            const Seen seen = tracker_.see(item_);
+            begin(seen.when);
+            work_.gate->take(seen);
+            addReleased(chunk);
+        }
+        begun_ = begun_ || !chunk.empty();
+        if (filter_.hidesKeepAlives())
+            holdBack(chunk, next);
+        return next;
+    }
+
+    void lookForPolls(Chunk& chunk, Seen& seen) {
         if (filter_.hidesKeepAlives())
             polls_.take(chunk, seen);
-        chunk.add(seen);
     }
 
     void addReleased(Chunk& chunk) {
         if (work_.gate == nullptr)
             return;
         while (const Seen* const seen = work_.gate->next())
-            add(chunk, *seen);
+            lookForPolls(chunk, chunk.add(*seen));
     }
 
-    // Hands in the items that were held, as far as they are wanted.
-    void handInRest() {
-        std::unique_ptr<Chunk> chunk = heldBack_ != nullptr ? std::move(heldBack_) : freeChunk();
-        work_.gate->finish();
-        addReleased(*chunk);
-        chunk->seal();
-        crew_.handIn(std::move(chunk));
+    // What was held back goes on, and of what was held at the gate as much as is wanted. No thread is left.
+    void handOnRest(Chunk& chunk, Composer& composer) {
+        chunk.clear();
+        std::swap(chunk, heldBack_);
+        if (work_.gate != nullptr)
+            work_.gate->finish();
+        addReleased(chunk);
+        chunk.seal();
+        compose(chunk, composer);
+        handOn(chunk, false);
     }
 
-    // Nothing has come. Lets time pass by this host's clock.
+    void compose(Chunk& chunk, Composer& composer) const {
+        composeChunk(chunk, filter_, composer, tracker_.followsLinks());
+    }
+
+    // Nothing has come: time goes on by this host's clock.
     void passTime() {
         if (!work_.clockRuns)
             return;
@@ -155,18 +239,17 @@ class Run {
             work_.gate->advance(passed);
     }
 
-    // Keeps back the items from the first poll on whose answer may still come, because the answer decides
-    // whether the poll is shown.
+    // Keeps the items from a poll on whose answer may still come: whether the poll is shown depends on that.
     void holdBack(Chunk& chunk, Next next) {
+        chunk.seal();
         const std::size_t from = polls_.open(chunk, next == Next::end);
-        if (from == chunk.size())
-            return;
-        heldBack_ = freeChunk();
-        chunk.split(from, *heldBack_);
+        heldBack_.clear();
+        if (from != chunk.size())
+            chunk.split(from, heldBack_);
     }
 
-    // Tells the filter the first time of the stream, before another thread uses the filter. A stream whose
-    // first chunk has no times counts as one without times.
+    // Tells the filter what the first time of the stream is, while no other thread asks it. A stream whose
+    // first chunk has no time is one without times.
     void begin(Instant first) {
         if (begun_ || first.clock == capture::Clock::none)
             return;
@@ -174,32 +257,21 @@ class Run {
         begun_ = true;
     }
 
-    // Hands finished chunks on until no more than `most` are held. False once nothing more is wanted.
-    bool handOn(std::size_t most) {
-        while (crew_.held() > most) {
-            std::unique_ptr<Chunk> chunk = crew_.takeBack();
-            std::size_t wanted = chunk->pieces.size();
-            passed_ += wanted;
-            if (first_ != 0) {
-                wanted = std::min<std::uint64_t>(wanted, left_);
-                left_ -= wanted;
-            }
-            if (wanted > 0 || consumer_.wantsAll())
-                consumer_.take(*chunk, wanted);
-            free_.push_back(std::move(chunk));
-            if (first_ != 0 && left_ == 0)
-                return false;
+    // Nothing goes on behind what was the last that is wanted, or behind a failure.
+    void handOn(Chunk& chunk, bool flushes) {
+        if (isFull_ || failure_ != nullptr)
+            return;
+        std::size_t wanted = chunk.pieces.size();
+        passed_ += wanted;
+        if (first_ != 0) {
+            wanted = std::min<std::uint64_t>(wanted, left_);
+            left_ -= wanted;
+            isFull_ = left_ == 0;
         }
-        return true;
-    }
-
-    std::unique_ptr<Chunk> freeChunk() {
-        if (free_.empty())
-            return std::make_unique<Chunk>();
-        std::unique_ptr<Chunk> chunk = std::move(free_.back());
-        free_.pop_back();
-        chunk->clear();
-        return chunk;
+        if (wanted > 0 || consumer_.wantsAll())
+            consumer_.take(chunk, wanted);
+        if (flushes)
+            consumer_.flush();
     }
 
     capture::Reader& reader_;
@@ -208,17 +280,24 @@ class Run {
     Consumer& consumer_;
     Chatter& chatter_;
     const Work& work_;
-    std::uint64_t first_;
-    std::uint64_t left_;
-    std::uint64_t passed_ = 0;
-    bool hasCome_ = true;              // an item has come since time was counted last
-    HostClock::time_point timeUntil_;  // the moment up to which time has been counted
+    // They belong to the thread that reads.
+    bool hasEnded_ = false;            // the input
+    bool isPaused_ = false;            // it has nothing more just now
+    bool hasCome_ = true;              // an item, since time was counted last
+    HostClock::time_point timeUntil_;  // time has been counted up to then
     bool begun_ = false;
     capture::Item item_;
     Polls polls_;
-    std::unique_ptr<Chunk> heldBack_;
-    std::vector<std::unique_ptr<Chunk>> free_;
-    Crew crew_;
+    Chunk heldBack_;
+    // These belong to the thread that hands on.
+    std::uint64_t first_;
+    std::uint64_t left_;
+    std::uint64_t passed_ = 0;
+    bool isFull_ = false;
+    std::exception_ptr failure_;
+
+    Turns turns_;
+    std::vector<std::thread> threads_;
 };
 
 }  // namespace

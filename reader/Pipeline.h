@@ -26,8 +26,8 @@ class Composer {
     virtual void compose(const Seen& seen, std::string& text, Piece& piece) = 0;
 };
 
-// Takes the chunks at the end of the pipeline. All functions are called on the thread of runPipeline, in the
-// order of the input.
+// Takes the chunks at the end of the pipeline, in the order of the input. One thread at a time calls it, and
+// not always the same one.
 class Consumer {
   public:
     virtual ~Consumer() = default;

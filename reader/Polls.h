@@ -13,8 +13,7 @@ namespace reader {
 // A poll is a keep-alive only if its answer follows, so items wait in their chunk until that is known.
 class Polls {
   public:
-    // Looks at an item that is about to be added to the chunk. If it answers a poll, marks both as
-    // keep-alive.
+    // Looks at an item that was added to the chunk. If it answers a poll, marks both as keep-alive.
     void take(Chunk& chunk, Seen& seen);
 
     // The first item of a sealed chunk whose poll may still be answered; the chunk's size if there is none. A

@@ -14,8 +14,7 @@ calls::Side sideOf(const capture::Frame& frame) {
 
 }  // namespace
 
-Seen Tracker::see(const capture::Item& item) {
-    Seen seen;
+void Tracker::see(const capture::Item& item, Seen& seen) {
     seen.item = &item;
     if (item.kind == Kind::frame || item.kind == Kind::oversized || item.kind == Kind::cut)
         seen.number = ++frames_;
@@ -24,7 +23,6 @@ Seen Tracker::see(const capture::Item& item) {
     tellTime(channel, seen);
     if (followsLinks_)
         follow(channel, seen);
-    return seen;
 }
 
 void Tracker::tellTime(Channel& channel, Seen& seen) {
@@ -41,7 +39,9 @@ void Tracker::tellTime(Channel& channel, Seen& seen) {
         first_ = seen.at;
     seen.sinceFirst = seen.at - *first_;
     seen.timeGoesBack = seen.when.clock == channel.last.clock && seen.when.time < channel.last.time;
-    channel.last = seen.when;
+    // Each part on its own: a copy of both would wait until the processor has stored seen.when.
+    channel.last.clock = seen.when.clock;
+    channel.last.time = seen.when.time;
 }
 
 capture::Variant Tracker::variantOf(const capture::Item& item) {

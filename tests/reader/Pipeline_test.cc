@@ -1,0 +1,132 @@
+#include "reader/Pipeline.h"
+
+#include <gtest/gtest.h>
+
+#include <stdexcept>
+
+#include "tests/reader/streams.h"
+
+namespace reader {
+namespace {
+
+// Gives so many frames of one D channel, and then throws or ends.
+class Frames : public capture::Reader {
+  public:
+    explicit Frames(std::uint64_t count, bool isBad = false) : left_(count), isBad_(isBad) {}
+
+    Next next(capture::Item& item) override {
+        if (left_ == 0 && isBad_)
+            throw capture::BadInput("bad");
+        if (left_ == 0)
+            return Next::end;
+        --left_;
+        item = {};
+        item.frame.octets = octets_;
+        item.frame.interface = &interface_;
+        return Next::item;
+    }
+    void wait(std::chrono::milliseconds /*most*/) override {}
+    Progress progress() const override { return {}; }
+
+  private:
+    std::uint64_t left_;
+    bool isBad_;
+    capture::Interface interface_;
+    std::vector<std::uint8_t> octets_{0x02, 0x01, 0x01, 0x01};
+};
+
+// Checks that frames come in their order, and may fail at one of them.
+class Counting : public Consumer {
+  public:
+    explicit Counting(std::uint64_t failAt = 0) : failAt_(failAt) {}
+    void take(Chunk& chunk, std::size_t count) override {
+        for (std::size_t i = 0; i < count; ++i) {
+            EXPECT_EQ(chunk.seen()[chunk.pieces[i].item].number, ++taken);
+            if (taken == failAt_)
+                throw std::runtime_error("full");
+        }
+    }
+    void flush() override { flushed = taken; }
+
+    std::uint64_t taken = 0;
+    std::uint64_t flushed = 0;
+
+  private:
+    std::uint64_t failAt_;
+};
+
+class Failing : public Composer {
+  public:
+    explicit Failing(std::uint64_t failAt) : failAt_(failAt) {}
+    void compose(const Seen& seen, std::string& text, Piece& /*piece*/) override {
+        if (seen.number == failAt_)
+            throw std::runtime_error("no words");
+        text += 'x';
+    }
+
+  private:
+    std::uint64_t failAt_;
+};
+
+class PipelineTest : public ::testing::TestWithParam<unsigned> {
+  protected:
+    Outcome run(capture::Reader& reader, Counting& counting, std::uint64_t first = 0,
+                std::uint64_t failAt = 0) {
+        Work work;
+        work.makeComposer = [failAt] { return std::make_unique<Failing>(failAt); };
+        work.jobs = GetParam();
+        work.first = first;
+        return runPipeline(reader, tracker_, filter_, counting, chatter_, work);
+    }
+
+    Tracker tracker_{InputOptions()};
+    Filter filter_{{}};
+    Chatter chatter_{Loudness::quiet};
+};
+
+TEST_P(PipelineTest, HandsOnAllFramesInTheirOrder) {
+    for (const std::uint64_t frames : {0U, 1U, 255U, 256U, 257U, 20'000U}) {
+        Frames reader(frames);
+        Counting counting;
+        Tracker tracker{InputOptions()};
+        tracker_ = std::move(tracker);
+        const Outcome outcome = run(reader, counting);
+        EXPECT_TRUE(outcome.isWhole);
+        EXPECT_EQ(outcome.passed, frames);
+        EXPECT_EQ(counting.flushed, frames);
+    }
+}
+
+TEST_P(PipelineTest, HandsOnNoMoreThanTheFirst) {
+    Frames reader(20'000);
+    Counting counting;
+    EXPECT_FALSE(run(reader, counting, 3000).isWhole);
+    EXPECT_EQ(counting.flushed, 3000U);
+}
+
+TEST_P(PipelineTest, HandsOnWhatWasReadBeforeTheInputTurnedBad) {
+    Frames reader(5000, true);
+    Counting counting;
+    EXPECT_THROW(run(reader, counting), capture::BadInput);
+    EXPECT_EQ(counting.flushed, 5000U);
+}
+
+TEST_P(PipelineTest, HandsOnNothingBehindAFailure) {
+    {
+        Frames reader(20'000);
+        Counting counting;
+        EXPECT_THROW(run(reader, counting, 0, 4000), std::runtime_error);
+        EXPECT_LE(counting.taken, 4000U);
+        EXPECT_GE(counting.taken, 3999U);
+    }
+    tracker_ = Tracker(InputOptions());
+    Frames reader(20'000);
+    Counting counting(4000);
+    EXPECT_THROW(run(reader, counting), std::runtime_error);
+    EXPECT_EQ(counting.taken, 4000U);
+}
+
+INSTANTIATE_TEST_SUITE_P(Jobs, PipelineTest, ::testing::Values(1, 2, 5));
+
+}  // namespace
+}  // namespace reader
