@@ -50,6 +50,10 @@ const Marks& DChannel::take(const capture::Frame& frame, std::uint64_t number, s
         sample_.assumed = commandBy(frame.role, sample_);
     link_ = &linkOf(sample_.layer2);
     marks_ = link_->take(sample_, events_, late_);
+    const isdn::Octets information = sample_.layer2.information;
+    if (sample_.layer2.type == isdn::FrameType::I && marks_.accepted.value_or(false) &&
+        !information.empty() && isdn::isMaintenance(information.front()))
+        servicePolls_.take(sample_, timers_.t200, marks_);
     for (LinkEvent& event : events_)
         event.tei = sample_.layer2.tei;
     if (fixed_ != capture::Role::unknown)
@@ -73,6 +77,7 @@ void DChannel::mayLack(Side side) {
 }
 
 void DChannel::restarted() {
+    servicePolls_ = {};
     for (const auto& [tei, link] : links_)
         link->forget();
 }

@@ -12,6 +12,7 @@
 #include "calls/CommandBits.h"
 #include "calls/Link.h"
 #include "calls/Message.h"
+#include "calls/ServicePolls.h"
 #include "calls/Timers.h"
 #include "capture/Frame.h"
 
@@ -62,6 +63,7 @@ class DChannel {
 
     Timers timers_;
     capture::Role fixed_;
+    ServicePolls servicePolls_;
     CommandBits shared_;  // what all links together have shown, for links that have not shown it themselves
     std::vector<std::unique_ptr<Link>> byAddress_;
     std::vector<std::pair<std::uint8_t, Link*>> links_;  // with their TEIs

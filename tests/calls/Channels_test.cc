@@ -191,4 +191,55 @@ TEST(Channels, TakenInOneOrderByBothSidesAreProneToGlare) {
     }
 }
 
+TEST(Channels, ThatAreOutOfServiceAreFoundInTheAnswerToo) {
+    for (const bool faulty : {false, true}) {
+        CallScript script;
+        const Bytes outOfService{0x01, 0x01, 0xC2};
+        script.at(0).maintenance(Side::peer, m::service, false, {outOfService, channel(7)});
+        script.maintenance(Side::us, m::serviceAcknowledge, true, {outOfService, channel(7)});
+        script.at(1000).us(m::setup, 1, false, {bearerSpeech()});
+        script.peer(m::callProceeding, 1, true, {channel(faulty ? 7 : 8)});
+        script.peer(m::alerting, 1, true, {channel(faulty ? 7 : 8)});
+        EXPECT_EQ(findingsIn(script), faulty ? "4 channel-out-of-service\n" : "");
+    }
+}
+
+TEST(Channels, RefusedByTheUserWithCause34AreFoundIfTheyAreIdle) {
+    for (const bool idle : {false, true}) {
+        CallScript script(capture::Role::network);
+        talk(script.at(0), 1, 30);
+        if (idle)
+            clear(script.at(2000), 1);
+        script.at(5000).us(m::setup, 2, false, {bearerSpeech(), channel(30)});
+        script.peer(m::releaseComplete, 2, true, {cause(34)});
+        EXPECT_EQ(findingsIn(script), idle ? "9 channel-refused-idle\n" : "");
+    }
+}
+
+TEST(Channels, ThatStayBehindWithALinkStandInItsFinding) {
+    for (const bool restarted : {false, true}) {
+        CallScript script;
+        script.at(0).linkUp();
+        for (std::uint8_t i = 1; i <= 3; ++i)
+            talk(script.at(i * 1000), i, i);
+        script.at(9000).raw(Side::peer, true, {0x53}).raw(Side::us, false, {0x73});  // DISC, UA
+        script.at(200000).linkUp();
+        for (std::uint8_t i = 1; restarted && i <= 3; ++i) {
+            script.us(m::restart, 0, false, {channel(i), restartIndicator(0)});
+            script.peer(m::restartAcknowledge, 0, true, {channel(i), restartIndicator(0)});
+        }
+        Collected collected;
+        Analysis analysis({}, collected);
+        std::uint64_t number = 0;
+        for (const Sent& sent : script.frames())
+            analysis.take(sent.frame, ++number);
+        analysis.advance(300 * second);
+        analysis.finish();
+        EXPECT_EQ(collected.lines, "16 mass-clear\n");
+        ASSERT_EQ(collected.findings.size(), 1U);
+        const std::vector<std::string> stuck{"1", "2", "3"};
+        EXPECT_EQ(collected.findings[0].channels, restarted ? std::vector<std::string>() : stuck);
+    }
+}
+
 }  // namespace calls

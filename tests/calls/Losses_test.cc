@@ -191,4 +191,25 @@ TEST(Losses, InAMessageOfSegmentsAreNoFaultOfItsSender) {
     }
 }
 
+TEST(Losses, OfALinkLeaveOneNoteForAllQuestionsThatWereOpen) {
+    CallScript s = begun();
+    for (std::uint16_t i = 0; i < 3; ++i)
+        s.at(asked + i * 100).us(m::setup, i + 2, false, {bearerSpeech()}).acknowledge(Side::peer);
+    s.at(asked + 500).raw(Side::peer, true, {0x7F}).raw(Side::us, false, {0x73});  // SABME, UA
+    Collected collected;
+    Analysis analysis({}, collected);
+    std::uint64_t number = 0;
+    for (const Sent& sent : s.frames())
+        analysis.take(sent.frame, ++number);
+    analysis.advance(20 * second);
+    std::vector<Finding> notes;
+    for (const Finding& finding : collected.findings)
+        if (finding.kind->id == "cannot-be-told")
+            notes.push_back(finding);
+    ASSERT_EQ(notes.size(), 1U) << collected.lines;
+    EXPECT_EQ(notes[0].count, 3U);
+    EXPECT_EQ(notes[0].sentence,
+              "3 questions got no answer, of calls 2, 3, 4, but the link was down meanwhile");
+}
+
 }  // namespace calls

@@ -92,4 +92,31 @@ TEST(Patterns, FindCallsThatEndTogetherWithTheLink) {
     EXPECT_NE(patternsIn(script).find("mass-clear\n"), std::string::npos) << patternsIn(script);
 }
 
+TEST(Patterns, SayWhatTheCauseOfABurstIsAbout) {
+    struct {
+        std::uint8_t cause;
+        const char* says;
+    } const cases[] = {
+        {1, "cause 1 in 5 calls within a minute, to numbers that begin with \"0033\"; number unknown/ISDN"},
+        {34, "cause 34 in 5 calls within a minute, to numbers that begin with \"0033\""},
+        {58,
+         "cause 58 in 5 calls within a minute, to numbers that begin with \"0033\"; bearer 64k unrestricted"},
+    };
+    for (const auto& each : cases) {
+        CallScript script;
+        for (std::uint16_t i = 0; i < 5; ++i) {
+            script.at(1000 + i * 5000).us(m::setup, i + 2, false, {bearer64k(), called("003312")});
+            script.peer(m::releaseComplete, i + 2, true, {cause(each.cause, 2)});
+        }
+        Collected collected;
+        Analysis analysis({}, collected);
+        std::uint64_t number = 0;
+        for (const Sent& sent : script.frames())
+            analysis.take(sent.frame, ++number);
+        analysis.finish();
+        ASSERT_EQ(collected.findings.size(), 1U) << collected.lines;
+        EXPECT_EQ(collected.findings[0].sentence, each.says);
+    }
+}
+
 }  // namespace calls
