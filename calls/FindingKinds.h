@@ -188,7 +188,7 @@ inline constexpr FindingKind channelRefused{"channel-refused-idle", Severity::wa
     "a channel was refused although the trace shows it idle",
     "the numbering of channels and interfaces, and channels blocked by hand"};
 inline constexpr FindingKind massClear{"mass-clear", Severity::error, "Q.931 5.8.9",
-    "several calls ended within a second, with the link",
+    "three calls or more ended within a second, with the link",
     "the link's events at that time"};
 inline constexpr FindingKind interfaceMismatch{"interface-mismatch", Severity::warning, "Q.931 4.5.13",
     "the two ends name different interfaces",
@@ -197,7 +197,7 @@ inline constexpr FindingKind timer102{"timer-102", Severity::warning, "Q.850 102
     "a call was cleared because a timer ran out",
     "the timer that the diagnostic names"};
 inline constexpr FindingKind sameDuration{"same-duration", Severity::note, "",
-    "five answered calls or more ended after the same time",
+    "five of the last 30 answered calls lasted equally long, to 0.5 s, and 10 s at least",
     "a timer somewhere on the way: session refresh, registration, NAT"};
 inline constexpr FindingKind causeBurst{"cause-burst", Severity::warning, "Q.850",
     "one cause came again and again",
