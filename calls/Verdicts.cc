@@ -79,10 +79,11 @@ void Verdicts::reconsider(std::int64_t at, bool isOver) {
     for (Unanswered& question : held_) {
         const LinkWitness& link = *links_.witness(question.tei);
         const bool isWhole = link.wholeUntil[indexOf(question.answering)] >= question.until;
-        if (!isWhole && !link.isWholeSince(question.asked, question.answering))
-            doubt(std::move(question), doubtAbout(question, &link), &link);
-        else if (!isOver && !isWhole && link.wasUpSince(question.until) &&
-                 at - question.until <= timers_.t203)
+        if (!isWhole && !link.isWholeSince(question.asked, question.answering)) {
+            const std::string_view reason = doubtAbout(question, &link);
+            doubt(std::move(question), reason, &link);
+        } else if (!isOver && !isWhole && link.wasUpSince(question.until) &&
+                   at - question.until <= timers_.t203)
             open.push_back(std::move(question));
         else
             sink_.report(std::move(question.finding));
