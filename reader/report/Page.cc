@@ -52,7 +52,7 @@ std::string hashOf(std::string_view content) {
     unsigned size = 0;
     if (EVP_Digest(content.data(), content.size(), digest.data(), &size, EVP_sha256(), nullptr) != 1)
         return "'none'";
-    std::array<unsigned char, 2 * EVP_MAX_MD_SIZE> encoded{};
+    std::array<unsigned char, std::size_t{2} * EVP_MAX_MD_SIZE> encoded{};
     const int length = EVP_EncodeBlock(encoded.data(), digest.data(), static_cast<int>(size));
     return "'sha256-" + std::string(encoded.begin(), encoded.begin() + length) + "'";
 }
@@ -92,13 +92,16 @@ std::string chartsOf(const Page& page) {
         }
         if (tables.empty())
             continue;
-        const std::string name(chart.name);
-        markup += "<figure>\n<figcaption>" + markupOf(chart.caption) +
-                  "</figcaption>\n<div class=\"chart\" hidden=\"hidden\"><canvas id=\"chart-" + name +
-                  "\" role=\"img\" aria-label=\"" + markupOf(chart.label) +
-                  "; the numbers follow as a table\"></canvas></div>\n<details open=\"open\"><summary>The "
-                  "numbers</summary>\n" +
-                  tables + "</details>\n</figure>\n";
+        markup += "<figure>\n<figcaption>";
+        appendXml(markup, chart.caption);
+        markup += "</figcaption>\n<div class=\"chart\" hidden=\"hidden\"><canvas id=\"chart-";
+        markup += chart.name;
+        markup += "\" role=\"img\" aria-label=\"";
+        appendXml(markup, chart.label);
+        markup += "; the numbers follow as a table\"></canvas></div>\n";
+        markup += "<details open=\"open\"><summary>The numbers</summary>\n";
+        markup += tables;
+        markup += "</details>\n</figure>\n";
     }
     return markup;
 }
