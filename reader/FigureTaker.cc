@@ -2,6 +2,7 @@
 
 #include <optional>
 
+#include "calls/recording.h"
 #include "reader/Feed.h"
 
 namespace reader {
@@ -14,7 +15,7 @@ std::optional<calls::LinkNews> newsOf(capture::Item::Kind kind) {
     using Kind = capture::Item::Kind;
     if (kind == Kind::run || kind == Kind::restart || kind == Kind::replaced)
         return calls::LinkNews::started;
-    return reasonOf(kind).empty() ? std::nullopt : std::optional(calls::LinkNews::lost);
+    return calls::reasonOf(kind).empty() ? std::nullopt : std::optional(calls::LinkNews::lost);
 }
 
 }  // namespace

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <utility>
 
+#include "calls/recording.h"
 #include "capture/notes.h"
 #include "reader/Feed.h"
 #include "reader/errors.h"
@@ -18,7 +19,7 @@ using Kind = capture::Item::Kind;
 std::string_view textOf(Kind kind) {
     const bool hasText =
         kind == Kind::cut || kind == Kind::mixed || kind == Kind::unproved || kind == Kind::damaged;
-    return hasText ? reasonOf(kind) : std::string_view();
+    return hasText ? calls::reasonOf(kind) : std::string_view();
 }
 
 // "trunk1" for the first name, "trunk2" for the second.
@@ -129,7 +130,7 @@ void Redacting::redact(Waiting& waiting) {
         if (seen.item->kind == Kind::cut)
             waiting.octets = redactor_.cut(seen.frame().octets, seen.variant);
         waiting.isReady = true;
-        tell(redactor_, *seen.item);
+        calls::tell(redactor_, *seen.item);
         return;
     }
     std::vector<redaction::Rebuilt> done;

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 
+#include "calls/recording.h"
 #include "reader/Feed.h"
 #include "reader/OptionRow.h"
 #include "reader/check.h"
@@ -48,7 +49,7 @@ std::span<const Triggers::Fired> Triggers::look(const Seen& seen) {
     if (analysis_ != nullptr && seen.isFrame())
         analysis_->take(seen.frame(), seen.number);
     else if (analysis_ != nullptr)
-        tell(*analysis_, *seen.item);
+        calls::tell(*analysis_, *seen.item);
     for (const Wanted& wanted : wanted_) {
         if (seen.isFrame() && wanted.filter.passes(seen))
             fired_.push_back({seen.frame().interface->name,
