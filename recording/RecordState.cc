@@ -44,7 +44,10 @@ Number numberIn(const json& from) {
     return static_cast<Number>(number);
 }
 
-json toJson(const RecordedLog& log) {
+// Names are octets to the system; those that are no UTF-8 are replaced.
+std::string textOf(const json& value) { return value.dump(-1, ' ', false, json::error_handler_t::replace); }
+
+json jsonOf(const RecordedLog& log) {
     return {
         {"path", log.path},
         {"device", log.device},
@@ -83,19 +86,15 @@ RecordState stateFrom(const json& from) {
 
 // The state as text, with one file a line, so that people and shell scripts can read it.
 std::string textOf(const RecordState& state) {
-    // To the system, names are any octets. Those that are no valid UTF-8 are replaced.
-    const auto text = [](const json& value) {
-        return value.dump(-1, ' ', false, json::error_handler_t::replace);
-    };
-    std::string all = "{\"v\":" + std::to_string(version) + ",\n\"trunk\":" + text(state.trunk) +
+    std::string all = "{\"v\":" + std::to_string(version) + ",\n\"trunk\":" + textOf(state.trunk) +
                       ",\n\"run\":" + std::to_string(state.run) +
                       ",\n\"next\":" + std::to_string(state.next) +
                       ",\n\"besides\":" + std::to_string(state.besides) +
-                      ",\n\"log\":" + (state.log ? text(toJson(*state.log)) : "null") + ",\n\"files\":[";
+                      ",\n\"log\":" + (state.log ? textOf(jsonOf(*state.log)) : "null") + ",\n\"files\":[";
     std::string_view separator = "\n";
     for (const RecordedFile& file : state.files) {
         all += separator;
-        all += "{\"name\":" + text(file.name) + ",\"run\":" + std::to_string(file.run) +
+        all += "{\"name\":" + textOf(file.name) + ",\"run\":" + std::to_string(file.run) +
                ",\"first\":" + std::to_string(file.first) + "}";
         separator = ",\n";
     }
@@ -110,6 +109,16 @@ std::optional<RecordedLog> logOf(const capture::Frame& first) {
     if (path == "-" || stat(path.c_str(), &status) != 0 || !S_ISREG(status.st_mode))
         return std::nullopt;
     return RecordedLog{path, status.st_dev, status.st_ino, first.time, first.ticks, hexOf(first.octets)};
+}
+
+std::string toJson(const RecordedLog& log) { return textOf(jsonOf(log)); }
+
+RecordedLog logFromJson(std::string_view text) {
+    try {
+        return logFrom(json::parse(text));
+    } catch (const json::exception& error) {
+        throw std::runtime_error(error.what());
+    }
 }
 
 std::string statePath(const std::string& folder, const std::string& trunk) {

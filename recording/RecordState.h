@@ -6,6 +6,7 @@
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "capture/Frame.h"
@@ -33,6 +34,10 @@ struct RecordedLog {
 // Describes the log that a frame was read from. Returns nothing if that is no regular file, because it could
 // not be read a second time.
 std::optional<RecordedLog> logOf(const capture::Frame& first);
+
+// One line of JSON, as it stands in the state. Reading throws std::runtime_error for anything else.
+std::string toJson(const RecordedLog& log);
+RecordedLog logFromJson(std::string_view text);
 
 // A recording that was finished. It holds frames of one run only, numbered without gaps.
 struct RecordedFile {

@@ -33,7 +33,8 @@ int writeAll(int descriptor, std::string_view text) {
     return 0;
 }
 
-std::optional<std::string> replaceFile(const std::string& path, std::string_view text) {
+std::optional<std::string> replaceFile(const std::string& path, std::string_view text,
+                                       Durability durability) {
     const std::string fresh = path + ".new";
     const auto failed = [&](int reason) {
         unlink(fresh.c_str());
@@ -42,7 +43,9 @@ std::optional<std::string> replaceFile(const std::string& path, std::string_view
     const int descriptor = open(fresh.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666);
     if (descriptor < 0)
         return failed(errno);
-    const int unwritten = writeAll(descriptor, text);
+    int unwritten = writeAll(descriptor, text);
+    if (unwritten == 0 && durability == Durability::onDisk && fsync(descriptor) != 0)
+        unwritten = errno;
     const int unclosed = close(descriptor) == 0 ? 0 : errno;
     if (unwritten != 0 || unclosed != 0)
         return failed(unwritten != 0 ? unwritten : unclosed);

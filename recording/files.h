@@ -14,7 +14,12 @@ int writeAll(int descriptor, std::string_view text);
 
 // Writes the text to PATH.new and renames that file to PATH, so that a reader sees either the old text or the
 // new one. Returns words that say what went wrong, or nothing.
-std::optional<std::string> replaceFile(const std::string& path, std::string_view text);
+enum class Durability {
+    whenever,  // the system has it; a power failure may bring the old text back, or leave an empty file
+    onDisk     // the disk has it
+};
+std::optional<std::string> replaceFile(const std::string& path, std::string_view text,
+                                       Durability durability = Durability::whenever);
 
 }  // namespace recording
 

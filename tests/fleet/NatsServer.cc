@@ -75,7 +75,7 @@ void NatsServer::writeConfiguration() const {
        << files.file("127.0.0.1.key") << "\", ca_file: \"" << files.file("authority.pem")
        << "\", verify_and_map: true }\nauthorization { users: [ { user: store }, { user: shipper, "
           "permissions: "
-          "{ publish: \"lapd.>\", subscribe: \"_INBOX.>\" } } ] }\n";
+          "{ publish: [ \"lapd.>\", \"$JS.API.STREAM.INFO.LAPD_SITE\" ], subscribe: \"_INBOX.>\" } } ] }\n";
 }
 
 void NatsServer::start() {

@@ -1,0 +1,32 @@
+// Says that room gets scarce, before there is none.
+#ifndef FLEET_SHIP_DISKWATCH_H
+#define FLEET_SHIP_DISKWATCH_H
+
+#include <cstdint>
+#include <functional>
+#include <map>
+#include <string>
+
+namespace fleet {
+
+class DiskWatch {
+  public:
+    using Say = std::function<void(const std::string&)>;
+
+    // Less than `leastFree` per cent is said: once, and again when it has got better in between.
+    DiskWatch(unsigned leastFree, Say say) : leastFree_(leastFree), say_(std::move(say)) {}
+
+    // Looks at the disk that a folder is on.
+    void look(const std::string& folder);
+    // Anything that is filled: "the stream LAPD_SITE". Without a limit (0) it is never full.
+    void look(const std::string& name, std::uint64_t used, std::uint64_t of);
+
+  private:
+    unsigned leastFree_;
+    Say say_;
+    std::map<std::string, bool> isScarce_;
+};
+
+}  // namespace fleet
+
+#endif

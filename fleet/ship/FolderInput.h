@@ -1,0 +1,76 @@
+// The recordings that lapdread record makes of a D channel, file after file.
+#ifndef FLEET_SHIP_FOLDERINPUT_H
+#define FLEET_SHIP_FOLDERINPUT_H
+
+#include <chrono>
+#include <ctime>
+#include <memory>
+#include <string>
+
+#include "capture/Reader.h"
+#include "fleet/ship/Place.h"
+#include "fleet/ship/TrunkInput.h"
+#include "recording/RecordState.h"
+
+namespace fleet {
+
+// Goes by the recorder's state: it lists the files and says which frame each of them begins with. The newest
+// file is read while it is written. Runs and numbers are the recorder's.
+class FolderInput final : public TrunkInput {
+  public:
+    enum class Before : std::uint8_t {
+        nothing,
+        recording  // old frames first: those of the recording before, in which a call may begin
+    };
+
+    // Gives what is behind `from`.
+    FolderInput(std::string folder, const std::string& trunk, const Place& from, Before before);
+
+    bool next(InputEvent& event) override;
+    const std::optional<recording::RecordedLog>& log() const override { return none_; }
+
+  private:
+    enum class Step { event, again, pause };
+
+    Step choose(InputEvent& event);
+    Step read(InputEvent& event);
+    Step endRun(InputEvent& event);
+    Step skipTo(std::uint64_t first, InputEvent& event);
+    void refresh();
+    std::size_t nextFile();
+    std::size_t firstFile();
+    std::size_t fileBehindPlace() const;
+    bool openFile(const recording::RecordedFile& file);
+    void give(InputEvent& event);
+    bool isComplete() const;
+    void finishFile();
+
+    std::string folder_;
+    std::string statePath_;
+    Before before_;
+    recording::RecordState state_;
+    std::timespec stateTime_{};  // when the state that was read was written
+    std::uint64_t stateInode_ = 0;
+
+    // What comes next.
+    std::uint64_t run_;
+    std::uint64_t next_;
+    std::uint64_t besides_ = 0;  // items that were given behind the frame before it
+    bool isEnded_;               // the end of the run was given
+    bool lacksTail_ = false;     // a recording of this run is gone, and none behind it was read
+    std::string done_;           // name of the file that was read last; empty before the first one
+
+    // The file that is read now.
+    recording::RecordedFile file_;
+    std::unique_ptr<capture::Reader> reader_;
+    std::uint64_t number_ = 0;       // of its next frame
+    std::uint64_t besidesHere_ = 0;  // items behind the frame before that
+    bool isComplete_ = false;        // nothing will be written to it any more
+    bool isFollowed_ = false;        // it was opened before that
+
+    std::optional<recording::RecordedLog> none_;
+};
+
+}  // namespace fleet
+
+#endif

@@ -1,0 +1,149 @@
+#include "fleet/ship/ShippedTrunk.h"
+
+#include <stdexcept>
+#include <utility>
+
+#include "fleet/ship/FolderInput.h"
+#include "fleet/ship/LogInput.h"
+
+namespace fleet {
+
+namespace {
+
+constexpr int mostAtOnce = 1000;  // events; then the other D channels have their turn
+
+// Two of its names cannot give one path: an address's text has no "." but that between them.
+std::string placePathOf(const Address& address, const std::string& folder) {
+    const std::string text = toText(address);
+    std::string name = text.substr(text.find('/', text.find('/') + 1) + 1);
+    name[name.find('/')] = '.';
+    return folder + "/" + name + ".place.json";
+}
+
+std::unique_ptr<TrunkInput> makeInput(const ShippedDChannel& dChannel, const Place& place) {
+    const std::string& trunk = dChannel.head.trunk;
+    if (!dChannel.log.empty())
+        return std::make_unique<LogInput>(dChannel.log, trunk, place);
+    const auto before =
+        dChannel.head.isRedacted ? FolderInput::Before::recording : FolderInput::Before::nothing;
+    return std::make_unique<FolderInput>(dChannel.folder, trunk, place, before);
+}
+
+}  // namespace
+
+ShippedTrunk::ShippedTrunk(const ShippedDChannel& dChannel, std::size_t number,
+                           const std::string& stateFolder, const redaction::Key* key, Say say)
+    : number_(number),
+      name_(toText(dChannel.head.address)),
+      placePath_(placePathOf(dChannel.head.address, stateFolder)),
+      say_(std::move(say)),
+      makesRuns_(!dChannel.log.empty()),
+      packer_(dChannel.head) {
+    try {
+        if (auto place = readPlace(placePath_))
+            place_ = *std::move(place);
+    } catch (const std::runtime_error& error) {
+        say_(std::string(error.what()) + "; everything is shipped again");
+    }
+    run_ = place_.run;
+    if (key != nullptr)
+        redactor_.emplace(*key, [this](const InputEvent& event) { packer_.take(event); });
+    input_ = makeInput(dChannel, place_);
+}
+
+bool ShippedTrunk::step(Outbox& outbox) {
+    for (int i = 0; i < mostAtOnce && outbox.hasRoom(number_);) {
+        if (!packer_.parcels().empty()) {
+            outbox.add(number_, packer_.parcels().front());
+            packer_.parcels().pop_front();
+        } else if (isHeld_) {
+            if (!beginRun(outbox))
+                return false;
+        } else if (readNext()) {
+            ++i;
+        } else {
+            if (redactor_)
+                redactor_->pause();
+            packer_.close();
+            if (packer_.parcels().empty())
+                return false;
+        }
+    }
+    return outbox.hasRoom(number_);
+}
+
+bool ShippedTrunk::readNext() {
+    try {
+        if (!input_->next(event_))
+            return false;
+    } catch (const capture::BadInput& error) {
+        sayOnce(error.what());
+        return false;
+    }
+    if (event_.run != std::exchange(run_, event_.run) && makesRuns_) {
+        packer_.close();
+        isHeld_ = true;
+    } else {
+        take(event_);
+    }
+    return true;
+}
+
+// A run that the shipper has made must be on the disk before any frame of it is sent: otherwise a shipper
+// that is started anew would make another one of the same frames. The end of the run before must be safe, or
+// it would be forgotten.
+bool ShippedTrunk::beginRun(Outbox& outbox) {
+    if (outbox.waiting(number_) != 0)
+        return false;
+    const Place before = std::exchange(place_, {run_, 1, false, input_->log()});
+    isChanged_ = true;
+    if (!save()) {
+        place_ = before;
+        return false;
+    }
+    isHeld_ = false;
+    take(event_);
+    return true;
+}
+
+void ShippedTrunk::take(const InputEvent& event) {
+    if (event.kind == InputEvent::Kind::item && isNumbered(event.item) && !event.isOld) {
+        ++frames_;
+        newest_ = event.item.frame.clock == capture::Clock::absolute ? event.item.frame.time : newest_;
+    }
+    gaps_ += event.gap ? 1 : 0;
+    if (redactor_)
+        redactor_->take(event);
+    else
+        packer_.take(event);
+}
+
+void ShippedTrunk::safe(const SafeUpTo& upTo) {
+    if (place_.run != upTo.run)
+        place_.log.reset();
+    place_.run = upTo.run;
+    place_.next = upTo.next;
+    place_.isEnded = upTo.isEnded;
+    isChanged_ = true;
+}
+
+bool ShippedTrunk::save() {
+    if (!isChanged_)
+        return true;
+    const bool isNewRun = place_.next == 1;
+    const auto durability = isNewRun ? recording::Durability::onDisk : recording::Durability::whenever;
+    if (const auto wrong = writePlace(place_, name_, placePath_, durability)) {
+        sayOnce(*wrong);
+        return false;
+    }
+    isChanged_ = false;
+    said_.clear();
+    return true;
+}
+
+void ShippedTrunk::sayOnce(const std::string& text) {
+    if (std::exchange(said_, text) != text)
+        say_(name_ + ": " + text);
+}
+
+}  // namespace fleet

@@ -1,0 +1,74 @@
+// One D channel on its way from its recordings to the stream.
+#ifndef FLEET_SHIP_SHIPPEDTRUNK_H
+#define FLEET_SHIP_SHIPPEDTRUNK_H
+
+#include <cstdint>
+#include <functional>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "fleet/ship/EventRedactor.h"
+#include "fleet/ship/Outbox.h"
+#include "fleet/ship/Packer.h"
+#include "fleet/ship/Place.h"
+#include "fleet/ship/ShipConfig.h"
+#include "fleet/ship/TrunkInput.h"
+
+namespace fleet {
+
+// Says a line to whoever runs the program.
+using Say = std::function<void(const std::string&)>;
+
+class ShippedTrunk {
+  public:
+    // `number` is the D channel's in the outbox. A place that is damaged is said, and everything is shipped
+    // again. With a key, pseudonyms are shipped in place of numbers.
+    ShippedTrunk(const ShippedDChannel& dChannel, std::size_t number, const std::string& stateFolder,
+                 const redaction::Key* key, Say say);
+    ShippedTrunk(const ShippedTrunk&) = delete;
+    ShippedTrunk& operator=(const ShippedTrunk&) = delete;
+
+    // Reads some frames and puts them into the outbox. False if there is nothing to read just now, or no
+    // room.
+    bool step(Outbox& outbox);
+    // Up to here everything is in the stream.
+    void safe(const SafeUpTo& upTo);
+    // Whether something was read that waits for the answers to what was sent before it.
+    bool isHolding() const { return isHeld_; }
+    // Writes the place down, unless it is written already. False if that fails, which is said once.
+    bool save();
+
+    const std::string& name() const { return name_; }
+    std::uint64_t frames() const { return frames_; }
+    std::int64_t newest() const { return newest_; }  // time of the newest frame read, 0: none
+    std::uint64_t gaps() const { return gaps_; }
+
+  private:
+    bool readNext();
+    bool beginRun(Outbox& outbox);
+    void take(const InputEvent& event);
+    void sayOnce(const std::string& text);
+
+    std::size_t number_;
+    std::string name_;
+    std::string placePath_;
+    Say say_;
+    std::string said_;
+    Place place_;
+    bool isChanged_ = false;
+    bool makesRuns_;  // its runs are known from nothing but the place
+    std::unique_ptr<TrunkInput> input_;
+    Packer packer_;
+    std::optional<EventRedactor> redactor_;  // hands on to the packer
+    InputEvent event_;
+    bool isHeld_ = false;  // the event begins a run that is not written down yet
+    std::uint64_t run_;    // of the newest event
+    std::uint64_t frames_ = 0;
+    std::uint64_t gaps_ = 0;
+    std::int64_t newest_ = 0;
+};
+
+}  // namespace fleet
+
+#endif

@@ -1,0 +1,82 @@
+// All D channels of a host, shipped over one connection.
+#ifndef FLEET_SHIP_SHIPPER_H
+#define FLEET_SHIP_SHIPPER_H
+
+#include <atomic>
+#include <chrono>
+#include <deque>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "fleet/Nats.h"
+#include "fleet/NatsPublisher.h"
+#include "fleet/ship/DiskWatch.h"
+#include "fleet/ship/Outbox.h"
+#include "fleet/ship/ShipConfig.h"
+#include "fleet/ship/ShippedTrunk.h"
+
+namespace fleet {
+
+struct ShipperRules {
+    OutboxRules outbox;
+    std::chrono::milliseconds betweenPlaces{200};  // how often places are written down
+    std::chrono::milliseconds toFinish{5000};      // how long the end waits for answers
+    std::chrono::seconds betweenWatches{30};       // how often disks and the stream are looked at
+};
+
+// Runs on one thread.
+class Shipper {
+  public:
+    // Throws std::runtime_error if another shipper uses the state's folder, or it cannot be used, and
+    // redaction::KeyError for a key that is not there.
+    Shipper(const ShipConfig& config, const ShipperRules& rules, Say say);
+    ~Shipper();
+    Shipper(const Shipper&) = delete;
+    Shipper& operator=(const Shipper&) = delete;
+
+    // Until `stop` is set, which a signal handler may do. Throws NatsError if the first server that is
+    // reached refuses the credentials; a server that cannot be reached is waited for.
+    void run(const std::atomic<bool>& stop);
+    // Ships what is there, and returns when all of it is safe and nothing more is to be read.
+    void drain(const std::atomic<bool>& stop);
+
+    bool isConnected() const { return connection_ && connection_->isConnected(); }
+    const OutboxFigures& figures() const { return outbox_.figures(); }
+    const std::deque<ShippedTrunk>& trunks() const { return trunks_; }
+
+  private:
+    using Clock = std::chrono::steady_clock;
+
+    bool turn();
+    bool readSome();
+    void carry(std::chrono::milliseconds wait);
+    void connect();
+    void sayConnection();
+    void sayRefusal();
+    void watch();
+    void savePlaces();
+    void finish();
+
+    ShipConfig config_;
+    ShipperRules rules_;
+    Say say_;
+    int lock_ = -1;
+    std::deque<ShippedTrunk> trunks_;
+    Outbox outbox_;
+    DiskWatch disks_;
+    std::unique_ptr<NatsConnection> connection_;
+    std::unique_ptr<NatsPublisher> publisher_;
+    bool wasConnected_ = false;
+    bool hasConnected_ = false;  // ever
+    bool mayAskStream_ = true;
+    std::string said_;
+    std::string saidRefusal_;
+    Clock::time_point nextAttempt_{};
+    Clock::time_point nextPlaces_{};
+    Clock::time_point nextWatch_{};
+};
+
+}  // namespace fleet
+
+#endif
