@@ -19,6 +19,7 @@ struct Source {
     explicit Source(const std::string& site) : api("$JS." + site + ".API") {
         jsExternalStream_Init(&external);
         external.APIPrefix = api.c_str();
+        external.DeliverPrefix = "";  // the library takes no null pointer
         jsStreamSource_Init(&source);
         source.Name = siteStream;
         source.External = &external;

@@ -188,6 +188,15 @@ TEST_F(Nats, AFailureSaysWhy) {
     }
 }
 
+TEST_F(Nats, AStreamMayFetchFromTheStreamsOfSites) {
+    StreamRules centre;
+    centre.name = "CENTRE";
+    centre.sites = {"london", "leeds"};
+    makeStream(connection, centre);
+    makeStream(connection, centre);  // gives it the rules that it has
+    EXPECT_EQ(fleet::fillingOf(connection, "CENTRE").messages, 0U);
+}
+
 Reason reasonOfRefusal(const NatsOptions& options) {
     try {
         const NatsConnection connection(options);
