@@ -24,7 +24,8 @@ bool endedNormally(const Call& call) {
 }  // namespace
 
 Moment momentOf(const Message& message) {
-    return {message.number, message.at, message.frame->clock, message.frame->time};
+    const bool timed = message.frame->clock != capture::Clock::none || message.frame->ticks;
+    return {message.number, message.at, message.frame->clock, message.frame->time, timed};
 }
 
 std::string_view nameOf(Kind kind) {

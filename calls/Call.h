@@ -19,6 +19,7 @@ struct Moment {
     std::int64_t at = 0;      // nanoseconds on the D channel's clock; for durations
     capture::Clock clock = capture::Clock::none;
     std::int64_t time = 0;  // nanoseconds, as `clock` says; for people
+    bool timed = false;     // whether the frame has a time or ticks; without them `at` says nothing
 };
 Moment momentOf(const Message& message);
 
@@ -151,6 +152,11 @@ struct Call {
 
 // What is special about the call, as words with blanks between them: "before-trace setup-repeated".
 std::string flagsOf(const Call& call);
+
+// A time of the call, in nanoseconds; nothing if its frames have no times.
+inline std::optional<std::int64_t> timeOf(const Call& call, const std::optional<std::int64_t>& nanoseconds) {
+    return call.begin.timed ? nanoseconds : std::nullopt;
+}
 
 // Whether an engineer would say that the call failed. A call whose end is not in the trace has not failed.
 bool hasFailed(const Call& call);

@@ -81,7 +81,7 @@ void Figures::gone(const Call& call) {
     countCauses(call);
     countTraffic(call);
     for (std::size_t i = 0; i < rows.size(); ++i) {
-        if (const Nanoseconds time = rows[i].of(call))
+        if (const Nanoseconds time = timeOf(call, rows[i].of(call)))
             times_[i][indexOf(call.origin)].add(*time);
     }
 }

@@ -22,6 +22,8 @@ void Analysed::end(Chatter& chatter) {
     analysis_.finish();
     if (!callFilter_.isEmpty() && !isAnyWanted_ && analysis_.begun() != 0)
         chatter.note("no call passes the filters; calls: " + std::to_string(analysis_.begun()));
+    if (hasFrames_ && !hasTimes_)
+        chatter.note("the input has no times: durations are left out, and no answer is called missing");
     if (const std::uint64_t dropped = analysis_.dropped(); dropped != 0)
         chatter.note("calls that were let go before their end, since too many were alive: " +
                      std::to_string(dropped));
@@ -40,6 +42,8 @@ void Analysed::take(Chunk& chunk, std::size_t count) {
 }
 
 void Analysed::look(const Seen& seen, bool passes) {
+    hasFrames_ = hasFrames_ || seen.isFrame();
+    hasTimes_ = hasTimes_ || seen.frame().clock != capture::Clock::none || seen.frame().ticks;
     if (filtered_) {
         while (newest_ + 1 < seen.number) {
             passed_.push_back(false);

@@ -64,6 +64,8 @@ class Analysed : public Consumer, protected calls::Listener {
     // The same for calls that have gone, because a finding may name a call that was replaced.
     static constexpr std::size_t callsRemembered = 65'536;
 
+    bool hasFrames_ = false;
+    bool hasTimes_ = false;  // a time or ticks, of any frame
     CallFilter callFilter_;
     calls::Analysis analysis_;
     bool filtered_;

@@ -83,15 +83,25 @@ constexpr std::array fields{
                   to += call.granted ? call.grantedWords : call.askedWords;
               }},
     CallField{"first_response_ms", number,
-              [](std::string& to, const Call& call, TimeText&) { putMilliseconds(to, call.firstResponse); }},
+              [](std::string& to, const Call& call, TimeText&) {
+                  putMilliseconds(to, timeOf(call, call.firstResponse));
+              }},
     CallField{"progress_ms", number,
-              [](std::string& to, const Call& call, TimeText&) { putMilliseconds(to, call.progress); }},
+              [](std::string& to, const Call& call, TimeText&) {
+                  putMilliseconds(to, timeOf(call, call.progress));
+              }},
     CallField{"alerting_ms", number,
-              [](std::string& to, const Call& call, TimeText&) { putMilliseconds(to, call.alerting); }},
+              [](std::string& to, const Call& call, TimeText&) {
+                  putMilliseconds(to, timeOf(call, call.alerting));
+              }},
     CallField{"connect_ms", number,
-              [](std::string& to, const Call& call, TimeText&) { putMilliseconds(to, call.connect); }},
+              [](std::string& to, const Call& call, TimeText&) {
+                  putMilliseconds(to, timeOf(call, call.connect));
+              }},
     CallField{"duration_ms", number,
-              [](std::string& to, const Call& call, TimeText&) { putMilliseconds(to, call.duration); }},
+              [](std::string& to, const Call& call, TimeText&) {
+                  putMilliseconds(to, timeOf(call, call.duration));
+              }},
     CallField{"outcome", text,
               [](std::string& to, const Call& call, TimeText&) { to += nameOf(call.outcome); }},
     CallField{"ended_by", text,

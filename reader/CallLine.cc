@@ -75,13 +75,18 @@ constexpr std::array columns{
     LineColumn{"channel", "channel ", 9, false,
                [](std::string& to, const Call& call, TimeText&) { putChannels(to, call); }},
     LineColumn{"respond", "respond ", 8, true,
-               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.firstResponse); }},
-    LineColumn{"alert", "alert ", 8, true,
-               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.alerting); }},
-    LineColumn{"connect", "connect ", 8, true,
-               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.connect); }},
-    LineColumn{"duration", "duration ", 9, true,
-               [](std::string& to, const Call& call, TimeText&) { putSeconds(to, call.duration); }},
+               [](std::string& to, const Call& call, TimeText&) {
+                   putSeconds(to, timeOf(call, call.firstResponse));
+               }},
+    LineColumn{
+        "alert", "alert ", 8, true,
+        [](std::string& to, const Call& call, TimeText&) { putSeconds(to, timeOf(call, call.alerting)); }},
+    LineColumn{
+        "connect", "connect ", 8, true,
+        [](std::string& to, const Call& call, TimeText&) { putSeconds(to, timeOf(call, call.connect)); }},
+    LineColumn{
+        "duration", "duration ", 9, true,
+        [](std::string& to, const Call& call, TimeText&) { putSeconds(to, timeOf(call, call.duration)); }},
     LineColumn{"outcome", "", 12, false,
                [](std::string& to, const Call& call, TimeText&) {
                    to += call.kind == calls::Kind::signalling ? nameOf(call.kind) : nameOf(call.outcome);

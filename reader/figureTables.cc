@@ -215,6 +215,11 @@ std::string rangesOf(const std::vector<calls::ChannelKey>& channels) {
     return text;
 }
 
+// A figure that needs time is absent if no time has passed: the trace has no times, or a single frame.
+std::string ifHeard(const calls::Occupancy::Group& group, std::string figure) {
+    return group.heard > 0 ? figure : std::string();
+}
+
 FigureTable trunks(const calls::Occupancy& occupancy, calls::TrunkSize size) {
     FigureTable table{"trunks",
                       "Trunks",
@@ -238,9 +243,9 @@ FigureTable trunks(const calls::Occupancy& occupancy, calls::TrunkSize size) {
         if (group.mostAt && group.mostAt->clock != capture::Clock::none)
             TimeText().append(at, {group.mostAt->clock, group.mostAt->time});
         table.rows.push_back({group.dChannels, std::string(nameOf(its)) + (its == size ? "" : ", learnt"),
-                              seconds(group.heard), std::to_string(group.most), at,
-                              decimal(group.erlangs(), 3), std::to_string(group.unknown), rangesOf(stuck),
-                              rangesOf(neverUsed(its, group))});
+                              ifHeard(group, seconds(group.heard)), std::to_string(group.most), at,
+                              ifHeard(group, decimal(group.erlangs(), 3)), std::to_string(group.unknown),
+                              rangesOf(stuck), rangesOf(neverUsed(its, group))});
     }
     return table;
 }
@@ -263,7 +268,8 @@ FigureTable channels(const calls::Occupancy& occupancy) {
                                      : figure.calls == 0 ? "asked for only"
                                                          : "";
             table.rows.push_back({group.dChannels, toString(channel), std::to_string(figure.calls),
-                                  seconds(figure.used), decimal(erlangs, 3), std::string(state)});
+                                  ifHeard(group, seconds(figure.used)), ifHeard(group, decimal(erlangs, 3)),
+                                  std::string(state)});
         }
     }
     return table;
