@@ -44,9 +44,10 @@ void UseOverTime::count(capture::Clock clock, std::int64_t from, std::int64_t un
         widen();
     std::int64_t at = from;
     do {
-        const std::int64_t number = stepOf(at);
-        const std::int64_t next = std::min(until, (number + 1) * width_);
-        Step& step = steps_[{clock, number}];
+        // The end of the last step may be no time any more, so it is not computed.
+        const std::int64_t left = width_ - (at % width_ + width_) % width_;
+        const std::int64_t next = until - at <= left ? until : at + left;
+        Step& step = steps_[{clock, stepOf(at)}];
         step.used += (next - at) * inUse_;
         step.most = std::max(step.most, inUse_);
         at = next;

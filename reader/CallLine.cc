@@ -121,6 +121,7 @@ std::string callHeading() {
 
 std::vector<CallColumn> callColumns() {
     std::vector<CallColumn> named;
+    named.reserve(columns.size());
     for (const LineColumn& column : columns)
         named.push_back({column.heading, column.right});
     return named;

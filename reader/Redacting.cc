@@ -22,9 +22,10 @@ std::string_view textOf(Kind kind) {
     return hasText ? calls::reasonOf(kind) : std::string_view();
 }
 
+constexpr std::string_view channelWord = "trunk";
+
 // "trunk1" for the first name, "trunk2" for the second.
-const std::string& numbered(std::map<std::string, std::string, std::less<>>& known, std::string_view name,
-                            std::string_view word) {
+const std::string& numbered(Redacting::Names& known, std::string_view name, std::string_view word) {
     auto found = known.find(name);
     if (found == known.end())
         found = known.emplace(name, std::string(word) + std::to_string(known.size() + 1)).first;
@@ -41,9 +42,23 @@ Redacting::Redacting(const Options& options, const redaction::Key& key, redactio
       composer_(std::move(composer)),
       next_(next),
       callFilter_(options.filters) {
+    // D channels that the options name come first, in the order in which behind() names them.
+    for (const std::vector<std::string>& group : options.calls.groups) {
+        for (const std::string& name : group)
+            numbered(channels_, name, channelWord);
+    }
     if (!callFilter_.isEmpty() && !next_.wantsAll())
         gate_.emplace(callFilter_, analysisOptions(options),
                       options.input.follow ? CallGate::Order::ofDecision : CallGate::Order::ofInput);
+}
+
+Options Redacting::behind(Options options) {
+    Names known;
+    for (std::vector<std::string>& group : options.calls.groups) {
+        for (std::string& name : group)
+            name = numbered(known, name, channelWord);
+    }
+    return options;
 }
 
 void Redacting::take(Chunk& chunk, std::size_t count) {
@@ -157,7 +172,7 @@ void Redacting::replaceNames(Waiting& waiting) {
     item.frame.place.file = numbered(files_, item.frame.place.file, "input");
     if (item.frame.interface == nullptr)
         return;
-    const capture::Interface wanted{numbered(channels_, item.frame.interface->name, "trunk"),
+    const capture::Interface wanted{numbered(channels_, item.frame.interface->name, channelWord),
                                     item.frame.interface->variant};
     auto found = std::find(interfaces_.begin(), interfaces_.end(), wanted);
     if (found == interfaces_.end())

@@ -23,11 +23,16 @@ namespace reader {
 // our own. While pseudonyms are undone all these stay as they are.
 class Redacting : public Consumer {
   public:
+    using Names = std::map<std::string, std::string, std::less<>>;  // by the original
+
     static constexpr const char* firstTrunk = "trunk1";  // the name that the first D channel gets
 
     // `composer` may be null if the next consumer wants no text. All references outlive this.
     Redacting(const Options& options, const redaction::Key& key, redaction::Direction direction,
               std::unique_ptr<Composer> composer, Consumer& next);
+
+    // The options for an analysis behind this, which sees D channels by their new names alone.
+    static Options behind(Options options);
 
     void take(Chunk& chunk, std::size_t count) override;
     bool wantsAll() const override { return true; }
@@ -77,9 +82,8 @@ class Redacting : public Consumer {
     CallFilter callFilter_;
     std::optional<CallGate> gate_;  // if whole calls are asked for
     Chunk released_;                // what it has let through
-    std::map<std::string, std::string, std::less<>>
-        channels_;  // D channels by name, and how they are called now
-    std::map<std::string, std::string, std::less<>> files_;
+    Names channels_;                // how D channels are called now
+    Names files_;
     std::list<capture::Interface> interfaces_;
 };
 

@@ -62,7 +62,7 @@ int runReport(const Options& options, Chatter& chatter) {
     Output& out = session.output("a report", looksLikeReport);
     if (out.isTerminal())
         throw UsageError("a report is not for a terminal: name a file with -o, or send it through a pipe");
-    ReportTaker taker(options);
+    ReportTaker taker(key ? Redacting::behind(options) : options);
     if (key)
         takeRedacted(taker, session, options, *key, chatter);
     else

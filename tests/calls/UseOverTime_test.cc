@@ -79,6 +79,19 @@ TEST(UseOverTime, KeepsClocksApartAndPassesOverWhatNoneHasTold) {
     EXPECT_EQ(step(use, 1'000'000'000).used, 500 * millisecond);
 }
 
+TEST(UseOverTime, CountsUpToTheEndOfTime) {
+    UseOverTime use;
+    use.set({.clock = absolute, .time = 0}, 1);
+    use.set({.clock = absolute, .time = INT64_MAX}, 2);
+    use.set({.clock = absolute, .time = INT64_MAX}, 0);
+    EXPECT_LE(use.steps().size(), static_cast<std::size_t>(UseOverTime::mostSteps));
+    std::int64_t used = 0;
+    for (const auto& [key, each] : use.steps())
+        used += each.used;
+    EXPECT_EQ(used, INT64_MAX);
+    EXPECT_EQ(std::prev(use.steps().end())->second.most, 2U);
+}
+
 TEST(UseOverTime, TakesNothingBackWhenTimeGoesBack) {
     UseOverTime use;
     use.set(at(5'000), 1);

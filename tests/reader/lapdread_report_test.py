@@ -362,6 +362,21 @@ class Redacted(Report):
                          [row["median_s"] for row in figures(path)["times"] if row["measure"] in SET_UP])
 
 
+    def test_d_channels_of_a_group_stay_together(self):
+        """Their names in --nfas are the original ones, and not in the order in which the channels appear."""
+        first, second = (SOURCE / f"tests/reader/data/traps/changeover-{letter}.hex" for letter in "ab")
+        words = ("--merge", "--nfas", "changeover-b,changeover-a", first, second)
+        trunks = []
+        for redact in ((), ("--redact",)):
+            browser.open(self.report(*redact, *words))
+            self.assertEqual(browser.complaints(), [])
+            trunks.append(browser.value("JSON.parse(document.getElementById('data').textContent).tables.trunks"))
+        self.assertEqual(len(trunks[0]), 1)
+        for row in (trunks[0][0], trunks[1][0]):
+            row.pop("dchannel")
+        self.assertEqual(trunks[1], trunks[0])
+
+
 class Filtered(Report):
     def test_pages_have_what_stats_and_calls_have(self):
         browser.open(self.report("--callref", "0379", EXAMPLES["net5"]))
