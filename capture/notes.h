@@ -11,8 +11,8 @@
 namespace capture {
 
 inline constexpr std::string_view notePrefix = "lapdmon: ";
-// Begins a comment that says with which key a trace was redacted; the check of the key follows. Hex lines have
-// it too.
+// Begins a comment that says with which key a trace was redacted; the check of the key follows. Hex lines
+// have it too.
 inline constexpr std::string_view redactedPrefix = "lapdread: redacted with key ";
 
 // "lapdmon: ticks 75 written 1795260333", as far as the frame has them; empty when it has neither.

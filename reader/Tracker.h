@@ -38,8 +38,8 @@ class Tracker {
     // Whether an item has come from a D channel of this name.
     bool knows(const std::string& dChannel) const { return channels_.contains(dChannel); }
 
-    // Does not read the headers of the frame; readHeaders does, on the thread that needs them. `seen` is as it
-    // was made.
+    // Does not read the headers of the frame; readHeaders does, on the thread that needs them. `seen` is as
+    // it was made.
     void see(const capture::Item& item, Seen& seen);
     Seen see(const capture::Item& item) {
         Seen seen;
