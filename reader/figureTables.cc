@@ -216,7 +216,7 @@ std::string rangesOf(const std::vector<calls::ChannelKey>& channels) {
 }
 
 // A figure that needs time is absent if no time has passed: the trace has no times, or a single frame.
-std::string ifHeard(const calls::Occupancy::Group& group, std::string figure) {
+std::string ifHeard(const calls::Occupancy::Group& group, const std::string& figure) {
     return group.heard > 0 ? figure : std::string();
 }
 
