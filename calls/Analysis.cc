@@ -263,4 +263,10 @@ const DChannel* Analysis::dChannel(std::string_view name) const {
     return found == channels_.end() ? nullptr : &found->second->links;
 }
 
+ChannelService Analysis::serviceOf(std::uint32_t group, const ChannelKey& channel) const {
+    const Maintenance& maintenance = groups_.at(group)->maintenance();
+    return {maintenance.serviceOf(channel), maintenance.blockedBy(channel),
+            maintenance.isRestarting(channel)};
+}
+
 }  // namespace calls

@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -13,6 +14,7 @@
 #include "calls/CallTable.h"
 #include "calls/DChannel.h"
 #include "calls/Finding.h"
+#include "calls/Maintenance.h"
 #include "calls/Timers.h"
 #include "capture/Frame.h"
 #include "isdn/Variant.h"
@@ -43,6 +45,13 @@ class Listener {
     // order of their end.
     virtual void gone(const Call& /*call*/) {}
     virtual void found(const Finding& /*finding*/) {}
+};
+
+// What the two sides say about the use of a B channel.
+struct ChannelService {
+    Service service = Service::in;
+    std::optional<Side> blockedBy{};  // the side that has taken it out of service
+    bool restarting = false;
 };
 
 // From when until when frames of a D channel were heard, in nanoseconds on its clock.
@@ -93,6 +102,8 @@ class Analysis {
     std::vector<Span> spans() const;
     // The links of a D channel, or null if no frame has come from it.
     const DChannel* dChannel(std::string_view name) const;
+    // What RESTART and SERVICE have made of a channel of a group that `spans` has named.
+    ChannelService serviceOf(std::uint32_t group, const ChannelKey& channel) const;
 
   private:
     class Group;

@@ -93,6 +93,7 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
     }
     CallTable& table() { return table_; }
     const CallTable& table() const { return table_; }
+    const Maintenance& maintenance() const { return maintenance_; }
 
     void heard(Call& call, const Message& message) override {
         waits_.heard(call, message);

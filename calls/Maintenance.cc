@@ -239,4 +239,14 @@ std::optional<Side> Maintenance::blockedBy(const ChannelKey& channel) const {
     return std::nullopt;
 }
 
+bool Maintenance::isRestarting(const ChannelKey& channel) const {
+    return std::any_of(asked_.begin(), asked_.end(), [&](const Asked& asked) {
+        const Target& target = asked.target;
+        if (asked.service || (target.interface && target.interface != channel.interface))
+            return false;
+        return target.channels.none() ||
+               (target.interface == channel.interface && target.channels.test(channel.number));
+    });
+}
+
 }  // namespace calls

@@ -54,6 +54,8 @@ class Maintenance {
     Service serviceOf(const ChannelKey& channel) const;
     // The side that has taken the channel furthest out of service; empty if it is in service.
     std::optional<Side> blockedBy(const ChannelKey& channel) const;
+    // A RESTART that names it, or all channels, waits for its answer.
+    bool isRestarting(const ChannelKey& channel) const;
 
   private:
     // What a message is about.
