@@ -88,7 +88,7 @@ void Analysed::gone(const calls::Call& call) {
 }
 
 bool Analysed::isWanted(const calls::Call& call) const {
-    return callFilter_.wants(call) && (!filtered_ || wanted_.contains(call.number));
+    return callFilter_.wants(call) && hasFrameWanted(call);
 }
 
 void Analysed::found(const calls::Finding& finding) {

@@ -44,6 +44,8 @@ class Analysed : public Consumer, protected calls::Listener {
     std::optional<bool> isWanted(const calls::Message& message, const calls::Call* call) const;
     // Whether a call that is alive may still be wanted by the filters on calls.
     bool mayBeWanted(const calls::Call& call) const { return callFilter_.wants(call.number).value_or(true); }
+    // Whether one of the frames that have come of it passes the filters on frames.
+    bool hasFrameWanted(const calls::Call& call) const { return !filtered_ || wanted_.contains(call.number); }
     // Is called for each finding that is wanted.
     virtual void report(const calls::Finding& /*finding*/) {}
     // Is called for each item, before the analysis takes it.

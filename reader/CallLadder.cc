@@ -98,6 +98,30 @@ std::vector<std::string> detailsOf(const CallLadder& ladder, const Rung& rung) {
     return details;
 }
 
+CallLadder together(std::vector<CallLadder> ladders, const std::vector<std::uint64_t>& calls) {
+    if (ladders.empty())
+        return {};
+    if (ladders.size() == 1)
+        return std::move(ladders.front());
+    CallLadder all;
+    all.us = ladders.front().us;
+    all.peer = ladders.front().peer;
+    std::set<std::pair<std::uint64_t, std::string>> linkRungs;
+    for (std::size_t i = 0; i < ladders.size(); ++i) {
+        all.headline.push_back("call " + std::to_string(calls[i]));
+        all.missing += ladders[i].missing;
+        for (Rung& rung : ladders[i].rungs) {
+            if (rung.kind == Rung::Kind::message)
+                rung.details.insert(rung.details.begin(), "call " + std::to_string(calls[i]));
+            else if (!linkRungs.emplace(rung.frame, rung.name).second)
+                continue;
+            all.rungs.push_back(std::move(rung));
+        }
+    }
+    putInOrder(all.rungs);
+    return all;
+}
+
 void Ladders::see(const Seen& seen) {
     if (seen.number != 0)
         number_ = seen.number;

@@ -53,6 +53,10 @@ std::string timeOfDay(Instant when, TimeText& times);
 // The details of a rung, and its terminal ("TEI 67") if the call has several.
 std::vector<std::string> detailsOf(const CallLadder& ladder, const Rung& rung);
 
+// Several calls as one ladder, in the order of their frames; each rung of a message says which call it is of.
+// `calls` are their numbers. One ladder alone stays as it is.
+CallLadder together(std::vector<CallLadder> ladders, const std::vector<std::uint64_t>& calls);
+
 // Collects the rungs of the calls that are alive, and the events of links. Memory is bounded.
 class Ladders {
   public:

@@ -11,15 +11,7 @@ namespace reader {
 namespace {
 
 using calls::Call;
-
-// A column of the line: its heading, its width, and the function that fills it in.
-struct LineColumn {
-    std::string_view heading;
-    std::string_view before;  // the word that names the value in a headline, which has no headings
-    unsigned width;
-    bool right;
-    void (*put)(std::string& to, const Call& call, TimeText& times);
-};
+using LineColumn = CallLineColumn;
 
 void putSeconds(std::string& to, const std::optional<std::int64_t>& nanoseconds) {
     if (nanoseconds)
@@ -106,6 +98,8 @@ void trimEnd(std::string& to, std::size_t start) {
 }
 
 }  // namespace
+
+std::span<const CallLineColumn> callLineColumns() { return columns; }
 
 std::string callHeading() {
     std::string heading;

@@ -2,6 +2,7 @@
 #ifndef READER_CALLLINE_H
 #define READER_CALLLINE_H
 
+#include <span>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -10,6 +11,17 @@
 #include "reader/TimeText.h"
 
 namespace reader {
+
+// A column of the line: its heading, its width, and the function that fills it in.
+struct CallLineColumn {
+    std::string_view heading;
+    std::string_view before;  // the word that names the value in a headline, which has no headings
+    unsigned width;           // 0: as long as the text is
+    bool right;               // blanks that fill it up stand in front
+    // Appends its text, which commands no terminal.
+    void (*put)(std::string& to, const calls::Call& call, TimeText& times);
+};
+std::span<const CallLineColumn> callLineColumns();
 
 // The heading above the lines.
 std::string callHeading();

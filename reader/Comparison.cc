@@ -259,31 +259,43 @@ ComparedMessage comparedMessage(const calls::Message& message, std::int64_t firs
     return compared;
 }
 
-Comparison compare(std::span<const ComparedMessage> a, std::span<const ComparedMessage> b,
-                   const CompareAlso& also) {
-    const bool byRole = knowsRoles(a) && knowsRoles(b);
-    Kinds kinds(byRole);
+std::vector<ComparedPair> pairsOf(std::span<const ComparedMessage> a, std::span<const ComparedMessage> b) {
+    Kinds kinds(knowsRoles(a) && knowsRoles(b));
     std::array<std::vector<Token>, 2> tokens;
     for (const ComparedMessage& message : a)
         tokens[0].push_back(kinds.tokenOf(message));
     for (const ComparedMessage& message : b)
         tokens[1].push_back(kinds.tokenOf(message));
-    const std::optional<std::vector<AlignedPair>> pairs = align(tokens[0], tokens[1]);
-    if (!pairs)
+    const std::optional<std::vector<AlignedPair>> aligned = align(tokens[0], tokens[1]);
+    if (!aligned)
         throw TooDifferent("the two differ in too many messages to be compared; filters choose some");
-    Comparer comparer(also, byRole);
+    std::vector<ComparedPair> pairs;
     std::size_t i = 0, j = 0;
     const auto upTo = [&](std::size_t endA, std::size_t endB) {
         for (; i < endA; ++i)
-            comparer.onlyInA(a[i]);
+            pairs.push_back({&a[i], nullptr});
         for (; j < endB; ++j)
-            comparer.onlyInB(b[j]);
+            pairs.push_back({nullptr, &b[j]});
     };
-    for (const AlignedPair& pair : *pairs) {
+    for (const AlignedPair& pair : *aligned) {
         upTo(pair.a, pair.b);
-        comparer.pair(a[i++], b[j++]);
+        pairs.push_back({&a[i++], &b[j++]});
     }
     upTo(a.size(), b.size());
+    return pairs;
+}
+
+Comparison compare(std::span<const ComparedMessage> a, std::span<const ComparedMessage> b,
+                   const CompareAlso& also) {
+    Comparer comparer(also, knowsRoles(a) && knowsRoles(b));
+    for (const ComparedPair& pair : pairsOf(a, b)) {
+        if (pair.b == nullptr)
+            comparer.onlyInA(*pair.a);
+        else if (pair.a == nullptr)
+            comparer.onlyInB(*pair.b);
+        else
+            comparer.pair(*pair.a, *pair.b);
+    }
     return std::move(comparer.result);
 }
 

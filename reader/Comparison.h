@@ -68,9 +68,17 @@ class TooDifferent : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
+// Messages that stand side by side; null: the other one has no counterpart.
+struct ComparedPair {
+    const ComparedMessage* a = nullptr;
+    const ComparedMessage* b = nullptr;
+};
+
 // Aligns the messages so that as many as possible stand beside one of their kind and direction, and of these
 // as many as possible beside an equal one. Directions are those of the roles if both series know them, else
 // those of the recorders. Throws TooDifferent.
+std::vector<ComparedPair> pairsOf(std::span<const ComparedMessage> a, std::span<const ComparedMessage> b);
+// The differences between messages that are paired so, and those that have no counterpart.
 Comparison compare(std::span<const ComparedMessage> a, std::span<const ComparedMessage> b,
                    const CompareAlso& also);
 

@@ -33,7 +33,7 @@ class Drawing {
   public:
     Drawing(std::string& to, const CallLadder& ladder, const LadderTextForm& form, TimeText& times)
         : to_(to), ladder_(ladder), times_(times), pen_(form.utf8 ? utf8 : ascii) {
-        const std::size_t width = std::max(form.width, LadderTextForm::leastWidth);
+        const std::size_t width = std::max(form.width, form.least);
         constexpr std::size_t beside = timeWidth + 1 + deltaWidth + 1 + 1 + arrowWidth + 1 + 2;
         width_ = width;
         isWide_ = width >= beside + leastForDetails;
@@ -45,14 +45,19 @@ class Drawing {
     void draw() {
         putHeadline();
         putSides();
-        for (std::size_t i = 0; i < ladder_.rungs.size(); ++i)
+        for (std::size_t i = 0; i < ladder_.rungs.size(); ++i) {
+            rungs_.push_back(to_.size());
             putRung(i);
+        }
         if (ladder_.missing != 0) {
             std::string words = "messages that are not shown, since there are too many: ";
             appendNumber(words, ladder_.missing);
             putLine(words);
         }
     }
+
+    // Where each rung begins in the text.
+    const std::vector<std::size_t>& rungs() const { return rungs_; }
 
   private:
     void putHeadline() {
@@ -175,6 +180,7 @@ class Drawing {
     std::size_t start_;    // columns in front of our life line
     std::size_t arrow_;    // columns between the life lines
     std::size_t details_;  // columns for details
+    std::vector<std::size_t> rungs_;
 };
 
 }  // namespace
@@ -211,6 +217,22 @@ std::vector<std::string> wrapped(const std::vector<std::string>& items, std::siz
 
 void appendLadder(std::string& to, const CallLadder& ladder, const LadderTextForm& form, TimeText& times) {
     Drawing(to, ladder, form, times).draw();
+}
+
+LadderLines ladderLines(const CallLadder& ladder, const LadderTextForm& form, TimeText& times) {
+    std::string text;
+    Drawing drawing(text, ladder, form, times);
+    drawing.draw();
+    LadderLines result;
+    std::size_t rung = 0;
+    for (std::size_t at = 0; at < text.size();) {
+        for (; rung < drawing.rungs().size() && drawing.rungs()[rung] == at; ++rung)
+            result.rungs.push_back(result.lines.size());
+        const std::size_t end = text.find('\n', at);
+        result.lines.push_back(text.substr(at, end - at));
+        at = end + 1;
+    }
+    return result;
 }
 
 }  // namespace reader

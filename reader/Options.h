@@ -2,6 +2,7 @@
 #ifndef READER_OPTIONS_H
 #define READER_OPTIONS_H
 
+#include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -88,6 +89,11 @@ struct LadderOptions {
     bool ascii = false;
 };
 
+struct BrowseOptions {
+    std::size_t frames = 1'000'000;  // that are kept
+    bool mouse = true;
+};
+
 struct RedactOptions {
     std::string key;  // the key's file; empty: a key that nobody keeps
     bool undo = false;
@@ -112,6 +118,7 @@ struct Options {
     bool failOnDifference = false;
     LadderOptions ladder;
     RedactOptions redact;
+    BrowseOptions browse;
 };
 
 }  // namespace reader

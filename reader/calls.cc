@@ -7,6 +7,7 @@
 #include "reader/Analysed.h"
 #include "reader/CallFields.h"
 #include "reader/CallLine.h"
+#include "reader/CallOrder.h"
 #include "reader/errors.h"
 #include "reader/session.h"
 #include "reader/text.h"
@@ -14,36 +15,6 @@
 namespace reader {
 
 namespace {
-
-// A key by which calls can be sorted.
-struct SortKey {
-    std::string_view name;
-    std::int64_t (*value)(const calls::Call& call);
-};
-constexpr SortKey sortKeys[] = {
-    {"start", [](const calls::Call& call) { return static_cast<std::int64_t>(call.number); }},
-    {"duration", [](const calls::Call& call) { return -call.duration.value_or(-1); }},
-    {"connect", [](const calls::Call& call) { return -call.connect.value_or(-1); }},
-    {"response", [](const calls::Call& call) { return -call.firstResponse.value_or(-1); }},
-    {"cause",
-     [](const calls::Call& call) { return call.cause ? std::int64_t{call.cause->value} : std::int64_t{0}; }},
-    {"channel",
-     [](const calls::Call& call) {
-         const auto& channel = call.channel();
-         return channel && channel->channels.any()
-                    ? static_cast<std::int64_t>(channel->channels._Find_first())
-                    : std::int64_t{-1};
-     }},
-};
-
-const SortKey& sortKeyNamed(const std::string& name) {
-    const auto* const found = std::find_if(std::begin(sortKeys), std::end(sortKeys),
-                                           [&](const SortKey& key) { return key.name == name; });
-    if (found == std::end(sortKeys))
-        throw UsageError("calls cannot be sorted by " + name +
-                         "; start, duration, connect, response, cause, channel");
-    return *found;
-}
 
 class CallPrinter : public Analysed {
   public:
@@ -61,9 +32,9 @@ class CallPrinter : public Analysed {
     void printSorted() {
         if (options_.calls.sort.empty())
             return;
-        const SortKey& key = sortKeyNamed(options_.calls.sort);
+        const CallOrder& order = callOrderNamed(options_.calls.sort);
         std::stable_sort(kept_.begin(), kept_.end(), [&](const calls::Call& a, const calls::Call& b) {
-            return std::pair(key.value(a), a.number) < std::pair(key.value(b), b.number);
+            return std::pair(order.value(a), a.number) < std::pair(order.value(b), b.number);
         });
         for (const calls::Call& call : kept_)
             print(call);
@@ -122,7 +93,7 @@ std::span<const OptionRow> callsOptions() {
          "of "
          "their end",
          [](Options& to, const std::string& value) {
-             sortKeyNamed(value);
+             callOrderNamed(value);
              to.calls.sort = value;
          }},
     };

@@ -4,6 +4,7 @@
 #include <optional>
 
 #include "reader/Analysed.h"
+#include "reader/FindingText.h"
 #include "reader/errors.h"
 #include "reader/json.h"
 #include "reader/session.h"
@@ -74,39 +75,10 @@ class FindingPrinter : public Analysed {
         if (colors_)
             text_ += colorOff;
         text_ += ' ';
-        putTime(finding);
-        text_ += " frame ";
-        appendNumber(text_, finding.frame);
-        if (finding.call) {
-            text_ += " call ";
-            appendNumber(text_, *finding.call);
-        }
-        text_ += ' ';
-        text_ += finding.kind->id;
-        text_ += ": ";
-        appendSafe(text_, finding.sentence);
-        if (finding.count > 1) {
-            text_ += " (";
-            appendNumber(text_, finding.count);
-            text_ += " times)";
-        }
+        appendHappening(text_, finding, times_);
         text_ += "\n        ";
-        text_ += finding.kind->meaning;
-        text_ += "; look at: ";
-        text_ += finding.kind->lookAt;
-        if (!finding.clause.empty()) {
-            text_ += " [";
-            text_ += finding.clause;
-            text_ += ']';
-        }
+        appendMeaning(text_, finding);
         text_ += '\n';
-    }
-
-    void putTime(const calls::Finding& finding) {
-        if (finding.clock == capture::Clock::none)
-            text_ += '-';
-        else
-            times_.append(text_, {finding.clock, finding.time});
     }
 
     void putKey(std::string_view key) {

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 
+#include "reader/browse/browse.h"
 #include "reader/calls.h"
 #include "reader/check.h"
 #include "reader/convert.h"
@@ -109,6 +110,14 @@ constexpr char redactExamples[] = R"(  lapdread redact lapdmon.log -o for-the-ca
       the numbers again, for whoever has the key
 )";
 
+constexpr char browseExamples[] = R"(  lapdread browse lapdmon.log
+      look around: calls, ladders, messages, findings
+  lapdread browse --follow lapdmon.log
+      the trunk as it runs
+  ssh host lapdread convert --follow --to pcapng /var/log/lapdmon.log - | lapdread browse -
+      the trunk of another machine
+)";
+
 const std::array table{
     Command{"list",
             "[FILE...]",
@@ -124,6 +133,12 @@ const std::array table{
             explainExamples,
             {"Octets", explainOptions()},
             runExplain},
+    Command{"browse",
+            "[FILE...]",
+            "screens to look around in: trunk, calls, ladders, messages, findings",
+            browseExamples,
+            {"Screens", browseOptions()},
+            runBrowse},
     Command{"calls", "[FILE...]", "a line a call", callsExamples, {"Calls", callsOptions()}, runCalls},
     Command{"ladder",
             "[FILE...]",

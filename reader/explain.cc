@@ -5,6 +5,7 @@
 
 #include "calls/standardVariant.h"
 #include "reader/Columns.h"
+#include "reader/Contents.h"
 #include "reader/TextConsumer.h"
 #include "reader/errors.h"
 #include "reader/session.h"
@@ -48,115 +49,83 @@ void endLine(std::string& text) {
     text += '\n';
 }
 
-}  // namespace
+// Puts rows into the text.
+class ExplainRows : public ContentsVisitor {
+  public:
+    // Positions count from `begin`.
+    ExplainRows(std::string& text, const std::uint8_t* begin, bool colors)
+        : text_(text), begin_(begin), colors_(colors) {}
 
-void ExplainComposer::putHeading(std::string& text, std::string_view words) {
-    if (colors_)
-        text += bold;
-    appendSafe(text, words);
-    if (colors_)
-        text += plain;
-    text += '\n';
-}
+    void heading(std::string_view words) override {
+        if (colors_)
+            text_ += bold;
+        appendSafe(text_, words);
+        if (colors_)
+            text_ += plain;
+        text_ += '\n';
+    }
+    void problem(isdn::Problem problem) override {
+        if (colors_)
+            text_ += red;
+        (text_ += "      ** ") += isdn::nameOf(problem);
+        if (colors_)
+            text_ += plain;
+        text_ += '\n';
+    }
+    void field(const isdn::Field& field) override;
 
-void ExplainComposer::putProblem(std::string& text, isdn::Problem problem) {
-    if (problem == isdn::Problem::none)
-        return;
-    if (colors_)
-        text += red;
-    (text += "      ** ") += isdn::nameOf(problem);
-    if (colors_)
-        text += plain;
-    text += '\n';
-}
+  private:
+    std::string& text_;
+    const std::uint8_t* begin_;
+    bool colors_;
+};
 
-void ExplainComposer::putRow(std::string& text, const isdn::Field& field) {
+void ExplainRows::field(const isdn::Field& field) {
     if (field.at.empty())
         return;
     const auto position = static_cast<std::size_t>(field.at.data() - begin_) + 1;
     const bool oneOctet = field.at.size() == 1;
-    appendPadded(text, number(position), positionWidth, true);
-    appendPadded(text, field.octet, octetWidth, true);
+    appendPadded(text_, number(position), positionWidth, true);
+    appendPadded(text_, field.octet, octetWidth, true);
     std::string hex;
     std::string bits;
     if (oneOctet) {
         appendHex(hex, field.at);
         appendBits(bits, field.at[0], field.high, field.low);
     }
-    appendPadded(text, hex, hexWidth);
-    appendPadded(text, bits, bitsWidth);
-    appendPadded(text, std::string(std::size_t{2} * field.depth, ' ') + std::string(field.name), nameWidth);
+    appendPadded(text_, hex, hexWidth);
+    appendPadded(text_, bits, bitsWidth);
+    appendPadded(text_, std::string(std::size_t{2} * field.depth, ' ') + std::string(field.name), nameWidth);
     const bool isNumber = field.kind != isdn::Field::Kind::text && field.at.size() <= sizeof field.value;
-    appendPadded(text, isNumber ? number(field.value) : "", valueWidth, true);
-    appendSafe(text, field.meaning);
+    appendPadded(text_, isNumber ? number(field.value) : "", valueWidth, true);
+    appendSafe(text_, field.meaning);
     if (!field.clause.empty()) {
-        text += text.back() == ' ' ? "(" : " (";
-        (text += field.clause) += ')';
+        text_ += text_.back() == ' ' ? "(" : " (";
+        (text_ += field.clause) += ')';
     }
-    endLine(text);
+    endLine(text_);
     for (std::size_t i = 0; i < field.at.size() && !oneOctet; i += octetsInLine) {
-        text.append(positionWidth + octetWidth + 2, ' ');
+        text_.append(positionWidth + octetWidth + 2, ' ');
         for (const std::uint8_t octet : field.at.subspan(i, std::min(octetsInLine, field.at.size() - i))) {
-            appendHex(text, std::span(&octet, 1));
-            text += ' ';
+            appendHex(text_, std::span(&octet, 1));
+            text_ += ' ';
         }
-        endLine(text);
+        endLine(text_);
     }
 }
 
-void ExplainComposer::putRows(std::string& text) {
-    for (const isdn::Field& field : fields_)
-        putRow(text, field);
-    fields_.clear();
-}
-
-void ExplainComposer::putElement(std::string& text, const isdn::Element& element, isdn::Variant variant) {
-    std::string heading(isdn::elementName(element, variant));
-    if (heading.empty())
-        heading = "unknown element";
-    if (element.codeset != 0)
-        heading += ", codeset " + number(element.codeset);
-    fields_.clear();
-    const isdn::Problem problem = isdn::fieldsOf(element, variant, fields_);
-    putHeading(text, heading);
-    putRows(text);
-    putProblem(text, problem);
-}
-
-void ExplainComposer::putMessage(std::string& text, const isdn::Layer3& message, isdn::Variant variant) {
-    putHeading(text,
-               message.hasType ? isdn::messageName(message) : isdn::protocolName(message.discriminator));
-    fields_.clear();
-    const isdn::Problem problem = isdn::fieldsOf(message, fields_);
-    putRows(text);
-    putProblem(text, problem);
-    for (const isdn::Element& element : message.elements)
-        putElement(text, element, variant);
-}
-
-void ExplainComposer::putContents(std::string& text, std::span<const std::uint8_t> octets,
-                                  isdn::Variant variant) {
-    begin_ = octets.data();
-    const isdn::Layer2 link = isdn::parseLayer2(octets);
-    fields_.clear();
-    const isdn::Problem problem = isdn::fieldsOf(link, fields_);
-    putHeading(text, isdn::nameOf(link.type));
-    putRows(text);
-    putProblem(text, problem);
-    if (link.carriesMessage())
-        putMessage(text, isdn::parseLayer3(link.information), variant);
-}
+}  // namespace
 
 void ExplainComposer::explainFrame(std::span<const std::uint8_t> octets, isdn::Variant variant,
-                                   std::string& text) {
-    putContents(text, octets, variant);
+                                   std::string& text) const {
+    ExplainRows rows(text, octets.data(), colors_);
+    visitFrame(octets, variant, rows);
 }
 
 void ExplainComposer::explainElement(std::span<const std::uint8_t> octets, isdn::Variant variant,
-                                     std::string& text) {
-    begin_ = octets.data();
-    for (const isdn::Element& element : isdn::Elements(octets))
-        putElement(text, element, variant);
+                                     std::string& text) const {
+    ExplainRows rows(text, octets.data(), colors_);
+    visitElements(isdn::Elements(octets), variant, rows);
 }
 
 void ExplainComposer::compose(const Seen& seen, std::string& text, Piece& /*piece*/) {
@@ -169,7 +138,7 @@ void ExplainComposer::compose(const Seen& seen, std::string& text, Piece& /*piec
     appendSafe(text, capture::toString(seen.frame().place));
     text += '\n';
     if (seen.isFrame()) {
-        putContents(text, seen.frame().octets, seen.variant);
+        explainFrame(seen.frame().octets, seen.variant, text);
     } else {
         appendEvent(text, *seen.item);
         text += '\n';

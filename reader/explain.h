@@ -23,22 +23,12 @@ class ExplainComposer : public Composer {
     void compose(const Seen& seen, std::string& text, Piece& piece) override;
 
     // Appends the rows of a frame that has no time and no direction.
-    void explainFrame(std::span<const std::uint8_t> octets, isdn::Variant variant, std::string& text);
-    void explainElement(std::span<const std::uint8_t> octets, isdn::Variant variant, std::string& text);
+    void explainFrame(std::span<const std::uint8_t> octets, isdn::Variant variant, std::string& text) const;
+    void explainElement(std::span<const std::uint8_t> octets, isdn::Variant variant, std::string& text) const;
 
   private:
-    void putRows(std::string& text);
-    void putRow(std::string& text, const isdn::Field& field);
-    void putElement(std::string& text, const isdn::Element& element, isdn::Variant variant);
-    void putMessage(std::string& text, const isdn::Layer3& message, isdn::Variant variant);
-    void putHeading(std::string& text, std::string_view words);
-    void putProblem(std::string& text, isdn::Problem problem);
-    void putContents(std::string& text, std::span<const std::uint8_t> octets, isdn::Variant variant);
-
     bool colors_;
     TimeText times_;
-    isdn::Fields fields_;
-    const std::uint8_t* begin_ = nullptr;  // the octet from which positions are counted
 };
 
 // Reads octets from hexadecimal digits. Blanks, colons, dashes and commas may separate parts, and each part

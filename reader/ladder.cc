@@ -10,6 +10,7 @@
 #include "reader/LadderMermaid.h"
 #include "reader/LadderSvg.h"
 #include "reader/LadderText.h"
+#include "reader/Locale.h"
 #include "reader/errors.h"
 #include "reader/text.h"
 
@@ -35,18 +36,6 @@ unsigned widthOf(const Options& options, const Output& out) {
     if (out.isTerminal() && ioctl(out.descriptor(), TIOCGWINSZ, &size) == 0 && size.ws_col != 0)
         return size.ws_col;
     return usualWidth;
-}
-
-// Whether the locale has UTF-8. The first of these variables that is set decides (POSIX, 8.2).
-bool localeHasUtf8() {
-    for (const char* const name : {"LC_ALL", "LC_CTYPE", "LANG"}) {
-        const char* const value = std::getenv(name);
-        if (value == nullptr || *value == '\0')
-            continue;
-        const std::string locale = plainName(value);
-        return locale.find("utf8") != std::string::npos;
-    }
-    return false;
 }
 
 class LadderPrinter : public Analysed {

@@ -43,8 +43,8 @@ install_packages() {
     rm -f "$log"
 }
 
-BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libjs-chart.js libnats-dev libpcap-dev libssl-dev libtomlplusplus-dev
-                nlohmann-json3-dev pkg-config)
+BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libjs-chart.js libnats-dev libncurses-dev libpcap-dev libssl-dev
+                libtomlplusplus-dev nlohmann-json3-dev pkg-config)
 CHECK_PACKAGES=(clang-format clang-tidy cppcheck)
 TEST_PACKAGES=(bash-completion chromium-headless-shell groff-base libgtest-dev libgmock-dev libbenchmark-dev man-db mandoc
                nats-server openssl python3 python3-jsonschema tmux tshark zsh)

@@ -1,0 +1,34 @@
+// What a frame consists of, part by part: headings, fields, and what is wrong.
+#ifndef READER_CONTENTS_H
+#define READER_CONTENTS_H
+
+#include <string>
+#include <string_view>
+
+#include "isdn/Field.h"
+
+namespace reader {
+
+class ContentsVisitor {
+  public:
+    ContentsVisitor() = default;
+    ContentsVisitor(const ContentsVisitor&) = delete;
+    ContentsVisitor& operator=(const ContentsVisitor&) = delete;
+    virtual ~ContentsVisitor() = default;
+
+    // The link header, the message or an element begins: "I", "SETUP", "CAUSE, codeset 5".
+    virtual void heading(std::string_view words) = 0;
+    // Valid during the call.
+    virtual void field(const isdn::Field& field) = 0;
+    // Of the part whose fields came before it.
+    virtual void problem(isdn::Problem problem) = 0;
+};
+
+// A frame from its address field on.
+void visitFrame(isdn::Octets octets, isdn::Variant variant, ContentsVisitor& visitor);
+// Elements, identifier first.
+void visitElements(const isdn::Elements& elements, isdn::Variant variant, ContentsVisitor& visitor);
+
+}  // namespace reader
+
+#endif

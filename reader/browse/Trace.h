@@ -1,0 +1,83 @@
+// What has been read so far, for the screens: items, calls, findings, trunks.
+#ifndef READER_BROWSE_TRACE_H
+#define READER_BROWSE_TRACE_H
+
+#include <cstdint>
+#include <deque>
+#include <map>
+#include <optional>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "reader/CallLadder.h"
+#include "reader/Comparison.h"
+#include "reader/browse/FrameStore.h"
+#include "reader/browse/Update.h"
+
+namespace reader::browse {
+
+// What an update has changed.
+struct Changes {
+    std::vector<std::uint64_t> calls{};  // new, or changed
+    std::vector<std::uint64_t> gone{};   // calls that are not there any more
+    bool findings = false;
+};
+
+// Memory is bounded by that of the frames: calls and findings go with their last frame. Used on one thread.
+class Trace {
+  public:
+    explicit Trace(std::size_t mostItems = FrameStore::usualMost) : frames_(mostItems) {}
+
+    Changes apply(Update update);
+
+    const FrameStore& frames() const { return frames_; }
+    // By number.
+    const std::map<std::uint64_t, calls::Call>& calls() const { return calls_; }
+    // Null if it is not known, or has gone.
+    const calls::Call* call(std::uint64_t number) const;
+    // The number of the call that a frame belongs to; 0 if it is of none.
+    std::uint64_t callOf(std::uint64_t frame) const;
+    // Of a call, in their order.
+    std::span<const CallFrame> framesOf(std::uint64_t call) const;
+    // In the order in which they were certain, each with a number that counts from 0.
+    const std::deque<calls::Finding>& findings() const { return findings_; }
+    std::uint64_t firstFinding() const { return firstFinding_; }
+    const std::vector<TrunkView>& trunks() const { return trunks_; }
+
+    Update::State state() const { return state_; }
+    const std::string& error() const { return error_; }
+    std::uint64_t callsDropped() const { return callsDropped_; }
+
+    // The call as a ladder, as far as its frames are kept.
+    CallLadder ladderOf(const calls::Call& call, TimeText& times) const;
+    // Its messages as the other side has accepted them.
+    std::vector<ComparedMessage> messagesOf(const calls::Call& call) const;
+    // A message alone; nothing of a frame that carries none.
+    std::optional<ComparedMessage> messageOf(std::uint64_t frame) const;
+
+    // Findings that are kept at most, and frames of one call that are known.
+    static constexpr std::size_t mostFindings = 100'000;
+    static constexpr std::size_t mostFramesOfCall = 65'536;
+
+  private:
+    void takeFrame(const CallFrame& frame);
+    std::vector<CallFrame> framesForLadder(const calls::Call& call) const;
+    void prune(Changes& changes);
+
+    FrameStore frames_;
+    std::map<std::uint64_t, calls::Call> calls_;
+    // By number of the call; also of calls that are not shown yet.
+    std::map<std::uint64_t, std::vector<CallFrame>> framesOf_;
+    std::deque<CallFrame> ofCalls_;  // the same in the order of the input, with RESTARTs
+    std::deque<calls::Finding> findings_;
+    std::uint64_t firstFinding_ = 0;
+    std::vector<TrunkView> trunks_;
+    Update::State state_ = Update::State::reading;
+    std::string error_;
+    std::uint64_t callsDropped_ = 0;
+};
+
+}  // namespace reader::browse
+
+#endif
