@@ -9,6 +9,8 @@ import jsonschema
 from lapdread_harness import EXAMPLES, RECORDED, SOURCE, output
 
 SCHEMA = json.loads((SOURCE / "docs/user/jsonl.schema.json").read_text())
+RESULTS = json.loads((SOURCE / "docs/user/results.schema.json").read_text())
+NIGHT = sorted((SOURCE / "tests/reader/data/night").glob("*.hex"))
 
 
 def lines(path, *words):
@@ -29,6 +31,30 @@ class JsonLines(unittest.TestCase):
         sound = lines(EXAMPLES["net5"], "--message", "SETUP")[0]
         wrong = [{"frame": "RRR"}, {"hex": "0"}, {"tei": 128}, {"v": 2}, {"time": "noon"}, {"something": 1}]
         for change in wrong:
+            self.assertFalse(validator.is_valid({**sound, **change}), change)
+
+    def test_every_line_of_results_fits_their_schema(self):
+        jsonschema.Draft7Validator.check_schema(RESULTS)
+        validator = jsonschema.Draft7Validator(RESULTS)
+        commands = [[command, "--jsonl", "--quiet", path] for path in [*EXAMPLES.values(), *RECORDED, *NIGHT]
+                    for command in ("calls", "check")]
+        commands += [["stats", "--over-time", "--jsonl", "--quiet", path] for path in [*EXAMPLES.values(), *RECORDED]]
+        commands += [["diff", "--jsonl", "--quiet", EXAMPLES["net5"], EXAMPLES["ni2"]]]
+        seen = set()
+        for command in commands:
+            for text in output(*command).splitlines():
+                line = json.loads(text)
+                seen.add(line.get("table") or next(key for key in ("finding", "difference", "call") if key in line))
+                errors = [error.message for error in validator.iter_errors(line)]
+                self.assertEqual(errors, [], f"{command}: {line}")
+        known = {form["properties"].get("table", {}).get("const") or form["title"].split()[-1] for form in RESULTS["oneOf"]}
+        self.assertEqual(seen, known)
+
+    def test_the_schema_of_results_finds_what_does_not_fit(self):
+        validator = jsonschema.Draft7Validator(RESULTS)
+        sound = json.loads(output("calls", "--jsonl", EXAMPLES["net5"]).splitlines()[0])
+        self.assertTrue(validator.is_valid(sound))
+        for change in ({"outcome": "good"}, {"call": 0}, {"callref": "xyz"}, {"more": 1}, {"table": "messages"}):
             self.assertFalse(validator.is_valid({**sound, **change}), change)
 
     def test_the_octets_of_a_message_are_those_of_its_elements(self):
