@@ -46,6 +46,7 @@ class RecordedTrunk {
 
     bool readsFrom(std::string_view file) const { return source_ == file; }
     std::uint64_t lostInAll() const { return file_.lostInAll(); }
+    std::uint64_t lostUnsaid() const { return file_.lostUnsaid(); }
 
     // How often a state that changes all the time is written: each second, or as a test sets it.
     void writeStateEvery(std::chrono::steady_clock::duration time) { betweenStates_ = time; }

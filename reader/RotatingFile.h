@@ -54,6 +54,8 @@ class RotatingFile {
     void finish();
 
     std::uint64_t lostInAll() const { return lostInAll_; }
+    // Of those, how many the user has not been told of.
+    std::uint64_t lostUnsaid() const { return unsaid_; }
     // The finished name of the newest file, without its folder, and how many have been begun; empty before
     // the first one.
     const std::string& newest() const { return newest_; }

@@ -98,7 +98,7 @@ constexpr OptionRow filterRowsBesides[] = {
 
 // These options decide which call a frame belongs to, so filters on calls need them as well.
 constexpr OptionRow callRows[] = {
-    {"--timer", "NAME=TIME", "Another value of a timer: T305=4s, T316=500ms",
+    {"--timer", "NAME=TIME", "Another value of a timer: T305=4s, T316=500ms, T301=3min; a number alone is seconds",
      [](Options& to, const std::string& value) {
          try {
              calls::setTimer(to.calls.timers, value);

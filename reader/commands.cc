@@ -178,7 +178,7 @@ const std::array table{
             runConvert},
     Command{"record",
             "[FILE...]",
-            "files that begin anew by size or time, of what is followed",
+            "files that begin anew by size or time; follows its input, and ends by a signal",
             recordExamples,
             {"Files", recordOptions()},
             runRecord},

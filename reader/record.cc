@@ -72,15 +72,20 @@ class Recorder : public Consumer {
             trunk.flush();
     }
 
-    // Returns how many frames could not be written.
-    std::uint64_t finish() {
+    // Tells of each frame that was lost, unless that was done when writing worked again. Returns false if any
+    // was lost.
+    bool finish() {
         roles_.giveUp([&](const capture::Item& item) { record(item); });
         std::uint64_t lost = 0;
+        std::uint64_t unsaid = 0;
         for (auto& [name, trunk] : trunks_) {
             trunk.finish();
             lost += trunk.lostInAll();
+            unsaid += trunk.lostUnsaid();
         }
-        return lost;
+        if (unsaid != 0)
+            chatter_.error("frames lost because they could not be written: " + std::to_string(unsaid));
+        return lost == 0;
     }
 
   private:
@@ -180,7 +185,7 @@ std::span<const OptionRow> recordOptions() {
     static constexpr OptionRow rows[] = {
         {"--to", "pcapng|log|pcap|hex", "The form to record in (default: pcapng)",
          [](Options& to, const std::string& value) { to.form = formNamed(value).name; }},
-        {"--folder", "DIR", "Where the files are (default: the current folder)",
+        {"--folder", "DIR", "Where the files are (default: the current folder); it must exist",
          [](Options& to, const std::string& value) { to.record.folder = value; }},
         {"--size", "SIZE", "Finish a file of this size: 500k, 100M, 2G",
          [](Options& to, const std::string& value) { to.record.size = readSize(value); }},
@@ -244,9 +249,7 @@ int runRecord(const Options& given, Chatter& chatter) {
         recorder.finish();
         throw;
     }
-    if (const std::uint64_t lost = recorder.finish(); lost != 0)
-        throw FileError("frames lost because they could not be written: " + std::to_string(lost));
-    return good;
+    return recorder.finish() ? good : cannotRead;
 }
 
 }  // namespace reader
