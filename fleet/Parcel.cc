@@ -333,4 +333,15 @@ Parcel parcelIn(std::string_view text) {
     return parcelFrom(all);
 }
 
+std::string toText(const std::vector<ParcelItem>& notes) {
+    return toJson(notes).dump(-1, ' ', false, json::error_handler_t::replace);
+}
+
+std::vector<ParcelItem> notesInText(std::string_view text) {
+    const json list = json::parse(text, nullptr, false);
+    if (!list.is_array())
+        throw BadParcel("no list of what the recorder said");
+    return notesIn(list);
+}
+
 }  // namespace fleet

@@ -43,11 +43,11 @@ install_packages() {
     rm -f "$log"
 }
 
-BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libjs-chart.js libnats-dev libncurses-dev libpcap-dev libssl-dev
+BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libjs-chart.js libnats-dev libncurses-dev libpcap-dev libpqxx-dev libssl-dev
                 libtomlplusplus-dev nlohmann-json3-dev pkg-config)
 CHECK_PACKAGES=(clang-format clang-tidy cppcheck)
 TEST_PACKAGES=(bash-completion chromium-headless-shell groff-base libgtest-dev libgmock-dev libbenchmark-dev man-db mandoc
-               nats-server openssl python3 python3-jsonschema tmux tshark zsh)
+               nats-server openssl postgresql python3 python3-jsonschema tmux tshark zsh)
 PACKAGE_PACKAGES=(dpkg-dev gzip lintian)
 
 # build_preset PRESET [OPTION...] [--target NAME]: configures a preset, and builds it or the target. Shows the compiler's

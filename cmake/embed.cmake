@@ -1,0 +1,10 @@
+# Makes rows of C++ of numbered files: {1, "001_tables", R"...(contents)..."},. Called as a script with FILES and OUT.
+set(rows)
+foreach(file ${FILES})
+    cmake_path(GET file STEM name)
+    string(REGEX MATCH "^0*([0-9]+)_" matched ${name})
+    set(number ${CMAKE_MATCH_1})
+    file(READ ${file} text)
+    string(APPEND rows "{${number}, \"${name}\", R\"---(${text})---\"},\n")
+endforeach()
+file(WRITE ${OUT} "${rows}")
