@@ -33,6 +33,8 @@ struct InputOptions {
     bool follow = false;
     bool merge = false;
     std::string trunk;  // the D channel's name; empty: as the input has it
+    std::string store;  // the URL of a fleet's store that is read instead of files; `trunk` chooses there
+    std::vector<std::string> sites;  // of the store; empty: all
     capture::Role role = capture::Role::unknown;
     capture::Variant variant = capture::Variant::unknown;
     std::string zone;

@@ -56,6 +56,10 @@ class TimePoint {
     // The point on the clock of a stream whose first frame has the time `first`. Nothing if that is unknown,
     // as for a date and a stream of relative times.
     std::optional<std::int64_t> on(Instant first) const;
+    // Nanoseconds since 1970; nothing of a time that the first frame decides.
+    std::optional<std::int64_t> absolute() const {
+        return kind_ == Kind::absolute ? std::optional(nanoseconds_) : std::nullopt;
+    }
 
   private:
     enum class Kind { absolute, timeOfDay, sinceFirst };

@@ -55,8 +55,15 @@ constexpr OptionRow inputRows[] = {
      [](Options& to, const std::string&) { to.input.follow = true; }},
     {"--merge", "", "Put the frames of several files in the order of their times",
      [](Options& to, const std::string&) { to.input.merge = true; }},
-    {"--trunk", "NAME", "The name of the D channel, instead of the one that the file tells",
+    {"--trunk", "NAME", "The name of the D channel, instead of the one that the file tells. With --store: only this one, or these (A,B)",
      [](Options& to, const std::string& value) { to.input.trunk = value; }},
+    {"--store", "URL", "Read the frames of a fleet's store instead of files: postgresql://USER@HOST/lapd",
+     [](Options& to, const std::string& value) { to.input.store = value; }},
+    {"--site", "A,B", "With --store: only D channels of these sites",
+     [](Options& to, const std::string& value) {
+         for (const std::string& site : splitAtCommas(value))
+             to.input.sites.push_back(site);
+     }},
     {"--role", "user|network", "Which side of the link ours is, instead of what the frames tell",
      [](Options& to, const std::string& value) {
          to.input.role = chosen<capture::Role>(value, {{"user", capture::Role::user}, {"network", capture::Role::network}});

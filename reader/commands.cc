@@ -157,7 +157,8 @@ const std::array table{
             "what differs between two calls, or two traces, down to the field",
             diffExamples,
             {"Comparison", diffOptions()},
-            runDiff},
+            runDiff,
+            true},
     Command{"stats",
             "[FILE...]",
             "figures: messages, causes, times, calls by direction and hour, channels",
@@ -181,13 +182,15 @@ const std::array table{
             "files that begin anew by size or time; follows its input, and ends by a signal",
             recordExamples,
             {"Files", recordOptions()},
-            runRecord},
+            runRecord,
+            true},
     Command{"redact",
             "[FILE...]",
             "frames without what names a person, in files that may be sent to others",
             redactExamples,
             {"Redaction", redactOptions()},
-            runRedact},
+            runRedact,
+            true},
 };
 
 }  // namespace

@@ -19,6 +19,7 @@ struct Command {
     OptionGroup options;        // the options that not every command has
     // Returns the exit status; throws UsageError, FileError or ReaderGone.
     int (*run)(const Options&, Chatter&);
+    bool takesFilesAlone = false;  // and no store
 };
 
 // All commands, in the order in which --help shows them. The first is run if the command line names none.

@@ -5,11 +5,15 @@
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
+#include <limits>
+#include <optional>
 
 #include "capture/open.h"
+#include "fleet/query/Store.h"
 #include "lapdlog/log.h"
 #include "reader/Joined.h"
 #include "reader/errors.h"
+#include "reader/text.h"
 
 namespace reader {
 
@@ -18,6 +22,48 @@ namespace {
 void checkReadable(const std::string& file) {
     if (file != "-" && access(file.c_str(), R_OK) != 0)
         throw FileError("cannot read " + file + ": " + std::strerror(errno));
+}
+
+// The widest of the times that the filters let through, for the store to read no more than that. Filters on
+// call numbers and the like are left to the filters themselves.
+void boundTimes(const std::vector<FilterWord>& filters, fleet::StoreQuery& query) {
+    constexpr std::int64_t never = std::numeric_limits<std::int64_t>::max();
+    std::int64_t since = never, until = -never;
+    for (const FilterWord& word : filters) {
+        if (word.negated || (word.name != "since" && word.name != "until"))
+            continue;
+        for (const std::string& value : splitAtCommas(word.value)) {
+            const std::optional<std::int64_t> at = TimePoint(value).absolute();
+            if (word.name == "since")
+                since = std::min(since, at.value_or(-never));
+            else
+                until = std::max(until, at.value_or(never));
+        }
+    }
+    if (since != never && since != -never)
+        query.since = since;
+    if (until != never && until != -never)
+        query.until = until;
+}
+
+std::unique_ptr<capture::Reader> openStore(const Options& options) {
+    const InputOptions& input = options.input;
+    if (!input.files.empty() || !options.words.empty())
+        throw UsageError("--store takes the place of files: " +
+                         (input.files.empty() ? options.words : input.files).front());
+    if (input.follow)
+        throw UsageError("--follow takes a file; a store is read as it is now");
+    fleet::StoreQuery query;
+    query.url = input.store;
+    query.sites = input.sites;
+    if (!input.trunk.empty())
+        query.trunks = splitAtCommas(input.trunk);
+    boundTimes(options.filters, query);
+    const auto store = std::make_shared<fleet::Store>(query);
+    std::vector<Opener> openers;
+    for (const fleet::Store::Trunk& trunk : store->trunks())
+        openers.emplace_back([store, &trunk] { return store->read(trunk); });
+    return std::make_unique<Merge>(openers);
 }
 
 }  // namespace
@@ -36,6 +82,8 @@ std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOp
 }
 
 std::vector<std::string> inputFiles(const Options& options) {
+    if (!options.input.store.empty())
+        return {};
     std::vector<std::string> files = options.input.files;
     files.insert(files.end(), options.words.begin(), options.words.end());
     if (files.empty() && isatty(STDIN_FILENO) == 1)
@@ -47,8 +95,12 @@ std::vector<std::string> inputFiles(const Options& options) {
 }
 
 std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*chatter*/) {
+    if (!options.input.store.empty())
+        return openStore(options);
     const std::vector<std::string> files = inputFiles(options);
     const InputOptions& input = options.input;
+    if (!input.sites.empty())
+        throw UsageError("--site chooses among the trunks of a store: name it with --store URL");
     if (input.follow && files.size() > 1 && !input.merge)
         throw UsageError("--follow takes one input, or several with --merge");
     std::vector<Opener> openers;

@@ -20,6 +20,8 @@ int run(const std::vector<std::string>& words) {
         out.flush();
         return good;
     }
+    if (line.command->takesFilesAlone && !line.options.input.store.empty())
+        throw UsageError(std::string(line.command->name) + " takes files; --store is for other commands");
     if (!line.options.input.zone.empty())
         useTimeZone(line.options.input.zone);
     Chatter chatter(line.options.loudness);
