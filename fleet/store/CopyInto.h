@@ -30,7 +30,8 @@ struct StagedTable {
 template <std::size_t width>
 void StagedTable<width>::prepare(pqxx::connection_base& connection) const {
     pqxx::work work(connection);
-    work.exec0("CREATE TEMPORARY TABLE new_" + name + " (LIKE lapd." + name +
+    work.exec0("SET LOCAL client_min_messages = warning");
+    work.exec0("CREATE TEMPORARY TABLE IF NOT EXISTS new_" + name + " (LIKE lapd." + name +
                " INCLUDING DEFAULTS) ON COMMIT DELETE ROWS");
     work.commit();
 }

@@ -1,0 +1,54 @@
+#include "fleet/store/NatsInbox.h"
+
+#include <array>
+#include <string>
+#include <utility>
+
+#include "fleet/streams.h"
+#include "fleet/subjects.h"
+
+namespace fleet {
+
+namespace {
+
+ConsumerRules rulesOf(unsigned partition) {
+    ConsumerRules rules;
+    rules.stream = centreStream;
+    rules.durable = "lapdstore-" + std::to_string(partition);
+    rules.filter = subjectsOf(partition);
+    return rules;
+}
+
+}  // namespace
+
+NatsInbox::NatsInbox(NatsConnection& connection, unsigned partition)
+    : connection_(connection), consumer_(connection, rulesOf(partition)) {}
+
+std::vector<Letter> NatsInbox::fetch(std::size_t most, std::chrono::milliseconds wait) {
+    if (held_.empty())
+        held_ = consumer_.fetch(most, wait);
+    std::vector<Letter> letters;
+    letters.reserve(held_.size());
+    for (const NatsMessage& message : held_)
+        letters.push_back({std::string(message.subject()), std::string(message.text()), message.sequence()});
+    return letters;
+}
+
+void NatsInbox::bury(const DeadLetter& dead) {
+    const std::array<std::pair<std::string, std::string>, 1> reason{{{"Lapd-Reason", dead.reason}}};
+    connection_.publish(deadSubjectOf(dead.letter.subject), dead.letter.text,
+                        "dead/" + std::to_string(dead.letter.sequence), reason);
+}
+
+// The server confirms the last one, and so has taken all of them: the connection keeps their order.
+void NatsInbox::acknowledge() {
+    for (std::size_t i = 0; i < held_.size(); ++i) {
+        if (i + 1 < held_.size())
+            held_[i].acknowledgeLater();
+        else
+            held_[i].acknowledge();
+    }
+    held_.clear();
+}
+
+}  // namespace fleet

@@ -1,0 +1,48 @@
+// The command line of lapdstore.
+#ifndef FLEET_STORE_COMMAND_LINE_H
+#define FLEET_STORE_COMMAND_LINE_H
+
+#include <functional>
+#include <stdexcept>
+#include <string>
+
+#include "fleet/Nats.h"
+
+namespace CLI {
+class App;
+}
+
+namespace fleet {
+
+// A command line that cannot be obeyed.
+class BadStoreCommand : public std::runtime_error {
+  public:
+    using std::runtime_error::runtime_error;
+};
+
+struct StoreCommand {
+    enum class What : std::uint8_t {
+        run,      // until a signal ends it
+        migrate,  // makes the tables, or brings them up to date
+        forget    // what is older than `days`
+    };
+
+    std::string told;  // help or version: print it and end
+    What what = What::run;
+    std::string database;
+    NatsOptions nats;
+    unsigned threads = 2;
+    unsigned firstPartition = 0;
+    unsigned lastPartition = 63;
+    unsigned days = 0;
+};
+
+// Throws BadStoreCommand.
+StoreCommand parseStoreCommand(int argc, const char* const* argv);
+
+// For manual pages and completion: the parser as it describes itself.
+void showStoreDescription(const std::function<void(const CLI::App&)>& visit);
+
+}  // namespace fleet
+
+#endif
