@@ -12,15 +12,15 @@
 
 namespace reader {
 
-// The names of the inputs; none if a store is read instead. If none is given, that is only "-", the standard input. Throws UsageError if none
-// is given and the standard input is a terminal.
+// The names of the inputs; none if a store is read instead. If none is given, that is only "-", the standard
+// input. Throws UsageError if none is given and the standard input is a terminal.
 std::vector<std::string> inputFiles(const Options& options);
 
 // Opens one input of any form that this program reads.
 std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOptions& input);
 
-// Opens all inputs as one stream: one after another, or in the order of time with --merge. The D channels of a
-// store come in the order of time. Throws FileError or capture::BadInput, before anything is read, if one
+// Opens all inputs as one stream: one after another, or in the order of time with --merge. The D channels of
+// a store come in the order of time. Throws FileError or capture::BadInput, before anything is read, if one
 // cannot be opened or its form is not known.
 std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& chatter);
 

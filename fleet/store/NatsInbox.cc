@@ -11,18 +11,19 @@ namespace fleet {
 
 namespace {
 
-ConsumerRules rulesOf(unsigned partition) {
+ConsumerRules rulesOf(unsigned partition, std::chrono::seconds againAfter) {
     ConsumerRules rules;
     rules.stream = centreStream;
     rules.durable = "lapdstore-" + std::to_string(partition);
     rules.filter = subjectsOf(partition);
+    rules.forAcknowledging = againAfter;
     return rules;
 }
 
 }  // namespace
 
-NatsInbox::NatsInbox(NatsConnection& connection, unsigned partition)
-    : connection_(connection), consumer_(connection, rulesOf(partition)) {}
+NatsInbox::NatsInbox(NatsConnection& connection, unsigned partition, std::chrono::seconds againAfter)
+    : connection_(connection), consumer_(connection, rulesOf(partition, againAfter)) {}
 
 std::vector<Letter> NatsInbox::fetch(std::size_t most, std::chrono::milliseconds wait) {
     if (held_.empty())

@@ -13,7 +13,7 @@ namespace fleet {
 // are given again by the next fetch. Throws NatsError. The connection outlives it.
 class NatsInbox : public Inbox {
   public:
-    NatsInbox(NatsConnection& connection, unsigned partition);
+    NatsInbox(NatsConnection& connection, unsigned partition, std::chrono::seconds againAfter);
 
     std::vector<Letter> fetch(std::size_t most, std::chrono::milliseconds wait) override;
     void bury(const DeadLetter& dead) override;

@@ -114,7 +114,7 @@ void Partition::forget() {
 
 std::vector<DeadLetter> Partition::bury(const Letter& letter, const std::exception& error) {
     const std::string reason = "the database does not take it: " + std::string(error.what());
-    const std::vector<DeadLetter> dead{{letter, printable(reason, longestReason)}};
+    std::vector<DeadLetter> dead{{letter, printable(reason, longestReason)}};
     Work work(connection_);
     writePlace(work, {&letter, 1}, dead);
     work.transaction.commit();

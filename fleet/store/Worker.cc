@@ -47,8 +47,9 @@ class Shift {
 
   private:
     struct Held {
-        Held(pqxx::connection_base& database, NatsConnection& nats, unsigned number)
-            : lease(database, number), inbox(nats, number), partition(database, number) {}
+        Held(pqxx::connection_base& database, NatsConnection& nats, unsigned number,
+             std::chrono::seconds againAfter)
+            : lease(database, number), inbox(nats, number, againAfter), partition(database, number) {}
         Lease lease;
         NatsInbox inbox;
         Partition partition;
@@ -66,7 +67,7 @@ class Shift {
         for (const unsigned number : options_.partitions) {
             if (held_.contains(number) || !Lease(database_, number).isHeld())
                 continue;
-            auto held = std::make_unique<Held>(database_, nats_, number);
+            auto held = std::make_unique<Held>(database_, nats_, number, options_.againAfter);
             if (!held->lease.isHeld())
                 continue;
             held_[number] = std::move(held);
@@ -98,8 +99,7 @@ void work(const WorkerOptions& options, const std::atomic<bool>& stopped, const 
             if (why != saidLast)
                 say(why);
             saidLast = why;
-            if (!stopped)
-                std::this_thread::sleep_for(beforeBeginningAnew);
+            std::this_thread::sleep_for(beforeBeginningAnew);
         }
     }
 }

@@ -3,6 +3,7 @@
 #define FLEET_STORE_WORKER_H
 
 #include <atomic>
+#include <chrono>
 #include <functional>
 #include <string>
 #include <vector>
@@ -15,6 +16,7 @@ struct WorkerOptions {
     std::string database;  // a URL for libpq
     NatsOptions nats;
     std::vector<unsigned> partitions;  // those that this thread looks after, as far as it can lease them
+    std::chrono::seconds againAfter;   // what a dead lapdstore has fetched comes again after this time
 };
 
 // Says a line about what went wrong or went well. Called on the worker's thread.

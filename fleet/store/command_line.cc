@@ -45,6 +45,11 @@ Commands describe(CLI::App& app, StoreCommand& to) {
     app.add_option("--last", to.lastPartition, "... up to this one (default: 63)")
         ->type_name("N")
         ->check(CLI::Range(0U, partitions - 1).description(""));
+    app.add_option("--again-after", to.againAfter,
+                   "What a lapdstore that died had fetched comes again after so many seconds, 1 to 3600 "
+                   "(default: 30)")
+        ->type_name("N")
+        ->check(CLI::Range(1, 3600).description(""));
     Commands commands;
     commands.migrate = app.add_subcommand("migrate", "Makes the tables, or brings them up to date, and ends");
     commands.forget = app.add_subcommand("forget", "Forgets what is older than some days, and ends");

@@ -62,6 +62,7 @@ void run(const fleet::StoreCommand& command) {
         share.database = command.database;
         share.nats = command.nats;
         share.nats.name = "lapdstore";
+        share.againAfter = std::chrono::seconds(command.againAfter);
         if (!share.partitions.empty())
             threads.emplace_back([&share] { fleet::work(share, stopped, say); });
     }

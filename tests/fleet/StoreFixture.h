@@ -58,11 +58,11 @@ class StoreTest : public testing::Test {
     // What came of the frames. The numbers of trunks depend on how often their rows were tried.
     std::string everything() const {
         std::string all;
-        for (const std::string table :
-             {"trunks t ORDER BY trunk", "runs t ORDER BY trunk, run", "frames t ORDER BY trunk, run, number",
-              "calls t ORDER BY trunk, run, first_frame",
-              "findings t ORDER BY trunk, run, frame, kind, ordinal", "gaps t ORDER BY trunk, run, first"})
-            all += rows("SELECT to_jsonb(t) - 'trunk' FROM lapd." + table);
+        for (const std::string table : {"trunks", "runs", "frames", "calls", "findings", "gaps"})
+            all += rows(
+                "SELECT to_jsonb(t) - 'trunk' || (SELECT jsonb_build_object('of', o.site) FROM lapd.trunks o "
+                "WHERE o.trunk = t.trunk) FROM lapd." +
+                table + " t ORDER BY 1");
         return all;
     }
     void empty() const {

@@ -1,0 +1,217 @@
+// lapdstore itself, between a NATS server and PostgreSQL.
+#include <fcntl.h>
+#include <sys/prctl.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <csignal>
+#include <thread>
+
+#include "NatsServer.h"
+#include "StoreFixture.h"
+#include "fleet/NatsConsumer.h"
+#include "fleet/NatsPublisher.h"
+#include "fleet/store/Worker.h"
+#include "fleet/streams.h"
+
+namespace fleet {
+
+namespace {
+
+using namespace std::chrono_literals;
+using fleet_tests::NatsServer;
+
+const std::string source = LAPDMON_SOURCE_DIR;
+constexpr auto longEnough = 100s;  // ends a test that would wait for ever
+
+// A lapdstore that is killed at the latest with this object.
+class Process {
+  public:
+    explicit Process(std::vector<std::string> words) {
+        process_ = fork();
+        if (process_ != 0)
+            return;
+        prctl(PR_SET_PDEATHSIG, SIGKILL);
+        words.insert(words.begin(), std::getenv("LAPDSTORE"));
+        std::vector<char*> arguments;
+        for (std::string& word : words)
+            arguments.push_back(word.data());
+        arguments.push_back(nullptr);
+        execv(arguments[0], arguments.data());
+        _exit(127);
+    }
+    ~Process() {
+        if (process_ > 0)
+            end(SIGKILL);
+    }
+    Process(const Process&) = delete;
+    Process& operator=(const Process&) = delete;
+
+    // Returns its exit status; -1 if a signal ended it.
+    int end(int signal) {
+        kill(process_, signal);
+        int status = 0;
+        waitpid(process_, &status, 0);
+        process_ = -1;
+        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    }
+
+  private:
+    pid_t process_ = -1;
+};
+
+class Lapdstore : public StoreTest {
+  protected:
+    Lapdstore() : connection(server.options()), publisher(connection) {
+        StreamRules rules;
+        rules.name = centreStream;
+        rules.subjects = {everySubject};
+        makeStream(connection, rules);
+        rules.name = deadStream;
+        rules.subjects = {everyDeadSubject};
+        makeStream(connection, rules);
+    }
+
+    void publish(const std::vector<Parcel>& parcels) {
+        for (const Parcel& parcel : parcels)
+            connection.publish(toText(parcel.subject()), toText(parcel), "");
+    }
+    std::vector<std::string> words() const {
+        return {"--database", url(), "--nats", server.options().servers.front(), "--again-after", "2"};
+    }
+    void await(const std::string& select, const std::string& expected) const {
+        const auto end = std::chrono::steady_clock::now() + longEnough;
+        while (rows(select) != expected) {
+            ASSERT_LT(std::chrono::steady_clock::now(), end) << select << ": " << rows(select);
+            std::this_thread::sleep_for(10ms);
+        }
+    }
+
+    NatsServer server;
+    NatsConnection connection;
+    NatsPublisher publisher;
+};
+
+std::vector<std::string> examples() { return {"4ess", "5ess", "dms100", "ntt", "net5", "ni2"}; }
+
+}  // namespace
+
+TEST_F(Lapdstore, StoresEachFrameOnceThoughItIsKilledAgainAndAgain) {
+    std::vector<std::vector<Parcel>> trunks;
+    for (const std::string& name : examples())
+        trunks.push_back(parcelsOf(source + "/examples/" + name + ".pcap", 3, true, "site-" + name));
+    for (const std::vector<Parcel>& parcels : trunks) {
+        pqxx::connection database(url());
+        Partition partition(database, parcels.front().subject().partition);
+        for (const Parcel& parcel : parcels) {
+            const Letter letter{toText(parcel.subject()), toText(parcel), 1};
+            partition.take({&letter, 1});
+        }
+    }
+    const std::string undisturbed = everything();
+    const std::string frames = rows("SELECT count(*) FROM lapd.frames");
+    empty();
+
+    auto first = std::make_unique<Process>(words());
+    auto second = std::make_unique<Process>(words());
+    std::size_t parcels = 0;
+    for (std::size_t i = 0; i < 60; ++i) {
+        for (const std::vector<Parcel>& trunk : trunks) {
+            if (i < trunk.size())
+                publish({trunk[i], trunk[i / 2]});
+        }
+        parcels += 2;
+        // Each time something is being written; whoever is killed is killed in the middle of it.
+        if (i % 15 == 7)
+            first = std::make_unique<Process>(words());
+        if (i % 15 == 14)
+            second = std::make_unique<Process>(words());
+    }
+    ASSERT_GT(parcels, 0U);
+    await("SELECT count(*) FROM lapd.runs WHERE finished", std::to_string(trunks.size()) + "\n");
+    EXPECT_EQ(rows("SELECT count(*) FROM lapd.frames"), frames);
+    EXPECT_EQ(everything(), undisturbed);
+    EXPECT_EQ(first->end(SIGTERM), 0);
+    EXPECT_EQ(second->end(SIGTERM), 0);
+}
+
+TEST_F(Lapdstore, GoesOnWhenThePartitionsOfAnotherBecomeFree) {
+    const std::vector<Parcel> parcels = parcelsOf(source + "/examples/net5.pcap", 10, true);
+    const std::string locks =
+        "SELECT count(*) FROM pg_locks WHERE locktype = 'advisory' AND granted "
+        "AND database = (SELECT oid FROM pg_database WHERE datname = current_database())";
+    Process first(words());
+    await(locks, "64\n");
+    Process second(words());
+    publish({parcels.front()});
+    await("SELECT assembled FROM lapd.runs", "11\n");
+    first.end(SIGKILL);
+    publish(parcels);
+    await("SELECT finished FROM lapd.runs", "t\n");
+}
+
+TEST_F(Lapdstore, GoesOnWhenTheDatabaseHasEndedItsConnections) {
+    const std::vector<Parcel> parcels = parcelsOf(source + "/examples/net5.pcap", 10, true);
+    Process store(words());
+    publish({parcels.front()});
+    await("SELECT assembled FROM lapd.runs", "11\n");
+    execute(
+        "SELECT pg_terminate_backend(pid) FROM pg_stat_activity WHERE pid <> pg_backend_pid() "
+        "AND datname = current_database()");
+    publish(parcels);
+    await("SELECT finished FROM lapd.runs", "t\n");
+}
+
+TEST_F(Lapdstore, PutsWhatItCannotReadIntoTheStreamOfDeadLetters) {
+    const std::vector<Parcel> parcels = parcelsOf(source + "/examples/net5.pcap", 10, true);
+    const std::string subject = toText(parcels.front().subject());
+    connection.publish(subject, "no JSON \xff", "");
+    connection.publish("lapd.1.not.a.d.channel.at.all", "{}", "");
+    Process store(words());
+    publish(parcels);
+    await("SELECT finished FROM lapd.runs", "t\n");
+    await("SELECT reason FROM lapd.dead_letters WHERE sequence = 1", "it is no JSON\n");
+    await("SELECT count(*) FROM lapd.dead_letters", "2\n");
+    ConsumerRules rules;
+    rules.stream = deadStream;
+    rules.durable = "test";
+    rules.filter = everyDeadSubject;
+    NatsConsumer dead(connection, rules);
+    std::vector<std::string> texts;
+    while (texts.size() < 2) {
+        for (NatsMessage& message : dead.fetch(10, 1s)) {
+            texts.push_back(std::string(message.subject()) + " " + std::string(message.text()));
+            message.acknowledge();
+        }
+    }
+    std::sort(texts.begin(), texts.end());
+    EXPECT_EQ(texts[0], "lapd-dead.1.not.a.d.channel.at.all {}");
+    EXPECT_EQ(texts[1], deadSubjectOf(subject) + " no JSON \xff");
+}
+
+TEST_F(Lapdstore, SaysWhyAnEngineRefusesIt) {
+    const auto saysOf = [](const std::string& database, const NatsOptions& nats) {
+        std::atomic<bool> stopped{false};
+        std::string said;
+        work({database, nats, {0}, 30s}, stopped, [&](const std::string& line) {
+            said = line;
+            stopped = true;
+        });
+        return said;
+    };
+    EXPECT_NE(saysOf(urlOf("postgres", "nobody"), server.options()).find("nobody"), std::string::npos);
+    NatsServer guarded(NatsServer::Security::certificates);
+    NatsOptions stranger = guarded.options();
+    stranger.certificate = fleet_tests::Certificates::get().strangersFile("store.pem");
+    stranger.key = fleet_tests::Certificates::get().strangersFile("store.key");
+    const std::string refused = saysOf(url(), stranger);
+    EXPECT_TRUE(!refused.empty() && !refused.starts_with("partitions")) << refused;
+    NatsConnection ours(guarded.options());
+    StreamRules rules;
+    rules.name = centreStream;
+    rules.subjects = {everySubject};
+    makeStream(ours, rules);
+    EXPECT_EQ(saysOf(url(), guarded.options()), "partitions leased: 0");
+}
+
+}  // namespace fleet
