@@ -107,7 +107,10 @@ StagedTable<std::tuple_size_v<CallRow>> makeCallsTable() {
     for (std::size_t i = 0; i < columns.size(); ++i) {
         const std::string name = columns[i].name;
         table.columns[ofTheRun + i] = name;
-        table.onConflict += (i == 0 ? "" : ", ") + name + " = EXCLUDED." + name;
+        if (i != 0)
+            table.onConflict += ", ";
+        (table.onConflict += name) += " = EXCLUDED.";
+        table.onConflict += name;
     }
     return table;
 }

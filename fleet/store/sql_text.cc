@@ -22,8 +22,8 @@ std::chrono::sys_days dayOf(std::int64_t nanoseconds) {
 std::string dayText(std::int64_t nanoseconds) {
     const std::chrono::year_month_day date(dayOf(nanoseconds));
     std::array<char, 32> text{};
-    std::snprintf(text.data(), text.size(), "%04d-%02u-%02u", int{date.year()}, unsigned{date.month()},
-                  unsigned{date.day()});
+    static_cast<void>(std::snprintf(text.data(), text.size(), "%04d-%02u-%02u", int{date.year()},
+                                    unsigned{date.month()}, unsigned{date.day()}));
     return text.data();
 }
 
@@ -31,9 +31,10 @@ std::string timestampText(std::int64_t nanoseconds) {
     const sys_time<Nanoseconds> at{Nanoseconds(nanoseconds)};
     const std::chrono::hh_mm_ss time(std::chrono::floor<std::chrono::microseconds>(at - dayOf(nanoseconds)));
     std::array<char, 32> text{};
-    std::snprintf(text.data(), text.size(), " %02d:%02d:%02d.%06d+00", static_cast<int>(time.hours().count()),
-                  static_cast<int>(time.minutes().count()), static_cast<int>(time.seconds().count()),
-                  static_cast<int>(time.subseconds().count()));
+    static_cast<void>(
+        std::snprintf(text.data(), text.size(), " %02d:%02d:%02d.%06d+00",
+                      static_cast<int>(time.hours().count()), static_cast<int>(time.minutes().count()),
+                      static_cast<int>(time.seconds().count()), static_cast<int>(time.subseconds().count())));
     return dayText(nanoseconds) + text.data();
 }
 
