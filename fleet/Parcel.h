@@ -90,7 +90,8 @@ std::string toText(const Parcel& parcel);
 // Takes any text at all. Throws BadParcel.
 Parcel parcelIn(std::string_view text);
 
-// What the recorder said, alone: the list that stands under "before" or "end" of a parcel. The store keeps it so.
+// What the recorder said, alone: the list that stands under "before" or "end" of a parcel. The store keeps it
+// so.
 std::string toText(const std::vector<ParcelItem>& notes);
 // Throws BadParcel.
 std::vector<ParcelItem> notesInText(std::string_view text);
