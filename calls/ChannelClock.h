@@ -27,6 +27,8 @@ class ChannelClock {
     bool hasTime() const { return hasTime_; }
 
   private:
+    void pass(std::int64_t nanoseconds);  // not negative
+
     std::int64_t now_ = 0;    // at the last frame
     std::int64_t since_ = 0;  // added by advance() since the last frame
     std::int64_t lastTime_ = 0;

@@ -1,6 +1,7 @@
 #include "calls/Occupancy.h"
 
 #include <algorithm>
+#include <limits>
 #include <set>
 
 namespace calls {
@@ -114,7 +115,9 @@ void Occupancy::stop(Group& group, Channel& channel, const Moment& moment) {
     group.used += used;
     --group.inUse;
     group.overTime.set(moment, group.inUse);
-    spread(channel.since, channel.since.time + used);
+    constexpr std::int64_t endOfTime = std::numeric_limits<std::int64_t>::max();
+    const std::int64_t since = channel.since.time;
+    spread(channel.since, since > endOfTime - used ? endOfTime : since + used);
 }
 
 // Adds a time of use to the hours that it touches.
@@ -124,7 +127,9 @@ void Occupancy::spread(const Moment& from, std::int64_t until) {
     std::int64_t at = from.time;
     for (std::size_t touched = 0; at < until && touched < mostHours; ++touched) {
         const HourKey key{from.clock, hoursIn(at)};
-        const std::int64_t next = std::min(until, (key.hour + 1) * hour);
+        const std::int64_t left =
+            hour - (at - key.hour * hour);  // of this hour; a sum could pass the end of time
+        const std::int64_t next = until - at < left ? until : at + left;
         if (hours_.size() < mostHours || hours_.contains(key))
             hours_[key] += next - at;
         at = next;

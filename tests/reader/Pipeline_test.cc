@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <stdexcept>
 
 #include "tests/reader/streams.h"
@@ -32,7 +33,7 @@ class Frames : public capture::Reader {
     std::uint64_t left_;
     bool isBad_;
     capture::Interface interface_;
-    std::vector<std::uint8_t> octets_{0x02, 0x01, 0x01, 0x01};
+    std::array<std::uint8_t, 4> octets_{0x02, 0x01, 0x01, 0x01};
 };
 
 // Checks that frames come in their order, and may fail at one of them.
