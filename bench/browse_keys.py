@@ -28,8 +28,9 @@ from read_speed import ROOT
 
 LIMIT = 600  # seconds
 STEP = 0.01  # between two portions of live frames
-# Keys, and what the terminal gets of the screen that they lead to: only what differs from the screen before is sent.
-KEYS = [(b"?", b"Key"), (b"q", b"Cal"), (b"/", rb"/_"), (b"4", rb"4_"), (b"\n", rb"/4"), (b"\x1b", rb"Calls|next"), (b"3", b"Find"), (b"2", b"Cal")]
+# Keys, and what the terminal gets of the screen that they lead to. Only what differs from the screen before is sent, so these are screens
+# that differ from each other in every line.
+KEYS = [(b"?", b"Key"), (b"q", b"Cal"), (b"3", b"Find"), (b"2", b"Cal")]
 
 
 def frame_ends(data):
@@ -86,7 +87,10 @@ def swallow(terminal, seconds):
     end = time.monotonic() + seconds
     while (left := end - time.monotonic()) > 0:
         if select.select([terminal], [], [], left)[0]:
-            os.read(terminal, 65536)
+            try:
+                os.read(terminal, 65536)
+            except OSError:  # the program has ended
+                return
 
 
 def measure(lapdread, folder, options):

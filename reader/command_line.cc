@@ -41,6 +41,12 @@ class Help : public CLI::Formatter {
                std::string(command == nullptr ? "" : command->words) + "\n";
     }
 
+    // Without the options that exclude this one: whoever gives both is told so.
+    std::string make_option_opts(const CLI::Option* option) const override {
+        const std::string form = CLI::Formatter::make_option_opts(option);
+        return form.substr(0, form.find(" Excludes:"));
+    }
+
     // The usage describes the words after the options.
     std::string make_positionals(const CLI::App* /*app*/) const override { return ""; }
 };

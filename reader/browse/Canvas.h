@@ -40,7 +40,7 @@ class Canvas {
     int width() const { return width_; }
     int height() const { return height_; }
     Area whole() const { return {0, 0, width_, height_}; }
-    const Cell& at(int x, int y) const { return cells_[static_cast<std::size_t>(y * width_ + x)]; }
+    const Cell& at(int x, int y) const { return cells_[index(x, y)]; }
 
     // Puts UTF-8 text from a column on, in columns before `end` only. Returns the column behind it. What
     // cannot be printed is shown as "?".
@@ -55,7 +55,10 @@ class Canvas {
     std::string line(int y) const;
 
   private:
-    Cell& cell(int x, int y) { return cells_[static_cast<std::size_t>(y * width_ + x)]; }
+    std::size_t index(int x, int y) const {
+        return static_cast<std::size_t>(y) * static_cast<std::size_t>(width_) + static_cast<std::size_t>(x);
+    }
+    Cell& cell(int x, int y) { return cells_[index(x, y)]; }
 
     int width_;
     int height_;

@@ -184,7 +184,7 @@ void MessageScreen::drawOctets(Canvas& canvas, const Area& area) const {
     const int top = std::max(0, std::min(litLine - area.height / 2,
                                          static_cast<int>(octets_.size()) / octetsInLine + 1 - area.height));
     for (int i = 0; i < area.height; ++i) {
-        const auto begin = static_cast<std::size_t>((top + i) * octetsInLine);
+        const auto begin = static_cast<std::size_t>(top + i) * std::size_t{octetsInLine};
         if (begin >= octets_.size())
             break;
         const int y = area.y + i;

@@ -162,9 +162,9 @@ std::optional<Key> keyOfCharacter(wint_t character) {
 
 struct Terminal::Held {
     struct ScreenEnd {
-        void operator()(SCREEN* screen) const {
+        void operator()(SCREEN* ended) const {
             endwin();
-            delscreen(screen);
+            delscreen(ended);
         }
     };
 
