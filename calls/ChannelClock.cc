@@ -13,7 +13,7 @@ constexpr std::int64_t ticksOutOfOrder =
 // The clock stops here, ten years before its numbers end, so that timers can be added to any of its readings.
 // No real trace comes near it; the times in a damaged capture may.
 constexpr std::int64_t latest =
-    std::numeric_limits<std::int64_t>::max() - 10 * 366 * 86400 * std::int64_t{1'000'000'000};
+    std::numeric_limits<std::int64_t>::max() - std::int64_t{10} * 366 * 86400 * 1'000'000'000;
 
 // From one time to a later one; the longest time there is if it is longer than that.
 std::int64_t timeBetween(std::int64_t from, std::int64_t to) {
