@@ -111,8 +111,8 @@ class ReadingThread {
 // Writes a file on a thread of its own, one at a time.
 class Saving {
   public:
-    Saving(const Options& options, redaction::Key key, const Wake& wake)
-        : options_(options), key_(std::move(key)), wake_(wake) {}
+    Saving(const Options& options, const redaction::Key& key, const Wake& wake)
+        : options_(options), key_(key), wake_(wake) {}
 
     bool isBusy() const { return result_.valid(); }
     void begin(const FrameStore& frames, SaveOrder order) {
@@ -225,7 +225,7 @@ class Loop {
 // Lines and arrows of UTF-8 need a locale that has it.
 bool beginLocale() {
     if (std::setlocale(LC_CTYPE, "") == nullptr && localeHasUtf8())
-        std::setlocale(LC_CTYPE, "C.UTF-8");
+        static_cast<void>(std::setlocale(LC_CTYPE, "C.UTF-8"));
     return std::strcmp(nl_langinfo(CODESET), "UTF-8") == 0;
 }
 
@@ -285,7 +285,7 @@ int runBrowse(const Options& options, Chatter& chatter) {
         const Signals signals(wake);
         Terminal terminal(
             {useColors(options.output, Output()), options.browse.mouse, readsStandardInput(options)});
-        Saving saving(options, std::move(key), wake);
+        Saving saving(options, key, wake);
         Browser* shown = nullptr;
         settings.save = [&](const FrameStore& frames, SaveOrder order) {
             if (saving.isBusy())
