@@ -1,6 +1,7 @@
 #include "reader/browse/Browser.h"
 
 #include <algorithm>
+#include <iterator>
 
 #include "reader/browse/CallsScreen.h"
 #include "reader/browse/FindingsScreen.h"
@@ -192,7 +193,7 @@ void Browser::drawFoot(Canvas& canvas) const {
     const int end = canvas.width() - columnsOf(always) - 1;
     int x = 0;
     if (!front().isTyping() && opened_.empty())
-        hints.insert(hints.begin() + (hints.empty() ? 0 : 1), everywhere[0]);
+        hints.insert(hints.empty() ? hints.begin() : std::next(hints.begin()), everywhere[0]);
     for (const KeyHint& hint : hints) {
         const int width = columnsOf(hint.key) + 1 + columnsOf(hint.what);
         if (x + width > end)
