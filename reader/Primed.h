@@ -18,6 +18,8 @@ class Primed : public capture::Reader {
     // Waits for the first item or the end, which next() gives afterwards. False if `stopped` was set before
     // that. Throws what next() throws: capture::BadInput for an input of no known form, for example.
     bool awaitFirst(const std::atomic<bool>& stopped);
+    // The item that awaitFirst() has waited for, valid until next(); null if there is none.
+    const capture::Item* first() const { return held_ == Next::item ? &first_ : nullptr; }
 
     Next next(capture::Item& item) override;
     void wait(std::chrono::milliseconds most) override { reader_->wait(most); }

@@ -34,10 +34,21 @@ const std::string& numbered(Redacting::Names& known, std::string_view name, std:
 
 }  // namespace
 
+bool namesKey(const capture::Item& item, const redaction::Key& key) {
+    if (item.kind != Kind::comment || !item.text.starts_with(capture::redactedPrefix))
+        return false;
+    const std::string_view check = item.text.substr(capture::redactedPrefix.size());
+    const std::string known = redaction::checkOf(key);
+    if (check != known)
+        throw FileError("the input was redacted with another key: its check is " + safe(check) +
+                        ", that of this key " + known);
+    return true;
+}
+
 Redacting::Redacting(const Options& options, const redaction::Key& key, redaction::Direction direction,
                      std::unique_ptr<Composer> composer, Consumer& next)
     : redactor_(key, direction, analysisOptions(options)),
-      keyCheck_(redaction::checkOf(key)),
+      key_(key),
       hidesNames_(direction == redaction::Direction::redact),
       composer_(std::move(composer)),
       next_(next),
@@ -102,8 +113,7 @@ void Redacting::giveUp() {
 void Redacting::look(const Seen& seen, bool passes) {
     if (seen.item->kind == Kind::comment && hidesNames_)
         return;
-    if (seen.item->kind == Kind::comment && seen.item->text.starts_with(capture::redactedPrefix)) {
-        checkKey(seen.item->text.substr(capture::redactedPrefix.size()));
+    if (namesKey(*seen.item, key_)) {
         knowsKey_ = true;
         return;
     }
@@ -118,12 +128,6 @@ void Redacting::look(const Seen& seen, bool passes) {
     if (waiting_.size() > mostWaiting)
         giveUp();
     release();
-}
-
-void Redacting::checkKey(std::string_view check) const {
-    if (check != keyCheck_)
-        throw FileError("the input was redacted with another key: its check is " + safe(check) +
-                        ", that of this key " + keyCheck_);
 }
 
 // Releases items, up to the first that waits for the rest of its message.

@@ -17,6 +17,9 @@
 
 namespace reader {
 
+// Whether the item says that the input was redacted with this key. Throws FileError if it was another one.
+bool namesKey(const capture::Item& item, const redaction::Key& key);
+
 // Stands between a run and the consumer that writes. It looks at every item, filters or not, since a number
 // may have begun in another frame; items that pass the filters go on, or all of them to a consumer that wants
 // all. Names of files and D channels are replaced, comments are left out, and messages are put in words of
@@ -67,10 +70,8 @@ class Redacting : public Consumer {
     void handOn();
     void passGate();
 
-    void checkKey(std::string_view check) const;
-
     redaction::TraceRedactor redactor_;
-    std::string keyCheck_;
+    redaction::Key key_;
     bool knowsKey_ = false;
     bool hidesNames_;
     std::unique_ptr<Composer> composer_;

@@ -1,5 +1,7 @@
 #include "reader/redact.h"
 
+#include <filesystem>
+
 #include "capture/Writer.h"
 #include "capture/notes.h"
 #include "reader/Redacting.h"
@@ -40,6 +42,22 @@ const Form& formOf(const Options& options) {
             return form;
     }
     throw UsageError("redact needs --to FORM, since the input's own form cannot be seen or written");
+}
+
+// Refuses inputs that were redacted with another key. What they say about it stands before their first frame.
+// Of pipes only the first one can be asked in advance, because a pipe can be read only once.
+void checkKeys(Session& session, const Options& options, const Key& key) {
+    for (const std::string& file : inputFiles(options)) {
+        std::error_code ignored;
+        if (file == "-" || !std::filesystem::is_regular_file(file, ignored))
+            continue;
+        const auto reader = openFile(file, options.input);
+        capture::Item item;
+        while (reader->next(item) == capture::Reader::Next::item && !item.isFrame() && !namesKey(item, key)) {
+        }
+    }
+    if (const capture::Item* const first = session.firstItem(); first != nullptr)
+        namesKey(*first, key);
 }
 
 // Says in the output with which key it was made, if its form has a place for that.
@@ -125,6 +143,8 @@ int runRedact(const Options& options, Chatter& chatter) {
     Session session(options, chatter);
     session.tellGuessedVariant("redacted");
     const Key key = redactionKey(options, chatter);  // before an output is emptied
+    if (options.redact.undo)
+        checkKeys(session, options, key);
     Output& out = session.output(form.what, form.looksRight);
     if (form.binary && out.isTerminal())
         throw UsageError(std::string(form.name) +

@@ -56,6 +56,11 @@ void Session::awaitInputs() {
         throw StoppedEarly();
 }
 
+const capture::Item* Session::firstItem() {
+    awaitInputs();
+    return reader_.first();
+}
+
 Output& Session::output(std::string_view form, bool (*looksRight)(std::string_view)) {
     if (output_ == nullptr && isStandard(options_.output.path)) {
         output_ = std::make_unique<Output>();

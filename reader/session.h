@@ -32,6 +32,9 @@ class Session {
     // leaves the file as it was; so does a signal before the first item (StoppedEarly). A file that is
     // neither empty nor of the right form ("text") is refused with FileError, and so is one of the inputs.
     Output& output(std::string_view form = "", bool (*looksRight)(std::string_view) = looksLikeNothing);
+    // Waits for the first item of the inputs, which run() hands on like the others; null if there is none.
+    // Throws StoppedEarly if a signal comes before it.
+    const capture::Item* firstItem();
     bool useColors() { return reader::useColors(options_.output, output()); }
 
     // Says so once if frames are `done` ("decoded") by the rules of a variant that nobody has named.

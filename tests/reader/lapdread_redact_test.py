@@ -244,10 +244,25 @@ class Redact(Folder):
             status, out, error = run("redact", "--undo", "--key", other, redacted, "-o", to)
             self.assertEqual(status, 2)
             self.assertIn("another key", error)
-            self.assertEqual(lines("net5", to) if to.stat().st_size else [], [])
+            self.assertEqual(out, b"")
+            self.assertFalse(to.exists())
             status, _, error = run("redact", "--undo", "--key", self.key, redacted, "-o", to)
             self.assertEqual((status, "which key" in error), (0, False), error)
             self.assertNotIn("redacted with key", output("convert", "--to", "jsonl", to))
+
+    def test_leaves_the_output_as_it_was_if_an_input_has_another_key(self):
+        other, mine, others = self.folder / "other", self.folder / "mine.hex", self.folder / "others.hex"
+        output("redact", "--key", self.key, EXAMPLES["net5"], "-o", mine)
+        output("redact", "--key", other, EXAMPLES["net5"], "-o", others)
+        to = self.folder / "to.hex"
+        before = output("convert", "--to", "hex", EXAMPLES["ntt"])
+        to.write_text(before)
+        for words, stdin in (([others], b""), ([mine, others], b""), (["-"], others.read_bytes())):
+            status, _, error = run("redact", "--undo", "--key", self.key, *words, "-o", to, stdin=stdin)
+            self.assertEqual((status, "another key" in error), (2, True), error)
+            self.assertEqual(to.read_text(), before)
+        output("redact", "--undo", "--key", self.key, mine, "-o", to)
+        self.assertNotEqual(to.read_text(), before)
 
     def test_says_that_it_cannot_tell_the_key_of_forms_without_comments(self):
         for form in ("pcap", "log"):
