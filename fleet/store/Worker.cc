@@ -6,6 +6,7 @@
 #include <memory>
 #include <pqxx/pqxx>
 #include <thread>
+#include <utility>
 
 #include "fleet/store/Lease.h"
 #include "fleet/store/NatsInbox.h"
@@ -35,10 +36,9 @@ class Shift {
             leaseMore();
             const auto begun = SteadyClock::now();
             std::size_t letters = 0;
-            for (auto& [number, held] : held_) {
-                if (stopped)
-                    return;
-                letters += moveOnce(held->inbox, held->partition, pause(), [](std::string_view) {});
+            for (auto next = held_.begin(); next != held_.end() && !stopped;) {
+                const auto at = next++;
+                letters += move(at);
             }
             if (letters == 0)
                 std::this_thread::sleep_until(begun + (held_.empty() ? round : shortest));
@@ -59,22 +59,60 @@ class Shift {
         return std::max(shortest, round / static_cast<int>(held_.size()));
     }
 
+    // What the stream refuses to one partition leaves the others alone: it is given back, and leased anew.
+    // Without a connection everything is begun anew.
+    std::size_t move(std::map<unsigned, std::unique_ptr<Held>>::iterator at) {
+        const unsigned number = at->first;
+        try {
+            Held& held = *at->second;
+            return moveOnce(held.inbox, held.partition, pause(), [](std::string_view) {});
+        } catch (const NatsError& error) {
+            if (!nats_.isConnected())
+                throw;
+            held_.erase(at);
+            sayOf(number, error);
+            return 0;
+        }
+    }
+
+    // A try that fails may have taken as long as a request may take. So the next one waits for its turn, and
+    // those that are held have theirs.
     void leaseMore() {
         if (SteadyClock::now() < nextTry_)
             return;
-        nextTry_ = SteadyClock::now() + betweenTries;
         std::string taken;
-        for (const unsigned number : options_.partitions) {
-            if (held_.contains(number) || !Lease(database_, number).isHeld())
-                continue;
-            auto held = std::make_unique<Held>(database_, nats_, number, options_.againAfter);
-            if (!held->lease.isHeld())
-                continue;
-            held_[number] = std::move(held);
-            taken += (taken.empty() ? "" : ", ") + std::to_string(number);
+        for (std::size_t i = 0; i < options_.partitions.size(); ++i) {
+            const unsigned number = options_.partitions[firstToTry_];
+            firstToTry_ = (firstToTry_ + 1) % options_.partitions.size();
+            try {
+                if (!held_.contains(number) && lease(number))
+                    taken += (taken.empty() ? "" : ", ") + std::to_string(number);
+            } catch (const NatsError& error) {
+                if (!nats_.isConnected())
+                    throw;
+                sayOf(number, error);
+                break;
+            }
         }
+        nextTry_ = SteadyClock::now() + betweenTries;
         if (!taken.empty())
             say_("partitions leased: " + taken);
+    }
+
+    bool lease(unsigned number) {
+        if (!Lease(database_, number).isHeld())
+            return false;
+        auto held = std::make_unique<Held>(database_, nats_, number, options_.againAfter);
+        if (!held->lease.isHeld())
+            return false;
+        held_[number] = std::move(held);
+        return true;
+    }
+
+    void sayOf(unsigned number, const NatsError& error) {
+        const std::string why = error.what();
+        if (std::exchange(saidOf_[number], why) != why)
+            say_("partition " + std::to_string(number) + ": " + why);
     }
 
     const WorkerOptions& options_;
@@ -82,7 +120,9 @@ class Shift {
     pqxx::connection database_;
     NatsConnection nats_;
     std::map<unsigned, std::unique_ptr<Held>> held_;
+    std::map<unsigned, std::string> saidOf_;  // partitions
     SteadyClock::time_point nextTry_{};
+    std::size_t firstToTry_ = 0;  // index in the options
 };
 
 }  // namespace

@@ -4,6 +4,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <csignal>
 #include <thread>
 
@@ -13,6 +14,7 @@
 #include "fleet/NatsPublisher.h"
 #include "fleet/store/Worker.h"
 #include "fleet/streams.h"
+#include "fleet/subjects.h"
 
 namespace fleet {
 
@@ -148,6 +150,32 @@ TEST_F(Lapdstore, GoesOnWhenThePartitionsOfAnotherBecomeFree) {
     first.end(SIGKILL);
     publish(parcels);
     await("SELECT finished FROM lapd.runs", "t\n");
+}
+
+// Somebody else's consumer of the same name, which cannot be made into ours.
+TEST_F(Lapdstore, GoesOnWithTheOthersWhenThePartitionOfOneCannotBeHad) {
+    const std::vector<Parcel> parcels = parcelsOf(source + "/examples/net5.pcap", 10, true);
+    const unsigned good = parcels.front().subject().partition;
+    const unsigned bad = (good + 1) % partitions;
+    const std::string consumer = "lapdstore-" + std::to_string(bad);
+    publisher.send(
+        "$JS.API.CONSUMER.DURABLE.CREATE.LAPD." + consumer,
+        R"({"stream_name":"LAPD","config":{"ack_policy":"none","durable_name":")" + consumer + "\"}}", "", 1);
+    ASSERT_TRUE(publisher.answer(longEnough));
+    std::atomic<bool> stopped{false};
+    std::vector<std::string> said;
+    {
+        const std::jthread worker([&] {
+            work({url(), server.options(), {bad, good}, 30s}, stopped,
+                 [&](const std::string& line) { said.push_back(line); });
+        });
+        publish(parcels);
+        await("SELECT finished FROM lapd.runs", "t\n");
+        stopped = true;
+    }
+    EXPECT_TRUE(std::ranges::any_of(said, [&](const std::string& line) {
+        return line.starts_with("partition " + std::to_string(bad) + ": cannot ");
+    })) << testing::PrintToString(said);
 }
 
 TEST_F(Lapdstore, GoesOnWhenTheDatabaseHasEndedItsConnections) {
