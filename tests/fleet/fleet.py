@@ -1,0 +1,231 @@
+"""A fleet on this machine: engines, trunks on the software board with their recorders, shippers and stores."""
+
+import contextlib
+import csv
+import io
+import json
+import os
+import pathlib
+import subprocess
+
+from engines import LIMIT, Engines, Process, awaited, fail_if_ended
+from traffic import Trunk as Traffic
+
+BINARIES = pathlib.Path(os.environ.get("FLEET_BINARIES", pathlib.Path(__file__).resolve().parents[2] / "build/release/bin"))
+
+
+def program(name):
+    return str(BINARIES / name)
+
+
+def lapdread(*words):
+    """What lapdread prints. Fails if lapdread does, or says anything."""
+    ran = subprocess.run([program("lapdread"), *map(str, words), "--quiet"], capture_output=True, text=True, timeout=10 * LIMIT)
+    if ran.returncode != 0 or ran.stderr:
+        raise RuntimeError(f"lapdread {' '.join(map(str, words))}: status {ran.returncode}: {ran.stderr}")
+    return ran.stdout
+
+
+def frames_in(capture):
+    """How many packets a pcap file has."""
+    count, at = 0, 24
+    while at < len(capture):
+        at += 16 + int.from_bytes(capture[at + 8:at + 12], "little")
+        count += 1
+    return count
+
+
+class Trunk:
+    """A trace on the software board, whose log is kept, and the recorder that follows the log."""
+
+    def __init__(self, name, site, number, folder, capture):
+        self.name, self.site, self.number = name, site, number
+        self.log, self.recordings = folder / f"{name}.lapdmon.log", folder / "recordings"
+        self.recordings.mkdir(exist_ok=True)
+        frames = folder / f"{name}.pcap"
+        frames.write_bytes(capture)
+        self.frames = frames_in(capture)
+        self.trace = Process(f"{name}.trace", [program("softboard"), "--frames", frames, "--dchannels", 1, "--", program("lapdmon"),
+                                               "-b1", "-d1", "-f", self.log], folder)
+        self.recorder = Process(f"{name}.recorder", [program("lapdread"), "record", "--follow", "--folder", self.recordings,
+                                                     "--trunk", name, "--size", "200k", self.log], folder)
+
+    def logged(self):
+        """How many frames the log has."""
+        return self.log.read_bytes().count(b"Hex Dump: \n") if self.log.exists() else 0
+
+    def recorded(self):
+        """How many frames the recorder says that it has."""
+        state = self.recordings / f"{self.name}.state.json"
+        return json.loads(state.read_text())["next"] - 1 if state.exists() else 0
+
+
+class Fleet:
+    """`traffic(number)`: the capture that trunk `number` plays, from 1. Trunks are shared out among the sites."""
+
+    def __init__(self, folder, trunks, traffic, sites=("london", "leeds"), stores=2, prometheus=None, site_folder=None,
+                 megabytes=200):
+        self.folder = pathlib.Path(folder)
+        self.engines = Engines(self.folder, sites, site_folder, prometheus)
+        self.shippers, self.stores, self.trunks = {}, [], []
+        self._plan = (trunks, traffic, stores)
+        self._megabytes = megabytes  # of a site's stream
+        self._state_folder = site_folder or (lambda site: self.folder / site)
+        self._down = contextlib.ExitStack()
+
+    def __enter__(self):
+        try:
+            self._down.enter_context(self.engines)
+            self._make_streams()
+            self._make_tables()
+            self._make_trunks()
+            self._start()
+            return self
+        except BaseException:
+            self._down.close()
+            raise
+
+    def __exit__(self, *_):
+        self._down.close()
+
+    def url(self, user="reads"):
+        return self.engines.database_url(user)
+
+    # Setting it up, as the pages say.
+
+    def _toml(self, site, user, trunks=()):
+        authority, certificate, key = self.engines.certificate(user)
+        servers = ", ".join(f'"{each}"' for each in self.engines.servers(site))
+        state = self._state_folder(site) / "shipper" if site else self.folder
+        state.mkdir(parents=True, exist_ok=True)
+        text = (f'site = "{site or "centre"}"\nhost = "h1"\nservers = [ {servers} ]\nstate = "{state}"\n'
+                f'[tls]\nauthority = "{authority}"\ncertificate = "{certificate}"\nkey = "{key}"\n')
+        for trunk in trunks:
+            text += (f'[[dchannel]]\nboard = "{trunk.number}"\ndchannel = "1"\ntrunk = "{trunk.name}"\n'
+                     f'folder = "{trunk.recordings}"\n')
+        if not trunks:  # only streams are made, but the file names a D channel
+            text += '[[dchannel]]\nboard = "0"\ndchannel = "1"\ntrunk = "none"\nlog = "/dev/null"\n'
+        path = self.folder / f"{site or 'centre'}.{user}.toml"
+        path.write_text(text)
+        return path
+
+    def _make_streams(self):
+        def made(*words, site=None):
+            ran = subprocess.run([program("lapdship"), "streams", *words, "-c", self._toml(site, "admin")], capture_output=True,
+                                 text=True, timeout=LIMIT)
+            return ran.returncode == 0
+        for site in self.engines.sites:
+            awaited(lambda: made("site", "--size", str(self._megabytes), site=site), f"the stream of {site}")  # noqa: B023
+        sites = [word for site in self.engines.sites for word in ("--from", site)]
+        # The three servers choose a leader before they make streams.
+        awaited(lambda: made("centre", "--replicas", "3", *sites), "the streams of the centre")
+
+    def _make_tables(self):
+        subprocess.run([program("lapdstore"), "--database", self.engines.owner_url, "migrate"], check=True, capture_output=True,
+                       timeout=LIMIT)
+        self.engines.sql("CREATE ROLE lapdstore LOGIN; GRANT lapd_writer TO lapdstore; CREATE ROLE reads LOGIN; "
+                         "GRANT lapd_reader TO reads")
+
+    def _make_trunks(self):
+        trunks, traffic, _ = self._plan
+        folder = self.folder / "trunks"
+        folder.mkdir()
+        for number in range(1, trunks + 1):
+            site = self.engines.sites[number % len(self.engines.sites)]
+            self.trunks.append(Trunk(f"pri{number}", site, number, folder, traffic(number)))
+
+    def _add(self, process):
+        self._down.callback(process.take_down)
+        return process
+
+    def _start(self):
+        for trunk in self.trunks:
+            self._add(trunk.trace).start()
+        for trunk in self.trunks:
+            awaited(lambda: trunk.log.exists() or fail_if_ended(trunk.trace), f"the log of {trunk.name}")  # noqa: B023
+            self._add(trunk.recorder).start()
+        for site in self.engines.sites:
+            own = [trunk for trunk in self.trunks if trunk.site == site]
+            self.shippers[site] = self._add(Process(f"lapdship.{site}", [program("lapdship"), "-c",
+                                                                         self._toml(site, "shipper", own)], self.folder)).start()
+        authority, certificate, key = self.engines.certificate("store")
+        nats = [word for server in self.engines.servers() for word in ("--nats", server)]
+        words = [program("lapdstore"), "--database", self.url("lapdstore"), *nats, "--authority", authority, "--certificate",
+                 certificate, "--key", key, "--again-after", "5"]
+        for number in range(1, self._plan[2] + 1):
+            self.stores.append(self._add(Process(f"lapdstore.{number}", words, self.folder)).start())
+
+    # Ending it, and what came of it.
+
+    def play_to_the_end(self):
+        """Returns when each log has all that its trunk plays, and each trace has ended in order."""
+        for trunk in self.trunks:
+            awaited(lambda: trunk.logged() >= trunk.frames, f"{trunk.name} plays", 10 * LIMIT)  # noqa: B023
+        for trunk in self.trunks:
+            if trunk.trace.end() != 0:
+                raise RuntimeError(f"{trunk.trace.name}: {trunk.trace.said()}")
+
+    def stored(self):
+        """How many frames the store has of each trunk."""
+        rows = self.engines.sql("SELECT name, count(frames.*) FROM lapd.trunks LEFT JOIN lapd.frames USING (trunk) GROUP BY 1")
+        return {name: int(count) for name, count in rows}
+
+    def await_stored(self, limit):
+        """Returns when the store has as many frames as the logs, or the time is over."""
+        wanted = {trunk.name: trunk.logged() for trunk in self.trunks}
+        with contextlib.suppress(TimeoutError):
+            awaited(lambda: self.stored() == wanted, "the frames of all trunks", limit)
+
+    def compare(self):
+        """What is in the logs, and in the store."""
+        result = Comparison()
+        for trunk in self.trunks:
+            result.of(trunk, self)
+        result.gaps = len(self.engines.sql("SELECT 1 FROM lapd.gaps"))
+        result.dead_letters = len(self.engines.sql("SELECT 1 FROM lapd.dead_letters"))
+        return result
+
+
+# Columns of lapdread calls --csv that the table of calls has in the same words.
+COLUMNS = ("callref", "origin", "dir", "kind", "calling", "called", "bearer", "channel_asked", "channel", "first_response_ms",
+           "progress_ms", "alerting_ms", "connect_ms", "duration_ms", "outcome", "ended_by", "cleared_by", "cause", "location",
+           "made", "causes", "first_frame", "last_frame", "flags")
+
+
+class Comparison:
+    """The logs and the store, read by lapdread, and the table of calls. `differences` are lines for people."""
+
+    def __init__(self):
+        self.frames = self.calls = self.gaps = self.dead_letters = 0
+        self.differences = []
+
+    def of(self, trunk, fleet):
+        """The same trunk, on both sides."""
+        def both(*words):
+            return [lapdread(*words, "--trunk", trunk.name, *where) for where in ([trunk.log], ["--store", fleet.url()])]
+        frames, stored = (text.splitlines() for text in both("convert", "--to", "hex"))
+        self.compare(f"{trunk.name}, frames", frames, stored)
+        self.frames += sum(not line.startswith("#") for line in frames)
+        calls, stored = (list(csv.DictReader(io.StringIO(text))) for text in both("calls", "--csv"))
+        self.compare(f"{trunk.name}, calls", [row_of(call) for call in calls], [row_of(call) for call in stored])
+        self.calls += len(calls)
+        self.compare(f"{trunk.name}, findings", *(text.splitlines() for text in both("check")))
+        table = fleet.engines.sql(f"SELECT {', '.join(COLUMNS)} FROM lapd.calls JOIN lapd.trunks USING (trunk) "
+                                  f"WHERE name = '{trunk.name}' ORDER BY last_frame, first_frame")
+        calls.sort(key=lambda call: (int(call["last_frame"]), int(call["first_frame"])))
+        self.compare(f"{trunk.name}, table of calls", [[call[column] for column in COLUMNS] for call in calls], table)
+
+    def compare(self, what, expected, got):
+        if expected == got:
+            return
+        here, there = set(map(str, expected)), set(map(str, got))
+        lost, more = [row for row in expected if str(row) not in there], [row for row in got if str(row) not in here]
+        self.differences.append(f"{what}: {len(expected)} in the log, {len(got)} in the store; {len(lost)} of the log are not in "
+                                f"the store, {len(more)} of the store not in the log")
+        for where, rows in (("log", lost), ("store", more)):
+            self.differences += [f"    only in the {where}: {row}" for row in rows[:3]]
+
+
+def row_of(call):
+    """A call without the column that says where it was read."""
+    return [value for key, value in call.items() if key != "file"]

@@ -1,0 +1,77 @@
+"""What passes on a simulated trunk: calls with numbers, causes and channels by chance, and a link that is watched."""
+
+import pathlib
+import random
+import sys
+import tempfile
+
+ROOT = pathlib.Path(__file__).resolve().parents[2]
+sys.path.insert(0, str(ROOT / "examples"))
+import make_captures  # noqa: E402
+
+FAR, NEAR = 0x8000, 0.012  # the flag of a call reference; an answer of layer 2 or 3 that takes no thinking
+
+
+class Trunk:
+    """The same seed gives the same traffic. `rate`: calls a second, about; `seconds`: how long calls begin."""
+
+    def __init__(self, seed, seconds, rate=0.5, causes=(17, 34, 41, 102, 1)):
+        self._random, self._causes, self._lines = random.Random(seed), causes, []
+        self._say(0, "tx sabme")
+        self._say(NEAR, "rx ua")
+        at, number = 0.5, 0
+        while at < seconds:
+            number += 1
+            self._call(at, number)
+            at += self._random.expovariate(rate)
+        for each in range(10, int(seconds), 10):
+            self._say(each, "tx poll")
+            self._say(each + NEAR, "rx final")
+
+    def text(self):
+        return "".join(f"{at * 4 / 1000:.3f} {what}\n" for at, what in sorted(self._lines, key=lambda line: line[0]))
+
+    def capture(self):
+        with tempfile.NamedTemporaryFile("w", suffix=".frames") as file:
+            file.write(self.text())
+            file.flush()
+            return make_captures.pcap(make_captures.read(pathlib.Path(file.name)))
+
+    def _say(self, at, what):
+        self._lines.append((round(at * 250), what))
+
+    def _tell(self, at, direction, message):
+        """A message, and the acknowledgement of the other side."""
+        self._say(at, f"{direction} {message}")
+        self._say(at + NEAR, f"{'rx' if direction == 'tx' else 'tx'} rr")
+
+    def _call(self, at, number):
+        some = self._random
+        ours, theirs = some.choice([("tx", "rx"), ("rx", "tx")])
+        mine = f"{number % 0x7fff + 1:04x}"
+        far = f"{number % 0x7fff + 1 | FAR:04x}"
+        channel = 128 + number % 30 + 1
+        called = f"030{some.randrange(10)}{some.randrange(1000):03}"
+        self._tell(at, ours, f'setup {mine} bearer=8090a3 channel=a983{channel:02x} calling=2181"49574145{some.randrange(100):02}"'
+                             f' called=80"{called}"')
+        at += some.uniform(0.04, 0.2)
+        self._tell(at, theirs, f"proceeding {far} channel=a983{channel:02x}")
+        at += some.uniform(0.2, 1)
+        if some.random() < 0.25:
+            self._tell(at, theirs, f"disconnect {far} cause=82{0x80 + some.choice(self._causes):02x}")
+            self._tell(at + 0.1, ours, f"release {mine}")
+            self._tell(at + 0.2, theirs, f"release-complete {far}")
+            return
+        self._tell(at, theirs, f"alerting {far}")
+        at += some.uniform(0.5, 3)
+        if some.random() < 0.8:
+            self._tell(at, theirs, f"connect {far}")
+            self._tell(at + 0.1, ours, f"connect-ack {mine}")
+            at += some.uniform(1, 8)
+        self._tell(at, ours, f"disconnect {mine} cause=8190")
+        self._tell(at + 0.1, theirs, f"release {far}")
+        self._tell(at + 0.2, ours, f"release-complete {mine}")
+
+
+if __name__ == "__main__":
+    sys.stdout.write(Trunk(int(sys.argv[1]), float(sys.argv[2])).text())
