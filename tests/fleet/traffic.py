@@ -13,10 +13,11 @@ FAR, NEAR = 0x8000, 0.012  # the flag of a call reference; an answer of layer 2 
 
 
 class Trunk:
-    """The same seed gives the same traffic. `rate`: calls a second, about; `seconds`: how long calls begin."""
+    """The same seed gives the same traffic. `rate`: calls a second, about; `seconds`: how long calls begin; `fails`: how
+    many of them the other side refuses, with one of `causes`; `flaps`: when the link is lost and set up again."""
 
-    def __init__(self, seed, seconds, rate=0.5, causes=(17, 34, 41, 102, 1)):
-        self._random, self._causes, self._lines = random.Random(seed), causes, []
+    def __init__(self, seed, seconds, rate=0.5, causes=(17, 34, 41, 102, 1), fails=0.25, flaps=()):
+        self._random, self._causes, self._fails, self._lines = random.Random(seed), causes, fails, []
         self._say(0, "tx sabme")
         self._say(NEAR, "rx ua")
         at, number = 0.5, 0
@@ -24,6 +25,11 @@ class Trunk:
             number += 1
             self._call(at, number)
             at += self._random.expovariate(rate)
+        for flap in flaps:
+            for second in range(4):
+                self._say(flap + second, "tx poll")
+            self._say(flap + 4, "tx sabme")
+            self._say(flap + 4 + NEAR, "rx ua")
         for each in range(10, int(seconds), 10):
             self._say(each, "tx poll")
             self._say(each + NEAR, "rx final")
@@ -57,7 +63,7 @@ class Trunk:
         at += some.uniform(0.04, 0.2)
         self._tell(at, theirs, f"proceeding {far} channel=a983{channel:02x}")
         at += some.uniform(0.2, 1)
-        if some.random() < 0.25:
+        if some.random() < self._fails:
             self._tell(at, theirs, f"disconnect {far} cause=82{0x80 + some.choice(self._causes):02x}")
             self._tell(at + 0.1, ours, f"release {mine}")
             self._tell(at + 0.2, theirs, f"release-complete {far}")

@@ -1,0 +1,137 @@
+"""Shows what an operator of a fleet asks, and the answers, on this machine.
+
+    scripts/fleet-demo [--trunks N]
+
+Starts three servers of NATS and two of sites, PostgreSQL, and N trunks on the software board with their recorders,
+shippers and stores; lets calls pass for half a minute; asks ten questions; takes all of it down.
+"""
+
+import argparse
+import os
+import signal
+import subprocess
+import sys
+import tempfile
+import time
+
+from engines import LIMIT, awaited, missing
+from fleet import BINARIES, Fleet
+from traffic import Trunk as Traffic
+
+SITES = ("london", "leeds")
+SECONDS = 30  # of calls
+LINES = 14    # of an answer
+
+
+def traffic(number):
+    """Trunk 2 loses its link twice, trunk 3 finds no channel; on the others all is well."""
+    if number == 2:
+        return Traffic(2, SECONDS, rate=0.1, flaps=(8, 20)).capture()
+    if number == 3:
+        return Traffic(3, SECONDS, causes=(34,), fails=0.7).capture()
+    return Traffic(number, SECONDS, fails=0.1).capture()
+
+
+def psql(query):
+    return f'psql "$STORE" -c "{query}"'
+
+
+QUESTIONS = (
+    ("Which trunks are there, and how new is what we have of them?",
+     psql("SELECT site, host, name AS trunk, count(*) AS frames, date_trunc('second', to_timestamp(max(time) / 1e9)) AS newest "
+          "FROM lapd.frames JOIN lapd.trunks USING (trunk) GROUP BY 1, 2, 3 ORDER BY 1, 3")),
+    ("Which calls to 0301... were there in the last week, on any trunk?",
+     "lapdread calls --store $STORE --number 0301 --since $WEEK"),
+    ("What passed in the first call that failed on pri3?",
+     "lapdread ladder --store $STORE --trunk pri3 --failed --first 6"),
+    ("Where does cause 34 rise?",
+     psql("SELECT site, name AS trunk, date_trunc('minute', began) AS minute, count(*) AS calls FROM lapd.calls "
+          "JOIN lapd.trunks USING (trunk) WHERE cause = 34 GROUP BY 1, 2, 3 ORDER BY 4 DESC, 3")),
+    ("Which links flapped?",
+     psql("SELECT site, name AS trunk, date_trunc('second', at) AS at, left(sentence, 70) AS finding FROM lapd.findings "
+          "JOIN lapd.trunks USING (trunk) WHERE kind LIKE 'link-%' ORDER BY at")),
+    ("What else is wrong at leeds, and what is to be looked at?",
+     "lapdread check --store $STORE --site leeds --level warning"),
+    ("Which calls are up just now?",
+     psql("SELECT site, name AS trunk, callref, calling, called, channel, began FROM lapd.calls JOIN lapd.trunks USING (trunk) "
+          "WHERE ended IS NULL ORDER BY began")),
+    ("How well are calls answered, site by site?",
+     psql("SELECT site, count(*) AS calls, count(*) FILTER (WHERE outcome = 'answered') AS answered, round(100.0 * count(*) FILTER "
+          "(WHERE outcome = 'answered') / count(*)) AS percent, round(avg(alerting_ms)) AS ms_to_ring FROM lapd.calls "
+          "JOIN lapd.trunks USING (trunk) WHERE ended IS NOT NULL GROUP BY 1 ORDER BY 1")),
+    ("What did the network say, octet by octet, when it refused a call with cause 34?",
+     "lapdread explain --store $STORE --trunk pri3 --cause 34 --first 1"),
+    ("Is anything missing, and how far is the store behind?",
+     psql("SELECT (SELECT count(*) FROM lapd.gaps) AS gaps, (SELECT count(*) FROM lapd.dead_letters) AS dead_letters, "
+          "(SELECT count(*) FROM lapd.runs WHERE NOT finished AND EXISTS (SELECT FROM lapd.frames f WHERE f.trunk = runs.trunk "
+          "AND f.run = runs.run AND f.number > runs.assembled)) AS runs_that_wait, (SELECT round(extract(epoch FROM now()) - "
+          "max(time) / 1e9, 1) FROM lapd.frames) AS seconds_since_newest_frame")),
+)
+
+
+def ask(number, question, command, environment):
+    print(f"\n{number}. {question}\n\n$ {command}")
+    ran = subprocess.run(["bash", "-c", command], env=environment, capture_output=True, text=True, timeout=LIMIT)
+    if ran.returncode != 0:
+        raise RuntimeError(f"status {ran.returncode}: {ran.stderr}")
+    lines = [line.rstrip() for line in ran.stdout.rstrip("\n").splitlines()]
+    print("\n".join(lines[:LINES]))
+    if len(lines) > LINES:
+        print(f"... and {len(lines) - LINES} more lines")
+    sys.stdout.flush()
+    return ran.stdout
+
+
+def show(fleet, began):
+    environment = {**os.environ, "STORE": fleet.url(), "WEEK": time.strftime("%Y-%m-%d", time.gmtime(time.time() - 7 * 86400)),
+                   "PATH": f"{BINARIES}:{os.environ['PATH']}", "PAGER": "cat"}
+    engines = fleet.engines
+    print(f"Up after {time.monotonic() - began:.0f} seconds:\n"
+          f"  {len(fleet.trunks)} trunks: softboard -- lapdmon, and lapdread record\n"
+          f"  {len(SITES)} sites: lapdship -> nats-server, a leaf of the centre ({', '.join(SITES)})\n"
+          f"  centre: nats-server {' '.join(engines.servers())}\n"
+          f"          {len(fleet.stores)} x lapdstore -> PostgreSQL\n"
+          f"  STORE={fleet.url()}\n"
+          f"\nCalls pass for {SECONDS} seconds. Meanwhile a lapdstore and a server of the centre are killed (kill -9), and the\n"
+          f"line to {SITES[0]} is cut for 5 seconds.", flush=True)
+    time.sleep(SECONDS / 3)
+    fleet.stores[0].kill()
+    engines.nats["centre-1"].kill()
+    engines.cables[SITES[0]].cut()
+    time.sleep(5)
+    engines.cables[SITES[0]].mend()
+    engines.nats["centre-1"].start()
+    fleet.stores[0].start()
+    awaited(lambda: all(trunk.logged() >= 0.8 * trunk.frames for trunk in fleet.trunks), "the calls")
+    awaited(lambda: sum(fleet.stored().values()) >= 0.8 * sum(trunk.frames for trunk in fleet.trunks), "frames in the store")
+    for number, (question, command) in enumerate(QUESTIONS, 1):
+        ask(number, question, command, environment)
+    fleet.play_to_the_end()
+    fleet.await_stored(LIMIT)
+    result = fleet.compare()
+    print(f"\nAll calls are over. The logs have {result.frames} frames and {result.calls} calls; "
+          + ("the store has the same." if not result.differences else "\n".join(["the store differs:", *result.differences])))
+    return 1 if result.differences else 0
+
+
+def main():
+    parser = argparse.ArgumentParser(prog="scripts/fleet-demo", description=__doc__,
+                                     formatter_class=argparse.RawDescriptionHelpFormatter)
+    parser.add_argument("--trunks", type=int, default=8, metavar="N", help="3 to 200 (default: 8)")
+    options = parser.parse_args()
+    if not 3 <= options.trunks <= 200:
+        parser.error("--trunks must be 3 to 200")
+    if missing():
+        raise SystemExit(f"not installed: {', '.join(missing())}")
+    signal.signal(signal.SIGTERM, lambda *_: sys.exit(1))
+    os.environ["TZ"] = "UTC"
+    began = time.monotonic()
+    with tempfile.TemporaryDirectory(prefix="fleet-demo.") as folder:
+        with Fleet(folder, options.trunks, traffic, SITES) as fleet:
+            status = show(fleet, began)
+    print(f"Everything is taken down again, after {time.monotonic() - began:.0f} seconds.")
+    return status
+
+
+if __name__ == "__main__":
+    sys.exit(main())
