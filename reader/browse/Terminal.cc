@@ -80,6 +80,12 @@ File opened(int descriptor, const char* mode, bool takeTty) {
     return File(fdopen(file, mode));
 }
 
+// The terminal's description has been read.
+bool canPlaceCursor() {
+    const char* const sequence = tigetstr("cup");
+    return sequence != nullptr && *sequence != '\0';
+}
+
 constexpr struct {
     Ink ink;
     short color;
@@ -191,7 +197,8 @@ Terminal::Terminal(const Settings& settings) : held_(std::make_unique<Held>()) {
     tcgetattr(fileno(held_->out.get()), &modes);
     set_escdelay(escapeDelay);
     held_->screen.reset(newterm(nullptr, held_->out.get(), held_->in.get()));
-    if (held_->screen == nullptr) {
+    if (held_->screen == nullptr || !canPlaceCursor()) {
+        held_->screen.reset();
         const char* const name = std::getenv("TERM");
         throw FileError("browse cannot show screens on a terminal of the kind TERM=" +
                         std::string(name == nullptr ? "" : name));

@@ -194,7 +194,7 @@ class Browse(Folder):
         self.assertIn("cause 1 unallocated number", saved)
         self.assertNotIn("4957414501", saved)
 
-    def test_no_colours_where_the_user_wants_none(self):
+    def test_no_colours_where_the_user_or_the_terminal_has_none(self):
         for before, words in (("NO_COLOR=1", ""), ("", "--color never"), ("TERM=vt100", "")):
             with self.subTest(before + words):
                 self.begin(f"{words} {NET5}", before and f"env {before}")
@@ -204,15 +204,26 @@ class Browse(Folder):
                 self.keys("q")
                 self.shows("\nend")
 
-    def test_colours_are_used_otherwise(self):
-        self.begin(NET5)
-        self.shows("Calls: 6")
-        self.assertIsNotNone(re.search("\x1b\\[[0-9;]*3[0-7]m", self.screen("-e")))
-        self.keys("q")
-        self.ended()
+    def test_colours_are_those_that_every_terminal_with_colours_has(self):
+        for name in ("xterm", "linux", "screen-256color"):  # the first two have eight
+            with self.subTest(name):
+                self.begin(NET5, f"env TERM={name}")
+                self.shows("Calls: 6")
+                self.assertIsNotNone(re.search("\x1b\\[[0-9;]*3[0-7]m", self.screen("-e")))
+                self.assertIsNone(re.search("\x1b\\[[0-9;]*(38;|9[0-7]m)", self.screen("-e")))
+                self.keys("q")
+                self.shows("\nend")
+
+    def test_a_terminal_without_screens_is_refused(self):
+        for name in ("dumb", "nonsense"):
+            with self.subTest(name):
+                self.begin(NET5, f"env TERM={name}")
+                self.shows(f"browse cannot show screens on a terminal of the kind TERM={name}")
+                self.assertIn("status 2", self.shows("\nend"))
 
     def test_ascii_where_the_locale_or_the_user_wants_it(self):
-        for before, words in (("LC_ALL=C", ""), ("", "--ascii")):
+        for before, words in (("LC_ALL=C", ""), ("-u LC_ALL LANG=C", ""), ("", "--ascii"),
+                              ("TERM=vt100 LC_ALL=C", "")):  # the last one, since it leaves its screen where it was
             with self.subTest(before + words):
                 self.begin(f"{words} {NET5}", before and f"env {before}")
                 self.shows("Calls: 6")
