@@ -1,7 +1,6 @@
 #include "reader/Contents.h"
 
 #include "isdn/Layer2.h"
-#include "isdn/Layer3.h"
 
 namespace reader {
 
@@ -14,6 +13,8 @@ void visit(const isdn::Fields& fields, isdn::Problem problem, ContentsVisitor& v
         visitor.problem(problem);
 }
 
+}  // namespace
+
 void visitMessage(const isdn::Layer3& message, isdn::Variant variant, ContentsVisitor& visitor) {
     visitor.heading(message.hasType ? isdn::messageName(message) : isdn::protocolName(message.discriminator));
     isdn::Fields fields;
@@ -21,8 +22,6 @@ void visitMessage(const isdn::Layer3& message, isdn::Variant variant, ContentsVi
     visit(fields, problem, visitor);
     visitElements(message.elements, variant, visitor);
 }
-
-}  // namespace
 
 void visitElements(const isdn::Elements& elements, isdn::Variant variant, ContentsVisitor& visitor) {
     isdn::Fields fields;

@@ -6,6 +6,7 @@
 #include <string_view>
 
 #include "isdn/Field.h"
+#include "isdn/Layer3.h"
 
 namespace reader {
 
@@ -26,6 +27,7 @@ class ContentsVisitor {
 
 // A frame from its address field on.
 void visitFrame(isdn::Octets octets, isdn::Variant variant, ContentsVisitor& visitor);
+void visitMessage(const isdn::Layer3& message, isdn::Variant variant, ContentsVisitor& visitor);
 // Elements, identifier first.
 void visitElements(const isdn::Elements& elements, isdn::Variant variant, ContentsVisitor& visitor);
 

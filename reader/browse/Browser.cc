@@ -98,6 +98,9 @@ void Browser::press(Key key) {
         if (!isUsed && key.code == Key::Code::escape && !opened_.empty())
             leave();
     }
+    if (key.code == Key::Code::home && opened_.empty() && trace_.frames().gone() != 0)
+        say("what came before frame " + grouped(trace_.frames().firstNumber()) +
+            " is not in memory any more: --frames N keeps more");
     if (mustClose_ && !opened_.empty())
         opened_.pop_back();
     mustClose_ = false;
@@ -176,7 +179,9 @@ void Browser::drawTop(Canvas& canvas) {
         canvas.put(at, 0, right, bar);
         canvas.put(x + 2, 0, safe(settings_.source), bar, at - 1);
     } else {
-        canvas.put(x + 1, 0, grouped(trace_.frames().end()), bar);
+        const std::uint64_t gone = trace_.frames().gone();
+        canvas.put(x + 1, 0,
+                   grouped(trace_.frames().end()) + (gone == 0 ? "" : ", " + grouped(gone) + " gone"), bar);
     }
 }
 

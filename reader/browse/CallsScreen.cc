@@ -73,6 +73,9 @@ std::string CallsScreen::title() const {
         title += ", by " + std::string(callOrders()[list_.order()].name);
     if (!desk().marked().calls.empty())
         title += ", " + std::to_string(desk().marked().calls.size()) + " marked";
+    if (trace().callsDropped() != 0)
+        title +=
+            ", let go before their end, since too many were alive: " + std::to_string(trace().callsDropped());
     if (isTyping_)
         title += "   /" + input_.text() + "_";
     else if (!list_.filter().empty())

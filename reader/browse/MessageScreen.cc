@@ -46,11 +46,14 @@ std::vector<std::string> itemsOf(std::string_view line) {
 // Makes rows of what a frame consists of.
 class MessageScreen::Rows : public ContentsVisitor {
   public:
-    Rows(std::vector<Row>& rows, std::span<const std::uint8_t> octets) : rows_(rows), octets_(octets) {}
+    // Views of fields are those of `octets`, which the screen keeps as this block.
+    Rows(std::vector<Row>& rows, std::span<const std::uint8_t> octets, std::size_t block)
+        : rows_(rows), octets_(octets), block_(block) {}
 
     void heading(std::string_view words) override {
         Row row;
         appendSafe(row.text, words);
+        row.block = block_;
         row.style = {Ink::title, true};
         rows_.push_back(std::move(row));
     }
@@ -60,6 +63,7 @@ class MessageScreen::Rows : public ContentsVisitor {
         Row row;
         row.begin = static_cast<std::size_t>(field.at.data() - octets_.data());
         row.size = field.at.size();
+        row.block = block_;
         appendSafe(row.text, field.octet);
         padTo(row.text, 0, octetColumn, true);
         row.text += ' ';
@@ -85,12 +89,13 @@ class MessageScreen::Rows : public ContentsVisitor {
         rows_.push_back(std::move(row));
     }
     void problem(isdn::Problem problem) override {
-        rows_.push_back({"     ** " + std::string(isdn::nameOf(problem)), {}, 0, 0, {Ink::error}});
+        rows_.push_back({"     ** " + std::string(isdn::nameOf(problem)), {}, 0, 0, block_, {Ink::error}});
     }
 
   private:
     std::vector<Row>& rows_;
     std::span<const std::uint8_t> octets_;
+    std::size_t block_;
 };
 
 MessageScreen::MessageScreen(Desk& desk, std::uint64_t frame, std::vector<std::uint64_t> frames)
@@ -101,7 +106,7 @@ MessageScreen::MessageScreen(Desk& desk, std::uint64_t frame, std::vector<std::u
 void MessageScreen::load(std::uint64_t frame) {
     frame_ = frame;
     rows_.clear();
-    octets_.clear();
+    blocks_ = {};
     headline_.clear();
     cursor_ = {};
     Shown shown;
@@ -115,10 +120,33 @@ void MessageScreen::load(std::uint64_t frame) {
     LineComposer({}, false).compose(seen, line, unused);
     line.pop_back();
     headline_ = itemsOf(line);
-    octets_.assign(seen.frame().octets.begin(), seen.frame().octets.end());
-    Rows rows(rows_, seen.frame().octets);
+    blocks_[0].assign(seen.frame().octets.begin(), seen.frame().octets.end());
+    Rows rows(rows_, seen.frame().octets, 0);
     if (seen.isFrame())
         visitFrame(seen.frame().octets, seen.variant, rows);
+    if (seen.hasMessage && seen.message.type == isdn::message::segment &&
+        seen.message.discriminator == isdn::callControl)
+        addJoined(seen.variant);
+}
+
+void MessageScreen::addJoined(isdn::Variant variant) {
+    auto joined = trace().joinedOf(frame_);
+    if (!joined) {
+        rows_.push_back({"The other segments of its message are not there.", {}, 0, 0, 0, {Ink::warning}});
+        return;
+    }
+    std::string words = "The message put together of frames ";
+    for (std::size_t i = 0; i < joined->frames.size(); ++i)
+        words += (i == 0 ? "" : ", ") + std::to_string(joined->frames[i]);
+    rows_.push_back({words, {}, 0, 0, 1, {Ink::title, true}});
+    blocks_[1] = std::move(joined->octets);
+    Rows rows(rows_, blocks_[1], 1);
+    visitMessage(isdn::parseLayer3(blocks_[1]), variant, rows);
+}
+
+// Those that stand beside the row under the cursor.
+const std::vector<std::uint8_t>& MessageScreen::shownOctets() const {
+    return blocks_[cursor_.line() < rows_.size() ? rows_[cursor_.line()].block : 0];
 }
 
 std::string MessageScreen::title() const {
@@ -149,7 +177,7 @@ void MessageScreen::draw(Canvas& canvas, const Area& area) {
         fields.width -= octetsWidth + 1;
         octets = {fields.x + fields.width + 1, fields.y, octetsWidth, fields.height};
     } else {
-        const int needed = (static_cast<int>(octets_.size()) + octetsInLine - 1) / octetsInLine;
+        const int needed = (static_cast<int>(shownOctets().size()) + octetsInLine - 1) / octetsInLine;
         const int given = std::min(needed, std::max(fields.height / 3, 1));
         fields.height -= given;
         octets = {fields.x, fields.y + fields.height, area.width, given};
@@ -176,26 +204,27 @@ void MessageScreen::draw(Canvas& canvas, const Area& area) {
 
 // Octets that the cursor's field stands in are reversed, and in brackets.
 void MessageScreen::drawOctets(Canvas& canvas, const Area& area) const {
+    const std::vector<std::uint8_t>& octets = shownOctets();
     const Row* const row = cursor_.line() < rows_.size() ? &rows_[cursor_.line()] : nullptr;
     const auto isLit = [&](std::size_t octet) {
         return row != nullptr && octet >= row->begin && octet < row->begin + row->size;
     };
     const int litLine = row == nullptr ? 0 : static_cast<int>(row->begin) / octetsInLine;
     const int top = std::max(0, std::min(litLine - area.height / 2,
-                                         static_cast<int>(octets_.size()) / octetsInLine + 1 - area.height));
+                                         static_cast<int>(octets.size()) / octetsInLine + 1 - area.height));
     for (int i = 0; i < area.height; ++i) {
         const auto begin = static_cast<std::size_t>(top + i) * std::size_t{octetsInLine};
-        if (begin >= octets_.size())
+        if (begin >= octets.size())
             break;
         const int y = area.y + i;
         std::string position;
         appendNumber(position, begin + 1);
         padTo(position, 0, positionWidth - 1, true);
         canvas.put(area.x, y, position + ":", {Ink::faint});
-        for (std::size_t at = begin; at < std::min(begin + octetsInLine, octets_.size()); ++at) {
+        for (std::size_t at = begin; at < std::min(begin + octetsInLine, octets.size()); ++at) {
             const int x = area.x + positionWidth + 3 * static_cast<int>(at - begin);
             std::string hex;
-            appendHex(hex, std::span(&octets_[at], 1));
+            appendHex(hex, std::span(&octets[at], 1));
             const bool lit = isLit(at);
             const Style style{Ink::plain, lit, lit};
             const bool begins = lit && (at == begin || !isLit(at - 1));

@@ -1,7 +1,9 @@
-// A frame: its fields in words beside its octets, those of the field under the cursor lit.
+// A frame: its fields in words beside its octets, those of the field under the cursor lit. A segment has the
+// message that it belongs to below it, with the octets of that.
 #ifndef READER_BROWSE_MESSAGESCREEN_H
 #define READER_BROWSE_MESSAGESCREEN_H
 
+#include <array>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -27,20 +29,23 @@ class MessageScreen : public Screen {
         std::string text{};
         std::vector<std::string> words{};  // the whole of it, where it stands, and the clause
         std::size_t begin = 0;
-        std::size_t size = 0;  // octets of the frame; 0: none
+        std::size_t size = 0;   // octets of the block; 0: none
+        std::size_t block = 0;  // which of blocks_ it stands in
         Style style{};
     };
     class Rows;
 
     void load(std::uint64_t frame);
+    void addJoined(isdn::Variant variant);
     void step(bool forward);
+    const std::vector<std::uint8_t>& shownOctets() const;
     void drawOctets(Canvas& canvas, const Area& area) const;
 
     std::uint64_t frame_ = 0;
     std::vector<std::uint64_t> frames_;
     std::vector<std::string> headline_;
     std::vector<Row> rows_;
-    std::vector<std::uint8_t> octets_;
+    std::array<std::vector<std::uint8_t>, 2> blocks_;  // the frame; the message put together of segments
     bool isThere_ = false;
     Cursor cursor_;
     int rowsTop_ = 0;

@@ -1,9 +1,11 @@
 #include "reader/browse/Trace.h"
 
 #include <algorithm>
+#include <array>
 #include <utility>
 
 #include "calls/Segments.h"
+#include "isdn/values.h"
 
 namespace reader::browse {
 
@@ -34,6 +36,18 @@ calls::Message messageIn(const Seen& seen) {
     message.layer3 = seen.message;
     message.variant = seen.variant;
     return message;
+}
+
+// Puts a line in front that says how many messages are not kept any more.
+void sayGone(CallLadder& ladder, std::size_t gone) {
+    if (gone == 0)
+        return;
+    Rung words;
+    words.kind = Rung::Kind::words;
+    if (!ladder.rungs.empty())
+        words.at = ladder.rungs.front().at;
+    words.name = "messages before this, not in memory any more: " + std::to_string(gone);
+    ladder.rungs.insert(ladder.rungs.begin(), std::move(words));
 }
 
 // Puts messages together that came in segments.
@@ -138,9 +152,17 @@ std::span<const CallFrame> Trace::framesOf(std::uint64_t call) const {
     return found == framesOf_.end() ? std::span<const CallFrame>() : std::span(found->second);
 }
 
+// How many of them, at their beginning, are not kept any more.
+std::size_t Trace::countGone(std::span<const CallFrame> frames) const {
+    const CallFrame oldest{0, frames_.firstNumber(), false};
+    return static_cast<std::size_t>(std::lower_bound(frames.begin(), frames.end(), oldest, isBefore) -
+                                    frames.begin());
+}
+
 // The call's own, the RESTARTs meanwhile, and what tells of links (with call 0 and carried), in order.
 std::vector<CallFrame> Trace::framesForLadder(const calls::Call& call) const {
-    const std::span<const CallFrame> own = framesOf(call.number);
+    std::span<const CallFrame> own = framesOf(call.number);
+    own = own.subspan(countGone(own));
     std::vector<CallFrame> all(
         own.begin(), own.begin() + static_cast<std::ptrdiff_t>(std::min(own.size(), Ladders::mostOfACall)));
     if (all.empty())
@@ -191,7 +213,9 @@ CallLadder Trace::ladderOf(const calls::Call& call, TimeText& times) const {
     }
     if (done != 0 && call.endedBy == calls::EndedBy::open)
         takeLinks(done, frames_.end());
-    return ladders.take(call, times);
+    CallLadder ladder = ladders.take(call, times);
+    sayGone(ladder, countGone(framesOf(call.number)));
+    return ladder;
 }
 
 std::vector<ComparedMessage> Trace::messagesOf(const calls::Call& call) const {
@@ -212,6 +236,33 @@ std::vector<ComparedMessage> Trace::messagesOf(const calls::Call& call) const {
         messages.push_back(comparedMessage(message, *first, {}));
     }
     return messages;
+}
+
+std::optional<JoinedMessage> Trace::joinedOf(std::uint64_t frame) const {
+    calls::Segments segments;
+    std::array<std::vector<std::uint64_t>, 2> begun;  // frames of a message that is not complete, by side
+    Shown shown;
+    for (const CallFrame& each : framesOf(callOf(frame))) {
+        const auto place = frames_.placeOf(each.frame);
+        if (!place || !frames_.load(*place, shown) || !shown.seen().hasMessage)
+            continue;
+        calls::Message message = messageIn(shown.seen());
+        std::vector<std::uint64_t>& frames = begun[static_cast<std::size_t>(message.from())];
+        const auto header =
+            isdn::segmentHeader(message.layer3.elements.find(isdn::element::segmentedMessage));
+        const calls::Segments::Taken taken = segments.take(message);
+        if (taken == calls::Segments::Taken::no)
+            continue;
+        if (taken == calls::Segments::Taken::outOfOrder || (header && header->first))
+            frames.clear();
+        frames.push_back(each.frame);
+        if (taken != calls::Segments::Taken::complete)
+            continue;
+        if (std::find(frames.begin(), frames.end(), frame) != frames.end())
+            return JoinedMessage{{message.layer3.octets.begin(), message.layer3.octets.end()}, frames};
+        frames.clear();
+    }
+    return std::nullopt;
 }
 
 std::optional<ComparedMessage> Trace::messageOf(std::uint64_t frame) const {

@@ -24,6 +24,12 @@ struct Changes {
     bool findings = false;
 };
 
+// A message that came in segments, put together.
+struct JoinedMessage {
+    std::vector<std::uint8_t> octets;   // from the protocol discriminator on
+    std::vector<std::uint64_t> frames;  // that carried it, in their order
+};
+
 // Memory is bounded by that of the frames: calls and findings go with their last frame. Used on one thread.
 class Trace {
   public:
@@ -38,7 +44,7 @@ class Trace {
     const calls::Call* call(std::uint64_t number) const;
     // The number of the call that a frame belongs to; 0 if it is of none.
     std::uint64_t callOf(std::uint64_t frame) const;
-    // Of a call, in their order.
+    // Of a call, in their order; also those that are not kept any more.
     std::span<const CallFrame> framesOf(std::uint64_t call) const;
     // In the order in which they were certain, each with a number that counts from 0.
     const std::deque<calls::Finding>& findings() const { return findings_; }
@@ -49,12 +55,14 @@ class Trace {
     const std::string& error() const { return error_; }
     std::uint64_t callsDropped() const { return callsDropped_; }
 
-    // The call as a ladder, as far as its frames are kept.
+    // The call as a ladder, as far as its frames are kept; its first rung says how many are not.
     CallLadder ladderOf(const calls::Call& call, TimeText& times) const;
     // Its messages as the other side has accepted them.
     std::vector<ComparedMessage> messagesOf(const calls::Call& call) const;
     // A message alone; nothing of a frame that carries none.
     std::optional<ComparedMessage> messageOf(std::uint64_t frame) const;
+    // The message that a frame has a segment of; nothing if others of its segments are not kept.
+    std::optional<JoinedMessage> joinedOf(std::uint64_t frame) const;
 
     // Findings that are kept at most, and frames of one call that are known.
     static constexpr std::size_t mostFindings = 100'000;
@@ -63,6 +71,7 @@ class Trace {
   private:
     void takeFrame(const CallFrame& frame);
     std::vector<CallFrame> framesForLadder(const calls::Call& call) const;
+    std::size_t countGone(std::span<const CallFrame> frames) const;
     void prune(Changes& changes);
 
     FrameStore frames_;

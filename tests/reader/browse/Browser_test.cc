@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <fstream>
 #include <random>
 #include <string_view>
 
@@ -215,6 +216,43 @@ TEST(Browser, FramesThatAreLetGoAreSaidToBeGone) {
     // Calls go with their last frame.
     stage.press("Home");
     EXPECT_EQ(stage.line(1), "Calls: 0");
+    EXPECT_EQ(stage.line(23), "what came before frame 103 is not in memory any more: --frames N keeps more");
+    EXPECT_EQ(stage.drawn(50, 24).line(0), " Trunk [Calls] Findings  800, 102 gone");
+}
+
+TEST(Browser, ALadderSaysHowManyOfItsMessagesAreGone) {
+    // A call that outlives very many polls.
+    const std::string path = ::testing::TempDir() + "long-call.hex";
+    std::ofstream file(path);
+    file << "RX 2026-11-21T11:00:00Z 02010000080200010504038090a31803a98381\n"
+            "TX 2026-11-21T11:00:01Z 000100020802800102"
+            "1803a98381\n"
+            "TX 2026-11-21T11:00:02Z 0001020208028001"
+            "07\n";
+    for (int i = 0; i < 1200; ++i)
+        file << "RX 2026-11-21T11:00:03Z 02010105\n";
+    file << "RX 2026-11-21T11:00:09Z 0201020608020001450802"
+            "8090\n";
+    file.close();
+    Options options;
+    options.browse.frames = 20;
+    Stage stage(path, false, options);
+    stage.press("Enter");
+    const std::string screen = stage.screen();
+    EXPECT_NE(screen.find("| messages before this,  |"), std::string::npos) << screen;
+    EXPECT_NE(screen.find("| more: 3                |"), std::string::npos) << screen;
+    EXPECT_NE(screen.find("DISCONNECT"), std::string::npos) << screen;
+    EXPECT_EQ(screen.find("SETUP"), std::string::npos) << screen;
+}
+
+TEST(Browser, CallsThatWereLetGoAreCounted) {
+    Browser browser({});
+    Update update;
+    update.callsDropped = 7;
+    browser.apply(std::move(update));
+    Canvas canvas(80, 24);
+    browser.draw(canvas);
+    EXPECT_EQ(canvas.line(1), "Calls: 0, let go before their end, since too many were alive: 7");
 }
 
 TEST(Browser, FiltersOfTheCommandLineChooseCallsAndFindings) {
