@@ -16,8 +16,13 @@ const isDate = text => text.includes("T");
 const milliseconds = text => isDate(text) ? Date.parse(text) : Number(text) * 1000;
 const zone = text => text.slice(23);
 const dated = Boolean(data.from) && isDate(data.from);
-// One axis has one clock: that of the trace's beginning.
-const onClock = (list, key) => list.filter(row => row[key] && isDate(row[key]) === dated);
+// One axis has one clock: that of the trace's beginning. What is on another one stands in the tables only; a chart says how much.
+const notDrawn = {};
+function onClock(chart, list, key) {
+    const fitting = list.filter(row => row[key] && isDate(row[key]) === dated);
+    notDrawn[chart] = list.length - fitting.length;
+    return fitting;
+}
 
 function shift(offset) {
     const parts = /^([+-])(\d\d):(\d\d)$/.exec(offset);
@@ -64,7 +69,7 @@ const whole = {ticks: {precision: 0}};
 const distinct = list => [...new Set(list)];
 
 function use() {
-    const steps = onClock(rows("use"), "from");
+    const steps = onClock("use", rows("use"), "from");
     if (steps.length === 0)
         return null;
     const datasets = [];
@@ -129,7 +134,7 @@ function everyHour(list) {
 }
 
 function hours() {
-    const list = everyHour(onClock(rows("hours"), "hour"));
+    const list = everyHour(onClock("hours", rows("hours"), "hour"));
     if (list.length === 0)
         return null;
     const offset = dated ? shift(zone(data.from)) : 0;
@@ -145,7 +150,7 @@ function hours() {
 }
 
 function links() {
-    const events = onClock(rows("link_events"), "time");
+    const events = onClock("links", rows("link_events"), "time");
     if (events.length === 0)
         return null;
     const nameOf = row => row.tei ? `${row.dchannel}, TEI ${row.tei}` : row.dchannel;
@@ -155,6 +160,15 @@ function links() {
     }));
     return {type: "scatter", data: {datasets}, options: {scales: {
         x: timeAxis(), y: axis("", {type: "category", offset: true, labels: data.link_news})}}};
+}
+
+function sayWhatIsNotDrawn(figure, count) {
+    figure.querySelectorAll(":scope > .note").forEach(old => old.remove());
+    if (!count)
+        return;
+    const words = `Not in the chart, but in the table: ${count} ${count === 1 ? "row" : "rows"} without ` +
+                  (dated ? "a time of day." : "a time since the first frame.");
+    figure.querySelector("details").before(Object.assign(document.createElement("p"), {className: "note", textContent: words}));
 }
 
 const CHARTS = {use, causes, times, hours, links};
@@ -171,6 +185,7 @@ function draw() {
             continue;  // there are no numbers for it
         const config = make();
         canvas.parentElement.hidden = config === null;
+        sayWhatIsNotDrawn(canvas.closest("figure"), notDrawn[name]);
         if (config !== null) {
             Object.assign(config.options, {animation: false, maintainAspectRatio: false,
                                            plugins: {legend: {labels: {usePointStyle: true}}}});

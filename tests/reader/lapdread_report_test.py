@@ -29,10 +29,10 @@ def setUpModule():
     unittest.addModuleCleanup(browser.close)
 
 
-def figures(*words):
+def figures(*words, **more):
     """The tables of `stats`, each a list of rows."""
     tables = collections.defaultdict(list)
-    for line in output("stats", "--quiet", "--jsonl", "--over-time", *words).splitlines():
+    for line in output("stats", "--quiet", "--jsonl", "--over-time", *words, **more).splitlines():
         row = json.loads(line)
         tables[row["table"]].append(row)
     return tables
@@ -108,20 +108,15 @@ class EveryPage(Report):
         self.assertIn("no call whose beginning", browser.value("document.getElementById('summary').textContent"))
 
 
-class Charts(Report):
-    def test_have_the_numbers_of_stats(self):
-        # Median, 95 of 100, worst and mean of the times differ here.
-        varied = self.folder / "varied.hex"
-        varied.write_text(refused(50, lambda number: 10 + number * number % 900))
-        for path in [varied, *EXAMPLES.values(), *RECORDED]:
-            with self.subTest(path.name):
-                tables = figures(path)
-                browser.open(self.report(path))
-                self.check_use(tables["use"])
-                self.check_causes(tables["causes"])
-                self.check_times([row for row in tables["times"] if row["measure"] in SET_UP])
-                self.check_hours(tables["hours"])
-                self.check_links(tables["link_events"])
+class Drawn(Report):
+    """What charts have drawn, against the tables of `stats`."""
+
+    def check_charts(self, tables):
+        self.check_use(tables["use"])
+        self.check_causes(tables["causes"])
+        self.check_times([row for row in tables["times"] if row["measure"] in SET_UP])
+        self.check_hours(tables["hours"])
+        self.check_links(tables["link_events"])
 
     def check_use(self, rows):
         drawn = datasets("use")
@@ -171,6 +166,42 @@ class Charts(Report):
                            ".tables.link_events.map(row => row.time.includes('T') ? Date.parse(row.time) : 1000 * row.time)")
         self.assertEqual(points, sorted(zip(at, (row["event"] for row in rows))))
 
+
+class Charts(Drawn):
+    def test_have_the_numbers_of_stats(self):
+        # Median, 95 of 100, worst and mean of the times differ here.
+        varied = self.folder / "varied.hex"
+        varied.write_text(refused(50, lambda number: 10 + number * number % 900))
+        for path in [varied, *EXAMPLES.values(), *RECORDED]:
+            with self.subTest(path.name):
+                browser.open(self.report(path))
+                self.check_charts(figures(path))
+
+    def test_say_what_they_leave_out(self):
+        """An axis has one clock. Rows of another one are in the tables, and the chart says how many."""
+        dated = ("TX 2026-11-21T11:00:00Z 00017f\nRX 2026-11-21T11:00:00.008Z 000173\n"
+                 + refused(3))
+        counted = re.sub(r"2026-11-21T11:(..):(..)(\.\d+)?Z", lambda time: f"{60 * int(time[1]) + int(time[2])}{time[3] or '.0'}", dated)
+        (self.folder / "dated.hex").write_text(dated)
+        (self.folder / "counted.hex").write_text(counted)
+        notes = "[...document.querySelectorAll('#charts .note')].map(each => each.textContent)"
+        for paths, without in ((("dated.hex", "counted.hex"), "a time of day"),
+                               (("counted.hex", "dated.hex"), "a time since the first frame")):
+            tables = figures(*paths, cwd=self.folder)
+            browser.open(self.report(*paths, cwd=self.folder))
+            expected = []
+            for name, key in (("hours", "hour"), ("link_events", "time")):
+                count = sum(("T" in row[key]) != (without == "a time of day") for row in tables[name])
+                self.assertGreater(count, 0)
+                expected.append(f"Not in the chart, but in the table: {count} {'row' if count == 1 else 'rows'} without {without}.")
+            self.assertEqual(browser.value(notes), expected)
+            self.assertEqual(sum(datasets("hours")["calls begun by the peer"]), 3)
+            browser.value("window.dispatchEvent(new Event('beforeprint'))")  # draws all anew
+            self.assertEqual(browser.value(notes), expected)
+            self.assertEqual(browser.complaints(), [])
+        browser.open(self.report("dated.hex", cwd=self.folder))
+        self.assertEqual(browser.value(notes), [])
+
     def test_fill_the_hours_in_which_nothing_happened(self):
         lines = []
         for number, hour in enumerate((8, 11)):
@@ -185,7 +216,7 @@ class Charts(Report):
         self.assertEqual(datasets("hours")["failed"], [1, 0, 0, 1])
 
 
-class Tables(Report):
+class Tables(Drawn):
     def setUp(self):
         super().setUp()
         calls_speed.write(self.folder / "many.pcap", 171_000)
@@ -202,7 +233,7 @@ class Tables(Report):
     def status(self, table):
         return browser.value(f"document.querySelector('#{table} [role=status]').textContent")
 
-    def test_of_ten_thousand_calls_sort_and_search(self):
+    def test_of_ten_thousand_calls_sort_and_search_below_their_charts(self):
         calls = [json.loads(line) for line in
                  output("calls", "--quiet", "--jsonl", "many.pcap", cwd=self.folder).splitlines()]
         self.assertGreater(len(calls), 10_000)
@@ -223,6 +254,7 @@ class Tables(Report):
         self.assertEqual(len(column("calls", 0)), busy)
         self.search("calls", "no such words")
         self.assertEqual(column("calls", 0), [])
+        self.check_charts(figures("many.pcap", cwd=self.folder))
         self.assertEqual(browser.complaints(), [])
 
 
