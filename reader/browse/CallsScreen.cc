@@ -27,6 +27,12 @@ constexpr std::array hints{
     KeyHint{"u", "unmark", "Takes all marks away."},
 };
 
+constexpr std::array typingHints{
+    KeyHint{"Enter", "keep the filter", "Ends the filter; letters are keys again."},
+    KeyHint{"Esc", "no filter", "Takes the filter away."},
+    KeyHint{"Up Down", "move", "Move the cursor."},
+};
+
 // Columns in the order in which they find room, and the room that those take whose text has any length.
 constexpr std::array<std::string_view, 13> byImportance{
     "call", "start",    "calling > called", "outcome", "cleared by: cause", "channel",
@@ -83,7 +89,9 @@ std::string CallsScreen::title() const {
     return title;
 }
 
-std::span<const KeyHint> CallsScreen::keys() const { return hints; }
+std::span<const KeyHint> CallsScreen::keys() const {
+    return isTyping_ ? std::span<const KeyHint>(typingHints) : hints;
+}
 
 void CallsScreen::changed(const Changes& changes) { list_.changed(changes); }
 

@@ -179,20 +179,24 @@ class Browse(Folder):
 
     def test_a_call_is_found_and_saved_without_its_numbers(self):
         """The trial of the user's page: the call that failed, redacted, for the carrier."""
-        self.begin(NET5)
-        self.shows("Calls: 6")
+        self.begin(SOURCE / "examples/noon.pcap")
+        self.shows("Calls: 19")
         self.keys("/")
-        self.tmux("send-keys", "-l", "failed T08:00")
-        self.shows("Calls: 1 of 6")
-        self.keys("Enter", "w")
-        self.shows("call-5.pcapng")
-        self.keys("Tab", "Space", "Enter")
-        self.shows("redacted, to call-5.pcapng")
-        self.keys("q")
+        self.tmux("send-keys", "-l", "failed T12:")
+        self.shows("Calls: 2 of 19")
+        self.keys("Enter", "Enter")
+        self.shows("Ladder of call 12")
+        self.keys("w")
+        self.shows("call-12.pcapng")
+        self.keys("Tab", "Space")
+        self.shows("Redact: yes")
+        self.keys("Enter")
+        self.shows("redacted, to call-12.pcapng")
+        self.keys("Q")
         self.ended()
-        saved = output("calls", self.folder / "call-5.pcapng")
-        self.assertIn("cause 1 unallocated number", saved)
-        self.assertNotIn("4957414501", saved)
+        saved = output("calls", self.folder / "call-12.pcapng")
+        self.assertIn("cause 41 temporary failure, transit network", saved)
+        self.assertNotIn("03023125586", saved)
 
     def test_no_colours_where_the_user_or_the_terminal_has_none(self):
         for before, words in (("NO_COLOR=1", ""), ("", "--color never"), ("TERM=vt100", "")):
