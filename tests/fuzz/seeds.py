@@ -181,7 +181,12 @@ def inputs():
         b"0x01 0x05  Receive Ready", b"Hex Dump: ", b"02 01 01 05 "))
     oversized = (b"\nSat Nov 21 11:25:33 2026\nRX Frame: Time = 0.308\n"
                  b"Oversized frame, frame will not be interpreted \nFrame Error \n")
-    yield head + b"NET5 Switch \n" + received + sent + b"Enqueue Failed \nFrames Lost: 17 \n" + oversized
+    whole = head + b"NET5 Switch \n" + received + sent + b"Enqueue Failed \nFrames Lost: 17 \n" + oversized
+    yield whole
+    # As editors of other systems leave them: line ends of two octets, and a byte order mark.
+    yield whole.replace(b"\n", b"\r\n")
+    yield b"\xef\xbb\xbf" + whole
+    yield b"\xef\xbb\xbfTX 2026-11-21T11:25:33.3Z 00 01 7f\r\nRX 12.5 000173\r\n"
     yield head + b"Get iemsg failed \n" + received[:-9]
     yield received[30:] + b"stray\n" + sent + received + head + b"NI2 Switch \n"
 
