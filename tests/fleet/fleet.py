@@ -143,17 +143,29 @@ class Fleet:
             self._add(trunk.trace).start()
         for trunk in self.trunks:
             awaited(lambda: trunk.log.exists() or fail_if_ended(trunk.trace), f"the log of {trunk.name}")  # noqa: B023
+        self.start_stores()
+        self.start_carrying()
+
+    def start_carrying(self):
+        """What brings frames from the logs to the stores."""
+        for trunk in self.trunks:
             self._add(trunk.recorder).start()
         for site in self.engines.sites:
             own = [trunk for trunk in self.trunks if trunk.site == site]
             self.shippers[site] = self._add(Process(f"lapdship.{site}", [program("lapdship"), "-c",
                                                                          self._toml(site, "shipper", own)], self.folder)).start()
+
+    def start_stores(self):
         authority, certificate, key = self.engines.certificate("store")
         nats = [word for server in self.engines.servers() for word in ("--nats", server)]
         words = [program("lapdstore"), "--database", self.url("lapdstore"), *nats, "--authority", authority, "--certificate",
                  certificate, "--key", key, "--again-after", "5"]
         for number in range(1, self._plan[2] + 1):
             self.stores.append(self._add(Process(f"lapdstore.{number}", words, self.folder)).start())
+
+    def leased(self):
+        """How many partitions of the stream are leased to a store."""
+        return len(self.engines.sql("SELECT 1 FROM pg_locks WHERE locktype = 'advisory' AND granted AND objid < 64"))
 
     # Ending it, and what came of it.
 
