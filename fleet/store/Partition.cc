@@ -52,6 +52,15 @@ bool isAboutData(const pqxx::sql_error& error) {
     return error.sqlstate().starts_with("22") || error.sqlstate().starts_with("23");
 }
 
+// A server may be set up to say "committed" before the transaction is in its log. If it is killed then, what
+// was acknowledged to the stream is gone.
+void commitForGood(pqxx::connection_base& connection) {
+    pqxx::nontransaction work(connection);
+    work.exec(
+        "SELECT set_config('synchronous_commit', 'on', false) "
+        "WHERE current_setting('synchronous_commit') = 'off'");
+}
+
 Parcel parcelOf(const Letter& letter, unsigned partition) {
     const Subject subject = subjectIn(letter.subject);
     Parcel parcel = parcelIn(letter.text);
@@ -78,6 +87,7 @@ Partition::Partition(pqxx::connection_base& connection, unsigned partition, Step
     framesTable().prepare(connection);
     callsTable().prepare(connection);
     findingsTable().prepare(connection);
+    commitForGood(connection);
 }
 
 std::vector<DeadLetter> Partition::take(std::span<const Letter> letters) {

@@ -321,6 +321,20 @@ TEST_F(Store_, LetsWritersAddAndReadersReadAndNothingElse) {
         refuses(reader, sql);
 }
 
+// A letter that is acknowledged must survive a server that is killed.
+TEST_F(Store_, CommitsForGoodWhereTheServerWouldNotWait) {
+    struct Row {
+        std::string configured;
+        std::string expected;
+    };
+    for (const Row& row : {Row{"off", "on"}, Row{"on", "on"}, Row{"remote_apply", "remote_apply"}}) {
+        pqxx::connection connection(url());
+        pqxx::nontransaction(connection).exec("SET synchronous_commit = " + row.configured);
+        const Partition partition(connection, 0);
+        EXPECT_EQ(pqxx::nontransaction(connection).exec1("SHOW synchronous_commit")[0].c_str(), row.expected);
+    }
+}
+
 TEST_F(Store_, LendsAPartitionToOneConnectionUntilThatEnds) {
     auto first = std::make_unique<pqxx::connection>(url());
     pqxx::connection second(url());
