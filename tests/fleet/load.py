@@ -3,12 +3,14 @@
     scripts/fleet-load [--trunks 8] [--frames 25000] [--rate 5000] [--seconds 20]
 
 First, logs that are there already: once the stores have their leases, recorders and shippers are started, and the time is
-taken until the last frame is a row, with its calls and findings. Then the logs grow by `--rate` frames a second, all together, and four times a second it is
-looked up when the newest frame that is stored was written. Everything, engines included, runs on this machine, with
-certificates, and three copies of the stream.
+taken until the last frame is a row, with its calls and findings; and how long each kind of program has worked, which is
+the same on a busy machine. Then the logs grow by `--rate` frames a second, all together, and four times a second it is looked
+up when the newest frame that is stored was written. Everything, engines included, runs on this machine, with certificates,
+and three copies of the stream.
 """
 
 import argparse
+import contextlib
 import itertools
 import os
 import pathlib
@@ -60,14 +62,32 @@ class WrittenFleet(Fleet):
         return int(self.engines.sql("SELECT count(*) FROM lapd.frames")[0][0])
 
 
+def processor_seconds(fleet):
+    """What each kind of program has worked so far, with the processes that it has made."""
+    ticks, parents = {}, {}
+    for path in pathlib.Path("/proc").glob("[0-9]*/stat"):
+        with contextlib.suppress(OSError):
+            fields = path.read_text().rsplit(") ", 1)[1].split()
+            pid = int(path.parent.name)
+            parents[pid], ticks[pid] = int(fields[1]), int(fields[11]) + int(fields[12])
+    kinds = {"lapdread record": [trunk.recorder for trunk in fleet.trunks], "lapdship": fleet.shippers.values(),
+             "nats-server": fleet.engines.nats.values(), "lapdstore": fleet.stores, "PostgreSQL": [fleet.engines.database]}
+    worked = {}
+    for kind, processes in kinds.items():
+        pids = {each.pid for each in processes if each.is_running()}
+        worked[kind] = sum(each for pid, each in ticks.items() if pid in pids or parents[pid] in pids) / os.sysconf("SC_CLK_TCK")
+    return worked
+
+
 def from_logs_to_rows(fleet, frames):
-    """Seconds."""
+    """Seconds that passed, and those that each kind of program has worked."""
     fleet.start_stores()
     awaited(lambda: fleet.leased() == PARTITIONS, "the leases")
-    began = time.monotonic()
+    before, began = processor_seconds(fleet), time.monotonic()
     fleet.start_carrying()
     awaited(lambda: fleet.count() >= frames, "the frames of the logs", 20 * LIMIT)
-    return time.monotonic() - began
+    took, after = time.monotonic() - began, processor_seconds(fleet)
+    return took, {kind: after[kind] - before[kind] for kind in after}
 
 
 def while_logs_grow(fleet, pieces, rate, seconds):
@@ -113,8 +133,11 @@ def main():
         print(f"{options.trunks} trunks, {each} frames each, {len(log) * options.trunks / 1e6:.0f} MB of logs; "
               f"{os.cpu_count()} processors, load {os.getloadavg()[0]:.1f}", flush=True)
         with WrittenFleet(folder, options.trunks, log) as fleet:
-            took = from_logs_to_rows(fleet, frames)
-            print(f"from written logs to rows: {took:.1f} s, {frames / took:.0f} frames a second", flush=True)
+            took, worked = from_logs_to_rows(fleet, frames)
+            print(f"from written logs to rows: {took:.1f} s, {frames / took:.0f} frames a second")
+            print("processor time for a frame: " + ", ".join(f"{kind} {seconds / frames * 1e6:.0f} us" for kind, seconds
+                                                             in worked.items())
+                  + f"; in all {sum(worked.values()) / frames * 1e6:.0f} us", flush=True)
             head, pieces = blocks(log)
             late, rate, rest = while_logs_grow(fleet, pieces, options.rate, options.seconds)
             late.sort()
