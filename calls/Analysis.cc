@@ -71,6 +71,9 @@ struct Analysis::Channel {
         Segments& pieces = segments[message.layer2.tei];
         expireSegments(message.at, timers);
         const Segments::Taken taken = pieces.take(message);
+        if (const auto replaced = pieces.replaced())
+            reportSegments(replaced->moment, replaced->from, replaced->moment.at, keeper.witness(),
+                           "the message that began in SEGMENT was not completed before the next one began");
         if (taken == Segments::Taken::kept) {
             segmentsDue = std::min(segmentsDue, message.at + timers.t314 + timers.slack);
             carriers.take(message, links.marks(), group.table(), group.carried());

@@ -120,7 +120,10 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
 
     // cppcheck-suppress CastIntegerToAddressAtReturn; it takes the pointer for a number
     const LinkWitness* witness(std::uint8_t tei) const override { return links_[tei & 127U]; }
-    void report(Finding finding) override { listener_.found(finding); }
+    void report(Finding finding) override {
+        patterns_.linkFault(finding, now_);
+        listener_.found(finding);
+    }
 
   private:
     // The calls of a group are signalled on one of its D channels at a time.

@@ -63,6 +63,7 @@ void CallFindings::heard(Call& call, const Message& message) {
     checkDigits(call, notes, message);
     checkCause(&call, message);
     checkStatus(call, notes, message);
+    demandChannel(call, notes, message);
     checkChannel(call, notes, message);
     notes.cleared = notes.cleared || isClearing(message.layer3.type);
 }
@@ -146,6 +147,22 @@ void CallFindings::checkDigits(const Call& call, Notes& notes, const Message& me
                nameOf(message) + " came " + std::to_string(waited / second) + " s after the last digit");
     if (goesOn)
         notes.acknowledged = false;
+}
+
+// The network names the channel in its first answer, unless the user has demanded one (Q.931 5.1.2, tables
+// 3-2 to 3-16). A SETUP that names none may be that of a connection without a B channel.
+void CallFindings::demandChannel(const Call& call, Notes& notes, const Message& message) {
+    constexpr std::array answers{type::setupAcknowledge, type::callProceeding, type::alerting, type::connect};
+    const bool isAnswer = message.from() != call.origin && message.sender() == isdn::Sender::network &&
+                          std::find(answers.begin(), answers.end(), message.layer3.type) != answers.end();
+    if (!isAnswer || std::exchange(notes.channelDemanded, true))
+        return;
+    using Selection = isdn::ChannelId::Selection;
+    const bool leavesChoice = call.asked && !call.asked->exclusive && !call.asked->dChannel &&
+                              call.asked->selection != Selection::none;
+    if (leavesChoice && !call.granted && !call.incomplete && call.kind == Kind::call)
+        report(findings::elementAbsent, &call, message,
+               nameOf(message) + " answers SETUP first and has no CHANNEL IDENTIFICATION");
 }
 
 // Only a SETUP that says "no other channel" is contradicted by another one.

@@ -33,13 +33,15 @@ class CallFindings : public CallObserver {
         bool sendingComplete = false;
         bool cleared = false;  // a clearing message has passed
         bool channelChecked = false;
-        std::int64_t lastDigit = 0;  // when the last digit, SETUP or SETUP ACKNOWLEDGE passed
+        bool channelDemanded = false;  // the other side has answered SETUP
+        std::int64_t lastDigit = 0;    // when the last digit, SETUP or SETUP ACKNOWLEDGE passed
     };
 
     void checkElements(const Call* call, const Message& message, bool clearsFirst);
     void checkCause(const Call* call, const Message& message);
     void checkStatus(const Call& call, Notes& notes, const Message& message);
     void checkDigits(const Call& call, Notes& notes, const Message& message);
+    void demandChannel(const Call& call, Notes& notes, const Message& message);
     void checkChannel(const Call& call, Notes& notes, const Message& message);
     void report(const FindingKind& kind, const Call* call, const Message& message, std::string sentence);
 

@@ -44,7 +44,7 @@ struct Finding {
     std::optional<std::uint64_t> call;  // the call's number, if the finding is about a call
     std::string sentence;               // what happened, with the values of this case; no full stop
     std::uint32_t count = 1;            // how many occurrences this finding stands for
-    std::vector<std::string> channels;  // the B channels that the finding calls stuck: "7", "2/7"
+    std::vector<std::string> channels;  // the B channels that it names, if any: "7", "2/7"
 };
 
 }  // namespace calls

@@ -18,19 +18,41 @@ constexpr std::size_t mostHistories = 4096;
 constexpr std::int64_t stormWindow = 600 * second;
 constexpr std::size_t stormAbove = 3;
 constexpr std::int64_t servicePatience = 120 * second;
+// A storm passes over the channels one after another; those that it reaches within this time are told as one.
+constexpr std::int64_t stormPasses = 10 * second;
+constexpr std::int64_t never = std::numeric_limits<std::int64_t>::max();
 constexpr std::uint32_t wholeInterface = 1000;  // stands for a restart of class 6 or 7 among channel numbers
 
 std::size_t indexOf(Side side) { return static_cast<std::size_t>(side); }
 
 std::string_view nameOf(Side side) { return side == Side::us ? "us" : "the peer"; }
 
-std::string listOf(const std::bitset<128>& channels) {
-    std::string list;
-    for (std::size_t i = 0; i < channels.size(); ++i) {
+std::string restartedTooOften(Side asker) {
+    return " restarted more than 3 times in 10 minutes by " + std::string(nameOf(asker));
+}
+
+GatheredFindings::Sentence unacknowledged(std::string_view messages, Side asker) {
+    return [messages, asker](const Finding&, const std::string& channels) {
+        return std::string(messages) + " of " + std::string(nameOf(asker)) + " got no acknowledge" +
+               (channels.empty() ? "" : ": " + channels);
+    };
+}
+
+std::vector<ChannelKey> keysOf(const std::optional<std::uint32_t>& interface,
+                               const std::bitset<128>& channels) {
+    std::vector<ChannelKey> keys;
+    for (std::uint32_t i = 0; i < channels.size(); ++i) {
         if (channels.test(i))
-            list += (list.empty() ? "" : ", ") + std::to_string(i);
+            keys.push_back({interface, i});
     }
-    return list;
+    return keys;
+}
+
+std::vector<std::string> namesOf(const std::vector<ChannelKey>& channels) {
+    std::vector<std::string> names;
+    for (const ChannelKey& each : channels)
+        names.push_back(toString(each));
+    return names;
 }
 
 isdn::Element changeStatusOf(const Message& message) {
@@ -45,18 +67,26 @@ std::optional<isdn::ChannelId> channelIn(const Message& message) {
 }  // namespace
 
 std::vector<ChannelKey> channelsOf(const std::optional<isdn::ChannelId>& channel) {
-    std::vector<ChannelKey> keys;
-    for (std::uint32_t i = 0; channel && i < channel->channels.size(); ++i) {
-        if (channel->channels.test(i))
-            keys.push_back({channel->interface, i});
-    }
-    return keys;
+    return channel ? keysOf(channel->interface, channel->channels) : std::vector<ChannelKey>();
 }
 
 std::string toString(const ChannelKey& channel) {
     return (channel.interface ? std::to_string(*channel.interface) + "/" : std::string()) +
            std::to_string(channel.number);
 }
+
+Maintenance::Told::Told(FindingSink& sink, Side asker)
+    : restarts(sink, unacknowledged("RESTARTs", asker)),
+      services(sink, unacknowledged("SERVICEs", asker)),
+      storms(sink, [asker](const Finding&, const std::string& channels) {
+          return (channels.empty() ? "the interface was" : channels + " were") + restartedTooOften(asker);
+      }) {}
+
+Maintenance::Maintenance(const Timers& timers, const LinkWitnesses& links, FindingSink& sink)
+    : timers_(timers),
+      sink_(sink),
+      told_{Told(sink, Side::us), Told(sink, Side::peer)},
+      verdicts_(timers, links, sink) {}
 
 void Maintenance::take(const Message& message) {
     const isdn::Layer3& layer3 = message.layer3;
@@ -89,8 +119,9 @@ void Maintenance::restart(const Message& message) {
 void Maintenance::ask(const Message& message, const Target& target, bool isService) {
     for (Asked& each : asked_) {
         if (each.service == isService && each.target == target && each.asker == message.from()) {
-            ++each.repetitions;
             each.last = momentOf(message);
+            if (++each.repetitions == 1)
+                each.due = dueAfterRepetition(each);
             return;
         }
     }
@@ -99,22 +130,29 @@ void Maintenance::ask(const Message& message, const Target& target, bool isServi
     if (asked_.size() >= mostAsked)
         asked_.erase(asked_.begin());
     const capture::Interface* const interface = message.frame->interface;
+    const Moment now = momentOf(message);
     asked_.push_back({isService, target, message.from(), message.layer2.tei,
-                      interface == nullptr ? std::string() : interface->name, momentOf(message),
-                      momentOf(message), 0});
+                      interface == nullptr ? std::string() : interface->name, now, now, 0,
+                      isService ? never : now.at + 2 * timers_.t316 + timers_.slack});
+}
+
+// The first repetition decides: a side that repeats for ever gets its finding all the same.
+std::int64_t Maintenance::dueAfterRepetition(const Asked& asked) const {
+    const std::int64_t due = asked.service
+                                 ? asked.first.at + servicePatience
+                                 : std::max(asked.first.at + 2 * timers_.t316, asked.last.at + timers_.t316);
+    return due + timers_.slack;
 }
 
 // Counts a restart of a channel that is no repetition, so an acknowledgement has come in between.
 void Maintenance::countRestart(const Message& message, const Target& target) {
     std::vector<ChannelKey> keys;
-    for (std::uint32_t i = 0; target.kind == 0 && i < target.channels.size(); ++i) {
-        if (target.channels.test(i))
-            keys.push_back({target.interface, i});
-    }
+    if (target.kind == 0)
+        keys = keysOf(target.interface, target.channels);
     if (keys.empty())
         keys.push_back({target.interface, wholeInterface + target.kind});
     bool storm = false;
-    std::string which;
+    std::vector<std::string> channels;
     for (const ChannelKey& key : keys) {
         if (restarts_.size() >= mostHistories && !restarts_.contains({message.from(), key}))
             continue;
@@ -125,14 +163,18 @@ void Maintenance::countRestart(const Message& message, const Target& target) {
         if (times.size() <= stormAbove)
             continue;
         storm = true;
-        which = key.number >= wholeInterface ? "the interface" : "channel " + toString(key);
+        if (key.number < wholeInterface)
+            channels.push_back(toString(key));
         while (times.size() > 1)  // reported once; then the count begins again
             times.pop_front();
     }
-    if (storm)
-        sink_.report(findingOf(findings::restartStorm, message, nullptr,
-                               which + " was restarted more than 3 times in 10 minutes by " +
-                                   std::string(nameOf(message.from()))));
+    if (!storm)
+        return;
+    Finding finding = findingOf(findings::restartStorm, message, nullptr,
+                                (channels.empty() ? "the interface" : "channel " + listOf(channels)) +
+                                    " was" + restartedTooOften(message.from()));
+    finding.channels = std::move(channels);
+    toldOf(message.from()).storms.report(std::move(finding));
 }
 
 void Maintenance::restartAcknowledge(const Message& message) {
@@ -148,8 +190,9 @@ void Maintenance::restartAcknowledge(const Message& message) {
     if (kind == 0 && channel) {
         const std::bitset<128> missing = found->target.channels & ~channel->channels;
         if (missing.any())
-            sink_.report(findingOf(findings::restartPartly, message, nullptr,
-                                   "RESTART ACKNOWLEDGE lacks channel " + listOf(missing)));
+            sink_.report(
+                findingOf(findings::restartPartly, message, nullptr,
+                          "RESTART ACKNOWLEDGE lacks channel " + listOf(namesOf(keysOf({}, missing)))));
     }
     asked_.erase(found);
 }
@@ -184,36 +227,68 @@ void Maintenance::serviceAcknowledge(const Message& message) {
     });
 }
 
-std::int64_t Maintenance::dueAt(const Asked& asked) const {
-    if (asked.service)
-        return asked.repetitions == 0 ? std::numeric_limits<std::int64_t>::max()
-                                      : asked.first.at + servicePatience + timers_.slack;
-    return (asked.repetitions == 0 ? asked.first.at + 2 * timers_.t316 : asked.last.at + timers_.t316) +
-           timers_.slack;
-}
-
 void Maintenance::advance(std::int64_t at) {
+    for (Told& told : told_) {
+        for (GatheredFindings* const gathered : {&told.restarts, &told.services, &told.storms})
+            gathered->advance(at);
+    }
     for (std::size_t i = 0; i < asked_.size();) {
-        if (at <= dueAt(asked_[i])) {
+        if (at <= asked_[i].due) {
             ++i;
             continue;
         }
-        expire(asked_[i], dueAt(asked_[i]) - timers_.slack);
+        expire(asked_[i]);
         asked_.erase(asked_.begin() + static_cast<std::ptrdiff_t>(i));
     }
-    constexpr std::int64_t never = std::numeric_limits<std::int64_t>::max();
     verdicts_.advance(at, asked_.empty() ? never : asked_.front().first.at);
+    completeTold(at);
 }
 
-void Maintenance::expire(const Asked& asked, std::int64_t until) {
+void Maintenance::expire(const Asked& asked) {
     if (asked.service && !acknowledgesService_[indexOf(other(asked.asker))])
         return;
     const FindingKind& kind =
         asked.service ? findings::serviceUnacknowledged : findings::restartUnacknowledged;
-    std::string what = std::string(asked.service ? "SERVICE" : "RESTART") + " of frame " +
-                       std::to_string(asked.first.frame) + " got no acknowledge";
-    verdicts_.judge({findingOf(kind, asked.last, asked.dChannel, std::move(what)), asked.tei, asked.asker,
-                     other(asked.asker), asked.first.frame, asked.first.at, until});
+    Finding finding = findingOf(kind, asked.last, asked.dChannel,
+                                std::string(asked.service ? "SERVICE" : "RESTART") + " of frame " +
+                                    std::to_string(asked.first.frame) + " got no acknowledge");
+    finding.channels = namesOf(keysOf(asked.target.interface, asked.target.channels));
+    if (!finding.channels.empty())
+        finding.sentence += ": channel " + listOf(finding.channels);
+    Told& told = toldOf(asked.asker);
+    verdicts_.judge({std::move(finding), asked.tei, asked.asker, other(asked.asker), asked.first.frame,
+                     asked.first.at, asked.due - timers_.slack,
+                     asked.service ? &told.services : &told.restarts});
+}
+
+// Questions that were asked before the first of them was overdue belong together. They are complete when none
+// of them waits any more.
+bool Maintenance::isComplete(const GatheredFindings& gathered, Side asker, bool service) const {
+    return gathered.since() && !verdicts_.isHolding() &&
+           std::none_of(asked_.begin(), asked_.end(), [&](const Asked& each) {
+               return each.service == service && each.asker == asker && each.due != never &&
+                      each.first.at <= *gathered.since();
+           });
+}
+
+void Maintenance::completeTold(std::int64_t at) {
+    for (const Side asker : {Side::us, Side::peer}) {
+        Told& told = toldOf(asker);
+        if (isComplete(told.restarts, asker, false))
+            told.restarts.complete();
+        if (isComplete(told.services, asker, true))
+            told.services.complete();
+        if (const auto since = told.storms.since(); since && at - *since > stormPasses)
+            told.storms.complete();
+    }
+}
+
+void Maintenance::finish() {
+    verdicts_.finish();
+    for (Told& told : told_) {
+        for (GatheredFindings* const gathered : {&told.restarts, &told.services, &told.storms})
+            gathered->finish();
+    }
 }
 
 void Maintenance::boardRestarted() {

@@ -16,6 +16,7 @@
 
 #include "calls/Call.h"
 #include "calls/FindingSink.h"
+#include "calls/GatheredFindings.h"
 #include "calls/LinkWitness.h"
 #include "calls/Message.h"
 #include "calls/Timers.h"
@@ -39,15 +40,14 @@ enum class Service : std::uint8_t { in, maintenance, out };
 
 class Maintenance {
   public:
-    Maintenance(const Timers& timers, const LinkWitnesses& links, FindingSink& sink)
-        : timers_(timers), sink_(sink), verdicts_(timers, links, sink) {}
+    Maintenance(const Timers& timers, const LinkWitnesses& links, FindingSink& sink);
 
     // Takes every message, and passes over those that are not RESTART, SERVICE or their answers.
     void take(const Message& message);
     // The clock has come to `at`. Call this before handing in what happened at that time.
     void advance(std::int64_t at);
     // The end of the trace. Timers that run are void.
-    void finish() { verdicts_.finish(); }
+    void finish();
     // The board restarted: whether an answer came is not known.
     void boardRestarted();
 
@@ -74,6 +74,12 @@ class Maintenance {
         Moment first;
         Moment last;
         unsigned repetitions = 0;
+        std::int64_t due = 0;  // when the answer is overdue; never, unless somebody waits for it
+    };
+    // What is told of one side's questions. Those that waited together have one cause.
+    struct Told {
+        Told(FindingSink& sink, Side asker);
+        GatheredFindings restarts, services, storms;
     };
 
     void restart(const Message& message);
@@ -82,11 +88,15 @@ class Maintenance {
     void serviceAcknowledge(const Message& message);
     void ask(const Message& message, const Target& target, bool isService);
     void countRestart(const Message& message, const Target& target);
-    std::int64_t dueAt(const Asked& asked) const;
-    void expire(const Asked& asked, std::int64_t until);
+    std::int64_t dueAfterRepetition(const Asked& asked) const;
+    void expire(const Asked& asked);
+    Told& toldOf(Side asker) { return told_[static_cast<std::size_t>(asker)]; }
+    void completeTold(std::int64_t at);
+    bool isComplete(const GatheredFindings& gathered, Side asker, bool service) const;
 
     const Timers& timers_;
     FindingSink& sink_;
+    std::array<Told, 2> told_;
     Verdicts verdicts_;
     std::vector<Asked> asked_;  // at most `mostAsked`, the oldest first
     std::array<bool, 2> acknowledgesService_{};

@@ -4,6 +4,8 @@
 #include <limits>
 #include <set>
 
+#include "calls/FindingKinds.h"
+
 namespace calls {
 
 namespace {
@@ -14,6 +16,12 @@ constexpr std::int64_t hour = 3600 * second;
 constexpr std::uint32_t lastOfT1 = 24;
 constexpr std::uint32_t dChannelOfE1 = 16;
 constexpr std::uint32_t lastOfE1 = 31;
+
+// Times in a damaged capture may lie at the end of what the numbers can hold; a sum stops there.
+std::int64_t later(std::int64_t time, std::int64_t by) {
+    constexpr std::int64_t endOfTime = std::numeric_limits<std::int64_t>::max();
+    return time > endOfTime - by ? endOfTime : time + by;
+}
 
 std::int64_t hoursIn(std::int64_t time) { return time >= 0 ? time / hour : (time + 1) / hour - 1; }
 
@@ -111,13 +119,11 @@ void Occupancy::end(const Call& call, const Moment& moment) {
 
 void Occupancy::stop(Group& group, Channel& channel, const Moment& moment) {
     const std::int64_t used = std::max<std::int64_t>(moment.at - channel.since.at, 0);
-    channel.used += used;
-    group.used += used;
+    channel.used = later(channel.used, used);
+    group.used = later(group.used, used);
     --group.inUse;
     group.overTime.set(moment, group.inUse);
-    constexpr std::int64_t endOfTime = std::numeric_limits<std::int64_t>::max();
-    const std::int64_t since = channel.since.time;
-    spread(channel.since, since > endOfTime - used ? endOfTime : since + used);
+    spread(channel.since, later(channel.since.time, used));
 }
 
 // Adds a time of use to the hours that it touches.
@@ -145,7 +151,9 @@ void Occupancy::ended(const Call& call) {
 
 void Occupancy::found(const Finding& finding) {
     const auto group = groupOf_.find(finding.dChannel);
-    if (group == groupOf_.end() || finding.channels.empty())
+    const bool tellsOfStuckOnes =
+        finding.kind == &findings::stuckChannel || finding.kind == &findings::massClear;
+    if (group == groupOf_.end() || !tellsOfStuckOnes)
         return;
     for (auto& [key, channel] : groups_[group->second].channels) {
         if (std::find(finding.channels.begin(), finding.channels.end(), toString(key)) !=
@@ -173,7 +181,7 @@ void Occupancy::finish(const std::vector<Span>& spans) {
             channel.usedAtEnd = true;
             Moment end = channel.since;
             end.at = std::max(until, channel.since.at);
-            end.time += end.at - channel.since.at;
+            end.time = later(end.time, end.at - channel.since.at);
             stop(group, channel, end);
         }
     }

@@ -23,6 +23,12 @@ constexpr std::int64_t burstWindow = 60 * second;
 constexpr std::int64_t burstSilence = 600 * second;
 constexpr std::size_t prefixDigits = 4;
 constexpr std::size_t mostFailures = 256;
+// Faults by which a link goes down; those that were reported this long before it did belong to it.
+constexpr std::array linkFaults{&findings::linkFlap,       &findings::sabmeUnanswered,
+                                &findings::linkRefused,    &findings::frameRejected,
+                                &findings::pollUnanswered, &findings::oneDirectionSilent};
+constexpr std::int64_t faultBefore = 60 * second;
+constexpr std::size_t mostFaults = 8;
 
 // Ordinary causes. Calls that end with one of them are not compared.
 bool isOrdinary(std::uint8_t cause) {
@@ -60,6 +66,15 @@ void Patterns::linkChanged(const Moment& moment, const std::string& dChannel, bo
     link_ = LinkChange{moment, dChannel, isUp};
 }
 
+void Patterns::linkFault(const Finding& fault, std::int64_t at) {
+    if (std::find(linkFaults.begin(), linkFaults.end(), fault.kind) == linkFaults.end())
+        return;
+    faults_.push_back(
+        {at, fault.dChannel, std::string(fault.kind->id) + " of frame " + std::to_string(fault.frame)});
+    if (faults_.size() > mostFaults)
+        faults_.pop_front();
+}
+
 // Whether the call ended because of its link: the link was down for too long, or one side cleared it when the
 // link went down or came up, and with a cause that is not ordinary.
 bool Patterns::endsWithLink(const Call& call) const {
@@ -72,16 +87,27 @@ bool Patterns::endsWithLink(const Call& call) const {
     return soon && !ordinary && call.endedBy != EndedBy::suspended && call.endedBy != EndedBy::replaced;
 }
 
+// What was reported of the link when it went down, or since.
+std::string Patterns::faultsOfLink() const {
+    std::vector<std::string> words;
+    for (const LinkFault& fault : faults_) {
+        if (fault.dChannel == link_->dChannel && fault.at >= link_->moment.at - faultBefore)
+            words.push_back(fault.words);
+    }
+    return listOf(words);
+}
+
 void Patterns::reportMassClear() {
     if (lost_.size() >= callsThatEndTogether) {
         std::vector<std::string> names;
         for (const std::uint64_t call : lost_)
             names.push_back(std::to_string(call));
+        std::string sentence = std::to_string(lost_.size()) + " calls ended with the link, which " +
+                               (link_->isUp ? "was set up" : "went down") + " here: " + listOf(names);
+        if (const std::string faults = faultsOfLink(); !faults.empty())
+            sentence += "; they follow from " + faults;
         stuck_.lostWithLink(
-            findingOf(findings::massClear, link_->moment, link_->dChannel,
-                      std::to_string(lost_.size()) + " calls ended with the link, which " +
-                          (link_->isUp ? "was set up" : "went down") + " here: " + listOf(names)),
-            lost_);
+            findingOf(findings::massClear, link_->moment, link_->dChannel, std::move(sentence)), lost_);
     }
     lost_.clear();
 }

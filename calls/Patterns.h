@@ -24,6 +24,8 @@ class Patterns : public CallObserver {
     void ended(Call& call, const Message* by) override;
     // A link went down, or was set up (again), in this frame.
     void linkChanged(const Moment& moment, const std::string& dChannel, bool isUp);
+    // A fault of a link was reported at `at`. A mass-clear that follows from it refers to it.
+    void linkFault(const Finding& fault, std::int64_t at);
     // The clock has come to `at`. Call this before handing in what happened at that time.
     void advance(std::int64_t at);
     // The end of the trace.
@@ -42,6 +44,7 @@ class Patterns : public CallObserver {
     static std::string detailsOf(const Failure& failure);
 
     bool endsWithLink(const Call& call) const;
+    std::string faultsOfLink() const;
     void reportMassClear();
     void findSameDuration(const Call& call);
     void findCauseBurst(const Call& call);
@@ -54,7 +57,14 @@ class Patterns : public CallObserver {
         bool isUp = false;
     };
 
+    struct LinkFault {
+        std::int64_t at = 0;
+        std::string dChannel;
+        std::string words;  // "sabme-unanswered of frame 12"
+    };
+
     std::optional<LinkChange> link_;      // the last change
+    std::deque<LinkFault> faults_;        // of links, the last few
     std::vector<std::uint64_t> lost_;     // numbers of the calls that ended with it, within a second
     std::int64_t lostAt_ = 0;             // when the first of them ended
     std::deque<std::int64_t> durations_;  // of the last answered calls

@@ -13,13 +13,12 @@ constexpr std::int64_t quiet = 600 * second;
 void RepeatedFindings::report(Finding finding, std::uint8_t tei, std::int64_t at) {
     const auto [place, isFirst] = repeats_.try_emplace(Key(finding.kind, finding.severity, tei), Repeats{at});
     Repeats& repeats = place->second;
+    finding.count += repeats.last ? repeats.last->count : 0;
     if (!isFirst && at - repeats.reported < quiet) {
-        finding.count = repeats.last ? repeats.last->count + 1 : 1;
         repeats.last = std::move(finding);
         return;
     }
-    if (std::optional<Finding> last = std::exchange(repeats.last, std::nullopt))
-        sink_->report(std::move(*last));
+    repeats.last.reset();
     repeats.reported = at;
     sink_->report(std::move(finding));
 }

@@ -14,8 +14,7 @@
 namespace calls {
 
 // Reports the first finding of a kind to the sink at once. Counts the findings that come in the next ten
-// minutes and reports only the last of them, with their number, when the next finding comes after that time,
-// or at the end.
+// minutes; the next one after that time is reported with their number, or the last of them at the end.
 class RepeatedFindings {
   public:
     explicit RepeatedFindings(FindingSink& sink) : sink_(&sink) {}

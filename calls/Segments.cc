@@ -19,6 +19,8 @@ Segments::Taken Segments::take(Message& message) {
     if (header->first) {
         if (known == pieces_.end() && pieces_.size() >= mostMessages)
             return Taken::outOfOrder;
+        if (known != pieces_.end())
+            replaced_ = Unfinished{known->second.moment, key.from};
         Pieces pieces;
         pieces.type = header->messageType;
         // The whole message has the header of its segments, except for the message type.

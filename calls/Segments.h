@@ -6,6 +6,7 @@
 #include <cstdint>
 #include <map>
 #include <optional>
+#include <utility>
 #include <vector>
 
 #include "calls/Call.h"
@@ -30,6 +31,9 @@ class Segments {
         Moment moment;
         Side from;
     };
+    // The last segment of a message that the side did not complete before it began the next one of the same
+    // call reference; it is returned once. Ask after each take().
+    std::optional<Unfinished> replaced() { return std::exchange(replaced_, std::nullopt); }
     // Forgets a message whose next segment has not come for `limit` nanoseconds, and returns its last one.
     // Call it until it returns nothing.
     std::optional<Unfinished> unfinished(std::int64_t at, std::int64_t limit);
@@ -55,6 +59,7 @@ class Segments {
     };
 
     std::map<Key, Pieces> pieces_;
+    std::optional<Unfinished> replaced_;
     std::vector<std::uint8_t> whole_;
 };
 

@@ -33,8 +33,13 @@ Verdicts::Verdict Verdicts::judge(Unanswered question) {
         held_.push_back(std::move(question));
         return Verdict::held;
     }
-    sink_.report(std::move(question.finding));
+    report(question);
     return Verdict::fault;
+}
+
+void Verdicts::report(Unanswered& fault) {
+    FindingSink& sink = fault.gathered != nullptr ? *fault.gathered : sink_;
+    sink.report(std::move(fault.finding));
 }
 
 void Verdicts::doubt(Unanswered question, std::string_view reason, const LinkWitness* link) {
@@ -86,7 +91,7 @@ void Verdicts::reconsider(std::int64_t at, bool isOver) {
                    at - question.until <= timers_.t203)
             open.push_back(std::move(question));
         else
-            sink_.report(std::move(question.finding));
+            report(question);
     }
     held_ = std::move(open);
 }

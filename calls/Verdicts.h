@@ -26,7 +26,8 @@ struct Unanswered {
     Side answering = Side::peer;
     std::uint64_t frame = 0;  // in which it was asked first
     std::int64_t asked = 0;
-    std::int64_t until = 0;  // when the timer ran out
+    std::int64_t until = 0;           // when the timer ran out
+    FindingSink* gathered = nullptr;  // is told if it is a fault, instead of the sink of the others
 };
 
 // A missing answer is a fault only if the link was up, the receiver's link layer acknowledged the question,
@@ -45,6 +46,8 @@ class Verdicts {
     // The clock has come to `at`. `oldest` is when the oldest question was asked that still waits for its
     // answer: a shared note is complete when no question is left that its reason touches.
     void advance(std::int64_t at, std::int64_t oldest);
+    // Whether it is not certain yet of some question that it is a fault.
+    bool isHolding() const { return !held_.empty(); }
     // The end of the trace: what is held is reported as it stands.
     void finish();
     // The board restarted: what is held cannot be decided any more.
@@ -61,6 +64,7 @@ class Verdicts {
     void doubt(Unanswered question, std::string_view reason, const LinkWitness* link);
     // Once `isOver`, what is still held is reported as it stands.
     void reconsider(std::int64_t at, bool isOver);
+    void report(Unanswered& fault);
     void report(Doubtful& doubtful, std::string_view reason);
 
     static constexpr std::size_t mostHeld = 4096;

@@ -38,8 +38,9 @@ std::string wordsOf(calls::MessageKind kind) {
         return "of other protocols, or damaged";
     const std::string_view name =
         kind.national ? std::string_view() : isdn::messageName(kind.discriminator, kind.type);
+    // Trunks may have both maintenance protocols, with the same names of messages.
     if (!name.empty())
-        return std::string(name);
+        return std::string(name) + (kind.discriminator == isdn::maintenanceOfNetwork ? " (protocol 43)" : "");
     std::string words = kind.national ? "national 0x" : "unknown 0x";
     appendHex(words, std::array{kind.type});
     return words;

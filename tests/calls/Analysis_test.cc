@@ -93,6 +93,20 @@ TEST_F(AnalysisTest, FindsSegmentsWhoseNextOneDoesNotCome) {
     EXPECT_EQ(told.foundLines, "1 segments-unfinished\n3 segments-unfinished\n");
 }
 
+TEST_F(AnalysisTest, FindsSegmentsThatAnotherMessageReplaces) {
+    CallScript script;
+    const Bytes first{0x00, 0x02, 0x81, 0x05}, last{0x00, 0x02, 0x00, 0x05};
+    script.at(0).us(m::segment, 9, false, {first, Bytes{0x04, 0x03, 0x80}});
+    script.at(100).us(m::segment, 9, false, {first, Bytes{0x04, 0x03, 0x80, 0x90, 0xA3, 0x70, 0x03, 0x81}});
+    script.at(200).us(m::segment, 9, false, {last, Bytes{0x31, 0x32}});
+    script.at(300).peer(m::releaseComplete, 9, true, {cause(17)});
+    Analysis analysis({}, told);
+    play(analysis, script);
+    analysis.finish();
+    EXPECT_EQ(told.heardLines, "3 SETUP 1\n4 RELEASE COMPLETE 1\n");
+    EXPECT_EQ(told.foundLines, "1 segments-unfinished\n");
+}
+
 TEST_F(AnalysisTest, KeepsDChannelsApartUnlessTheyShareTheirCalls) {
     const capture::Interface first{"A", capture::Variant::ni2};
     const capture::Interface standby{"B", capture::Variant::ni2};

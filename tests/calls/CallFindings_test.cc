@@ -179,6 +179,30 @@ TEST(CallFindings, MissTheChannelInASetupOfTheNetworkAlone) {
     }
 }
 
+TEST(CallFindings, MissTheChannelInTheFirstAnswerOfTheNetworkIfItHadAChoice) {
+    struct {
+        const char* says;
+        capture::Role role;
+        Bytes asked, answered;
+        bool missing;
+    } const cases[] = {
+        {"a channel that is preferred", capture::Role::user, channel(5, false), {}, true},
+        {"any channel", capture::Role::user, {0x18, 0x01, 0xA3}, {}, true},
+        {"the answer names one", capture::Role::user, channel(5, false), channel(6), false},
+        {"only this channel", capture::Role::user, channel(5), {}, false},
+        {"no channel", capture::Role::user, {0x18, 0x01, 0xA0}, {}, false},
+        {"nothing", capture::Role::user, {}, {}, false},
+        {"the user answers", capture::Role::network, channel(5, false), {}, false},
+    };
+    for (const auto& each : cases) {
+        CallScript script(each.role);
+        script.at(0).us(m::setup, 9, false, {bearerSpeech(), each.asked});
+        script.at(100).peer(m::callProceeding, 9, true, {each.answered});
+        script.at(200).peer(m::alerting, 9, true);  // the first answer is told, and no other
+        EXPECT_EQ(findingsOf(script, 1000), each.missing ? "2 element-absent\n" : "") << each.says;
+    }
+}
+
 TEST(CallFindings, FindAStatusOfTheGlobalReferenceThatTellsOfAnError) {
     for (const auto& [value, found] : {std::pair<std::uint8_t, std::string>{30, ""},
                                        {97, "2 element-ignored\n"},

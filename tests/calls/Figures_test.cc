@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <limits>
+
 #include "tests/calls/CallScript.h"
 
 namespace calls {
@@ -14,11 +16,17 @@ namespace m = isdn::message;
 // The figures of a script.
 class Counted : public Listener {
   public:
-    explicit Counted(const CallScript& script, std::int64_t quiet = 0) {
+    enum class Ticks { kept, dropped };
+
+    explicit Counted(const CallScript& script, std::int64_t quiet = 0, Ticks ticks = Ticks::kept) {
         Analysis analysis({}, *this);
         std::uint64_t number = 0;
-        for (const Sent& sent : script.frames())
-            analysis.take(sent.frame, ++number);
+        for (const Sent& sent : script.frames()) {
+            capture::Frame frame = sent.frame;
+            if (ticks == Ticks::dropped)
+                frame.ticks.reset();
+            analysis.take(frame, ++number);
+        }
         analysis.advance(quiet * millisecond);
         analysis.finish();
         occupancy.finish(analysis.spans());
@@ -247,6 +255,24 @@ TEST(Occupancy, IsSpreadOverTheHoursThatItTouches) {
     EXPECT_EQ(hours.at({capture::Clock::relative, 0}), 10 * second);
     EXPECT_EQ(hours.at({capture::Clock::relative, 1}), 3600 * second);
     EXPECT_EQ(hours.at({capture::Clock::relative, 2}), 10 * second);
+}
+
+TEST(Occupancy, StopsAtTheLargestTimeInADamagedCapture) {
+    constexpr std::int64_t largest = std::numeric_limits<std::int64_t>::max();
+    for (const bool cleared : {false, true}) {
+        CallScript script;
+        for (std::uint8_t i = 1; i <= 3; ++i) {
+            script.at(0).us(m::setup, i, false, {bearerSpeech(), channel(i)});
+            script.peer(m::connect, i, true);
+        }
+        script.at(largest / 3 * 2 / millisecond).us(m::information, 1, false);
+        for (std::uint8_t i = 1; cleared && i <= 3; ++i)
+            script.us(m::releaseComplete, i, false, {cause(16)});
+        const Counted counted(script, 0, Counted::Ticks::dropped);
+        EXPECT_GT(counted.channel(3).used, largest / 2);
+        EXPECT_EQ(counted.group().used, largest);
+        EXPECT_GT(counted.group().erlangs(), 1);
+    }
 }
 
 TEST(Occupancy, NamesChannelsThatWereNeverUsedOrAreStuck) {

@@ -2,6 +2,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <string>
+
 #include "tests/calls/analysed.h"
 
 namespace calls {
@@ -27,6 +30,22 @@ CallScript& restart(CallScript& script, std::uint8_t number, bool acknowledged =
 
 const Bytes outOfService{0x01, 0x01, 0xC2};
 
+// "4 restart-unacknowledged x30: RESTARTs of us got no ...", a line for each finding.
+std::string toldIn(const CallScript& script, std::int64_t quiet) {
+    Collected collected;
+    Analysis analysis({}, collected);
+    std::uint64_t number = 0;
+    for (const Sent& sent : script.frames())
+        analysis.take(sent.frame, ++number);
+    analysis.advance(quiet * millisecond);
+    analysis.finish();
+    std::string lines;
+    for (const Finding& finding : collected.findings)
+        lines += std::to_string(finding.frame) + " " + std::string(finding.kind->id) + " x" +
+                 std::to_string(finding.count) + ": " + finding.sentence + "\n";
+    return lines;
+}
+
 }  // namespace
 
 TEST(Maintenance, FindsARestartWithoutAcknowledgeAfterItsRepetition) {
@@ -37,6 +56,70 @@ TEST(Maintenance, FindsARestartWithoutAcknowledgeAfterItsRepetition) {
     EXPECT_EQ(findingsIn(script, 120100), "4 cannot-be-told\n");  // nobody has acknowledged the frame either
     script.at(122000).peer(m::information, 9, true);
     EXPECT_EQ(findingsIn(script, 119100), "4 restart-unacknowledged\n");
+}
+
+TEST(Maintenance, TellsRestartsThatWaitTogetherAsOneFinding) {
+    CallScript script = afterACall();
+    for (std::uint8_t number = 1; number <= 5; ++number)
+        restart(script.at(1000 + number * 20), number, number == 3);
+    script.at(2000).acknowledge(Side::peer).acknowledge(Side::us);
+    EXPECT_EQ(toldIn(script, 238900), "");
+    EXPECT_EQ(toldIn(script, 240000),
+              "3 restart-unacknowledged x4: RESTARTs of us got no acknowledge: channels 1, 2, 4, 5\n");
+}
+
+TEST(Maintenance, TellsTheRestartsOfTheTwoSidesApart) {
+    CallScript script = afterACall();
+    for (std::uint8_t number = 1; number <= 2; ++number) {
+        script.at(1000 + number * 20).us(m::restart, 0, false, {channel(number), restartIndicator(0)});
+        script.peer(m::restart, 0, false, {channel(number), restartIndicator(0)});
+    }
+    script.at(2000).acknowledge(Side::peer).acknowledge(Side::us);
+    EXPECT_EQ(toldIn(script, 240000),
+              "3 restart-unacknowledged x2: RESTARTs of us got no acknowledge: channels 1, 2\n"
+              "4 restart-unacknowledged x2: RESTARTs of the peer got no acknowledge: channels 1, 2\n");
+}
+
+TEST(Maintenance, FindsARestartThatIsRepeatedForEver) {
+    CallScript script = afterACall();
+    for (int minute = 0; minute < 60; ++minute) {
+        restart(script.at(1000 + minute * 60000), 5, false);
+        script.acknowledge(Side::peer);
+    }
+    // After four minutes the answer to the first one is overdue; then once in ten minutes at most.
+    const std::string told = toldIn(script, 0);
+    EXPECT_TRUE(
+        told.starts_with("11 restart-unacknowledged x1: RESTART of frame 3 got no acknowledge: channel 5\n"))
+        << told;
+    const auto findings = std::count(told.begin(), told.end(), '\n');
+    EXPECT_GE(findings, 2) << told;
+    EXPECT_LE(findings, 7) << told;
+}
+
+TEST(Maintenance, TellsAStormThatPassesOverTheChannelsAsOneFinding) {
+    CallScript script = afterACall();
+    for (int round = 0; round < 4; ++round) {
+        for (std::uint8_t number = 1; number <= 30; ++number)
+            restart(script.at(1000 + round * 60000 + number * 20), number);
+    }
+    const std::string told = toldIn(script, 0);
+    EXPECT_TRUE(told.starts_with("183 restart-storm x30: channels 1, 2, 3, 4, ")) << told;
+    EXPECT_TRUE(told.ends_with(", 29, 30 were restarted more than 3 times in 10 minutes by us\n")) << told;
+    EXPECT_EQ(toldIn(script, 11000), told);
+}
+
+TEST(Maintenance, TellsServicesThatWaitTogetherAsOneFinding) {
+    CallScript script = afterACall();
+    script.at(500).maintenance(Side::us, m::service, false, {outOfService, channel(3)});
+    script.at(510).maintenance(Side::peer, m::serviceAcknowledge, true, {outOfService, channel(3)});
+    for (int time = 0; time < 2; ++time) {
+        for (std::uint8_t number = 4; number <= 6; ++number)
+            script.at(1000 + time * 60000 + number)
+                .maintenance(Side::us, m::service, false, {outOfService, channel(number)});
+    }
+    script.at(62000).acknowledge(Side::peer);
+    EXPECT_EQ(toldIn(script, 70000),
+              "8 service-unacknowledged x3: SERVICEs of us got no acknowledge: channels 4, 5, 6\n");
 }
 
 TEST(Maintenance, TakesARestartOfEachChannelForSound) {

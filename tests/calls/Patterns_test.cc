@@ -92,6 +92,38 @@ TEST(Patterns, FindCallsThatEndTogetherWithTheLink) {
     EXPECT_NE(patternsIn(script).find("mass-clear\n"), std::string::npos) << patternsIn(script);
 }
 
+TEST(Patterns, ReferToTheFaultOfTheLinkThatCallsEndedWith) {
+    for (const bool flaps : {false, true}) {
+        CallScript script;
+        script.at(0).linkUp();
+        for (std::uint16_t i = 1; i <= 3; ++i) {
+            script.at(i * 100).us(m::setup, i, false,
+                                  {bearerSpeech(), channel(static_cast<std::uint8_t>(i))});
+            script.at(i * 100 + 10).peer(m::connect, i, true);
+        }
+        if (!flaps)
+            script.at(8900).raw(Side::peer, true, {0x53}).raw(Side::us, false, {0x73});  // DISC, UA
+        script.at(9000).linkUp();
+        for (std::uint16_t i = 1; i <= 3; ++i)
+            script.at(9100).peer(m::releaseComplete, i, true, {cause(41)});
+        Collected collected;
+        Analysis analysis({}, collected);
+        std::uint64_t number = 0;
+        for (const Sent& sent : script.frames())
+            analysis.take(sent.frame, ++number);
+        analysis.advance(400 * second);
+        analysis.finish();
+        const std::string says = "3 calls ended with the link, which was set up here: 1, 2, 3";
+        if (flaps) {
+            EXPECT_EQ(collected.lines, "9 link-flap\n10 mass-clear\n");
+            EXPECT_EQ(collected.findings.back().sentence, says + "; they follow from link-flap of frame 9");
+        } else {
+            EXPECT_EQ(collected.lines, "12 mass-clear\n");
+            EXPECT_EQ(collected.findings.back().sentence, says);
+        }
+    }
+}
+
 TEST(Patterns, SayWhatTheCauseOfABurstIsAbout) {
     struct {
         std::uint8_t cause;

@@ -24,14 +24,19 @@ def calls(path):
 class Figures(unittest.TestCase):
     def test_of_messages_are_those_of_the_frames(self):
         for path in EXAMPLES.values():
-            counted = collections.Counter((frame["message"], frame["dir"])
+            counted = collections.Counter((frame["message"] + (" (protocol 43)" if frame["pd"] == 0x43 else ""), frame["dir"])
                                           for frame in objects("convert", "--quiet", "--to", "jsonl", path)
                                           if frame.get("message") and frame["accepted"])
-            told = collections.Counter()  # SERVICE has a row for each of its protocols
+            told = collections.Counter()
             for row in table(path, "messages"):
                 told[row["message"], "tx"] += row["sent"]
                 told[row["message"], "rx"] += row["received"]
             self.assertEqual({key: told[key] for key in counted}, dict(counted))
+
+    def test_tell_the_two_maintenance_protocols_apart(self):
+        names = [row["message"] for row in table(EXAMPLES["4ess"], "messages")]
+        self.assertEqual(len(names), len(set(names)), names)
+        self.assertLess({"SERVICE", "SERVICE (protocol 43)"}, set(names))
 
     def test_of_causes_are_those_of_the_calls(self):
         for path in EXAMPLES.values():
