@@ -19,25 +19,45 @@ namespace {
 
 constexpr std::size_t mostMessages = 50'000;
 
-// A file, or one call in a file: "day.pcapng#3" is the call that `lapdread calls day.pcapng` numbers 3.
+// A file, or one call in a file: "day.pcapng#3" is the call that `lapdread calls day.pcapng` numbers 3. Of a
+// store, D channels take the place of files; "#3" alone is of those that --trunk and --site choose.
 struct Operand {
-    std::string file;
+    std::string name;
     std::optional<std::uint64_t> call;
+    Options options;  // that read it, and nothing else
+
+    std::string shown() const { return name.empty() ? inputNames(options).front() : name; }
 };
 
-Operand operandOf(const std::string& word) {
+Operand operandOf(const std::string& word, const Options& options) {
+    const bool isFile = options.input.store.empty();
     const std::size_t mark = word.rfind('#');
     std::uint64_t number = 0;
-    if (mark == std::string::npos || !readNumber(std::string_view(word).substr(mark + 1), number) ||
-        std::filesystem::exists(word))
-        return {word, std::nullopt};
-    return {word.substr(0, mark), number};
+    Operand operand{word, std::nullopt, options};
+    if (mark != std::string::npos && readNumber(std::string_view(word).substr(mark + 1), number) &&
+        !(isFile && std::filesystem::exists(word)))
+        operand = {word.substr(0, mark), number, options};
+    operand.options.words.clear();
+    operand.options.input.files.clear();
+    if (isFile)
+        operand.options.input.files = {operand.name};
+    else if (!operand.name.empty())
+        operand.options.input.trunk = operand.name;
+    return operand;
+}
+
+std::vector<std::string> wordsOf(const Options& options) {
+    if (options.input.store.empty())
+        return inputFiles(options);
+    std::vector<std::string> words = options.input.files;
+    words.insert(words.end(), options.words.begin(), options.words.end());
+    return words;
 }
 
 class MessageTaker : public Analysed {
   public:
-    MessageTaker(const Options& options, const Operand& operand)
-        : Analysed(options), also_(options.compareAlso), operand_(operand) {}
+    explicit MessageTaker(const Operand& operand)
+        : Analysed(operand.options), also_(operand.options.compareAlso), operand_(operand) {}
 
     void flush() override {}
     // The messages to compare. Called after the end of the trace.
@@ -58,7 +78,7 @@ class MessageTaker : public Analysed {
         if (isOther || !wanted.value_or(true))
             return;
         if (messages_.size() >= mostMessages)
-            throw UsageError(operand_.file + " holds more than " + std::to_string(mostMessages) +
+            throw UsageError(operand_.shown() + " holds more than " + std::to_string(mostMessages) +
                              " messages; filters choose some");
         if (messages_.empty())
             first_ = message.at;
@@ -82,21 +102,18 @@ class MessageTaker : public Analysed {
     std::int64_t first_ = 0;
 };
 
-std::vector<ComparedMessage> messagesOf(const Options& options, const Operand& operand, Chatter& chatter) {
-    Options own = options;
-    own.words.clear();
-    own.input.files = {operand.file};
-    Session session(own, chatter);
-    MessageTaker taker(own, operand);
+std::vector<ComparedMessage> messagesOf(const Operand& operand, Chatter& chatter) {
+    Session session(operand.options, chatter);
+    MessageTaker taker(operand);
     taker.run(session, chatter);
     std::vector<ComparedMessage> messages = taker.messages();
     if (operand.call && messages.empty())
-        throw UsageError(operand.file + " has no message of a call " + std::to_string(*operand.call));
+        throw UsageError(operand.shown() + " has no message of a call " + std::to_string(*operand.call));
     return messages;
 }
 
-std::string wordsOf(const Operand& operand, std::size_t messages) {
-    std::string words = safe(operand.file);
+std::string headOf(const Operand& operand, std::size_t messages) {
+    std::string words = safe(operand.shown());
     if (operand.call)
         words += ", call " + std::to_string(*operand.call);
     return words + ": " + std::to_string(messages) + (messages == 1 ? " message" : " messages");
@@ -191,17 +208,20 @@ std::span<const OptionRow> diffOptions() {
 }
 
 int runDiff(const Options& options, Chatter& chatter) {
-    const std::vector<std::string> files = inputFiles(options);
-    if (files.size() != 2 || options.input.follow || files[0] == "-")
-        throw UsageError("diff takes two files, or calls of files: lapdread diff A#3 B#7");
-    const Operand a = operandOf(files[0]), b = operandOf(files[1]);
-    const std::vector<ComparedMessage> messagesA = messagesOf(options, a, chatter);
-    const std::vector<ComparedMessage> messagesB = messagesOf(options, b, chatter);
+    const std::vector<std::string> words = wordsOf(options);
+    if (words.size() != 2 || options.input.follow || words[0] == "-")
+        throw UsageError(options.input.store.empty()
+                             ? "diff takes two files, or calls of files: lapdread diff A#3 B#7"
+                             : "diff takes two D channels of a store, or calls of them: lapdread diff "
+                               "--store URL pri1#3 pri2#7");
+    const Operand a = operandOf(words[0], options), b = operandOf(words[1], options);
+    const std::vector<ComparedMessage> messagesA = messagesOf(a, chatter);
+    const std::vector<ComparedMessage> messagesB = messagesOf(b, chatter);
     const Comparison comparison = compare(messagesA, messagesB, options.compareAlso);
     const bool isText = options.calls.form == CallForm::text;
     std::string text;
     if (isText)
-        text = "A  " + wordsOf(a, messagesA.size()) + "\nB  " + wordsOf(b, messagesB.size()) + "\n\n";
+        text = "A  " + headOf(a, messagesA.size()) + "\nB  " + headOf(b, messagesB.size()) + "\n\n";
     const Difference* before = nullptr;
     for (const Difference& difference : comparison.differences) {
         if (isText)
@@ -212,9 +232,9 @@ int runDiff(const Options& options, Chatter& chatter) {
     }
     if (isText)
         text += summaryOf(comparison);
-    Options outputs = options;
-    outputs.words.clear();
-    outputs.input.files = {a.file, b.file};
+    Options outputs = a.options;
+    if (options.input.store.empty())
+        outputs.input.files = {a.name, b.name};
     Session session(outputs, chatter);
     session.output().write(text);
     session.output().flush();

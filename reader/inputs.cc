@@ -94,6 +94,19 @@ std::vector<std::string> inputFiles(const Options& options) {
     return files;
 }
 
+std::vector<std::string> inputNames(const Options& options) {
+    const InputOptions& input = options.input;
+    if (input.store.empty())
+        return inputFiles(options);
+    std::vector<std::string> chosen = input.sites;
+    if (!input.trunk.empty())
+        chosen.push_back(input.trunk);
+    std::string name = "the store";
+    for (const std::string& each : chosen)
+        name += (&each == &chosen.front() ? ": " : ", ") + each;
+    return {name};
+}
+
 std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*chatter*/) {
     if (!options.input.store.empty())
         return openStore(options);

@@ -16,6 +16,10 @@ namespace reader {
 // input. Throws UsageError if none is given and the standard input is a terminal.
 std::vector<std::string> inputFiles(const Options& options);
 
+// What is read, for people: the names of the inputs, or "the store", with the sites and D channels that were
+// chosen there. Its URL may hold a password, and is left out.
+std::vector<std::string> inputNames(const Options& options);
+
 // Opens one input of any form that this program reads.
 std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOptions& input);
 

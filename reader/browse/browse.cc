@@ -230,7 +230,7 @@ bool beginLocale() {
 }
 
 std::string sourceOf(const Options& options) {
-    const std::vector<std::string> files = inputFiles(options);
+    const std::vector<std::string> files = inputNames(options);
     const std::string first = files[0] == "-" ? "standard input" : files[0];
     return files.size() == 1 ? first : first + " and " + std::to_string(files.size() - 1) + " more";
 }

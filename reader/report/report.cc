@@ -19,8 +19,11 @@ std::string titleOf(const Options& options) {
     if (options.redact.inReport)
         return "Report of a trace, redacted";
     std::string title = "Report of";
-    for (const std::string& file : inputFiles(options))
-        title += " " + (file == "-" ? "the standard input" : file.substr(file.rfind('/') + 1));
+    const bool areFiles = options.input.store.empty();
+    for (const std::string& name : inputNames(options)) {
+        const std::string shown = areFiles ? name.substr(name.rfind('/') + 1) : name;
+        title += " " + (shown == "-" ? "the standard input" : shown);
+    }
     return title;
 }
 

@@ -14,9 +14,7 @@ using namespace std::chrono_literals;
 
 const std::string source = LAPDMON_SOURCE_DIR;
 
-// What lapdread prints, its messages included, and how it ended.
-std::string lapdread(const std::string& words) {
-    const std::string command = "TZ=UTC " + std::string(std::getenv("LAPDREAD")) + " " + words + " 2>&1";
+std::string outputOf(const std::string& command) {
     const std::unique_ptr<std::FILE, int (*)(std::FILE*)> pipe(popen(command.c_str(), "r"), pclose);
     std::string text;
     std::array<char, 4096> part{};
@@ -24,6 +22,55 @@ std::string lapdread(const std::string& words) {
         text.append(part.data(), size);
     return text;
 }
+
+// What lapdread prints, its messages included.
+std::string lapdread(const std::string& words) {
+    return outputOf("TZ=UTC " + std::string(std::getenv("LAPDREAD")) + " " + words + " 2>&1");
+}
+
+// lapdread browse in a terminal of its own, which is tmux.
+class Screen {
+  public:
+    explicit Screen(const std::string& words) {
+        folder_ = std::filesystem::temp_directory_path() / "lapd-screen.XXXXXX";
+        if (mkdtemp(folder_.data()) == nullptr)
+            throw std::runtime_error("cannot make a folder");
+        const std::string command =
+            "TZ=UTC " + std::string(std::getenv("LAPDREAD")) + " browse --ascii " + words;
+        tmux("-f /dev/null new-session -d -x 110 -y 40 \"" + command + "\"");
+    }
+    ~Screen() {
+        tmux("kill-server");
+        std::error_code ignored;
+        std::filesystem::remove_all(folder_, ignored);
+    }
+    Screen(const Screen&) = delete;
+    Screen& operator=(const Screen&) = delete;
+
+    void press(const std::string& keys) const { tmux("send-keys " + keys); }
+    // All but the first line, which names what is read, as soon as it has the text.
+    std::string with(const std::string& text) const {
+        const auto end = std::chrono::steady_clock::now() + 100s;
+        std::string shown;
+        do
+            shown = tmux("capture-pane -p");
+        while (shown.find(text) == std::string::npos && std::chrono::steady_clock::now() < end);
+        EXPECT_NE(shown.find(text), std::string::npos) << shown;
+        return shown.substr(shown.find('\n') + 1);
+    }
+    std::string firstLine() const {
+        const std::string shown = tmux("capture-pane -p");
+        return shown.substr(0, shown.find('\n'));
+    }
+
+  private:
+    std::string tmux(const std::string& words) const {
+        return outputOf("env -u TMUX TERM=screen LC_ALL=C.UTF-8 tmux -S " + folder_ + "/socket " + words +
+                        " 2>&1");
+    }
+
+    std::string folder_;
+};
 
 // Inputs whose frames have dates: only these can be shipped.
 std::vector<std::string> recordings() {
@@ -82,9 +129,17 @@ TEST_F(StoreAsInput, PrintsWhatTheFilesPrint) {
             "list --columns n,time,delta,trunk,ticks,dir,link,message,details,marks,hex",
             "calls --jsonl --sort start", "check --jsonl"};
         if (file.ends_with("net5.pcap") || file.ends_with("national-bri.hex"))
-            commands = {"list",           "list --relative", "list --message SETUP,DISCONNECT",
-                        "list --first 3", "calls",           "calls --failed",
-                        "ladder",         "check",           "stats"};
+            commands = {"list",
+                        "list --relative",
+                        "list --message SETUP,DISCONNECT",
+                        "list --first 3",
+                        "calls",
+                        "calls --failed",
+                        "ladder",
+                        "check",
+                        "stats",
+                        "stats --csv",
+                        "check --level warning"};
         for (const std::string& command : commands) {
             SCOPED_TRACE(command);
             std::string expected = lapdread(command + " " + file);
@@ -176,13 +231,78 @@ TEST_F(StoreAsInput, SaysWhatIsMissingAsALoss) {
     EXPECT_NE(ofStore("list").find("frames lost by the recorder: 4"), std::string::npos) << ofStore("list");
 }
 
+TEST_F(StoreAsInput, ComparesCallsAndDChannelsAsItComparesFiles) {
+    const std::string pri = source + "/examples/net5.pcap";
+    const std::string other = source + "/examples/ni2.pcap";
+    store(parcelsOf(pri, 100, true, "london"));
+    store(parcelsOf(other, 100, true, "paris"));
+    // Files are called by their names, and D channels by theirs.
+    const auto named = [](std::string text, const std::string& file, const std::string& name) {
+        for (std::size_t at = 0; (at = text.find(file, at)) != std::string::npos;)
+            text.replace(at, file.size(), name);
+        return text;
+    };
+    for (const std::string options : {"", "--with time,channel", "--jsonl"}) {
+        SCOPED_TRACE(options);
+        EXPECT_EQ(ofStore("diff " + options + " net5#1 net5#2"),
+                  named(lapdread("diff " + options + " " + pri + "#1 " + pri + "#2"), pri, "net5"));
+        EXPECT_EQ(ofStore("diff " + options + " net5 paris/h1/0/1"),
+                  named(named(lapdread("diff " + options + " " + pri + " " + other), pri, "net5"), other,
+                        "paris/h1/0/1"));
+    }
+    EXPECT_EQ(ofStore("diff --trunk net5 '#1' '#2'"),
+              named(lapdread("diff " + pri + "#1 " + pri + "#2"), pri, "the store: net5"));
+}
+
+TEST_F(StoreAsInput, ReportsWhatTheFileReports) {
+    const std::string file = source + "/examples/net5.pcap";
+    store(parcelsOf(file, 7, true));
+    std::string expected = lapdread("report " + file);
+    const std::string title = "Report of net5.pcap";
+    ASSERT_NE(expected.find(title), std::string::npos);
+    for (std::size_t at = 0; (at = expected.find(title, at)) != std::string::npos;)
+        expected.replace(at, title.size(), "Report of the store: london");
+    EXPECT_EQ(ofStore("report --site london"), expected);
+    EXPECT_EQ(ofStore("report --site london").find("postgresql"), std::string::npos)
+        << "a URL may hold a password";
+}
+
+TEST_F(StoreAsInput, BrowsesWhatTheFileHolds) {
+    if (outputOf("tmux -V 2>&1").substr(0, 4) != "tmux")
+        GTEST_SKIP() << "there is no tmux";
+    const std::string file = source + "/examples/net5.pcap";
+    store(parcelsOf(file, 7, true));
+    const Screen ofFile(file), ofTheStore("--store '" + url() + "'");
+    const auto both = [&](const std::string& keys, const std::string& text) {
+        SCOPED_TRACE(keys);
+        for (const Screen* const each : {&ofFile, &ofTheStore})
+            each->press(keys);
+        EXPECT_EQ(ofTheStore.with(text), ofFile.with(text));
+    };
+    ofFile.with("Calls: 6");
+    ofTheStore.with("Calls: 6");
+    EXPECT_NE(ofTheStore.firstLine().find("the store"), std::string::npos) << ofTheStore.firstLine();
+    both("Home", ">     1");
+    both("Enter", "Ladder of call 1");
+    both("Down Enter", "Frame 7 of call 1");
+    both("Escape", "Ladder of call 1");
+    both("q", "Calls: 6");
+    both("Tab", "Findings:");
+    both("BTab BTab", "1 D channel");
+}
+
 TEST_F(StoreAsInput, RefusesWhatItCannotDo) {
     store(parcelsOf(source + "/examples/net5.pcap", 100, true));
     EXPECT_EQ(ofStore("list --trunk pri9"), "lapdread: the store: it has no trunk pri9\n");
     EXPECT_EQ(ofStore("list --site rome"), "lapdread: the store: it has no site rome\n");
     EXPECT_EQ(ofStore("list day.log"), "lapdread: --store takes the place of files: day.log\n");
     EXPECT_EQ(ofStore("list --follow"), "lapdread: --follow takes a file; a store is read as it is now\n");
-    EXPECT_EQ(ofStore("diff a b"), "lapdread: diff takes files; --store is for other commands\n");
+    EXPECT_EQ(ofStore("redact a"), "lapdread: redact takes files; --store is for other commands\n");
+    EXPECT_EQ(ofStore("diff net5"),
+              "lapdread: diff takes two D channels of a store, or calls of them: lapdread diff --store URL "
+              "pri1#3 pri2#7\n");
+    EXPECT_EQ(ofStore("diff net5#1 pri9#1"), "lapdread: the store: it has no trunk pri9\n");
+    EXPECT_EQ(ofStore("diff net5#1 '#99'"), "lapdread: the store has no message of a call 99\n");
     EXPECT_EQ(lapdread("list --site london " + source + "/examples/net5.pcap"),
               "lapdread: --site chooses among the trunks of a store: name it with --store URL\n");
     EXPECT_EQ(lapdread("list --store '" + urlOf("postgres") + "'"),
