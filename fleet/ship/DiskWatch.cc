@@ -13,7 +13,9 @@ void DiskWatch::look(const std::string& folder) {
         return;
     const std::uint64_t reserved = status.f_bfree - status.f_bavail;  // for the administrator
     const std::uint64_t all = status.f_blocks - std::min<std::uint64_t>(reserved, status.f_blocks);
-    look("the disk of " + folder, all - std::min<std::uint64_t>(status.f_bavail, all), all);
+    const std::uint64_t used = all - std::min<std::uint64_t>(status.f_bavail, all);
+    disks_[folder] = {used * status.f_frsize, all * status.f_frsize};
+    look("the disk of " + folder, used, all);
 }
 
 void DiskWatch::look(const std::string& name, std::uint64_t used, std::uint64_t of) {

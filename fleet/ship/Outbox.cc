@@ -13,13 +13,20 @@ std::size_t Outbox::waiting(std::size_t dChannel) const {
     return dChannel < ofDChannel_.size() ? ofDChannel_[dChannel].size() : 0;
 }
 
+std::optional<std::int64_t> Outbox::oldestWaiting(std::size_t dChannel) const {
+    if (waiting(dChannel) == 0)
+        return std::nullopt;
+    return parcels_.at(ofDChannel_[dChannel].front()).time;
+}
+
 void Outbox::add(std::size_t dChannel, const Parcel& parcel) {
     const std::uint64_t token = ++tokens_;
     Sent sent{dChannel,
               toText(parcel.subject()),
               toText(parcel),
               parcel.id(),
-              {parcel.run, parcel.first + parcel.frames.size(), parcel.end.has_value()}};
+              {parcel.run, parcel.first + parcel.frames.size(), parcel.end.has_value()},
+              parcel.frames.empty() ? std::nullopt : parcel.frames.front().item.time};
     octets_ += sent.text.size();
     parcels_.emplace(token, std::move(sent));
     if (ofDChannel_.size() <= dChannel)

@@ -7,6 +7,7 @@
 #include <deque>
 #include <functional>
 #include <map>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -54,6 +55,8 @@ class Outbox {
     void add(std::size_t dChannel, const Parcel& parcel);
     // How many of its parcels are not reported as safe.
     std::size_t waiting(std::size_t dChannel) const;
+    // The time of the first frame in the oldest of these, in nanoseconds since 1970; nothing if it has none.
+    std::optional<std::int64_t> oldestWaiting(std::size_t dChannel) const;
 
     // Sends what is to be sent, and takes answers: those that are there, or the first one to come within the
     // time. Throws NatsError if the carrier does; what was not answered stays.
@@ -73,8 +76,9 @@ class Outbox {
         std::string text;
         std::string id;
         SafeUpTo then;
-        Clock::time_point due{};  // when it is sent (again)
-        bool isOut = false;       // it waits for an answer
+        std::optional<std::int64_t> time;  // of its first frame
+        Clock::time_point due{};           // when it is sent (again)
+        bool isOut = false;                // it waits for an answer
         bool isKept = false;
     };
 

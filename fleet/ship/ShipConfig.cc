@@ -7,6 +7,8 @@
 #include <set>
 #include <string_view>
 
+#include "fleet/metrics/HttpAnswerer.h"
+
 namespace fleet {
 
 namespace {
@@ -164,6 +166,9 @@ ShipConfig readShipConfig(const std::string& path, const std::string& redact) {
     if (!redact.empty())
         config.redact = redact;
     config.leastFree = table.number("least_free", 100, config.leastFree);
+    config.metrics = table.text("metrics").value_or("");
+    if (!config.metrics.empty() && !isListenAddress(config.metrics))
+        table.fail("metrics", "must be an address to listen on, such as \"127.0.0.1:9470\"");
     readTls(table.table("tls"), config.nats);
     std::set<Address> known;
     for (Table& each : table.tables("dchannel")) {

@@ -33,6 +33,7 @@ struct ShipConfig {
     std::string state;                  // the folder of places
     std::optional<std::string> redact;  // key file; pseudonyms are sent in place of numbers
     unsigned leastFree = 10;            // per cent of a disk or a stream; less is said
+    std::string metrics;                // where to listen for those who ask for figures; empty: nowhere
     std::vector<ShippedDChannel> dChannels;
 };
 

@@ -109,7 +109,9 @@ bool ShippedTrunk::beginRun(Outbox& outbox) {
 void ShippedTrunk::take(const InputEvent& event) {
     if (event.kind == InputEvent::Kind::item && isNumbered(event.item) && !event.isOld) {
         ++frames_;
-        newest_ = event.item.frame.clock == capture::Clock::absolute ? event.item.frame.time : newest_;
+        const capture::Frame& frame = event.item.frame;
+        if (frame.clock == capture::Clock::absolute)
+            newest_[frame.transmitted ? 1 : 0] = frame.time;
     }
     gaps_ += event.gap ? 1 : 0;
     if (redactor_)

@@ -2,6 +2,7 @@
 #ifndef FLEET_SHIP_SHIPPEDTRUNK_H
 #define FLEET_SHIP_SHIPPEDTRUNK_H
 
+#include <array>
 #include <cstdint>
 #include <functional>
 #include <memory>
@@ -41,7 +42,8 @@ class ShippedTrunk {
 
     const std::string& name() const { return name_; }
     std::uint64_t frames() const { return frames_; }
-    std::int64_t newest() const { return newest_; }  // time of the newest frame read, 0: none
+    // Time of the newest frame read that our side has sent, or received; 0: none.
+    std::int64_t newest(bool transmitted) const { return newest_[transmitted ? 1 : 0]; }
     std::uint64_t gaps() const { return gaps_; }
 
   private:
@@ -66,7 +68,7 @@ class ShippedTrunk {
     std::uint64_t run_;    // of the newest event
     std::uint64_t frames_ = 0;
     std::uint64_t gaps_ = 0;
-    std::int64_t newest_ = 0;
+    std::array<std::int64_t, 2> newest_{};
 };
 
 }  // namespace fleet

@@ -12,7 +12,7 @@
 #include <stdexcept>
 #include <utility>
 
-#include "fleet/streams.h"
+#include "fleet/ship/ShipMetrics.h"
 
 namespace fleet {
 
@@ -22,6 +22,7 @@ using namespace std::chrono_literals;
 
 constexpr auto glance = 20ms;  // how often inputs are looked at that had nothing to give
 constexpr auto betweenAttempts = 1s;
+constexpr auto betweenFigures = 1s;
 
 // A signal ends it early.
 void pauseFor(std::chrono::milliseconds time) {
@@ -61,6 +62,11 @@ Shipper::Shipper(const ShipConfig& config, const ShipperRules& rules, Say say)
     const std::optional<redaction::Key> key = keyOf(config_);
     for (const ShippedDChannel& each : config_.dChannels)
         trunks_.emplace_back(each, trunks_.size(), config_.state, key ? &*key : nullptr, say_);
+    if (config_.metrics.empty())
+        return;
+    answerer_ = std::make_unique<HttpAnswerer>(config_.metrics, [this] { return metrics_.get(); });
+    publish();
+    say_("figures are at http://" + answerer_->address() + "/metrics");
 }
 
 Shipper::~Shipper() { close(lock_); }
@@ -95,6 +101,8 @@ bool Shipper::turn() {
         nextAttempt_ = Clock::now() + betweenAttempts;
     }
     savePlaces();
+    publish();
+    heartbeat_.beat();
     return hasRead;
 }
 
@@ -158,8 +166,8 @@ void Shipper::watch() {
     if (!mayAskStream_ || !isConnected())
         return;
     try {
-        const StreamFilling filling = fillingOf(*connection_, config_.stream);
-        disks_.look("the stream " + config_.stream, filling.octets, filling.mostOctets);
+        stream_ = fillingOf(*connection_, config_.stream);
+        disks_.look("the stream " + config_.stream, stream_.octets, stream_.mostOctets);
     } catch (const NatsError& error) {
         say_(std::string(error.what()) + "; its filling is not watched");
         mayAskStream_ = false;
@@ -172,6 +180,13 @@ void Shipper::savePlaces() {
     nextPlaces_ = Clock::now() + rules_.betweenPlaces;
     for (ShippedTrunk& trunk : trunks_)
         trunk.save();
+}
+
+void Shipper::publish() {
+    if (!answerer_ || Clock::now() < nextMetrics_)
+        return;
+    nextMetrics_ = Clock::now() + betweenFigures;
+    metrics_.set(metricsOf(*this));
 }
 
 void Shipper::finish() {

@@ -11,10 +11,14 @@
 
 #include "fleet/Nats.h"
 #include "fleet/NatsPublisher.h"
+#include "fleet/metrics/HttpAnswerer.h"
+#include "fleet/metrics/Published.h"
 #include "fleet/ship/DiskWatch.h"
 #include "fleet/ship/Outbox.h"
 #include "fleet/ship/ShipConfig.h"
 #include "fleet/ship/ShippedTrunk.h"
+#include "fleet/streams.h"
+#include "service/notify.h"
 
 namespace fleet {
 
@@ -25,11 +29,11 @@ struct ShipperRules {
     std::chrono::seconds betweenWatches{30};       // how often disks and the stream are looked at
 };
 
-// Runs on one thread.
+// Runs on one thread; figures are handed out by another one.
 class Shipper {
   public:
-    // Throws std::runtime_error if another shipper uses the state's folder, or it cannot be used, and
-    // redaction::KeyError for a key that is not there.
+    // Throws std::runtime_error if another shipper uses the state's folder, or it cannot be used,
+    // redaction::KeyError for a key that is not there, and BadListenAddress if figures cannot be offered.
     Shipper(const ShipConfig& config, const ShipperRules& rules, Say say);
     ~Shipper();
     Shipper(const Shipper&) = delete;
@@ -42,7 +46,12 @@ class Shipper {
     void drain(const std::atomic<bool>& stop);
 
     bool isConnected() const { return connection_ && connection_->isConnected(); }
+    const ShipConfig& config() const { return config_; }
     const OutboxFigures& figures() const { return outbox_.figures(); }
+    const Outbox& outbox() const { return outbox_; }
+    const DiskWatch& disks() const { return disks_; }
+    // What the site's stream said of itself last; no octets at all if it was not asked.
+    const StreamFilling& stream() const { return stream_; }
     const std::deque<ShippedTrunk>& trunks() const { return trunks_; }
 
   private:
@@ -56,6 +65,7 @@ class Shipper {
     void sayRefusal();
     void watch();
     void savePlaces();
+    void publish();
     void finish();
 
     ShipConfig config_;
@@ -65,6 +75,10 @@ class Shipper {
     std::deque<ShippedTrunk> trunks_;
     Outbox outbox_;
     DiskWatch disks_;
+    StreamFilling stream_;
+    Published metrics_;  // made once a second, and handed out by the answerer's thread
+    std::unique_ptr<HttpAnswerer> answerer_;
+    service::Heartbeat heartbeat_;
     std::unique_ptr<NatsConnection> connection_;
     std::unique_ptr<NatsPublisher> publisher_;
     bool wasConnected_ = false;
@@ -75,6 +89,7 @@ class Shipper {
     Clock::time_point nextAttempt_{};
     Clock::time_point nextPlaces_{};
     Clock::time_point nextWatch_{};
+    Clock::time_point nextMetrics_{};
 };
 
 }  // namespace fleet

@@ -9,6 +9,7 @@
 #include "fleet/ship/command_line.h"
 #include "fleet/streams.h"
 #include "recording/files.h"
+#include "service/notify.h"
 
 namespace {
 
@@ -46,10 +47,12 @@ void obey(const fleet::ShipCommand& command) {
     }
     watchSignals();
     fleet::Shipper shipper(config, {}, say);
+    service::notify("READY=1");
     if (command.what == fleet::ShipCommand::What::once)
         shipper.drain(shallStop);
     else
         shipper.run(shallStop);
+    service::notify("STOPPING=1");
 }
 
 }  // namespace

@@ -16,7 +16,7 @@ constexpr std::size_t ordinalsRemembered = 65'536;
 }  // namespace
 
 Assembly::Assembly(const RunKey& key, std::string trunkName, std::string place)
-    : key_(key), rows_(std::move(trunkName), std::move(place)), analysis_({}, *this) {}
+    : key_(key), name_(trunkName), rows_(std::move(trunkName), std::move(place)), analysis_({}, *this) {}
 
 void Assembly::expect(const std::string& day) {
     if (!isAnyDay_ && (!since_ || day < *since_))
@@ -98,6 +98,7 @@ void Assembly::feedItems() {
     if (next_ <= assembled_) {
         changed_.clear();
         findings_.clear();
+        outcomes_ = {};
     }
 }
 
@@ -118,6 +119,13 @@ void Assembly::finishIfEnded(pqxx::transaction_base& work) {
 void Assembly::heard(const calls::Message& /*message*/, const calls::Call* call) {
     if (call != nullptr)
         remember(*call);
+}
+
+void Assembly::ended(const calls::Call& call) {
+    put(call);
+    ++outcomes_.calls;
+    if (hasFailed(call))
+        ++outcomes_.failed[call.cause ? std::optional<int>(call.cause->value) : std::nullopt];
 }
 
 void Assembly::gone(const calls::Call& call) {
@@ -153,6 +161,7 @@ void Assembly::found(const calls::Finding& finding) {
     if (ordinals_.size() > ordinalsRemembered)
         ordinals_.erase(ordinals_.begin());
     findings_.emplace_back(finding, ordinal);
+    ++outcomes_.findings[finding.kind->id];
 }
 
 // A finding may come before its call is heard of, so the call is looked up only now.
@@ -165,8 +174,20 @@ void Assembly::collect(Results& results) {
             firstFrame = known->second;
         results.findings.push_back(rowOf(key_, finding, ordinal, firstFrame));
     }
+    outcomes_.isLinkUp = isLinkUp();
+    results.outcomes[key_.trunk].add(outcomes_);
     changed_.clear();
     findings_.clear();
+    outcomes_ = {};
+}
+
+// Of the link that a primary rate has. Nothing tells whether a link that was never spoken of is up.
+std::optional<bool> Assembly::isLinkUp() const {
+    const calls::DChannel* const channel = analysis_.dChannel(name_);
+    const calls::Link* const link = channel == nullptr ? nullptr : channel->find(isdn::callControlSapi, 0);
+    if (link == nullptr || link->state() == calls::LinkState::unknown)
+        return std::nullopt;
+    return link->state() == calls::LinkState::up;
 }
 
 }  // namespace fleet

@@ -14,6 +14,7 @@
 #include "calls/Analysis.h"
 #include "fleet/query/FrameRows.h"
 #include "fleet/store/CallRow.h"
+#include "fleet/store/Figures.h"
 
 namespace fleet {
 
@@ -21,6 +22,7 @@ namespace fleet {
 struct Results {
     std::vector<CallRow> calls;
     std::vector<FindingRow> findings;
+    std::map<int, Outcomes> outcomes;  // by trunk, to be counted once the rows are written
 };
 
 // Reads frames in the order of their numbers, as far as none is missing, and hands them to the analysis that
@@ -44,7 +46,7 @@ class Assembly : private calls::Listener {
 
   private:
     void heard(const calls::Message& message, const calls::Call* call) override;
-    void ended(const calls::Call& call) override { put(call); }
+    void ended(const calls::Call& call) override;
     void gone(const calls::Call& call) override;
     void found(const calls::Finding& finding) override;
 
@@ -57,8 +59,10 @@ class Assembly : private calls::Listener {
     void put(const calls::Call& call);
     void putOpen();
     void collect(Results& results);
+    std::optional<bool> isLinkUp() const;
 
     RunKey key_;
+    std::string name_;
     FrameRows rows_;
     calls::Analysis analysis_;
     std::uint64_t next_ = 1;            // the frame that is analysed next
@@ -71,7 +75,8 @@ class Assembly : private calls::Listener {
     std::map<std::uint64_t, CallRow> changed_;  // calls, by their first frame
     std::map<std::uint64_t, CallRow> open_;     // as they were put last, by their first frame
     std::vector<std::pair<calls::Finding, std::uint32_t>> findings_;  // with their ordinals
-    std::map<std::uint64_t, std::uint64_t> firstFrames_;              // by number of the call
+    Outcomes outcomes_;
+    std::map<std::uint64_t, std::uint64_t> firstFrames_;  // by number of the call
     std::map<std::pair<std::uint64_t, std::string_view>, std::uint32_t> ordinals_;
 };
 

@@ -14,7 +14,8 @@ namespace fleet {
 struct Letter {
     std::string subject;
     std::string text;
-    std::uint64_t sequence = 0;  // in the stream
+    std::uint64_t sequence = 0;           // in the stream
+    std::chrono::nanoseconds storedAt{};  // when the stream took it, since 1970; 0: not known
 };
 
 // A letter that cannot be stored.

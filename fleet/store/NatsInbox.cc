@@ -31,7 +31,8 @@ std::vector<Letter> NatsInbox::fetch(std::size_t most, std::chrono::milliseconds
     std::vector<Letter> letters;
     letters.reserve(held_.size());
     for (const NatsMessage& message : held_)
-        letters.push_back({std::string(message.subject()), std::string(message.text()), message.sequence()});
+        letters.push_back({std::string(message.subject()), std::string(message.text()), message.sequence(),
+                           message.storedAt()});
     return letters;
 }
 

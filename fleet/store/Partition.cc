@@ -5,6 +5,7 @@
 #include <tuple>
 #include <utility>
 
+#include "fleet/metrics/process.h"
 #include "fleet/store/sql_text.h"
 
 namespace fleet {
@@ -80,6 +81,8 @@ struct Partition::Work {
     std::vector<FrameRow> frames;
     std::set<RunKey> touched;
     std::map<std::string, std::set<RunKey>> days;  // that frames are of, with their runs
+    PartitionFigures figures;                      // what the transaction adds to them
+    Results results;
 };
 
 Partition::Partition(pqxx::connection_base& connection, unsigned partition, Steps steps)
@@ -94,7 +97,7 @@ std::vector<DeadLetter> Partition::take(std::span<const Letter> letters) {
     std::vector<DeadLetter> dead;
     try {
         store(letters, dead);
-        stored_.deadLetters += dead.size();
+        figures_.deadLetters += dead.size();
         return dead;
     } catch (const pqxx::sql_error& error) {
         forget();
@@ -128,7 +131,7 @@ std::vector<DeadLetter> Partition::bury(const Letter& letter, const std::excepti
     Work work(connection_);
     writePlace(work, {&letter, 1}, dead);
     work.transaction.commit();
-    ++stored_.deadLetters;
+    ++figures_.deadLetters;
     return dead;
 }
 
@@ -149,6 +152,7 @@ void Partition::store(std::span<const Letter> letters, std::vector<DeadLetter>& 
     writePlace(work, letters, dead);
     steps_("written");
     work.transaction.commit();
+    count(work, letters);
     steps_("committed");
 }
 
@@ -157,19 +161,30 @@ void Partition::takeParcel(Work& work, const Parcel& parcel) {
     const RunKey key{trunk.id, parcel.run};
     beginRun(work.transaction, key, trunk);
     work.touched.insert(key);
+    TrunkFigures& figures = work.figures.trunks[trunk.address];
+    figures.trunk = trunk.id;
+    figures.site = parcel.address.site;
+    figures.address = trunk.address;
+    figures.name = parcel.trunk;
+    figures.group = parcel.group;
+    figures.frames += parcel.frames.size();
     capture::Variant variant = parcel.variant;
     std::uint64_t number = parcel.first;
     for (const ParcelFrame& frame : parcel.frames) {
         for (const ParcelItem& note : frame.before)
             variant = note.kind == capture::Item::Kind::run ? note.variant : variant;
+        std::int64_t& newest = figures.newest[frame.item.transmitted ? 1 : 0];
+        newest = std::max(newest, frame.item.time.value_or(0));
         work.frames.push_back(rowOf(key, number++, frame, variant));
         work.days[*work.frames.back()[3]].insert(key);
     }
     for (const ParcelGap& gap : parcel.gaps)
-        work.transaction.exec_params0(
-            "INSERT INTO lapd.gaps (trunk, run, first, last, reason) VALUES ($1, $2, $3, $4, $5) ON CONFLICT "
-            "DO NOTHING",
-            key.trunk, key.run, gap.first, gap.last, gap.why);
+        figures.gaps += static_cast<std::uint64_t>(
+            work.transaction
+                .exec_params0("INSERT INTO lapd.gaps (trunk, run, first, last, reason) VALUES ($1, $2, $3, "
+                              "$4, $5) ON CONFLICT DO NOTHING",
+                              key.trunk, key.run, gap.first, gap.last, gap.why)
+                .affected_rows());
     if (!parcel.end)
         return;
     const bool isOpenGap = !parcel.gaps.empty() && !parcel.gaps.back().last;
@@ -216,20 +231,35 @@ void Partition::writeFrames(Work& work) {
             runs_[key]->expect(day);
     }
     const std::size_t added = framesTable().put(work.transaction, work.frames);
-    stored_.frames += added;
-    stored_.doubles += work.frames.size() - added;
+    work.figures.frames = added;
+    work.figures.doubles = work.frames.size() - added;
 }
 
 void Partition::assemble(Work& work) {
-    Results results;
     for (const RunKey& key : work.touched)
-        runs_[key]->advance(work.transaction, results);
+        runs_[key]->advance(work.transaction, work.results);
     steps_("assembled");
-    stored_.calls += callsTable().put(work.transaction, results.calls);
-    stored_.findings += findingsTable().put(work.transaction, results.findings);
+    work.figures.calls = callsTable().put(work.transaction, work.results.calls);
+    work.figures.findings = findingsTable().put(work.transaction, work.results.findings);
     std::erase_if(runs_, [](const auto& run) { return run.second->isFinished(); });
-    stored_.holes = static_cast<std::uint64_t>(std::count_if(
+}
+
+// The transaction is committed.
+void Partition::count(Work& work, std::span<const Letter> letters) {
+    figures_.frames += work.figures.frames;
+    figures_.doubles += work.figures.doubles;
+    figures_.calls += work.figures.calls;
+    figures_.findings += work.figures.findings;
+    figures_.holes = static_cast<std::uint64_t>(std::count_if(
         runs_.begin(), runs_.end(), [](const auto& run) { return run.second->hole().has_value(); }));
+    std::chrono::nanoseconds oldest = std::chrono::nanoseconds::max();
+    for (const Letter& letter : letters)
+        oldest = std::min(oldest, letter.storedAt);
+    figures_.lag = oldest.count() == 0 ? 0 : std::max<std::int64_t>(nanosecondsNow() - oldest.count(), 0);
+    for (auto& [address, more] : work.figures.trunks) {
+        more.outcomes = work.results.outcomes[more.trunk];
+        figures_.trunks[address].add(more);
+    }
 }
 
 void Partition::writePlace(Work& work, std::span<const Letter> letters, const std::vector<DeadLetter>& dead) {

@@ -14,19 +14,10 @@
 
 #include "fleet/Parcel.h"
 #include "fleet/store/Assembly.h"
+#include "fleet/store/Figures.h"
 #include "fleet/store/Inbox.h"
 
 namespace fleet {
-
-// What was done, for metrics.
-struct Stored {
-    std::uint64_t frames = 0;   // rows that are new
-    std::uint64_t doubles = 0;  // frames that were there already
-    std::uint64_t calls = 0;    // rows written, also again
-    std::uint64_t findings = 0;
-    std::uint64_t deadLetters = 0;
-    std::uint64_t holes = 0;  // runs that wait for a frame, just now
-};
 
 // Called at each step of a transaction and behind it, by name: "copied", "assembled", "written", "committed",
 // "buried", "acknowledged". Tests throw from it.
@@ -45,7 +36,11 @@ class Partition {
     // not take, are the result; they are in the table of dead letters. Throws pqxx::failure.
     std::vector<DeadLetter> take(std::span<const Letter> letters);
 
-    const Stored& stored() const { return stored_; }
+    // Of what was committed.
+    const PartitionFigures& figures() const { return figures_; }
+    // For those who watch: how many letters wait in the stream; and that none came when some were asked for.
+    void sawWaiting(std::uint64_t letters) { figures_.waiting = letters; }
+    void sawNone() { figures_.lag = 0; }
 
   private:
     struct Known {
@@ -64,12 +59,13 @@ class Partition {
     void beginRun(pqxx::transaction_base& work, const RunKey& key, const Known& trunk);
     void writeFrames(Work& work);
     void assemble(Work& work);
+    void count(Work& work, std::span<const Letter> letters);
     void writePlace(Work& work, std::span<const Letter> letters, const std::vector<DeadLetter>& dead);
 
     pqxx::connection_base& connection_;
     unsigned partition_;
     Steps steps_;
-    Stored stored_;
+    PartitionFigures figures_;
     std::set<std::string> days_;  // that have a partition
     std::map<Address, Known> trunks_;
     std::map<RunKey, std::unique_ptr<Assembly>> runs_;  // that have not finished

@@ -11,6 +11,7 @@
 #include "fleet/store/Lease.h"
 #include "fleet/store/NatsInbox.h"
 #include "fleet/store/Partition.h"
+#include "fleet/streams.h"
 
 namespace fleet {
 
@@ -21,6 +22,10 @@ using SteadyClock = std::chrono::steady_clock;
 
 constexpr auto betweenTries = 2s;
 constexpr auto beforeBeginningAnew = 1s;
+constexpr auto betweenFigures = 1s;
+constexpr auto betweenQuestions = 10s;
+constexpr auto betweenEngines = 60s;
+constexpr auto afterNoAnswer = 5min;
 // All partitions of a thread are asked within this time, so nothing waits for longer.
 constexpr std::chrono::milliseconds round = 200ms;
 constexpr std::chrono::milliseconds shortest = 5ms;
@@ -30,6 +35,14 @@ class Shift {
   public:
     Shift(const WorkerOptions& options, const Say& say)
         : options_(options), say_(say), database_(options.database), nats_(options.nats) {}
+    ~Shift() {
+        for (const auto& [number, held] : held_) {
+            if (options_.figures != nullptr)
+                options_.figures->release(number);
+        }
+    }
+    Shift(const Shift&) = delete;
+    Shift& operator=(const Shift&) = delete;
 
     void run(const std::atomic<bool>& stopped) {
         while (!stopped) {
@@ -40,6 +53,7 @@ class Shift {
                 const auto at = next++;
                 letters += move(at);
             }
+            tellEngines();
             if (letters == 0)
                 std::this_thread::sleep_until(begun + (held_.empty() ? round : shortest));
         }
@@ -53,6 +67,8 @@ class Shift {
         Lease lease;
         NatsInbox inbox;
         Partition partition;
+        SteadyClock::time_point nextFigures{};
+        SteadyClock::time_point nextWaiting{};
     };
 
     std::chrono::milliseconds pause() const {
@@ -65,13 +81,61 @@ class Shift {
         const unsigned number = at->first;
         try {
             Held& held = *at->second;
-            return moveOnce(held.inbox, held.partition, pause(), [](std::string_view) {});
+            const std::size_t moved = moveOnce(held.inbox, held.partition, pause(), [](std::string_view) {});
+            if (moved == 0)
+                held.partition.sawNone();
+            tell(number, held);
+            return moved;
         } catch (const NatsError& error) {
             if (!nats_.isConnected())
                 throw;
             held_.erase(at);
+            if (options_.figures != nullptr)
+                options_.figures->release(number);
             sayOf(number, error);
             return 0;
+        }
+    }
+
+    // Whoever asks for figures gets those of the last second. Only the servers know what waits.
+    void tell(unsigned number, Held& held) {
+        const auto now = SteadyClock::now();
+        if (options_.figures == nullptr || now < held.nextFigures)
+            return;
+        held.nextFigures = now + betweenFigures;
+        if (now >= std::max(held.nextWaiting, mayAskFrom_)) {
+            held.nextWaiting = now + betweenQuestions;
+            ask([&] { held.partition.sawWaiting(held.inbox.waiting()); });
+        }
+        options_.figures->set(number, held.partition.figures());
+    }
+
+    void tellEngines() {
+        if (options_.figures == nullptr)
+            return;
+        options_.figures->turned(options_.number, true);
+        if (options_.number != 0 || SteadyClock::now() < std::max(nextEngines_, mayAskFrom_))
+            return;
+        nextEngines_ = SteadyClock::now() + betweenEngines;
+        ask([&] {
+            const StreamFilling stream = fillingOf(nats_, centreStream);
+            pqxx::nontransaction work(database_);
+            const auto octets =
+                work.exec1("SELECT pg_database_size(current_database())")[0].as<std::uint64_t>();
+            options_.figures->setEngines({octets, stream.octets, stream.mostOctets});
+        });
+    }
+
+    // What only watchers want to know must not hold up the work: a server that does not answer such a
+    // question is left alone for a while.
+    template <class Question>
+    void ask(Question question) {
+        try {
+            question();
+        } catch (const NatsError& error) {
+            mayAskFrom_ = SteadyClock::now() + afterNoAnswer;
+            if (std::exchange(saidNoAnswer_, error.what()) != error.what())
+                say_(saidNoAnswer_ + "; figures of the stream are missing");
         }
     }
 
@@ -123,6 +187,9 @@ class Shift {
     std::map<unsigned, std::string> saidOf_;  // partitions
     SteadyClock::time_point nextTry_{};
     std::size_t firstToTry_ = 0;  // index in the options
+    SteadyClock::time_point nextEngines_{};
+    SteadyClock::time_point mayAskFrom_{};
+    std::string saidNoAnswer_;
 };
 
 }  // namespace
@@ -139,6 +206,8 @@ void work(const WorkerOptions& options, const std::atomic<bool>& stopped, const 
             if (why != saidLast)
                 say(why);
             saidLast = why;
+            if (options.figures != nullptr)
+                options.figures->turned(options.number, false);
             std::this_thread::sleep_for(beforeBeginningAnew);
         }
     }

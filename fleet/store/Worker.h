@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "fleet/Nats.h"
+#include "fleet/store/Figures.h"
 
 namespace fleet {
 
@@ -17,6 +18,8 @@ struct WorkerOptions {
     NatsOptions nats;
     std::vector<unsigned> partitions;  // those that this thread looks after, as far as it can lease them
     std::chrono::seconds againAfter;   // what a dead lapdstore has fetched comes again after this time
+    StoreFigures* figures = nullptr;   // where to tell what is done; outlives the worker
+    unsigned number = 0;               // of the thread, there
 };
 
 // Says a line about what went wrong or went well. Called on the worker's thread.

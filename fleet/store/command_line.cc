@@ -2,6 +2,7 @@
 
 #include <CLI/CLI.hpp>
 
+#include "fleet/metrics/HttpAnswerer.h"
 #include "fleet/subjects.h"
 
 namespace fleet {
@@ -50,6 +51,10 @@ Commands describe(CLI::App& app, StoreCommand& to) {
                    "(default: 30)")
         ->type_name("N")
         ->check(CLI::Range(1, 3600).description(""));
+    app.add_option("--metrics", to.metrics,
+                   "Offer figures for Prometheus at http://ADDR:PORT/metrics; a port alone is on 127.0.0.1 "
+                   "(default: nowhere)")
+        ->type_name("[ADDR:]PORT");
     Commands commands;
     commands.migrate = app.add_subcommand("migrate", "Makes the tables, or brings them up to date, and ends");
     commands.forget = app.add_subcommand("forget", "Forgets what is older than some days, and ends");
@@ -86,6 +91,9 @@ StoreCommand parseStoreCommand(int argc, const char* const* argv) {
         command.what = StoreCommand::What::forget;
     if (command.what == StoreCommand::What::run && command.nats.servers.empty())
         throw BadStoreCommand("--nats names no server (--help tells more)");
+    if (!command.metrics.empty() && !isListenAddress(command.metrics))
+        throw BadStoreCommand("--metrics " + command.metrics +
+                              " is no address to listen on, such as 127.0.0.1:9471");
     if (command.firstPartition > command.lastPartition)
         throw BadStoreCommand("--first is behind --last");
     return command;

@@ -34,6 +34,7 @@ struct StoreCommand {
     unsigned threads = 2;
     unsigned firstPartition = 0;
     unsigned lastPartition = 63;
+    std::string metrics;       // where to listen for those who ask for figures; empty: nowhere
     unsigned againAfter = 30;  // seconds
     unsigned days = 0;
 };

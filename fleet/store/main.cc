@@ -2,13 +2,16 @@
 #include <csignal>
 #include <iostream>
 #include <mutex>
+#include <optional>
 #include <pqxx/pqxx>
 #include <thread>
 #include <vector>
 
+#include "fleet/metrics/HttpAnswerer.h"
 #include "fleet/store/Migrations.h"
 #include "fleet/store/Worker.h"
 #include "fleet/store/command_line.h"
+#include "service/notify.h"
 
 namespace {
 
@@ -54,6 +57,12 @@ void forget(const fleet::StoreCommand& command) {
 
 void run(const fleet::StoreCommand& command) {
     stopOnSignals();
+    fleet::StoreFigures figures;
+    std::optional<fleet::HttpAnswerer> answerer;
+    if (!command.metrics.empty()) {
+        answerer.emplace(command.metrics, [&] { return figures.text(); });
+        say("figures are at http://" + answerer->address() + "/metrics");
+    }
     std::vector<fleet::WorkerOptions> shares(command.threads);
     for (unsigned partition = command.firstPartition; partition <= command.lastPartition; ++partition)
         shares[partition % command.threads].partitions.push_back(partition);
@@ -63,9 +72,15 @@ void run(const fleet::StoreCommand& command) {
         share.nats = command.nats;
         share.nats.name = "lapdstore";
         share.againAfter = std::chrono::seconds(command.againAfter);
+        share.figures = &figures;
+        share.number = static_cast<unsigned>(&share - shares.data());
         if (!share.partitions.empty())
             threads.emplace_back([&share] { fleet::work(share, stopped, say); });
     }
+    service::notify("READY=1");
+    for (std::jthread& each : threads)
+        each.join();
+    service::notify("STOPPING=1");
 }
 
 void obey(const fleet::StoreCommand& command) {

@@ -17,6 +17,7 @@
 #include "fleet/Parcel.h"
 #include "fleet/ship/Place.h"
 #include "fleet/ship/ShipConfig.h"
+#include "fleet/ship/ShipMetrics.h"
 #include "fleet/ship/Shipper.h"
 #include "fleet/streams.h"
 #include "redaction/Key.h"
@@ -192,6 +193,59 @@ TEST_F(ShipperTest, AStreamThatIsFullIsSaidAndFramesWait) {
     ship();
     receive();
     expectFrames(100);
+}
+
+TEST_F(ShipperTest, TellsItsFigures) {
+    writeConfig("folder = \"" + folder_.path() + "\"\ngroup = \"nfas\"\n", "metrics = \"0\"\n");
+    recorder_.begin(run, 1);
+    recorder_.frames(1200);
+    fleet::Shipper shipper(fleet::readShipConfig(folder_.file("ship.toml")), {},
+                           [this](const std::string& text) { said_ += text + ";"; });
+    EXPECT_NE(said_.find("figures are at http://127.0.0.1:"), std::string::npos) << said_;
+    const std::string labels = "{site=\"s\",trunk=\"s/h/0/1\",name=\"pri1\",group=\"nfas\"";
+    EXPECT_NE(metricsOf(shipper).find("lapdship_connected 0\n"), std::string::npos);
+    shipper.drain(stop_);
+    const std::string text = metricsOf(shipper);
+    const auto& figures = shipper.figures();
+    for (const std::string& line : std::vector<std::string>{
+             "lapdship_connected 1\n", "lapdship_stream_full 0\n",
+             "lapdship_parcels_kept_total " + std::to_string(figures.kept) + "\n",
+             "lapdship_frames_total" + labels + "} 1200\n", "lapdship_gaps_total" + labels + "} 0\n",
+             "lapdship_waiting_parcels" + labels + "} 0\n", "lapdship_lag_seconds" + labels + "} 0\n",
+             "lapdship_stream_bytes{stream=\"LAPD_SITE\"} 0\n",
+             "lapdship_disk_bytes{folder=\"" + folder_.path() + "\"} "})
+        EXPECT_NE(text.find("\n" + line), std::string::npos) << line << text;
+    EXPECT_GE(figures.kept, 2U);
+    // The recordings are of one direction.
+    const std::string newest = "\nlapdship_newest_frame_timestamp_seconds" + labels + ",direction=\"";
+    EXPECT_NE(text.find(newest + "tx\"} 0\n") == std::string::npos,
+              text.find(newest + "rx\"} 0\n") == std::string::npos);
+}
+
+TEST_F(ShipperTest, WhatIsNotSafeYetIsLag) {
+    recorder_.begin(run, 1);
+    recorder_.frames(5);
+    server_.kill();
+    fleet::ShipConfig config = fleet::readShipConfig(folder_.file("ship.toml"));
+    config.nats.timeout = 100ms;
+    std::atomic<bool> stop{false};
+    // The first attempt to connect fails, and with it all is over.
+    fleet::Shipper shipper(config, {}, [&](const std::string&) { stop = true; });
+    shipper.run(stop);
+    const std::string text = metricsOf(shipper);
+    EXPECT_EQ(text.find("\nlapdship_lag_seconds{site=\"s\",trunk=\"s/h/0/1\",name=\"pri1\",group=\"\"} 0\n"),
+              std::string::npos);
+    EXPECT_NE(
+        text.find("\nlapdship_waiting_parcels{site=\"s\",trunk=\"s/h/0/1\",name=\"pri1\",group=\"\"} 1\n"),
+        std::string::npos)
+        << text;
+}
+
+TEST_F(ShipperTest, AnAddressForFiguresThatIsTakenIsSaid) {
+    writeConfig("folder = \"x\"\n", "metrics = \"192.0.2.1:0\"\n");
+    EXPECT_THROW(ship(), fleet::BadListenAddress);
+    writeConfig("folder = \"x\"\n", "metrics = \"here\"\n");
+    EXPECT_THROW(ship(), fleet::BadConfig);
 }
 
 TEST_F(ShipperTest, OneFolderOfPlacesHasOneShipper) {

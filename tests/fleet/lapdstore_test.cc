@@ -217,6 +217,33 @@ TEST_F(Lapdstore, PutsWhatItCannotReadIntoTheStreamOfDeadLetters) {
     EXPECT_EQ(texts[1], deadSubjectOf(subject) + " no JSON \xff");
 }
 
+TEST_F(Lapdstore, TellsItsFigures) {
+    const std::vector<Parcel> parcels = parcelsOf(source + "/examples/net5.pcap", 10, true);
+    publish(parcels);
+    StoreFigures figures;
+    std::atomic<bool> stopped{false};
+    WorkerOptions options{url(), server.options(), {}, 30s, &figures};
+    for (unsigned partition = 0; partition < 64; ++partition)
+        options.partitions.push_back(partition);
+    std::thread worker([&] { work(options, stopped, [](const std::string&) {}); });
+    const std::string partition = "{partition=\"" + std::to_string(parcels[0].subject().partition) + "\"} ";
+    const auto end = std::chrono::steady_clock::now() + longEnough;
+    const auto isThere = [&](const std::string& line) {
+        return figures.text().find("\n" + line) != std::string::npos;
+    };
+    for (const std::string& line :
+         {"lapdstore_waiting_parcels" + partition + "0\n", "lapdstore_lag_seconds" + partition + "0\n",
+          std::string("lapdstore_connected{thread=\"0\"} 1\n"), std::string("lapdstore_database_bytes "),
+          std::string("lapdstore_stream_used_bytes ")}) {
+        while (!isThere(line) && std::chrono::steady_clock::now() < end)
+            std::this_thread::sleep_for(10ms);
+        EXPECT_TRUE(isThere(line)) << line << figures.text();
+    }
+    stopped = true;
+    worker.join();
+    EXPECT_FALSE(isThere("lapdstore_partition_leased")) << "whoever has ended leases nothing";
+}
+
 TEST_F(Lapdstore, SaysWhyAnEngineRefusesIt) {
     const auto saysOf = [](const std::string& database, const NatsOptions& nats) {
         std::atomic<bool> stopped{false};

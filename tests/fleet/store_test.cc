@@ -251,7 +251,7 @@ TEST_F(Store_, BuriesWhatIsNoParcelAndStoresTheRest) {
               "3|it is about another D channel than its subject\n"
               "4|it is of another partition\n");
     EXPECT_EQ(rows("SELECT finished FROM lapd.runs"), "t\n");
-    EXPECT_EQ(partition.stored().deadLetters, 4U);
+    EXPECT_EQ(partition.figures().deadLetters, 4U);
 }
 
 TEST_F(Store_, BuriesTheOneLetterThatTheDatabaseRefuses) {
@@ -286,6 +286,92 @@ TEST_F(Store_, KeepsDaysInPartitionsAndForgetsThemWhole) {
     EXPECT_EQ(rows("SELECT count(*) FROM pg_inherits WHERE inhparent = 'lapd.frames'::regclass"), "3\n");
     EXPECT_EQ(rows("SELECT lapd.forget_before(current_date - 1)"), "1\n");
     EXPECT_EQ(count("frames"), std::to_string(frames.size() - frames.size() / 2) + "\n");
+}
+
+// The first half is stored by another Partition, whose frames are read again: what came of them does not
+// count twice.
+TEST_F(Store_, CountsCallsAndFindingsOnceThoughItReadsFramesAgain) {
+    for (const char* const name : {"/examples/net5.pcap", "/tests/reader/data/traps/overlap.hex"}) {
+        SCOPED_TRACE(name);
+        empty();
+        const std::vector<Parcel> parcels = parcelsOf(source + name, 3, true);
+        Outcomes sum;
+        std::uint64_t frames = 0;
+        for (const bool isSecond : {false, true}) {
+            FakeInbox inbox;
+            for (std::size_t i = 0; i < parcels.size(); ++i) {
+                if ((i >= parcels.size() / 2) == isSecond || i == 0)
+                    inbox.add(parcels[i]);
+            }
+            pqxx::connection connection(url());
+            Partition partition(connection, partitionOf(parcels[0]));
+            moveAll(inbox, partition);
+            const TrunkFigures& trunk = partition.figures().trunks.at("london/h1/0/1");
+            EXPECT_EQ(partition.figures().doubles, isSecond ? parcels[0].frames.size() : 0U);
+            frames += partition.figures().frames;
+            sum.add(trunk.outcomes);
+        }
+        EXPECT_EQ(std::to_string(frames) + "\n", count("frames"));
+        EXPECT_EQ(std::to_string(sum.calls) + "\n",
+                  rows("SELECT count(*) FROM lapd.calls WHERE ended IS NOT NULL"));
+        std::string failed;
+        for (const auto& [cause, number] : sum.failed)
+            failed += (cause ? std::to_string(*cause) : "-") + "|" + std::to_string(number) + "\n";
+        EXPECT_EQ(failed,
+                  rows("SELECT cause, count(*) FROM lapd.calls WHERE failed GROUP BY 1 ORDER BY 1 NULLS "
+                       "FIRST"));
+        std::string findings;
+        for (const auto& [kind, number] : sum.findings)
+            findings += std::string(kind) + "|" + std::to_string(number) + "\n";
+        EXPECT_EQ(findings,
+                  rows("SELECT kind COLLATE \"C\", count(*) FROM lapd.findings GROUP BY 1 ORDER BY 1"));
+    }
+}
+
+TEST_F(Store_, TellsItsFigures) {
+    StoreFigures all;
+    std::vector<Parcel> parcels = parcelsOf(net5, 1000);
+    FakeInbox inbox;
+    inbox.add(parcels[0]);
+    inbox.add("lapd.1.x", "{}");
+    pqxx::connection connection(url());
+    Partition partition(connection, partitionOf(parcels[0]));
+    moveAll(inbox, partition);
+    partition.sawWaiting(7);
+    all.set(17, partition.figures());
+    all.turned(1, true);
+    all.setEngines({1, 2, 3});
+    const std::string text = all.text();
+    const std::string labels =
+        "{site=\"london\",trunk=\"london/h1/0/1\",name=\"" + parcels[0].trunk + "\",group=\"\"";
+    const std::string calls = rows("SELECT count(*) FROM lapd.calls WHERE ended IS NOT NULL");
+    for (const std::string& line : std::vector<std::string>{
+             "lapdstore_partition_leased{partition=\"17\"} 1\n",
+             "lapdstore_waiting_parcels{partition=\"17\"} 7\n",
+             "lapdstore_dead_letters_total{partition=\"17\"} 1\n",
+             "lapdstore_lag_seconds{partition=\"17\"} 0\n",
+             "lapdstore_frames_total{partition=\"17\"} " + count("frames"),
+             "lapdstore_trunk_frames_total" + labels + "} " + count("frames"),
+             "lapdstore_calls_total" + labels + "} " + calls, "lapdstore_link_up" + labels + "} 1\n",
+             "lapdstore_findings_total" + labels + ",kind=\"stuck-channel\"} 0\n",
+             "lapdstore_connected{thread=\"1\"} 1\n", "lapdstore_database_bytes 1\n",
+             std::string("lapdstore_stream_used_bytes 2\n"), std::string("lapdstore_stream_bytes 3\n")})
+        EXPECT_NE(text.find("\n" + line), std::string::npos) << line << text;
+    // What the link is now, not what it was.
+    parcels[0].first += parcels[0].frames.size();
+    ParcelItem disconnect = parcels[0].frames.back().item;
+    disconnect.transmitted = false;
+    disconnect.octets = {0x02, 0x01, 0x53};
+    ParcelItem answer = disconnect;
+    answer.transmitted = true;
+    answer.octets = {0x02, 0x01, 0x73};
+    parcels[0].frames = {{disconnect, {}}, {answer, {}}};
+    inbox.add(parcels[0]);
+    moveAll(inbox, partition);
+    all.set(17, partition.figures());
+    EXPECT_NE(all.text().find("\nlapdstore_link_up" + labels + "} 0\n"), std::string::npos);
+    all.release(17);
+    EXPECT_EQ(all.text().find("partition=\"17\""), std::string::npos);
 }
 
 TEST_F(Store_, LetsWritersAddAndReadersReadAndNothingElse) {
