@@ -1,0 +1,66 @@
+"""The alerts in packaging/prometheus: Prometheus' own tool takes them, they say what they should, and the figures that
+they ask for are figures that the programs offer and the page explains."""
+
+import os
+import pathlib
+import re
+import shutil
+import subprocess
+import unittest
+
+SOURCE = pathlib.Path(os.environ["SOURCE"])
+FOLDER = SOURCE / "packaging/prometheus"
+RULES = FOLDER / "alerts.yml"
+METRIC = r"\b(?:lapdship|lapdstore)_[a-z_]+\b"
+
+
+def offered():
+    """Metrics of both programs, as their sources name them."""
+    sources = (SOURCE / "fleet/ship/ShipMetrics.cc", SOURCE / "fleet/store/Figures.cc")
+    return {name for source in sources for name in re.findall(f'"({METRIC})"', source.read_text())}
+
+
+class Names(unittest.TestCase):
+    def test_alerts_ask_for_what_the_programs_offer(self):
+        asked = set(re.findall(METRIC, "\n".join(
+            line for line in RULES.read_text().splitlines() if not re.match(r" +(summary|description|-? ?name):", line))))
+        self.assertGreater(len(asked), 10)
+        self.assertEqual(asked - offered(), set())
+
+    def test_the_page_explains_every_figure(self):
+        page = (SOURCE / "docs/user/fleet-metrics.md").read_text()
+        told = {name for name in re.findall(METRIC, page) if not name.endswith("_build_info")}
+        self.assertEqual(told, offered())
+
+    def test_the_page_explains_every_alert(self):
+        page = (SOURCE / "docs/user/fleet-metrics.md").read_text()
+        self.assertEqual(set(re.findall(r"\bLapd[A-Z]\w+", page)), set(re.findall(r"alert: (\w+)", RULES.read_text())))
+
+    def test_what_inhibits_is_an_alert(self):
+        named = set(re.findall(r"\bLapd[A-Z]\w+", (FOLDER / "alertmanager.yml").read_text()))
+        self.assertGreater(len(named), 3)
+        self.assertLessEqual(named, set(re.findall(r"alert: (\w+)", RULES.read_text())))
+
+
+@unittest.skipUnless(shutil.which("promtool"), "there is no promtool")
+class Promtool(unittest.TestCase):
+    def expect_good(self, *words):
+        done = subprocess.run(["promtool", *map(str, words)], capture_output=True, text=True, timeout=120, check=False)
+        self.assertEqual(done.returncode, 0, done.stdout + done.stderr)
+
+    def test_takes_the_rules(self):
+        self.expect_good("check", "rules", RULES)
+
+    def test_takes_the_configuration(self):
+        self.expect_good("check", "config", FOLDER / "prometheus.yml")
+
+    def test_finds_that_the_rules_say_what_they_should(self):
+        self.expect_good("test", "rules", SOURCE / "tests/fleet/alerts_test.yml")
+
+    def test_every_alert_is_tested(self):
+        tested = set(re.findall(r"alertname: (\w+)\n +exp_alerts", (SOURCE / "tests/fleet/alerts_test.yml").read_text()))
+        self.assertEqual(tested, set(re.findall(r"alert: (\w+)", RULES.read_text())))
+
+
+if __name__ == "__main__":
+    unittest.main()
