@@ -18,6 +18,7 @@ import ctypes
 import os
 import pathlib
 import random
+import signal
 import subprocess
 import sys
 import tempfile
@@ -70,7 +71,7 @@ class Disk:
 class Chaos:
     """Faults of a running fleet. Each is a function that does it, and returns what undoes it."""
 
-    def __init__(self, fleet, disk, seed):
+    def __init__(self, fleet, disk, seed, spare=()):
         self.fleet, self._random, self._disk = fleet, random.Random(seed), disk
         self.faults = {"recorder": self._kill(lambda: self._random.choice(fleet.trunks).recorder, 3),
                        "shipper": self._kill(lambda: self._random.choice(list(fleet.shippers.values())), 3),
@@ -80,6 +81,8 @@ class Chaos:
                        "PostgreSQL": self._database, "line to a site": self._line}
         if disk.is_real:
             self.faults["disk of a site"] = self._fill
+        for name in spare:
+            self.faults.pop(name, None)
         self.count = dict.fromkeys(self.faults, 0)
         self.unwanted = []
         self._undo = []  # (when, what, busy)
@@ -178,7 +181,7 @@ def run(options):
         with Fleet(folder, options.trunks, traffic, SITES, site_folder=disk.of, megabytes=megabytes) as fleet:
             print(f"seed {options.seed}: {options.trunks} trunks at {len(SITES)} sites, {options.minutes:g} minutes; up after "
                   f"{time.monotonic() - began:.0f} seconds", flush=True)
-            chaos = Chaos(fleet, disk, options.seed)
+            chaos = Chaos(fleet, disk, options.seed, options.spare)
             chaos.run(seconds)
             calm = time.monotonic()
             chaos.look_at_all()
@@ -211,6 +214,7 @@ def main(words=None):
     parser.add_argument("--minutes", type=float, default=30, metavar="M")
     parser.add_argument("--rate", type=float, default=0.25, help="calls a second on each trunk (default: 0.25)")
     parser.add_argument("--seed", type=int, default=random.randrange(1 << 32), help="repeats traffic and order of the faults")
+    parser.add_argument("--spare", action="append", default=[], metavar="FAULT", help="leave this fault out: 'disk of a site'")
     parser.add_argument("--patience", type=float, default=600, help="seconds for the store to have all, at the end")
     parser.add_argument("--keep", metavar="FOLDER", help="where everything is copied to if something is wrong")
     options = parser.parse_args(words)
@@ -218,6 +222,7 @@ def main(words=None):
         print(f"not installed: {', '.join(missing())}")
         return SKIPPED
     os.environ["TZ"] = "UTC"
+    signal.signal(signal.SIGTERM, lambda *_: sys.exit(1))  # takes everything down
     return run(options)
 
 

@@ -2,7 +2,7 @@
 
     scripts/fleet-demo [--trunks N]
 
-Starts three servers of NATS and two of sites, PostgreSQL, and N trunks on the software board with their recorders,
+Starts three servers of NATS and two of sites, PostgreSQL, Prometheus, and N trunks on the software board with their recorders,
 shippers and stores; lets calls pass for half a minute; asks ten questions; takes all of it down.
 """
 
@@ -59,8 +59,8 @@ QUESTIONS = (
      psql("SELECT site, count(*) AS calls, count(*) FILTER (WHERE outcome = 'answered') AS answered, round(100.0 * count(*) FILTER "
           "(WHERE outcome = 'answered') / count(*)) AS percent, round(avg(alerting_ms)) AS ms_to_ring FROM lapd.calls "
           "JOIN lapd.trunks USING (trunk) WHERE ended IS NOT NULL GROUP BY 1 ORDER BY 1")),
-    ("What did the network say, octet by octet, when it refused a call with cause 34?",
-     "lapdread explain --store $STORE --trunk pri3 --cause 34 --first 1"),
+    ("Which alerts does Prometheus raise just now?",
+     """promtool query instant $PROMETHEUS 'ALERTS{alertstate="firing"}'"""),
     ("Is anything missing, and how far is the store behind?",
      psql("SELECT (SELECT count(*) FROM lapd.gaps) AS gaps, (SELECT count(*) FROM lapd.dead_letters) AS dead_letters, "
           "(SELECT count(*) FROM lapd.runs WHERE NOT finished AND EXISTS (SELECT FROM lapd.frames f WHERE f.trunk = runs.trunk "
@@ -85,6 +85,7 @@ def ask(number, question, command, environment):
 def show(fleet, began):
     environment = {**os.environ, "STORE": fleet.url(), "WEEK": time.strftime("%Y-%m-%d", time.gmtime(time.time() - 7 * 86400)),
                    "PATH": f"{BINARIES}:{os.environ['PATH']}", "PAGER": "cat"}
+    environment["PROMETHEUS"] = fleet.start_prometheus()
     engines = fleet.engines
     print(f"Up after {time.monotonic() - began:.0f} seconds:\n"
           f"  {len(fleet.trunks)} trunks: softboard -- lapdmon, and lapdread record\n"
@@ -92,6 +93,7 @@ def show(fleet, began):
           f"  centre: nats-server {' '.join(engines.servers())}\n"
           f"          {len(fleet.stores)} x lapdstore -> PostgreSQL\n"
           f"  STORE={fleet.url()}\n"
+          f"  PROMETHEUS={environment['PROMETHEUS']}\n"
           f"\nCalls pass for {SECONDS} seconds. Meanwhile a lapdstore and a server of the centre are killed (kill -9), and the\n"
           f"line to {SITES[0]} is cut for 5 seconds.", flush=True)
     time.sleep(SECONDS / 3)
@@ -121,8 +123,8 @@ def main():
     options = parser.parse_args()
     if not 3 <= options.trunks <= 200:
         parser.error("--trunks must be 3 to 200")
-    if missing():
-        raise SystemExit(f"not installed: {', '.join(missing())}")
+    if missing("prometheus", "promtool"):
+        raise SystemExit(f"not installed: {', '.join(missing('prometheus', 'promtool'))}")
     signal.signal(signal.SIGTERM, lambda *_: sys.exit(1))
     os.environ["TZ"] = "UTC"
     began = time.monotonic()

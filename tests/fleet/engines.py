@@ -1,4 +1,4 @@
-"""The engines of a fleet on this machine: three NATS servers of a centre, one for each site, PostgreSQL, Prometheus.
+"""The engines of a fleet on this machine: three NATS servers of a centre, one for each site, PostgreSQL, and Prometheus.
 
     with Engines(folder) as engines:          everything is up, and is taken down however the block ends
         engines.nats["centre-1"].kill()       as kill -9
@@ -14,6 +14,7 @@ import contextlib
 import csv
 import glob
 import io
+import json
 import os
 import pathlib
 import pwd
@@ -42,10 +43,10 @@ def own_address():
     return f"127.{64 + (pid >> 16) % 64}.{pid >> 8 & 255}.{pid & 255}"
 
 
-def missing():
+def missing(*more):
     """Programs that are not installed; none may be."""
     paths = os.pathsep.join([os.environ.get("PATH", ""), "/usr/sbin", database_programs()])
-    return [name for name in ("nats-server", "postgres", "initdb", "psql", "openssl", "setpriv")
+    return [name for name in ("nats-server", "postgres", "initdb", "psql", "openssl", "setpriv", *more)
             if shutil.which(name, path=paths) is None]
 
 
@@ -121,11 +122,10 @@ class Engines:
     """`sites`: their names; each gets a server that is a leaf of the centre's three, behind a cable that can be cut.
     `site_folder(name)`: where a site's stream is kept, below the folder unless told."""
 
-    def __init__(self, folder, sites=("london",), site_folder=None, prometheus=None):
+    def __init__(self, folder, sites=("london",), site_folder=None):
         self.folder, self.sites, self.address = pathlib.Path(folder), tuple(sites), own_address()
         self.certificates = self.folder / "certificates"
         self._site_folder = site_folder or (lambda site: self.folder / site)
-        self._prometheus = prometheus
         self.nats, self.cables, self.database, self.prometheus = {}, {}, None, None
         self._down = contextlib.ExitStack()
 
@@ -140,8 +140,6 @@ class Engines:
                 self.cables[site] = self._down.enter_context(
                     Cable([((self.address, CABLE_PORT + 10 * number + i), (self.address, LEAF_PORT + i)) for i in (1, 2, 3)]))
                 self._start_nats(site, number, self._site_folder(site), self._leaf(site, number))
-            if self._prometheus:
-                self._start_prometheus()
             self.await_ready()
             return self
         except BaseException:
@@ -267,14 +265,20 @@ class Engines:
                                    str(DATABASE_PORT)], check=False).returncode == 0
         awaited(is_up, "PostgreSQL")
 
-    def _start_prometheus(self):
-        folder = self._own(self.folder / "prometheus", "prometheus")
-        self.prometheus = Process("prometheus", ["prometheus", f"--config.file={self._prometheus}",
+    def start_prometheus(self, targets):
+        """With the alerts of the tree. `targets`: addresses that are asked, by the name of their program."""
+        folder, configuration = self._own(self.folder / "prometheus", "prometheus"), self.folder / "prometheus.yml"
+        jobs = [{"job_name": job, "static_configs": [{"targets": each}]} for job, each in targets.items()]
+        configuration.write_text(json.dumps({
+            "global": {"scrape_interval": "1s", "evaluation_interval": "1s"},
+            "rule_files": [str(ROOT / "packaging/prometheus/alerts.yml")], "scrape_configs": jobs}))  # JSON is YAML as well
+        self.prometheus = Process("prometheus", ["prometheus", f"--config.file={configuration}",
                                                  f"--storage.tsdb.path={folder}",
                                                  f"--web.listen-address={self.address}:{PROMETHEUS_PORT}"],
                                   self.folder, "prometheus", cwd="/")
         self._down.callback(self.prometheus.take_down)
         self.prometheus.start()
+        return f"http://{self.address}:{PROMETHEUS_PORT}"
 
     def await_ready(self):
         for number, engine in enumerate(self.nats.values(), 1):
@@ -296,19 +300,16 @@ def answers(address, port):
 def main():
     parser = argparse.ArgumentParser(prog="scripts/fleet-engines", description=__doc__,
                                      formatter_class=argparse.RawDescriptionHelpFormatter)
-    parser.add_argument("--prometheus", metavar="CONFIGURATION", help="start Prometheus as well")
     parser.add_argument("sites", nargs="*", metavar="SITE", help="names of sites (default: london)")
     options = parser.parse_args()
     signal.signal(signal.SIGTERM, lambda *_: sys.exit(1))
     with tempfile.TemporaryDirectory(prefix="fleet-engines.") as folder, \
-            Engines(folder, options.sites or ["london"], prometheus=options.prometheus) as engines:
+            Engines(folder, options.sites or ["london"]) as engines:
         print(f"centre:        {' '.join(engines.servers())}")
         for site in engines.sites:
             print(f"site {site}: {' '.join(engines.servers(site))}")
         print(f"certificates:  {engines.certificates} (clients: {', '.join(CLIENTS)})")
         print(f"database:      {engines.owner_url} (its owner, here), {engines.database_url('reads')} (as a role that you make)")
-        if engines.prometheus:
-            print(f"Prometheus:    http://{engines.address}:{PROMETHEUS_PORT}")
         print("Enter, or a signal, takes all of it down.", flush=True)
         with contextlib.suppress(KeyboardInterrupt):
             sys.stdin.readline()

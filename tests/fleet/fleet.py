@@ -13,6 +13,8 @@ from traffic import Trunk as Traffic
 
 BINARIES = pathlib.Path(os.environ.get("FLEET_BINARIES", pathlib.Path(__file__).resolve().parents[2] / "build/release/bin"))
 
+SHIP_METRICS, STORE_METRICS = 29470, 29480  # ports
+
 
 def program(name):
     return str(BINARIES / name)
@@ -63,10 +65,10 @@ class Trunk:
 class Fleet:
     """`traffic(number)`: the capture that trunk `number` plays, from 1. Trunks are shared out among the sites."""
 
-    def __init__(self, folder, trunks, traffic, sites=("london", "leeds"), stores=2, prometheus=None, site_folder=None,
+    def __init__(self, folder, trunks, traffic, sites=("london", "leeds"), stores=2, site_folder=None,
                  megabytes=200):
         self.folder = pathlib.Path(folder)
-        self.engines = Engines(self.folder, sites, site_folder, prometheus)
+        self.engines = Engines(self.folder, sites, site_folder)
         self.shippers, self.stores, self.trunks = {}, [], []
         self._plan = (trunks, traffic, stores)
         self._megabytes = megabytes  # of a site's stream
@@ -91,6 +93,16 @@ class Fleet:
     def url(self, user="reads"):
         return self.engines.database_url(user)
 
+    def metrics(self, site=None, store=0):
+        """Where the shipper of a site, or a store, offers its figures."""
+        return f"{self.engines.address}:{STORE_METRICS + store if site is None else SHIP_METRICS + self.engines.sites.index(site)}"
+
+    def start_prometheus(self):
+        """Returns its URL."""
+        return self.engines.start_prometheus({
+            "lapdship": [self.metrics(site) for site in self.engines.sites],
+            "lapdstore": [self.metrics(store=number) for number in range(1, self._plan[2] + 1)]})
+
     # Setting it up, as the pages say.
 
     def _toml(self, site, user, trunks=()):
@@ -99,6 +111,7 @@ class Fleet:
         state = self._state_folder(site) / "shipper" if site else self.folder
         state.mkdir(parents=True, exist_ok=True)
         text = (f'site = "{site or "centre"}"\nhost = "h1"\nservers = [ {servers} ]\nstate = "{state}"\n'
+                f'metrics = "{self.metrics(site)}"\n'
                 f'[tls]\nauthority = "{authority}"\ncertificate = "{certificate}"\nkey = "{key}"\n')
         for trunk in trunks:
             text += (f'[[dchannel]]\nboard = "{trunk.number}"\ndchannel = "1"\ntrunk = "{trunk.name}"\n'
@@ -161,7 +174,8 @@ class Fleet:
         words = [program("lapdstore"), "--database", self.url("lapdstore"), *nats, "--authority", authority, "--certificate",
                  certificate, "--key", key, "--again-after", "5"]
         for number in range(1, self._plan[2] + 1):
-            self.stores.append(self._add(Process(f"lapdstore.{number}", words, self.folder)).start())
+            own = [*words, "--metrics", self.metrics(store=number)]
+            self.stores.append(self._add(Process(f"lapdstore.{number}", own, self.folder)).start())
 
     def leased(self):
         """How many partitions of the stream are leased to a store."""
