@@ -21,10 +21,11 @@ constexpr std::chrono::milliseconds glance{20};  // how often a growing file is 
 
 [[noreturn]] void fail(const std::string& name) { throw BadInput(name + ": " + std::strerror(errno)); }
 
-int open(const std::string& name) {
+// `flags` may say not to wait for the writer of a FIFO.
+int open(const std::string& name, int flags = 0) {
     if (name == "-")
         return STDIN_FILENO;
-    const int file = ::open(name.c_str(), O_RDONLY | O_CLOEXEC);
+    const int file = ::open(name.c_str(), O_RDONLY | O_CLOEXEC | flags);
     if (file < 0)
         fail(name);
     return file;
@@ -40,11 +41,19 @@ struct stat statusOf(int file, const std::string& name) {
 }  // namespace
 
 Source::Source(std::string path, bool follow)
-    : name_(std::move(path)), file_(open(name_)), follow_(follow), capacity_(2 * readSize) {
+    : name_(std::move(path)),
+      file_(open(name_, follow ? O_NONBLOCK : 0)),
+      follow_(follow),
+      capacity_(2 * readSize) {
     const struct stat status = statusOf(file_, name_);
     isRegular_ = S_ISREG(status.st_mode);
-    if (follow_ && S_ISFIFO(status.st_mode) && file_ != STDIN_FILENO)
+    if (follow_ && S_ISFIFO(status.st_mode) && file_ != STDIN_FILENO) {
         ownWriter_ = ::open(name_.c_str(), O_WRONLY | O_NONBLOCK | O_CLOEXEC);
+        if (ownWriter_ < 0) {  // its end would come before its first writer
+            ::close(file_);
+            file_ = open(name_);
+        }
+    }
     buffer_ = std::make_unique_for_overwrite<char[]>(capacity_);
 }
 

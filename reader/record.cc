@@ -239,8 +239,8 @@ int runRecord(const Options& given, Chatter& chatter) {
             "--on keeps all that surrounds a trigger: --call, --failed, --unanswered do not go with it");
     if (!std::filesystem::is_directory(rules.files.folder))
         throw FileError("cannot write into " + rules.files.folder + ": no such folder");
-    Session session(options, chatter);
     heedSignals();
+    Session session(options, chatter);
     Recorder recorder(rules, options, chatter);
     service::notify("READY=1");
     try {

@@ -342,14 +342,45 @@ class FullDisk(Recording):
 
 
 class Service(Recording):
-    def test_the_service_manager_hears_that_the_recorder_is_ready_and_records_on(self):
+    def manager(self):
+        """A socket that hears what a service tells its manager, and the variable that names it."""
         manager = socket.socket(socket.AF_UNIX, socket.SOCK_DGRAM)
         self.addCleanup(manager.close)
         manager.settimeout(LIMIT)
         name = "lapdread-record-" + str(os.getpid())
         manager.bind("\0" + name)
+        return manager, "NOTIFY_SOCKET=@" + name
+
+    def test_signals_end_no_recorder_that_waits_for_the_writer_of_a_fifo(self):
+        manager, variable = self.manager()
+        fifo = self.folder / "fifo"
+        os.mkfifo(fifo)
+        recorder = self.start("env", variable, "WATCHDOG_USEC=300000", LAPDREAD, "record", "--trunk", "t", fifo)
+        # It goes on to say that it lives, so it does not wait within open().
+        self.assertEqual([manager.recv(100) for _ in range(3)], [b"READY=1"] + 2 * [b"WATCHDOG=1"])
+        recorder.send_signal(signal.SIGHUP)
+        recorder.send_signal(signal.SIGUSR1)
+        for number in (1, 2):  # a writer that goes away ends nothing either
+            writer = None
+
+            def opened():
+                nonlocal writer
+                try:
+                    writer = os.open(fifo, os.O_WRONLY | os.O_NONBLOCK)
+                except OSError:  # nobody reads it yet
+                    return False
+                return True
+            until(opened, "the recorder reads the FIFO")
+            os.write(writer, (numbered(number, number) + "\n").encode())
+            os.close(writer)
+            self.has(number)
+        self.stop(recorder)
+        self.assertEqual(self.numbers(*self.recorded()), [1, 2])
+
+    def test_the_service_manager_hears_that_the_recorder_is_ready_and_records_on(self):
+        manager, variable = self.manager()
         self.write("t.hex", numbered(1))
-        recorder = self.start("env", "NOTIFY_SOCKET=@" + name, "WATCHDOG_USEC=300000",
+        recorder = self.start("env", variable, "WATCHDOG_USEC=300000",
                               LAPDREAD, "record", "--trunk", "t", "t.hex")
         told = [manager.recv(100) for _ in range(4)]
         self.assertEqual(told, [b"READY=1"] + 3 * [b"WATCHDOG=1"])
