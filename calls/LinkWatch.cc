@@ -4,6 +4,7 @@
 #include <utility>
 
 #include "calls/FindingKinds.h"
+#include "calls/linkWords.h"
 
 namespace calls {
 
@@ -11,23 +12,11 @@ using isdn::FrameType;
 
 namespace {
 
-constexpr unsigned repetitions200 = 3;  // N200
 constexpr std::int64_t flapTime = 60 * second;
 constexpr std::size_t flapTimes = 3;
-constexpr std::int64_t notReadyTime = 10 * second;
 constexpr std::int64_t hour = 3600 * second;
-constexpr unsigned idlePeriods = 3, leastPeriods = 2;
 // Fewer repetitions, or on fewer occasions, do not show a line that loses frames.
 constexpr std::uint64_t leastRepeated = 10, leastOccasions = 3;
-
-constexpr std::array bothSides{Side::us, Side::peer};
-
-std::string nameOf(Side side) { return side == Side::us ? "our side" : "the other side"; }
-
-std::string secondsOf(std::int64_t duration) {
-    const std::int64_t tenths = (duration + 50 * millisecond) / (100 * millisecond);
-    return std::to_string(tenths / 10) + "." + std::to_string(tenths % 10) + " s";
-}
 
 bool isSetUp(FrameType type) { return type == FrameType::SABME || type == FrameType::SABM; }
 
@@ -86,7 +75,7 @@ void LinkWatch::polls(const Sample& sample) {
         Asked& asked = polls_[indexOf(other(sample.from()))];
         if (asked.count > 1 && !asked.reported)
             observe(findings::pollUnanswered, asked.frame, asked.first,
-                    std::to_string(asked.count - 1) + " of " + nameOf(other(sample.from())) +
+                    std::to_string(asked.count - 1) + " of " + wordsOf(other(sample.from())) +
                         "'s polls got no answer before one was answered",
                     Severity::note);
         asked = {};
@@ -116,7 +105,7 @@ void LinkWatch::flaps(const Sample& sample, const Marks& marks, const Circumstan
         around.access != Access::basic && !around.outOfService && (sentInformation_ || !around.grouped);
     if (isSetUp(sample.layer2.type) && up_ && mayFlap)
         observe(findings::linkFlap, sample.number, sample.at,
-                nameOf(sample.from()) + " set the link up again while it was up");
+                wordsOf(sample.from()) + " set the link up again while it was up");
     if (!marks.linkUp)
         return;
     const bool again = std::exchange(lost_, false) && !released_;
@@ -212,34 +201,8 @@ void LinkWatch::endHour(Repeated& repeated, Side side) {
         repeated.occasions >= leastOccasions)
         observe(findings::retransmissions, repeated.lastAgain, repeated.lastAgainAt,
                 std::to_string(repeated.again) + " of " + std::to_string(repeated.sent) + " I frames of " +
-                    nameOf(side) + " were sent again within an hour");
+                    wordsOf(side) + " were sent again within an hour");
     repeated = {};
-}
-
-void LinkWatch::schedule(const Circumstances& around) {
-    due_ = never;
-    const std::int64_t wait = around.timers->t200 + around.timers->slack;
-    const auto by = [&](bool waits, std::int64_t at) {
-        if (waits)
-            due_ = std::min(due_, at);
-    };
-    for (const std::size_t side : {std::size_t{0}, std::size_t{1}}) {
-        for (const Asked* const asked : {&polls_[side], &setUps_[side], &demands_[side]})
-            due_ = std::min(due_, dueOf(*asked, around));
-        by(full_[side].holds && !full_[side].reported, full_[side].at + wait);
-        by(notReady_[side].holds && !notReady_[side].reported, notReady_[side].at + notReadyTime);
-        due_ = std::min(due_, dueOf(idle_[side], around));
-    }
-}
-
-void LinkWatch::expire(std::int64_t at, const Circumstances& around) {
-    for (const Side side : bothSides) {
-        expireDemands(side, at, around);
-        expireSetUps(side, at, around);
-        expireWindows(side, at, around);
-        expireKeepAlives(side, at, around);
-    }
-    schedule(around);
 }
 
 void LinkWatch::Asked::add(const Sample& sample) {
@@ -249,75 +212,6 @@ void LinkWatch::Asked::add(const Sample& sample) {
     last = sample.at;
     if (count == repetitions200 + 1)
         exhausted = sample.at;
-}
-
-// When the answer to the last allowed repetition is overdue. Some equipment repeats for ever.
-std::int64_t LinkWatch::dueOf(const Asked& asked, const Circumstances& around) {
-    if (asked.count <= repetitions200 || asked.reported)
-        return never;
-    return asked.exhausted + around.timers->t200 + around.timers->slack;
-}
-
-std::int64_t LinkWatch::dueOf(const Idle& idle, const Circumstances& around) const {
-    const bool expected = idle.seen >= leastPeriods && up_ && around.access != Access::basic &&
-                          !keepAliveReported_ && lastFrame_ != 0;
-    return expected ? lastAt_ + idlePeriods * idle.period : never;
-}
-
-void LinkWatch::expireDemands(Side side, std::int64_t at, const Circumstances& around) {
-    Asked& demand = demands_[indexOf(side)];
-    if (around.bothHeard && at > dueOf(demand, around)) {
-        demand.reported = silent_[indexOf(other(side))] = true;
-        observe(findings::oneDirectionSilent, demand.frame, demand.first,
-                nameOf(other(side)) + " sent nothing for " + secondsOf(at - demand.first) + ", although " +
-                    nameOf(side) + " demanded an answer " + std::to_string(demand.count) + " times");
-    }
-    Asked& poll = polls_[indexOf(side)];
-    if (around.bothHeard && at > dueOf(poll, around)) {
-        poll.reported = true;
-        if (poll.heard)
-            observe(findings::pollUnanswered, poll.frame, poll.first,
-                    std::to_string(poll.count) + " polls of " + nameOf(side) + " got no answer");
-    }
-}
-
-// SABMEs without an answer are not reported after the direction was reported silent, because they follow from
-// that.
-void LinkWatch::expireSetUps(Side side, std::int64_t at, const Circumstances& around) {
-    Asked& setUp = setUps_[indexOf(side)];
-    if (at <= dueOf(setUp, around))
-        return;
-    setUp.reported = true;
-    if (!silent_[indexOf(other(side))])
-        observe(findings::sabmeUnanswered, setUp.frame, setUp.first,
-                nameOf(side) + " sent SABME " + std::to_string(setUp.count) + " times without an answer");
-}
-
-void LinkWatch::expireWindows(Side side, std::int64_t at, const Circumstances& around) {
-    Since& full = full_[indexOf(side)];
-    if (full.holds && !full.reported && at > full.at + around.timers->t200 + around.timers->slack) {
-        full.reported = true;
-        if (around.bothHeard && up_ && !notReady_[indexOf(other(side))].holds)
-            observe(findings::windowStalled, full.frame, full.at,
-                    std::to_string(window_[indexOf(side)]) + " frames of " + nameOf(side) +
-                        " wait for an acknowledgement longer than " + secondsOf(around.timers->t200));
-    }
-    Since& notReady = notReady_[indexOf(side)];
-    if (notReady.holds && !notReady.reported && at > notReady.at + notReadyTime) {
-        notReady.reported = true;
-        observe(findings::receiverNotReady, notReady.frame, notReady.at,
-                nameOf(side) + " has been not ready to receive for more than " + secondsOf(notReadyTime));
-    }
-}
-
-void LinkWatch::expireKeepAlives(Side side, std::int64_t at, const Circumstances& around) {
-    const Idle& idle = idle_[indexOf(side)];
-    if (at <= dueOf(idle, around))
-        return;
-    keepAliveReported_ = true;
-    observe(findings::keepAliveMissing, lastFrame_, lastAt_,
-            nameOf(side) + " polled every " + secondsOf(idle.period) + ", and then nothing was sent for " +
-                secondsOf(at - lastAt_));
 }
 
 void LinkWatch::forget() {
