@@ -2,7 +2,9 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
+#include <iterator>
 #include <sstream>
+#include <utility>
 
 namespace manual {
 
@@ -57,6 +59,12 @@ Command commandOf(const CLI::App& app) {
     return command;
 }
 
+bool has(const Command& command, const Option& option) {
+    return std::any_of(command.options.begin(), command.options.end(), [&](const Option& other) {
+        return other.names == option.names && other.help == option.help;
+    });
+}
+
 }  // namespace
 
 Program programOf(const CLI::App& app) {
@@ -72,18 +80,39 @@ Program programOf(const CLI::App& app) {
     return program;
 }
 
+Program programThatWorksAlone(const CLI::App& app) {
+    Program program = programOf(app);
+    const Command alone = commandOf(app);
+    for (Command& command : program.commands) {
+        std::vector<Option> options = alone.options;
+        std::copy_if(command.options.begin(), command.options.end(), std::back_inserter(options),
+                     [&](const Option& option) { return !has(alone, option); });
+        command.options = std::move(options);
+    }
+    program.commands.insert(program.commands.begin(), alone);
+    return program;
+}
+
 std::vector<Option> sharedOptions(const Program& program) {
     std::vector<Option> shared;
     for (const Option& option : program.commands.front().options) {
-        const auto has = [&](const Command& command) {
-            return std::any_of(command.options.begin(), command.options.end(), [&](const Option& other) {
-                return other.names == option.names && other.help == option.help;
-            });
-        };
-        if (std::all_of(program.commands.begin(), program.commands.end(), has))
+        if (std::all_of(program.commands.begin(), program.commands.end(),
+                        [&](const Command& command) { return has(command, option); }))
             shared.push_back(option);
     }
     return shared;
+}
+
+std::vector<Option> ownOptions(const Program& program, const std::string& name) {
+    const Command shared{"", "", "", "", sharedOptions(program)};
+    std::vector<Option> own;
+    for (const Command& command : program.commands) {
+        for (const Option& option : command.options) {
+            if (command.name == name && !has(shared, option))
+                own.push_back(option);
+        }
+    }
+    return own;
 }
 
 void setChoices(Program& program, const std::string& name, const std::vector<std::string>& choices) {

@@ -25,7 +25,7 @@ struct Option {
 };
 
 struct Command {
-    std::string name;  // empty for a program without commands
+    std::string name;  // empty for a program without commands, and for what a program does without one
     std::string summary;
     std::string words;   // what follows the options
     std::string footer;  // what --help shows behind the options
@@ -38,11 +38,17 @@ struct Program {
     std::string footer;
     bool runsAnother = false;  // behind "--" come another program and its words
 
-    bool hasCommands() const { return !commands.front().name.empty(); }
+    bool hasCommands() const { return commands.size() > 1 || !commands.front().name.empty(); }
 };
 
 // The options and commands of a command line. Options that --help hides are left out.
 Program programOf(const CLI::App& app);
+// The same of a program that works without a command: the first one has no name. The others take its options
+// as well.
+Program programThatWorksAlone(const CLI::App& app);
+
+// The options of a command that not all commands have.
+std::vector<Option> ownOptions(const Program& program, const std::string& command);
 
 // The options that each of the commands has.
 std::vector<Option> sharedOptions(const Program& program);

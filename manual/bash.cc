@@ -124,8 +124,10 @@ std::string commandRows(const Program& program) {
 
 std::string commandNames(const Program& program, const std::string& between) {
     std::string all;
-    for (const Command& command : program.commands)
-        all += (all.empty() ? "" : between) + command.name;
+    for (const Command& command : program.commands) {
+        if (!command.name.empty())
+            all += (all.empty() ? "" : between) + command.name;
+    }
     return all;
 }
 

@@ -7,6 +7,8 @@
 #include <iostream>
 #include <sstream>
 
+#include "fleet/ship/command_line.h"
+#include "fleet/store/command_line.h"
 #include "manual/completion.h"
 #include "manual/roff.h"
 #include "reader/command_line.h"
@@ -41,6 +43,14 @@ Program softboard() {
     for (const softboard::FaultName& row : softboard::faultNames())
         faults.push_back(row.name);
     setChoices(program, "--fault", faults);
+    return program;
+}
+
+// Works without a command, and has commands besides.
+template <class Show>
+Program alone(Show show) {
+    Program program;
+    show([&](const CLI::App& app) { program = programThatWorksAlone(app); });
     return program;
 }
 
@@ -93,8 +103,12 @@ const Program& programNamed(const std::string& name, const std::vector<Program>&
 }
 
 void generate(const fs::path& pages, const fs::path& out, const Edition& edition) {
-    const std::vector<Program> programs{lapdmon(), lapdread(), softboard(),
-                                        described(relay::showDescription)};
+    const std::vector<Program> programs{lapdmon(),
+                                        lapdread(),
+                                        softboard(),
+                                        described(relay::showDescription),
+                                        alone(fleet::showShipDescription),
+                                        alone(fleet::showStoreDescription)};
     fs::remove_all(out);
     for (const auto& entry : fs::directory_iterator(pages)) {
         const Program& program = programNamed(entry.path().stem().string(), programs);
@@ -103,8 +117,8 @@ void generate(const fs::path& pages, const fs::path& out, const Edition& edition
     for (const Program& program : programs) {
         write(out / "bash" / program.name, bashCompletion(program));
         write(out / "zsh" / ("_" + program.name), zshCompletion(program));
-        if (!program.hasCommands())
-            continue;
+        if (program.commands.front().name.empty())
+            continue;  // all of it stands on one page
         for (const Command& command : program.commands)
             write(out / "man" / (program.name + "-" + command.name + ".1"),
                   commandPage(program, command, edition));

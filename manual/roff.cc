@@ -166,12 +166,16 @@ std::string commandPage(const Program& program, const Command& command, const Ed
 
 std::string filledPage(const std::string& source, const Program& program, const Edition& edition) {
     constexpr std::string_view list = "@LIST ";
+    constexpr std::string_view own = "@OPTIONS ";
     std::string page;
     for (const std::string& line : linesOf(source)) {
         if (line == "@OPTIONS@")
             page += optionsAsRoff(sharedOptions(program));
         else if (line == "@COMMANDS@")
             page += commandsAsRoff(program);
+        else if (line.starts_with(own))
+            page +=
+                optionsAsRoff(ownOptions(program, line.substr(own.size(), line.size() - own.size() - 1)));
         else if (line.starts_with(list))
             page += listNamed(program, line.substr(list.size(), line.size() - list.size() - 1));
         else

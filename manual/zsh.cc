@@ -70,8 +70,10 @@ std::string argumentsOf(const Command& command, const Program& program) {
 
 std::string commandChoice(const Program& program) {
     std::string text = "  local -a commands\n  commands=(\n";
-    for (const Command& command : program.commands)
-        text += "    '" + command.name + ":" + quoted(command.summary) + "'\n";
+    for (const Command& command : program.commands) {
+        if (!command.name.empty())
+            text += "    '" + command.name + ":" + quoted(command.summary) + "'\n";
+    }
     return text + "  )\n" + "  local command=" + program.commands.front().name + "\n" +
            "  if (( CURRENT > 2 )) && (( ${+commands[(r)${words[2]}:*]} )); then\n"
            "    command=${words[2]}\n"

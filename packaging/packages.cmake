@@ -71,6 +71,10 @@ captures and JSON Lines.")
 lapdmon_package(softboard softboard "runs lapdmon on simulated KV9 boards"
 "softboard starts a program on a simulated board, which plays recorded D-channel
 frames. Use it to try lapdmon without a board, and to test programs.")
+lapdmon_package(fleet lapdmon-fleet "records of many hosts in one place"
+"lapdship sends what a host has recorded of its ISDN D channels to NATS
+JetStream. lapdstore keeps it in PostgreSQL, with calls and findings, where
+lapdread asks it. Alerts for Prometheus are included.")
 lapdmon_package(doc lapdmon-doc "documents of lapdmon, lapdread and softboard"
 "How to run lapdmon, read its log, find out why a call failed, and how the
 programs are made.")
@@ -82,6 +86,11 @@ board's own is needed to run a program.")
 foreach(script postinst prerm postrm)
     list(APPEND CPACK_DEBIAN_LAPDMON_PACKAGE_CONTROL_EXTRA ${CMAKE_CURRENT_SOURCE_DIR}/debian/lapdmon/${script})
 endforeach()
+foreach(script postinst prerm postrm)
+    list(APPEND CPACK_DEBIAN_FLEET_PACKAGE_CONTROL_EXTRA ${CMAKE_CURRENT_SOURCE_DIR}/debian/lapdmon-fleet/${script})
+endforeach()
+set(CPACK_DEBIAN_FLEET_PACKAGE_DEPENDS adduser)
+set(CPACK_DEBIAN_FLEET_PACKAGE_SUGGESTS "lapdmon, lapdread, lapdmon-doc, nats-server, postgresql, prometheus")
 # The services record with lapdread, under a user of their own.
 set(CPACK_DEBIAN_LAPDMON_PACKAGE_DEPENDS "adduser, lapdread (= ${version})")
 set(CPACK_DEBIAN_LAPDREAD_PACKAGE_SUGGESTS "lapdmon-doc")

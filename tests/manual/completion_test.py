@@ -95,6 +95,17 @@ class InBash(Completion):
         self.assertEqual(self.bash("kv9relayd", "--all"), {"--allow"})
 
 
+    def test_programs_that_work_without_a_command_offer_both(self):
+        self.assertIn("streams", self.bash("lapdship", "st"))
+        self.assertEqual(self.bash("lapdship", "--on"), {"--once"})
+        self.assertEqual(self.bash("lapdship", "--repl"), set())
+        self.assertEqual(self.bash("lapdship", "streams", "--repl"), {"--replicas"})
+        self.assertEqual(self.bash("lapdship", "streams", "--conf"), {"--config"})
+        self.assertEqual(self.bash("lapdship", "--config", "tr"), {"trunk.log", "traces"})
+        self.assertEqual(self.bash("lapdstore", "mi"), {"migrate"})
+        self.assertEqual(self.bash("lapdstore", "forget", "--da"), {"--database", "--days"})
+
+
 @unittest.skipUnless(shutil.which("zsh"), "there is no zsh")
 class InZsh(Completion):
     def zsh(self, line):
@@ -124,6 +135,9 @@ class InZsh(Completion):
     def test_the_other_programs(self):
         self.assertIn("--max-clients", self.zsh("kv9relayd --"))
         self.assertIn("-b", self.zsh("lapdmon -"))
+        self.assertIn("--metrics", self.zsh("lapdstore --"))
+        self.assertRegex(self.zsh("lapdstore "), r"\bmigrate +##")
+        self.assertRegex(self.zsh("lapdship streams --"), r"--replicas +##")
 
 
 if __name__ == "__main__":

@@ -25,9 +25,9 @@ def plain(roff):
     return re.sub(r"\\f[BIR]", "", roff).replace("\\-", "-").replace("\\e", "\\")
 
 
-def options_of_page(text):
+def options_of_page(text, title="OPTIONS"):
     """Each option's line, as {"-o, --output OUT"}."""
-    section = re.search(r"^\.SH OPTIONS\n(.*?)(?=^\.SH )", text, re.M | re.S)[1]
+    section = re.search(rf"^\.SH {title}\n(.*?)(?=^\.SH )", text, re.M | re.S)[1]
     return {plain(line) for line in re.findall(r"^\.TP\n(.*)$", section, re.M)}
 
 
@@ -56,6 +56,19 @@ class Pages(unittest.TestCase):
             with self.subTest(name):
                 self.assertGreater(len(options_of_page(page(name))), 5)
                 self.assertEqual(options_of_page(page(name)), options_of_help(program))
+
+    def test_the_fleets_programs_have_the_options_of_their_help_and_of_their_commands(self):
+        for name, commands_and_titles in (("lapdship", {"streams": "STREAMS"}),
+                                          ("lapdstore", {"migrate": None, "forget": "FORGET"})):
+            text = page(f"{name}.8")
+            shared = options_of_help(name)
+            self.assertGreater(len(shared), 4)
+            self.assertEqual(options_of_page(text), shared)
+            for command, title in commands_and_titles.items():
+                with self.subTest(f"{name} {command}"):
+                    # A command's own --help is about the command; the other options are those of the page.
+                    own = {line for line in options_of_help(name, command) if "--help" not in line}
+                    self.assertEqual(options_of_page(text, title) if title else set(), own)
 
     def test_each_command_of_lapdread_has_a_page_with_the_options_of_its_help(self):
         self.assertGreater(len(commands()), 5)

@@ -11,7 +11,7 @@ fail() {
 }
 step() { printf '  %s\n' "$*"; }
 quietly() { "$@" >/tmp/output 2>&1 || { cat /tmp/output >&2; fail "$*"; }; }
-ours=(lapdmon lapdmon-doc lapdread softboard libvela-dev)
+ours=(lapdmon lapdmon-doc lapdmon-fleet lapdread softboard libvela-dev)
 
 # Every file and folder but those that tools keep for themselves.
 files() {
@@ -51,7 +51,7 @@ softboard --frames /usr/share/doc/softboard/examples/ni2.pcap --protocol ni2 --r
     < <(sleep 2; printf q) | grep -q 'NI2 Switch' || fail 'the example is not traced'
 step 'a trace on the software board, read by lapdread'
 
-for page in $(dpkg -L lapdmon lapdread softboard | sed -n 's#^/usr/share/man/man./\(.*\)\.gz$#\1#p'); do
+for page in $(dpkg -L lapdmon lapdmon-fleet lapdread softboard | sed -n 's#^/usr/share/man/man./\(.*\)\.gz$#\1#p'); do
     name=${page%.*} section=${page##*.}
     man --warnings "$section" "$name" >/tmp/output 2>/tmp/warnings || fail "man $section $name"
     [ ! -s /tmp/warnings ] && grep -q '^NAME' /tmp/output || fail "man $section $name: $(cat /tmp/warnings)"
@@ -61,7 +61,7 @@ step "manual pages"
 bash -ic 'source /usr/share/bash-completion/bash_completion; _completion_loader lapdread
     COMP_WORDS=(lapdread record --fold) COMP_CWORD=2; _lapdread; [ "${COMPREPLY[*]}" = --folder ]' 2>/dev/null ||
     fail 'bash does not complete lapdread'
-for program in lapdmon lapdread softboard kv9relayd; do
+for program in lapdmon lapdread softboard kv9relayd lapdship lapdstore; do
     zsh -fc "autoload -Uz compinit; compinit -u -D; [[ \$_comps[$program] == _$program ]]" || fail "zsh: $program"
     bash -ic "source /usr/share/bash-completion/bash_completion; _completion_loader $program; complete -p $program" \
         >/dev/null 2>&1 || fail "bash: $program"
@@ -69,7 +69,7 @@ done
 step 'completion in bash and zsh'
 
 getent passwd lapdmon >/dev/null || fail 'there is no user lapdmon'
-for unit in lapdmon@.service lapdmon@.socket lapdmon-record@.service kv9relayd.service; do
+for unit in lapdmon@.service lapdmon@.socket lapdmon-record@.service kv9relayd.service lapdship.service lapdstore.service; do
     told=$(systemd-analyze verify --man=no "/lib/systemd/system/$unit" 2>&1) && [ -z "$told" ] || fail "$unit: $told"
 done
 # Each unit's ExecStart as its user, with the FIFO as the socket unit makes it and holds it open.
@@ -105,6 +105,30 @@ wait "$relay" || fail "the relay's service ends with $?: $(cat relay)"
 unset LD_LIBRARY_PATH RECORD_LIMITS RELAY_OPTIONS
 step "the services' programs, as their user"
 
+for user in lapdship lapdstore; do
+    getent passwd "$user" >/dev/null || fail "there is no user $user"
+done
+id -nG lapdship | grep -qw lapdmon || fail 'lapdship may not read what the services record'
+for program in lapdship lapdstore; do
+    [ "$($program --version)" = "$program ${version%-*}" ] || fail "$program --version: $($program --version)"
+done
+examples=/usr/share/doc/lapdmon-fleet/examples
+for file in lapdship.toml lapdstore.default alerts.yml prometheus.yml alertmanager.yml fleet-certificates; do
+    [ -s $examples/$file ] || fail "there is no example $file"
+done
+# The example as it stands: it names servers and certificates that are not here.
+install -d -o lapdship -m 700 /var/lib/lapdship
+sed 's#"/etc/lapdship/#"/nowhere/#' $examples/lapdship.toml >/etc/lapdship.toml
+timeout 20 setpriv --reuid lapdship --regid lapdship --init-groups bash -c "exec $(command_of lapdship.service)" >shipper 2>&1 || true
+grep -q 'figures are at http://127.0.0.1:9470/metrics' shipper || fail "lapdship: $(cat shipper)"
+grep -qi 'certificate\|tls\|file' shipper || fail "lapdship does not say what it lacks: $(cat shipper)"
+rm -rf /etc/lapdship.toml /var/lib/lapdship
+status=0
+STORE_OPTIONS='--database postgresql://nobody@/lapd?host=/nowhere' \
+    setpriv --reuid lapdstore --regid lapdstore --init-groups bash -c "exec $(command_of lapdstore.service) migrate" >store 2>&1 || status=$?
+[ "$status" -eq 2 ] && grep -q '^lapdstore: ' store || fail "lapdstore ends with $status: $(cat store)"
+step 'the fleet: programs, users, examples'
+
 quietly apt-get purge -y "${ours[@]}"
 files >/tmp/before
 quietly apt-get install -y /older/*.deb
@@ -124,5 +148,7 @@ left=$(files | comm -13 /tmp/before - | tr '\n' ' ')
 quietly dpkg --purge "${ours[@]}"
 left=$(files | comm -13 /tmp/before - | tr '\n' ' ')
 [ -z "$left" ] || fail "purge leaves: $left"
-getent passwd lapdmon >/dev/null && fail 'purge leaves the user lapdmon'
+for user in lapdmon lapdship lapdstore; do
+    getent passwd "$user" >/dev/null && fail "purge leaves the user $user"
+done
 step 'removal left the records and nothing else, purge nothing'

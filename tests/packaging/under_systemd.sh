@@ -8,7 +8,7 @@ cd /root
 
 fail() {
     printf 'FAILED: %s\n' "$*" >&2
-    systemctl --no-pager status 'lapdmon*' kv9relayd >&2 || true
+    systemctl --no-pager status 'lapdmon*' kv9relayd lapdship lapdstore >&2 || true
     exit 1
 }
 step() { printf '  %s\n' "$*"; }
@@ -93,16 +93,46 @@ done
 more_come 1-1
 step 'watchdogs'
 
+for unit in lapdship lapdstore; do
+    ! systemctl is-enabled --quiet $unit 2>/dev/null || fail "$unit is enabled by its installation"
+    systemctl start $unit
+    ! systemctl is-active --quiet $unit || fail "$unit runs without a configuration"
+done
+cat >/etc/lapdship.toml <<END
+site = "here"
+servers = ["nats://127.0.0.1:1"]
+state = "/var/lib/lapdship"
+metrics = "9470"
+[[dchannel]]
+board = "1"
+dchannel = "1"
+trunk = "1-1"
+folder = "/var/log/lapdmon"
+END
+echo 'STORE_OPTIONS="--database postgresql://nobody@/lapd?host=/nowhere --nats nats://127.0.0.1:1 --metrics 9471"' >/etc/default/lapdstore
+for unit in lapdship lapdstore; do
+    systemctl start $unit
+    systemctl is-active --quiet $unit || fail "$unit is not ready"
+    until_it "$unit offers figures" eval "says $unit 'figures are at' | grep -q '^[1-9]'"
+done
+# It reads the recordings, as a member of the group lapdmon, though no server is there.
+shipped() { exec 8<>/dev/tcp/127.0.0.1/9470; printf 'GET /metrics HTTP/1.0\r\n\r\n' >&8; cat <&8; }
+ships() { shipped | grep '^lapdship_frames_total' | grep -qv ' 0$'; }
+until_it 'the shipper reads what is recorded' ships
+systemctl stop lapdship lapdstore
+[ "$(systemctl show -p Result --value lapdship lapdstore | sort -u | tr -d '\n')" = success ] || fail 'the end of the fleet programs'
+step 'the fleet, which needs a configuration and ends in order'
+
 traces=$(systemctl show -p MainPID --value lapdmon@1-1 lapdmon-record@1-1)
 apt-get install -y --reinstall /packages/*.deb >output 2>&1 || { cat output >&2; fail 'the upgrade'; }
 [ "$(systemctl show -p MainPID --value lapdmon@1-1 lapdmon-record@1-1)" = "$traces" ] || fail 'an upgrade ends traces'
 more_come 1-1
-apt-get remove -y lapdmon lapdread softboard lapdmon-doc libvela-dev >output 2>&1 || { cat output >&2; fail 'the removal'; }
+apt-get remove -y lapdmon lapdmon-fleet lapdread softboard lapdmon-doc libvela-dev >output 2>&1 || { cat output >&2; fail 'the removal'; }
 left=$(systemctl list-units --no-legend --plain 'lapdmon*' 'kv9relayd*' --state=active)
 [ -z "$left" ] || fail "after the removal still runs: $left"
-grep -hE '^(lapdmon|lapdread|kv9relayd)' /proc/[0-9]*/comm && fail 'after the removal programs still run'
+grep -hE '^(lapdmon|lapdread|kv9relayd|lapdship|lapdstore)' /proc/[0-9]*/comm && fail 'after the removal programs still run'
 [ -z "$(ls /var/log/lapdmon/*.part 2>/dev/null)" ] || fail 'the removal did not let the recorders finish their files'
 [ -n "$(ls /var/log/lapdmon/*.pcapng)" ] || fail 'the removal takes evidence'
-dpkg --purge lapdmon lapdread softboard lapdmon-doc libvela-dev >output 2>&1 || { cat output >&2; fail 'the purge'; }
+dpkg --purge lapdmon lapdmon-fleet lapdread softboard lapdmon-doc libvela-dev >output 2>&1 || { cat output >&2; fail 'the purge'; }
 [ ! -e /var/log/lapdmon ] && [ ! -e /etc/default/lapdmon ] || fail 'the purge leaves something'
 step 'an upgrade leaves traces alone, a removal ends them'
