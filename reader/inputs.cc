@@ -7,6 +7,7 @@
 #include <filesystem>
 #include <limits>
 #include <optional>
+#include <utility>
 
 #include "capture/open.h"
 #include "fleet/query/Store.h"
@@ -46,6 +47,16 @@ void boundTimes(const std::vector<FilterWord>& filters, fleet::StoreQuery& query
         query.until = until;
 }
 
+fleet::StoreQuery queryOf(const Options& options) {
+    fleet::StoreQuery query;
+    query.url = options.input.store;
+    query.sites = options.input.sites;
+    if (!options.input.trunk.empty())
+        query.trunks = splitAtCommas(options.input.trunk);
+    boundTimes(options.filters, query);
+    return query;
+}
+
 std::unique_ptr<capture::Reader> openStore(const Options& options) {
     const InputOptions& input = options.input;
     if (!input.files.empty() || !options.words.empty())
@@ -53,13 +64,7 @@ std::unique_ptr<capture::Reader> openStore(const Options& options) {
                          (input.files.empty() ? options.words : input.files).front());
     if (input.follow)
         throw UsageError("--follow takes a file; a store is read as it is now");
-    fleet::StoreQuery query;
-    query.url = input.store;
-    query.sites = input.sites;
-    if (!input.trunk.empty())
-        query.trunks = splitAtCommas(input.trunk);
-    boundTimes(options.filters, query);
-    const auto store = std::make_shared<fleet::Store>(query);
+    const auto store = std::make_shared<fleet::Store>(queryOf(options));
     std::vector<Opener> openers;
     for (const fleet::Store::Trunk& trunk : store->trunks())
         openers.emplace_back([store, &trunk] { return store->read(trunk); });
@@ -124,6 +129,13 @@ std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*c
     if (input.merge && files.size() > 1)
         return std::make_unique<Merge>(openers);
     return std::make_unique<Sequence>(std::move(openers));
+}
+
+void joinGroupsOfStore(Options& options) {
+    if (options.input.store.empty())
+        return;
+    for (std::vector<std::string>& group : fleet::Store(queryOf(options)).groups())
+        options.calls.groups.push_back(std::move(group));
 }
 
 void checkForms(const Options& options) {

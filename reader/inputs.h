@@ -28,6 +28,10 @@ std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOp
 // cannot be opened or its form is not known.
 std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& chatter);
 
+// The D channels of a store that share their calls do so as if --nfas named them. Without a store nothing is
+// done. Throws what openInputs() throws for a store.
+void joinGroupsOfStore(Options& options);
+
 // Throws capture::BadInput if one of the inputs is a regular file whose form is not known. Does not look at
 // inputs that are followed, because they may be empty yet, nor at pipes, because they can be read only once.
 void checkForms(const Options& options);

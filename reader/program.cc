@@ -7,13 +7,14 @@
 #include "reader/Output.h"
 #include "reader/command_line.h"
 #include "reader/errors.h"
+#include "reader/inputs.h"
 
 namespace reader {
 
 namespace {
 
 int run(const std::vector<std::string>& words) {
-    const CommandLine line = parseCommandLine(words);
+    CommandLine line = parseCommandLine(words);
     if (line.command == nullptr) {
         Output out;
         out.write(line.told);
@@ -24,6 +25,7 @@ int run(const std::vector<std::string>& words) {
         throw UsageError(std::string(line.command->name) + " takes files; --store is for other commands");
     if (!line.options.input.zone.empty())
         useTimeZone(line.options.input.zone);
+    joinGroupsOfStore(line.options);
     Chatter chatter(line.options.loudness);
     const int status = line.command->run(line.options, chatter);
     return status == good && chatter.hasWrongUsage() ? badUsage : status;

@@ -105,6 +105,8 @@ void Session::tellWhatWasNotFound(const Outcome& outcome, const CallGate* gate) 
         chatter_.note("no call passes the filters; calls: " + std::to_string(gate->calls()));
     else if (isNothing && !filter_.isEmpty())
         chatter_.note("no frame passes the filters; frames: " + std::to_string(tracker_.frames()));
+    if (!options_.input.store.empty())
+        return;  // there a standby may have said nothing
     for (const std::vector<std::string>& group : options_.calls.groups) {
         for (const std::string& name : group) {
             if (!tracker_.knows(name))

@@ -59,10 +59,10 @@ class Store::Snapshot {
 
     void findTrunks() {
         std::map<std::string, int> count;
-        for (const pqxx::row& row : work_.exec(
-                 "SELECT trunk, site, host, board, dchannel, name FROM lapd.trunks ORDER BY 2, 3, 4, 5")) {
+        for (const pqxx::row& row : work_.exec("SELECT trunk, site, host, board, dchannel, name, nfas FROM "
+                                               "lapd.trunks ORDER BY 2, 3, 4, 5")) {
             const Address address{row[1].c_str(), row[2].c_str(), row[3].c_str(), row[4].c_str()};
-            Trunk trunk{row[0].as<int>(), toText(address), row[5].c_str()};
+            Trunk trunk{row[0].as<int>(), toText(address), row[5].c_str(), address.site, row[6].c_str()};
             ++count[trunk.name];
             all_.push_back({address.site, trunk});
             if ((query_.sites.empty() || isNamed(query_.sites, address.site)) &&
@@ -208,6 +208,20 @@ Store::Store(StoreQuery query) {
 Store::~Store() = default;
 
 const std::vector<Store::Trunk>& Store::trunks() const { return snapshot_->trunks(); }
+
+std::vector<std::vector<std::string>> Store::groups() const {
+    std::map<std::pair<std::string, std::string>, std::vector<std::string>> byName;
+    for (const Trunk& trunk : trunks()) {
+        if (!trunk.group.empty())
+            byName[{trunk.site, trunk.group}].push_back(trunk.name);
+    }
+    std::vector<std::vector<std::string>> groups;
+    for (auto& [name, members] : byName) {
+        if (members.size() > 1)
+            groups.push_back(std::move(members));
+    }
+    return groups;
+}
 
 std::unique_ptr<capture::Reader> Store::read(const Trunk& trunk) const {
     try {

@@ -29,6 +29,8 @@ class Store {
         int id = 0;
         std::string address;  // "london/h1/0/1"
         std::string name;     // that of the D channel; its address if another one has the same name
+        std::string site;
+        std::string group;  // NFAS, of this site; empty: none
     };
 
     // Throws capture::BadInput if the store cannot be reached, has no schema that this program knows, or has
@@ -40,6 +42,9 @@ class Store {
 
     // Those that the query names, by address.
     const std::vector<Trunk>& trunks() const;
+
+    // Of these, the names of D channels that share their calls (NFAS): two at least in each group.
+    std::vector<std::vector<std::string>> groups() const;
 
     // Reads the frames of a D channel, run after run. With times in the query it reads whole days (UTC), the
     // day in front of the first, and besides the days of the calls that were alive at its ends, so that these

@@ -203,6 +203,31 @@ TEST_F(StoreAsInput, ChoosesTrunksAndSites) {
     EXPECT_EQ(ofStore("calls"), lapdread("calls --merge " + pri + " " + other));
 }
 
+TEST_F(StoreAsInput, JoinsTheDChannelsOfAGroupAsNfasDoes) {
+    const std::string traps = source + "/tests/reader/data/traps/changeover-";
+    std::string files;
+    for (const std::string half : {"a", "b"}) {
+        std::vector<Parcel> parcels = parcelsOf(traps + half + ".hex", 7, true);
+        for (Parcel& parcel : parcels) {
+            parcel.address.dChannel = half;
+            parcel.group = "nfas-a";
+        }
+        store(parcels);
+        files += " " + traps + half + ".hex";
+    }
+    const std::string nfas = " --merge --nfas changeover-a,changeover-b" + files;
+    for (const std::string command : {"calls", "check", "stats", "ladder", "list --callref 1"}) {
+        SCOPED_TRACE(command);
+        EXPECT_EQ(ofStore(command), lapdread(command + nfas));
+    }
+    // The call of the group goes on over the other D channel; apart, they tell another story.
+    EXPECT_NE(ofStore("calls"), lapdread("calls --merge" + files));
+    EXPECT_EQ(ofStore("calls --trunk changeover-a"), lapdread("calls" + files.substr(0, files.rfind(' '))));
+    // Two sites may use one name for their groups.
+    execute("UPDATE lapd.trunks SET site = 'paris' WHERE dchannel = 'b'");
+    EXPECT_EQ(ofStore("calls"), lapdread("calls --merge" + files));
+}
+
 TEST_F(StoreAsInput, TellsTrunksOfOneNameApartByTheirAddresses) {
     const std::string file = source + "/examples/net5.pcap";
     store(parcelsOf(file, 100, true, "london"));
