@@ -174,8 +174,7 @@ std::string filledPage(const std::string& source, const Program& program, const 
         else if (line == "@COMMANDS@")
             page += commandsAsRoff(program);
         else if (line.starts_with(own))
-            page +=
-                optionsAsRoff(ownOptions(program, line.substr(own.size(), line.size() - own.size() - 1)));
+            page += optionsAsRoff(ownOptions(program, line.substr(own.size(), line.size() - own.size() - 1)));
         else if (line.starts_with(list))
             page += listNamed(program, line.substr(list.size(), line.size() - list.size() - 1));
         else
