@@ -188,6 +188,20 @@ void Occupancy::finish(const std::vector<Span>& spans) {
     held_.clear();
 }
 
+std::string_view nameOf(TrunkSize size) {
+    switch (size) {
+        case TrunkSize::e1:
+            return "E1";
+        case TrunkSize::t1:
+            return "T1";
+        case TrunkSize::basic:
+            return "basic access";
+        case TrunkSize::unknown:
+            break;
+    }
+    return "unknown";
+}
+
 TrunkSize learntSize(const Occupancy::Group& group) {
     const auto wasUsed = [](const auto& each) { return each.second.calls > 0; };
     if (std::none_of(group.channels.begin(), group.channels.end(), wasUsed))

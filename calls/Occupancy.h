@@ -7,6 +7,7 @@
 #include <map>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -84,6 +85,7 @@ class Occupancy {
 
 // How many B channels a trunk has: 30 (E1), 23 (T1) or two (basic access).
 enum class TrunkSize : std::uint8_t { unknown, e1, t1, basic };
+std::string_view nameOf(TrunkSize size);  // "E1"
 // The size that the channels in use and the variant suggest; unknown if no call has used a channel.
 TrunkSize learntSize(const Occupancy::Group& group);
 // The B channels of a trunk of this size that no call has used, for each interface that calls have named. The

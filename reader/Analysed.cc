@@ -11,7 +11,7 @@ namespace reader {
 Analysed::Analysed(const Options& options)
     : callFilter_(options.filters),
       analysis_(analysisOptions(options), *this),
-      filtered_(!Filter(options.filters).isEmpty()) {}
+      filtered_(!Filter(options.filters).isEmpty() || options.skipped != 0) {}
 
 void Analysed::run(Session& session, Chatter& chatter) {
     session.run(*this, [] { return std::make_unique<NoComposer>(); });

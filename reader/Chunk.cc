@@ -31,4 +31,17 @@ void Chunk::clear() {
     pieces.clear();
 }
 
+void Chunk::dropPieces(std::size_t count) {
+    if (count == 0)
+        return;
+    const std::size_t end = pieces[count - 1].end;
+    text.erase(0, end);
+    pieces.erase(pieces.begin(), pieces.begin() + static_cast<std::ptrdiff_t>(count));
+    for (Piece& piece : pieces) {
+        piece.end -= end;
+        if (piece.deltaSize != 0)
+            piece.deltaAt -= end;
+    }
+}
+
 }  // namespace reader

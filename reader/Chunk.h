@@ -35,6 +35,8 @@ class Chunk {
     // Moves all items from index `from` on to `other`. This chunk must be sealed, and `other` must not be.
     void split(std::size_t from, Chunk& other);
     void clear();
+    // Forgets the first pieces and their text; the items stay.
+    void dropPieces(std::size_t count);
 
     bool empty() const { return seen_.empty(); }
     std::size_t size() const { return seen_.size(); }

@@ -109,7 +109,8 @@ struct Options {
     InputOptions input;
     OutputOptions output;
     std::vector<FilterWord> filters;
-    std::uint64_t first = 0;  // how many frames are shown; 0: all
+    std::uint64_t first = 0;    // how many frames are shown; 0: all
+    std::uint64_t skipped = 0;  // how many are left out in front of them
     Loudness loudness = Loudness::usual;
     ListOptions list;
     ExplainAs explainAs = ExplainAs::guess;

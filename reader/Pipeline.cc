@@ -73,6 +73,7 @@ class Run {
           work_(work),
           first_(consumer.countsItself() ? 0 : work.first),
           left_(first_),
+          skipped_(consumer.countsItself() ? 0 : work.skipped),
           turns_(std::max(work.jobs, 1U)) {}
 
     Outcome run() {
@@ -263,6 +264,11 @@ class Run {
             return;
         std::size_t wanted = chunk.pieces.size();
         passed_ += wanted;
+        if (const std::size_t dropped = std::min<std::uint64_t>(wanted, skipped_); dropped != 0) {
+            chunk.dropPieces(dropped);
+            skipped_ -= dropped;
+            wanted -= dropped;
+        }
         if (first_ != 0) {
             wanted = std::min<std::uint64_t>(wanted, left_);
             left_ -= wanted;
@@ -292,6 +298,7 @@ class Run {
     // These belong to the thread that hands on.
     std::uint64_t first_;
     std::uint64_t left_;
+    std::uint64_t skipped_;  // that are still to be left out
     std::uint64_t passed_ = 0;
     bool isFull_ = false;
     std::exception_ptr failure_;

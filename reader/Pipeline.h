@@ -46,6 +46,7 @@ class Consumer {
 struct Work {
     std::function<std::unique_ptr<Composer>()> makeComposer;  // called on the thread of runPipeline
     std::uint64_t first = 0;                                  // the most pieces that are handed on; 0: all
+    std::uint64_t skipped = 0;                                // how many are left out in front of them
     unsigned jobs = 1;                                        // how many threads work, the caller's included
     bool eachAtOnce = false;   // each item is handed on before the next is read
     CallGate* gate = nullptr;  // lets through only frames of the calls that are wanted; null: all frames

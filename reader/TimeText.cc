@@ -85,6 +85,13 @@ void TimeText::append(std::string& to, Instant instant) {
     to.append(text, at);
 }
 
+std::string textOf(Instant instant) {
+    std::string text;
+    if (instant.clock != capture::Clock::none)
+        TimeText().append(text, instant);
+    return text;
+}
+
 void appendSeconds(std::string& to, std::int64_t nanoseconds) {
     const std::int64_t milliseconds = nanoseconds / nanosecondsPerMillisecond;
     if (milliseconds < 0)

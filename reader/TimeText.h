@@ -42,6 +42,9 @@ class TimeText {
     char offset_[8] = {};  // "+01:00"
 };
 
+// The instant alone; empty without a clock.
+std::string textOf(Instant instant);
+
 // Appends signed seconds with three digits: "0.040", "-1.000". Parts of a millisecond are cut off towards
 // zero.
 void appendSeconds(std::string& to, std::int64_t nanoseconds);

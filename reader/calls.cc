@@ -8,6 +8,7 @@
 #include "reader/CallFields.h"
 #include "reader/CallLine.h"
 #include "reader/CallOrder.h"
+#include "reader/Limit.h"
 #include "reader/errors.h"
 #include "reader/session.h"
 #include "reader/text.h"
@@ -53,9 +54,8 @@ class CallPrinter : public Analysed {
     }
 
     void print(const calls::Call& call) {
-        if (options_.first != 0 && printed_ == options_.first)
+        if (!limit_.takeOne())
             return;
-        ++printed_;
         text_.clear();
         switch (options_.calls.form) {
             case CallForm::csv:
@@ -76,7 +76,7 @@ class CallPrinter : public Analysed {
     Output& out_;
     TimeText times_;
     std::string text_;
-    std::uint64_t printed_ = 0;
+    Limit limit_{options_};
     std::vector<calls::Call> kept_;
 };
 

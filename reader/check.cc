@@ -5,6 +5,7 @@
 
 #include "reader/Analysed.h"
 #include "reader/FindingText.h"
+#include "reader/Limit.h"
 #include "reader/errors.h"
 #include "reader/json.h"
 #include "reader/session.h"
@@ -54,9 +55,8 @@ class FindingPrinter : public Analysed {
             return;
         ++counts_[static_cast<std::size_t>(finding.severity)];
         worst_ = std::max(worst_.value_or(finding.severity), finding.severity);
-        if (options_.first != 0 && printed_ == options_.first)
+        if (!limit_.takeOne())
             return;
-        ++printed_;
         text_.clear();
         if (options_.calls.form == CallForm::jsonLines)
             putJson(finding);
@@ -126,7 +126,7 @@ class FindingPrinter : public Analysed {
     bool colors_;
     TimeText times_;
     std::string text_;
-    std::uint64_t printed_ = 0;
+    Limit limit_{options_};
     std::array<std::uint64_t, 3> counts_{};
     std::optional<calls::Severity> worst_;
 };

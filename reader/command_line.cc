@@ -105,7 +105,7 @@ constexpr OptionRow generalRows[] = {
 constexpr OptionRow filterRowsBesides[] = {
     {"--first", "N", "Only the first N frames that the other filters let through",
      [](Options& to, const std::string& value) { to.first = countIn<std::uint64_t>(value, INT64_MAX); }},
-    {"--not", "", "In front of a filter: only frames that it would not let through",
+    {"--not", "", "In front of a filter: only frames that it would not let through; of --first: all but the first N",
      [](Options&, const std::string&) {}},
 };
 
@@ -185,6 +185,15 @@ void addFilters(CLI::App& app, Options& options) {
     }
 }
 
+// Counts rather than chooses, so that it is no row of the filters.
+constexpr std::string_view countingFilter = "--first";
+
+void addNegatedCount(CLI::App& app, Options& options) {
+    add(app, "--not-first", "N", "", [&options](const std::string& value) {
+        options.skipped = countIn<std::uint64_t>(value, INT64_MAX);
+    })->group("");
+}
+
 void addCommand(CLI::App& app, const Command& command, Options& options) {
     CLI::App* sub = app.add_subcommand(std::string(command.name), std::string(command.summary));
     sub->formatter(std::make_shared<Help>());
@@ -194,6 +203,7 @@ void addCommand(CLI::App& app, const Command& command, Options& options) {
     sub->add_option("words", options.words)->group("");
     addGroup(*sub, command.options, options);
     addFilters(*sub, options);
+    addNegatedCount(*sub, options);
     for (const OptionGroup& group : common)
         addGroup(*sub, group, options);
 }
@@ -217,8 +227,9 @@ std::vector<std::string> joinNegations(const std::vector<std::string>& words) {
         }
         const std::string name = words[i].substr(0, words[i].find('='));
         const auto rows = filterRows();
-        if (std::none_of(rows.begin(), rows.end(),
-                         [&](const FilterRow& row) { return name == "--" + std::string(row.name); }))
+        if (name != countingFilter && std::none_of(rows.begin(), rows.end(), [&](const FilterRow& row) {
+                return name == "--" + std::string(row.name);
+            }))
             throw UsageError("--not stands in front of a filter, and " + words[i] + " is none");
         joined.push_back("--not-" + words[i].substr(2));
         negated = false;

@@ -28,9 +28,7 @@ std::string percent(std::optional<double> share) { return share ? decimal(*share
 
 std::string instant(calls::HourKey key) {
     constexpr std::int64_t hour = 3600 * calls::second;
-    std::string text;
-    TimeText().append(text, {key.clock, key.hour * hour});
-    return text;
+    return textOf({key.clock, key.hour * hour});
 }
 
 std::string wordsOf(calls::MessageKind kind) {
@@ -185,20 +183,6 @@ FigureTable hours(const calls::Figures& figures, const calls::Occupancy& occupan
     return table;
 }
 
-std::string_view nameOf(calls::TrunkSize size) {
-    switch (size) {
-        case calls::TrunkSize::e1:
-            return "E1";
-        case calls::TrunkSize::t1:
-            return "T1";
-        case calls::TrunkSize::basic:
-            return "basic access";
-        case calls::TrunkSize::unknown:
-            break;
-    }
-    return "unknown";
-}
-
 // The channels as ranges of numbers: "1 to 15, 17".
 std::string rangesOf(const std::vector<calls::ChannelKey>& channels) {
     std::string text;
@@ -240,9 +224,8 @@ FigureTable trunks(const calls::Occupancy& occupancy, calls::TrunkSize size) {
             if (figure.stuck)
                 stuck.push_back(channel);
         }
-        std::string at;
-        if (group.mostAt && group.mostAt->clock != capture::Clock::none)
-            TimeText().append(at, {group.mostAt->clock, group.mostAt->time});
+        const std::string at =
+            group.mostAt ? textOf({group.mostAt->clock, group.mostAt->time}) : std::string();
         table.rows.push_back({group.dChannels, std::string(nameOf(its)) + (its == size ? "" : ", learnt"),
                               ifHeard(group, seconds(group.heard)), std::to_string(group.most), at,
                               ifHeard(group, decimal(group.erlangs(), 3)), std::to_string(group.unknown),

@@ -10,6 +10,7 @@
 #include "reader/LadderMermaid.h"
 #include "reader/LadderSvg.h"
 #include "reader/LadderText.h"
+#include "reader/Limit.h"
 #include "reader/Locale.h"
 #include "reader/errors.h"
 #include "reader/text.h"
@@ -74,7 +75,7 @@ class LadderPrinter : public Analysed {
             ladders_.carried(message, *call);
     }
     void gone(const calls::Call& call) override {
-        if (isWanted(call) && (options_.first == 0 || printed_ < options_.first))
+        if (isWanted(call) && limit_.takeOne())
             print(ladders_.take(call, times_));
         else
             ladders_.forget(call);
@@ -82,19 +83,19 @@ class LadderPrinter : public Analysed {
     }
 
     void print(const CallLadder& ladder) {
-        ++printed_;
+        const std::uint64_t number = limit_.taken();
         std::string text;
         switch (options_.ladder.form) {
             case LadderForm::text:
-                text = printed_ == 1 ? "" : "\n";
+                text = number == 1 ? "" : "\n";
                 appendLadder(text, ladder, text_, times_);
                 break;
             case LadderForm::mermaid:
-                text = printed_ == 1 ? "" : "\n";
+                text = number == 1 ? "" : "\n";
                 appendMermaid(text, ladder, times_);
                 break;
             case LadderForm::svg:
-                if (printed_ <= mostInPicture)
+                if (number <= mostInPicture)
                     svg_.add(ladder, times_);
                 else
                     ++notDrawn_;
@@ -110,7 +111,7 @@ class LadderPrinter : public Analysed {
     LadderSvg svg_;
     TimeText times_;
     Ladders ladders_;
-    std::uint64_t printed_ = 0;
+    Limit limit_{options_};
     std::uint64_t notDrawn_ = 0;
 };
 

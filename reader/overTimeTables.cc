@@ -1,6 +1,6 @@
 #include "reader/overTimeTables.h"
 
-#include "reader/CallFields.h"
+#include "reader/TimeText.h"
 #include "reader/text.h"
 
 namespace reader {
@@ -9,12 +9,7 @@ namespace {
 
 using enum FigureColumn::Kind;
 
-std::string instant(const calls::Moment& moment) {
-    TimeText times;
-    std::string text;
-    appendInstant(text, moment, times);
-    return text;
-}
+std::string instant(const calls::Moment& moment) { return textOf({moment.clock, moment.time}); }
 
 void appendUse(FigureTable& table, const std::string& dChannels, const calls::UseOverTime& use) {
     const std::string width = std::to_string(use.width() / calls::second);

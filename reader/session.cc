@@ -80,6 +80,7 @@ void Session::run(Consumer& consumer, const std::function<std::unique_ptr<Compos
     Work work;
     work.makeComposer = makeComposer;
     work.first = options_.first;
+    work.skipped = options_.skipped;
     work.jobs =
         options_.output.jobs != 0 ? options_.output.jobs : std::max(1U, std::thread::hardware_concurrency());
     work.eachAtOnce = options_.output.lineBuffered;

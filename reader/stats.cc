@@ -10,6 +10,7 @@
 #include "reader/errors.h"
 #include "reader/figureForms.h"
 #include "reader/session.h"
+#include "reader/trunkRows.h"
 
 namespace reader {
 
@@ -21,12 +22,9 @@ std::span<const OptionRow> statsOptions() {
          [](Options& to, const std::string&) { to.calls.form = CallForm::jsonLines; }, "form"},
         {"--over-time", "", "Also: channels in use over time, links, and link events",
          [](Options& to, const std::string&) { to.calls.overTime = true; }},
-        {"--e1", "", "The trunks have the channels of E1 (default: learnt)",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::e1; }, "trunk"},
-        {"--t1", "", "The trunks have the channels of T1",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::t1; }, "trunk"},
-        {"--bri", "", "The trunks are basic accesses",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::basic; }, "trunk"},
+        e1Row,
+        t1Row,
+        basicRow,
     };
     return rows;
 }

@@ -55,20 +55,6 @@ std::string_view nameOf(capture::Role role) {
                                             : "our side's role is not known yet";
 }
 
-std::string_view nameOf(calls::TrunkSize size) {
-    switch (size) {
-        case calls::TrunkSize::e1:
-            return "E1";
-        case calls::TrunkSize::t1:
-            return "T1";
-        case calls::TrunkSize::basic:
-            return "basic access";
-        case calls::TrunkSize::unknown:
-            break;
-    }
-    return "size not known";
-}
-
 Style styleOf(calls::LinkState state) {
     switch (state) {
         case calls::LinkState::up:
@@ -126,8 +112,9 @@ void TrunkScreen::putCells(const calls::CellRow& row, int width) {
     std::string heading = "  channels";
     if (row.interface)
         heading += " of interface " + std::to_string(*row.interface);
-    heading += ": " + std::string(nameOf(row.size));
-    if (row.isLearnt && row.size != calls::TrunkSize::unknown)
+    const bool isKnown = row.size != calls::TrunkSize::unknown;
+    heading += ": " + (isKnown ? std::string(nameOf(row.size)) : "size not known");
+    if (row.isLearnt && isKnown)
         heading += ", learnt";
     putLine(heading + ", " + std::to_string(used) + " in use");
     const auto inLine = static_cast<std::size_t>(std::max((width - 2) / cellWidth, 1));

@@ -24,6 +24,7 @@
 #include "reader/redact.h"
 #include "reader/session.h"
 #include "reader/text.h"
+#include "reader/trunkRows.h"
 
 namespace reader {
 
@@ -255,18 +256,15 @@ std::span<const OptionRow> browseOptions() {
          [](Options& to, const std::string&) { to.browse.mouse = false; }},
         {"--key", "FILE", "Make pseudonyms by this key where frames are saved redacted; see `redact`",
          [](Options& to, const std::string& value) { to.redact.key = value; }},
-        {"--e1", "", "The trunks have the channels of E1 (default: learnt)",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::e1; }},
-        {"--t1", "", "The trunks have the channels of T1",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::t1; }},
-        {"--bri", "", "The trunks are basic accesses",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::basic; }},
+        e1Row,
+        t1Row,
+        basicRow,
     };
     return rows;
 }
 
 int runBrowse(const Options& options, Chatter& chatter) {
-    if (!options.output.path.empty() || options.first != 0)
+    if (!options.output.path.empty() || options.first != 0 || options.skipped != 0)
         throw UsageError(
             "browse shows all there is in a terminal: --output and --first are for other commands");
     Chatter quiet(Loudness::quiet);

@@ -28,17 +28,11 @@ void appendCell(std::string& to, bool isNumber, std::string_view safeText) {
     to += "</td>";
 }
 
-std::string textOf(const std::optional<Instant>& instant) {
-    std::string text;
-    if (instant && instant->clock != capture::Clock::none)
-        TimeText().append(text, *instant);
-    return text;
-}
-
 }  // namespace
 
 ReportTaker::ReportTaker(const Options& options)
-    : FigureTaker(options), filtered_(!options.filters.empty() || options.first != 0) {}
+    : FigureTaker(options),
+      filtered_(!options.filters.empty() || options.first != 0 || options.skipped != 0) {}
 
 void ReportTaker::see(const Seen& seen) {
     FigureTaker::see(seen);
@@ -116,7 +110,7 @@ void ReportTaker::report(const calls::Finding& finding) {
         worst_ = finding;
     std::string row = "<tr class=\"" + std::string(nameOf(finding.severity)) + "\">";
     appendCell(row, false, nameOf(finding.severity));
-    appendCell(row, false, textOf(Instant{finding.clock, finding.time}));
+    appendCell(row, false, textOf({finding.clock, finding.time}));
     appendCell(row, true, std::to_string(finding.frame));
     appendCell(row, true, finding.call ? std::to_string(*finding.call) : "");
     appendCell(row, false, finding.kind->id);
@@ -141,7 +135,7 @@ Page ReportTaker::page(std::string title, calls::TrunkSize size) const {
     return {.title = std::move(title),
             .summary = summaryOf(overview),
             .figures = std::move(figures),
-            .from = textOf(from_),
+            .from = textOf(from_.value_or(Instant())),
             .until = textOf(until_),
             .calls = callRows_,
             .ladders = ladderParts_,

@@ -2,7 +2,7 @@
 
 #include <string_view>
 
-#include "reader/CallFields.h"
+#include "reader/TimeText.h"
 #include "reader/text.h"
 
 namespace reader {
@@ -18,12 +18,6 @@ std::string counted(std::uint64_t number, std::string_view word) {
     return std::to_string(number) + " " + std::string(word) + (number == 1 ? "" : "s");
 }
 
-std::string textOf(Instant instant) {
-    std::string text;
-    TimeText().append(text, instant);
-    return text;
-}
-
 std::string trace(const Overview& overview) {
     std::string sentence = "The trace has " + counted(overview.frames, "frame");
     if (overview.from.clock == capture::Clock::none)
@@ -36,9 +30,7 @@ std::string link(const calls::LinkHistory::Key& key, const calls::LinkHistory::S
     std::string sentence = "The link of " + safe(key.first);
     if (key.second != 0)
         sentence += ", TEI " + std::to_string(key.second) + ",";
-    std::string since;
-    TimeText times;
-    appendInstant(since, standing.since, times);
+    std::string since = textOf({standing.since.clock, standing.since.time});
     since = since.empty() ? " since frame " + std::to_string(standing.since.frame) : " since " + since;
     switch (standing.state) {
         case LinkState::up:

@@ -9,6 +9,7 @@
 #include "reader/redact.h"
 #include "reader/report/ReportTaker.h"
 #include "reader/session.h"
+#include "reader/trunkRows.h"
 
 namespace reader {
 
@@ -47,12 +48,9 @@ std::span<const OptionRow> reportOptions() {
              to.redact.inReport = true;
              to.redact.key = value;
          }},
-        {"--e1", "", "The trunks have the channels of E1 (default: learnt)",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::e1; }, "trunk"},
-        {"--t1", "", "The trunks have the channels of T1",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::t1; }, "trunk"},
-        {"--bri", "", "The trunks are basic accesses",
-         [](Options& to, const std::string&) { to.calls.trunk = calls::TrunkSize::basic; }, "trunk"},
+        e1Row,
+        t1Row,
+        basicRow,
     };
     return rows;
 }

@@ -39,7 +39,7 @@ class Frames : public capture::Reader {
 // Checks that frames come in their order, and may fail at one of them.
 class Counting : public Consumer {
   public:
-    explicit Counting(std::uint64_t failAt = 0) : failAt_(failAt) {}
+    explicit Counting(std::uint64_t failAt = 0, std::uint64_t after = 0) : taken(after), failAt_(failAt) {}
     void take(Chunk& chunk, std::size_t count) override {
         for (std::size_t i = 0; i < count; ++i) {
             EXPECT_EQ(chunk.seen()[chunk.pieces[i].item].number, ++taken);
@@ -49,7 +49,7 @@ class Counting : public Consumer {
     }
     void flush() override { flushed = taken; }
 
-    std::uint64_t taken = 0;
+    std::uint64_t taken;  // the number of the last one
     std::uint64_t flushed = 0;
 
   private:
@@ -72,11 +72,12 @@ class Failing : public Composer {
 class PipelineTest : public ::testing::TestWithParam<unsigned> {
   protected:
     Outcome run(capture::Reader& reader, Counting& counting, std::uint64_t first = 0,
-                std::uint64_t failAt = 0) {
+                std::uint64_t failAt = 0, std::uint64_t skipped = 0) {
         Work work;
         work.makeComposer = [failAt] { return std::make_unique<Failing>(failAt); };
         work.jobs = GetParam();
         work.first = first;
+        work.skipped = skipped;
         return runPipeline(reader, tracker_, filter_, counting, chatter_, work);
     }
 
@@ -103,6 +104,16 @@ TEST_P(PipelineTest, HandsOnNoMoreThanTheFirst) {
     Counting counting;
     EXPECT_FALSE(run(reader, counting, 3000).isWhole);
     EXPECT_EQ(counting.flushed, 3000U);
+}
+
+TEST_P(PipelineTest, LeavesOutSoManyInFront) {
+    for (const std::uint64_t skipped : {1U, 255U, 256U, 257U, 3000U}) {
+        tracker_ = Tracker(InputOptions());
+        Frames reader(20'000);
+        Counting counting(0, skipped);
+        run(reader, counting, 1000, 0, skipped);
+        EXPECT_EQ(counting.flushed, skipped + 1000);
+    }
 }
 
 TEST_P(PipelineTest, HandsOnWhatWasReadBeforeTheInputTurnedBad) {

@@ -80,6 +80,7 @@ TEST(CommandLine, RefusesOptionsOfWhichOnlyOneCanHold) {
                                {"stats", "--jsonl", "--csv"},
                                {"stats", "--e1", "--t1"},
                                {"stats", "--bri", "--e1"},
+                               {"browse", "--e1", "--t1"},
                                {"list", "--relative", "--delta"},
                                {"list", "--wide", "--columns", "n"},
                                {"ladder", "--svg", "--mermaid"},
@@ -93,6 +94,10 @@ TEST(CommandLine, RefusesNotInFrontOfAnythingElse) {
     EXPECT_THROW(parseCommandLine({"--not", "a.log"}), UsageError);
     EXPECT_THROW(parseCommandLine({"a.log", "--not"}), UsageError);
     EXPECT_THROW(parseCommandLine({"--not", "--wide", "a.log"}), UsageError);
+    EXPECT_THROW(parseCommandLine({"--not", "--first", "0", "a.log"}), UsageError);
+    const Options options = parseCommandLine({"--first", "5", "--not", "--first", "7", "a.log"}).options;
+    EXPECT_EQ(options.first, 5U);
+    EXPECT_EQ(options.skipped, 7U);
 }
 
 TEST(CommandLine, RefusesWhatItDoesNotKnow) {

@@ -1,0 +1,37 @@
+// What --first and --not --first let through of things that a command counts itself: calls, findings.
+#ifndef READER_LIMIT_H
+#define READER_LIMIT_H
+
+#include <cstdint>
+
+#include "reader/Options.h"
+
+namespace reader {
+
+class Limit {
+  public:
+    explicit Limit(const Options& options) : skipped_(options.skipped), most_(options.first) {}
+
+    // Counts one more. False if it is one of those in front, or behind the last that is wanted.
+    bool takeOne() {
+        if (skipped_ != 0) {
+            --skipped_;
+            return false;
+        }
+        if (most_ != 0 && taken_ == most_)
+            return false;
+        ++taken_;
+        return true;
+    }
+    // How many were wanted so far.
+    std::uint64_t taken() const { return taken_; }
+
+  private:
+    std::uint64_t skipped_;
+    std::uint64_t most_;  // 0: all
+    std::uint64_t taken_ = 0;
+};
+
+}  // namespace reader
+
+#endif
