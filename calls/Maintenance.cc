@@ -4,6 +4,7 @@
 #include <limits>
 
 #include "calls/FindingKinds.h"
+#include "calls/channelKeys.h"
 #include "calls/findingOf.h"
 
 namespace calls {
@@ -38,23 +39,6 @@ GatheredFindings::Sentence unacknowledged(std::string_view messages, Side asker)
     };
 }
 
-std::vector<ChannelKey> keysOf(const std::optional<std::uint32_t>& interface,
-                               const std::bitset<128>& channels) {
-    std::vector<ChannelKey> keys;
-    for (std::uint32_t i = 0; i < channels.size(); ++i) {
-        if (channels.test(i))
-            keys.push_back({interface, i});
-    }
-    return keys;
-}
-
-std::vector<std::string> namesOf(const std::vector<ChannelKey>& channels) {
-    std::vector<std::string> names;
-    for (const ChannelKey& each : channels)
-        names.push_back(toString(each));
-    return names;
-}
-
 isdn::Element changeStatusOf(const Message& message) {
     const isdn::Element own = message.layer3.elements.find(element::changeStatus);
     return own.octets.empty() ? message.layer3.elements.find(element::changeStatus, 6) : own;
@@ -65,15 +49,6 @@ std::optional<isdn::ChannelId> channelIn(const Message& message) {
 }
 
 }  // namespace
-
-std::vector<ChannelKey> channelsOf(const std::optional<isdn::ChannelId>& channel) {
-    return channel ? keysOf(channel->interface, channel->channels) : std::vector<ChannelKey>();
-}
-
-std::string toString(const ChannelKey& channel) {
-    return (channel.interface ? std::to_string(*channel.interface) + "/" : std::string()) +
-           std::to_string(channel.number);
-}
 
 Maintenance::Told::Told(FindingSink& sink, Side asker)
     : restarts(sink, unacknowledged("RESTARTs", asker)),
