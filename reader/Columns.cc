@@ -225,14 +225,14 @@ void appendMessageName(std::string& to, const Seen& seen) {
 }
 
 void appendDetails(std::string& to, const Seen& seen) {
-    std::string words;
+    const std::size_t start = to.size();
     if (seen.hasMessage)
-        isdn::appendWords(words, seen.message, seen.variant, senderOf(seen));
+        isdn::appendWords(to, seen.message, seen.variant, senderOf(seen));
     else if (seen.link.carriesTeiMessage())
-        isdn::appendWords(words, isdn::parseTeiMessage(seen.link.information));
+        isdn::appendWords(to, isdn::parseTeiMessage(seen.link.information));
     else if (seen.link.type == isdn::FrameType::FRMR)
-        isdn::appendWords(words, isdn::parseFrameReject(seen.link.information));
-    appendSafe(to, words);
+        isdn::appendWords(to, isdn::parseFrameReject(seen.link.information));
+    makeSafe(to, start);
 }
 
 void appendCallReference(std::string& to, const Seen& seen) {

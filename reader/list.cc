@@ -1,5 +1,6 @@
 #include "reader/list.h"
 
+#include <algorithm>
 #include <string_view>
 
 #include "reader/TextConsumer.h"
@@ -44,6 +45,13 @@ std::vector<Column> chosenColumns(const ListOptions& options) {
     return chosen;
 }
 
+// The place of the column of this name; the number of columns if there is none.
+std::size_t placeOf(std::string_view name, const std::vector<Column>& columns) {
+    const auto found = std::find_if(columns.begin(), columns.end(),
+                                    [&](const Column& column) { return column.name == name; });
+    return static_cast<std::size_t>(found - columns.begin());
+}
+
 void trimBlanks(std::string& text, std::size_t start) {
     while (text.size() > start && text.back() == ' ')
         text.pop_back();
@@ -52,28 +60,32 @@ void trimBlanks(std::string& text, std::size_t start) {
 }  // namespace
 
 LineComposer::LineComposer(const ListOptions& options, bool colors)
-    : columns_(chosenColumns(options)), relative_(options.time == TimeForm::relative), colors_(colors) {}
+    : columns_(chosenColumns(options)),
+      delta_(placeOf(deltaColumn, columns_)),
+      relative_(options.time == TimeForm::relative),
+      colors_(colors) {}
 
 void LineComposer::compose(const Seen& seen, std::string& text, Piece& piece) {
     const std::size_t lineStart = text.size();
     Cell cell{seen, text, times_, relative_, colors_};
-    // One blank between columns, but two after a message and after other texts that contain blanks.
-    std::string_view separator;
-    for (const Column& column : columns_) {
-        text += separator;
+    // One blank follows a column, but two follow a message and other texts that contain blanks.
+    for (std::size_t i = 0; i < columns_.size(); ++i) {
+        const Column& column = columns_[i];
         const std::size_t start = text.size();
         column.put(cell);
-        padTo(text, start, column.width, column.right);
-        if (column.name == deltaColumn) {
+        if (i == delta_) {
             piece.deltaAt = start;
             piece.deltaSize = deltaWidth;
         }
-        if (column.width != 0)
-            separator = " ";
-        else if (text.size() != start)
-            separator = "  ";
+        const std::size_t length = text.size() - start;
+        if (column.width == 0)
+            text.append(length == 0 ? 0 : 2, ' ');
+        else if (length >= column.width)
+            text += ' ';
+        else if (!column.right)
+            text.append(column.width - length + 1, ' ');
         else
-            text.resize(start - separator.size());
+            text.insert(start, column.width - length, ' ') += ' ';
     }
     trimBlanks(text, std::max(lineStart, piece.deltaAt + piece.deltaSize));
     text += '\n';

@@ -21,6 +21,7 @@ class LineComposer : public Composer {
 
   private:
     std::vector<Column> columns_;
+    std::size_t delta_;  // place of the delta column among them; their number if it is none of them
     bool relative_;
     bool colors_;
     TimeText times_;

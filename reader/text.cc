@@ -9,6 +9,7 @@ namespace {
 constexpr char hexDigits[] = "0123456789abcdef";
 
 constexpr bool isPrintable(char character) { return character >= ' ' && character <= '~'; }
+constexpr bool isSafe(char character) { return isPrintable(character) && character != '\\'; }
 
 void appendEscaped(std::string& to, char character) {
     const auto octet = static_cast<unsigned char>(character);
@@ -35,8 +36,15 @@ void appendEscaping(std::string& to, std::string_view text, IsPlain isPlain) {
 
 }  // namespace
 
-void appendSafe(std::string& to, std::string_view text) {
-    appendEscaping(to, text, [](char character) { return isPrintable(character) && character != '\\'; });
+void appendSafe(std::string& to, std::string_view text) { appendEscaping(to, text, isSafe); }
+
+void makeSafe(std::string& text, std::size_t start) {
+    const auto from = text.begin() + static_cast<std::ptrdiff_t>(start);
+    if (std::all_of(from, text.end(), isSafe))
+        return;
+    const std::string unsafe(from, text.end());
+    text.resize(start);
+    appendSafe(text, unsafe);
 }
 
 std::string safe(std::string_view text) {

@@ -17,6 +17,8 @@ namespace reader {
 // appear as \xHH, so that a terminal only ever gets what can be read; a backslash appears as two.
 void appendSafe(std::string& to, std::string_view text);
 std::string safe(std::string_view text);
+// Gives the text from `start` on the form that appendSafe would have appended.
+void makeSafe(std::string& text, std::size_t start);
 
 // Appends text that is safe already, in the form that XML or HTML needs in text and between the double quotes
 // of an attribute.

@@ -5,6 +5,18 @@
 namespace reader {
 namespace {
 
+TEST(SafeText, IsMadeInPlaceFromAPlaceOn) {
+    std::string text = "\x1b[1mkept, ";
+    makeSafe(text, text.size());
+    EXPECT_EQ(text, "\x1b[1mkept, ");
+    text += "plain";
+    makeSafe(text, 10);
+    EXPECT_EQ(text, "\x1b[1mkept, plain");
+    text += "\x1b\\\xff!";
+    makeSafe(text, 10);
+    EXPECT_EQ(text, "\x1b[1mkept, plain\\x1b\\\\\\xff!");
+}
+
 TEST(SafeText, ShowsControlCharactersAsTheirCodes) {
     EXPECT_EQ(safe("\x1b[2Jred"), "\\x1b[2Jred");
     EXPECT_EQ(safe("a\nb\tc\x7f"), "a\\x0ab\\x09c\\x7f");
