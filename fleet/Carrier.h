@@ -1,4 +1,4 @@
-// Who takes messages and answers when they are safe.
+// The interface through which a shipper sends messages to a stream and gets the stream's answers.
 #ifndef FLEET_CARRIER_H
 #define FLEET_CARRIER_H
 
@@ -14,13 +14,13 @@ class Carrier {
   public:
     // What became of a message.
     struct Answer {
-        // That send() was given. Nothing if no stream takes the subject, or none is reachable: the carrier
-        // does not know which message that was.
+        // The token that send() was given with the message. Empty if no stream took a message: the carrier
+        // does not know then which message it was.
         std::optional<std::uint64_t> token;
-        bool isKept = false;  // the stream has it, also if it had it before
-        bool isDuplicate = false;
-        bool isFull = false;  // not kept, since the stream takes no more
-        std::string error;    // why it is not kept
+        bool isKept = false;       // the stream has the message
+        bool isDuplicate = false;  // the stream had it before
+        bool isFull = false;       // not kept, because the stream has no room
+        std::string error;         // why it is not kept
     };
 
     Carrier() = default;
@@ -28,11 +28,12 @@ class Carrier {
     Carrier& operator=(const Carrier&) = delete;
     virtual ~Carrier() = default;
 
-    // Sends a message and does not wait. Its answer may never come: whoever sends waits for a time and sends
-    // again. A token may be used again. Throws NatsError if it cannot be sent now.
+    // Sends a message and does not wait for its answer. The answer may never come. The caller then sends the
+    // message again, with the same `id`, which the stream recognises, and the same `token`. Throws NatsError
+    // if the message cannot be sent now.
     virtual void send(const std::string& subject, std::string_view text, const std::string& id,
                       std::uint64_t token) = 0;
-    // The next answer, in the order in which they come; nothing if none comes within the time. Throws
+    // Returns the next answer, or nothing if none comes within `wait`. Answers come in any order. Throws
     // NatsError if there is no connection any more.
     virtual std::optional<Answer> answer(std::chrono::milliseconds wait) = 0;
 };

@@ -34,7 +34,8 @@ struct NatsConnection::Handles {
     OwnedJetStream jetStream;
 };
 
-// Throws NatsError unless the status is good; `wanted` is "connect to NATS" and the like.
+// Throws NatsError unless the status is good. `wanted` says what was tried, for the error's text: "connect to
+// NATS".
 void require(natsStatus status, const std::string& wanted, int jetStreamError = 0);
 
 // Makes a message that can be sent. Throws NatsError.

@@ -1,4 +1,4 @@
-// Messages into a stream, many of them on their way at a time.
+// Publishes messages over NATS without waiting for the answer to each.
 #ifndef FLEET_NATSPUBLISHER_H
 #define FLEET_NATSPUBLISHER_H
 
@@ -9,10 +9,11 @@
 
 namespace fleet {
 
-// Answers are those of the streams. Used by one thread at a time, the one that uses the connection.
+// The answers are those of the stream that takes the subject. Used only by the thread that uses the
+// connection.
 class NatsPublisher final : public Carrier {
   public:
-    // The connection outlives it. Throws NatsError.
+    // The connection must outlive this object. Throws NatsError.
     explicit NatsPublisher(NatsConnection& connection);
     ~NatsPublisher() override;
 

@@ -1,4 +1,5 @@
-// What travels from a shipper to the store: consecutive frames of one D channel and one run.
+// A parcel: the message that carries consecutive frames of one D channel and one run from a shipper to the
+// store.
 #ifndef FLEET_PARCEL_H
 #define FLEET_PARCEL_H
 
@@ -14,7 +15,7 @@
 
 namespace fleet {
 
-// A frame, or what the recorder had to say (capture::Item), with its octets.
+// An item of a recording with its octets: a frame, or what the recorder said between frames (capture::Item).
 struct ParcelItem {
     capture::Item::Kind kind = capture::Item::Kind::frame;
     std::optional<std::int64_t> time;     // nanoseconds since 1970, UTC; every frame has one
@@ -22,10 +23,10 @@ struct ParcelItem {
     std::optional<std::int64_t> written;  // as in capture::Frame
     bool transmitted = false;
     capture::Role role = capture::Role::unknown;
-    std::vector<std::uint8_t> octets;  // of frame and cut
-    std::uint64_t count = 0;           // not of frames
-    std::string text;                  // not of frames; UTF-8, at most Parcel::longestText octets
-    capture::Variant variant = capture::Variant::unknown;  // of run
+    std::vector<std::uint8_t> octets;  // empty unless `kind` is frame or cut
+    std::uint64_t count = 0;           // 0 in frames
+    std::string text;                  // empty in frames; UTF-8, at most Parcel::longestText octets
+    capture::Variant variant = capture::Variant::unknown;  // unknown unless `kind` is run
 
     bool operator==(const ParcelItem&) const = default;
 };
@@ -38,8 +39,8 @@ struct ParcelFrame {
     bool operator==(const ParcelFrame&) const = default;
 };
 
-// Frames of the run that nobody will ever get: numbers `first` to `last`, or from `first` on an unknown
-// number if there is no `last`; then the run has ended.
+// Frames of the run that are missing for good: numbers `first` to `last`. If there is no `last`, an unknown
+// number of frames is missing from `first` on, and the run has ended.
 struct ParcelGap {
     std::uint64_t first = 1;
     std::optional<std::uint64_t> last;
@@ -48,8 +49,8 @@ struct ParcelGap {
     bool operator==(const ParcelGap&) const = default;
 };
 
-// docs/user/fleet-parcel.md describes the text. A frame is known by D channel, run and number: the shipper
-// may send it several times, in parcels of other sizes, and it is the same frame.
+// docs/user/fleet-parcel.md describes the text. D channel, run and number identify a frame. The shipper may
+// send a frame several times, in parcels of different sizes; it is the same frame each time.
 struct Parcel {
     static constexpr std::size_t mostFrames = 1000;
     static constexpr std::size_t mostNotes = 1000;  // before one frame, and at the end
@@ -67,7 +68,7 @@ struct Parcel {
     std::uint64_t first = 1;          // number of the first frame; without frames, of the next one to come
     std::vector<ParcelFrame> frames;  // numbered first, first + 1, ...
     std::vector<ParcelGap> gaps;      // in their order, all of them before the frames
-    // The run has ended behind the frames; nothing of it follows. What the recorder said behind the last one.
+    // If set, the run ends with this parcel. It holds what the recorder said after the run's last frame.
     std::optional<std::vector<ParcelItem>> end;
 
     bool operator==(const Parcel&) const = default;
@@ -78,22 +79,23 @@ struct Parcel {
     Subject subject() const { return {partitionOf(address, group), address}; }
 };
 
-// A text that is no parcel. what() says which part of it is wrong, in at most 200 printable characters.
+// Thrown for a text that is no parcel, and for a parcel that cannot be written. what() says which part is
+// wrong, in at most 200 printable characters.
 class BadParcel : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
 };
 
-// JSON in one line. Texts in words, and the D channel's name, are made fit for it (cleanUtf8). Throws
-// BadParcel for a parcel that is empty or too large, and for numbers that do not fit each other.
+// Writes the parcel as one line of JSON. The D channel's name and all texts pass through cleanUtf8. Throws
+// BadParcel if the parcel is empty or too large, or if its numbers contradict each other.
 std::string toText(const Parcel& parcel);
-// Takes any text at all. Throws BadParcel.
+// Reads what toText writes. The text may hold any octets. Throws BadParcel.
 Parcel parcelIn(std::string_view text);
 
-// What the recorder said, alone: the list that stands under "before" or "end" of a parcel. The store keeps it
-// so.
+// Writes only what the recorder said, as the list that "before" or "end" holds in a parcel's text. The store
+// keeps the list in this form.
 std::string toText(const std::vector<ParcelItem>& notes);
-// Throws BadParcel.
+// Reads such a list. Throws BadParcel.
 std::vector<ParcelItem> notesInText(std::string_view text);
 
 }  // namespace fleet

@@ -16,8 +16,8 @@ inline constexpr char centreStream[] = "LAPD";
 inline constexpr char siteStream[] = "LAPD_SITE";
 inline constexpr char deadStream[] = "LAPD_DEAD";
 
-// A stream refuses messages for which it has no room, so the sender must keep them. It removes messages that
-// are older than `age`.
+// A stream refuses a message for which it has no room; the sender must keep it. A stream removes messages
+// that are older than `age`.
 struct StreamRules {
     std::string name;
     std::vector<std::string> subjects;
@@ -25,7 +25,7 @@ struct StreamRules {
     std::uint64_t mostOctets = 0;  // on each server's disk; 0: as much as the server allows
     std::chrono::hours age{7 * 24};
     std::chrono::seconds duplicates{120};  // how long the server remembers the ids of messages
-    // JetStream domains of sites, whose LAPD_SITE is copied into this stream.
+    // The JetStream domains of sites. The stream LAPD_SITE of each is copied into this stream.
     std::vector<std::string> sites;
 };
 
@@ -37,7 +37,7 @@ struct StreamFilling {
     std::uint64_t octets = 0;
     std::uint64_t mostOctets = 0;  // 0: no limit of its own
 };
-// Throws NatsError.
+// Asks the server how full the stream is. Throws NatsError.
 StreamFilling fillingOf(NatsConnection& connection, const std::string& stream);
 
 }  // namespace fleet

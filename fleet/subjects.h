@@ -21,16 +21,16 @@ struct Address {
 
 bool isName(std::string_view text);
 
-// "london/h1/0/1": what the D channel is called in ids, metrics and the store. Any character of a name that
-// is no letter or digit of ASCII, no "-" and no "_" is written as "%" and two hexadecimal digits in upper
-// case.
+// "london/h1/0/1": the D channel's name in ids, metrics and the store. ASCII letters and digits, "-" and "_"
+// stay; any other character is written as "%" and two hexadecimal digits in upper case.
 std::string toText(const Address& address);
 
 inline constexpr unsigned partitions = 64;
 
-// 0 to 63. D channels of one NFAS group have one partition; without a group ("") the D channel decides. It is
-// FNV-1a, 64 bits, of "SITE/GROUP" or else of the address's text, the upper and the lower half of its bits
-// combined by XOR, modulo 64. It must never change: a partition's consumer keeps the order of its trunks.
+// Returns the D channel's partition, 0 to 63. All D channels of an NFAS group have one partition. It is
+// FNV-1a (64 bits) of "SITE/GROUP", or of the address's text if `group` is empty; the upper and the lower
+// half of the hash are combined by XOR, modulo 64. This must never change: one consumer takes all messages of
+// a D channel, and so keeps their order.
 unsigned partitionOf(const Address& address, std::string_view group);
 
 // Thrown for a subject that no shipper can have made. what() says why.
@@ -46,8 +46,8 @@ struct Subject {
     bool operator==(const Subject&) const = default;
 };
 
-// "lapd.17.london.h1.0.1", its names written as in an address's text. So no name holds what has a meaning in
-// a subject (".", "*", ">", blanks).
+// "lapd.17.london.h1.0.1", with names written as in an address's text, so that none of them holds a character
+// that has a meaning in a subject (".", "*", ">", blanks).
 std::string toText(const Subject& subject);
 // Reads a subject in exactly the form that toText writes. Throws BadSubject.
 Subject subjectIn(std::string_view text);
@@ -56,7 +56,8 @@ Subject subjectIn(std::string_view text);
 inline constexpr char everySubject[] = "lapd.>";
 std::string subjectsOf(unsigned partition);
 
-// Where a message goes that cannot be stored: "lapd-dead.17.london.h1.0.1". Takes any subject below "lapd.".
+// The subject to which a message goes if it cannot be stored: "lapd-dead.17.london.h1.0.1". Takes any subject
+// below "lapd.".
 inline constexpr char everyDeadSubject[] = "lapd-dead.>";
 std::string deadSubjectOf(std::string_view subject);
 

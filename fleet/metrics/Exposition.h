@@ -10,13 +10,15 @@
 
 namespace fleet {
 
-// Families come one after another, each with its samples behind it. Used by one thread.
+// Composes the text: call family(), then sample() for each sample of this family, then the next family().
+// Used by one thread.
 class Exposition {
   public:
     enum class Type : std::uint8_t { counter, gauge };
     using Labels = std::initializer_list<std::pair<std::string_view, std::string_view>>;
 
-    // Names, and those of labels, must be ones that Prometheus takes. `help` is one line.
+    // Begins a family. The caller sees to it that its name, and the names of labels, are valid for
+    // Prometheus. `help` is one line.
     void family(std::string_view name, Type type, std::string_view help);
     // A sample of the last family. Values of labels may be any text.
     void sample(Labels labels, std::uint64_t value) { add(labels, std::to_string(value)); }

@@ -11,9 +11,9 @@
 
 namespace fleet {
 
-// What a client may take of us.
+// The most that clients can cost this program.
 struct HttpLimits {
-    std::size_t mostConnections = 32;          // then the oldest one ends for a new one
+    std::size_t mostConnections = 32;          // a further one ends the oldest
     std::size_t mostOctets = 8192;             // of a request
     std::chrono::milliseconds patience{5000};  // from a connection's beginning to its end
 };
@@ -28,8 +28,8 @@ class BadListenAddress : public std::runtime_error {
 // chooses.
 bool isListenAddress(const std::string& text);
 
-// Owns a thread that listens and answers, one request a connection. Whatever clients do, they cost no more
-// than the limits allow, and hold up neither each other nor the rest of the program.
+// Owns a thread that listens and answers, one request for each connection. Whatever clients do, they cost no
+// more than the limits allow, and delay neither each other nor the rest of the program.
 class HttpAnswerer {
   public:
     // `compose` makes the text; it is called on the answerer's thread, and what it throws becomes an answer

@@ -1,4 +1,4 @@
-// A text that one thread makes and another hands out.
+// Passes a text from the thread that makes it to the thread that hands it out.
 #ifndef FLEET_METRICS_PUBLISHED_H
 #define FLEET_METRICS_PUBLISHED_H
 
@@ -8,7 +8,7 @@
 
 namespace fleet {
 
-// Used by any threads.
+// Any thread may call any function; the lock guards the text.
 class Published {
   public:
     void set(std::string text) {

@@ -1,4 +1,4 @@
-// What every program says of itself.
+// Figures that every program of a fleet gives about itself.
 #ifndef FLEET_METRICS_PROCESS_H
 #define FLEET_METRICS_PROCESS_H
 
@@ -9,10 +9,11 @@
 
 namespace fleet {
 
-// Since 1970.
+// The time of day, in nanoseconds since 1970.
 std::int64_t nanosecondsNow();
 
-// The version ("lapdship_build_info"), and when the process began ("process_start_time_seconds").
+// Adds the program's version ("lapdship_build_info") and the time at which the process began
+// ("process_start_time_seconds").
 void describeProcess(Exposition& to, const std::string& program, const std::string& version);
 
 }  // namespace fleet

@@ -14,31 +14,32 @@
 
 namespace fleet {
 
-// What a SELECT must ask for, in this order.
+// The columns that a SELECT must ask for, in this order.
 inline constexpr char frameColumns[] =
     "run, number, time, sent, role, ticks, written, variant, octets, before";
 
-// Takes the rows of one D channel in the order of runs and numbers. Gives a row as the recorder's notes in
-// front of the frame, then the frame. Used by one thread at a time.
+// Takes the rows of one D channel in the order of runs and numbers, and gives the items of each row: what the
+// recorder said before the frame, then the frame. Used by one thread at a time.
 class FrameRows {
   public:
-    // `name` is that of the D channel, `place` what messages call the input. The frame numbered `next` of
-    // `run` is expected first; without them whatever comes first is.
+    // `name` is the D channel's name. `place` names the input in messages. The first row may have any number.
     FrameRows(std::string name, std::string place);
     FrameRows(const FrameRows&) = delete;
     FrameRows& operator=(const FrameRows&) = delete;
 
-    // A frame that came before, on another day, is passed over. Frames that are missing between the one
-    // before and this one are an item of their own (lost); a new run begins with one as well (replaced).
+    // Takes a row and drops items of the row before that next() has not given. A row whose frame was taken
+    // already, with another day, gives nothing. If numbers are missing before the frame, an item of kind
+    // `lost` with their count comes first; a new run begins with an item of kind `replaced`.
     void take(const pqxx::row& row);
-    // What the recorder said behind the last frame of a run: the text of a column.
+    // Takes what the recorder said after a run's last frame, as the column `behind` of lapd.runs has it.
+    // Drops items as take() does.
     void takeNotes(std::string_view json);
 
-    // The next item of what was taken; false if there is no more. Valid until the next call of this class;
-    // interfaces as long as this.
+    // Gives the next item of what was taken; false if there is no more. The item's views are valid until the
+    // next call, its interface as long as this object.
     bool next(capture::Item& item);
 
-    // Of the last row.
+    // Run and number of the last row; 0 before the first one.
     std::uint64_t run() const { return run_; }
     std::uint64_t number() const { return number_; }
 

@@ -1,4 +1,4 @@
-// The store of a fleet as an input: the frames of its D channels, each a capture::Reader.
+// The store of a fleet as an input: a capture::Reader for each of its D channels.
 #ifndef FLEET_QUERY_STORE_H
 #define FLEET_QUERY_STORE_H
 
@@ -12,17 +12,17 @@
 
 namespace fleet {
 
-// What to read. Empty lists: all.
+// What to read. An empty list means all.
 struct StoreQuery {
-    std::string url;  // "postgresql://...", or what else libpq takes
+    std::string url;  // "postgresql://...", or anything else that libpq takes
     std::vector<std::string> sites;
     std::vector<std::string> trunks;    // names, or addresses (SITE/HOST/BOARD/DCHANNEL)
     std::optional<std::int64_t> since;  // nanoseconds since 1970
     std::optional<std::int64_t> until;
 };
 
-// A connection with one snapshot of the store: all that is read through it is of one moment. Used by one
-// thread at a time.
+// A connection to the database with one transaction, so that everything that is read through it shows the
+// store at one moment. Used by one thread at a time, together with its readers.
 class Store {
   public:
     struct Trunk {
@@ -40,15 +40,16 @@ class Store {
     Store(const Store&) = delete;
     Store& operator=(const Store&) = delete;
 
-    // Those that the query names, by address.
+    // The D channels that the query chooses, in the order of their addresses.
     const std::vector<Trunk>& trunks() const;
 
-    // Of these, the names of D channels that share their calls (NFAS): two at least in each group.
+    // The NFAS groups among them: the names of the D channels of each group, at least two.
     std::vector<std::vector<std::string>> groups() const;
 
-    // Reads the frames of a D channel, run after run. With times in the query it reads whole days (UTC), the
-    // day in front of the first, and besides the days of the calls that were alive at its ends, so that these
-    // calls are complete. Keeps the store open. Its functions throw capture::BadInput.
+    // Makes a reader of the frames of a D channel, run after run. If the query has times, the reader gives
+    // whole days (UTC): from the day before `since` to the day after `until`, and further days if a call was
+    // alive at `since` or `until`, so that this call is complete. The reader keeps the connection open, also
+    // when this object is gone. Its functions throw capture::BadInput.
     std::unique_ptr<capture::Reader> read(const Trunk& trunk) const;
 
   private:

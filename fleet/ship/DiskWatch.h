@@ -1,4 +1,4 @@
-// Says that room gets scarce, before there is none.
+// Warns when a disk or the stream has little room left.
 #ifndef FLEET_SHIP_DISKWATCH_H
 #define FLEET_SHIP_DISKWATCH_H
 
@@ -18,15 +18,15 @@ class DiskWatch {
         std::uint64_t of = 0;  // octets both
     };
 
-    // Less than `leastFree` per cent is said: once, and again when it has got better in between.
+    // `say` gets a line when less than `leastFree` per cent are free, and another when there is room again.
     DiskWatch(unsigned leastFree, Say say) : leastFree_(leastFree), say_(std::move(say)) {}
 
-    // Looks at the disk that a folder is on.
+    // Looks at the disk that a folder is on. Does nothing if the system gives no figures of it.
     void look(const std::string& folder);
-    // Anything that is filled: "the stream LAPD_SITE". Without a limit (0) it is never full.
+    // Looks at anything else that can become full: "the stream LAPD_SITE". `of` is its limit; 0: it has none.
     void look(const std::string& name, std::uint64_t used, std::uint64_t of);
 
-    // What was seen last of each folder's disk.
+    // What was seen last of each folder's disk, without what is reserved for root.
     const std::map<std::string, Filling>& disks() const { return disks_; }
 
   private:

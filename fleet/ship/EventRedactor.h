@@ -15,19 +15,20 @@
 
 namespace fleet {
 
-// Of one D channel. Keeps the order: what stands behind a piece of a message waits with it until the message
-// is whole. Comments are left out, and what else the recorder said is put in words of our own, since both may
-// name people.
+// Redacts the events of one D channel and keeps their order. A SEGMENT waits until its message is whole, and
+// all events after it wait as well. Comments are dropped, and texts of what else the recorder said are
+// replaced by our own words, because both may name people.
 class EventRedactor {
   public:
     using Next = std::function<void(const InputEvent&)>;
 
-    // `next` gets the events, with views that are valid during the call.
+    // `next` gets the redacted events; their views are valid only during the call.
     EventRedactor(const redaction::Key& key, Next next);
 
-    // Old events must pass as well: numbers may begin in them.
+    // Takes an event. Old events must be taken as well, because a number's first digits may be in them.
     void take(const InputEvent& event);
-    // Nothing more is there just now. What has waited too long goes on, with its pieces blanked.
+    // The caller has no event just now. If none has come for TraceRedactor::longestWait, gives the events
+    // that wait, with their segments blanked.
     void pause();
 
   private:

@@ -14,16 +14,17 @@
 
 namespace fleet {
 
-// Goes by the recorder's state: it lists the files and says which frame each of them begins with. The newest
-// file is read while it is written. Runs and numbers are the recorder's.
+// Reads the recordings that the recorder's state lists; the state also says which frame each of them begins
+// with. Follows the newest file while it is written. Runs and numbers are those of the recorder.
 class FolderInput final : public TrunkInput {
   public:
     enum class Before : std::uint8_t {
         nothing,
-        recording  // old frames first: those of the recording before, in which a call may begin
+        recording  // begins one recording earlier, because a call may begin there
     };
 
-    // Gives what is behind `from`.
+    // Begins with the recording that holds the last frame before `from`, or as `before` says. Events that
+    // `from` has passed are given as old ones (InputEvent::isOld).
     FolderInput(std::string folder, const std::string& trunk, const Place& from, Before before);
 
     bool next(InputEvent& event) override;
@@ -60,13 +61,13 @@ class FolderInput final : public TrunkInput {
     bool lacksTail_ = false;     // a recording of this run is gone, and none behind it was read
     std::string done_;           // name of the file that was read last; empty before the first one
 
-    // The file that is read now.
+    // The file that is being read.
     recording::RecordedFile file_;
     std::unique_ptr<capture::Reader> reader_;
     std::uint64_t number_ = 0;       // of its next frame
-    std::uint64_t besidesHere_ = 0;  // items behind the frame before that
+    std::uint64_t besidesHere_ = 0;  // items after the frame before that
     bool isComplete_ = false;        // nothing will be written to it any more
-    bool isFollowed_ = false;        // it was opened before that
+    bool isFollowed_ = false;        // it was opened before it was complete
 
     std::optional<recording::RecordedLog> none_;
 };

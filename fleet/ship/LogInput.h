@@ -12,9 +12,10 @@
 
 namespace fleet {
 
-// Makes runs itself: a log with the device, the inode and the first frame of the place is the place's run and
-// goes on; any other begins a new one, and so does a log that is emptied or replaced, and a FIFO each time.
-// What was written and not read then is lost, so the run before ends with a gap.
+// Makes the runs itself. If the log has the device, the inode and the first frame that the place names, the
+// place's run goes on. Otherwise a new run begins: for another log, for one that was emptied or replaced, and
+// for a FIFO whenever the program is started. What was written to the log before and not read is lost, so the
+// earlier run ends with a gap.
 class LogInput final : public TrunkInput {
   public:
     LogInput(std::string path, std::string trunk, const Place& from);
@@ -33,7 +34,7 @@ class LogInput final : public TrunkInput {
 
     std::string path_;
     std::string trunk_;
-    int ownWriter_ = -1;  // of a FIFO, so that opening it waits for nobody
+    int ownWriter_ = -1;  // our own writer of a FIFO, so that opening it for reading does not wait
     std::unique_ptr<capture::Reader> reader_;
 
     std::uint64_t run_;
@@ -41,7 +42,7 @@ class LogInput final : public TrunkInput {
     bool isEnded_;        // its end was given, or there is no run yet
     std::optional<recording::RecordedLog> log_;
 
-    // What is read now, from its beginning on.
+    // The log that is being read, from its beginning on.
     std::optional<recording::RecordedLog> found_;
     capture::Batch first_;      // its first frame, and what came before it
     bool hasFirst_ = false;     // the frame has come

@@ -1,4 +1,4 @@
-// Parcels on their way: sent until they are safe, and reported in the order of each D channel.
+// Holds parcels until the stream has confirmed them, sends them again if need be, and reports which are safe.
 #ifndef FLEET_SHIP_OUTBOX_H
 #define FLEET_SHIP_OUTBOX_H
 
@@ -17,26 +17,27 @@
 namespace fleet {
 
 struct OutboxRules {
-    std::size_t most = 256;                    // parcels on their way
-    std::size_t mostOfOne = 32;                // of one D channel
-    std::size_t mostOctets = 16 << 20;         // of all of them
-    std::chrono::milliseconds patience{5000};  // for an answer; then a parcel is sent again
-    std::chrono::milliseconds pause{1000};     // before one is sent again that was refused
+    std::size_t most = 256;                    // parcels that are held
+    std::size_t mostOfOne = 32;                // of these, parcels of one D channel
+    std::size_t mostOctets = 16 << 20;         // of all their texts
+    std::chrono::milliseconds patience{5000};  // without an answer, a parcel is sent again after this time
+    std::chrono::milliseconds pause{1000};     // a parcel that was refused is sent again after this time
 };
 
-// What was sent, for whoever watches.
+// Counts of what was sent and answered, for the program's figures.
 struct OutboxFigures {
     std::uint64_t sent = 0;  // parcels, each time they were sent
     std::uint64_t octets = 0;
     std::uint64_t kept = 0;
     std::uint64_t duplicates = 0;  // of those kept: the stream had them before
     std::uint64_t refused = 0;     // answers that say no
-    std::uint64_t unanswered = 0;  // in time
-    bool isFull = false;           // the newest refusal was for want of room
-    std::string refusal;           // in words; empty once one was kept behind it
+    std::uint64_t unanswered = 0;  // parcels sent again because no answer came in time
+    bool isFull = false;           // the newest answer was a refusal for want of room
+    std::string refusal;           // the newest refusal in words; empty once a parcel was kept after it
 };
 
-// What is known to be safe of a D channel.
+// All frames of a D channel before number `next` of `run` are safe: the stream has confirmed them. `isEnded`:
+// the end of the run is safe as well.
 struct SafeUpTo {
     std::uint64_t run = 0;
     std::uint64_t next = 1;
@@ -47,21 +48,22 @@ class Outbox {
   public:
     using Safe = std::function<void(std::size_t dChannel, const SafeUpTo&)>;
 
-    // `safe` is called by pump(), for each D channel in the order of its parcels.
+    // pump() calls `safe` when more of a D channel is safe. A parcel counts only when all parcels of its D
+    // channel before it are safe.
     Outbox(const OutboxRules& rules, Safe safe) : rules_(rules), safe_(std::move(safe)) {}
 
-    // D channels are numbered by the caller, from 0.
+    // The caller numbers the D channels from 0, and adds a parcel only if there is room for it.
     bool hasRoom(std::size_t dChannel) const;
     void add(std::size_t dChannel, const Parcel& parcel);
-    // How many of its parcels are not reported as safe.
+    // How many parcels of the D channel were not reported as safe yet.
     std::size_t waiting(std::size_t dChannel) const;
     // The time of the first frame in the oldest of these, in nanoseconds since 1970; nothing if it has none.
     std::optional<std::int64_t> oldestWaiting(std::size_t dChannel) const;
 
-    // Sends what is to be sent, and takes answers: those that are there, or the first one to come within the
-    // time. Throws NatsError if the carrier does; what was not answered stays.
+    // Sends the parcels that are due, and takes the answers that have come; if there is none, waits at most
+    // `wait` for the first. Throws NatsError if the carrier does; parcels without an answer stay.
     void pump(Carrier& carrier, std::chrono::milliseconds wait);
-    // With a new connection: what was not answered is sent again.
+    // Call this when there is a new connection: the next pump() sends all parcels that are not kept again.
     void sendAllAgain();
 
     bool isEmpty() const { return parcels_.empty(); }
@@ -77,7 +79,7 @@ class Outbox {
         std::string id;
         SafeUpTo then;
         std::optional<std::int64_t> time;  // of its first frame
-        Clock::time_point due{};           // when it is sent (again)
+        Clock::time_point due{};           // when it is sent, or sent again
         bool isOut = false;                // it waits for an answer
         bool isKept = false;
     };
@@ -92,7 +94,7 @@ class Outbox {
     std::vector<std::deque<std::uint64_t>> ofDChannel_;
     std::uint64_t tokens_ = 0;
     std::size_t octets_ = 0;
-    Clock::time_point nextDue_{};  // nothing is to be sent before
+    Clock::time_point nextDue_{};  // no parcel is due before
     OutboxFigures figures_;
 };
 

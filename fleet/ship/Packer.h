@@ -1,4 +1,4 @@
-// From the events of a D channel to parcels.
+// Packs the events of a D channel into parcels.
 #ifndef FLEET_SHIP_PACKER_H
 #define FLEET_SHIP_PACKER_H
 
@@ -11,7 +11,7 @@
 
 namespace fleet {
 
-// What stands in every parcel of a D channel.
+// The fields that are the same in every parcel of a D channel.
 struct ParcelHead {
     Address address;
     std::string trunk;
@@ -19,18 +19,17 @@ struct ParcelHead {
     bool isRedacted = false;
 };
 
-// A parcel is closed when it is full, when the run or the variant changes, and when the caller has nothing
-// more to put into it just now.
+// Closes a parcel when it is full, when the run or the variant changes, and when close() is called.
 class Packer {
   public:
     explicit Packer(ParcelHead head) : head_(std::move(head)) {}
 
-    // Frames and what the recorder said; old ones are passed over.
+    // Takes an event; passes over old items.
     void take(const InputEvent& event);
-    // Nothing more comes just now: the frames there are make a parcel.
+    // Closes the parcel that has been begun. Call this when there is no event just now.
     void close();
 
-    // Closed parcels, in their order. Whoever takes them pops them.
+    // The closed parcels, in their order. The caller removes those that it takes.
     std::deque<Parcel>& parcels() { return closed_; }
 
   private:
@@ -38,7 +37,8 @@ class Packer {
     void takeNote(ParcelItem item);
     void open(std::uint64_t run, std::uint64_t first, capture::Variant variant);
 
-    // Of a parcel's text, roughly; what one frame can bring with it still fits.
+    // When a parcel is full: octets of its text, estimated, and frames. One more frame with all that the
+    // recorder said before it still fits into Parcel::largest.
     static constexpr std::size_t full = 100'000;
     static constexpr std::size_t mostFrames = 500;
     static constexpr std::size_t mostNoteText = 100'000;
@@ -51,8 +51,8 @@ class Packer {
     std::deque<Parcel> closed_;
 };
 
-// The frame or what the recorder said, with its octets. A frame of a trace without dates gets a time that
-// depends on nothing but the run and the frame, so that it has the same one whenever it is read.
+// Copies an item with its octets. A frame of a trace without dates gets a time that depends only on the run
+// and the frame, so that it has the same time whenever it is read.
 ParcelItem parcelItem(const capture::Item& item, std::uint64_t run, std::uint64_t number);
 
 }  // namespace fleet

@@ -1,4 +1,5 @@
-// How far a shipper has come with a D channel: what is safe in the stream.
+// How far a shipper has come with a D channel, as it is noted on disk. Safe means that the stream has
+// confirmed it.
 #ifndef FLEET_SHIP_PLACE_H
 #define FLEET_SHIP_PLACE_H
 
@@ -14,14 +15,15 @@ namespace fleet {
 struct Place {
     std::uint64_t run = 0;                      // 0: nothing was shipped yet
     std::uint64_t next = 1;                     // the first frame of the run that is not safe
-    bool isEnded = false;                       // that the run has ended is safe, too
-    std::optional<recording::RecordedLog> log;  // that the run is read from, if the shipper itself reads one
+    bool isEnded = false;                       // the end of the run is safe as well
+    std::optional<recording::RecordedLog> log;  // the log of the run, if the shipper itself reads a log
 };
 
-// Nothing if there is no such file. Throws std::runtime_error, which names the file, if it is damaged.
+// Returns nothing if there is no such file. Throws std::runtime_error, which names the file, if it is
+// damaged.
 std::optional<Place> readPlace(const std::string& path);
 
-// Puts it in the place of the old one in one step. Returns what is wrong, or nothing.
+// Replaces the file in one step (rename). Returns words that say what went wrong, or nothing.
 std::optional<std::string> writePlace(const Place& place, const std::string& dChannel,
                                       const std::string& path, recording::Durability durability);
 

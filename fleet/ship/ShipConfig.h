@@ -1,4 +1,4 @@
-// What a shipper is told: its configuration file.
+// The configuration file of a shipper.
 #ifndef FLEET_SHIP_SHIPCONFIG_H
 #define FLEET_SHIP_SHIPCONFIG_H
 
@@ -21,24 +21,24 @@ class BadConfig : public std::runtime_error {
 
 struct ShippedDChannel {
     ParcelHead head;
-    // One of the two.
+    // The input: one of these two, the other is empty.
     std::string folder;  // where lapdread record keeps the recordings of head.trunk
     std::string log;     // a log or a FIFO of lapdmon
 };
 
-// docs/user/fleet.md describes the file.
+// docs/user/fleet-shipping.md describes the file.
 struct ShipConfig {
     NatsOptions nats;
-    std::string stream = siteStream;    // whose filling is watched
+    std::string stream = siteStream;    // the stream whose filling is watched
     std::string state;                  // the folder of places
     std::optional<std::string> redact;  // key file; pseudonyms are sent in place of numbers
-    unsigned leastFree = 10;            // per cent of a disk or a stream; less is said
-    std::string metrics;                // where to listen for those who ask for figures; empty: nowhere
+    unsigned leastFree = 10;            // per cent of a disk or a stream; a line says when less is free
+    std::string metrics;                // the address at which figures are offered; empty: nowhere
     std::vector<ShippedDChannel> dChannels;
 };
 
-// Relative paths are relative to the folder of the file. `redact` is a key file in place of the
-// configuration's, unless it is empty. Throws BadConfig.
+// Reads the file. Relative paths in it are relative to its folder. If `redact` is not empty, it is the key
+// file in place of the one that the configuration names. Throws BadConfig.
 ShipConfig readShipConfig(const std::string& path, const std::string& redact = {});
 
 }  // namespace fleet

@@ -8,7 +8,7 @@ namespace fleet {
 
 class Shipper;
 
-// docs/user/fleet-metrics.md tells what each figure is. Called on the shipper's thread.
+// docs/user/fleet-metrics.md says what each figure means. Called on the shipper's thread.
 std::string metricsOf(const Shipper& shipper);
 
 }  // namespace fleet

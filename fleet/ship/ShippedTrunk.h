@@ -23,26 +23,27 @@ using Say = std::function<void(const std::string&)>;
 
 class ShippedTrunk {
   public:
-    // `number` is the D channel's in the outbox. A place that is damaged is said, and everything is shipped
-    // again. With a key, pseudonyms are shipped in place of numbers.
+    // `number` is the D channel's number in the outbox. Reads the place; if the file is damaged, says so and
+    // ships everything again. With a key, pseudonyms are shipped in place of numbers.
     ShippedTrunk(const ShippedDChannel& dChannel, std::size_t number, const std::string& stateFolder,
                  const redaction::Key* key, Say say);
     ShippedTrunk(const ShippedTrunk&) = delete;
     ShippedTrunk& operator=(const ShippedTrunk&) = delete;
 
-    // Reads some frames and puts them into the outbox. False if there is nothing to read just now, or no
-    // room.
+    // Reads some frames and puts them into the outbox. Returns false if there is nothing more to read just
+    // now, or if the outbox has no room.
     bool step(Outbox& outbox);
-    // Up to here everything is in the stream.
+    // The outbox says that everything up to here is safe.
     void safe(const SafeUpTo& upTo);
-    // Whether something was read that waits for the answers to what was sent before it.
+    // Whether the first event of a new run waits until everything that was sent before it is safe.
     bool isHolding() const { return isHeld_; }
-    // Writes the place down, unless it is written already. False if that fails, which is said once.
+    // Writes the place to its file if it has changed. Returns false if that fails, and says so once.
     bool save();
 
     const std::string& name() const { return name_; }
     std::uint64_t frames() const { return frames_; }
-    // Time of the newest frame read that our side has sent, or received; 0: none.
+    // When the newest frame that our side has sent, or received, was recorded, in nanoseconds since 1970; 0
+    // if none was read.
     std::int64_t newest(bool transmitted) const { return newest_[transmitted ? 1 : 0]; }
     std::uint64_t gaps() const { return gaps_; }
 
@@ -59,7 +60,7 @@ class ShippedTrunk {
     std::string said_;
     Place place_;
     bool isChanged_ = false;
-    bool makesRuns_;  // its runs are known from nothing but the place
+    bool makesRuns_;  // it reads a log, and no recorder numbers its runs
     std::unique_ptr<TrunkInput> input_;
     Packer packer_;
     std::optional<EventRedactor> redactor_;  // hands on to the packer

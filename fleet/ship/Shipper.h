@@ -24,25 +24,26 @@ namespace fleet {
 
 struct ShipperRules {
     OutboxRules outbox;
-    std::chrono::milliseconds betweenPlaces{200};  // how often places are written down
+    std::chrono::milliseconds betweenPlaces{200};  // how often places are written to their files
     std::chrono::milliseconds toFinish{5000};      // how long the end waits for answers
     std::chrono::seconds betweenWatches{30};       // how often disks and the stream are looked at
 };
 
-// Runs on one thread; figures are handed out by another one.
+// Runs on the caller's thread. Another thread hands out the figures (HttpAnswerer).
 class Shipper {
   public:
-    // Throws std::runtime_error if another shipper uses the state's folder, or it cannot be used,
-    // redaction::KeyError for a key that is not there, and BadListenAddress if figures cannot be offered.
+    // Throws std::runtime_error if the state's folder cannot be used or another shipper uses it,
+    // redaction::KeyError if the key is missing, and BadListenAddress if figures cannot be offered.
     Shipper(const ShipConfig& config, const ShipperRules& rules, Say say);
     ~Shipper();
     Shipper(const Shipper&) = delete;
     Shipper& operator=(const Shipper&) = delete;
 
-    // Until `stop` is set, which a signal handler may do. Throws NatsError if the first server that is
-    // reached refuses the credentials; a server that cannot be reached is waited for.
+    // Ships until `stop` is set, which a signal handler may do. Waits for a server that cannot be reached.
+    // Throws NatsError if the first server that is reached refuses the credentials.
     void run(const std::atomic<bool>& stop);
-    // Ships what is there, and returns when all of it is safe and nothing more is to be read.
+    // Ships what is there. Returns when all of it is safe and there is nothing more to read, or when `stop`
+    // is set. Throws as run() does.
     void drain(const std::atomic<bool>& stop);
 
     bool isConnected() const { return connection_ && connection_->isConnected(); }
@@ -50,7 +51,7 @@ class Shipper {
     const OutboxFigures& figures() const { return outbox_.figures(); }
     const Outbox& outbox() const { return outbox_; }
     const DiskWatch& disks() const { return disks_; }
-    // What the site's stream said of itself last; no octets at all if it was not asked.
+    // How full the site's stream was when it was asked last; all zero if it was never asked.
     const StreamFilling& stream() const { return stream_; }
     const std::deque<ShippedTrunk>& trunks() const { return trunks_; }
 

@@ -1,4 +1,4 @@
-// The frames of one D channel as they are recorded, with the numbers that they have for ever.
+// The interface of an input: the frames of one D channel with their runs and numbers, which never change.
 #ifndef FLEET_SHIP_TRUNKINPUT_H
 #define FLEET_SHIP_TRUNKINPUT_H
 
@@ -14,20 +14,20 @@ namespace fleet {
 
 struct InputEvent {
     enum class Kind : std::uint8_t {
-        item,  // `item`: a frame that has `number`, or what the recorder said before the frame with it
-        gap,   // frames that nobody will ever get, those of `gap`
-        end    // the run has ended; frames behind `number` may be missing if `gap` is set
+        item,  // `item` is frame `number`, or what the recorder said before frame `number`
+        gap,   // the frames of `gap` are missing for good
+        end    // the run has ended; if `gap` is set, frames from `number` on may be missing
     };
 
     Kind kind = Kind::item;
     std::uint64_t run = 0;
     std::uint64_t number = 0;
     capture::Item item;  // its views are valid until the next event is asked for
-    bool isOld = false;  // was shipped before; for those who must see what precedes the first new frame
+    bool isOld = false;  // it was shipped before; redaction must see it, and everybody else passes over it
     std::optional<ParcelGap> gap;
 };
 
-// Whether it is a frame that has a number of its own.
+// Whether the item is a frame with a number of its own: a whole one, or one that is too long.
 inline bool isNumbered(const capture::Item& item) {
     return item.isFrame() || item.kind == capture::Item::Kind::oversized;
 }
@@ -39,10 +39,10 @@ class TrunkInput {
     TrunkInput& operator=(const TrunkInput&) = delete;
     virtual ~TrunkInput() = default;
 
-    // False if there is nothing just now. Frames come once each, in the order of their numbers, runs in the
-    // order of time. Throws capture::BadInput for an input that cannot be read now; it may be asked again.
+    // Gives the next event; returns false if there is none just now. Each frame comes once, in the order of
+    // runs and numbers. Throws capture::BadInput if the input cannot be read now; the caller may try again.
     virtual bool next(InputEvent& event) = 0;
-    // The log of the run that is read now, if it is one that can be read a second time.
+    // The log from which the present run is read, if it is a file that can be read a second time.
     virtual const std::optional<recording::RecordedLog>& log() const = 0;
 };
 

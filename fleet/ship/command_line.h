@@ -24,22 +24,22 @@ class BadShipCommand : public std::runtime_error {
 
 struct ShipCommand {
     enum class What : std::uint8_t {
-        ship,    // until a signal ends it
-        once,    // what is there, and then no more
-        streams  // makes streams
+        ship,    // ships until a signal ends it
+        once,    // ships what is there and ends
+        streams  // makes streams and ends
     };
 
-    std::string told;  // help or version: print it and end
+    std::string told;  // if not empty: the text of --help or --version, to be printed before the program ends
     What what = What::ship;
     std::string config;
-    std::string redact;                // a key file, in place of the configuration's
+    std::string redact;                // key file in place of the configuration's; may be empty
     std::vector<StreamRules> streams;  // to make
 };
 
 // Throws BadShipCommand.
 ShipCommand parseShipCommand(int argc, const char* const* argv);
 
-// For manual pages and completion: the parser as it describes itself.
+// Calls `visit` with the parser, from whose options manual pages and completion are made.
 void showShipDescription(const std::function<void(const CLI::App&)>& visit);
 
 }  // namespace fleet

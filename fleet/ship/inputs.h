@@ -1,4 +1,4 @@
-// Recordings and logs, opened.
+// Opens recordings and logs.
 #ifndef FLEET_SHIP_INPUTS_H
 #define FLEET_SHIP_INPUTS_H
 
@@ -11,8 +11,8 @@ namespace fleet {
 
 enum class Manner : std::uint8_t { readOnce, follow };
 
-// An input of any form that a recorder writes. `trunk` names its D channel, in place of what it says itself,
-// unless it is empty. Throws capture::BadInput.
+// Opens an input of any form that a recorder writes. If `trunk` is not empty, it is the D channel's name in
+// place of the one that the input gives. Throws capture::BadInput.
 std::unique_ptr<capture::Reader> openInput(const std::string& path, Manner manner,
                                            const std::string& trunk = {});
 

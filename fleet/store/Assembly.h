@@ -18,28 +18,30 @@
 
 namespace fleet {
 
-// Rows that a transaction has yet to write.
+// The rows that the transaction has to write next.
 struct Results {
     std::vector<CallRow> calls;
     std::vector<FindingRow> findings;
     std::map<int, Outcomes> outcomes;  // by trunk, to be counted once the rows are written
 };
 
-// Reads frames in the order of their numbers, as far as none is missing, and hands them to the analysis that
-// `lapdread calls` and `check` use. Whatever happened to its process, the rows are those of one reading of
-// the whole run: a new Assembly first reads again what the one before it has read, and writes nothing while
-// it does. Valid as long as every transaction that it was used in is committed. Used by one thread at a time.
+// Reads the frames of a run in the order of their numbers, up to the first that is missing, and hands them to
+// the analysis that `lapdread calls` and `check` use. The rows are always those of one reading of the whole
+// run, also when the program was started again meanwhile: a new Assembly reads the run from its beginning,
+// and gives no rows for frames that an earlier one has assembled. If a transaction in which an Assembly was
+// used is not committed, destroy the Assembly and make a new one. Used by one thread at a time.
 class Assembly : private calls::Listener {
   public:
     Assembly(const RunKey& key, std::string trunkName, std::string place);
 
-    // A frame of this day has come in since advance() read last. Days that were not told are not looked at,
-    // but for the first time.
+    // Says that a frame of this day ("2026-11-21") was stored since the last advance(). The first advance()
+    // reads frames of all days, later ones only frames of the days that were named here, or later days.
     void expect(const std::string& day);
-    // Takes what can be taken now, and notes in lapd.runs how far it came.
+    // Reads and analyses the frames that can be read now, adds rows to `results`, and notes in lapd.runs how
+    // far it came. Throws pqxx::failure.
     void advance(pqxx::transaction_base& work, Results& results);
 
-    // The run has ended and nothing of it will change.
+    // Whether the run has ended and all of it is assembled, so that nothing of it will change.
     bool isFinished() const { return isFinished_; }
     // The number of the first frame that is missing, while there are later ones.
     std::optional<std::uint64_t> hole() const { return hole_; }

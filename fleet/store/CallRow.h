@@ -20,14 +20,15 @@ struct RunKey {
     auto operator<=>(const RunKey&) const = default;
 };
 
-// A row is replaced as its call goes on.
+// The row of a call. It replaces the earlier row of the same call.
 using CallRow = Row<35>;
 const StagedTable<std::tuple_size_v<CallRow>>& callsTable();
 CallRow rowOf(const RunKey& run, const calls::Call& call);
 
 using FindingRow = Row<10>;
 const StagedTable<std::tuple_size_v<FindingRow>>& findingsTable();
-// `ordinal` tells findings of one kind at one frame apart; `firstFrame` is of the call that it is about.
+// `ordinal` distinguishes findings of one kind at one frame. `firstFrame` is the first frame of the call that
+// the finding is about; nothing if it is about none.
 FindingRow rowOf(const RunKey& run, const calls::Finding& finding, std::uint32_t ordinal,
                  std::optional<std::uint64_t> firstFrame);
 

@@ -1,4 +1,4 @@
-// Rows into a table through COPY, by way of a staging table, so that rows that are there already are passed
+// Writes rows into a table through COPY and a staging table, so that rows which are there already are passed
 // over or replaced.
 #ifndef FLEET_STORE_COPYINTO_H
 #define FLEET_STORE_COPYINTO_H
@@ -13,17 +13,19 @@
 
 namespace fleet {
 
-// A table of the schema with a staging table beside it, which lives as long as the connection and is empty
-// between transactions.
+// A table of the schema, and its staging table, which exists as long as the connection and is empty between
+// transactions.
 template <std::size_t width>
 struct StagedTable {
     std::string name;                        // without the schema
     std::array<std::string, width> columns;  // of the rows
     std::string onConflict;                  // "DO NOTHING", "(key) DO UPDATE SET ..."
 
-    // Before any transaction of the connection. Throws pqxx::failure.
+    // Makes the staging table. Call this once for each connection, outside a transaction. Throws
+    // pqxx::failure.
     void prepare(pqxx::connection_base& connection) const;
-    // Once a transaction at most. Returns how many rows were put in or replaced. Throws pqxx::failure.
+    // Writes the rows. Call this at most once in a transaction. Returns how many rows were added or replaced.
+    // Throws pqxx::failure.
     std::size_t put(pqxx::transaction_base& work, const std::vector<Row<width>>& rows) const;
 };
 

@@ -13,14 +13,15 @@
 
 namespace fleet {
 
-// What calls and findings of a D channel come to.
+// Counts of the calls and findings of a D channel, and the state of its link.
 struct Outcomes {
-    std::uint64_t calls = 0;                             // that have ended
-    std::map<std::optional<int>, std::uint64_t> failed;  // of them, by cause; without one: none was given
+    std::uint64_t calls = 0;  // that have ended
+    // Of these, calls that failed, by cause. The key is empty for calls without a cause.
+    std::map<std::optional<int>, std::uint64_t> failed;
     std::map<std::string_view, std::uint64_t> findings;  // by kind
     std::optional<bool> isLinkUp;                        // SAPI 0, TEI 0; nothing while it is not known
 
-    // Adds up what is counted, and takes the newer state of the link.
+    // Adds the counts of `more`, and takes its state of the link if it has one.
     void add(const Outcomes& more);
 };
 
@@ -30,46 +31,47 @@ struct TrunkFigures {
     std::string address;
     std::string name;
     std::string group;                     // NFAS, or empty
-    std::uint64_t frames = 0;              // that came, also again
+    std::uint64_t frames = 0;              // frames that came; one that came twice counts twice
     std::uint64_t gaps = 0;                // how often frames are missing for good
     std::array<std::int64_t, 2> newest{};  // of frames received and sent: nanoseconds since 1970, or 0
     Outcomes outcomes;
 
-    // Adds up what is counted, and takes what is newer of the rest.
+    // Adds the counts of `more`, and takes the newer of all other values.
     void add(const TrunkFigures& more);
 };
 
-// Of one partition since it was leased.
+// Figures of one partition since it was leased. A letter is a message of the stream (Inbox.h).
 struct PartitionFigures {
-    std::uint64_t frames = 0;   // rows that are new
-    std::uint64_t doubles = 0;  // frames that were there already
-    std::uint64_t calls = 0;    // rows written, also again
+    std::uint64_t frames = 0;   // frames that were stored
+    std::uint64_t doubles = 0;  // frames that were dropped because the store had them
+    std::uint64_t calls = 0;    // rows written; one that is replaced counts again
     std::uint64_t findings = 0;
     std::uint64_t deadLetters = 0;
-    std::uint64_t holes = 0;               // runs that wait for a frame, just now
+    std::uint64_t holes = 0;               // runs that wait for a frame now
     std::int64_t lag = 0;                  // how long the newest letters waited in the stream, nanoseconds
-    std::optional<std::uint64_t> waiting;  // letters in the stream
+    std::optional<std::uint64_t> waiting;  // letters that wait in the stream; empty if it was not asked yet
     std::map<std::string, TrunkFigures> trunks;  // by address
 };
 
-// What is known of the engines, besides.
+// Figures of PostgreSQL and of the stream.
 struct EngineFigures {
     std::uint64_t databaseOctets = 0;
     std::uint64_t streamOctets = 0;
     std::uint64_t mostStreamOctets = 0;  // 0: no limit
 };
 
-// The newest figures of all that this lapdstore does. Used by any threads.
+// The newest figures of all workers of this lapdstore. Any thread may call any function; a lock guards the
+// figures.
 class StoreFigures {
   public:
     void set(unsigned partition, const PartitionFigures& figures);
     void setEngines(const EngineFigures& figures);
-    // The partition is leased no more; its figures are those of somebody else now.
+    // The partition is not leased any more. Drops its figures, which another lapdstore may give from now on.
     void release(unsigned partition);
-    // A worker has gone round; `worker` numbers them. False: it has no connections.
+    // The worker with this number has gone through its partitions once, or has no connections.
     void turned(unsigned worker, bool isConnected);
 
-    // docs/user/fleet-metrics.md tells what each figure is.
+    // docs/user/fleet-metrics.md says what each figure means.
     std::string text() const;
 
   private:

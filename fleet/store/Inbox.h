@@ -1,4 +1,5 @@
-// Where parcels come from, as the store sees it: a queue that keeps them until they are acknowledged.
+// The interface through which the store takes parcels: a queue that keeps messages until they are
+// acknowledged.
 #ifndef FLEET_STORE_INBOX_H
 #define FLEET_STORE_INBOX_H
 
@@ -10,7 +11,7 @@
 
 namespace fleet {
 
-// A message of the stream, whatever it holds.
+// A message of the stream. Its text may be a parcel or anything else.
 struct Letter {
     std::string subject;
     std::string text;
@@ -24,8 +25,8 @@ struct DeadLetter {
     std::string reason;  // one line of printable ASCII
 };
 
-// The letters of one partition. Used by one thread at a time. Every function throws what its transport
-// throws; letters that were fetched and not acknowledged come again, at once or later.
+// Gives the letters of one partition. Letters that were fetched and not acknowledged come again, with the
+// next fetch or later. Every function throws what its transport throws. Used by one thread at a time.
 class Inbox {
   public:
     Inbox() = default;
@@ -33,11 +34,12 @@ class Inbox {
     Inbox& operator=(const Inbox&) = delete;
     virtual ~Inbox() = default;
 
-    // At most `most` letters, in the order of the stream; none if none comes within the time.
+    // Returns at most `most` letters in the order of the stream; none if none comes within `wait`.
     virtual std::vector<Letter> fetch(std::size_t most, std::chrono::milliseconds wait) = 0;
-    // Puts it where dead letters are kept, and returns when it is there. May be told of one letter twice.
+    // Puts a letter where dead letters are kept, and returns when it is there. May be called twice for one
+    // letter.
     virtual void bury(const DeadLetter& dead) = 0;
-    // All letters of the last fetch need not come again.
+    // Acknowledges all letters of the last fetch, so that they do not come again.
     virtual void acknowledge() = 0;
 };
 

@@ -1,4 +1,4 @@
-// The right to write a partition: one lapdstore has it at a time.
+// The right to write a partition. Only one lapdstore has it at a time.
 #ifndef FLEET_STORE_LEASE_H
 #define FLEET_STORE_LEASE_H
 
@@ -6,11 +6,12 @@
 
 namespace fleet {
 
-// An advisory lock of the database. It ends with the connection, however that ends; so what is written
-// through this connection is written by whoever has the lease. The connection must outlive it.
+// An advisory lock of the database, held by a connection until this object is destroyed or the connection
+// ends in any way. So write the partition only through this connection: no other lapdstore can then have the
+// lease at the same time. The connection must outlive this object.
 class Lease {
   public:
-    // Does not wait. Throws pqxx::failure.
+    // Tries to take the lease and does not wait; isHeld() says whether it has it. Throws pqxx::failure.
     Lease(pqxx::connection_base& connection, unsigned partition);
     ~Lease();
     Lease(const Lease&) = delete;

@@ -15,14 +15,14 @@ struct Migration {
     std::string_view sql;
 };
 
-// In order. They are the files of fleet/store/migrations, built in.
+// All steps in their order. The build makes them from the files in fleet/store/migrations.
 std::span<const Migration> migrations();
 
 // The highest version that has been applied; 0 for an empty database. Throws pqxx::sql_error.
 int schemaVersion(pqxx::transaction_base& work);
 
-// Applies those that are missing, all in one transaction, and returns their names. Two that run at once wait
-// for each other. Throws pqxx::sql_error; nothing has changed then.
+// Applies the missing steps in one transaction and returns their names. If two programs migrate at once, the
+// second waits for the first. Throws pqxx::sql_error; then nothing has changed.
 std::vector<std::string_view> migrate(pqxx::connection_base& connection);
 
 }  // namespace fleet

@@ -1,4 +1,4 @@
-// The letters of one partition out of JetStream.
+// An Inbox over NATS JetStream.
 #ifndef FLEET_STORE_NATSINBOX_H
 #define FLEET_STORE_NATSINBOX_H
 
@@ -9,8 +9,9 @@
 
 namespace fleet {
 
-// A durable consumer of the centre's stream, "lapdstore-17". Letters that were fetched and not acknowledged
-// are given again by the next fetch. Throws NatsError. The connection outlives it.
+// Uses the durable consumer "lapdstore-17" of the centre's stream for partition 17. Letters that this object
+// has fetched and not acknowledged come again with the next fetch; if the object is destroyed before, they
+// come again after `againAfter`. Throws NatsError. The connection must outlive this object.
 class NatsInbox : public Inbox {
   public:
     NatsInbox(NatsConnection& connection, unsigned partition, std::chrono::seconds againAfter);

@@ -1,4 +1,4 @@
-// One partition of the stream, written into the store.
+// Writes the letters of one partition into the database.
 #ifndef FLEET_STORE_PARTITION_H
 #define FLEET_STORE_PARTITION_H
 
@@ -19,26 +19,26 @@
 
 namespace fleet {
 
-// Called at each step of a transaction and behind it, by name: "copied", "assembled", "written", "committed",
-// "buried", "acknowledged". Tests throw from it.
+// Is called with the name of each step in a transaction and after it: "copied", "assembled", "written",
+// "committed", "buried", "acknowledged". Tests throw from it.
 using Steps = std::function<void(std::string_view step)>;
 
-// Nobody else writes this partition: see Lease. After an exception it can be used again while its connection
-// lives. Used by one thread at a time.
+// The caller holds the partition's Lease, so nobody else writes this partition. After an exception the object
+// can be used again if its connection still works. Used by one thread at a time.
 class Partition {
   public:
-    // Makes the connection ready for writing. Throws pqxx::failure.
+    // Makes the connection ready for writing. The connection must outlive this object. Throws pqxx::failure.
     Partition(
         pqxx::connection_base& connection, unsigned partition, Steps steps = [](std::string_view) {});
 
-    // Writes the frames of the letters, the calls and findings that they complete, and the place in the
-    // stream, in one transaction. Letters that are no parcels of this partition, or that the database does
-    // not take, are the result; they are in the table of dead letters. Throws pqxx::failure.
+    // Writes the frames of the letters, the calls and findings that are made of them, and the place in the
+    // stream, in one transaction. Returns the letters that are no parcels of this partition or that the
+    // database refuses, after it has added them to the table of dead letters. Throws pqxx::failure.
     std::vector<DeadLetter> take(std::span<const Letter> letters);
 
-    // Of what was committed.
+    // Figures of what was committed.
     const PartitionFigures& figures() const { return figures_; }
-    // For those who watch: how many letters wait in the stream; and that none came when some were asked for.
+    // The caller says, for the figures, how many letters wait in the stream, or that a fetch gave none.
     void sawWaiting(std::uint64_t letters) { figures_.waiting = letters; }
     void sawNone() { figures_.lag = 0; }
 
@@ -48,7 +48,7 @@ class Partition {
         std::string name;
         std::string address;
     };
-    // What one transaction is about.
+    // What one transaction has read and has to write.
     struct Work;
 
     void store(std::span<const Letter> letters, std::vector<DeadLetter>& dead);
@@ -71,7 +71,8 @@ class Partition {
     std::map<RunKey, std::unique_ptr<Assembly>> runs_;  // that have not finished
 };
 
-// Fetches once, stores, buries, acknowledges. Returns how many letters there were.
+// Fetches letters once, stores them, buries those that cannot be stored, and acknowledges all. Returns how
+// many there were. Throws what the inbox and the partition throw.
 std::size_t moveOnce(Inbox& inbox, Partition& partition, std::chrono::milliseconds wait, const Steps& steps);
 
 }  // namespace fleet

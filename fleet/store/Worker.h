@@ -16,18 +16,18 @@ namespace fleet {
 struct WorkerOptions {
     std::string database;  // a URL for libpq
     NatsOptions nats;
-    std::vector<unsigned> partitions;  // those that this thread looks after, as far as it can lease them
-    std::chrono::seconds againAfter;   // what a dead lapdstore has fetched comes again after this time
-    StoreFigures* figures = nullptr;   // where to tell what is done; outlives the worker
-    unsigned number = 0;               // of the thread, there
+    std::vector<unsigned> partitions;  // the partitions that this thread tries to lease
+    std::chrono::seconds againAfter;   // letters that a dead lapdstore had fetched come again after this time
+    StoreFigures* figures = nullptr;   // gets the figures unless it is null; must outlive the worker
+    unsigned number = 0;               // this thread's number in the figures
 };
 
 // Says a line about what went wrong or went well. Called on the worker's thread.
 using Say = std::function<void(const std::string& line)>;
 
-// Works until `stopped`, with a connection to each of the two engines. If one of them is lost, or refuses, it
-// says so and begins anew a second later. Partitions that another lapdstore has leased are tried every two
-// seconds.
+// Works until `stopped` is set, with a connection to PostgreSQL and one to NATS. If one of them fails, says
+// so, gives all leases back and connects again a second later. If only the stream refuses one partition,
+// gives back that one. Tries every two seconds to lease the partitions that it does not have.
 void work(const WorkerOptions& options, const std::atomic<bool>& stopped, const Say& say);
 
 }  // namespace fleet

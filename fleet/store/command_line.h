@@ -22,19 +22,19 @@ class BadStoreCommand : public std::runtime_error {
 
 struct StoreCommand {
     enum class What : std::uint8_t {
-        run,      // until a signal ends it
+        run,      // stores parcels until a signal ends it
         migrate,  // makes the tables, or brings them up to date
-        forget    // what is older than `days`
+        forget    // deletes what is older than `days`
     };
 
-    std::string told;  // help or version: print it and end
+    std::string told;  // if not empty: the text of --help or --version, to be printed before the program ends
     What what = What::run;
     std::string database;
     NatsOptions nats;
     unsigned threads = 2;
     unsigned firstPartition = 0;
     unsigned lastPartition = 63;
-    std::string metrics;       // where to listen for those who ask for figures; empty: nowhere
+    std::string metrics;       // the address at which figures are offered; empty: nowhere
     unsigned againAfter = 30;  // seconds
     unsigned days = 0;
 };
@@ -42,7 +42,7 @@ struct StoreCommand {
 // Throws BadStoreCommand.
 StoreCommand parseStoreCommand(int argc, const char* const* argv);
 
-// For manual pages and completion: the parser as it describes itself.
+// Calls `visit` with the parser, from whose options manual pages and completion are made.
 void showStoreDescription(const std::function<void(const CLI::App&)>& visit);
 
 }  // namespace fleet
