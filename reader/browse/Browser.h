@@ -1,4 +1,4 @@
-// The program without its terminal: screens in front of each other, and what they have in common.
+// `lapdread browse` without its terminal: the screens, of which one is in front, and what they share.
 #ifndef READER_BROWSE_BROWSER_H
 #define READER_BROWSE_BROWSER_H
 
@@ -16,18 +16,20 @@ namespace reader::browse {
 class Browser : public Desk {
   public:
     struct Settings {
-        std::string source;  // what is read, for the first line
+        std::string source;  // the input's name, for the first line
         bool utf8 = false;
         std::size_t mostItems = FrameStore::usualMost;
-        // Begins to write frames of the store; what came of it is told by say().
+        // Begins to write frames of the store to a file. Whoever sets this calls say() with the result.
         std::function<void(const FrameStore&, SaveOrder)> save = [](const FrameStore&, const SaveOrder&) {};
     };
 
     explicit Browser(Settings settings);
 
+    // Takes over what the reading thread has found, and tells the screens what has changed.
     void apply(Update update);
     void press(Key key);
-    // Goes on with long work. True if there is more to do.
+    // Goes on with work that takes long, such as filtering, at most until this time. Returns true if there is
+    // more to do.
     bool work(Screen::Clock::time_point until);
     void draw(Canvas& canvas);
     bool isDone() const { return isDone_; }

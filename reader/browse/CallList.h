@@ -1,4 +1,4 @@
-// The calls that a filter lets through, in an order.
+// The calls that pass a filter, sorted.
 #ifndef READER_BROWSE_CALLLIST_H
 #define READER_BROWSE_CALLLIST_H
 
@@ -14,13 +14,14 @@
 
 namespace reader::browse {
 
-// Works in pieces: with very many calls the list fills little by little.
+// Looks at the calls a few at a time, in work(), so that keys are answered while a long list fills.
 class CallList {
   public:
     explicit CallList(Desk& desk) : desk_(desk) {}
 
-    // Words that a call's line must hold, whatever their case; "!" in front of one: must not hold. Some words
-    // ask for more than the line: "failed", "unanswered", "open", "marked".
+    // Sets the filter: words that a call's line must hold, in capitals or small letters. A word after "!"
+    // must not be in the line. Four words ask about the call itself: "failed", "unanswered", "open",
+    // "marked".
     void setFilter(const std::string& words);
     const std::string& filter() const { return filter_; }
     // An index into callOrders().
@@ -28,7 +29,7 @@ class CallList {
     std::size_t order() const { return order_; }
 
     void changed(const Changes& changes);
-    // Looks at calls that have not been looked at yet. True if there are more.
+    // Looks at calls that were not looked at yet, at most until this time. Returns true if there are more.
     bool work(Screen::Clock::time_point until);
 
     std::size_t size() const { return shown_.size(); }

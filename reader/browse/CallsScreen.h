@@ -1,4 +1,4 @@
-// A line a call, as `lapdread calls` has it.
+// The list of calls: one line for each, as `lapdread calls` prints it.
 #ifndef READER_BROWSE_CALLSSCREEN_H
 #define READER_BROWSE_CALLSSCREEN_H
 
@@ -26,7 +26,7 @@ class CallsScreen : public Screen {
     void changed(const Changes& changes) override;
     bool work(Clock::time_point until) override;
 
-    // Puts the cursor on a call, without a filter if that would hide it.
+    // Puts the cursor on a call. Removes the filter if it hides the call.
     void goTo(std::uint64_t call);
 
   private:
@@ -40,8 +40,8 @@ class CallsScreen : public Screen {
 
     CallList list_;
     Cursor cursor_;
-    // The call that the cursor is on, whatever comes or goes around it; at the end of the list the cursor
-    // goes on to calls that come.
+    // The number of the call that the cursor is on. The cursor stays on it when other calls come or go. If
+    // followsEnd_ is set, the cursor is on the last line and moves to each new last call.
     std::uint64_t current_ = 0;
     bool followsEnd_ = false;
     LineInput input_;

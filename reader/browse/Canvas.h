@@ -10,8 +10,8 @@
 
 namespace reader::browse {
 
-// What a character is about. A terminal without colours shows them alike: whatever matters is also told by
-// words or signs.
+// The meaning of a character, shown by its colour. A terminal without colours shows all of them alike, so
+// words or signs must say the same.
 enum class Ink : std::uint8_t { plain, ours, theirs, error, warning, note, title, faint };
 
 struct Style {
@@ -32,7 +32,7 @@ struct Area {
     int x = 0, y = 0, width = 0, height = 0;
 };
 
-// Nothing that is put can be a control character, and nothing stands outside.
+// Holds no control characters. Whatever is put outside is cut off.
 class Canvas {
   public:
     Canvas(int width, int height);
@@ -42,13 +42,13 @@ class Canvas {
     Area whole() const { return {0, 0, width_, height_}; }
     const Cell& at(int x, int y) const { return cells_[index(x, y)]; }
 
-    // Puts UTF-8 text from a column on, in columns before `end` only. Returns the column behind it. What
-    // cannot be printed is shown as "?".
+    // Puts UTF-8 text from column `x` on, as far as it fits before column `end`. Returns the column after the
+    // text. A character that cannot be printed is shown as "?".
     int put(int x, int y, std::string_view text, Style style, int end);
     int put(int x, int y, std::string_view text, Style style = {}) { return put(x, y, text, style, width_); }
-    // Blanks in `style`.
+    // Fills the area with blanks of this style.
     void fill(const Area& area, Style style = {});
-    // What stands there already takes this style.
+    // Gives this style to the characters that are in the area.
     void paint(const Area& area, Style style);
 
     // A line as UTF-8, without the blanks at its end.

@@ -1,4 +1,4 @@
-// Makes updates of a run: the thread that reads works for it.
+// Collects what is found out about the input, and hands it in updates to the thread that shows it.
 #ifndef READER_BROWSE_COLLECTOR_H
 #define READER_BROWSE_COLLECTOR_H
 
@@ -18,16 +18,16 @@
 
 namespace reader::browse {
 
-// Calls and findings are those that `calls` and `check` would show with the same options; items are all that
-// are read. Names that pages refer to live here. Used by the thread that reads; it throws UpdateQueue::Closed
-// where the queue is closed.
+// Gives all items, and those calls and findings that `calls` and `check` show with the same options. Owns the
+// names of D channels and files to which pages refer, so it must outlive all pages. Used by the thread that
+// reads. Its functions throw UpdateQueue::Closed once the queue is closed.
 class Collector : public Analysed {
   public:
     Collector(const Options& options, UpdateQueue& queue);
 
     bool countsItself() const override { return true; }
     void flush() override;
-    // The input has ended, or cannot be read any further: `error` says why.
+    // The input has ended, or cannot be read any further; `error` then says why. Hands the last update over.
     void finish(const std::string& error);
 
   private:
@@ -59,9 +59,9 @@ class Collector : public Analysed {
     const capture::Interface* known(const capture::Interface* interface);
     std::string_view known(std::string_view file);
 
-    // An update holds no more items.
+    // The most items of an update.
     static constexpr std::size_t mostItems = 512;
-    // Screens show trunks no fresher than this.
+    // The shortest time between two updates with the state of the trunks, while frames come.
     static constexpr std::chrono::milliseconds trunkInterval{100};
 
     UpdateQueue& queue_;
@@ -72,7 +72,7 @@ class Collector : public Analysed {
     std::set<std::string, std::less<>> files_;
     std::shared_ptr<Page> page_;
     Update update_;
-    std::set<std::uint64_t> touched_;  // calls that are alive, and have changed
+    std::set<std::uint64_t> touched_;  // numbers of open calls that have changed since the last update
     std::uint64_t newestCall_ = 0;
     bool hasChanged_ = true;
     HostClock::time_point trunksAt_{};

@@ -1,4 +1,4 @@
-// Where one looks in a list, and which part of it is shown.
+// The line of a list that the cursor is on, and the part of the list that is shown.
 #ifndef READER_BROWSE_CURSOR_H
 #define READER_BROWSE_CURSOR_H
 
@@ -10,9 +10,10 @@ namespace reader::browse {
 
 class Cursor {
   public:
-    // The list has so many lines, of which `height` are shown. Keeps the cursor in it, and in sight.
+    // Says how many lines the list has, and that `height` of them are shown. Moves the cursor into the list,
+    // and the part that is shown to the cursor.
     void fit(std::size_t lines, int height);
-    // True if the key moves a cursor.
+    // Moves the cursor. Returns false if the key moves no cursor.
     bool press(const Key& key);
     void moveTo(std::size_t line) { line_ = line; }
 

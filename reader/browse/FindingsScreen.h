@@ -1,4 +1,4 @@
-// What `lapdread check` finds; each finding leads to its frame.
+// The list of findings, as `lapdread check` reports them. Enter on a finding opens its frame.
 #ifndef READER_BROWSE_FINDINGSSCREEN_H
 #define READER_BROWSE_FINDINGSSCREEN_H
 

@@ -1,4 +1,4 @@
-// The newest items of the input, for as long as there is room.
+// Keeps the newest items of the input, up to a number of them.
 #ifndef READER_BROWSE_FRAMESTORE_H
 #define READER_BROWSE_FRAMESTORE_H
 
@@ -12,20 +12,20 @@
 
 namespace reader::browse {
 
-// Items have places, which count from 0 over the whole input. Used on one thread; copies of it share the
-// pages, and may be used on another.
+// The place of an item is its number in the whole input, counted from 0. Used on one thread. A copy shares
+// the pages, which never change, so another thread may use it.
 class FrameStore {
   public:
     static constexpr std::size_t usualMost = 1'000'000;
 
     explicit FrameStore(std::size_t most = usualMost) : most_(most) {}
 
-    // Lets the oldest items go if there are too many.
+    // Adds the items of a page, and drops the oldest pages that are not needed to keep `most` items.
     void add(std::shared_ptr<const Page> page);
 
     std::uint64_t begin() const { return pages_.empty() ? end_ : pages_.front().begin; }
     std::uint64_t end() const { return end_; }
-    // Items that were let go.
+    // How many items were dropped.
     std::uint64_t gone() const { return begin(); }
     // The number of the oldest frame that is kept; 0 if nothing is.
     std::uint64_t firstNumber() const { return pages_.empty() ? 0 : pages_.front().page->number(0); }
@@ -33,11 +33,12 @@ class FrameStore {
         return pages_.empty() ? 0 : pages_.back().page->number(pages_.back().page->size() - 1);
     }
 
-    // False if it is not there.
+    // Makes `to` the item at this place. Returns false if it is not kept.
     bool load(std::uint64_t place, Shown& to) const;
-    // The place of a frame; nothing if it is not there.
+    // The place of the frame with this number; nothing if it is not kept.
     std::optional<std::uint64_t> placeOf(std::uint64_t number) const;
-    // Places in [from, to) of what tells of links, in order; the last `most` of them.
+    // The places in [from, to) of items for which Page::tellsOfLink is true, in order; the last `most` of
+    // them.
     std::vector<std::uint64_t> tellingOfLinks(std::uint64_t from, std::uint64_t to, std::size_t most) const;
 
   private:
@@ -48,12 +49,12 @@ class FrameStore {
 
     const Part* partOf(std::uint64_t place) const;
 
-    // A page that is smaller takes in the next ones.
+    // Pages are joined as long as they have no more items together.
     static constexpr std::size_t smallPage = 512;
 
     std::size_t most_;
     std::deque<Part> pages_;
-    std::deque<std::uint64_t> links_;  // places of what tells of links
+    std::deque<std::uint64_t> links_;  // places of items for which tellsOfLink is true
     std::uint64_t end_ = 0;
 };
 

@@ -1,4 +1,4 @@
-// What the keys do, of the screen that it was called from and everywhere.
+// Explains the keys of the screen from which it was opened, and the keys that work on every screen.
 #ifndef READER_BROWSE_HELPSCREEN_H
 #define READER_BROWSE_HELPSCREEN_H
 

@@ -1,4 +1,4 @@
-// What the user does: a key, or the mouse.
+// A key that the user pressed, or what the mouse did.
 #ifndef READER_BROWSE_KEY_H
 #define READER_BROWSE_KEY_H
 

@@ -1,4 +1,4 @@
-// The messages of a call, or of several, as arrows between both sides.
+// The ladder of a call, or of several: their messages as arrows between both sides.
 #ifndef READER_BROWSE_LADDERSCREEN_H
 #define READER_BROWSE_LADDERSCREEN_H
 

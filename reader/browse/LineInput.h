@@ -8,7 +8,7 @@
 
 namespace reader::browse {
 
-// The cursor stands at the end. Printable ASCII only.
+// Holds printable ASCII only. The cursor is always at the end.
 class LineInput {
   public:
     const std::string& text() const { return text_; }

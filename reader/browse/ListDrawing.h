@@ -1,4 +1,4 @@
-// Pieces that lists are drawn with.
+// Draws the parts that all lists have.
 #ifndef READER_BROWSE_LISTDRAWING_H
 #define READER_BROWSE_LISTDRAWING_H
 
@@ -15,8 +15,9 @@ namespace reader::browse {
 inline constexpr int gutter = 2;
 void drawGutter(Canvas& canvas, const Area& area, int line, bool isCurrent, bool isMarked);
 
-// Lines of text at the foot of an area, below a rule; returns what is left above. Nothing is drawn where the
-// area has not got `least` lines besides.
+// Draws a rule and up to `most` lines of text below it at the foot of an area, where `most` lines are always
+// taken. Returns the area above. If fewer than `least` lines would be left there, draws nothing and returns
+// the whole area.
 Area drawDetails(Canvas& canvas, const Area& area, const std::vector<std::string>& lines, int most, int least,
                  bool utf8);
 

@@ -1,5 +1,5 @@
-// A frame: its fields in words beside its octets, those of the field under the cursor lit. A segment has the
-// message that it belongs to below it, with the octets of that.
+// A frame: its fields in words beside its octets, of which those of the field under the cursor are in
+// brackets. Below a segment it shows the message that the segment belongs to, with that message's octets.
 #ifndef READER_BROWSE_MESSAGESCREEN_H
 #define READER_BROWSE_MESSAGESCREEN_H
 
@@ -15,7 +15,7 @@ namespace reader::browse {
 
 class MessageScreen : public Screen {
   public:
-    // `frames` are those that "next" and "previous" lead to; empty: all.
+    // The keys for the next and the previous frame go through `frames`; if it is empty, through all frames.
     MessageScreen(Desk& desk, std::uint64_t frame, std::vector<std::uint64_t> frames);
 
     std::string title() const override;
@@ -27,10 +27,10 @@ class MessageScreen : public Screen {
     // A field, or a heading.
     struct Row {
         std::string text{};
-        std::vector<std::string> words{};  // the whole of it, where it stands, and the clause
-        std::size_t begin = 0;
-        std::size_t size = 0;   // octets of the block; 0: none
-        std::size_t block = 0;  // which of blocks_ it stands in
+        std::vector<std::string> words{};  // the whole field, its place in the octets, and the clause
+        std::size_t begin = 0;             // its first octet in the block
+        std::size_t size = 0;              // how many octets it has in the block; 0: none
+        std::size_t block = 0;             // which of blocks_ holds it
         Style style{};
     };
     class Rows;

@@ -1,4 +1,4 @@
-// Items of the input as they are kept for looking at: their octets and what was found out about them.
+// Items of the input as they are kept in memory: their octets, and what was found out about them.
 #ifndef READER_BROWSE_PAGE_H
 #define READER_BROWSE_PAGE_H
 
@@ -15,7 +15,7 @@ namespace reader::browse {
 
 class Page;
 
-// An item with copies of all that it refers to, as a page gives it.
+// An item that was loaded from a page, with everything that it refers to. Keeps the page alive.
 class Shown {
   public:
     Shown() = default;
@@ -32,31 +32,31 @@ class Shown {
     std::shared_ptr<const Page> page_;
 };
 
-// Some items that follow each other. Filled on one thread; nobody changes it once it is shared. Names of D
-// channels and files stay whoever handed them in's, who keeps them for as long as any page lives.
+// Consecutive items. One thread fills a page, and nobody changes it once it is shared. A page refers to names
+// of D channels and files and does not own them; the caller of add() keeps them as long as any page exists.
 class Page {
   public:
     // `last` is the number of the frame before the first item.
     explicit Page(std::uint64_t last = 0) : last_(last) {}
 
-    // The headers of the item have been read.
+    // Copies an item whose headers have been read.
     void add(const Seen& seen, const capture::Interface* interface, std::string_view file);
-    // All items of another page.
+    // Copies all items of another page.
     void append(const Page& other);
 
     bool empty() const { return kept_.empty(); }
     std::size_t size() const { return kept_.size(); }
-    // Of a frame its number, of another item that of the frame before it.
+    // The number of a frame; for an item that is no frame, the number of the frame before it.
     std::uint64_t number(std::size_t item) const { return kept_[item].number; }
-    // Of the last frame, or of that before the first item.
+    // The number of the last frame; if there is none, of the frame before the first item.
     std::uint64_t lastNumber() const { return last_; }
     bool hasNumber(std::size_t item) const { return kept_[item].isNumbered; }
-    // A frame that sets a link up, ends it or asks for frames again, or something that is no frame: ladders
-    // may show it beside the messages of a call.
+    // Whether ladders may show the item beside the messages of a call: a frame that sets a link up, ends it
+    // or asks for frames again, or an item that is no frame.
     bool tellsOfLink(std::size_t item) const { return kept_[item].tellsOfLink; }
     std::int64_t at(std::size_t item) const { return kept_[item].at; }
 
-    // Makes `to` the item, its headers read.
+    // Makes `to` the item, and reads its headers.
     static void load(const std::shared_ptr<const Page>& page, std::size_t item, Shown& to);
 
   private:

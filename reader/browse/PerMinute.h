@@ -1,4 +1,4 @@
-// How often something happens in a minute.
+// Counts how often something happened in the last minute.
 #ifndef READER_BROWSE_PERMINUTE_H
 #define READER_BROWSE_PERMINUTE_H
 
@@ -17,7 +17,7 @@ class PerMinute {
         moveTo(at);
         ++counts_[static_cast<std::size_t>(second_ % seconds)];
     }
-    // How often it has happened in the minute that ends at `at`.
+    // How often it happened in the minute that ends at `at`, to a second.
     std::uint64_t upTo(std::int64_t at) {
         moveTo(at);
         return std::accumulate(counts_.begin(), counts_.end(), std::uint64_t{0});

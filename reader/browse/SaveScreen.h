@@ -1,4 +1,4 @@
-// Asks where marked frames go, and whether they are redacted.
+// Asks for the file into which marked frames are saved, and whether they are redacted.
 #ifndef READER_BROWSE_SAVESCREEN_H
 #define READER_BROWSE_SAVESCREEN_H
 
@@ -12,7 +12,7 @@ namespace reader::browse {
 
 class SaveScreen : public Screen {
   public:
-    // What is marked is written; if nothing is, `otherwise`.
+    // Saves what the user has marked; if nothing is marked, `otherwise`.
     SaveScreen(Desk& desk, const Marked& otherwise);
 
     std::string title() const override { return "Save"; }

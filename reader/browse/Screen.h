@@ -1,4 +1,5 @@
-// A screen: it shows a part of the trace, and takes keys.
+// The interface of a screen, which shows a part of the trace and takes keys, and the interface through which
+// a screen reaches the program.
 #ifndef READER_BROWSE_SCREEN_H
 #define READER_BROWSE_SCREEN_H
 
@@ -19,7 +20,7 @@ namespace reader::browse {
 
 class Screen;
 
-// What the user has marked, by number.
+// The numbers of the calls and frames that the user has marked.
 struct Marked {
     std::set<std::uint64_t> calls{};
     std::set<std::uint64_t> frames{};
@@ -34,7 +35,7 @@ struct SaveOrder {
     bool redacted = false;
 };
 
-// What screens ask of the program that shows them.
+// What a screen may ask of the program. Used on one thread.
 class Desk {
   public:
     Desk() = default;
@@ -45,15 +46,15 @@ class Desk {
     virtual const Trace& trace() const = 0;
     virtual Marked& marked() = 0;
     virtual TimeText& times() = 0;
-    // Lines may be drawn with UTF-8.
+    // Whether lines may be drawn with characters of UTF-8.
     virtual bool hasUtf8() const = 0;
-    // Puts a screen in front of the one that asks.
+    // Shows a screen in front of the one that calls. The program owns it.
     virtual void open(std::unique_ptr<Screen> screen) = 0;
-    // Puts the one that asks away, as soon as it has returned.
+    // Destroys the screen that calls, once its function has returned.
     virtual void close() = 0;
-    // A line for the user, in the place of the keys until the next one is pressed.
+    // Shows a line of text in place of the keys, until the user presses the next key.
     virtual void say(std::string words) = 0;
-    // Begins to write; what came of it is said later.
+    // Begins to write the file and returns. say() later shows how that ended.
     virtual void save(SaveOrder order) = 0;
 };
 
@@ -73,17 +74,17 @@ class Screen {
     Screen& operator=(const Screen&) = delete;
     virtual ~Screen() = default;
 
-    // What is shown, in a line of its own above the screen.
+    // The line above the screen, which says what the screen shows.
     virtual std::string title() const = 0;
     virtual void draw(Canvas& canvas, const Area& area) = 0;
-    // False if it has no use for the key.
+    // Returns false if the screen has no use for the key.
     virtual bool press(const Key& key) = 0;
     virtual std::span<const KeyHint> keys() const = 0;
-    // Letters are text, and not keys.
+    // Whether the user types text at present, so that letters are no commands.
     virtual bool isTyping() const { return false; }
-    // News have come. Called in any case before `draw`.
+    // The trace has changed. Called before the screen is drawn from it.
     virtual void changed(const Changes& /*changes*/) {}
-    // Goes on with long work for as long as there is time. True if there is more to do.
+    // Goes on with work that takes long, at most until this time. Returns true if there is more to do.
     virtual bool work(Clock::time_point /*until*/) { return false; }
 
   protected:

@@ -1,4 +1,5 @@
-// The terminal: shows a canvas, and gives keys. It is put back however the program ends.
+// The terminal: shows a canvas, and gives the keys that are pressed. Its modes are restored however the
+// program ends.
 #ifndef READER_BROWSE_TERMINAL_H
 #define READER_BROWSE_TERMINAL_H
 
@@ -16,11 +17,11 @@ class Terminal {
     struct Settings {
         bool colors = true;
         bool mouse = true;
-        bool keysFromTty = false;  // standard input is what is read
+        bool keysFromTty = false;  // the frames come from standard input, so keys come from /dev/tty
     };
 
-    // Takes the terminal over: that of standard input and output, or /dev/tty where these are none. Throws
-    // FileError if there is none that can show screens.
+    // Takes over the terminal of standard input and output, or /dev/tty if these are no terminal. Throws
+    // FileError if there is no terminal that can show screens.
     explicit Terminal(const Settings& settings);
     ~Terminal();
     Terminal(const Terminal&) = delete;
@@ -28,16 +29,17 @@ class Terminal {
 
     // For poll().
     int descriptor() const;
-    // The next key that was pressed; nothing if there is none just now.
+    // The next key that was pressed. Does not wait; returns nothing if there is none.
     std::optional<Key> key();
-    // As large as the terminal is now.
+    // An empty canvas of the terminal's present size.
     Canvas canvas() const;
     void show(const Canvas& canvas);
     // The next show() draws everything anew.
     void forget();
-    // The terminal has gone: the connection was closed.
+    // Whether the terminal is gone, because its window or connection was closed.
     bool isGone() const;
-    // Gives the terminal back, stops the program as the shell wants it, and goes on when it is continued.
+    // Restores the terminal, stops the program as Ctrl-Z does, and takes the terminal over again when the
+    // program is continued.
     void suspend();
 
   private:

@@ -20,17 +20,18 @@ namespace reader::browse {
 // What an update has changed.
 struct Changes {
     std::vector<std::uint64_t> calls{};  // new, or changed
-    std::vector<std::uint64_t> gone{};   // calls that are not there any more
-    bool findings = false;
+    std::vector<std::uint64_t> gone{};   // calls that are not kept any more
+    bool findings = false;               // there are new findings, or some are not kept any more
 };
 
 // A message that came in segments, put together.
 struct JoinedMessage {
     std::vector<std::uint8_t> octets;   // from the protocol discriminator on
-    std::vector<std::uint64_t> frames;  // that carried it, in their order
+    std::vector<std::uint64_t> frames;  // the frames that carried it, in their order
 };
 
-// Memory is bounded by that of the frames: calls and findings go with their last frame. Used on one thread.
+// Memory is bounded: a call that has ended, and a finding, is dropped when its last frame is. Used on one
+// thread.
 class Trace {
   public:
     explicit Trace(std::size_t mostItems = FrameStore::usualMost) : frames_(mostItems) {}
@@ -38,15 +39,16 @@ class Trace {
     Changes apply(Update update);
 
     const FrameStore& frames() const { return frames_; }
-    // By number.
+    // All calls that are kept, by number.
     const std::map<std::uint64_t, calls::Call>& calls() const { return calls_; }
-    // Null if it is not known, or has gone.
+    // Null if the call is not kept. Valid until the next apply().
     const calls::Call* call(std::uint64_t number) const;
-    // The number of the call that a frame belongs to; 0 if it is of none.
+    // The number of the call that a frame belongs to; 0 if it belongs to none.
     std::uint64_t callOf(std::uint64_t frame) const;
-    // Of a call, in their order; also those that are not kept any more.
+    // The frames of a call in their order, also those that are not kept any more.
     std::span<const CallFrame> framesOf(std::uint64_t call) const;
-    // In the order in which they were certain, each with a number that counts from 0.
+    // The findings in the order in which they became certain. Their numbers count from 0; firstFinding() is
+    // the number of the first that is kept.
     const std::deque<calls::Finding>& findings() const { return findings_; }
     std::uint64_t firstFinding() const { return firstFinding_; }
     const std::vector<TrunkView>& trunks() const { return trunks_; }
@@ -57,14 +59,14 @@ class Trace {
 
     // The call as a ladder, as far as its frames are kept; its first rung says how many are not.
     CallLadder ladderOf(const calls::Call& call, TimeText& times) const;
-    // Its messages as the other side has accepted them.
+    // The call's messages as the other side's layer 2 has accepted them.
     std::vector<ComparedMessage> messagesOf(const calls::Call& call) const;
-    // A message alone; nothing of a frame that carries none.
+    // The message of one frame; nothing if the frame carries none.
     std::optional<ComparedMessage> messageOf(std::uint64_t frame) const;
-    // The message that a frame has a segment of; nothing if others of its segments are not kept.
+    // The whole message of which a frame carries a segment; nothing if another of its segments is not kept.
     std::optional<JoinedMessage> joinedOf(std::uint64_t frame) const;
 
-    // Findings that are kept at most, and frames of one call that are known.
+    // The most findings that are kept, and the most frames that are noted for one call.
     static constexpr std::size_t mostFindings = 100'000;
     static constexpr std::size_t mostFramesOfCall = 65'536;
 
@@ -76,7 +78,7 @@ class Trace {
 
     FrameStore frames_;
     std::map<std::uint64_t, calls::Call> calls_;
-    // By number of the call; also of calls that are not shown yet.
+    // By number of the call, also for calls that are not shown yet.
     std::map<std::uint64_t, std::vector<CallFrame>> framesOf_;
     std::deque<CallFrame> ofCalls_;  // the same in the order of the input, with RESTARTs
     std::deque<calls::Finding> findings_;

@@ -16,7 +16,7 @@ struct LinkView {
     std::uint8_t tei = 0;
     calls::LinkState state = calls::LinkState::unknown;
     Instant since;
-    bool sawSetUp = false;  // else it is in this state at least since then
+    bool sawSetUp = false;  // the trace shows the set-up; otherwise the link is up at least since then
 };
 
 struct TrunkView {
@@ -25,7 +25,8 @@ struct TrunkView {
     std::vector<LinkView> links;
     std::uint64_t framesAMinute = 0;  // in the last minute of its clock
     std::uint64_t callsAMinute = 0;
-    std::vector<calls::CellRow> cells;  // of its group, at the first D channel of the group
+    // The channels of its group. Only the group's first D channel has them.
+    std::vector<calls::CellRow> cells;
 };
 
 }  // namespace reader::browse

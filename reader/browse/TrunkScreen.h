@@ -28,7 +28,7 @@ class TrunkScreen : public Screen {
     };
     struct Line {
         std::vector<Piece> pieces;
-        std::optional<std::uint64_t> frame{};  // that it leads to
+        std::optional<std::uint64_t> frame{};  // the frame that Enter opens
     };
 
     void build(int width);
@@ -39,7 +39,7 @@ class TrunkScreen : public Screen {
     void putLine(std::string text, Style style = {}) { lines_.push_back({{{std::move(text), style}}}); }
 
     std::vector<Line> lines_;
-    unsigned usesShown_ = 0;  // a bit a sign that the legend has to tell
+    unsigned usesShown_ = 0;  // a bit for each kind of cell that is shown, so that the legend explains it
     Cursor cursor_;
     int top_ = 0;
 };

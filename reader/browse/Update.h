@@ -1,4 +1,4 @@
-// What the thread that reads hands to the one that shows.
+// What the thread that reads hands to the thread that shows, and the queue between them.
 #ifndef READER_BROWSE_UPDATE_H
 #define READER_BROWSE_UPDATE_H
 
@@ -24,32 +24,32 @@ namespace reader::browse {
 struct CallFrame {
     std::uint64_t call = 0;  // 0: RESTART or its answer, which may end any call
     std::uint64_t frame = 0;
-    bool carried = false;  // it carries a message without being the one that counts
+    bool carried = false;  // a copy or a segment: it carries a message, which is heard by another frame
 };
 
-// A piece of news: items, and what they have changed.
+// Items that were read, and what they have changed.
 struct Update {
     enum class State : std::uint8_t { reading, live, ended };
 
     std::shared_ptr<const Page> page = std::make_shared<Page>();
-    std::map<std::uint64_t, calls::Call> calls{};  // as they stand now, by number; without `frames`
+    std::map<std::uint64_t, calls::Call> calls{};  // new state of calls, by number; without Call::frames
     std::vector<CallFrame> frames{};
-    std::vector<std::uint64_t> unwanted{};  // calls that the filters hide after all
+    std::vector<std::uint64_t> unwanted{};  // calls that do not pass the filters, as their end has shown
     std::vector<calls::Finding> findings{};
-    std::vector<TrunkView> trunks{};  // empty: as before
-    std::uint64_t callsDropped = 0;   // since too many were alive
+    std::vector<TrunkView> trunks{};  // empty: those of the update before stay
+    std::uint64_t callsDropped = 0;   // how many calls were dropped because too many were alive
     std::uint64_t octets = 0;         // how far reading has come
     State state = State::reading;
-    std::string error{};  // reading ended with it
+    std::string error{};  // why reading ended early; empty otherwise
 };
 
-// Hands updates over in their order. Whoever puts waits while much is held: memory is bounded.
+// Hands updates over in their order. put() waits while `most` updates are in the queue, so memory is bounded.
 class UpdateQueue {
   public:
-    // Thrown where nobody takes any more.
+    // Thrown by put() once the queue is closed.
     class Closed {};
 
-    // `wake` is called after each put, on the thread that puts.
+    // put() calls `wake` after it has added an update, on its own thread and without the lock.
     explicit UpdateQueue(std::function<void()> wake) : wake_(std::move(wake)) {}
 
     void put(Update update) {
@@ -62,7 +62,7 @@ class UpdateQueue {
         }
         wake_();
     }
-    // Does not wait; empty if there is none.
+    // Takes the oldest update. Does not wait; returns nothing if there is none.
     std::optional<Update> take() {
         const std::lock_guard lock(mutex_);
         if (held_.empty())
@@ -72,7 +72,7 @@ class UpdateQueue {
         room_.notify_one();
         return first;
     }
-    // Nothing is taken any more.
+    // Wakes the thread that waits in put(). From now on put() throws.
     void close() {
         const std::lock_guard lock(mutex_);
         isClosed_ = true;

@@ -1,4 +1,4 @@
-// Ends a poll() that waits, from another thread or a signal handler.
+// Lets another thread or a signal handler end a poll() that waits.
 #ifndef READER_BROWSE_WAKE_H
 #define READER_BROWSE_WAKE_H
 
@@ -12,11 +12,11 @@ class Wake {
     Wake(const Wake&) = delete;
     Wake& operator=(const Wake&) = delete;
 
-    // Readable once call() was called.
+    // For poll(): readable from call() until heard().
     int descriptor() const { return descriptor_; }
     // May be called in a signal handler.
     void call() const noexcept;
-    // Takes the calls so far.
+    // Makes the descriptor unreadable until the next call().
     void heard() const;
 
   private:

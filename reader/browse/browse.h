@@ -1,4 +1,4 @@
-// Screens in a terminal: trunk, calls, ladders, messages, findings.
+// lapdread browse: screens in a terminal for trunks, calls, ladders, messages and findings.
 #ifndef READER_BROWSE_BROWSE_H
 #define READER_BROWSE_BROWSE_H
 

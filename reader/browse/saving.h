@@ -10,10 +10,10 @@
 
 namespace reader::browse {
 
-// `order` must name a frame. Writes pcapng; over a file that is there. The frames that are still in the store
-// are written, in their order. Redaction looks at all frames before them, since numbers may have begun there.
-// Returns what was done, in words. Throws FileError. May be called on another thread than the one that fills
-// the store, with a copy of it.
+// Writes the frames of `order` that the store still has to a pcapng file, in the order of the input. `order`
+// must name at least one frame. Overwrites a file. Redaction looks at all kept frames before them as well,
+// because a number may have begun there. Returns a sentence that says what was done. Throws FileError.
+// Another thread than the one that fills the store may call this with a copy of the store.
 std::string saveFrames(const FrameStore& frames, const SaveOrder& order, const Options& options,
                        const redaction::Key& key);
 

@@ -14,12 +14,12 @@ namespace reader {
 struct Page {
     std::string title;
     std::vector<std::string> summary;    // sentences; safe
-    std::vector<FigureTable> figures{};  // all of `stats`
-    std::string from{};                  // of the first frame, as in tables; empty without times
-    std::string until{};
-    Pieces calls;     // markup: <tr>...</tr>
-    Pieces ladders;   // markup: <details>...</details>
-    Pieces findings;  // markup: <tr>...</tr>
+    std::vector<FigureTable> figures{};  // all tables of `stats`
+    std::string from{};                  // the first frame's time, as in tables; empty without times
+    std::string until{};                 // the last frame's time
+    Pieces calls;                        // markup: <tr>...</tr>
+    Pieces ladders;                      // markup: <details>...</details>
+    Pieces findings;                     // markup: <tr>...</tr>
 };
 
 std::string htmlOf(const Page& page);

@@ -17,7 +17,8 @@ namespace reader {
 // failed. Memory is bounded: pieces for which there is no room are counted.
 class ReportTaker : public FigureTaker {
   public:
-    // Rows of calls that failed and of all others, each; findings; ladders, and their octets.
+    // The most rows of calls that failed, and of other calls; rows of findings; ladders, and octets of
+    // ladders.
     static constexpr std::uint64_t mostCalls = 20'000;
     static constexpr std::uint64_t mostFindings = 2'000;
     static constexpr std::uint64_t mostLadders = 500;

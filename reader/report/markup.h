@@ -22,7 +22,7 @@ void appendHead(std::string& to, const std::vector<HtmlColumn>& columns);
 // A table of figures with its caption; nothing without rows.
 void appendTable(std::string& to, const FigureTable& table);
 
-// The same for a script, as it may stand in <script type="application/json">: {"messages":[{...},...],...}.
+// The tables as JSON that may be put into <script type="application/json">: {"messages":[{...},...],...}.
 std::string jsonOf(const std::vector<FigureTable>& tables);
 
 // Collects pieces of HTML up to a limit.
