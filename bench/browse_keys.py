@@ -34,7 +34,7 @@ KEYS = [(b"?", b"Key"), (b"q", b"Cal"), (b"3", b"Find"), (b"2", b"Cal")]
 
 
 def frame_ends(data):
-    """Where each frame of a capture ends."""
+    """The offset at which each frame of a capture ends."""
     ends, at = [], len(calls_speed.HEADER)
     while at < len(data):
         at += 16 + struct.unpack_from("<I", data, at + 8)[0]

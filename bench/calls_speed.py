@@ -74,7 +74,7 @@ def frames_of_a_round():
 
 
 def write(path, wanted):
-    """So many frames, rounds of calls with references of their own; the octets of a round are the same but for these."""
+    """Writes so many frames, in rounds. The rounds have the same octets except for times and call references."""
     frames = frames_of_a_round()
     round_octets, times, references, at = bytearray(), [], [], 0
     for time, octets, call in frames:

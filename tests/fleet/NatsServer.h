@@ -38,11 +38,11 @@ class NatsServer {
     NatsServer(const NatsServer&) = delete;
     NatsServer& operator=(const NatsServer&) = delete;
 
-    // kill -9; what it has stored stays.
+    // Kills the server as kill -9 does. What it has stored stays.
     void kill();
-    // On the same port; returns when it takes connections.
+    // Starts it again on the same port, and returns when it takes connections.
     void start();
-    // The server does nothing until it is let go on.
+    // Stops the server's process until thaw().
     void freeze();
     void thaw();
 

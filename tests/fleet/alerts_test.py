@@ -15,7 +15,7 @@ METRIC = r"\b(?:lapdship|lapdstore)_[a-z_]+\b"
 
 
 def offered():
-    """Metrics of both programs, as their sources name them."""
+    """The names of the metrics of both programs, found in their sources."""
     sources = (SOURCE / "fleet/ship/ShipMetrics.cc", SOURCE / "fleet/store/Figures.cc")
     return {name for source in sources for name in re.findall(f'"({METRIC})"', source.read_text())}
 

@@ -1,4 +1,4 @@
-"""Connections that are passed on, and can be cut, as the line between a site and its centre."""
+"""Passes connections on, and can cut them. It stands for the line between a site and its centre."""
 
 import contextlib
 import selectors

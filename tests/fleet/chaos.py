@@ -34,7 +34,7 @@ SKIPPED = 77
 
 
 class Disk:
-    """A small tmpfs for each site, which no other process sees, so that it goes with us."""
+    """A small tmpfs for each site, in a mount namespace of this process, so that it is gone when the process ends."""
 
     def __init__(self, folder, megabytes):
         self._folder, self.is_real = pathlib.Path(folder), False
@@ -57,7 +57,7 @@ class Disk:
         return self._folder / f"disk.{site}"
 
     def fill(self, site):
-        """To the last octet."""
+        """Fills the site's disk to the last octet."""
         with open(self.of(site) / "ballast", "wb", buffering=0) as file:
             for size in (1 << 20, 1 << 12, 1):
                 with contextlib.suppress(OSError):
@@ -69,7 +69,7 @@ class Disk:
 
 
 class Chaos:
-    """Faults of a running fleet. Each is a function that does it, and returns what undoes it."""
+    """Makes faults in a running fleet. Each fault is a function that makes it and returns a function that undoes it."""
 
     def __init__(self, fleet, disk, seed, spare=()):
         self.fleet, self._random, self._disk = fleet, random.Random(seed), disk
@@ -107,7 +107,8 @@ class Chaos:
         self.count[name] += 1
 
     def _until(self, moment):
-        """Undoes what is due up to this moment; without one, everything."""
+        """Undoes the faults that are due before this moment, each at its time, and waits for the moment. Without a moment,
+        undoes all of them."""
         for due, what, undo in sorted(self._undo, key=lambda each: each[0]):
             if moment is None or due < moment:
                 time.sleep(max(0, due - time.monotonic()))
@@ -118,7 +119,7 @@ class Chaos:
             time.sleep(max(0, moment - time.monotonic()))
 
     def look(self, process):
-        """What nobody has killed must run."""
+        """Notes the process if it has ended although nobody has killed it."""
         if not process.is_running():
             self.unwanted.append(f"{process.name} has ended by itself: ...{process.said()[-300:]}")
 
@@ -155,7 +156,7 @@ class Chaos:
         return cable, self._random.uniform(1, 15), cable.mend
 
     def _fill(self):
-        """A server whose disk was full may have switched its streams off, so it is started anew."""
+        """Fills a site's disk. A server whose disk was full may have switched its streams off, so it is started again."""
         site = self._random.choice(SITES)
         server = self.fleet.engines.nats[site]
         if server.name in self._busy:

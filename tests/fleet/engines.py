@@ -44,7 +44,7 @@ def own_address():
 
 
 def missing(*more):
-    """Programs that are not installed; none may be."""
+    """The names of programs that are needed and not installed."""
     paths = os.pathsep.join([os.environ.get("PATH", ""), "/usr/sbin", database_programs()])
     return [name for name in ("nats-server", "postgres", "initdb", "psql", "openssl", "setpriv", *more)
             if shutil.which(name, path=paths) is None]
@@ -56,7 +56,7 @@ def database_programs():
 
 
 def awaited(condition, what, limit=LIMIT):
-    """Waits until condition() is true, and returns what it gave."""
+    """Waits until condition() is true, and returns its value."""
     end = time.monotonic() + limit
     while not (found := condition()):
         if time.monotonic() > end:
@@ -97,7 +97,7 @@ class Process:
         self.end(signal.SIGKILL)
 
     def end(self, number=signal.SIGTERM, limit=LIMIT):
-        """Returns the exit status; one that does not end in time is killed, and that is told."""
+        """Ends the process and returns its exit status. Kills it if it does not end in time, and says so."""
         if self._process is None:
             return None
         self._process.send_signal(number)
@@ -157,7 +157,7 @@ class Engines:
         return [f"tls://{self.address}:{CLIENT_PORT + number}" for number in numbers]
 
     def certificate(self, user):
-        """The three files that a client shows and trusts: authority, certificate, key."""
+        """A client's three files: the authority that it trusts, its certificate and its key."""
         return [self.certificates / name for name in ("authority.pem", f"{user}.pem", f"{user}.key")]
 
     def database_url(self, user):
@@ -170,7 +170,7 @@ class Engines:
         return f"postgresql://owner@/lapd?host={self.folder}/database&port={DATABASE_PORT}"
 
     def sql(self, query, database="lapd"):
-        """Rows as lists of texts, asked as the owner."""
+        """Runs a query as the owner, and returns its rows as lists of texts."""
         said = subprocess.run(["psql", "-Xtq", "--csv", "-v", "ON_ERROR_STOP=1", "-h", self.folder / "database", "-p",
                                str(DATABASE_PORT), "-U", "owner", "-d", database, "-c", query],
                               check=True, capture_output=True, text=True, timeout=LIMIT).stdout
@@ -179,7 +179,7 @@ class Engines:
     # The engines.
 
     def _own(self, path, user):
-        """A folder or file of this user's alone."""
+        """Makes the folder unless the path exists, and lets only this user read what is there."""
         if not path.exists():
             path.mkdir(parents=True)
         os.chmod(path, 0o700 if path.is_dir() else 0o600)
@@ -257,7 +257,7 @@ class Engines:
         self.sql("CREATE DATABASE lapd", "postgres")
 
     def start_database(self):
-        """It refuses to start while children of one that was killed are still about."""
+        """Starts PostgreSQL, as often as it takes: it refuses while children of a killed server still run."""
         def is_up():
             if not self.database.is_running():
                 self.database.start()

@@ -21,7 +21,7 @@ def program(name):
 
 
 def lapdread(*words):
-    """What lapdread prints. Fails if lapdread does, or says anything."""
+    """Returns what lapdread prints. Fails if lapdread fails or writes to the standard error stream."""
     ran = subprocess.run([program("lapdread"), *map(str, words), "--quiet"], capture_output=True, text=True, timeout=10 * LIMIT)
     if ran.returncode != 0 or ran.stderr:
         raise RuntimeError(f"lapdread {' '.join(map(str, words))}: status {ran.returncode}: {ran.stderr}")
@@ -98,7 +98,7 @@ class Fleet:
         return f"{self.engines.address}:{STORE_METRICS + store if site is None else SHIP_METRICS + self.engines.sites.index(site)}"
 
     def start_prometheus(self):
-        """Returns its URL."""
+        """Starts Prometheus and returns its URL."""
         return self.engines.start_prometheus({
             "lapdship": [self.metrics(site) for site in self.engines.sites],
             "lapdstore": [self.metrics(store=number) for number in range(1, self._plan[2] + 1)]})
@@ -160,7 +160,7 @@ class Fleet:
         self.start_carrying()
 
     def start_carrying(self):
-        """What brings frames from the logs to the stores."""
+        """Starts the programs that bring frames from the logs to the stores."""
         for trunk in self.trunks:
             self._add(trunk.recorder).start()
         for site in self.engines.sites:
@@ -184,7 +184,7 @@ class Fleet:
     # Ending it, and what came of it.
 
     def play_to_the_end(self):
-        """Returns when each log has all that its trunk plays, and each trace has ended in order."""
+        """Waits until each log has all frames that its trunk plays, and each trace has ended in order."""
         for trunk in self.trunks:
             awaited(lambda: trunk.logged() >= trunk.frames, f"{trunk.name} plays", 10 * LIMIT)  # noqa: B023
         for trunk in self.trunks:
@@ -197,13 +197,13 @@ class Fleet:
         return {name: int(count) for name, count in rows}
 
     def await_stored(self, limit):
-        """Returns when the store has as many frames as the logs, or the time is over."""
+        """Waits until the store has as many frames as the logs, or the time is over."""
         wanted = {trunk.name: trunk.logged() for trunk in self.trunks}
         with contextlib.suppress(TimeoutError):
             awaited(lambda: self.stored() == wanted, "the frames of all trunks", limit)
 
     def compare(self):
-        """What is in the logs, and in the store."""
+        """Reads the logs and the store, and returns the Comparison."""
         result = Comparison()
         for trunk in self.trunks:
             result.of(trunk, self)

@@ -33,7 +33,7 @@ FRAMES_A_CALL, BEFORE_NOW = 18, 86400  # about; seconds
 
 
 def written_log(folder, frames):
-    """The log of about so many frames of yesterday, as text, and how many there are."""
+    """Returns the text of a log with about so many frames of yesterday, and their exact number."""
     make_captures.START = int(time.time()) - BEFORE_NOW
     capture, log = folder / "written.pcap", folder / "written.log"
     capture.write_bytes(Traffic(1, frames / FRAMES_A_CALL / 5, rate=5).capture())
@@ -63,7 +63,7 @@ class WrittenFleet(Fleet):
 
 
 def processor_seconds(fleet):
-    """What each kind of program has worked so far, with the processes that it has made."""
+    """Returns the processor time that each kind of program has taken so far, its child processes included."""
     ticks, parents = {}, {}
     for path in pathlib.Path("/proc").glob("[0-9]*/stat"):
         with contextlib.suppress(OSError):

@@ -26,7 +26,7 @@ def programs():
 
 
 def as_user(*words, last=False):
-    """The words behind what makes root the user postgres. `last`: ends with us."""
+    """The command, run as the user postgres if root starts it. `last`: the process ends when this one does."""
     end = ["--pdeathsig", "QUIT"] if last else []
     if os.geteuid() == 0:
         return ["setpriv", "--reuid", "postgres", "--regid", "postgres", "--clear-groups", *end, "--", *map(str, words)]

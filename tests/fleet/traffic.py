@@ -1,4 +1,4 @@
-"""What passes on a simulated trunk: calls with numbers, causes and channels by chance, and a link that is watched."""
+"""The frames of a simulated trunk: calls with random numbers, causes and channels, and a link that is polled."""
 
 import pathlib
 import random
@@ -13,8 +13,9 @@ FAR, NEAR = 0x8000, 0.012  # the flag of a call reference; an answer of layer 2 
 
 
 class Trunk:
-    """The same seed gives the same traffic. `rate`: calls a second, about; `seconds`: how long calls begin; `fails`: how
-    many of them the other side refuses, with one of `causes`; `flaps`: when the link is lost and set up again."""
+    """The same seed gives the same traffic. `rate`: about so many calls a second; `seconds`: new calls begin for so long;
+    `fails`: the share of calls that the other side refuses with one of `causes`; `flaps`: when the link is lost and set up
+    again."""
 
     def __init__(self, seed, seconds, rate=0.5, causes=(17, 34, 41, 102, 1), fails=0.25, flaps=()):
         self._random, self._causes, self._fails, self._lines = random.Random(seed), causes, fails, []
