@@ -31,8 +31,8 @@ std::string_view nameOf(Use use);
 struct ChannelCell {
     ChannelKey channel{};
     Use use = Use::idle;
-    std::optional<Side> by{};  // who took it out of service
-    std::uint64_t call = 0;    // that is on it
+    std::optional<Side> by{};  // the side that took it out of service
+    std::uint64_t call = 0;    // the number of the call that is on it; 0: none
 };
 
 // The channels of one interface of a D channel, or of the D channels that share their calls.
@@ -40,11 +40,12 @@ struct CellRow {
     std::uint32_t group = 0;
     std::optional<std::uint32_t> interface {};
     TrunkSize size = TrunkSize::unknown;
-    bool isLearnt = false;  // the size is what the channels in use suggest
+    bool isLearnt = false;  // the size was not given; the channels in use suggest it
     std::vector<ChannelCell> cells{};
 };
 
-// Rows of all groups of which `occupancy` knows channels. `size` is that of the trunks; unknown: learnt.
+// Makes the rows of all groups of which `occupancy` knows channels. `size` is the size of the trunks; if it
+// is unknown, it is learnt from the channels in use.
 std::vector<CellRow> cellRows(const Analysis& analysis, const Occupancy& occupancy, TrunkSize size);
 
 }  // namespace calls

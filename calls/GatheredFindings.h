@@ -1,4 +1,5 @@
-// Tells as one finding what has one cause: thirty RESTARTs that nobody acknowledged, for example.
+// Reports several findings that have one cause as one finding: thirty RESTARTs that nobody acknowledged, for
+// example.
 #ifndef CALLS_GATHEREDFINDINGS_H
 #define CALLS_GATHEREDFINDINGS_H
 
@@ -13,14 +14,14 @@
 
 namespace calls {
 
-// Keeps the findings that it is told, of one kind and about one side, until its owner says that they are
-// complete. Then it reports the first of them, with the channels of all and their number. What comes again
-// within ten minutes is only counted (RepeatedFindings). Memory is bounded: of further findings only the
-// channels are kept.
+// Keeps the findings that it gets, which are of one kind and about one side, until its owner calls
+// complete(). Then it reports the first of them, with the channels of all and their number. If that happens
+// again within ten minutes, it is only counted (RepeatedFindings). Memory is bounded: only the channels of
+// further findings are kept.
 class GatheredFindings : public FindingSink {
   public:
-    // The sentence of several findings. `channels` is what the sentence calls their channels: "channels 1,
-    // 2"; empty if they name none.
+    // Composes the sentence for several findings. `channels` is the text for their channels: "channels 1, 2";
+    // empty if they name none.
     using Sentence = std::function<std::string(const Finding& first, const std::string& channels)>;
 
     GatheredFindings(FindingSink& sink, Sentence sentence)
@@ -29,11 +30,11 @@ class GatheredFindings : public FindingSink {
     void report(Finding finding) override;
     // The clock has come to `at`.
     void advance(std::int64_t at) { now_ = at; }
-    // When the first of those that are kept came; empty if there is none.
+    // When the first of the findings that are kept came; empty if none is kept.
     std::optional<std::int64_t> since() const { return first_ ? std::optional(since_) : std::nullopt; }
-    // Those that are kept are all.
+    // No further finding of this cause will come. Reports the findings that are kept as one.
     void complete();
-    // The end of the trace.
+    // The trace has ended. Reports what is kept and what was only counted.
     void finish();
 
   private:

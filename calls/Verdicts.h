@@ -31,10 +31,11 @@ struct Unanswered {
 };
 
 // A missing answer is a fault only if the link was up, the receiver's link layer acknowledged the question,
-// and no frame of the answering side is missing between `asked` and `until`. The last of these may show only
-// in the numbers of a later frame, so that a finding waits for one, up to T203. Otherwise a note says
-// that it cannot be told; questions that have one reason for it share one note. Nothing is said if only one
-// direction was heard on the link. Memory is bounded.
+// and no frame of the answering side is missing between `asked` and `until`. The numbers of a later frame may
+// be needed to show that none is missing, so the finding waits for such a frame, up to T203. If one of the
+// conditions does not hold, a note says that it cannot be told whether the answer was sent; questions with
+// the same reason share one note. Nothing is reported if only one direction was heard on the link. Memory is
+// bounded.
 class Verdicts {
   public:
     Verdicts(const Timers& timers, const LinkWitnesses& links, FindingSink& sink)
@@ -43,10 +44,10 @@ class Verdicts {
     enum class Verdict : std::uint8_t { nothing, fault, held, cannotBeTold };
     Verdict judge(Unanswered question);
 
-    // The clock has come to `at`. `oldest` is when the oldest question was asked that still waits for its
-    // answer: a shared note is complete when no question is left that its reason touches.
+    // The clock has come to `at`. `oldest` is the time at which the oldest question that still waits for its
+    // answer was asked. A shared note is reported when no waiting question can have its reason.
     void advance(std::int64_t at, std::int64_t oldest);
-    // Whether it is not certain yet of some question that it is a fault.
+    // Whether the decision about some question still waits for a later frame.
     bool isHolding() const { return !held_.empty(); }
     // The end of the trace: what is held is reported as it stands.
     void finish();

@@ -15,11 +15,11 @@ namespace calls {
 
 class WitnessKeeper {
   public:
-    // What the channel has said of its last frame, which is of this link.
+    // Takes what the channel says about its last frame, which must belong to this link.
     void take(const DChannel& channel);
-    // The recorder may have missed frames by now.
+    // The recorder may have missed frames before `at`.
     void mayMiss(std::int64_t at);
-    // It has seen a frame of this side without its octets.
+    // The recorder has seen a frame of this side without its octets.
     void lacks(Side side, std::int64_t at);
     const LinkWitness& witness() const { return witness_; }
 

@@ -1,4 +1,4 @@
-// A whole trace redacted, or restored, frame by frame: what a program uses that redacts.
+// Redacts or restores a whole trace, frame by frame. Programs that redact use this class.
 #ifndef REDACTION_TRACEREDACTOR_H
 #define REDACTION_TRACEREDACTOR_H
 
@@ -22,11 +22,12 @@ namespace redaction {
 //     std::vector<redaction::Rebuilt> done;
 //     redactor.take(frame, ++number, isdn::Variant::net5, done);
 //
-// Only the octets change, never their number. Times, directions and ticks are not touched, and names of D
-// channels and files are the caller's to hide.
+// Only the octets change, never their number. Times, directions and ticks stay. The caller hides names of D
+// channels and files.
 //
-// All frames of a trunk must pass, wanted or not, since digits of a number may come one by one: one redactor
-// a trunk, kept as long as the trunk is recorded. After a new start numbers that go on are blanked.
+// Hand in all frames of a trunk, wanted or not, because digits of a number may come one by one. Keep one
+// redactor for each trunk as long as the trunk is recorded: a new one blanks numbers whose first digits it
+// has not seen.
 //
 // Memory is bounded. Used by one thread at a time; redactors of different threads share nothing.
 class TraceRedactor {
@@ -35,13 +36,13 @@ class TraceRedactor {
     // KeyError if this host's libcrypto has no HMAC with SHA-512.
     TraceRedactor(const Key& key, Direction direction, const calls::Options& options = {});
 
-    // Appends to `done` the frames that are ready by now, with their numbers: mostly this one. A SEGMENT
-    // waits for the rest of its message, and the frames behind it do not, so frames may come out of their
-    // order; a caller that keeps the order holds those behind it back. The interface must not be null.
-    // Numbers grow.
+    // Appends to `done` the frames that are ready now, with their numbers; in most cases this is the frame
+    // itself. A SEGMENT waits for the rest of its message, and frames after it do not, so frames may leave in
+    // another order; a caller that needs the order holds the later ones back. The interface must not be null.
+    // `number` must be larger than in the call before.
     void take(const capture::Frame& frame, std::uint64_t number, isdn::Variant variant,
               std::vector<Rebuilt>& done);
-    // A frame that was not recorded whole. It does not count in the trace.
+    // Redacts a frame that was not recorded whole. Such a frame does not count in the trace.
     std::vector<std::uint8_t> cut(isdn::Octets frame, isdn::Variant variant);
 
     // What a recorder says between frames, as calls::Analysis takes it. Numbers whose digits may be missing
@@ -50,9 +51,9 @@ class TraceRedactor {
     void mayLack(const capture::Interface& interface, calls::Side side);
     void restarted(const capture::Interface& interface);
 
-    // Segments that wait are blanked and come out: at the end of a trace, or if nothing has come for
-    // `longestWait`. take() does the same by itself once a segment has waited so long, or for `mostWaiting`
-    // frames.
+    // Blanks all segments that wait, and appends their frames to `done`. Call it at the end of a trace, or if
+    // nothing has come for `longestWait`. take() does the same when a segment has waited for that time or for
+    // `mostWaiting` frames.
     void giveUp(std::vector<Rebuilt>& done) { redactor_.giveUpSegments(done); }
     bool isWaiting() const { return redactor_.isWaiting(); }
 
