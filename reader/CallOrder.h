@@ -1,4 +1,4 @@
-// What calls can be put in order by.
+// The orders in which calls can be sorted.
 #ifndef READER_CALLORDER_H
 #define READER_CALLORDER_H
 
@@ -13,13 +13,13 @@ namespace reader {
 
 struct CallOrder {
     std::string_view name;
-    // The call with the lowest value comes first; of equal ones that with the lowest number.
+    // The call with the lowest value comes first; among equal values, the call with the lowest number.
     std::int64_t (*value)(const calls::Call& call);
 };
-// The first one is that of their beginning.
+// All orders. The first one is the order of the calls' beginning.
 std::span<const CallOrder> callOrders();
 
-// Throws UsageError for a name that is none.
+// Throws UsageError if no order has this name.
 const CallOrder& callOrderNamed(const std::string& name);
 
 }  // namespace reader

@@ -1,4 +1,4 @@
-// What a frame consists of, part by part: headings, fields, and what is wrong.
+// Takes a frame apart and tells a visitor its parts one by one: headings, fields, and what is wrong.
 #ifndef READER_CONTENTS_H
 #define READER_CONTENTS_H
 
@@ -19,16 +19,16 @@ class ContentsVisitor {
 
     // The link header, the message or an element begins: "I", "SETUP", "CAUSE, codeset 5".
     virtual void heading(std::string_view words) = 0;
-    // Valid during the call.
+    // A field of the part. Its views are valid only during the call.
     virtual void field(const isdn::Field& field) = 0;
-    // Of the part whose fields came before it.
+    // Something is wrong with the part whose fields came before.
     virtual void problem(isdn::Problem problem) = 0;
 };
 
 // A frame from its address field on.
 void visitFrame(isdn::Octets octets, isdn::Variant variant, ContentsVisitor& visitor);
 void visitMessage(const isdn::Layer3& message, isdn::Variant variant, ContentsVisitor& visitor);
-// Elements, identifier first.
+// Elements as they stand in a message, each beginning with its identifier.
 void visitElements(const isdn::Elements& elements, isdn::Variant variant, ContentsVisitor& visitor);
 
 }  // namespace reader

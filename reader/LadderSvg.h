@@ -1,4 +1,4 @@
-// Ladders as one picture.
+// Draws ladders as one picture.
 #ifndef READER_LADDERSVG_H
 #define READER_LADDERSVG_H
 
@@ -15,10 +15,10 @@ class LadderSvg {
     void add(const CallLadder& ladder, TimeText& times);
     // The whole picture, with its height.
     std::string picture() const;
-    // The same as a part of a page, with `label` for those who cannot see it. The page has the rules for its
-    // classes in the stylesheet, and once the definitions.
+    // The picture as a part of a page, with `label` as its text for people who cannot see it. The page's
+    // stylesheet must have the rules for its classes, and the page must contain definitions() once.
     std::string part(std::string_view label) const;
-    // The heads of arrows, to stand in an <svg> of the page.
+    // The heads of arrows, to be put into an <svg> of the page.
     static std::string definitions();
 
   private:

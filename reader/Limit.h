@@ -1,4 +1,4 @@
-// What --first and --not --first let through of things that a command counts itself: calls, findings.
+// Applies --first and --not --first to calls and findings, which commands count themselves.
 #ifndef READER_LIMIT_H
 #define READER_LIMIT_H
 
@@ -12,7 +12,8 @@ class Limit {
   public:
     explicit Limit(const Options& options) : skipped_(options.skipped), most_(options.first) {}
 
-    // Counts one more. False if it is one of those in front, or behind the last that is wanted.
+    // Counts one more, and returns whether it is wanted: not among those that are skipped at the beginning,
+    // and not after the last that is wanted.
     bool takeOne() {
         if (skipped_ != 0) {
             --skipped_;

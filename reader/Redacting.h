@@ -20,21 +20,23 @@ namespace reader {
 // Whether the item says that the input was redacted with this key. Throws FileError if it was another one.
 bool namesKey(const capture::Item& item, const redaction::Key& key);
 
-// Stands between a run and the consumer that writes. It looks at every item, filters or not, since a number
-// may have begun in another frame; items that pass the filters go on, or all of them to a consumer that wants
-// all. Names of files and D channels are replaced, comments are left out, and messages are put in words of
-// our own. While pseudonyms are undone all these stay as they are.
+// Takes the items of a run and hands them on, redacted, to the consumer that writes. It looks at every item,
+// because a number may have begun in a frame that the filters drop. It hands on the items that pass the
+// filters, or all items if the consumer wants all. It replaces names of files and D channels, drops comments,
+// and replaces texts of what the recorder said by our own words. When it restores, it leaves all these as
+// they are.
 class Redacting : public Consumer {
   public:
     using Names = std::map<std::string, std::string, std::less<>>;  // by the original
 
     static constexpr const char* firstTrunk = "trunk1";  // the name that the first D channel gets
 
-    // `composer` may be null if the next consumer wants no text. All references outlive this.
+    // `composer` may be null if the next consumer wants no text. All references must outlive this object.
     Redacting(const Options& options, const redaction::Key& key, redaction::Direction direction,
               std::unique_ptr<Composer> composer, Consumer& next);
 
-    // The options for an analysis behind this, which sees D channels by their new names alone.
+    // The options for an analysis that takes what this object hands on, and so knows D channels only by their
+    // new names.
     static Options behind(Options options);
 
     void take(Chunk& chunk, std::size_t count) override;
@@ -48,7 +50,7 @@ class Redacting : public Consumer {
     bool knowsKey() const { return knowsKey_; }
 
   private:
-    // A frame that waits for the end of its message, or an item behind one.
+    // A frame that waits for the end of its message, or an item after such a frame.
     struct Waiting {
         Seen seen;
         capture::Item item;
@@ -58,7 +60,7 @@ class Redacting : public Consumer {
         bool passes = false;
     };
 
-    // Items that wait for the end of a message at most.
+    // The most items that wait for the end of a message.
     static constexpr std::size_t mostWaiting = 4096;
 
     void look(const Seen& seen, bool passes);
@@ -82,8 +84,8 @@ class Redacting : public Consumer {
     std::vector<bool> passes_;  // of the items of out_
     CallFilter callFilter_;
     std::optional<CallGate> gate_;  // if whole calls are asked for
-    Chunk released_;                // what it has let through
-    Names channels_;                // how D channels are called now
+    Chunk released_;                // the items that the gate has let through
+    Names channels_;                // the new names of D channels
     Names files_;
     std::list<capture::Interface> interfaces_;
 };
