@@ -1,5 +1,5 @@
-// What manual pages and completion need to know about a program. It is read from the description from which
-// parser and --help are made.
+// Describes a program's command line for manual pages and completion. The description is read from the
+// parser, which also makes --help.
 #ifndef MANUAL_PROGRAM_H
 #define MANUAL_PROGRAM_H
 
@@ -43,8 +43,8 @@ struct Program {
 
 // The options and commands of a command line. Options that --help hides are left out.
 Program programOf(const CLI::App& app);
-// The same of a program that works without a command: the first one has no name. The others take its options
-// as well.
+// The same for a program that also works without a command. Its first Command has no name; the others take
+// the options of this one as well.
 Program programThatWorksAlone(const CLI::App& app);
 
 // The options of a command that not all commands have.
@@ -53,10 +53,10 @@ std::vector<Option> ownOptions(const Program& program, const std::string& comman
 // The options that each of the commands has.
 std::vector<Option> sharedOptions(const Program& program);
 
-// A word of --help: "--fault" takes one of these.
+// Says that an option, for example "--fault", takes one of these words.
 void setChoices(Program& program, const std::string& option, const std::vector<std::string>& choices);
 
-// "Examples:" names the lines of a footer from that one to the next empty line, without their title.
+// Returns a section of a footer: the lines after the title ("Examples:") up to the next empty line.
 std::string sectionOf(const std::string& footer, const std::string& title);
 
 std::vector<std::string> linesOf(const std::string& text);

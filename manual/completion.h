@@ -1,4 +1,4 @@
-// What a shell offers when Tab is pressed.
+// Makes the files from which shells know what to offer when Tab is pressed.
 #ifndef MANUAL_COMPLETION_H
 #define MANUAL_COMPLETION_H
 
