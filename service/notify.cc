@@ -1,6 +1,7 @@
 #include "service/notify.h"
 
 #include <sys/socket.h>
+#include <sys/time.h>
 #include <sys/un.h>
 #include <unistd.h>
 
@@ -43,23 +44,30 @@ std::optional<std::uint64_t> numberIn(const char* name) {
     return number;
 }
 
-}  // namespace
-
-void notify(const std::string& line) {
+// Returns whether the service manager has the line, or nobody wants it. Waits at most `patience`, or not at
+// all, for a service manager whose socket is full.
+bool sent(std::string_view line, std::chrono::seconds patience) {
     const char* const path = std::getenv("NOTIFY_SOCKET");
     sockaddr_un address{};
     if (path == nullptr || (*path != '/' && *path != '@') || std::strlen(path) >= sizeof address.sun_path)
-        return;
+        return true;
     const std::size_t length = std::strlen(path);
     address.sun_family = AF_UNIX;
     std::memcpy(address.sun_path, path, length);
     if (*path == '@')
         address.sun_path[0] = '\0';  // an abstract name instead of a file
     const Socket socket;
-    sendto(socket.number(), line.data(), line.size(), MSG_NOSIGNAL,
-           reinterpret_cast<const sockaddr*>(&address),
-           static_cast<socklen_t>(offsetof(sockaddr_un, sun_path) + length));
+    const timeval limit{patience.count(), 0};
+    setsockopt(socket.number(), SOL_SOCKET, SO_SNDTIMEO, &limit, sizeof limit);
+    const int waits = patience.count() == 0 ? MSG_DONTWAIT : 0;
+    return sendto(socket.number(), line.data(), line.size(), MSG_NOSIGNAL | waits,
+                  reinterpret_cast<const sockaddr*>(&address),
+                  static_cast<socklen_t>(offsetof(sockaddr_un, sun_path) + length)) >= 0;
 }
+
+}  // namespace
+
+void notify(const std::string& line) { sent(line, std::chrono::seconds(1)); }
 
 Heartbeat::Heartbeat() {
     constexpr unsigned beats = 3;
@@ -78,8 +86,8 @@ void Heartbeat::beat() {
     const Clock::time_point now = Clock::now();
     if (last_ != Clock::time_point::min() && now - last_ < *interval_ / 2)
         return;
-    last_ = now;
-    notify("WATCHDOG=1");
+    if (sent("WATCHDOG=1", {}))
+        last_ = now;
 }
 
 }  // namespace service

@@ -10,6 +10,7 @@
 namespace service {
 
 // Sends a line such as "READY=1" or "STOPPING=1" to the socket that NOTIFY_SOCKET names.
+// If the service manager's socket stays full for a second, the line is not sent.
 void notify(const std::string& line);
 
 // Tells the service manager that the main loop still runs; the manager restarts a program that does not say
@@ -26,6 +27,7 @@ class Heartbeat {
     std::optional<std::chrono::milliseconds> interval() const { return interval_; }
 
     // Sends "WATCHDOG=1" if half of the interval has passed since it was last sent.
+    // Never waits: if the service manager's socket is full, the next call tries again.
     void beat();
 
   private:
