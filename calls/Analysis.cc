@@ -158,6 +158,16 @@ Analysis::Channel& Analysis::channelOf(const capture::Interface& interface) {
     return *last_;
 }
 
+// Whether a D channel of the same group has a link over which the calls can be signalled.
+bool Analysis::mayCallsGoOn(const Channel& channel, std::uint8_t tei) const {
+    return std::any_of(channels_.begin(), channels_.end(), [&](const auto& each) {
+        if (&each.second->group != &channel.group)
+            return false;
+        const Link* const link = each.second->links.find(isdn::callControlSapi, tei);
+        return link != nullptr && link->state() == LinkState::up;
+    });
+}
+
 const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
     Channel& channel = channelOf(*frame.interface);
     const std::int64_t at = channel.clock.at(frame);
@@ -178,7 +188,7 @@ const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
         channel.group.table().framesLost(layer2.tei);
     if (marks.linkUp || marks.linkDown)
         channel.group.linkChanged(layer2.tei, {number, channel.group.now(), frame.clock, frame.time},
-                                  channel.name, marks.linkUp);
+                                  channel.name, marks.linkUp, mayCallsGoOn(channel, layer2.tei));
     for (const KeptFrame& late : channel.links.late()) {
         capture::Frame kept = late.frame;
         kept.octets = late.octets;

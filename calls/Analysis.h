@@ -111,6 +111,7 @@ class Analysis {
 
     Channel& channelOf(const capture::Interface& interface);
     std::uint32_t groupOf(const std::string& name);
+    bool mayCallsGoOn(const Channel& channel, std::uint8_t tei) const;
 
     Options options_;
     Listener& listener_;

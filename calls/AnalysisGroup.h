@@ -69,9 +69,11 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
         table_.advance(now_);
     }
     std::int64_t now() const { return now_; }
-    void linkChanged(std::uint8_t tei, const Moment& moment, const std::string& dChannel, bool isUp) {
+    // `mayCallsGoOn` says whether one of the group's D channels has a link now.
+    void linkChanged(std::uint8_t tei, const Moment& moment, const std::string& dChannel, bool isUp,
+                     bool mayCallsGoOn) {
         patterns_.linkChanged(moment, dChannel, isUp);
-        if (isUp)
+        if (mayCallsGoOn)
             table_.linkUp(tei);
         else
             table_.linkDown(tei, moment.at);

@@ -122,6 +122,37 @@ TEST(Traps, StandInFiles) {
     }
 }
 
+// The first D channel's link stays down for much longer than T309.
+TEST(Traps, ACallOutlivesTheLinkOfADChannelWhileAnotherOfItsGroupHasOne) {
+    namespace m = isdn::message;
+    for (const bool bothDown : {false, true}) {
+        CallScript script(capture::Role::user);
+        script.on("a").at(0).linkUp().on("b").linkUp();
+        script.on("a").at(100).us(m::setup, 1, false, {bearerSpeech(), channel(1), called("4021")});
+        script.at(900).peer(m::connect, 1, true).us(m::connectAcknowledge, 1, false);
+        script.at(10000).raw(Side::peer, true, {0x53}).raw(Side::us, false, {0x73});  // DISC, UA
+        script.on("b").at(20000).poll(Side::us);
+        if (bothDown)
+            script.raw(Side::peer, true, {0x53}).raw(Side::us, false, {0x73});
+        script.at(100000).on("a").raw(Side::us, true, {0x7F}).on("b").at(119000);
+        if (bothDown)
+            script.raw(Side::us, true, {0x7F});
+        else
+            script.poll(Side::us).at(200000).us(m::disconnect, 1, false, {cause(16)});
+        Options options;
+        options.groups = {{"a", "b"}};
+        Collected collected;
+        Analysis analysis(options, collected);
+        std::uint64_t number = 0;
+        for (const Sent& sent : script.frames())
+            analysis.take(sent.frame, ++number);
+        analysis.finish();
+        ASSERT_EQ(collected.calls.size(), 1U);
+        EXPECT_EQ(nameOf(collected.calls.front().endedBy), bothDown ? "link" : "open");
+        EXPECT_EQ(collected.calls.front().clearingSeen, !bothDown);
+    }
+}
+
 TEST(Traps, AChangeoverIsNoFaultWhereTheDChannelsShareTheirCalls) {
     const CallScript script = changeover();
     for (const char* const name : {"changeover-a", "changeover-b"})
