@@ -88,7 +88,8 @@ class Arrivals : public vela::Lane {
 extern std::shared_ptr<Arrivals> arrivals;
 
 // The traced D channel. Its callbacks must end before it can be destroyed, so its destructor closes the
-// arrivals and drops the records that wait.
+// arrivals and drops the records that still wait for a thread. quit() destroys it last, after the records
+// have been written or counted as lost.
 class TracedCcs : public vela::CCS {
   public:
     using CCS::CCS;

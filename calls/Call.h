@@ -41,17 +41,17 @@ enum class EndedBy : std::uint8_t {
 
 enum class ClearedBy : std::uint8_t { unknown, us, peer, both, nobody };
 
-enum class Outcome : std::uint8_t {
-    open,
-    answered,
+enum class Outcome : std::uint8_t {  // decided by the clearing's cause, unless a line says otherwise
+    open,                            // it has not ended in the trace, and CONNECT was not seen
+    answered,                        // CONNECT was seen
     busy,
-    noAnswer,
-    abandoned,
-    rejected,
-    number,
-    incompatible,
-    congestion,
-    protocol,
+    noAnswer,      // also: no terminal answered a SETUP to all
+    abandoned,     // its origin cleared it before it was answered, with a cause that says nothing special
+    rejected,      // cause 21
+    number,        // the number is wrong, changed or incomplete
+    incompatible,  // a bearer or service that is not to be had
+    congestion,    // no channel, or a fault or an overload of the network
+    protocol,      // causes 81 to 111
     other
 };
 
@@ -126,7 +126,7 @@ struct Call {
     ClearedBy clearedBy = ClearedBy::unknown;
     Outcome outcome = Outcome::open;
     bool clearingSeen = false;              // DISCONNECT, RELEASE or RELEASE COMPLETE has passed
-    std::optional<CauseGiven> cause;        // of the first of these; empty if it has none
+    std::optional<CauseGiven> cause;        // of the first clearing message; empty if it has none
     std::optional<CauseGiven> causeBefore;  // of PROGRESS, or of a terminal that refused earlier
     std::vector<CauseGiven> laterCauses;    // of the clearing messages after the first, in order
 

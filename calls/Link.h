@@ -38,8 +38,8 @@ struct Marks {
     bool outOfSequence = false;            // an earlier N(S) is missing
     bool pollUnanswered = false;           // a poll; the one before it got no answer
     bool linkUp = false;                   // UA that sets the link up
-    bool linkDown = false;                 // DM, or the answer to DISC: the link is not up any more
-    bool unseenSetUp = false;              // numbers begin at 0 again: a SABME is missing in the trace
+    bool linkDown = false;  // SABME on a link that was up, DM, or the answer to DISC: it is not up any more
+    bool unseenSetUp = false;  // numbers begin at 0 again: a SABME is missing in the trace
     bool contradictsRole = false;
     // `keepAlive`: a poll that says nothing but that the link is alive; it may be hidden if its answer
     // follows. `answers`: the number of the poll that this frame answers, if both may be hidden.
@@ -64,7 +64,7 @@ struct LinkEvent {
     Kind kind;
     Side from;            // who sent the frame that shows it, or the frames that are missing
     std::uint64_t frame;  // number of the frame that shows it
-    std::int64_t at;
+    std::int64_t at;      // nanoseconds on the D channel's clock
     Hole hole{};
     LostBy by = LostBy::unknown;
     std::uint8_t number = 0;

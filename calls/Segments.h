@@ -22,7 +22,7 @@ class Segments {
         no,         // the message is no segment
         kept,       // more segments must come
         complete,   // `message.layer3` is the whole message now, valid until the next call
-        outOfOrder  // a segment without its beginning, or one that does not follow: dropped
+        outOfOrder  // a segment without its beginning, one that does not follow, or one too many: dropped
     };
     Taken take(Message& message);
 

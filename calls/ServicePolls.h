@@ -1,5 +1,5 @@
-// SERVICE messages that only repeat what their side has said before. North American trunks poll each other
-// so.
+// Finds SERVICE messages that only repeat what their side has said before. The two ends of North American
+// trunks poll each other with them.
 #ifndef CALLS_SERVICEPOLLS_H
 #define CALLS_SERVICEPOLLS_H
 

@@ -23,7 +23,7 @@ constexpr bool isAhead(std::uint8_t number, std::uint8_t of) {
 }
 constexpr std::uint8_t after(std::uint8_t number) { return static_cast<std::uint8_t>((number + 1) & 0x7F); }
 
-// A frame as a machine takes it.
+// A frame as the state machines of links take it.
 struct Sample {
     const capture::Frame* frame;
     std::uint64_t number;  // in the input, from 1
@@ -69,10 +69,10 @@ class Stream {
     };
     struct Taken {
         Verdict verdict = Verdict::accepted;
-        bool again = false;           // its number was seen before
-        std::optional<Hole> found{};  // a hole in front of it
-        std::optional<LostBy> by{};   // who lost the frames of `found` or `decided`
-        std::optional<Hole> decided{};
+        bool again = false;             // its number was seen before
+        std::optional<Hole> found{};    // a hole in front of it
+        std::optional<LostBy> by{};     // who lost the frames of `found` or `decided`
+        std::optional<Hole> decided{};  // an earlier hole about which this frame decides
     };
 
     // Takes an I frame of this side. `recorded` is the recorder's own report that it has missed frames since
@@ -95,8 +95,8 @@ class Stream {
     std::uint8_t acknowledged() const { return acknowledged_; }
     // Whether N(R) acknowledges what this side has not sent, as far as the trace shows.
     bool isBeyond(std::uint8_t nr) const { return firm_ && isAhead(nr, next_); }
-    // N(R) further behind what was acknowledged than a repetition may repeat it. 0 may come of a SABME that
-    // the trace lacks.
+    // Whether N(R) is behind what was acknowledged, by more than a window, so that it is no repetition of an
+    // older N(R). Never for 0, which may follow a SABME that the trace lacks.
     bool isLongAcknowledged(std::uint8_t nr) const {
         constexpr unsigned widestWindow = 7;
         const unsigned behind = ahead(acknowledged_, nr);

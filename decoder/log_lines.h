@@ -31,8 +31,8 @@ constexpr std::string_view variantLine(int variant) {
     return "";
 }
 
-// A record could not be queued; an entry of the queue could not be taken; and, with their number and " \n"
-// behind it, frames that are missing here because writing had failed.
+// Lines for a record that could not be queued, and for one that could not be taken out of the queue; and the
+// beginning of "Frames Lost: N \n", which stands where N frames are missing for any reason.
 inline constexpr char enqueueFailed[] = "Enqueue Failed \n";
 inline constexpr char getFailed[] = "Get iemsg failed \n";
 inline constexpr char framesLost[] = "Frames Lost: ";

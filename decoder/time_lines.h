@@ -10,8 +10,8 @@
 namespace decoder {
 
 // Composes the empty line and both time lines, and sets `flag` for the lines that follow. `localTime` is the
-// text of a LocalTime. The time stamp counts 4 ms. Milliseconds are written without leading zeros, on
-// purpose.
+// text of a LocalTime. The time stamp counts ticks of 4 ms. Milliseconds are written without leading zeros,
+// on purpose.
 void timeLines(bool transmitted, unsigned int timestamp, std::string_view localTime);
 
 // Makes the text of a local time. Frames of the same half minute share the text but for its seconds, because

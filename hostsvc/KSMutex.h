@@ -24,7 +24,7 @@ class KSMutex {
     void unlock();
     bool tryLock();
     // Tries timeoutMs / intervalMs times with a sleep of intervalMs after each try, and then once more. An
-    // unlock during a sleep ends the wait with success. intervalMs must not be 0.
+    // unlock during a sleep ends the wait with success. If intervalMs is 0, tries only once.
     bool tryLock(unsigned timeoutMs, unsigned intervalMs);
 
   private:

@@ -20,7 +20,7 @@ class KSRemoteMsgQueue : public KSAbstractMsgQueue {
     static constexpr int retryBudget = 10;
 
     // Connects to the relay on hostName and asks it to open a queue. hostName may end with a colon and a
-    // port; without one the port is Port. desc, a and b are passed to the relay. Throws
+    // port; without one it is `port`. desc, a and b are passed to the relay. Throws
     // KSResource_CreationError when there is no relay, when it refuses, or when it has not answered within
     // five seconds.
     KSRemoteMsgQueue(NvCompDesc desc, unsigned a, unsigned b, const char* hostName);

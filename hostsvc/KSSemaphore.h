@@ -21,7 +21,7 @@ class KSSemaphore {
     void wait();  // continues to wait when a signal interrupts it
     bool tryWait();
     // Tries timeoutMs / intervalMs times with a sleep of intervalMs after each try, and then once more. A
-    // post during a sleep ends the wait with success. intervalMs must not be 0.
+    // post during a sleep ends the wait with success. If intervalMs is 0, tries only once.
     bool tryWait(unsigned timeoutMs, unsigned intervalMs);
 
   private:

@@ -44,8 +44,8 @@ class sock {
     int ready(char mode, long sec, long usec) const;
     int ready(long sec, long usec) const { return ready('r', sec, usec); }
 
-    // Return 0 when all octets have been read or written. A length below 1 is returned as it is. If the peer
-    // has closed the connection, reading returns how many octets are missing, and writing returns 0.
+    // Return 0 for success, a negative number for an error, and a length below 1 as it is. If the peer has
+    // closed, reading returns how many octets are missing; if the system takes no octet, writing returns 0.
     long readblock(void* buf, long len);
     long writeblock(const void* buf, long len);
 

@@ -102,7 +102,7 @@ class Elements {
 struct Layer3 {
     Octets octets;
     Octets header;  // discriminator, call reference, message type
-    Octets raw;  // what is not elements: a segment's piece of a message, another protocol, a damaged header
+    Octets raw;     // octets outside elements: a segment's piece, another protocol, or after a damaged header
     Elements elements;
     CallReference callReference;
     Problem problem = Problem::none;

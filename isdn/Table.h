@@ -40,7 +40,7 @@ class Names {
     constexpr Names() = default;
     template <std::size_t N>
     constexpr Names(const Name (&rows)[N])
-        : rows_(rows) {}  // NOLINT(*-explicit-*): tables name it in passing
+        : rows_(rows) {}  // NOLINT(*-explicit-*): the rows of tables convert to it
     constexpr Names(std::string_view (*function)(std::uint8_t))
         : function_(function) {}  // NOLINT(*-explicit-*)
 
@@ -171,7 +171,7 @@ struct ElementTable {
     std::string_view clause;
     std::span<const Row> rows;
     Variants variants = everywhere;
-    Test understood = {};  // the coding standard, where there is one
+    Test understood = {};  // passes if the coding standard is one whose values the rows describe
     Otherwise otherwise = Otherwise::unnamed;
 };
 

@@ -18,7 +18,7 @@ constexpr std::uint8_t bitsOf(std::uint8_t octet, unsigned high, unsigned low) {
     return static_cast<std::uint8_t>((octet & ((1U << high) - 1U)) >> (low - 1U));
 }
 
-// Whether bits of an octet have one of some values, all of them below 64. Nothing is asked while high is 0.
+// Asks whether bits of an octet have one of some values, all of them below 64. While high is 0, asks nothing.
 struct Test {
     std::string_view octet;
     std::uint8_t high = 0;
@@ -56,7 +56,7 @@ class When {
     Test next;                 // of the octet itself
     Variants variants = everywhere;
 
-    // Both conditions.
+    // Asks for both. If both conditions say something about `presence` or `next`, that of b counts.
     friend constexpr When operator&(const When& a, const When& b) {
         When both = a;
         if (b.presence != Presence::mandatory)
@@ -98,7 +98,7 @@ constexpr When ifNotZero(std::string_view octet) {
     when.seen[0].values = ~std::uint64_t{1};
     return when;
 }
-// The next octet has one of these values in these bits.
+// The octet itself, which is optional, has one of these values in these bits.
 constexpr When ifNext(unsigned high, unsigned low, std::initializer_list<unsigned> values) {
     When when = optional;
     when.next = {"", high, low, values};
@@ -110,7 +110,7 @@ constexpr When on(Variants variants) {
     return when;
 }
 
-// The octets of an element that have been read, by their labels.
+// The octets of an element that have been read, by their labels; the first 24 of them.
 class Seen {
   public:
     void add(std::string_view label, std::uint8_t octet) {

@@ -10,6 +10,8 @@ using Kind = BerType::Kind;
 using Tagging = BerMember::Tagging;
 using Words = BerMember::Words;
 
+// A member with its type's own tag; with a context tag instead of that tag (implicit); with a context tag
+// around the tagged value (explicit).
 constexpr BerMember plain(std::string_view name, const BerType& type, Words words = Words::named) {
     return {name, &type, Tagging::none, 0, words};
 }

@@ -15,15 +15,15 @@ Problem readSlotMap(const Contents& contents, Fields& fields);      // Q.931 4.5
 Problem readDiagnostics(const Contents& contents, Fields& fields);  // Q.850 table 1
 Problem readUserInformation(const Contents& contents, Fields& fields);
 
-// DISPLAY. On North American trunks an octet with bit 8 set may precede the characters, or fields of their
-// own.
+// DISPLAY. On North American trunks an octet with bit 8 set may come first, and then characters, or fields of
+// tag, length and text, which readDisplayFields reads.
 Problem readDisplay(const Contents& contents, Fields& fields);
 Problem readDisplayFields(const Contents& contents, Fields& fields);
 
 // FACILITY and EXTENDED FACILITY (Q.932 8.2).
 Problem readFacility(const Contents& contents, Fields& fields);
 
-// A message type of call control, for fields that hold one.
+// The name of a message type of call control, for fields that hold one.
 std::string_view callControlMessageName(std::uint8_t type);
 
 }  // namespace isdn

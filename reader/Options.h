@@ -58,14 +58,14 @@ enum class ExplainAs { guess, frame, element };
 struct RecordOptions {
     std::string folder = ".";
     std::uint64_t size = 0;    // octets of a file; 0: no limit
-    std::int64_t seconds = 0;  // clock-aligned; 0: no limit
+    std::int64_t seconds = 0;  // a new file at each multiple of it in local time; 0: never
     unsigned files = 0;        // how many files are kept; 0: all
-    std::int64_t span = 0;     // seconds that are kept; 0: all
+    std::int64_t span = 0;     // seconds; files that hold only what is older than this are removed; 0: none
     // Triggers: findings of this severity or a worse one, and frames that pass one of these filters.
     std::optional<calls::Severity> onCheck = std::nullopt;
     std::vector<FilterWord> onFrames;
-    std::int64_t before = 300;  // seconds that are kept in front of a trigger
-    std::int64_t after = 60;    // and behind it
+    std::int64_t before = 300;  // how many seconds before a trigger are kept
+    std::int64_t after = 60;    // how many seconds after it are kept
     unsigned keptFiles = 0;     // how many files are kept of what surrounds triggers; 0: all
 };
 
@@ -78,8 +78,8 @@ struct CallOptions {
     CallForm form = CallForm::text;
     std::string sort;                                      // empty: in the order of their end
     calls::TrunkSize trunk = calls::TrunkSize::unknown;    // of the figures; unknown: learnt
-    bool overTime = false;                                 // of the figures: what happened when
-    calls::Severity least = calls::Severity::note;         // milder findings are not shown
+    bool overTime = false;                                 // `stats` also shows what happened over time
+    calls::Severity least = calls::Severity::note;         // findings of a lower severity are not shown
     std::optional<calls::Severity> failOn = std::nullopt;  // exit status 3 for such a finding or a worse one
 };
 
@@ -92,14 +92,14 @@ struct LadderOptions {
 };
 
 struct BrowseOptions {
-    std::size_t frames = 1'000'000;  // that are kept
+    std::size_t frames = 1'000'000;  // the most frames that are kept in memory
     bool mouse = true;
 };
 
 struct RedactOptions {
     std::string key;  // the key's file; empty: a key that nobody keeps
     bool undo = false;
-    bool inReport = false;  // of a command that shows things rather than writes frames
+    bool inReport = false;  // `report` shows pseudonyms
     std::optional<unsigned> keepPrefix = std::nullopt;
     bool blankShort = false;
 };

@@ -44,11 +44,14 @@ class RecordedTrunk {
     void beginFile();
     void finish();
 
+    // Whether the last item came from this file.
     bool readsFrom(std::string_view file) const { return source_ == file; }
+    // How many frames could not be written, and how many of these the user has not been told of.
     std::uint64_t lostInAll() const { return file_.lostInAll(); }
     std::uint64_t lostUnsaid() const { return file_.lostUnsaid(); }
 
-    // How often a state that changes all the time is written: each second, or as a test sets it.
+    // The state is written at once when its list of files or its log changes. Changes of its numbers alone,
+    // which each frame makes, are written once in this time: a second, unless a test sets another.
     void writeStateEvery(std::chrono::steady_clock::duration time) { betweenStates_ = time; }
 
   private:

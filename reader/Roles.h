@@ -11,7 +11,7 @@
 namespace reader {
 
 // Frames that come before the role is known wait until a frame shows it. When a thousand items wait, and at
-// the end, they go on without a role, and a note on standard error says so.
+// the end (giveUp), they go on without a role, and a note on standard error says so.
 class Roles {
   public:
     explicit Roles(Chatter& chatter) : chatter_(chatter) {}

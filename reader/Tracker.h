@@ -23,7 +23,7 @@ class Tracker {
     // A role or a variant in the options replaces those of the frames.
     explicit Tracker(const InputOptions& options) : role_(options.role), variant_(options.variant) {}
 
-    // From now on, says once if frames have a variant that neither the options nor the input names.
+    // From now on, says once if frames are `done` ("decoded") by a variant that nobody has named.
     void tellGuessedVariant(Chatter& chatter, std::string_view done) {
         chatter_ = &chatter;
         done_ = done;
@@ -38,8 +38,8 @@ class Tracker {
     // Whether an item has come from a D channel of this name.
     bool knows(const std::string& dChannel) const { return channels_.contains(dChannel); }
 
-    // Does not read the headers of the frame; readHeaders does, on the thread that needs them. `seen` is as
-    // it was made.
+    // Numbers the item and follows its link. `seen` must be a newly made object. Does not read the headers of
+    // the frame; readHeaders does, on the thread that needs them.
     void see(const capture::Item& item, Seen& seen);
     Seen see(const capture::Item& item) {
         Seen seen;

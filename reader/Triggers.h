@@ -32,7 +32,8 @@ class Triggers : private calls::Listener {
     // Whether anything can trigger. If not, the functions below need not be called.
     bool areThere() const { return analysis_ != nullptr || !wanted_.empty(); }
 
-    // The triggers that this item is, or that it shows to have happened. Valid until the next call.
+    // Returns the triggers of this item: filters that it passes, findings that it shows. Valid until the next
+    // call.
     std::span<const Fired> look(const Seen& seen);
     // So many nanoseconds have passed without an item. Returns the triggers that this shows.
     std::span<const Fired> advance(std::int64_t nanoseconds);

@@ -16,10 +16,10 @@ struct Command {
     std::string_view words;     // the words after the options: "[FILE...]"
     std::string_view summary;   // one line
     std::string_view examples;  // "  lapdread ...\n      what it does\n"
-    OptionGroup options;        // the options that not every command has
+    OptionGroup options;        // the options of this command that not every command has
     // Returns the exit status; throws UsageError, FileError or ReaderGone.
     int (*run)(const Options&, Chatter&);
-    bool takesFilesAlone = false;  // and no store
+    bool takesFilesAlone = false;  // the command reads files and cannot read a store
 };
 
 // All commands, in the order in which --help shows them. The first is run if the command line names none.

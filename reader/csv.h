@@ -12,11 +12,11 @@ namespace reader {
 // The first line, with its line end.
 std::string_view csvHeader();
 
-// Only frames have rows; numbers are decimal, "callref" and "hex" hexadecimal. Appends a value, quoted if
-// necessary. Values that a spreadsheet would take for a formula are not changed, because numbers like "+49"
-// are data.
+// Appends a value, quoted if necessary. Values that a spreadsheet would take for a formula are not changed,
+// because numbers like "+49" are data.
 void appendCsvValue(std::string& to, std::string_view value);
 
+// Composes the row of a frame; other items have none. Numbers are decimal, "callref" and "hex" hexadecimal.
 class CsvComposer : public Composer {
   public:
     void compose(const Seen& seen, std::string& text, Piece& piece) override;

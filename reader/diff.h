@@ -1,4 +1,4 @@
-// lapdread diff: what differs between two calls, or two traces.
+// lapdread diff: shows what differs between two calls, or two traces.
 #ifndef READER_DIFF_H
 #define READER_DIFF_H
 

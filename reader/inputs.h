@@ -20,7 +20,7 @@ std::vector<std::string> inputFiles(const Options& options);
 // chosen there. Its URL may hold a password, and is left out.
 std::vector<std::string> inputNames(const Options& options);
 
-// Opens one input of any form that this program reads.
+// Opens an input. Throws capture::BadInput if it cannot be opened; next() throws that for an unknown form.
 std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOptions& input);
 
 // Opens all inputs as one stream: one after another, or in the order of time with --merge. The D channels of

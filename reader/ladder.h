@@ -1,4 +1,4 @@
-// The messages of calls as arrows between both sides.
+// lapdread ladder: shows the messages of calls as arrows between both sides.
 #ifndef READER_LADDER_H
 #define READER_LADDER_H
 

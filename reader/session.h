@@ -37,7 +37,7 @@ class Session {
     const capture::Item* firstItem();
     bool useColors() { return reader::useColors(options_.output, output()); }
 
-    // Says so once if frames are `done` ("decoded") by the rules of a variant that nobody has named.
+    // Says once if frames are `done` ("decoded") by the rules of a variant that nobody has named.
     void tellGuessedVariant(std::string_view done) { tracker_.tellGuessedVariant(chatter_, done); }
 
     // Says that the command uses only octets and times. Without filters, the links need not be followed then.

@@ -1,4 +1,4 @@
-// lapdread stats: figures of messages, causes, times, calls and channels.
+// lapdread stats: shows figures of messages, causes, times, calls and channels.
 #ifndef READER_STATS_H
 #define READER_STATS_H
 

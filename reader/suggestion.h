@@ -1,4 +1,4 @@
-// What somebody may have meant who mistyped a word.
+// Finds the name that somebody may have meant who mistyped a word.
 #ifndef READER_SUGGESTION_H
 #define READER_SUGGESTION_H
 

@@ -54,8 +54,8 @@ struct RecordState {
     std::string trunk;
     // identifies the run: microseconds since 1970 when its log was first seen; 0: none yet
     std::uint64_t run = 0;
-    std::uint64_t next = 1;     // the number of the run's next frame
-    std::uint64_t besides = 0;  // how many items that are no frames were recorded after the frame before that
+    std::uint64_t next = 1;           // the number of the run's next frame
+    std::uint64_t besides = 0;        // how many items that are no frames were recorded after the last frame
     std::optional<RecordedLog> log;   // the log that the run is read from
     std::vector<RecordedFile> files;  // the newest ones, oldest first
 };

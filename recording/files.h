@@ -12,8 +12,8 @@ namespace recording {
 // error's number.
 int writeAll(int descriptor, std::string_view text);
 
-// Writes the text to PATH.new and renames that file to PATH, so that a reader sees either the old text or the
-// new one. Returns words that say what went wrong, or nothing.
+// replaceFile writes the text to PATH.new and renames that file to PATH, so that a reader sees either the old
+// text or the new one. It returns words that say what went wrong, or nothing. When it returns:
 enum class Durability {
     whenever,  // the system has it; a power failure may bring the old text back, or leave an empty file
     onDisk     // the disk has it

@@ -111,8 +111,8 @@ class Addressable : public virtualObject {
     virtual void setErrorWaitTime(unsigned int ms) { errorWaitTime_ = ms; }
 
     // Sends cmd, waits for the reply, and reads it into ret unless that is null. If trans is 0, uses a new
-    // transaction number. Throws Timeout, UnexpectedMsg, and KSMsgRef::AllocationError when the transport has
-    // no memory.
+    // transaction number. If flags is not 0, the reply may come from any source. Throws Timeout,
+    // UnexpectedMsg, and KSMsgRef::AllocationError when the transport has no memory.
     void request(unsigned int msgType, MsgBody* cmd, unsigned int retMsgType, MsgBody* ret,
                  unsigned int trans = 0, int flags = 0);
     // Sends cmd, which has no reply, and waits for the error wait time. Throws UnexpectedMsg if any reply

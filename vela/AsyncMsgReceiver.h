@@ -13,9 +13,9 @@ namespace vela {
 class Addressable;
 class MsgQueue;
 
-// Registered with its owner's queue under the owner's target address, from the end of the most derived
-// constructor (a message may come at once) to the beginning of its destructor. The base class cannot do that,
-// so a class derived from this one is abstract until it is made as an Enrolled (see below).
+// A receiver is registered with its owner's queue, under the owner's target address, from the end of the most
+// derived constructor (a message may come at once) to the beginning of its destructor. The base class cannot
+// do that, so a class derived from this one is abstract until it is made as an Enrolled (see below).
 class AsyncMsgReceiver : public virtualObject {
   public:
     explicit AsyncMsgReceiver(Addressable* owner) : owner_(owner) {}
@@ -28,8 +28,8 @@ class AsyncMsgReceiver : public virtualObject {
 
     Addressable* owner() const { return owner_; }
 
-    // Register with the queue, and deregister. Each does nothing when that is so already. enrol throws
-    // Exception when another receiver is registered for the address.
+    // Register with the owner's queue, and deregister. Neither does anything if that was done before. enrol
+    // throws Exception when another receiver is registered for the address.
     void enrol();
     void leave();
     // Deregisters from its queue and registers with another. If that throws, as enrol does, it stays with the

@@ -28,7 +28,7 @@ struct ieMessage {
 
 struct CCSMessages : Family<CCSMessages> {
     // A trace record. Label 2 is a frame. Direction is 1 for a frame that the board transmitted, any other
-    // value for one that it received. Timestamp counts 4 ms. Length is in octets; List may hold fewer.
+    // value for one that it received. Timestamp is in ticks of 4 ms, Length in octets; List may hold fewer.
     // clang-format off
     struct EvtL2Trace_t : Body<2, rows::EvtL2Trace> { using Body::Body; };
     // A call-control message: a call, and its private and public information elements. After reading, the

@@ -1,4 +1,4 @@
-// The address of one component instance, and the attributes that instances are searched by.
+// The address of one component instance.
 #ifndef VELA_COMPDESC_H
 #define VELA_COMPDESC_H
 
@@ -31,7 +31,7 @@ class CompDesc_t : public MsgBody {
     unsigned char Board = 0;
     unsigned char Processor = 0;
     unsigned char Component = 0;
-    unsigned char Node = 0;  // the host; boards have node 0
+    unsigned char Node = 0;  // 0 for components of a board; the library chooses that of a host queue
 };
 
 }  // namespace vela

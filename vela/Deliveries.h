@@ -35,8 +35,8 @@ class Deliveries {
         const OnThisThread* outer_;
     };
 
-    void awaitAll();
-    void awaitFor(const void* object);
+    void awaitAll();                    // waits until every delivery has ended
+    void awaitFor(const void* object);  // waits until those of one object have ended
 
   private:
     template <typename Count, typename Concerns>

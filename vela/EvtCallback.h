@@ -36,9 +36,9 @@ class EvtCallback : public AsyncMsgReceiver {
     // continues in the dispatcher afterwards.
     ~EvtCallback() override { end(); }
 
-    // Stops receiving, and returns when every delivery has ended, also those that wait in their lanes, but
-    // not one that runs on this thread. The callbacks that it waits for may still register and cancel.
-    // Reports that wait are dropped, and the standard error stream says how many.
+    // Stops receiving. Drops the messages that wait for the unregistered handlers, and says on the standard
+    // error stream how many. Then waits until every other delivery has ended, also those in lanes, except for
+    // one on this thread. The callbacks that it waits for may still register and cancel.
     void end();
 
     // Any thread may register; it waits for no callback. A callback that is registered twice runs twice. Each

@@ -42,8 +42,8 @@ class Lane {
     std::unique_ptr<Delivery> spare();
 
     // These three are called in the order of arrival, by one thread at a time. add takes a delivery over,
-    // which then gets a thread or waits. Throws when a thread cannot be made; the delivery that was to get
-    // the thread is lost.
+    // which then gets a thread or waits. Throws Thread::CreationError when the system refuses the thread, and
+    // std::bad_alloc; the delivery that was to get the thread is then lost and counted.
     void add(std::unique_ptr<Delivery> delivery);
     // Runs the delivery on the calling thread at once.
     void runHere(std::unique_ptr<Delivery> delivery);

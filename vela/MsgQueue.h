@@ -43,7 +43,7 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
         unsigned int timeoutMs_;
     };
 
-    // The reply was an error. The exception owns the message; its copies share it.
+    // The reply was an error or of another type. The exception owns the message; its copies share it.
     class ErrorMsg : public Exception {
       public:
         ErrorMsg(MsgQueue* queue, std::unique_ptr<Msg> msg) : queue_(queue), msg_(std::move(msg)) {}
@@ -66,9 +66,9 @@ class MsgQueue : public virtualObject, public Shared, public KSAsyncMsgReceiver 
 
     CompDesc_t getHostDesc() const;
 
-    // Sends cmd, takes it over, and waits up to timeoutMs for the reply with its transaction. The caller owns
-    // the returned message. Returns null when no reply came and none was expected (retMsgType 0). Throws
-    // Timeout, ErrorMsg.
+    // Sends cmd, takes it over, and waits up to timeoutMs for the reply with its transaction, from cmd's
+    // target or, if flags is not 0, from any source. The caller owns the returned message. Returns null when
+    // no reply came and none was expected (retMsgType 0). Throws Timeout, ErrorMsg.
     Msg* request(Msg* cmd, unsigned int timeoutMs, unsigned int retMsgType, int flags = 0);
 
     // Registers the receiver for messages from this source. The queue does not own it. Throws Exception when

@@ -38,7 +38,7 @@ class ResourceMgr : public WithBodies<Addressable, ResourceMgrMessages> {
     // Commands, each with its fields; WithBodies::send sends a prepared one. All throw Timeout, and
     // UnexpectedMsg, also when nothing is found. StdResource.h describes what they have in common.
 
-    // Finds the first component with this type (0: any) and these attributes.
+    // Finds the first component, from this processor and instance on, of this type (0: any) and attributes.
     StdResource find(unsigned char compType, unsigned char processor, unsigned short instance,
                      staticList<CompAttr_t> attributes, Wait wait = {});
 
@@ -57,7 +57,7 @@ class ResourceMgr : public WithBodies<Addressable, ResourceMgrMessages> {
                          staticList<CompAttr_t> attributes, Wait wait = {});
     void free(CompDesc_t instance, Wait wait = {}) { command(CompInstFree_t(instance), nullptr, wait); }
 
-    // Marks components as in use, each with a word of the caller's choice, or as no longer in use.
+    // Marks components as in use, each with a number of the caller's choice, or as no longer in use.
     void use(staticList<CompUse_t::List_t>& uses, Wait wait = {}) { command(CompUse_t(uses), nullptr, wait); }
     void use(const CompDesc_t& component, unsigned int payload, Wait wait = {});
     void unuse(staticList<CompUnuse_t::List_t>& uses, Wait wait = {}) {

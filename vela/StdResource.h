@@ -23,7 +23,7 @@ class StdResource : public WithBodies<Addressable, StdResourceMessages> {
 
     // NOLINTNEXTLINE(bugprone-virtual-near-miss): programs call both names
     void msgQueueAttach(MsgQueue* queue) { MsgQueueAttach(queue); }
-    // Requests to the board's resource manager: mark the component as in use, with a word of the caller's
+    // Requests to the board's resource manager: mark the component as in use, with a number of the caller's
     // choice; mark it as no longer in use; give an allocated instance back. Throw Timeout, UnexpectedMsg.
     // They are virtual, so that an Instance remembers what was done through a reference to this base class.
     virtual void use(unsigned int payload);
