@@ -58,14 +58,14 @@ struct Analysis::Channel {
         linkFindings.restarted();
         group.boardRestarted();
     }
-    // A frame that carries a message.
+    // Takes a frame that carries a message.
     void take(const Message& message, const Timers& timers) {
         if (links.marks().accepted.value_or(false))
             accept(message, timers);
         else
             carriers.take(message, links.marks(), group.table(), group.carried());
     }
-    // A frame that the receiver's layer 2 hands up.
+    // Takes a frame that the receiver's layer 2 hands up.
     void accept(Message message, const Timers& timers) {
         WitnessKeeper& keeper = keepers[message.layer2.tei];
         Segments& pieces = segments[message.layer2.tei];

@@ -28,7 +28,7 @@ std::string nameOf(const Message& message) {
     return name.empty() ? "message " + std::to_string(message.layer3.type) : std::string(name);
 }
 
-// Causes by which one side tells the other that it did not understand (Q.850 2.2.7), and how bad that is.
+// The causes by which one side says that it did not understand a message (Q.850 2.2.7), and their findings.
 const FindingKind* protocolFinding(std::uint8_t cause) {
     switch (cause) {
         case invalidReference:
@@ -196,7 +196,7 @@ void CallFindings::replaced(Call& old, Call& by, const Message& message) {
     std::string sentence = nameOf(message) + " takes the reference of call " + std::to_string(old.number) +
                            ", which had not ended";
     if (old.lack == Lack::board)
-        return;  // that was said
+        return;  // board-restarted has been reported
     if (old.lack == Lack::frames)
         report(findings::cannotBeTold, &by, message,
                sentence + " as far as the trace shows: frames are missing");

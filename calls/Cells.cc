@@ -45,7 +45,7 @@ void putCalls(std::map<std::uint32_t, Cells>& groups, const Analysis& analysis) 
     }
 }
 
-// What RESTART and SERVICE say counts more than an idle channel, and less than a call.
+// Marks the channels that are being restarted, and those that are out of service and that no call has.
 void putService(Cells& cells, std::uint32_t group, const Analysis& analysis) {
     for (auto& [key, cell] : cells) {
         const ChannelService service = analysis.serviceOf(group, key);

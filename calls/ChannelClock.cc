@@ -15,7 +15,7 @@ constexpr std::int64_t ticksOutOfOrder =
 constexpr std::int64_t latest =
     std::numeric_limits<std::int64_t>::max() - std::int64_t{10} * 366 * 86400 * 1'000'000'000;
 
-// From one time to a later one; the longest time there is if it is longer than that.
+// The time from one moment to a later one, at most the longest time that the number can hold.
 std::int64_t timeBetween(std::int64_t from, std::int64_t to) {
     std::int64_t passed = 0;
     return __builtin_sub_overflow(to, from, &passed) ? std::numeric_limits<std::int64_t>::max() : passed;

@@ -74,7 +74,7 @@ void Channels::setUp(Call& call, Seizure& seizure, const Message& message) {
     hunt(call, seizure, message);
 }
 
-// Once a call, whether SETUP or the answer takes the channel.
+// Reports, once for each call, that SETUP or the answer takes a channel that is out of service.
 void Channels::checkService(const Call& call, Seizure& seizure, const std::vector<ChannelKey>& channels,
                             const Message& message) {
     for (const ChannelKey& key : channels) {
@@ -149,7 +149,7 @@ void Channels::findDoubleSeizure(const Call& call, const ChannelKey& key, State&
     for (const std::uint64_t holder : holders) {
         const auto found = seizures_.find(holder);
         if (found == seizures_.end() || found->second.glare == call.number)
-            continue;  // said as glare
+            continue;  // reported as glare
         std::string sentence = "channel " + toString(key) + " is given to " + callName(call.number) +
                                " while " + callName(holder) + " holds it";
         if (found->second.call->lack == Lack::nothing) {

@@ -9,7 +9,7 @@ namespace calls {
 
 namespace {
 
-constexpr std::size_t mostChannels = 512;  // that are named
+constexpr std::size_t mostChannels = 512;  // the most channels that a finding names
 
 }  // namespace
 

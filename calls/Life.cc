@@ -26,8 +26,8 @@ void learnNumber(Number& number, const Element& found) {
         number = numberOf(*party);
 }
 
-// The digits of the called party come in SETUP and, one by one, in INFORMATION: each time in CALLED PARTY NUM
-// or else in KEYPAD. The first of the former gives type and plan.
+// The digits of the called party come in SETUP and, one by one, in INFORMATION: each time in CALLED PARTY
+// NUM, or else in KEYPAD. The first CALLED PARTY NUM gives type and plan.
 void learnDigits(Life& life, const Message& message) {
     Call& call = life.call;
     const isdn::Layer3& layer3 = message.layer3;
@@ -73,7 +73,8 @@ void learnChannel(Life& life, const Message& message) {
     if (!channel)
         return;
     Call& call = life.call;
-    // A connection on the D channel itself; "no channel" alone is a call that waits for one.
+    // The D-channel indicator says that the connection has no B channel. "No channel" alone is a call that
+    // waits for one.
     if (channel->dChannel && channel->channels.none())
         call.kind = Kind::signalling;
     if (message.layer3.type == type::retrieveAcknowledge || message.layer3.type == type::resumeAcknowledge)

@@ -1,4 +1,4 @@
-// What should have happened on a link by some moment, and has not.
+// The part of LinkWatch that finds what should have happened on a link by some moment, and has not.
 #include <algorithm>
 
 #include "calls/FindingKinds.h"

@@ -7,7 +7,7 @@ namespace {
 constexpr std::array<std::string_view, linkNewsKinds> names{
     "start", "frames lost", "poll unanswered", "FRMR", "down", "DISC", "SABME", "up", "set-up not seen"};
 
-// What a frame tells, the most telling first.
+// The event that a frame shows. If it shows several, the first of these tests decides.
 std::optional<LinkNews> newsOf(const isdn::Layer2& frame, const Marks& marks) {
     if (marks.linkUp)
         return LinkNews::up;

@@ -19,7 +19,8 @@ constexpr std::size_t mostHistories = 4096;
 constexpr std::int64_t stormWindow = 600 * second;
 constexpr std::size_t stormAbove = 3;
 constexpr std::int64_t servicePatience = 120 * second;
-// A storm passes over the channels one after another; those that it reaches within this time are told as one.
+// A storm passes over the channels one after another. Channels that it reaches within this time share one
+// finding.
 constexpr std::int64_t stormPasses = 10 * second;
 constexpr std::int64_t never = std::numeric_limits<std::int64_t>::max();
 constexpr std::uint32_t wholeInterface = 1000;  // stands for a restart of class 6 or 7 among channel numbers

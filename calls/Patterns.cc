@@ -14,7 +14,7 @@ namespace {
 
 constexpr std::size_t callsThatEndTogether = 3;
 constexpr std::size_t callsOfOneLength = 5;
-// Among more calls than these, five would have the same length by chance.
+// With more calls than these, five would have the same length by chance.
 constexpr std::size_t durationsCompared = 30;
 constexpr std::int64_t shortestLength = 10 * second;
 constexpr std::int64_t lengthTolerance = second / 2;
@@ -87,7 +87,7 @@ bool Patterns::endsWithLink(const Call& call) const {
     return soon && !ordinary && call.endedBy != EndedBy::suspended && call.endedBy != EndedBy::replaced;
 }
 
-// What was reported of the link when it went down, or since.
+// The findings that were reported of the link when it went down, or since then.
 std::string Patterns::faultsOfLink() const {
     std::vector<std::string> words;
     for (const LinkFault& fault : faults_) {

@@ -10,7 +10,7 @@ namespace {
 constexpr std::int64_t minute = 60 * second;
 constexpr std::int64_t hour = 60 * minute;
 constexpr std::int64_t day = 24 * hour;
-// Each is a multiple of the one before.
+// The widths of steps. Each is a multiple of the one before, so that steps can be put together.
 constexpr std::array widths{second,      5 * second, 15 * second, minute, 5 * minute,
                             15 * minute, hour,       6 * hour,    day};
 
@@ -29,7 +29,7 @@ void UseOverTime::set(const Moment& moment, unsigned inUse) {
     clock_ = moment.clock;
     since_ = moment.time;
     inUse_ = inUse;
-    // What begins and ends at one moment has been in use as well.
+    // A use that begins and ends at one moment still counts in the greatest number at once.
     count(clock_, since_, since_);
 }
 

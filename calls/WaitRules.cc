@@ -34,7 +34,7 @@ const std::vector<Waits::Rule>& Waits::rules() {
          .sameSideAnswers = true, .progressStops = true,
          .timer = "T310", .user = &T::t310User, .network = &T::t310Network,
          .finding = &findings::proceedingUnanswered},
-        // To clear is what a side does about a user that never answers; only to wait on is worth a note.
+        // Clearing a call that nobody answers is normal. Only a wait beyond the timer is worth a note.
         {.ask = type::alerting, .asker = unknown, .answers = typesOf({type::connect}),
          .sameSideAnswers = true, .waitingSideGivesUp = false,
          .timer = "T301", .user = &T::t301, .network = &T::t301,

@@ -96,7 +96,7 @@ Waits::Effect Waits::effectOf(const Wait& wait, const Message& message) const {
         return Effect::restarts;
     if (!isClearing(messageType))
         return Effect::none;
-    // Its sender goes on from DISCONNECT to RELEASE. It may do so at any time, without an answer.
+    // The sender of DISCONNECT goes on to RELEASE, which it may do at any time without an answer.
     const bool goesOn = rule.ask == type::disconnect && messageType == type::release;
     if (!rule.clearingAnswers && !goesOn)
         return Effect::none;

@@ -12,7 +12,7 @@ void WitnessKeeper::take(const DChannel& channel) {
         witness_.lastDown = sample.at;
     witness_.up = isUp;
     for (const LinkEvent& event : channel.events()) {
-        // What the line has lost is sent again.
+        // Frames that the line has lost do not count, because they are sent again.
         if (event.kind == LinkEvent::Kind::hole && event.by != LostBy::line)
             witness_.lastHole[indexOf(event.from)] = sample.at;
     }

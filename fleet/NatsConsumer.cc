@@ -8,7 +8,7 @@ namespace {
 
 using OwnedConsumerInfo = NatsOwned<jsConsumerInfo, jsConsumerInfo_Destroy>;
 
-// The messages of a list that is given back to the library.
+// Gives the messages of the library's list back to it at the end.
 struct MessageList {
     natsMsgList list{};
     MessageList() = default;
@@ -101,7 +101,7 @@ NatsConsumer::NatsConsumer(NatsConnection& connection, const ConsumerRules& rule
     handle_->connection = &connection;
     handle_->rules = rules;
     makeConsumer(jetStream, rules);
-    // Bound to the consumer, the library does not delete it when it is done.
+    // A subscription that is bound to an existing consumer does not delete the consumer at its end.
     jsSubOptions bound;
     jsSubOptions_Init(&bound);
     bound.Stream = rules.stream.c_str();

@@ -19,7 +19,7 @@ constexpr unsigned version = 1;
 constexpr std::uint64_t mostNumber = std::numeric_limits<std::int64_t>::max();  // what the store can hold
 constexpr std::int64_t latest = 7'258'118'399'000'000'000;                      // the end of the year 2199
 
-// A character that no text may have: the store cannot hold it.
+// The character that no text of a parcel may contain, because the store cannot hold it.
 constexpr char forbidden = '\0';
 
 bool hasOctets(Kind kind) { return kind == Kind::frame || kind == Kind::cut; }
@@ -195,7 +195,7 @@ ParcelGap gapIn(const json& from) {
             members.text("why", Parcel::longestText)};
 }
 
-// What holds between the parts.
+// Checks the rules between several members of a parcel.
 void check(const Parcel& parcel) {
     std::uint64_t next = 1;
     for (const ParcelGap& gap : parcel.gaps) {

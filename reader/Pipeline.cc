@@ -23,7 +23,7 @@ constexpr std::chrono::milliseconds longestWait{500};
 // that.
 constexpr std::chrono::seconds recorderMayLag{2};
 
-// Where links are left alone nobody asks for headers either.
+// If links are not followed, nobody needs headers either.
 void composeChunk(Chunk& chunk, const Filter& filter, Composer& composer, bool readsHeaders) {
     for (std::size_t i = 0; i < chunk.size(); ++i) {
         Seen& seen = chunk.seen()[i];
@@ -119,7 +119,7 @@ class Run {
         }
     }
 
-    // Of several exceptions the first is kept. What was read before it goes on all the same.
+    // Keeps the first of several exceptions. What was read before it is still handed on.
     template <class Act>
     static void attempt(std::exception_ptr& thrown, Act act) {
         try {
@@ -208,7 +208,8 @@ class Run {
             lookForPolls(chunk, chunk.add(*seen));
     }
 
-    // What was held back goes on, and of what was held at the gate as much as is wanted. No thread is left.
+    // Hands on the items that were held back, and of those at the gate as many as are wanted. Called when no
+    // other thread is left.
     void handOnRest(Chunk& chunk, Composer& composer) {
         chunk.clear();
         std::swap(chunk, heldBack_);
@@ -224,7 +225,7 @@ class Run {
         composeChunk(chunk, filter_, composer, tracker_.followsLinks());
     }
 
-    // Nothing has come: time goes on by this host's clock.
+    // Called while nothing comes: tells the consumer how much time has passed on this host's clock.
     void passTime() {
         if (!work_.clockRuns)
             return;
@@ -258,7 +259,7 @@ class Run {
         begun_ = true;
     }
 
-    // Nothing goes on behind what was the last that is wanted, or behind a failure.
+    // Hands on nothing after the last piece that is wanted, or after a failure.
     void handOn(Chunk& chunk, bool flushes) {
         if (isFull_ || failure_ != nullptr)
             return;

@@ -41,7 +41,7 @@ class Help : public CLI::Formatter {
                std::string(command == nullptr ? "" : command->words) + "\n";
     }
 
-    // Without the options that exclude this one: whoever gives both is told so.
+    // Help does not list the options that exclude this one: an error message names them if both are given.
     std::string make_option_opts(const CLI::Option* option) const override {
         const std::string form = CLI::Formatter::make_option_opts(option);
         return form.substr(0, form.find(" Excludes:"));
@@ -185,7 +185,7 @@ void addFilters(CLI::App& app, Options& options) {
     }
 }
 
-// Counts rather than chooses, so that it is no row of the filters.
+// --first counts frames instead of choosing them, so it is not among the rows of the filters.
 constexpr std::string_view countingFilter = "--first";
 
 void addNegatedCount(CLI::App& app, Options& options) {
@@ -243,7 +243,7 @@ bool asksAboutAll(const std::string& word) {
     return word == "-h" || word == "--help" || word == "-V" || word == "--version";
 }
 
-// A file is what exists, or what is like no command.
+// Throws UsageError for a word that is like the name of a command and is not the name of a file.
 void checkNoMistypedCommand(const std::string& word) {
     if (word.find_first_not_of("abcdefghijklmnopqrstuvwxyz") != std::string::npos)
         return;
@@ -289,7 +289,7 @@ void showDescription(const std::function<void(const CLI::App&)>& visit) {
 
 CommandLine parseCommandLine(std::vector<std::string> words) {
     words = joinNegations(withCommand(std::move(words)));
-    std::reverse(words.begin(), words.end());  // as CLI11 takes them
+    std::reverse(words.begin(), words.end());  // CLI11 takes the words from the end
     CommandLine line;
     CLI::App app(about, "lapdread");
     describe(app, line.options);

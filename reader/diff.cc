@@ -19,8 +19,9 @@ namespace {
 
 constexpr std::size_t mostMessages = 50'000;
 
-// A file, or one call in a file: "day.pcapng#3" is the call that `lapdread calls day.pcapng` numbers 3. Of a
-// store, D channels take the place of files; "#3" alone is of those that --trunk and --site choose.
+// A file, or one call in a file: "day.pcapng#3" is the call that `lapdread calls day.pcapng` numbers 3. With
+// a store, the name of a D channel stands for the file; "#3" alone means those that --trunk and --site
+// choose.
 struct Operand {
     std::string name;
     std::optional<std::uint64_t> call;

@@ -53,7 +53,7 @@ FigureTable links(const calls::LinkHistory& history) {
                        {"ups", "set up"},
                        {"downs", "ended"}}};
     for (const auto& [link, standing] : history.links()) {
-        // What the trace has not seen beginning has been so for longer.
+        // A state whose beginning is not in the trace has lasted longer than the trace shows.
         const bool isSeen = standing.state != calls::LinkState::up || standing.sawSetUp;
         const std::string since = instant(standing.since);
         table.rows.push_back({link.first, std::to_string(link.second), std::string(nameOf(standing.state)),

@@ -72,8 +72,8 @@ class Recorder : public Consumer {
             trunk.flush();
     }
 
-    // Tells of each frame that was lost, unless that was done when writing worked again. Returns false if any
-    // was lost.
+    // Finishes all files. Reports how many frames were lost, apart from those that were reported before.
+    // Returns false if any frame was lost.
     bool finish() {
         roles_.giveUp([&](const capture::Item& item) { record(item); });
         std::uint64_t lost = 0;

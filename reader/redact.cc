@@ -44,8 +44,8 @@ const Form& formOf(const Options& options) {
     throw UsageError("redact needs --to FORM, since the input's own form cannot be seen or written");
 }
 
-// Refuses inputs that were redacted with another key. What they say about it stands before their first frame.
-// Of pipes only the first one can be asked in advance, because a pipe can be read only once.
+// Refuses inputs that were redacted with another key, which they name before their first frame. A pipe can be
+// read only once, so of several pipes only the first is looked at in advance.
 void checkKeys(Session& session, const Options& options, const Key& key) {
     for (const std::string& file : inputFiles(options)) {
         std::error_code ignored;

@@ -22,7 +22,7 @@ std::atomic<bool> stopped = false;
 void stopOnSignals() {
     struct sigaction action {};
     action.sa_handler = [](int) { stopped = true; };
-    action.sa_flags = static_cast<int>(SA_RESETHAND);  // and no SA_RESTART: a read that waits returns
+    action.sa_flags = static_cast<int>(SA_RESETHAND);  // without SA_RESTART, so a read that waits returns
     for (const int signal : {SIGINT, SIGTERM})
         sigaction(signal, &action, nullptr);
 }
@@ -107,7 +107,7 @@ void Session::tellWhatWasNotFound(const Outcome& outcome, const CallGate* gate) 
     else if (isNothing && !filter_.isEmpty())
         chatter_.note("no frame passes the filters; frames: " + std::to_string(tracker_.frames()));
     if (!options_.input.store.empty())
-        return;  // there a standby may have said nothing
+        return;  // the groups are the store's, and a standby D channel may have said nothing
     for (const std::vector<std::string>& group : options_.calls.groups) {
         for (const std::string& name : group) {
             if (!tracker_.knows(name))

@@ -36,7 +36,7 @@ void Redactor::expect(std::uint64_t number) {
 
 void Redactor::heard(const calls::Message& message, const calls::Call* call) {
     if (message.number != expected_) {
-        mayMiss();  // it was accepted late because frames before it are missing
+        mayMiss();  // the frame was accepted late, because frames before it are missing
         return;
     }
     heard_.isAccepted = true;

@@ -17,14 +17,14 @@ using isdn::Element;
 using isdn::Octets;
 namespace element = isdn::element;
 
-// Octets behind the last action indicator belong to nothing. A terminal may have two; if none of more says
-// that it is the last, the first is taken for it.
+// Blanks the octets after the last action indicator. There are at most two of them; if neither the first nor
+// the second says that it is the last, only the first is kept.
 void planTeiMessage(Octets information, PlanBuilder& to) {
     constexpr std::uint8_t teiManagement = 0x0F;
     constexpr std::size_t header = 4, most = 2;
     const isdn::TeiMessage message = isdn::parseTeiMessage(information);
     if (message.entity != teiManagement || isdn::teiMessageName(message.type).empty()) {
-        // The type stays unknown.
+        // The type becomes FF, which is unknown as well.
         to.blank(behind(information, 1), 0, message.entity == teiManagement ? allBits : std::uint8_t{0});
         return;
     }
@@ -34,8 +34,9 @@ void planTeiMessage(Octets information, PlanBuilder& to) {
     to.blank(behind(information, header + (ends ? message.actions.size() : 1)));
 }
 
-// Q.921 5.8.5: the rejected control field, V(S) with a bit 0, V(R) with C/R, four bits that say why. What has
-// another form keeps it.
+// Keeps a frame reject in the standard's form (Q.921 5.8.5): the rejected control field, V(S) with a bit that
+// is 0, V(R) with C/R, and four bits that say why. Blanks any other one, in such a way that its form stays
+// wrong.
 void planFrameReject(Octets information, PlanBuilder& to) {
     constexpr std::size_t size = 5, sent = 2, why = 4;
     const bool isSound =
@@ -60,7 +61,7 @@ constexpr LinkParameter linkParameters[] = {
     {10, 1},  // repetitions
 };
 
-// Identifier, length and value, again and again. False if a length is wrong.
+// Calls take(identifier, value) for each parameter. Returns false if a length is wrong.
 template <typename Take>
 bool forEachParameter(Octets octets, Take take) {
     constexpr std::size_t header = 2;
@@ -83,8 +84,8 @@ void planParameter(std::uint8_t id, Octets value, PlanBuilder& to) {
         to.blank(value);
 }
 
-// Groups of ISO/IEC 8885: the parameters of the link stay; user data (FF) has no length. Of a group with a
-// wrong length, its own or one within it, the identifier alone stays, and so of all that follows.
+// Keeps the parameters of the link in groups of ISO/IEC 8885, and blanks user data (FF), which has no length.
+// Keeps only the identifier of a group that has or contains a wrong length, and blanks everything after it.
 void planIdentification(Octets information, PlanBuilder& to) {
     constexpr std::uint8_t generalPurpose = 0x82, ofLink = 0x80;
     constexpr std::size_t header = 3;
@@ -106,7 +107,7 @@ void planIdentification(Octets information, PlanBuilder& to) {
     to.blank(behind(rest, 1));
 }
 
-// The element that holds digits as the caller dials them: the called number if it has any, else the keypad.
+// The element with the digits that the caller dials: the called number if it has digits, else the keypad.
 Element dialledIn(const isdn::Layer3& message) {
     const bool dials = message.discriminator == isdn::callControl && !message.national &&
                        (message.type == isdn::message::setup || message.type == isdn::message::information);
@@ -120,7 +121,7 @@ Element dialledIn(const isdn::Layer3& message) {
 
 void planMessage(Octets octets, PlanBuilder& to) {
     const isdn::Layer3 message = isdn::parseLayer3(octets);
-    // Trunks use call references of one octet or two. Behind the length of a longer one nothing is sure.
+    // Trunks use call references of one or two octets. A longer one, and all after it, is not trusted.
     constexpr std::size_t longestReference = 2, lengthOfReference = 2;
     if (message.callReference.length > longestReference) {
         to.blank(behind(octets, lengthOfReference));
@@ -129,7 +130,7 @@ void planMessage(Octets octets, PlanBuilder& to) {
     if (message.callReference.octets.size() < message.callReference.length)
         to.blank(message.callReference.octets);
     const Element dialled = dialledIn(message);
-    Octets doubtful;  // from the first octet on that a wrong length may have put there
+    Octets doubtful;  // all octets from the first one that a wrong length may have put at its place
     bool isTruncated = false;
     for (const Element& each : message.elements) {
         planElement(each, message, dialled, to);
@@ -140,8 +141,8 @@ void planMessage(Octets octets, PlanBuilder& to) {
         doubtful = behind(octets,
                           (isUnknown ? to.placeOf(each.octets) : to.endOf(each.octets)) - to.placeOf(octets));
     }
-    // A message that ends within an element has a wrong length somewhere: that of the last element, or that
-    // of one before it, so that digits are taken for elements. It still ends within an element then.
+    // If a message ends within an element, a length is wrong: that of the last element, or of one before it,
+    // so that digits are taken for elements. The blanked message must still end within an element.
     if (isTruncated && !doubtful.empty()) {
         constexpr std::uint8_t ofNoElement = 0x7F;
         to.dropFrom(doubtful);
@@ -149,7 +150,7 @@ void planMessage(Octets octets, PlanBuilder& to) {
         to.blank(behind(doubtful.first(std::min<std::size_t>(doubtful.size(), 2)), 1), 0, allBits);
         to.blank(behind(doubtful, 2));
     }
-    // A call reference whose length is wrong keeps its length octet, which says so.
+    // Keep the length octet of a call reference even if it is wrong, so that the error can still be seen.
     const bool wrongLength = message.problem == isdn::Problem::invalid;
     to.blank(behind(message.raw, wrongLength ? 1 : 0));
 }

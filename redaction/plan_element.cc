@@ -1,5 +1,5 @@
-// Which octets of an element name a person. What stays are codes that a table of the standards names, as long
-// as the standard lets them be.
+// Decides which octets of an element are replaced. Only codes that a table of the standards names are kept,
+// and only if they are no longer than the standard allows.
 #include <algorithm>
 #include <array>
 #include <iterator>
@@ -21,19 +21,19 @@ using isdn::Octets;
 using isdn::Variant;
 namespace element = isdn::element;
 
-constexpr std::uint8_t tooLong = 0xFF;  // set in a length that is too long, it stays so
+constexpr std::uint8_t tooLong = 0xFF;  // replaces a length that is too long, so that it still is
 
 bool isDigit(std::uint8_t octet) {
     const unsigned character = octet & 0x7FU;  // bit 8 may be a parity
     return character >= '0' && character <= '9';
 }
 
-// Fields that name nobody as long as they are no longer than their standard has them, in octets. Of other
-// fields of characters, or that no table describes, nothing stays; other fields have one octet.
+// The fields of several octets that may be kept, and how many octets the standard allows them. Other fields
+// of characters, and fields that no table describes, are blanked; all other fields have one octet.
 struct Limit {
     enum class Beyond : std::uint8_t {
-        all,   // a longer field is another thing
-        rest,  // what is behind the limit is
+        all,   // a field that is too long is blanked as a whole
+        rest,  // its octets after the limit are blanked
     };
 
     std::string_view field;
@@ -45,7 +45,7 @@ constexpr Limit limits[] = {
     {"timer", 3, Limit::Beyond::rest},     // "303"; some equipment adds characters
     {"charges", 5, Limit::Beyond::all},    // fewer than the digits of a number
     {"slot map", 4, Limit::Beyond::rest},  // of 2048 kbit/s
-    {"element", 2, Limit::Beyond::rest},   // that a cause is about
+    {"element", 2, Limit::Beyond::rest},   // elements that the diagnostic of a cause names
     {"interface", 2, Limit::Beyond::rest}, {"channel number", 31, Limit::Beyond::rest},
 };
 
@@ -57,7 +57,7 @@ const Limit* limitOf(std::string_view field) {
 // How many octets of each field with a limit have been seen. A field of one octet may repeat itself.
 class Counted {
   public:
-    // How many octets of the field stay.
+    // How many octets of the field are kept.
     std::size_t keptOf(const Field& field) {
         const Limit* const limit = limitOf(field.name);
         const bool hasNoTable = field.kind == Field::Kind::text || field.kind == Field::Kind::raw;
@@ -68,7 +68,8 @@ class Counted {
         seen += field.at.size();
         const std::size_t size = field.at.size();
         const std::size_t kept = size <= left ? size : limit->beyond == Limit::Beyond::all ? 0 : left;
-        // Carriers, timers and charges are digits; octets that are none may be digits of four bits.
+        // Carriers, timers and charges consist of digits. Octets that are no digits may be digits of four
+        // bits.
         return hasNoTable && !std::ranges::all_of(field.at.first(kept), isDigit) ? 0 : kept;
     }
 
@@ -88,7 +89,7 @@ bool mayBeDialled(const Element& each) {
     return each.codeset == 0 && (each.id == element::calledNumber || each.id == element::keypad);
 }
 
-// The bits of its octet that are not the field's; none of a field of several octets.
+// The bits of the field's octet that belong to other fields; none if the field has several octets.
 std::uint8_t bitsBeside(const Field& field) {
     if (field.at.size() != 1)
         return 0;
@@ -96,8 +97,8 @@ std::uint8_t bitsBeside(const Field& field) {
     return static_cast<std::uint8_t>(~(upTo & ~below));
 }
 
-// Blanks a field of an element so that what is around it is read as before: bit 8 says where a group ends,
-// other bits of an octet are other fields, and in a display a length that is too long must stay so.
+// Blanks a field in such a way that its neighbours are read as before: keeps bit 8, which may end a group,
+// and bits that belong to other fields. In a display a length that is too long stays too long.
 void blankDoubtful(const Field& field, const Element& each, PlanBuilder& to) {
     if (field.kind == Field::Kind::extension)
         return;
@@ -111,7 +112,7 @@ Treatment treatmentOf(const Field& field, const Element& each, bool isOpen) {
         const bool isNumber = isdn::partyNumber(each) || (each.codeset == 0 && each.id == element::keypad);
         return isNumber ? Treatment::number : Treatment::text;
     }
-    // Bit 8 of a pseudonym would end the group elsewhere.
+    // Bit 8 of a pseudonym could end the group at another octet.
     return isOpen ? Treatment::blank : Treatment::octets;
 }
 
@@ -122,22 +123,22 @@ bool isOfCodes(const isdn::ElementTable& table) {
     });
 }
 
-// Looks for digits in an element that consists of codes, where no code is one: three in a row, and all behind
-// them, came there by a wrong length.
+// Looks for digits in an element that consists of codes. Three octets in a row that are digits show that a
+// wrong length has put them, and all after them, into the element.
 class DigitsAmongCodes {
   public:
     static constexpr std::size_t telling = 3;
 
     explicit DigitsAmongCodes(Octets contents) : contents_(contents) {}
 
-    // The fields of an element in their order, as long as they are not doubtful. True once there are so many.
+    // Takes the fields of an element in order, up to the first doubtful one. Returns true at the third digit.
     bool take(const Field& field) {
         if (field.at.data() != last_)
             run_ = isDigit(field.at[0]) ? run_ + 1 : 0;
         last_ = field.at.data();
         return run_ == telling;
     }
-    // The first of them, and all behind it.
+    // The octets from the first of these digits to the end.
     Octets found() const {
         const auto at = static_cast<std::size_t>(last_ - contents_.data());
         return contents_.subspan(at + 1 - telling);
@@ -149,7 +150,7 @@ class DigitsAmongCodes {
     std::size_t run_ = 0;
 };
 
-// Elements of one octet that no table knows, or whose value has no name. A shift stays, whatever it says.
+// Blanks an element of one octet if no table knows it or its value has no name. Shifts are kept.
 void planSingleOctet(const Element& each, PlanBuilder& to) {
     if (each.shift())
         return;
@@ -177,7 +178,7 @@ class ElementPlanner {
         const isdn::ElementTable* const table = isdn::elementTable(each_, to_.variant());
         const bool ofCodes = table != nullptr && isOfCodes(*table);
         DigitsAmongCodes digits(each_.contents);
-        bool isOpen = false;  // an octet before says that its group goes on
+        bool isOpen = false;  // whether an earlier octet says that its group goes on
         for (const Field& field : fields) {
             if (field.kind == Field::Kind::header)
                 continue;
@@ -204,7 +205,7 @@ class ElementPlanner {
         return isDialled_ ? Treatment::dialled : ofInformation_ ? Treatment::blank : Treatment::number;
     }
 
-    // Zeros go on telling that there were digits.
+    // Blanks digits by zeros, so that undoing the redaction recognises digits at the same place.
     void blankDigits(Octets octets) {
         constexpr std::uint8_t digitBits = 0xF0;
         to_.dropFrom(octets);
@@ -212,7 +213,7 @@ class ElementPlanner {
         to_.blank(behind(octets, DigitsAmongCodes::telling), extensionBit);
     }
     void planCode(const Field& field) {
-        // No element has this identifier, and none has the one that it becomes.
+        // Replaces an identifier that no element has by another one that no element has.
         if (field.name == "element" && field.meaning.empty()) {
             constexpr std::uint8_t ofNoElement = 0x7F;
             to_.blank(field.at, extensionBit, ofNoElement);

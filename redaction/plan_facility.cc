@@ -1,5 +1,5 @@
-// Which values of a facility name a person. Of the values that stay, each is of a type that is known, and no
-// longer than that type has them; whether a value spells something does not matter.
+// Decides which values of a facility are replaced. Only values of a known type are kept, and only if they are
+// no longer than that type allows; what a value spells does not matter.
 #include <algorithm>
 #include <vector>
 
@@ -31,7 +31,7 @@ Treatment treatmentOf(const BerValue& value, const BerType* type) {
     return isString ? Treatment::text : Treatment::octets;
 }
 
-// Octets of a value of a known type that is nobody's: more are another thing.
+// The most octets of a value of a type that names nobody. A longer value is blanked.
 std::size_t mostOf(const BerType& type) {
     if (&type == &isdn::facility::number)  // identifiers and codes
         return 2;
@@ -67,7 +67,8 @@ class FacilityPlanner {
   private:
     const isdn::BerTree& tree() const { return facility_.tree(); }
 
-    // The profile has one octet. More of them are known to nobody, but their end has to stay.
+    // Keeps the one octet of the profile. Blanks further octets of it, but keeps bit 8, which ends the
+    // profile.
     void planProfile() {
         const auto last =
             std::ranges::find_if(contents_, [](std::uint8_t octet) { return (octet & extensionBit) != 0; });
@@ -78,10 +79,11 @@ class FacilityPlanner {
             to_.blank(behind(contents_, profile));
     }
 
-    // Returns the index of the value to go on with.
+    // Returns the index of the next value to plan.
     std::size_t planValue(std::size_t index) {
         const BerValue& value = tree().values()[index];
-        // A wrong length is not always the one that shows it: values that nobody knows may be something else.
+        // The length that is wrong may be an earlier one, so unknown values of a damaged facility are
+        // blanked.
         if (isDamaged_ && (isUnknown(index) || hasLongIdentifier(value)))
             return blankTo(limitAround(index), value.offset, index);
         if (hasStrangeHeader(value))
@@ -97,8 +99,8 @@ class FacilityPlanner {
         return index + 1;
     }
 
-    // An identifier has one octet here, and a length at most three; of more octets, and where they are
-    // damaged, nobody knows what they are.
+    // Known facilities have identifiers of one octet and lengths of at most three. Longer or damaged ones are
+    // not trusted.
     bool hasLongIdentifier(const BerValue& value) const {
         constexpr std::uint8_t isLong = 0x1F;
         return value.offset < tree().octets().size() && (tree().octets()[value.offset] & isLong) == isLong;
@@ -118,14 +120,15 @@ class FacilityPlanner {
     bool isDamaged(const BerValue& value) const {
         return value.problem != BerProblem::none || hasStrangeHeader(value);
     }
-    // A value of which no table knows anything. Zeros often fill an element up.
+    // Whether no table knows anything of the value. Zeros count as known, because they often fill an element.
     bool isUnknown(std::size_t index) const {
         constexpr isdn::BerTag zero{};
         const isdn::BerMeaning& meaning = facility_.meanings()[index];
         return meaning.type == nullptr && meaning.name.empty() && tree().values()[index].tag != zero;
     }
 
-    // From here on nothing can be told apart, and that stays so. Returns the index of the value behind it.
+    // Blanks the octets up to `end` with FF, so that they stay unreadable. Returns the index of the next
+    // value.
     std::size_t blankTo(std::size_t end, std::size_t from, std::size_t index) {
         to_.blank(behind(tree().octets().first(end), from), 0, allBits);
         return firstFrom(index, end);
@@ -134,7 +137,7 @@ class FacilityPlanner {
     std::size_t mostOf(std::size_t index) const {
         const BerValue& value = tree().values()[index];
         const isdn::BerMeaning& meaning = facility_.meanings()[index];
-        // An operation or an error that a table knows.
+        // An object identifier is kept if it is that of an operation or an error that a table knows.
         if (value.tag == isdn::berObjectIdentifier)
             return meaning.says.empty() ? 0 : value.length;
         if (meaning.type != nullptr)
@@ -142,7 +145,7 @@ class FacilityPlanner {
         return value.tag == isdn::berBoolean ? 1 : 0;
     }
 
-    // Where the octets end that a value without a length of its own would take.
+    // The end of the innermost enclosing value with a length, which a value with a wrong length cannot pass.
     std::size_t limitAround(std::size_t index) const {
         const std::vector<BerValue>& values = tree().values();
         std::size_t end = tree().octets().size();
@@ -154,7 +157,7 @@ class FacilityPlanner {
         return end;
     }
 
-    // The first value behind `index` that does not begin before this place.
+    // The first value after `index` that begins at this place or later.
     std::size_t firstFrom(std::size_t index, std::size_t place) const {
         const std::vector<BerValue>& values = tree().values();
         ++index;

@@ -120,7 +120,8 @@ Request requestIn(std::string_view text) {
             line.substr(second + 1).starts_with("HTTP/1.")};
 }
 
-// Whether the text has the empty line that ends a request. What stands before `from` was looked at.
+// Whether the text contains the empty line that ends a request. The octets before `from` were searched
+// before.
 bool isWhole(const std::string& text, std::size_t from) {
     const std::size_t begin = from < 3 ? 0 : from - 3;
     return text.find("\r\n\r\n", begin) != text.npos || text.find("\n\n", begin) != text.npos;
@@ -247,7 +248,7 @@ class HttpAnswerer::Loop {
     void wake() { eventfd_write(wake_.number(), 1); }
 
   private:
-    // The first is what wakes the thread, the second what listens; then come the connections.
+    // The first descriptor wakes the thread, the second one listens, and those of the connections follow.
     std::vector<pollfd> waitForSomething() {
         const Clock::time_point now = Clock::now();
         Clock::time_point until = Clock::time_point::max();

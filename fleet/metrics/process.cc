@@ -6,7 +6,7 @@ namespace fleet {
 
 namespace {
 
-// The program's objects are made as it begins.
+// Initialised when the program begins.
 const std::int64_t begun = nanosecondsNow();
 
 }  // namespace

@@ -18,7 +18,7 @@ std::optional<Number> numberIf(const pqxx::row& row, Column column) {
     return row[column].is_null() ? std::nullopt : std::optional(row[column].as<Number>());
 }
 
-// bytea comes as "\x" and two digits an octet.
+// The database writes a bytea as "\x" and two digits for each octet.
 std::vector<std::uint8_t> octetsIn(const pqxx::field& field) {
     std::vector<std::uint8_t> octets;
     const std::string_view digits(field.c_str(), field.size());

@@ -16,7 +16,7 @@ constexpr int schemaNeeded = 1;
 constexpr char rowsAtOnce[] = "2000";
 constexpr std::int64_t nanosecondsPerSecond = 1'000'000'000;
 
-// What the server or libpq says has line ends; a message has none.
+// Removes the line ends of an error text of the server or libpq, because our messages have one line.
 std::string inOneLine(std::string text) {
     std::replace(text.begin(), text.end(), '\n', ' ');
     while (!text.empty() && text.back() == ' ')
@@ -34,7 +34,7 @@ bool isNamed(const std::vector<std::string>& names, const std::string& name) {
 
 }  // namespace
 
-// The transaction is open as long as somebody reads.
+// The transaction is open as long as the object lives.
 class Store::Snapshot {
   public:
     explicit Snapshot(StoreQuery query)
@@ -76,7 +76,7 @@ class Store::Snapshot {
         }
     }
 
-    // A name that is misspelt must not look like a trunk on which nothing has happened.
+    // Refuses unknown names, because a misspelt name would look like a trunk on which nothing has happened.
     void checkNames() const {
         const auto refuse = [](const char* what, const std::string& name) {
             throw capture::BadInput("the store: it has no " + std::string(what) + " " + name);
@@ -103,7 +103,7 @@ class Store::Snapshot {
 
 namespace {
 
-// Frames of whole days, and what the recorder said behind a run's last one.
+// Reads the frames of whole days, and what the recorder said after the last frame of each run.
 class TrunkReader : public capture::Reader {
   public:
     TrunkReader(std::shared_ptr<void> keeps, pqxx::transaction_base& work, const Store::Trunk& trunk,
@@ -151,7 +151,7 @@ class TrunkReader : public capture::Reader {
         return true;
     }
 
-    // What stands behind the run that was read last, once; false if there is nothing.
+    // Gives, once, what the recorder said after the last frame of a run. Returns false if that is nothing.
     bool takeBehind() {
         if (rows_.run() == told_ || (!isWhole_ && isFetched_))
             return false;
@@ -164,7 +164,8 @@ class TrunkReader : public capture::Reader {
         return true;
     }
 
-    // " AND day >= ... AND day <= ...". A call that was alive at an end of the time is read whole.
+    // Returns " AND day >= ... AND day <= ...". Adds a day at each end, or more if a call was alive at that
+    // moment, so that the call is read whole.
     std::string days(const StoreQuery& query) {
         std::string condition;
         const auto bound = [&](std::int64_t time, const char* compared, const char* least,

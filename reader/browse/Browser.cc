@@ -25,7 +25,7 @@ constexpr std::array everywhere{
     KeyHint{"Q", "", "Ends the program."},
 };
 
-// Letters that people have in their fingers.
+// Translates the letters that other terminal programs use for arrow keys and the like.
 Key translated(const Key& key) {
     using enum Key::Code;
     if (key.is(U'j'))
@@ -106,7 +106,7 @@ void Browser::press(Key key) {
     mustClose_ = false;
 }
 
-// What the keys do whatever screen is in front.
+// Handles the keys that mean the same on every screen. Returns whether this was one of them.
 bool Browser::pressEverywhere(const Key& key) {
     if (key.code == Key::Code::click && key.y == 0) {
         for (std::size_t i = 0; i < tabCount; ++i) {
@@ -141,10 +141,10 @@ void Browser::draw(Canvas& canvas) {
     if (canvas.height() > top + foot) {
         const Area area{0, top, canvas.width(), canvas.height() - top - foot};
         front().draw(canvas, area);
-        // A screen that drew into the last line is put in its place.
+        // The last line is the foot's: clear what a screen has drawn there.
         canvas.fill({0, canvas.height() - 1, canvas.width(), 1});
     }
-    // The title counts what was drawn.
+    // The title comes after the screen, because it counts what the screen has drawn.
     canvas.put(0, 1, front().title(), {Ink::title, true});
     drawFoot(canvas);
 }
@@ -193,7 +193,7 @@ void Browser::drawFoot(Canvas& canvas) const {
         return;
     }
     std::vector<KeyHint> hints(front().keys().begin(), front().keys().end());
-    // What fits is chosen so that help and the way out are always named.
+    // Names as many keys as fit. The keys for help and for going back are always named.
     const std::string_view always = front().isTyping() ? "" : "? help  q back";
     const int end = canvas.width() - columnsOf(always) - 1;
     int x = 0;

@@ -33,14 +33,15 @@ constexpr std::array typingHints{
     KeyHint{"Up Down", "move", "Move the cursor."},
 };
 
-// Columns in the order in which they find room, and the room that those take whose text has any length.
+// The columns, the most important first: the screen shows as many as it has room for. Below: how wide the
+// columns are whose texts may have any length.
 constexpr std::array<std::string_view, 13> byImportance{
     "call", "start",    "calling > called", "outcome", "cleared by: cause", "channel",
     "dir",  "duration", "connect",          "alert",   "respond",           "ref",
     "flags"};
 constexpr int roomForText = 20;
 constexpr int timeWidth = 12;
-constexpr int datedWidth = 110;  // screens that are as wide have dates
+constexpr int datedWidth = 110;  // screens of at least this width show dates
 
 const CallLineColumn& columnNamed(std::string_view heading) {
     return *std::find_if(callLineColumns().begin(), callLineColumns().end(),
@@ -65,7 +66,7 @@ std::vector<const CallLineColumn*> columnsFor(int width, bool hasDates) {
         width -= needed;
         chosen.push_back(&column);
     }
-    std::sort(chosen.begin(), chosen.end());  // as they stand in the table
+    std::sort(chosen.begin(), chosen.end());  // in the order of the table
     return chosen;
 }
 

@@ -9,7 +9,7 @@ namespace {
 
 constexpr char32_t unreadable = U'?';
 
-// Takes the first character off; `unreadable` for what is no UTF-8.
+// Removes the first character from the text and returns it; `unreadable` if it is not valid UTF-8.
 char32_t takeCharacter(std::string_view& text) {
     const auto first = static_cast<unsigned char>(text[0]);
     const std::size_t length = first < 0x80    ? 1
@@ -81,7 +81,7 @@ int Canvas::put(int x, int y, std::string_view text, Style style, int end) {
         char32_t character = takeCharacter(text);
         int columns = widthOf(character);
         if (columns == 0)
-            continue;  // it would change the character in front of it
+            continue;  // a combining character would change the one before it
         if (columns < 0) {
             character = unreadable;
             columns = 1;

@@ -81,7 +81,7 @@ bool Collector::mayBeShown(const calls::Call& call) const {
     return mayBeWanted(call) && hasFrameWanted(call);
 }
 
-// The numbers of its frames come by themselves.
+// Keeps a copy of the call without the numbers of its frames, which are handed over separately.
 void Collector::keep(const calls::Call& call) {
     calls::Call copy = call;
     copy.frames = {};

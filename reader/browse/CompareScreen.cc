@@ -130,7 +130,7 @@ CompareScreen::CompareScreen(Desk& desk, std::string title, std::vector<Row> row
     choose();
 }
 
-// Messages stay in any case.
+// Chooses the rows that are shown. The rows that name messages are always shown.
 void CompareScreen::choose() {
     shown_.clear();
     for (std::size_t i = 0; i < rows_.size(); ++i) {

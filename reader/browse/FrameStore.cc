@@ -48,8 +48,8 @@ std::optional<std::uint64_t> FrameStore::placeOf(std::uint64_t number) const {
     auto after = std::upper_bound(
         pages_.begin(), pages_.end(), number,
         [](std::uint64_t wanted, const Part& part) { return wanted < part.page->number(0); });
-    // A page may begin with what is no frame, and bears the number of the frame at the end of the page
-    // before.
+    // A page may begin with an item that is no frame. Then its number is that of the last frame of the page
+    // before it.
     for (; after != pages_.begin(); --after) {
         const Part& part = *std::prev(after);
         for (std::size_t low = 0, high = part.page->size(); low < high;) {

@@ -31,7 +31,7 @@ void HelpScreen::draw(Canvas& canvas, const Area& area) {
     appendKeys(lines, ofScreen_, area.width);
     lines.emplace_back(ofScreen_.empty() ? "Keys" : "Everywhere");
     appendKeys(lines, everywhere_, area.width);
-    // The cursor leads the part that is shown: it stands on its first line, as long as there is more below.
+    // The cursor moves the text: it stands on the first line that is shown as long as there is more below.
     const auto height = static_cast<std::size_t>(std::max(area.height, 1));
     cursor_.fit(lines.size() > height ? lines.size() - height + 1 : 1, 1);
     for (std::size_t i = 0; i < height && cursor_.line() + i < lines.size(); ++i) {

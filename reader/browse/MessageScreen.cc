@@ -26,10 +26,10 @@ constexpr std::array hints{
 constexpr int octetsInLine = 8;
 constexpr int positionWidth = 4;
 constexpr int octetsWidth = positionWidth + 1 + 3 * octetsInLine + 1;
-constexpr int leastBeside = 72;  // screens that are as wide have octets beside the fields
+constexpr int leastBeside = 72;  // screens of at least this width show octets beside the fields
 constexpr std::size_t octetColumn = 4, nameColumn = 24;
 
-// What stands two or more blanks apart in a line.
+// Splits a line where two or more blanks stand.
 std::vector<std::string> itemsOf(std::string_view line) {
     std::vector<std::string> items;
     while (!line.empty()) {
@@ -46,7 +46,7 @@ std::vector<std::string> itemsOf(std::string_view line) {
 // Makes rows of what a frame consists of.
 class MessageScreen::Rows : public ContentsVisitor {
   public:
-    // Views of fields are those of `octets`, which the screen keeps as this block.
+    // The fields of the rows are views of `octets`, which the screen keeps as the block of this number.
     Rows(std::vector<Row>& rows, std::span<const std::uint8_t> octets, std::size_t block)
         : rows_(rows), octets_(octets), block_(block) {}
 
@@ -144,7 +144,7 @@ void MessageScreen::addJoined(isdn::Variant variant) {
     visitMessage(isdn::parseLayer3(blocks_[1]), variant, rows);
 }
 
-// Those that stand beside the row under the cursor.
+// Returns the octets that are shown beside the row under the cursor.
 const std::vector<std::uint8_t>& MessageScreen::shownOctets() const {
     return blocks_[cursor_.line() < rows_.size() ? rows_[cursor_.line()].block : 0];
 }
@@ -202,7 +202,7 @@ void MessageScreen::draw(Canvas& canvas, const Area& area) {
         canvas.put(area.x, area.y + area.height - foot + i, words[static_cast<std::size_t>(i)], {Ink::note});
 }
 
-// Octets that the cursor's field stands in are reversed, and in brackets.
+// Draws the octets. Those that contain the field under the cursor are reversed and in brackets.
 void MessageScreen::drawOctets(Canvas& canvas, const Area& area) const {
     const std::vector<std::uint8_t>& octets = shownOctets();
     const Row* const row = cursor_.line() < rows_.size() ? &rows_[cursor_.line()] : nullptr;

@@ -17,7 +17,7 @@
 
 #include "reader/errors.h"
 
-// After all others: its macros are many.
+// Included after all other headers, because it defines many macros.
 #define NCURSES_WIDECHAR 1
 #define NCURSES_NOMACROS 1
 #include <curses.h>
@@ -28,7 +28,7 @@ namespace {
 
 constexpr int escapeDelay = 25;  // milliseconds in which the rest of a key's sequence has to come
 
-// What has to be undone where nothing but a signal handler runs any more. There is one terminal.
+// What a signal handler needs to restore the terminal after a crash. There is one terminal.
 struct Emergency {
     int descriptor = -1;
     termios modes{};
@@ -41,7 +41,7 @@ std::array<struct sigaction, fatalSignals.size()> handlersBefore;
 
 void putBackAndDie(int signal) {
     if (write(emergency.descriptor, emergency.text.data(), emergency.size) < 0) {
-        // Nothing can be done about it.
+        // A write that fails cannot be reported here.
     }
     tcsetattr(emergency.descriptor, TCSANOW, &emergency.modes);
     for (std::size_t i = 0; i < fatalSignals.size(); ++i)
@@ -80,7 +80,7 @@ File opened(int descriptor, const char* mode, bool takeTty) {
     return File(fdopen(file, mode));
 }
 
-// The terminal's description has been read.
+// Call it when the terminal's description has been read.
 bool canPlaceCursor() {
     const char* const sequence = tigetstr("cup");
     return sequence != nullptr && *sequence != '\0';
@@ -220,7 +220,7 @@ Terminal::Terminal(const Settings& settings) : held_(std::make_unique<Held>()) {
     }
     if (settings.mouse) {
         mousemask(BUTTON1_PRESSED | BUTTON4_PRESSED | BUTTON5_PRESSED, nullptr);
-        mouseinterval(0);  // presses come at once
+        mouseinterval(0);  // report a press at once, without waiting for a double click
     }
 }
 

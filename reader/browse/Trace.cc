@@ -15,7 +15,7 @@ constexpr std::size_t mostLinkRungs = 2000;
 
 bool isBefore(const CallFrame& a, const CallFrame& b) { return a.frame < b.frame; }
 
-// Frames come nearly in order. What is known of one already is replaced.
+// Inserts a frame at its place, which is mostly the end. If the frame is there already, replaces it.
 template <class Frames>
 void insertInOrder(Frames& frames, const CallFrame& frame) {
     const auto at = std::lower_bound(frames.begin(), frames.end(), frame, isBefore);
@@ -50,7 +50,7 @@ void sayGone(CallLadder& ladder, std::size_t gone) {
     ladder.rungs.insert(ladder.rungs.begin(), std::move(words));
 }
 
-// Puts messages together that came in segments.
+// Puts the segments of messages together.
 class Whole {
   public:
     // A frame of one call. `carried` says that the message was heard by another frame.
@@ -113,7 +113,7 @@ void Trace::prune(Changes& changes) {
     const std::uint64_t oldest = frames_.firstNumber();
     while (!ofCalls_.empty() && ofCalls_.front().frame < oldest)
         ofCalls_.pop_front();
-    // Old calls stand in front, but for a few that go on for long.
+    // Calls whose frames are gone are at the beginning, apart from a few between them that last long.
     constexpr int glance = 256;
     int looked = 0;
     for (auto each = framesOf_.begin(); each != framesOf_.end() && looked < glance; ++looked) {
@@ -152,14 +152,14 @@ std::span<const CallFrame> Trace::framesOf(std::uint64_t call) const {
     return found == framesOf_.end() ? std::span<const CallFrame>() : std::span(found->second);
 }
 
-// How many of them, at their beginning, are not kept any more.
+// How many of the frames, counted from the first, are not kept any more.
 std::size_t Trace::countGone(std::span<const CallFrame> frames) const {
     const CallFrame oldest{0, frames_.firstNumber(), false};
     return static_cast<std::size_t>(std::lower_bound(frames.begin(), frames.end(), oldest, isBefore) -
                                     frames.begin());
 }
 
-// The call's own, the RESTARTs meanwhile, and what tells of links (with call 0 and carried), in order.
+// The frames of the call itself, of RESTARTs meanwhile, and of its links (with call 0 and carried), in order.
 std::vector<CallFrame> Trace::framesForLadder(const calls::Call& call) const {
     std::span<const CallFrame> own = framesOf(call.number);
     own = own.subspan(countGone(own));
@@ -191,7 +191,7 @@ CallLadder Trace::ladderOf(const calls::Call& call, TimeText& times) const {
                 ladders.see(shown.seen());
         }
     };
-    std::uint64_t done = 0;  // places before it are seen
+    std::uint64_t done = 0;  // the frames at all places before this one were looked at
     for (const CallFrame& frame : frames) {
         const auto place = frames_.placeOf(frame.frame);
         if (!place)

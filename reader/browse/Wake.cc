@@ -19,7 +19,7 @@ Wake::~Wake() { close(descriptor_); }
 void Wake::call() const noexcept {
     const int before = errno;
     const std::uint64_t one = 1;
-    // It only fails when it was called very often and not heard.
+    // It fails only if nobody has read for so long that the count is full. Then the reader wakes anyway.
     static_cast<void>(!write(descriptor_, &one, sizeof one));
     errno = before;
 }

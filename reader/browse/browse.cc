@@ -33,11 +33,11 @@ namespace {
 using namespace browse;
 using Clock = std::chrono::steady_clock;
 
-// Keys are looked at in between.
+// How long the program works before it looks for a key again.
 constexpr std::chrono::milliseconds workAtOnce{10};
-// News are drawn no more often; what a key has changed is drawn at once.
+// The least time between two drawings of new data. What a key has changed is drawn at once.
 constexpr std::chrono::milliseconds betweenDrawings{50};
-// A terminal that goes away without a signal is seen after so long.
+// Milliseconds after which the program notices a terminal that has gone away without a signal.
 constexpr int longestPoll = 1000;
 
 // What signals ask for.
@@ -51,7 +51,7 @@ void takeSignal(int signal) {
         wake->call();
 }
 
-// While it lives, the signals that end or stop a program are orders to the loop.
+// While an object lives, the signals that end or stop a program only set flags, which the loop obeys.
 class Signals {
   public:
     explicit Signals(const Wake& wake) {
@@ -60,7 +60,7 @@ class Signals {
         action.sa_handler = takeSignal;
         for (const int signal : {SIGINT, SIGTERM, SIGHUP, SIGQUIT, SIGTSTP})
             sigaction(signal, &action, nullptr);
-        // Ends a system call of the thread that reads, and nothing else.
+        // SIGUSR1 only interrupts a system call of the reading thread.
         action.sa_handler = [](int) {};
         sigaction(SIGUSR1, &action, nullptr);
     }
@@ -69,11 +69,11 @@ class Signals {
     Signals& operator=(const Signals&) = delete;
 };
 
-// Reads on a thread of its own, until the end of the input or its own.
+// Reads the input on a thread of its own, until the input or the object ends.
 class ReadingThread {
   public:
     ReadingThread(Session& session, Collector& collector, UpdateQueue& queue) : queue_(queue) {
-        // Signals are for the thread that has the terminal.
+        // The reading thread gets no other signals: the thread that has the terminal gets them.
         sigset_t all, before;
         sigfillset(&all);
         sigdelset(&all, SIGUSR1);
@@ -128,7 +128,7 @@ class Saving {
             return said;
         });
     }
-    // What came of it, once it is done; empty before.
+    // Returns words that say how the writing ended, once; empty while it goes on.
     std::string done() {
         if (!isBusy() || result_.wait_for(std::chrono::seconds(0)) != std::future_status::ready)
             return {};
@@ -142,7 +142,7 @@ class Saving {
     std::future<std::string> result_;
 };
 
-// What goes on between terminal, screens and news.
+// Takes keys, signals and new data, and draws the screen when one of them has changed it.
 class Loop {
   public:
     Loop(Terminal& terminal, Browser& browser, UpdateQueue& queue, Saving& saving, const Wake& wake)
@@ -217,13 +217,13 @@ class Loop {
     Saving& saving_;
     const Wake& wake_;
     bool isDue_ = true;        // a key has changed something
-    bool hasChanged_ = false;  // news have
+    bool hasChanged_ = false;  // new data has changed something
     bool hasMore_ = false;     // there is work to go on with
     int width_ = 0, height_ = 0;
     Clock::time_point nextDrawing_{};
 };
 
-// Lines and arrows of UTF-8 need a locale that has it.
+// Sets a locale with UTF-8, which lines and arrows need. Returns false if there is none.
 bool beginLocale() {
     if (std::setlocale(LC_CTYPE, "") == nullptr && localeHasUtf8())
         static_cast<void>(std::setlocale(LC_CTYPE, "C.UTF-8"));

@@ -13,7 +13,7 @@ namespace {
 
 constexpr std::size_t itemsInChunk = 256;
 
-// Counts the frames on their way to the file.
+// Counts the frames and hands them on to the consumer that writes them.
 class Counting : public Consumer {
   public:
     explicit Counting(Consumer& next) : next_(next) {}
@@ -32,7 +32,7 @@ class Counting : public Consumer {
 
 void handOn(Chunk& chunk, Consumer& to) {
     chunk.seal();
-    // What readers have lent is a copy by now: the headers refer to that one.
+    // Read the headers now, because the chunk holds copies of the octets and headers are views of them.
     for (Seen& seen : chunk.seen())
         readHeaders(seen);
     to.take(chunk, chunk.pieces.size());

@@ -18,7 +18,7 @@ namespace reader {
 
 namespace {
 
-// A chart, and the tables that say the same without a script.
+// A chart, and the tables that show the same figures without a script.
 struct Chart {
     std::string_view name;  // of its function in charts.js
     std::string_view caption;
@@ -46,7 +46,7 @@ bool isInChart(std::string_view table) {
     });
 }
 
-// As a Content-Security-Policy names a script or style that may be used: 'sha256-...'.
+// The form in which a Content-Security-Policy permits a script or a style: 'sha256-...'.
 std::string hashOf(std::string_view content) {
     std::array<unsigned char, EVP_MAX_MD_SIZE> digest{};
     unsigned size = 0;
@@ -73,7 +73,7 @@ std::string summaryOf(const Page& page) {
     return markup;
 }
 
-// A list that is shorter than it should be says so.
+// Appends a sentence if a list does not show everything.
 void appendLeftOut(std::string& to, const Pieces& pieces, std::string_view what) {
     if (pieces.leftOut() == 0)
         return;
@@ -169,7 +169,7 @@ std::string dataOf(const Page& page) {
         appendJsonString(json, nameOf(static_cast<calls::LinkNews>(i)));
     }
     json += "],\"tables\":" + jsonOf(page.figures) + "}";
-    // In JSON this character stands in strings alone. Escaped, nothing can end the element that holds the
+    // JSON has "<" only in strings. It is escaped there, so that no text can end the element that holds the
     // data.
     std::string harmless;
     for (const char character : json) {
@@ -183,7 +183,7 @@ std::string dataOf(const Page& page) {
 
 using Parts = std::map<std::string_view, std::function<std::string()>>;
 
-// The template with each {{NAME}} replaced by the part of this name. Parts are not looked into.
+// The template with each {{NAME}} replaced by the part of this name. A {{NAME}} inside a part stays.
 std::string filled(std::string_view page, const Parts& parts) {
     std::string text;
     while (true) {

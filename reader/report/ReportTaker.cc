@@ -67,7 +67,7 @@ void ReportTaker::gone(const calls::Call& call) {
     FigureTaker::gone(call);
 }
 
-// Calls that failed are what one looks for: others may fill half of the table and no more.
+// Readers look for calls that failed, so the others get at most half of the table.
 void ReportTaker::addCall(const calls::Call& call) {
     const bool failed = hasFailed(call);
     const bool hasLadder = failed && addLadder(call);

@@ -9,7 +9,7 @@ namespace reader {
 
 namespace {
 
-// What a column has no heading for is called by its name: "said_by" is "said by".
+// The heading of a column that has none of its own is its name: "said by" for "said_by".
 std::string headingOf(const FigureColumn& column) {
     std::string heading(column.heading.empty() ? column.name : column.heading);
     std::replace(heading.begin(), heading.end(), '_', ' ');

@@ -15,7 +15,7 @@ namespace reader {
 
 namespace {
 
-// Names of files name people and places as well.
+// The title of a redacted report names no files, because file names may name people and places.
 std::string titleOf(const Options& options) {
     if (options.redact.inReport)
         return "Report of a trace, redacted";
@@ -28,7 +28,7 @@ std::string titleOf(const Options& options) {
     return title;
 }
 
-// Pseudonyms come before anything is composed or counted.
+// Replaces numbers by pseudonyms before anything is composed or counted.
 void takeRedacted(ReportTaker& taker, Session& session, const Options& options, const redaction::Key& key,
                   Chatter& chatter) {
     Redacting redacting(options, key, redaction::Direction::redact, nullptr, taker);
