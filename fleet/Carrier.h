@@ -17,10 +17,12 @@ class Carrier {
         // The token that send() was given with the message. Empty if no stream took a message: the carrier
         // does not know then which message it was.
         std::optional<std::uint64_t> token;
-        bool isKept = false;       // the stream has the message
-        bool isDuplicate = false;  // the stream had it before
-        bool isFull = false;       // not kept, because the stream has no room
-        std::string error;         // why it is not kept
+        bool isKept = false;         // the stream has the message
+        bool isDuplicate = false;    // the stream had it before
+        bool isFull = false;         // not kept, because the stream has no room
+        std::string error;           // why it is not kept
+        bool isAtLimit = false;      // not kept, because the stream's own limit is reached
+        std::uint64_t sequence = 0;  // its number in the stream, if it is kept; 0: not known
     };
 
     Carrier() = default;

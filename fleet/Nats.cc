@@ -123,6 +123,13 @@ std::string NatsConnection::server() const {
     return isKnown ? std::string(url.data()) : std::string();
 }
 
+std::string NatsConnection::serverProcess() const {
+    std::array<char, 300> id{};
+    const bool isKnown =
+        natsConnection_GetConnectedServerId(handles_->connection.get(), id.data(), id.size()) == NATS_OK;
+    return isKnown ? std::string(id.data()) : std::string();
+}
+
 void NatsConnection::publish(const std::string& subject, std::string_view text, const std::string& id,
                              Headers headers) {
     const OwnedMessage message = makeMessage(subject, "", text, id, headers);

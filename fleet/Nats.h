@@ -54,6 +54,9 @@ class NatsConnection {
     bool isConnected() const;
     // "tls://127.0.0.1:4222"; empty while there is no connection.
     std::string server() const;
+    // The server's name for its own process, a new one whenever it is started; empty while there is no
+    // connection.
+    std::string serverProcess() const;
 
     using Headers = std::span<const std::pair<std::string, std::string>>;
     // Sends a message to the stream that takes the subject, and waits until the stream has stored it. Throws

@@ -23,6 +23,10 @@ struct InboxName {
     InboxName& operator=(const InboxName&) = delete;
 };
 
+// What the server says when a stream has as much as its rules allow. Other refusals come from a server that
+// has trouble with its disk or with itself.
+constexpr std::string_view limitReached = "maximum ";
+
 std::uint64_t tokenOf(std::string_view inbox) {
     const std::string_view digits = inbox.substr(inbox.rfind('.') + 1);
     std::uint64_t token = 0;
@@ -32,6 +36,7 @@ std::uint64_t tokenOf(std::string_view inbox) {
 
 void readError(const json& error, NatsPublisher::Answer& answer) {
     answer.error = error.value("description", "no reason given");
+    answer.isAtLimit = answer.error.starts_with(limitReached);
     const int code = error.value("err_code", 0);
     answer.isFull = std::find(std::begin(noRoomCodes), std::end(noRoomCodes), code) != std::end(noRoomCodes);
 }
@@ -44,7 +49,9 @@ void readAnswer(std::string_view text, NatsPublisher::Answer& answer) {
             readError(*error, answer);
             return;
         }
-        answer.isKept = all.at("seq").is_number_unsigned();
+        const json& sequence = all.at("seq");
+        answer.isKept = sequence.is_number_unsigned();
+        answer.sequence = answer.isKept ? sequence.get<std::uint64_t>() : 0;
         answer.isDuplicate = all.value("duplicate", false);
     } catch (const json::exception&) {
         answer.error = "the answer is not one of a stream";

@@ -4,6 +4,13 @@
 
 namespace fleet {
 
+namespace {
+
+// A stream whose numbers are so much lower is another one, made anew.
+constexpr std::uint64_t mostForgotten = 100'000;
+
+}  // namespace
+
 bool Outbox::hasRoom(std::size_t dChannel) const {
     return parcels_.size() < rules_.most && waiting(dChannel) < rules_.mostOfOne &&
            octets_ < rules_.mostOctets;
@@ -24,7 +31,7 @@ void Outbox::add(std::size_t dChannel, const Parcel& parcel) {
     Sent sent{dChannel,
               toText(parcel.subject()),
               toText(parcel),
-              parcel.id(),
+              parcel.id() + idEnding_,
               {parcel.run, parcel.first + parcel.frames.size(), parcel.end.has_value()},
               parcel.frames.empty() ? std::nullopt : parcel.frames.front().item.time};
     octets_ += sent.text.size();
@@ -66,11 +73,10 @@ void Outbox::sendDue(Carrier& carrier) {
 }
 
 void Outbox::take(const Carrier::Answer& answer) {
-    if (!answer.isKept) {
-        ++figures_.refused;
-        figures_.isFull = answer.isFull;
-        figures_.refusal = answer.error;
-    }
+    if (answer.isKept)
+        countKept(answer);
+    else
+        countRefusal(answer);
     const auto found = answer.token ? parcels_.find(*answer.token) : parcels_.end();
     if (found == parcels_.end() || found->second.isKept)
         return;  // the answer to a parcel that was sent twice
@@ -91,6 +97,28 @@ void Outbox::take(const Carrier::Answer& answer) {
     settle(sent.dChannel);
 }
 
+void Outbox::countRefusal(const Carrier::Answer& answer) {
+    ++figures_.refused;
+    figures_.failures += answer.isAtLimit ? 0 : 1;
+    figures_.isFull = answer.isFull;
+    figures_.refusal = answer.error;
+}
+
+// A stream numbers what it takes. If a number comes for the second time, the stream has lost what it had
+// given that number before.
+void Outbox::countKept(const Carrier::Answer& answer) {
+    if (answer.isDuplicate)
+        return;
+    newestKept_ = Clock::now();
+    if (answer.sequence == 0 || answer.sequence > highest_) {
+        highest_ = std::max(highest_, answer.sequence);
+        return;
+    }
+    ++figures_.forgotten;
+    if (highest_ - answer.sequence > mostForgotten)
+        highest_ = answer.sequence;
+}
+
 // A parcel behind one that is not safe does not count yet: whoever starts anew begins with that one.
 void Outbox::settle(std::size_t dChannel) {
     std::deque<std::uint64_t>& tokens = ofDChannel_[dChannel];
@@ -105,6 +133,17 @@ void Outbox::settle(std::size_t dChannel) {
     }
     if (safe.run != 0)
         safe_(dChannel, safe);
+}
+
+void Outbox::drop(std::size_t dChannel) {
+    if (waiting(dChannel) == 0)
+        return;
+    for (const std::uint64_t token : ofDChannel_[dChannel]) {
+        const auto found = parcels_.find(token);
+        octets_ -= found->second.text.size();  // empty once it is kept
+        parcels_.erase(found);
+    }
+    ofDChannel_[dChannel].clear();
 }
 
 void Outbox::sendAllAgain() {

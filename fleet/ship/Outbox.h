@@ -31,6 +31,8 @@ struct OutboxFigures {
     std::uint64_t kept = 0;
     std::uint64_t duplicates = 0;  // of those kept: the stream had them before
     std::uint64_t refused = 0;     // answers that say no
+    std::uint64_t failures = 0;    // of these, answers for another reason than a limit of the stream
+    std::uint64_t forgotten = 0;   // answers with a number that the stream had given to another parcel before
     std::uint64_t unanswered = 0;  // parcels sent again because no answer came in time
     bool isFull = false;           // the newest answer was a refusal for want of room
     std::string refusal;           // the newest refusal in words; empty once a parcel was kept after it
@@ -65,6 +67,13 @@ class Outbox {
     void pump(Carrier& carrier, std::chrono::milliseconds wait);
     // Call this when there is a new connection: the next pump() sends all parcels that are not kept again.
     void sendAllAgain();
+    // Drops all parcels of the D channel. No more of it is safe until others are added and kept.
+    void drop(std::size_t dChannel);
+    // The ids of parcels that are added from now on end in this text. So the stream does not take them for
+    // parcels that it says it has.
+    void endIdsWith(std::string ending) { idEnding_ = std::move(ending); }
+    // When the stream has taken a parcel that it did not have before, most recently.
+    std::chrono::steady_clock::time_point newestKept() const { return newestKept_; }
 
     bool isEmpty() const { return parcels_.empty(); }
     const OutboxFigures& figures() const { return figures_; }
@@ -86,6 +95,8 @@ class Outbox {
 
     void sendDue(Carrier& carrier);
     void take(const Carrier::Answer& answer);
+    void countRefusal(const Carrier::Answer& answer);
+    void countKept(const Carrier::Answer& answer);
     void settle(std::size_t dChannel);
 
     OutboxRules rules_;
@@ -95,6 +106,9 @@ class Outbox {
     std::uint64_t tokens_ = 0;
     std::size_t octets_ = 0;
     Clock::time_point nextDue_{};  // no parcel is due before
+    Clock::time_point newestKept_{};
+    std::uint64_t highest_ = 0;  // number that the stream has given
+    std::string idEnding_;
     OutboxFigures figures_;
 };
 

@@ -13,6 +13,8 @@ namespace fleet {
 
 namespace {
 
+constexpr unsigned longestWindow = 3600;  // seconds
+
 // A table of the file, whose keys are taken one by one.
 class Table {
   public:
@@ -166,6 +168,8 @@ ShipConfig readShipConfig(const std::string& path, const std::string& redact) {
     if (!redact.empty())
         config.redact = redact;
     config.leastFree = table.number("least_free", 100, config.leastFree);
+    config.resendWindow = std::chrono::seconds(
+        table.number("resend_window", longestWindow, static_cast<unsigned>(config.resendWindow.count())));
     config.metrics = table.text("metrics").value_or("");
     if (!config.metrics.empty() && !isListenAddress(config.metrics))
         table.fail("metrics", "must be an address to listen on, such as \"127.0.0.1:9470\"");

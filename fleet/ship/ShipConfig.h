@@ -2,6 +2,7 @@
 #ifndef FLEET_SHIP_SHIPCONFIG_H
 #define FLEET_SHIP_SHIPCONFIG_H
 
+#include <chrono>
 #include <optional>
 #include <stdexcept>
 #include <string>
@@ -32,8 +33,10 @@ struct ShipConfig {
     std::string stream = siteStream;    // the stream whose filling is watched
     std::string state;                  // the folder of places
     std::optional<std::string> redact;  // key file; pseudonyms are sent in place of numbers
-    unsigned leastFree = 10;            // per cent of a disk or a stream; a line says when less is free
-    std::string metrics;                // the address at which figures are offered; empty: nowhere
+    // A server may lose what it has confirmed for so long at most. 0: it loses nothing.
+    std::chrono::seconds resendWindow{120};
+    unsigned leastFree = 10;  // per cent of a disk or a stream; a line says when less is free
+    std::string metrics;      // the address at which figures are offered; empty: nowhere
     std::vector<ShippedDChannel> dChannels;
 };
 

@@ -111,6 +111,9 @@ std::string metricsOf(const Shipper& shipper) {
     to.single("lapdship_connected", Type::gauge, "1 while there is a connection to NATS.",
               std::uint64_t{shipper.isConnected()});
     parcels(to, shipper.figures());
+    to.single("lapdship_returns_total", Type::counter,
+              "How often frames were shipped again because the server may have lost them.",
+              shipper.returns());
     trunks(to, shipper);
     space(to, shipper);
     return to.text();

@@ -1,5 +1,7 @@
 #include "fleet/ship/ShippedTrunk.h"
 
+#include <algorithm>
+#include <iterator>
 #include <stdexcept>
 #include <utility>
 
@@ -33,7 +35,9 @@ std::unique_ptr<TrunkInput> makeInput(const ShippedDChannel& dChannel, const Pla
 
 ShippedTrunk::ShippedTrunk(const ShippedDChannel& dChannel, std::size_t number,
                            const std::string& stateFolder, const redaction::Key* key, Say say)
-    : number_(number),
+    : dChannel_(dChannel),
+      number_(number),
+      key_(key == nullptr ? std::nullopt : std::optional(*key)),
       name_(toText(dChannel.head.address)),
       placePath_(placePathOf(dChannel.head.address, stateFolder)),
       say_(std::move(say)),
@@ -45,10 +49,14 @@ ShippedTrunk::ShippedTrunk(const ShippedDChannel& dChannel, std::size_t number,
     } catch (const std::runtime_error& error) {
         say_(std::string(error.what()) + "; everything is shipped again");
     }
+    begin();
+}
+
+void ShippedTrunk::begin() {
     run_ = place_.run;
-    if (key != nullptr)
-        redactor_.emplace(*key, [this](const InputEvent& event) { packer_.take(event); });
-    input_ = makeInput(dChannel, place_);
+    if (key_)
+        redactor_.emplace(*key_, [this](const InputEvent& event) { packer_.take(event); });
+    input_ = makeInput(dChannel_, place_);
 }
 
 bool ShippedTrunk::step(Outbox& outbox) {
@@ -107,20 +115,53 @@ bool ShippedTrunk::beginRun(Outbox& outbox) {
 }
 
 void ShippedTrunk::take(const InputEvent& event) {
-    if (event.kind == InputEvent::Kind::item && isNumbered(event.item) && !event.isOld) {
-        ++frames_;
-        const capture::Frame& frame = event.item.frame;
-        if (frame.clock == capture::Clock::absolute)
-            newest_[frame.transmitted ? 1 : 0] = frame.time;
-    }
-    gaps_ += event.gap ? 1 : 0;
+    count(event);
     if (redactor_)
         redactor_->take(event);
     else
         packer_.take(event);
 }
 
-void ShippedTrunk::safe(const SafeUpTo& upTo) {
+void ShippedTrunk::count(const InputEvent& event) {
+    const bool isFrame = event.kind == InputEvent::Kind::item && isNumbered(event.item) && !event.isOld;
+    const std::pair at{event.run, event.number};
+    if ((!isFrame && !event.gap) || at <= counted_)
+        return;
+    counted_ = at;
+    gaps_ += event.gap ? 1 : 0;
+    if (!isFrame)
+        return;
+    ++frames_;
+    const capture::Frame& frame = event.item.frame;
+    if (frame.clock == capture::Clock::absolute)
+        newest_[frame.transmitted ? 1 : 0] = frame.time;
+}
+
+void ShippedTrunk::safe(const SafeUpTo& upTo, Clock::time_point now) {
+    safe_.push_back({upTo, now});
+    if (makesRuns_)
+        settle(now);
+}
+
+void ShippedTrunk::settle(Clock::time_point then) {
+    const auto end = std::ranges::find_if(safe_, [&](const Safe& each) { return each.since > then; });
+    if (end == safe_.begin())
+        return;
+    moveTo(std::prev(end)->upTo);
+    safe_.erase(safe_.begin(), end);
+}
+
+bool ShippedTrunk::goBack(Outbox& outbox) {
+    if (makesRuns_)
+        return false;
+    outbox.drop(number_);
+    safe_.clear();
+    packer_ = Packer(dChannel_.head);
+    begin();
+    return true;
+}
+
+void ShippedTrunk::moveTo(const SafeUpTo& upTo) {
     if (place_.run != upTo.run)
         place_.log.reset();
     place_.run = upTo.run;

@@ -56,8 +56,9 @@ Shipper::Shipper(const ShipConfig& config, const ShipperRules& rules, Say say)
       rules_(rules),
       say_(std::move(say)),
       lock_(lockFolder(config.state)),
-      outbox_(rules.outbox,
-              [this](std::size_t dChannel, const SafeUpTo& upTo) { trunks_[dChannel].safe(upTo); }),
+      outbox_(rules.outbox, [this](std::size_t dChannel,
+                                   const SafeUpTo& upTo) { trunks_[dChannel].safe(upTo, Clock::now()); }),
+      doubt_(config.state + "/server", rules.calm),
       disks_(config.leastFree, say_) {
     const std::optional<redaction::Key> key = keyOf(config_);
     for (const ShippedDChannel& each : config_.dChannels)
@@ -72,8 +73,10 @@ Shipper::Shipper(const ShipConfig& config, const ShipperRules& rules, Say say)
 Shipper::~Shipper() { close(lock_); }
 
 void Shipper::run(const std::atomic<bool>& stop) {
-    while (!stop)
+    while (!stop) {
         turn();
+        reconsider();
+    }
     finish();
 }
 
@@ -81,6 +84,8 @@ void Shipper::drain(const std::atomic<bool>& stop) {
     const auto isHolding = [](const ShippedTrunk& trunk) { return trunk.isHolding(); };
     while (!stop && (turn() || !outbox_.isEmpty() || std::ranges::any_of(trunks_, isHolding))) {
     }
+    if (!stop)
+        settle(Clock::now());
     nextPlaces_ = {};
     savePlaces();
 }
@@ -172,6 +177,46 @@ void Shipper::watch() {
         say_(std::string(error.what()) + "; its filling is not watched");
         mayAskStream_ = false;
     }
+}
+
+// What the stream has confirmed is safe for good once the stream has taken something else a while later.
+// Until then the places stay before it, also while nothing is sent and while there is no connection.
+void Shipper::reconsider() {
+    const Clock::time_point now = Clock::now();
+    if (config_.resendWindow.count() == 0) {
+        settle(now);
+        return;
+    }
+    const OutboxFigures& figures = outbox_.figures();
+    const std::uint64_t troubles = figures.failures + figures.forgotten;
+    if (std::exchange(troubles_, troubles) != troubles)
+        doubt_.raise(now);
+    if (isConnected())
+        doubt_.connectedTo(connection_->serverProcess(), now);
+    if (!doubt_.exists())
+        settle(outbox_.newestKept() - config_.resendWindow);
+    else if (isConnected() && doubt_.isCalm(now))
+        goBack();
+}
+
+// The server may say that it has parcels which it is about to lose, and a centre that fetches from it passes
+// over numbers that it has seen before. So the parcels get new ids, and are stored behind all others.
+void Shipper::goBack() {
+    const auto second = std::chrono::system_clock::now().time_since_epoch() / 1s;
+    outbox_.endIdsWith("~" + std::to_string(second));
+    bool isAny = false;
+    for (ShippedTrunk& trunk : trunks_)
+        isAny = trunk.goBack(outbox_) || isAny;
+    doubt_.end();
+    if (!isAny)
+        return;
+    ++returns_;
+    say_("the server was started anew or was in trouble; what it has confirmed lately is shipped again");
+}
+
+void Shipper::settle(Clock::time_point then) {
+    for (ShippedTrunk& trunk : trunks_)
+        trunk.settle(then);
 }
 
 void Shipper::savePlaces() {

@@ -14,6 +14,7 @@
 #include "fleet/metrics/HttpAnswerer.h"
 #include "fleet/metrics/Published.h"
 #include "fleet/ship/DiskWatch.h"
+#include "fleet/ship/Doubt.h"
 #include "fleet/ship/Outbox.h"
 #include "fleet/ship/ShipConfig.h"
 #include "fleet/ship/ShippedTrunk.h"
@@ -27,6 +28,7 @@ struct ShipperRules {
     std::chrono::milliseconds betweenPlaces{200};  // how often places are written to their files
     std::chrono::milliseconds toFinish{5000};      // how long the end waits for answers
     std::chrono::seconds betweenWatches{30};       // how often disks and the stream are looked at
+    std::chrono::milliseconds calm{30'000};  // how long all is well before an older place is gone back to
 };
 
 // Runs on the caller's thread. Another thread hands out the figures (HttpAnswerer).
@@ -40,10 +42,12 @@ class Shipper {
     Shipper& operator=(const Shipper&) = delete;
 
     // Ships until `stop` is set, which a signal handler may do. Waits for a server that cannot be reached.
+    // When the server may have lost what it confirmed, goes back to the places and ships it again.
     // Throws NatsError if the first server that is reached refuses the credentials.
     void run(const std::atomic<bool>& stop);
-    // Ships what is there. Returns when all of it is safe and there is nothing more to read, or when `stop`
-    // is set. Throws as run() does.
+    // Ships what is there. Returns when the stream has confirmed all of it and there is nothing more to read,
+    // or when `stop` is set. Never goes back, since it does not stay to see what the server does. Throws as
+    // run() does.
     void drain(const std::atomic<bool>& stop);
 
     bool isConnected() const { return connection_ && connection_->isConnected(); }
@@ -51,6 +55,8 @@ class Shipper {
     const OutboxFigures& figures() const { return outbox_.figures(); }
     const Outbox& outbox() const { return outbox_; }
     const DiskWatch& disks() const { return disks_; }
+    // How often it went back.
+    std::uint64_t returns() const { return returns_; }
     // How full the site's stream was when it was asked last; all zero if it was never asked.
     const StreamFilling& stream() const { return stream_; }
     const std::deque<ShippedTrunk>& trunks() const { return trunks_; }
@@ -65,6 +71,9 @@ class Shipper {
     void sayConnection();
     void sayRefusal();
     void watch();
+    void reconsider();
+    void goBack();
+    void settle(Clock::time_point then);
     void savePlaces();
     void publish();
     void finish();
@@ -75,6 +84,9 @@ class Shipper {
     int lock_ = -1;
     std::deque<ShippedTrunk> trunks_;
     Outbox outbox_;
+    Doubt doubt_;
+    std::uint64_t troubles_ = 0;  // that the outbox has counted, and that were seen
+    std::uint64_t returns_ = 0;
     DiskWatch disks_;
     StreamFilling stream_;
     Published metrics_;  // made once a second, and handed out by the answerer's thread

@@ -107,6 +107,8 @@ void NatsServer::kill() {
     close(said_);
 }
 
+void NatsServer::lose() const { std::filesystem::remove_all(folder_ / "store"); }
+
 void NatsServer::freeze() { ::kill(process_, SIGSTOP); }
 void NatsServer::thaw() { ::kill(process_, SIGCONT); }
 

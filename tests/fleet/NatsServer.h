@@ -40,6 +40,8 @@ class NatsServer {
 
     // Kills the server as kill -9 does. What it has stored stays.
     void kill();
+    // Removes all that the killed server has stored.
+    void lose() const;
     // Starts it again on the same port, and returns when it takes connections.
     void start();
     // Stops the server's process until thaw().

@@ -2,45 +2,18 @@
 
 #include <gtest/gtest.h>
 
-#include <deque>
 #include <string>
 
+#include "FakeCarrier.h"
 #include "fleet/Nats.h"
 
 namespace {
 
 using namespace std::chrono_literals;
-using fleet::Carrier;
 using fleet::Outbox;
 using fleet::OutboxRules;
 using fleet::Parcel;
-
-// Keeps what it is given, and answers what it is told to.
-class FakeCarrier : public Carrier {
-  public:
-    void send(const std::string&, std::string_view, const std::string& id, std::uint64_t token) override {
-        if (isDown)
-            throw fleet::NatsError(fleet::NatsError::Reason::unreachable, "down");
-        sent += id.substr(id.rfind('/', id.rfind('/') - 1) + 1) + ";";
-        tokens.push_back(token);
-    }
-    std::optional<Answer> answer(std::chrono::milliseconds) override {
-        if (answers.empty())
-            return std::nullopt;
-        const Answer next = answers.front();
-        answers.pop_front();
-        return next;
-    }
-    void accept(std::uint64_t token) { answers.push_back({token, true, false, false, ""}); }
-    void refuse(std::uint64_t token) {
-        answers.push_back({token, false, false, true, "maximum bytes exceeded"});
-    }
-
-    bool isDown = false;
-    std::string sent;  // first number and count of each parcel
-    std::deque<std::uint64_t> tokens;
-    std::deque<Answer> answers;
-};
+using fleet_tests::FakeCarrier;
 
 class OutboxTest : public testing::Test {
   protected:
@@ -161,6 +134,98 @@ TEST_F(OutboxTest, WithANewConnectionEverythingIsSentAgain) {
     outbox.sendAllAgain();
     outbox.pump(carrier_, 0ms);
     EXPECT_EQ(carrier_.sent, "1/1;2/1;1/1;2/1;");
+}
+
+TEST_F(OutboxTest, WhatIsDroppedIsNeitherSentNorSafe) {
+    Outbox outbox = this->outbox(impatient());
+    outbox.add(0, parcel(1));
+    outbox.add(0, parcel(2));
+    outbox.add(1, parcel(1));
+    outbox.pump(carrier_, 0ms);
+    carrier_.accept(carrier_.tokens[1]);
+    outbox.pump(carrier_, 0ms);
+    outbox.drop(0);
+    outbox.drop(7);
+    EXPECT_EQ(outbox.waiting(0), 0U);
+    carrier_.accept(carrier_.tokens[0]);
+    carrier_.sent.clear();
+    outbox.pump(carrier_, 0ms);
+    EXPECT_EQ(carrier_.sent, "1/1;") << "that of the other D channel";
+    EXPECT_EQ(safe_, "");
+    outbox.add(0, parcel(1));
+    outbox.pump(carrier_, 0ms);
+    carrier_.accept(carrier_.tokens.back());
+    outbox.pump(carrier_, 0ms);
+    EXPECT_EQ(safe_, "0:2;");
+}
+
+TEST_F(OutboxTest, WhatIsDroppedNeedsNoRoom) {
+    OutboxRules rules = patient();
+    rules.mostOctets = 100;
+    Outbox outbox = this->outbox(rules);
+    outbox.add(0, parcel(1));
+    EXPECT_FALSE(outbox.hasRoom(0));
+    outbox.drop(0);
+    EXPECT_TRUE(outbox.hasRoom(0));
+    EXPECT_TRUE(outbox.isEmpty());
+}
+
+TEST_F(OutboxTest, IdsCanBeMadeNew) {
+    Outbox outbox = this->outbox(patient());
+    outbox.add(0, parcel(1));
+    outbox.endIdsWith("~5");
+    outbox.add(0, parcel(2));
+    outbox.pump(carrier_, 0ms);
+    EXPECT_EQ(carrier_.sent, "1/1;2/1~5;");
+}
+
+TEST_F(OutboxTest, AStreamThatNumbersAsBeforeHasForgottenSomething) {
+    Outbox outbox = this->outbox(patient());
+    for (std::uint64_t number = 1; number <= 6; ++number)
+        outbox.add(0, parcel(number));
+    outbox.pump(carrier_, 0ms);
+    struct Case {
+        std::uint64_t sequence;
+        bool isDuplicate;
+        std::uint64_t forgotten;  // in all
+    };
+    std::size_t at = 0;
+    for (const Case& each : {Case{200'001, false, 0}, Case{7, true, 0}, Case{0, false, 0},
+                             Case{200'001, false, 1}, Case{5, false, 2}, Case{6, false, 2}}) {
+        carrier_.answers.push_back(
+            {carrier_.tokens[at++], true, each.isDuplicate, false, "", false, each.sequence});
+        outbox.pump(carrier_, 0ms);
+        EXPECT_EQ(outbox.figures().forgotten, each.forgotten) << at;
+    }
+    EXPECT_EQ(safe_, "0:2;0:3;0:4;0:5;0:6;0:7;");
+}
+
+TEST_F(OutboxTest, ALimitOfTheStreamIsNoFailure) {
+    Outbox outbox = this->outbox(patient());
+    outbox.add(0, parcel(1));
+    outbox.pump(carrier_, 0ms);
+    carrier_.refuse(carrier_.tokens[0]);
+    outbox.pump(carrier_, 0ms);
+    EXPECT_EQ(outbox.figures().failures, 0U);
+    carrier_.answers.push_back({carrier_.tokens[0], false, false, true, "no space left on device"});
+    carrier_.answers.push_back({std::nullopt, false, false, false, "nobody"});
+    outbox.pump(carrier_, 0ms);
+    EXPECT_EQ(outbox.figures().failures, 2U);
+    EXPECT_EQ(outbox.figures().refused, 3U);
+}
+
+TEST_F(OutboxTest, OnlyWhatIsNewToTheStreamShowsThatItTakesFrames) {
+    Outbox outbox = this->outbox(patient());
+    outbox.add(0, parcel(1));
+    outbox.add(0, parcel(2));
+    outbox.pump(carrier_, 0ms);
+    const auto never = outbox.newestKept();
+    carrier_.answers.push_back({carrier_.tokens[0], true, true, false, ""});
+    outbox.pump(carrier_, 0ms);
+    EXPECT_EQ(outbox.newestKept(), never);
+    carrier_.accept(carrier_.tokens[1]);
+    outbox.pump(carrier_, 0ms);
+    EXPECT_GT(outbox.newestKept(), never);
 }
 
 TEST_F(OutboxTest, ItHasLimitsForOneDChannelForAllAndForOctets) {

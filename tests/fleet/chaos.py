@@ -179,7 +179,8 @@ def run(options):
     def traffic(number):
         return Traffic(f"{options.seed} {number}", seconds, options.rate).capture()
     with tempfile.TemporaryDirectory(prefix="fleet-chaos.") as folder, Disk(folder, 2 * megabytes) as disk:
-        with Fleet(folder, options.trunks, traffic, SITES, site_folder=disk.of, megabytes=megabytes) as fleet:
+        with Fleet(folder, options.trunks, traffic, SITES, site_folder=disk.of, megabytes=megabytes,
+                   resend_window=options.window) as fleet:
             print(f"seed {options.seed}: {options.trunks} trunks at {len(SITES)} sites, {options.minutes:g} minutes; up after "
                   f"{time.monotonic() - began:.0f} seconds", flush=True)
             chaos = Chaos(fleet, disk, options.seed, options.spare)
@@ -216,6 +217,7 @@ def main(words=None):
     parser.add_argument("--rate", type=float, default=0.25, help="calls a second on each trunk (default: 0.25)")
     parser.add_argument("--seed", type=int, default=random.randrange(1 << 32), help="repeats traffic and order of the faults")
     parser.add_argument("--spare", action="append", default=[], metavar="FAULT", help="leave this fault out: 'disk of a site'")
+    parser.add_argument("--window", type=int, default=120, help="seconds; the shippers' resend_window (default: 120)")
     parser.add_argument("--patience", type=float, default=600, help="seconds for the store to have all, at the end")
     parser.add_argument("--keep", metavar="FOLDER", help="where everything is copied to if something is wrong")
     options = parser.parse_args(words)

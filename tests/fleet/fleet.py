@@ -66,12 +66,12 @@ class Fleet:
     """`traffic(number)`: the capture that trunk `number` plays, from 1. Trunks are shared out among the sites."""
 
     def __init__(self, folder, trunks, traffic, sites=("london", "leeds"), stores=2, site_folder=None,
-                 megabytes=200):
+                 megabytes=200, resend_window=120):
         self.folder = pathlib.Path(folder)
         self.engines = Engines(self.folder, sites, site_folder)
         self.shippers, self.stores, self.trunks = {}, [], []
         self._plan = (trunks, traffic, stores)
-        self._megabytes = megabytes  # of a site's stream
+        self._megabytes, self._resend_window = megabytes, resend_window  # of a site's stream; of a shipper, in seconds
         self._state_folder = site_folder or (lambda site: self.folder / site)
         self._down = contextlib.ExitStack()
 
@@ -111,7 +111,7 @@ class Fleet:
         state = self._state_folder(site) / "shipper" if site else self.folder
         state.mkdir(parents=True, exist_ok=True)
         text = (f'site = "{site or "centre"}"\nhost = "h1"\nservers = [ {servers} ]\nstate = "{state}"\n'
-                f'metrics = "{self.metrics(site)}"\n'
+                f'metrics = "{self.metrics(site)}"\nresend_window = {self._resend_window}\n'
                 f'[tls]\nauthority = "{authority}"\ncertificate = "{certificate}"\nkey = "{key}"\n')
         for trunk in trunks:
             text += (f'[[dchannel]]\nboard = "{trunk.number}"\ndchannel = "1"\ntrunk = "{trunk.name}"\n'

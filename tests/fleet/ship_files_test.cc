@@ -55,7 +55,7 @@ TEST_F(ShipFiles, APlaceThatIsNotThereIsNothingAndADamagedOneIsSaid) {
 
 constexpr char config[] =
     "site = \"london\"\nhost = \"h1\"\nservers = [\"tls://a:4222\", \"tls://b:4222\"]\nstate = \"state\"\n"
-    "redact = \"/etc/key\"\nleast_free = 5\nstream = \"OTHER\"\n"
+    "redact = \"/etc/key\"\nleast_free = 5\nstream = \"OTHER\"\nresend_window = 7\n"
     "[tls]\nauthority = \"ca.pem\"\ncertificate = \"/c.pem\"\nkey = \"/c.key\"\n"
     "[[dchannel]]\nboard = \"0\"\ndchannel = \"1\"\ntrunk = \"pri1\"\nfolder = \"rec\"\ngroup = \"nfas-a\"\n"
     "[[dchannel]]\nboard = \"0\"\ndchannel = \"2\"\ntrunk = \"pri2\"\nlog = \"/run/x.fifo\"\n";
@@ -70,6 +70,7 @@ TEST_F(ShipFiles, AConfigurationSaysItAll) {
     EXPECT_EQ(read.state, folder_.file("state"));
     EXPECT_EQ(read.redact, "/etc/key");
     EXPECT_EQ(read.leastFree, 5U);
+    EXPECT_EQ(read.resendWindow.count(), 7);
     EXPECT_EQ(read.stream, "OTHER");
     ASSERT_EQ(read.dChannels.size(), 2U);
     EXPECT_EQ(toText(read.dChannels[0].head.address), "london/h1/0/1");
@@ -100,6 +101,7 @@ TEST_F(ShipFiles, AConfigurationThatCannotBeObeyedIsSaidWithItsLine) {
              Case{with("servers = [\"tls://a:4222\", \"tls://b:4222\"]\n", ""), "list of texts"},
              Case{with("host", "hots"), ":2: hots is not known"},
              Case{with("least_free = 5", "least_free = 101"), "from 0 to 100"},
+             Case{with("resend_window = 7", "resend_window = 3601"), "from 0 to 3600"},
              Case{with("key = \"/c.key\"\n", ""), "certificate and key together"},
              Case{with("folder = \"rec\"\n", ""), "either folder or log"},
              Case{with("folder = \"rec\"\n", "folder = \"rec\"\nlog = \"x\"\n"), "either folder or log"},
