@@ -24,6 +24,10 @@ std::string_view textOf(Kind kind) {
 
 constexpr std::string_view channelWord = "trunk";
 
+std::string nameOf(std::string_view input) {
+    return input.empty() || input == "-" ? std::string("the input") : safe(input);
+}
+
 // "trunk1" for the first name, "trunk2" for the second.
 const std::string& numbered(Redacting::Names& known, std::string_view name, std::string_view word) {
     auto found = known.find(name);
@@ -40,8 +44,8 @@ bool namesKey(const capture::Item& item, const redaction::Key& key) {
     const std::string_view check = item.text.substr(capture::redactedPrefix.size());
     const std::string known = redaction::checkOf(key);
     if (check != known)
-        throw FileError("the input was redacted with another key: its check is " + safe(check) +
-                        ", that of this key " + known);
+        throw FileError(nameOf(item.frame.place.file) + " was redacted with another key: its check is " +
+                        safe(check) + ", that of this key " + known);
     return true;
 }
 

@@ -7,6 +7,7 @@
 #include <filesystem>
 #include <limits>
 #include <optional>
+#include <set>
 #include <utility>
 
 #include "capture/open.h"
@@ -71,6 +72,13 @@ std::unique_ptr<capture::Reader> openStore(const Options& options) {
     return std::make_unique<Merge>(openers);
 }
 
+// Opens the input, and returns an opener that hands over its reader.
+Opener openNow(const std::string& file, const InputOptions& input, std::vector<Primed*>& pipes) {
+    auto reader = std::make_shared<std::unique_ptr<Primed>>(std::make_unique<Primed>(openFile(file, input)));
+    pipes.push_back(reader->get());
+    return [reader] { return std::move(*reader); };
+}
+
 }  // namespace
 
 std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOptions& input) {
@@ -112,7 +120,13 @@ std::vector<std::string> inputNames(const Options& options) {
     return {name};
 }
 
-std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*chatter*/) {
+bool canBeReadAgain(const std::string& file) {
+    std::error_code ignored;
+    return file != "-" && std::filesystem::is_regular_file(file, ignored);
+}
+
+std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*chatter*/,
+                                            std::vector<Primed*>* pipes) {
     if (!options.input.store.empty())
         return openStore(options);
     const std::vector<std::string> files = inputFiles(options);
@@ -122,9 +136,13 @@ std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*c
     if (input.follow && files.size() > 1 && !input.merge)
         throw UsageError("--follow takes one input, or several with --merge");
     std::vector<Opener> openers;
+    std::set<std::string> opened;
     for (const std::string& file : files) {
         checkReadable(file);
-        openers.emplace_back([file, &input] { return openFile(file, input); });
+        if (pipes != nullptr && !canBeReadAgain(file) && opened.insert(file).second)
+            openers.push_back(openNow(file, input, *pipes));
+        else
+            openers.emplace_back([file, &input] { return openFile(file, input); });
     }
     if (input.merge && files.size() > 1)
         return std::make_unique<Merge>(openers);
@@ -142,9 +160,8 @@ void checkForms(const Options& options) {
     if (options.input.follow)
         return;
     for (const std::string& file : inputFiles(options)) {
-        std::error_code ignored;
         capture::Item item;
-        if (file != "-" && std::filesystem::is_regular_file(file, ignored))
+        if (canBeReadAgain(file))
             openFile(file, options.input)->next(item);
     }
 }

@@ -9,6 +9,7 @@
 #include "capture/Reader.h"
 #include "reader/Chatter.h"
 #include "reader/Options.h"
+#include "reader/Primed.h"
 
 namespace reader {
 
@@ -26,7 +27,12 @@ std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOp
 // Opens all inputs as one stream: one after another, or in the order of time with --merge. The D channels of
 // a store come in the order of time. Throws FileError or capture::BadInput, before anything is read, if one
 // cannot be opened or its form is not known.
-std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& chatter);
+//
+// If `pipes` is given, inputs that can be read only once are all opened now, and `pipes` gets a pointer to
+// each, which the stream owns. The caller may wait there for the first item of each before it reads the
+// stream. An input that is named twice is there once.
+std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& chatter,
+                                            std::vector<Primed*>* pipes = nullptr);
 
 // The D channels of a store that share their calls do so as if --nfas named them. Without a store nothing is
 // done. Throws what openInputs() throws for a store.
@@ -35,6 +41,9 @@ void joinGroupsOfStore(Options& options);
 // Throws capture::BadInput if one of the inputs is a regular file whose form is not known. Does not look at
 // inputs that are followed, because they may be empty yet, nor at pipes, because they can be read only once.
 void checkForms(const Options& options);
+
+// Whether the input is a regular file, and so can be read a second time.
+bool canBeReadAgain(const std::string& file);
 
 }  // namespace reader
 

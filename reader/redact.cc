@@ -1,7 +1,5 @@
 #include "reader/redact.h"
 
-#include <filesystem>
-
 #include "capture/Writer.h"
 #include "capture/notes.h"
 #include "reader/Redacting.h"
@@ -44,19 +42,18 @@ const Form& formOf(const Options& options) {
     throw UsageError("redact needs --to FORM, since the input's own form cannot be seen or written");
 }
 
-// Refuses inputs that were redacted with another key, which they name before their first frame. A pipe can be
-// read only once, so of several pipes only the first is looked at in advance.
+// Refuses inputs that were redacted with another key, before anything is written. Each names its key before its
+// first frame. A pipe can be read only once, so it is asked for its first item, which run() gets as well.
 void checkKeys(Session& session, const Options& options, const Key& key) {
     for (const std::string& file : inputFiles(options)) {
-        std::error_code ignored;
-        if (file == "-" || !std::filesystem::is_regular_file(file, ignored))
+        if (!canBeReadAgain(file))
             continue;
         const auto reader = openFile(file, options.input);
         capture::Item item;
         while (reader->next(item) == capture::Reader::Next::item && !item.isFrame() && !namesKey(item, key)) {
         }
     }
-    if (const capture::Item* const first = session.firstItem(); first != nullptr)
+    for (const capture::Item* const first : session.firstItems())
         namesKey(*first, key);
 }
 
@@ -140,7 +137,7 @@ std::span<const OptionRow> redactOptions() {
 
 int runRedact(const Options& options, Chatter& chatter) {
     const Form& form = formOf(options);
-    Session session(options, chatter);
+    Session session(options, chatter, options.redact.undo ? Session::Pipes::atOnce : Session::Pipes::inTurn);
     session.tellGuessedVariant("redacted");
     const Key key = redactionKey(options, chatter);  // before an output is emptied
     if (options.redact.undo)

@@ -40,13 +40,13 @@ bool useColors(const OutputOptions& options, const Output& out) {
     return out.isTerminal() && !dumb && (noColor == nullptr || *noColor == '\0');
 }
 
-Session::Session(const Options& options, Chatter& chatter)
+Session::Session(const Options& options, Chatter& chatter, Pipes pipes)
     : options_(options),
       chatter_(chatter),
       filter_(options.filters),
       callFilter_(options.filters),
       tracker_(options.input),
-      reader_(openInputs(options, chatter)) {
+      reader_(openInputs(options, chatter, pipes == Pipes::atOnce ? &pipes_ : nullptr)) {
     stopOnSignals();
 }
 
@@ -56,9 +56,16 @@ void Session::awaitInputs() {
         throw StoppedEarly();
 }
 
-const capture::Item* Session::firstItem() {
-    awaitInputs();
-    return reader_.first();
+std::vector<const capture::Item*> Session::firstItems() {
+    checkForms(options_);
+    std::vector<const capture::Item*> items;
+    for (Primed* const pipe : pipes_) {
+        if (!pipe->awaitFirst(stopped))
+            throw StoppedEarly();
+        if (pipe->first() != nullptr)
+            items.push_back(pipe->first());
+    }
+    return items;
 }
 
 Output& Session::output(std::string_view form, bool (*looksRight)(std::string_view)) {

@@ -4,6 +4,7 @@
 
 #include <functional>
 #include <memory>
+#include <vector>
 
 #include "capture/Reader.h"
 #include "reader/CallFilter.h"
@@ -24,17 +25,21 @@ bool useColors(const OutputOptions& options, const Output& out);
 // Owns the inputs and the output that the options name. There is one in the process.
 class Session {
   public:
+    // When inputs are opened that can be read only once.
+    enum class Pipes : std::uint8_t { inTurn, atOnce };
+
     // Opens the inputs. Throws UsageError or FileError. From now on SIGINT and SIGTERM end the work in order.
-    Session(const Options& options, Chatter& chatter);
+    Session(const Options& options, Chatter& chatter, Pipes pipes = Pipes::inTurn);
 
     // Opened by the first call: standard output, or the file that the options name, created or emptied. That
     // happens only once all inputs are known to have a form that can be read, so an input that cannot be read
     // leaves the file as it was; so does a signal before the first item (StoppedEarly). A file that is
     // neither empty nor of the right form ("text") is refused with FileError, and so is one of the inputs.
     Output& output(std::string_view form = "", bool (*looksRight)(std::string_view) = looksLikeNothing);
-    // Waits for the first item of the inputs, which run() hands on like the others; null if there is none.
-    // Throws StoppedEarly if a signal comes before it.
-    const capture::Item* firstItem();
+    // Waits for the first item of each input that was opened at once. run() hands them on like the others.
+    // Inputs that are empty give none. Throws StoppedEarly if a signal comes before they are there. To be
+    // called before output().
+    std::vector<const capture::Item*> firstItems();
     bool useColors() { return reader::useColors(options_.output, output()); }
 
     // Says once if frames are `done` ("decoded") by the rules of a variant that nobody has named.
@@ -59,6 +64,7 @@ class Session {
     Filter filter_;
     CallFilter callFilter_;
     Tracker tracker_;
+    std::vector<Primed*> pipes_;  // that were opened at once; reader_ owns them
     Primed reader_;
     std::unique_ptr<Output> output_;
 };

@@ -7,9 +7,10 @@ import os
 import re
 import stat
 import struct
+import subprocess
 import unittest
 
-from lapdread_harness import EXAMPLES, Folder, output, run
+from lapdread_harness import EXAMPLES, LAPDREAD, LIMIT, Folder, environment, output, run
 
 FORMS = ("pcapng", "pcap", "jsonl", "csv", "hex", "log")
 NUMBER = re.compile(r"^[0-9]{6,}$")
@@ -263,6 +264,32 @@ class Redact(Folder):
             self.assertEqual(to.read_text(), before)
         output("redact", "--undo", "--key", self.key, mine, "-o", to)
         self.assertNotEqual(to.read_text(), before)
+
+    def test_asks_every_pipe_for_its_key_before_anything_is_written(self):
+        other, mine, others = self.folder / "other", self.folder / "mine.hex", self.folder / "others.hex"
+        output("redact", "--key", self.key, EXAMPLES["net5"], "-o", mine)
+        output("redact", "--key", other, EXAMPLES["net5"], "-o", others)
+        to = self.folder / "to.hex"
+        before = output("convert", "--to", "hex", EXAMPLES["ntt"])
+        to.write_text(before)
+
+        def undo(*words):
+            command = f'"$0" redact --quiet --undo --key "{self.key}" {" ".join(words)} -o "{to}"'
+            return subprocess.run(["bash", "-c", command, LAPDREAD], capture_output=True, text=True, timeout=LIMIT,
+                                  env=environment(), check=False)
+
+        for words in ((f"<(cat {mine})", f"<(cat {others})"), ("--merge", f"<(cat {mine})", f"<(cat {others})"),
+                      (str(mine), f"<(cat {mine})", f"<(cat {others})")):
+            with self.subTest(words):
+                done = undo(*words)
+                self.assertEqual((done.returncode, "another key" in done.stderr), (2, True), done.stderr)
+                self.assertEqual(to.read_text(), before)
+        done = undo(f"<(cat {mine})", str(mine), f"<(cat {mine})")
+        self.assertEqual((done.returncode, done.stderr), (0, ""))
+        alone = self.folder / "alone.hex"
+        output("redact", "--undo", "--key", self.key, mine, mine, mine, "-o", alone)
+        self.assertEqual(to.read_text(), alone.read_text())
+        self.assertEqual(len(frames("net5", to)), 3 * len(frames("net5", mine)))
 
     def test_says_that_it_cannot_tell_the_key_of_forms_without_comments(self):
         for form in ("pcap", "log"):
