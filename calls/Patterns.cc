@@ -69,8 +69,8 @@ void Patterns::linkChanged(const Moment& moment, const std::string& dChannel, bo
 void Patterns::linkFault(const Finding& fault, std::int64_t at) {
     if (std::find(linkFaults.begin(), linkFaults.end(), fault.kind) == linkFaults.end())
         return;
-    faults_.push_back(
-        {at, fault.dChannel, std::string(fault.kind->id) + " of frame " + std::to_string(fault.frame)});
+    faults_.push_back({at, fault.dChannel, fault.severity,
+                       std::string(fault.kind->id) + " of frame " + std::to_string(fault.frame)});
     if (faults_.size() > mostFaults)
         faults_.pop_front();
 }
@@ -88,15 +88,16 @@ bool Patterns::endsWithLink(const Call& call) const {
 }
 
 // The findings that were reported of the link when it went down, or since then.
-std::string Patterns::faultsOfLink() const {
-    std::vector<std::string> words;
+std::vector<const Patterns::LinkFault*> Patterns::faultsOfLink() const {
+    std::vector<const LinkFault*> faults;
     for (const LinkFault& fault : faults_) {
         if (fault.dChannel == link_->dChannel && fault.at >= link_->moment.at - faultBefore)
-            words.push_back(fault.words);
+            faults.push_back(&fault);
     }
-    return listOf(words);
+    return faults;
 }
 
+// If an error of the link has been reported, the calls that went with it are its consequence, and a note.
 void Patterns::reportMassClear() {
     if (lost_.size() >= callsThatEndTogether) {
         std::vector<std::string> names;
@@ -104,10 +105,18 @@ void Patterns::reportMassClear() {
             names.push_back(std::to_string(call));
         std::string sentence = std::to_string(lost_.size()) + " calls ended with the link, which " +
                                (link_->isUp ? "was set up" : "went down") + " here: " + listOf(names);
-        if (const std::string faults = faultsOfLink(); !faults.empty())
-            sentence += "; they follow from " + faults;
-        stuck_.lostWithLink(
-            findingOf(findings::massClear, link_->moment, link_->dChannel, std::move(sentence)), lost_);
+        bool isConsequence = false;
+        std::vector<std::string> words;
+        for (const LinkFault* const fault : faultsOfLink()) {
+            words.push_back(fault->words);
+            isConsequence = isConsequence || fault->severity == Severity::error;
+        }
+        if (!words.empty())
+            sentence += "; they follow from " + listOf(words);
+        Finding finding = findingOf(findings::massClear, link_->moment, link_->dChannel, std::move(sentence));
+        if (isConsequence)
+            finding.severity = Severity::note;
+        stuck_.lostWithLink(std::move(finding), lost_);
     }
     lost_.clear();
 }

@@ -44,7 +44,6 @@ class Patterns : public CallObserver {
     static std::string detailsOf(const Failure& failure);
 
     bool endsWithLink(const Call& call) const;
-    std::string faultsOfLink() const;
     void reportMassClear();
     void findSameDuration(const Call& call);
     void findCauseBurst(const Call& call);
@@ -60,8 +59,11 @@ class Patterns : public CallObserver {
     struct LinkFault {
         std::int64_t at = 0;
         std::string dChannel;
+        Severity severity = Severity::note;
         std::string words;  // "sabme-unanswered of frame 12"
     };
+
+    std::vector<const LinkFault*> faultsOfLink() const;
 
     std::optional<LinkChange> link_;      // the last change
     std::deque<LinkFault> faults_;        // of links, the last few

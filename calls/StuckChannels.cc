@@ -81,10 +81,12 @@ void StuckChannels::settleLostLinks() {
             }))
             return false;
         Finding finding = link.finding;
-        if (!finding.channels.empty())
+        if (!finding.channels.empty()) {
+            finding.severity = finding.kind->severity;  // the link may be well again, and they are not
             finding.sentence += "; neither cleared nor restarted since then: channel" +
                                 std::string(finding.channels.size() == 1 ? " " : "s ") +
                                 listOf(finding.channels);
+        }
         sink_.report(std::move(finding));
         return true;
     });

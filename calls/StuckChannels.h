@@ -24,7 +24,7 @@ class StuckChannels {
     // The channel was restarted, or another call has taken it.
     void freed(const ChannelKey& channel) { orphans_.erase(channel); }
     // Calls ended with their link; `massClear` says so. It is reported as soon as it is known which of their
-    // channels stay behind, and names these.
+    // channels stay behind, and names these. If it names some, it has the severity of its kind.
     void lostWithLink(Finding massClear, std::vector<std::uint64_t> calls);
     // The board restarted: who holds what is not known any more.
     void boardRestarted();

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "calls/FindingKinds.h"
 #include "tests/calls/analysed.h"
 
 namespace calls {
@@ -239,6 +240,36 @@ TEST(Channels, ThatStayBehindWithALinkStandInItsFinding) {
         ASSERT_EQ(collected.findings.size(), 1U);
         const std::vector<std::string> stuck{"1", "2", "3"};
         EXPECT_EQ(collected.findings[0].channels, restarted ? std::vector<std::string>() : stuck);
+        EXPECT_EQ(collected.findings[0].severity, Severity::error);
+    }
+}
+
+TEST(Channels, ThatStayBehindAreAnErrorThoughTheLinkHasOneOfItsOwn) {
+    for (const bool restarted : {false, true}) {
+        CallScript script;
+        script.at(0).linkUp();
+        for (std::uint8_t i = 1; i <= 3; ++i)
+            talk(script.at(i * 1000), i, i);
+        script.at(9000).raw(Side::peer, true, {0x53}).raw(Side::us, false, {0x73});  // DISC, UA
+        for (int i = 0; i < 4; ++i)
+            script.at(10000 + i * 1000).raw(Side::us, true, {0x7F});  // SABME that nobody answers
+        script.at(200000).linkUp();
+        for (std::uint8_t i = 1; restarted && i <= 3; ++i) {
+            script.us(m::restart, 0, false, {channel(i), restartIndicator(0)});
+            script.peer(m::restartAcknowledge, 0, true, {channel(i), restartIndicator(0)});
+        }
+        Collected collected;
+        Analysis analysis({}, collected);
+        std::uint64_t number = 0;
+        for (const Sent& sent : script.frames())
+            analysis.take(sent.frame, ++number);
+        analysis.advance(500 * second);
+        analysis.finish();
+        ASSERT_EQ(collected.findings.size(), 2U) << collected.lines;
+        EXPECT_EQ(collected.findings[0].kind, &findings::sabmeUnanswered);
+        EXPECT_EQ(collected.findings[0].severity, Severity::error);
+        EXPECT_EQ(collected.findings[1].kind, &findings::massClear);
+        EXPECT_EQ(collected.findings[1].severity, restarted ? Severity::note : Severity::error);
     }
 }
 

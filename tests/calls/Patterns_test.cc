@@ -117,11 +117,37 @@ TEST(Patterns, ReferToTheFaultOfTheLinkThatCallsEndedWith) {
         if (flaps) {
             EXPECT_EQ(collected.lines, "9 link-flap\n10 mass-clear\n");
             EXPECT_EQ(collected.findings.back().sentence, says + "; they follow from link-flap of frame 9");
+            EXPECT_EQ(collected.findings.back().severity, Severity::note);
         } else {
             EXPECT_EQ(collected.lines, "12 mass-clear\n");
             EXPECT_EQ(collected.findings.back().sentence, says);
+            EXPECT_EQ(collected.findings.back().severity, Severity::error);
         }
     }
+}
+
+TEST(Patterns, ReportLostCallsAsAnErrorIfOnlyAWarningOfTheLinkExplainsThem) {
+    CallScript script;
+    script.at(0).linkUp();
+    for (std::uint16_t i = 1; i <= 3; ++i) {
+        script.at(i * 100).us(m::setup, i, false, {bearerSpeech(), channel(static_cast<std::uint8_t>(i))});
+        script.at(i * 100 + 10).peer(m::connect, i, true);
+    }
+    script.at(8900).raw(Side::peer, true, {0x53}).raw(Side::us, false, {0x73});  // DISC, UA
+    script.at(9000).raw(Side::us, true, {0x7F}).raw(Side::peer, false, {0x1F});  // SABME, DM
+    script.at(9010).linkUp();
+    for (std::uint16_t i = 1; i <= 3; ++i)
+        script.at(9100).peer(m::releaseComplete, i, true, {cause(41)});
+    Collected collected;
+    Analysis analysis({}, collected);
+    std::uint64_t number = 0;
+    for (const Sent& sent : script.frames())
+        analysis.take(sent.frame, ++number);
+    analysis.advance(400 * second);
+    analysis.finish();
+    ASSERT_EQ(collected.lines, "12 link-refused\n14 mass-clear\n");
+    EXPECT_EQ(collected.findings.front().severity, Severity::warning);
+    EXPECT_EQ(collected.findings.back().severity, Severity::error);
 }
 
 TEST(Patterns, SayWhatTheCauseOfABurstIsAbout) {
