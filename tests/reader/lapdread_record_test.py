@@ -293,6 +293,62 @@ class Trigger(Recording):
                 self.assertEqual(recorder.wait(LIMIT), 1)
 
 
+class TwoTrunks(Recording):
+    def start_recorder(self):
+        with open(self.folder / "said", "w", encoding="ascii") as said:
+            return self.start(LAPDREAD, "record", "--merge", "--files", "1", "--on", "cause:16", "--before", "10s", "--after",
+                              "10s", "a.hex", "b.hex", stderr=said)
+
+    def of(self, trunk, kept=False):
+        return in_order(path for path in self.folder.glob(f"{trunk}.2*") if (".kept." in path.name) == kept)
+
+    def hold(self, a, b):
+        """Waits until the files of each trunk hold these numbers."""
+        def there():
+            try:
+                return (self.numbers(*self.of("a")), self.numbers(*self.of("b"))) == (a, b)
+            except AssertionError:
+                return False  # a file without its head, or one that has just got its name or is removed
+        until(there, f"the files hold {a} and {b}")
+
+    def states(self):
+        return [json.loads((self.folder / f"{trunk}.state.json").read_text()) for trunk in "ab"]
+
+    def test_are_recorded_at_once_each_with_its_files_triggers_and_state(self):
+        self.write("a.hex", *[numbered(number, 2 * number) for number in (1, 2, 3)])
+        self.write("b.hex", *[numbered(number, 2 * number + 1) for number in (101, 102, 103)],
+                   frame(210, Trigger.DISCONNECT.replace("08020001", "08020068")))  # of call 104
+        recorder = self.start_recorder()
+        self.hold([1, 2, 3], [101, 102, 103, 104])
+        recorder.send_signal(signal.SIGHUP)
+        until(lambda: not list(self.folder.glob("[ab].2*Z.pcapng.part")), "both files are finished")
+        self.write("a.hex", numbered(4, 300))
+        self.write("b.hex", numbered(105, 301))
+        self.hold([1, 2, 3, 4], [101, 102, 103, 104, 105])  # the kept number of files does not count those being written
+        recorder.send_signal(signal.SIGUSR1)
+        until(lambda: "b: trigger, what surrounds it is kept: SIGUSR1" in self.said(), "the signal is heeded")
+        recorder.send_signal(signal.SIGHUP)
+        self.hold([4], [105])
+        self.stop(recorder)
+        self.assertEqual([line for line in self.said().splitlines() if "trigger" in line],
+                         ["lapdread: b: trigger, what surrounds it is kept: cause:16 (frame 7)",
+                          "lapdread: a: trigger, what surrounds it is kept: SIGUSR1",
+                          "lapdread: b: trigger, what surrounds it is kept: SIGUSR1"])
+        self.assertEqual([self.numbers(path) for path in self.of("a", kept=True)], [[4]])
+        self.assertEqual([self.numbers(path) for path in self.of("b", kept=True)], [[101, 102, 103, 104], [105]])
+        before = self.states()
+        self.assertEqual([state["next"] for state in before], [5, 6])
+        self.assertEqual([state["trunk"] for state in before], ["a", "b"])
+        # Each trunk goes on where it ended, also when only one of them has something new.
+        self.write("b.hex", numbered(106, 302))
+        recorder = self.start_recorder()
+        self.hold([4], [105, 106])
+        self.stop(recorder)
+        after = self.states()
+        self.assertEqual([state["next"] for state in after], [5, 7])
+        self.assertEqual([state["run"] for state in after], [state["run"] for state in before])
+
+
 @unittest.skipUnless(os.geteuid() == 0, "only root can mount a disk that is small enough to be full")
 class FullDisk(Recording):
     def setUp(self):
