@@ -42,8 +42,8 @@ const Form& formOf(const Options& options) {
     throw UsageError("redact needs --to FORM, since the input's own form cannot be seen or written");
 }
 
-// Refuses inputs that were redacted with another key, before anything is written. Each names its key before its
-// first frame. A pipe can be read only once, so it is asked for its first item, which run() gets as well.
+// Refuses inputs that were redacted with another key, before anything is written. Each names its key before
+// its first frame. A pipe can be read only once, so it is asked for its first item, which run() gets as well.
 void checkKeys(Session& session, const Options& options, const Key& key) {
     for (const std::string& file : inputFiles(options)) {
         if (!canBeReadAgain(file))
