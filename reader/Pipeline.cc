@@ -17,7 +17,7 @@ namespace reader {
 namespace {
 
 // Large enough that taking turns costs little, small enough that octets and text stay in a processor's cache.
-constexpr std::size_t itemsInChunk = 256;
+constexpr std::size_t itemsInChunk = 512;
 constexpr std::chrono::milliseconds longestWait{500};
 // How much later than a frame passed a recorder may write it. Time on this host's clock counts only after
 // that.
@@ -172,7 +172,9 @@ class Run {
     }
 
     Next fill(Chunk& chunk) {
-        std::swap(chunk, heldBack_);
+        if (!heldBack_
+                 .empty())  // otherwise each thread keeps its own memory, which is in its processor's cache
+            std::swap(chunk, heldBack_);
         std::size_t room = work_.eachAtOnce ? 1 : itemsInChunk;
         Next next = Next::item;
         addReleased(chunk);
@@ -212,7 +214,9 @@ class Run {
     // other thread is left.
     void handOnRest(Chunk& chunk, Composer& composer) {
         chunk.clear();
-        std::swap(chunk, heldBack_);
+        if (!heldBack_
+                 .empty())  // otherwise each thread keeps its own memory, which is in its processor's cache
+            std::swap(chunk, heldBack_);
         if (work_.gate != nullptr)
             work_.gate->finish();
         addReleased(chunk);

@@ -266,14 +266,18 @@ std::vector<std::string> withCommand(std::vector<std::string> words) {
     return words;
 }
 
-void describe(CLI::App& app, Options& options) {
+// Describes the options of one command, or of all if that is null. Describing all takes milliseconds, which a
+// script feels that runs lapdread for each of many files.
+void describe(CLI::App& app, Options& options, const Command* only = nullptr) {
     app.formatter(std::make_shared<Help>());
     app.footer("\n" + std::string(moreOnAll));
     app.set_help_flag("-h,--help", "Print this and exit");
     app.set_version_flag("-V,--version", "lapdread " LAPDREAD_VERSION, "Print the version and exit");
     app.require_subcommand(0, 1);
-    for (const Command& command : commands())
-        addCommand(app, command, options);
+    for (const Command& command : commands()) {
+        if (only == nullptr || only == &command)
+            addCommand(app, command, options);
+    }
 }
 
 }  // namespace
@@ -289,10 +293,11 @@ void showDescription(const std::function<void(const CLI::App&)>& visit) {
 
 CommandLine parseCommandLine(std::vector<std::string> words) {
     words = joinNegations(withCommand(std::move(words)));
+    const Command* const only = words.empty() ? nullptr : commandNamed(words.front());
     std::reverse(words.begin(), words.end());  // CLI11 takes the words from the end
     CommandLine line;
     CLI::App app(about, "lapdread");
-    describe(app, line.options);
+    describe(app, line.options, only);
     try {
         app.parse(std::move(words));
     } catch (const CLI::CallForHelp&) {
