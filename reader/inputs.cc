@@ -11,7 +11,7 @@
 #include <utility>
 
 #include "capture/open.h"
-#include "fleet/query/Store.h"
+#include "fleet/query/openStore.h"
 #include "lapdlog/log.h"
 #include "reader/Joined.h"
 #include "reader/errors.h"
@@ -65,7 +65,7 @@ std::unique_ptr<capture::Reader> openStore(const Options& options) {
                          (input.files.empty() ? options.words : input.files).front());
     if (input.follow)
         throw UsageError("--follow takes a file; a store is read as it is now");
-    const auto store = std::make_shared<fleet::Store>(queryOf(options));
+    const std::shared_ptr<fleet::Store> store = fleet::openStore(queryOf(options));
     std::vector<Opener> openers;
     for (const fleet::Store::Trunk& trunk : store->trunks())
         openers.emplace_back([store, &trunk] { return store->read(trunk); });
@@ -152,7 +152,7 @@ std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*c
 void joinGroupsOfStore(Options& options) {
     if (options.input.store.empty())
         return;
-    for (std::vector<std::string>& group : fleet::Store(queryOf(options)).groups())
+    for (std::vector<std::string>& group : fleet::openStore(queryOf(options))->groups())
         options.calls.groups.push_back(std::move(group));
 }
 

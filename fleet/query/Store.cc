@@ -32,11 +32,11 @@ bool isNamed(const std::vector<std::string>& names, const std::string& name) {
     return std::find(names.begin(), names.end(), name) != names.end();
 }
 
-}  // namespace
-
 // The transaction is open as long as the object lives.
-class Store::Snapshot {
+class Snapshot {
   public:
+    using Trunk = Store::Trunk;
+
     explicit Snapshot(StoreQuery query)
         : query_(std::move(query)), connection_(query_.url), work_(connection_) {
         checkSchema();
@@ -100,8 +100,6 @@ class Store::Snapshot {
     std::vector<Trunk> trunks_;
     unsigned cursors_ = 0;
 };
-
-namespace {
 
 // Reads the frames of whole days, and what the recorder said after the last frame of each run.
 class TrunkReader : public capture::Reader {
@@ -196,38 +194,44 @@ class TrunkReader : public capture::Reader {
     std::uint64_t told_ = 0;  // the run whose end was told
 };
 
+class Database : public Store {
+  public:
+    explicit Database(StoreQuery query) : snapshot_(std::make_shared<Snapshot>(std::move(query))) {}
+
+    const std::vector<Trunk>& trunks() const override { return snapshot_->trunks(); }
+
+    std::vector<std::vector<std::string>> groups() const override {
+        std::map<std::pair<std::string, std::string>, std::vector<std::string>> byName;
+        for (const Trunk& trunk : trunks()) {
+            if (!trunk.group.empty())
+                byName[{trunk.site, trunk.group}].push_back(trunk.name);
+        }
+        std::vector<std::vector<std::string>> groups;
+        for (auto& [name, members] : byName) {
+            if (members.size() > 1)
+                groups.push_back(std::move(members));
+        }
+        return groups;
+    }
+
+    std::unique_ptr<capture::Reader> read(const Trunk& trunk) const override {
+        try {
+            return std::make_unique<TrunkReader>(snapshot_, snapshot_->work(), trunk, snapshot_->newCursor(),
+                                                 snapshot_->query());
+        } catch (const pqxx::failure& error) {
+            fail(error);
+        }
+    }
+
+  private:
+    std::shared_ptr<Snapshot> snapshot_;
+};
+
 }  // namespace
 
-Store::Store(StoreQuery query) {
+std::unique_ptr<Store> connectStore(StoreQuery query) {
     try {
-        snapshot_ = std::make_shared<Snapshot>(std::move(query));
-    } catch (const pqxx::failure& error) {
-        fail(error);
-    }
-}
-
-Store::~Store() = default;
-
-const std::vector<Store::Trunk>& Store::trunks() const { return snapshot_->trunks(); }
-
-std::vector<std::vector<std::string>> Store::groups() const {
-    std::map<std::pair<std::string, std::string>, std::vector<std::string>> byName;
-    for (const Trunk& trunk : trunks()) {
-        if (!trunk.group.empty())
-            byName[{trunk.site, trunk.group}].push_back(trunk.name);
-    }
-    std::vector<std::vector<std::string>> groups;
-    for (auto& [name, members] : byName) {
-        if (members.size() > 1)
-            groups.push_back(std::move(members));
-    }
-    return groups;
-}
-
-std::unique_ptr<capture::Reader> Store::read(const Trunk& trunk) const {
-    try {
-        return std::make_unique<TrunkReader>(snapshot_, snapshot_->work(), trunk, snapshot_->newCursor(),
-                                             snapshot_->query());
+        return std::make_unique<Database>(std::move(query));
     } catch (const pqxx::failure& error) {
         fail(error);
     }

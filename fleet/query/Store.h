@@ -22,7 +22,8 @@ struct StoreQuery {
 };
 
 // A connection to the database with one transaction, so that everything that is read through it shows the
-// store at one moment. Used by one thread at a time, together with its readers.
+// store at one moment. Used by one thread at a time, together with its readers. The class is abstract because
+// lapdread takes it from a module that it loads (openStore.h).
 class Store {
   public:
     struct Trunk {
@@ -33,29 +34,24 @@ class Store {
         std::string group;  // NFAS, of this site; empty: none
     };
 
-    // Throws capture::BadInput if the store cannot be reached, has no schema that this program knows, or has
-    // no such trunk or site.
-    explicit Store(StoreQuery query);
-    ~Store();
-    Store(const Store&) = delete;
-    Store& operator=(const Store&) = delete;
+    virtual ~Store() = default;
 
     // The D channels that the query chooses, in the order of their addresses.
-    const std::vector<Trunk>& trunks() const;
+    virtual const std::vector<Trunk>& trunks() const = 0;
 
     // The NFAS groups among them: the names of the D channels of each group, at least two.
-    std::vector<std::vector<std::string>> groups() const;
+    virtual std::vector<std::vector<std::string>> groups() const = 0;
 
     // Makes a reader of the frames of a D channel, run after run. If the query has times, the reader gives
     // whole days (UTC): from the day before `since` to the day after `until`, and further days if a call was
     // alive at `since` or `until`, so that this call is complete. The reader keeps the connection open, also
     // when this object is gone. Its functions throw capture::BadInput.
-    std::unique_ptr<capture::Reader> read(const Trunk& trunk) const;
-
-  private:
-    class Snapshot;
-    std::shared_ptr<Snapshot> snapshot_;
+    virtual std::unique_ptr<capture::Reader> read(const Trunk& trunk) const = 0;
 };
+
+// Connects to the store. Throws capture::BadInput if the store cannot be reached, has no schema that this
+// program knows, or has no such trunk or site.
+std::unique_ptr<Store> connectStore(StoreQuery query);
 
 }  // namespace fleet
 

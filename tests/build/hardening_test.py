@@ -9,9 +9,11 @@ import unittest
 
 BUILD = pathlib.Path(os.environ["BUILD_TREE"])
 SOURCE = pathlib.Path(os.environ["SOURCE_TREE"])
-PROGRAMS = [BUILD / "bin" / name for name in ("lapdmon", "softboard", "kv9relayd")]
-LIBRARY = BUILD / "lib/lapdmon/libnorv.so"
-LAYERS = ("app", "decoder", "hostsvc", "relay", "softboard", "vela")
+PROGRAMS = [BUILD / "bin" / name for name in ("lapdmon", "softboard", "kv9relayd", "lapdread", "lapdship", "lapdstore")]
+STORE = BUILD / "lib/lapdread/store.so"
+LIBRARIES = [BUILD / "lib/lapdmon/libnorv.so", STORE]
+LAYERS = ("app", "calls", "capture", "decoder", "fleet", "hostsvc", "isdn", "lapdlog", "reader", "recording", "redaction", "relay",
+          "service", "softboard", "vela")
 
 
 def readelf(*words):
@@ -19,7 +21,7 @@ def readelf(*words):
 
 
 class Hardening(unittest.TestCase):
-    def each(self, files=(*PROGRAMS, LIBRARY)):
+    def each(self, files=(*PROGRAMS, *LIBRARIES)):
         for file in files:
             with self.subTest(file.name):
                 yield file
@@ -57,6 +59,11 @@ class Hardening(unittest.TestCase):
             self.assertTrue({"-fPIE", "-fPIC"} & set(words), command["file"])
             self.assertTrue({"-O2", "-O3"} & set(words), command["file"])
         self.assertEqual(seen, set(LAYERS))
+
+class Store(unittest.TestCase):
+    def test_lapdread_starts_without_the_libraries_of_the_database(self):
+        self.assertNotIn("libpq", readelf("--dynamic", BUILD / "bin/lapdread"))
+        self.assertIn("libpqxx", readelf("--dynamic", STORE))
 
 
 if __name__ == "__main__":

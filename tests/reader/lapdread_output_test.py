@@ -2,6 +2,7 @@
 
 import os
 import pathlib
+import shutil
 import signal
 import subprocess
 import unittest
@@ -86,6 +87,18 @@ class Output(Folder):
                 self.assertEqual(done.returncode, 2)
                 self.assertIn("is read and cannot be written at the same time", done.stderr)
                 self.assertEqual(same.read_bytes(), EXAMPLES["net5"].read_bytes())
+
+
+class Alone(Folder):
+    def test_a_program_without_its_module_reads_all_but_stores(self):
+        alone = shutil.copy(LAPDREAD, self.folder)
+        listed = subprocess.run([alone, "--quiet", EXAMPLES["net5"]], capture_output=True, env=environment(), check=True)
+        self.assertEqual(listed.stdout, run("--quiet", EXAMPLES["net5"])[1])
+        refused = subprocess.run([alone, "--store", "postgresql://nobody@127.0.0.1:1/lapd"], capture_output=True, text=True,
+                                 env=environment(), check=False)
+        self.assertEqual((refused.returncode, refused.stdout), (2, ""))
+        self.assertIn("the store cannot be read: ", refused.stderr)
+        self.assertIn("lib/lapdread/store.so", refused.stderr)
 
 
 if __name__ == "__main__":
