@@ -4,48 +4,18 @@ import os
 import re
 import signal
 import subprocess
-import time
 import unittest
 
-from lapdread_harness import EXAMPLES, LAPDREAD, LIMIT, SANITIZER_REPORT, SOURCE, Folder, environment, output, until
+from lapdread_harness import EXAMPLES, LAPDREAD, LIMIT, SOURCE, environment, output, until
+from tmux import PROMPT, TmuxTest
 
-PROMPT = "ready>"
 NET5 = EXAMPLES["net5"]
 # What the curses library itself leaves behind: for a terminal that it does not know, and of the mouse of the console.
 KEPT_BY_CURSES = "ASAN_OPTIONS=detect_leaks=0"
 
 
-class Browse(Folder):
-    def setUp(self):
-        super().setUp()
-        self.socket = str(self.folder / "tmux")
-        self.tmux("-f", "/dev/null", "new-session", "-d", "-x", "80", "-y", "24", f"env PS1='{PROMPT}' bash --norc")
-        self.addCleanup(self.tmux, "kill-server")
-        self.shows(PROMPT)
-
-    def tmux(self, *words):
-        done = subprocess.run(["tmux", "-S", self.socket, *words], env=environment(), cwd=self.folder, text=True,
-                              capture_output=True, timeout=LIMIT, check=True)
-        return done.stdout
-
-    def screen(self, *options):
-        screen = self.tmux("capture-pane", "-p", *options)
-        self.assertIsNone(SANITIZER_REPORT.search(screen), screen)
-        return screen
-
-    def shows(self, text, *options):
-        end = time.monotonic() + LIMIT
-        while text not in self.screen(*options):
-            self.assertLess(time.monotonic(), end, f"never showed {text!r}:\n{self.screen()}")
-            time.sleep(0.02)
-        return self.screen(*options)
-
-    def keys(self, *keys):
-        self.tmux("send-keys", *keys)
-
-    def type(self, text):
-        self.tmux("send-keys", "-l", text)
-        self.tmux("send-keys", "Enter")
+class Browse(TmuxTest):
+    shell = "bash --norc"
 
     def begin(self, words, before=""):
         """Starts browse with its modes of the terminal written down before and after; `pid` is its process."""

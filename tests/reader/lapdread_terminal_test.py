@@ -1,41 +1,15 @@
 """lapdread in a terminal: colours, progress, and nothing of a frame that a terminal would obey. tmux is the terminal."""
 
 import os
-import subprocess
 import time
 import unittest
 
-from lapdread_harness import EXAMPLES, LAPDREAD, LIMIT, Folder, environment
+from lapdread_harness import EXAMPLES, LAPDREAD, LIMIT
+from tmux import TmuxTest
 
-PROMPT = "ready>"
 
-
-class Terminal(Folder):
-    def setUp(self):
-        super().setUp()
-        self.socket = str(self.folder / "tmux")
-        self.tmux("-f", "/dev/null", "new-session", "-d", "-x", "150", "-y", "40", f"env PS1='{PROMPT}' sh")
-        self.addCleanup(self.tmux, "kill-server")
-        self.shows(PROMPT)
-
-    def tmux(self, *words):
-        done = subprocess.run(["tmux", "-S", self.socket, *words], env=environment(), cwd=self.folder, text=True,
-                              capture_output=True, timeout=LIMIT, check=True)
-        return done.stdout
-
-    def screen(self, *options):
-        return self.tmux("capture-pane", "-p", *options)
-
-    def shows(self, text, *options):
-        end = time.monotonic() + LIMIT
-        while text not in self.screen(*options):
-            self.assertLess(time.monotonic(), end, f"never showed {text!r}:\n{self.screen()}")
-            time.sleep(0.02)
-        return self.screen(*options)
-
-    def type(self, text):
-        self.tmux("send-keys", "-l", text)
-        self.tmux("send-keys", "Enter")
+class Terminal(TmuxTest):
+    size = (150, 40)
 
     def test_colours_are_used_on_a_terminal(self):
         self.type(f"{LAPDREAD} --first 5 {EXAMPLES['net5']}; echo end")
