@@ -230,12 +230,7 @@ TEST(Channels, ThatStayBehindWithALinkStandInItsFinding) {
             script.peer(m::restartAcknowledge, 0, true, {channel(i), restartIndicator(0)});
         }
         Collected collected;
-        Analysis analysis({}, collected);
-        std::uint64_t number = 0;
-        for (const Sent& sent : script.frames())
-            analysis.take(sent.frame, ++number);
-        analysis.advance(300 * second);
-        analysis.finish();
+        analyse(script, collected, 300000);
         EXPECT_EQ(collected.lines, "16 mass-clear\n");
         ASSERT_EQ(collected.findings.size(), 1U);
         const std::vector<std::string> stuck{"1", "2", "3"};
@@ -259,12 +254,7 @@ TEST(Channels, ThatStayBehindAreAnErrorThoughTheLinkHasOneOfItsOwn) {
             script.peer(m::restartAcknowledge, 0, true, {channel(i), restartIndicator(0)});
         }
         Collected collected;
-        Analysis analysis({}, collected);
-        std::uint64_t number = 0;
-        for (const Sent& sent : script.frames())
-            analysis.take(sent.frame, ++number);
-        analysis.advance(500 * second);
-        analysis.finish();
+        analyse(script, collected, 500000);
         ASSERT_EQ(collected.findings.size(), 2U) << collected.lines;
         EXPECT_EQ(collected.findings[0].kind, &findings::sabmeUnanswered);
         EXPECT_EQ(collected.findings[0].severity, Severity::error);

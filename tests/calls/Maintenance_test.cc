@@ -33,12 +33,7 @@ const Bytes outOfService{0x01, 0x01, 0xC2};
 // "4 restart-unacknowledged x30: RESTARTs of us got no ...", a line for each finding.
 std::string toldIn(const CallScript& script, std::int64_t quiet) {
     Collected collected;
-    Analysis analysis({}, collected);
-    std::uint64_t number = 0;
-    for (const Sent& sent : script.frames())
-        analysis.take(sent.frame, ++number);
-    analysis.advance(quiet * millisecond);
-    analysis.finish();
+    analyse(script, collected, quiet);
     std::string lines;
     for (const Finding& finding : collected.findings)
         lines += std::to_string(finding.frame) + " " + std::string(finding.kind->id) + " x" +

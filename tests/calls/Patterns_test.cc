@@ -27,11 +27,7 @@ void failedCall(CallScript& script, std::int64_t begin, std::uint16_t ref, const
 
 std::string patternsIn(const CallScript& script) {
     Collected collected;
-    Analysis analysis({}, collected);
-    std::uint64_t number = 0;
-    for (const Sent& sent : script.frames())
-        analysis.take(sent.frame, ++number);
-    analysis.finish();
+    analyse(script, collected);
     std::string lines;
     for (const Finding& finding : collected.findings) {
         if (finding.kind->id != "element-absent")
@@ -107,12 +103,7 @@ TEST(Patterns, ReferToTheFaultOfTheLinkThatCallsEndedWith) {
         for (std::uint16_t i = 1; i <= 3; ++i)
             script.at(9100).peer(m::releaseComplete, i, true, {cause(41)});
         Collected collected;
-        Analysis analysis({}, collected);
-        std::uint64_t number = 0;
-        for (const Sent& sent : script.frames())
-            analysis.take(sent.frame, ++number);
-        analysis.advance(400 * second);
-        analysis.finish();
+        analyse(script, collected, 400000);
         const std::string says = "3 calls ended with the link, which was set up here: 1, 2, 3";
         if (flaps) {
             EXPECT_EQ(collected.lines, "9 link-flap\n10 mass-clear\n");
@@ -139,12 +130,7 @@ TEST(Patterns, ReportLostCallsAsAnErrorIfOnlyAWarningOfTheLinkExplainsThem) {
     for (std::uint16_t i = 1; i <= 3; ++i)
         script.at(9100).peer(m::releaseComplete, i, true, {cause(41)});
     Collected collected;
-    Analysis analysis({}, collected);
-    std::uint64_t number = 0;
-    for (const Sent& sent : script.frames())
-        analysis.take(sent.frame, ++number);
-    analysis.advance(400 * second);
-    analysis.finish();
+    analyse(script, collected, 400000);
     ASSERT_EQ(collected.lines, "12 link-refused\n14 mass-clear\n");
     EXPECT_EQ(collected.findings.front().severity, Severity::warning);
     EXPECT_EQ(collected.findings.back().severity, Severity::error);
@@ -167,11 +153,7 @@ TEST(Patterns, SayWhatTheCauseOfABurstIsAbout) {
             script.peer(m::releaseComplete, i + 2, true, {cause(each.cause, 2)});
         }
         Collected collected;
-        Analysis analysis({}, collected);
-        std::uint64_t number = 0;
-        for (const Sent& sent : script.frames())
-            analysis.take(sent.frame, ++number);
-        analysis.finish();
+        analyse(script, collected);
         ASSERT_EQ(collected.findings.size(), 1U) << collected.lines;
         EXPECT_EQ(collected.findings[0].sentence, each.says);
     }

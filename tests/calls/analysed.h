@@ -22,15 +22,19 @@ class Collected : public Listener {
     std::vector<Call> calls;
 };
 
-// The trace ends `quiet` milliseconds after the last frame.
-inline std::string findingsIn(const CallScript& script, std::int64_t quiet = 0) {
-    Collected collected;
-    Analysis analysis({}, collected);
+// Hands the script to an analysis. The trace ends `quiet` milliseconds after the last frame.
+inline void analyse(const CallScript& script, Listener& listener, std::int64_t quiet = 0) {
+    Analysis analysis({}, listener);
     std::uint64_t number = 0;
     for (const Sent& sent : script.frames())
         analysis.take(sent.frame, ++number);
     analysis.advance(quiet * millisecond);
     analysis.finish();
+}
+
+inline std::string findingsIn(const CallScript& script, std::int64_t quiet = 0) {
+    Collected collected;
+    analyse(script, collected, quiet);
     return collected.lines;
 }
 
