@@ -5,6 +5,7 @@
 #include <nlohmann/json.hpp>
 
 #include "capture/hex_digits.h"
+#include "fleet/ParcelMembers.h"
 #include "fleet/utf8.h"
 
 namespace fleet {
@@ -19,139 +20,54 @@ constexpr unsigned version = 1;
 constexpr std::uint64_t mostNumber = std::numeric_limits<std::int64_t>::max();  // what the store can hold
 constexpr std::int64_t latest = 7'258'118'399'000'000'000;                      // the end of the year 2199
 
-// The character that no text of a parcel may contain, because the store cannot hold it.
-constexpr char forbidden = '\0';
-
 bool hasOctets(Kind kind) { return kind == Kind::frame || kind == Kind::cut; }
 bool isNumbered(Kind kind) { return kind == Kind::frame || kind == Kind::oversized; }
 
-// Reads the members of an object, each with its limits.
-class Members {
-  public:
-    explicit Members(const json& object) : object_(object) {
-        if (!object.is_object())
-            throw BadParcel("not an object where one must stand");
-    }
-
-    const json* find(const char* key) const {
-        const auto found = object_.find(key);
-        return found == object_.end() ? nullptr : &*found;
-    }
-
-    std::uint64_t number(const char* key, std::uint64_t least, std::uint64_t most) const {
-        const json& value = at(key);
-        if (!value.is_number_unsigned() || value.get<std::uint64_t>() < least ||
-            value.get<std::uint64_t>() > most)
-            refuse(key);
-        return value.get<std::uint64_t>();
-    }
-
-    template <class Number>
-    std::optional<Number> numberIf(const char* key, std::uint64_t most) const {
-        if (find(key) == nullptr)
-            return std::nullopt;
-        return static_cast<Number>(number(key, 0, most));
-    }
-
-    std::string text(const char* key, std::size_t longest) const {
-        const json& value = at(key);
-        if (!value.is_string())
-            refuse(key);
-        const auto& text = value.get_ref<const std::string&>();
-        if (text.size() > longest || text.find(forbidden) != std::string::npos)
-            refuse(key);
-        return text;
-    }
-
-    std::string textIf(const char* key, std::size_t longest) const {
-        return find(key) == nullptr ? std::string() : text(key, longest);
-    }
-
-    std::string name(const char* key) const {
-        std::string name = text(key, Parcel::longestText);
-        if (!isName(name))
-            refuse(key);
-        return name;
-    }
-
-    bool truthIf(const char* key) const {
-        const json* value = find(key);
-        if (value != nullptr && !value->is_boolean())
-            refuse(key);
-        return value != nullptr && value->get<bool>();
-    }
-
-    // Empty if there is none.
-    const json& listIf(const char* key, std::size_t longest) const {
-        static const json none = json::array();
-        const json* value = find(key);
-        if (value == nullptr)
-            return none;
-        if (!value->is_array() || value->size() > longest)
-            refuse(key);
-        return *value;
-    }
-
-    [[noreturn]] static void refuse(const char* key) {
-        throw BadParcel(std::string("\"") + key + "\" is not what it must be");
-    }
-
-  private:
-    const json& at(const char* key) const {
-        const json* value = find(key);
-        if (value == nullptr)
-            throw BadParcel(std::string("\"") + key + "\" is missing");
-        return *value;
-    }
-
-    const json& object_;
-};
-
-std::vector<std::uint8_t> octetsIn(const Members& members) {
+std::vector<std::uint8_t> octetsIn(const ParcelMembers& members) {
     const std::string hex = members.text("hex", 2 * Parcel::mostOctets);
     std::vector<std::uint8_t> octets;
     octets.reserve(hex.size() / 2);
     if (!capture::appendOctets(hex, octets))
-        Members::refuse("hex");
+        ParcelMembers::refuse("hex");
     return octets;
 }
 
-capture::Role roleIn(const Members& members) {
+capture::Role roleIn(const ParcelMembers& members) {
     const std::string role = members.textIf("role", Parcel::longestText);
     if (role == "user")
         return capture::Role::user;
     if (role == "network")
         return capture::Role::network;
     if (!role.empty())
-        Members::refuse("role");
+        ParcelMembers::refuse("role");
     return capture::Role::unknown;
 }
 
-capture::Variant variantIn(const Members& members) {
+capture::Variant variantIn(const ParcelMembers& members) {
     const std::string name = members.textIf("variant", Parcel::longestText);
     const capture::Variant variant = capture::variantNamed(name);
     if (variant == capture::Variant::unknown && !name.empty())
-        Members::refuse("variant");
+        ParcelMembers::refuse("variant");
     return variant;
 }
 
-Kind kindIn(const Members& members) {
+Kind kindIn(const ParcelMembers& members) {
     if (members.find("kind") == nullptr)
         return Kind::frame;
     const auto kind = capture::kindNamed(members.text("kind", Parcel::longestText));
     if (!kind)
-        Members::refuse("kind");
+        ParcelMembers::refuse("kind");
     return *kind;
 }
 
-bool isTransmitted(const Members& members) {
+bool isTransmitted(const ParcelMembers& members) {
     const std::string direction = members.text("dir", Parcel::longestText);
     if (direction != "tx" && direction != "rx")
-        Members::refuse("dir");
+        ParcelMembers::refuse("dir");
     return direction == "tx";
 }
 
-ParcelItem itemIn(const Members& members) {
+ParcelItem itemIn(const ParcelMembers& members) {
     ParcelItem item;
     item.kind = kindIn(members);
     item.time = members.numberIf<std::int64_t>("time", latest);
@@ -170,7 +86,7 @@ ParcelItem itemIn(const Members& members) {
 std::vector<ParcelItem> notesIn(const json& list) {
     std::vector<ParcelItem> notes;
     for (const json& each : list) {
-        notes.push_back(itemIn(Members(each)));
+        notes.push_back(itemIn(ParcelMembers(each)));
         if (isNumbered(notes.back().kind))
             throw BadParcel("a frame among what the recorder said");
     }
@@ -178,7 +94,7 @@ std::vector<ParcelItem> notesIn(const json& list) {
 }
 
 ParcelFrame frameIn(const json& from, std::uint64_t number) {
-    const Members members(from);
+    const ParcelMembers members(from);
     if (members.number("n", 1, mostNumber) != number)
         throw BadParcel("the numbers of frames do not follow each other");
     ParcelFrame frame{itemIn(members), notesIn(members.listIf("before", Parcel::mostNotes))};
@@ -190,7 +106,7 @@ ParcelFrame frameIn(const json& from, std::uint64_t number) {
 }
 
 ParcelGap gapIn(const json& from) {
-    const Members members(from);
+    const ParcelMembers members(from);
     return {members.number("first", 1, mostNumber), members.numberIf<std::uint64_t>("last", mostNumber),
             members.text("why", Parcel::longestText)};
 }
@@ -216,7 +132,7 @@ void check(const Parcel& parcel) {
 }
 
 Parcel parcelFrom(const json& from) {
-    const Members members(from);
+    const ParcelMembers members(from);
     if (members.number("v", 0, std::numeric_limits<std::uint32_t>::max()) != version)
         throw BadParcel("it is of another version");
     Parcel parcel;
