@@ -33,21 +33,29 @@ void eachPartition(Exposition& to, const Partitions& partitions, const char* nam
         to.sample({{"partition", std::to_string(number)}}, valueOf(*figures));
 }
 
+struct CountRow {
+    const char* name;
+    Type type;
+    const char* help;
+    std::uint64_t PartitionFigures::*count;
+};
+constexpr CountRow counts[] = {
+    {"lapdstore_frames_total", Type::counter, "Frames stored.", &PartitionFigures::frames},
+    {"lapdstore_frames_duplicate_total", Type::counter, "Frames dropped, since the store had them.",
+     &PartitionFigures::doubles},
+    {"lapdstore_dead_letters_total", Type::counter, "Parcels dropped into the stream of dead letters.",
+     &PartitionFigures::deadLetters},
+    {"lapdstore_waiting_runs", Type::gauge, "Runs whose calls wait for a frame that has not come.",
+     &PartitionFigures::holes},
+};
+
 void partitionsAsText(Exposition& to, const Partitions& all) {
     using Figures = PartitionFigures;
     eachPartition(to, all, "lapdstore_partition_leased", Type::gauge, "1 for each partition leased.",
                   [](const Figures&) { return std::uint64_t{1}; });
-    eachPartition(to, all, "lapdstore_frames_total", Type::counter, "Frames stored.",
-                  [](const Figures& figures) { return figures.frames; });
-    eachPartition(to, all, "lapdstore_frames_duplicate_total", Type::counter,
-                  "Frames dropped, since the store had them.",
-                  [](const Figures& figures) { return figures.doubles; });
-    eachPartition(to, all, "lapdstore_dead_letters_total", Type::counter,
-                  "Parcels dropped into the stream of dead letters.",
-                  [](const Figures& figures) { return figures.deadLetters; });
-    eachPartition(to, all, "lapdstore_waiting_runs", Type::gauge,
-                  "Runs whose calls wait for a frame that has not come.",
-                  [](const Figures& figures) { return figures.holes; });
+    for (const CountRow& row : counts)
+        eachPartition(to, all, row.name, row.type, row.help,
+                      [&row](const Figures& figures) { return figures.*row.count; });
     eachPartition(to, all, "lapdstore_lag_seconds", Type::gauge,
                   "How long the parcels that were stored last had waited in the stream; 0 if none waits.",
                   [](const Figures& figures) { return secondsOf(figures.lag); });
