@@ -62,6 +62,9 @@ class Network {
     void shutDown();
 
   private:
+    // A frame waits while this many messages wait unread in a queue that it is for.
+    static constexpr size_t mostWaiting = 64;
+
     // All but play() are called with lock_ held. (The constructor calls setUp before any other thread knows
     // the object.) play() is the body of the playing thread.
     void setUp(const Scenario& scenario);
