@@ -29,7 +29,7 @@ TEST(Durations, AreExactBelowASecond) {
     EXPECT_EQ(durations.mean(), 202 * millisecond);
 }
 
-TEST(Durations, OfOneAreThatOne) {
+TEST(Durations, HaveTheirOnlyValueAsEachQuantile) {
     Durations durations;
     durations.add(5900 * millisecond);
     EXPECT_EQ(durations.quantile(0.5), 5900 * millisecond);

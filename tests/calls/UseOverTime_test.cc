@@ -31,7 +31,7 @@ TEST(UseOverTime, IsCountedInStepsOfASecond) {
     EXPECT_EQ(step(use, 12).most, 2U);
 }
 
-TEST(UseOverTime, ShowsWhatLastsNoTimeAtAll) {
+TEST(UseOverTime, CountsAUseThatEndsAtTheMomentItBegins) {
     UseOverTime use;
     use.set(at(3'100), 1);
     use.set(at(3'100), 2);
@@ -67,7 +67,7 @@ TEST(UseOverTime, IsBoundedHoweverLongTheTraceIs) {
     EXPECT_EQ(used, 20'000 * second);
 }
 
-TEST(UseOverTime, KeepsClocksApartAndPassesOverWhatNoneHasTold) {
+TEST(UseOverTime, KeepsClocksApartAndIgnoresChangesWithoutATime) {
     UseOverTime use;
     use.set(at(1'000, capture::Clock::none), 1);
     EXPECT_TRUE(use.steps().empty());

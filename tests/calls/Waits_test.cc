@@ -29,7 +29,7 @@ TEST(Waits, FindASetupThatIsNotAnsweredAfterItsRepetition) {
     EXPECT_EQ(findingsOf(script, 18010), "4 setup-repeated\n4 setup-unanswered\n");
 }
 
-TEST(Waits, AreOverWithAnyAnswerToSetup) {
+TEST(Waits, EndWithAnyAnswerToSetup) {
     for (const std::uint8_t answer : {m::callProceeding, m::setupAcknowledge, m::alerting, m::connect}) {
         CallScript script = afterACall();
         script.at(10000).us(m::setup, 2, false, {bearerSpeech()});

@@ -102,7 +102,7 @@ TEST(Traps, ShowNoWarning) {
     }
 }
 
-TEST(Traps, ThatAreSpoiltShowTheFault) {
+TEST(Traps, ShowTheFaultOnceItIsReallyThere) {
     for (const Trap& trap : traps()) {
         CallScript script(trap.role);
         trap.tell(script, true);
@@ -113,7 +113,7 @@ TEST(Traps, ThatAreSpoiltShowTheFault) {
     }
 }
 
-TEST(Traps, StandInFiles) {
+TEST(Traps, AreTheSameInTheirFiles) {
     for (const Trap& trap : traps()) {
         CallScript script(trap.role);
         trap.tell(script, false);

@@ -33,7 +33,7 @@ TEST(TimeText, IsReadInTheseForms) {
     tzset();
 }
 
-TEST(TimeText, AnythingElseIsNoTime) {
+TEST(TimeText, ATextOfAnotherFormIsNoTime) {
     for (const char* text : {"", "12", "12.", ".5", "2026-13-01T00:00:00Z", "2026-02-30T00:00:00Z",
                              "2026-11-21", "11:25", "24:00:00", "2026-11-21T11:25:33+1",
                              "2026-11-21T11:25:33Zz", "1500-01-01T00:00:00Z", "99999999999.5", "abc"})

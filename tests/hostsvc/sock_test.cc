@@ -198,7 +198,7 @@ TEST_F(SockTest, BlocksOfNoLengthReturnTheirLength) {
     EXPECT_EQ(sock_.writeblock(nullptr, -3), -3);
 }
 
-TEST_F(SockTest, ReadinessIsThatOfTheMode) {
+TEST_F(SockTest, WaitsForReadingWritingOrAnExceptionAsTheModeSays) {
     EXPECT_EQ(sock_.ready(0, 0), 0);
     EXPECT_EQ(sock_.ready('r', 0, 1000), 0);
     EXPECT_EQ(sock_.ready('w', 0, 0), 1);

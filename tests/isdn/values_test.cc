@@ -129,7 +129,7 @@ TEST(Cause, HoldsStandardLocationValueAndDiagnostics) {
     }
 }
 
-TEST(Values, OfElementsOfOneOctet) {
+TEST(Values, OfShortElementsAreRead) {
     const auto state = callState(Given("14 01 4a").element);
     ASSERT_TRUE(state);
     EXPECT_EQ(state->codingStandard, 1);
@@ -222,7 +222,7 @@ TEST(Values, AreThoseOfTheirElementAlone) {
     EXPECT_EQ(readers(Given("01 01 c2", 6, true).element), "status ");
 }
 
-TEST(Values, NeedTheOctetThatHoldsThem) {
+TEST(Values, AreAbsentIfTheirOctetIs) {
     for (const char* text : {"08 01 82", "08 02 02 80", "1e 01 82", "1e 02 02 81", "00 01 80", "01 00",
                              "14 00", "18 00", "79 00", "70 00"})
         EXPECT_EQ(readers(Given(text).element), "") << text;

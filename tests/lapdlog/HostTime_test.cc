@@ -28,7 +28,7 @@ TEST_F(HostTimeTest, IsThatOfTheZone) {
     EXPECT_EQ(time_.of("Wed Jul  1 02:00:00 2026", std::nullopt), 1782864000);
 }
 
-TEST_F(HostTimeTest, OfTheHourThatComesTwiceIsTheOneThatIsExpected) {
+TEST_F(HostTimeTest, InTheHourThatComesTwiceItIsTheOneNearerToTheExpectedTime) {
     // Summer time ends on 25 October 2026 at 01:00 UTC.
     EXPECT_EQ(time_.of("Sun Oct 25 02:30:00 2026", 1792888200), 1792888200);
     EXPECT_EQ(time_.of("Sun Oct 25 02:30:00 2026", 1792891800), 1792891800);
@@ -37,7 +37,7 @@ TEST_F(HostTimeTest, OfTheHourThatComesTwiceIsTheOneThatIsExpected) {
     EXPECT_EQ(time_.of("Sun Oct 25 03:00:00 2026", 1792886399), 1792893600);
 }
 
-TEST_F(HostTimeTest, AnythingElseIsNoTime) {
+TEST_F(HostTimeTest, ATextOfAnotherFormIsNoTime) {
     for (const char* text :
          {"", "Sat Nov 21 12:25:33 202", "Sat Nov 21 12:25:33 20266", "Sun Nov 21 12:25:33 2026",
           "Sat Nov 32 12:25:33 2026", "Sat nov 21 12:25:33 2026", "Sat Nov 21 24:25:33 2026",

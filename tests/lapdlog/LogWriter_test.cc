@@ -87,13 +87,13 @@ TEST_F(LogWriterTest, ItemsBetweenFramesComeBack) {
     EXPECT_EQ(throughPcapng(log), log);
 }
 
-TEST_F(LogWriterTest, APieceWithoutHeadStaysOne) {
+TEST_F(LogWriterTest, APieceOfALogWithoutAHeadGetsNone) {
     const std::string log = textOf(true, 1, sabme) + textOf(false, 2, setup);
     EXPECT_EQ(logAgain(log), log);
     EXPECT_EQ(throughPcapng(log), log);
 }
 
-TEST_F(LogWriterTest, AHeadWithoutVariantStaysSo) {
+TEST_F(LogWriterTest, AHeadWithoutVariantGetsNone) {
     EXPECT_EQ(throughPcapng(headText + textOf(true, 1, sabme)), headText + textOf(true, 1, sabme));
 }
 

@@ -32,7 +32,7 @@ TEST(ProverTest, ATextIsProvedByItsDump) {
     }
 }
 
-TEST(ProverTest, EveryBeginningOfATextMayStillBecomeOne) {
+TEST(ProverTest, TheBeginningOfATextIsCutWhileMoreMayComeAndBadAtTheEnd) {
     Prover prover;
     const std::string body = bodyOf(true, setup);
     for (std::size_t size = 0; size < body.size(); ++size) {

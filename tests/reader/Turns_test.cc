@@ -55,7 +55,7 @@ TEST(Turns, AreReadByOneThreadAtATimeAndHandedOnByOne) {
         ASSERT_EQ(handedOn[i], static_cast<int>(i) + 1);
 }
 
-TEST(Turns, WhoReadsTillItHasHandedOnIsAlone) {
+TEST(Turns, AThreadThatReadsUntilItHasHandedOnMeetsNoOther) {
     Turns turns(2);
     bool isAlone = false;
     std::atomic<bool> metAnother = false;

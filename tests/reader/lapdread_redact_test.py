@@ -88,7 +88,7 @@ class Redact(Folder):
                     self.assertNotIn(os.uname().nodename.encode(), octets)
         self.assertGreater(counted, 40)
 
-    def test_leaves_none_in_the_value_of_a_field(self):
+    def test_leaves_no_number_and_no_name_in_the_value_of_a_field(self):
         for variant, path in EXAMPLES.items():
             secrets = people(variant, path)
             redacted = self.redact(variant, path, "pcapng")
@@ -299,7 +299,7 @@ class Redact(Folder):
             self.assertEqual(status, 0)
             self.assertIn("does not say with which key", error)
 
-    def test_a_key_goes_with_its_manner(self):
+    def test_a_key_keeps_its_settings_and_refuses_others(self):
         key = self.folder / "key"
         kept = output("redact", "--to", "jsonl", "--key", key, "--keep-prefix", "3", EXAMPLES["net5"])
         self.assertIn('"meaning":"731', kept)

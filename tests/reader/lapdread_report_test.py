@@ -99,7 +99,7 @@ class EveryPage(Report):
         first = self.report(EXAMPLES["net5"]).read_bytes()
         self.assertEqual(self.report(EXAMPLES["net5"]).read_bytes(), first)
 
-    def test_of_nothing_says_so(self):
+    def test_of_an_empty_trace_says_that_there_is_no_call(self):
         (self.folder / "empty.pcap").write_bytes(calls_speed.HEADER)
         page = self.report("empty.pcap", cwd=self.folder)
         self.assert_well_formed(page)
@@ -282,7 +282,7 @@ class Ladders(Report):
 
 
 class WithoutScript(Report):
-    def test_all_is_there_to_read(self):
+    def test_all_tables_and_ladders_can_be_read(self):
         browser.open(self.report(EXAMPLES["net5"]), scripts=False)
         self.assertEqual(len(column("calls", 0)), 6)
         self.assertEqual(browser.value("[...document.querySelectorAll('.chart')].map(each => each.offsetHeight)"), [0] * 5)

@@ -29,7 +29,7 @@ class Traps(unittest.TestCase):
         self.assertEqual(output("calls", "--csv", *nfas).count("\n") - 1, 1)
         self.assertEqual(output("calls", "--csv", "--merge", *both).count("\n") - 1, 2)
 
-    def test_are_read_as_what_they_are(self):
+    def test_have_as_many_calls_as_their_names_say(self):
         calls = {"no-connect-acknowledge": 1, "hold-and-second-call": 2, "suspend-and-resume": 2, "segments": 2,
                  "register": 1, "overlap": 2, "basic-access-goes-idle": 3, "standby": 0, "three-days": 1}
         for name, count in calls.items():

@@ -43,7 +43,7 @@ TEST(Json, OfTablesIsAnObjectWithAnArrayEach) {
               "{\"v\":1,\"table\":\"name\",\"said_by\":\"b\",\"n\":null}],\n\"empty\":[\n]}");
 }
 
-TEST(Pieces, CountsWhatThereIsNoRoomFor) {
+TEST(Pieces, CountsThePiecesForWhichThereIsNoRoom) {
     Pieces pieces(2);
     for (const char* const piece : {"a", "b", "c"})
         pieces.add(piece);

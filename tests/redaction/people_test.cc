@@ -63,7 +63,7 @@ TEST(People, leaveNoNumberAndNoNameInAFrame) {
     EXPECT_GT(secrets, 5'000U);
 }
 
-TEST(People, stayAsLongAsTheyWere) {
+TEST(People, keepTheLengthAndThePlanOfTheirFrames) {
     forEachTrace([](unsigned structure, Variant variant) {
         const auto pseudonyms = makePseudonyms(test::keyOf(9), Direction::redact);
         const std::vector<Passed> before = peopleOf(structure, 1, variant).frames;
@@ -77,7 +77,7 @@ TEST(People, stayAsLongAsTheyWere) {
 
 // Blanks: 0; ff in displays and in damaged facilities; 7f for an element that a message ends in; 80 and the
 // digit 0.
-TEST(People, comeBackButForBlanks) {
+TEST(People, areRestoredExceptWhereTheyWereBlanked) {
     std::size_t restoredOctets = 0;
     std::size_t blanks = 0;
     forEachTrace([&](unsigned structure, Variant variant) {

@@ -11,7 +11,7 @@ TO_CCS = "00000001 00000000 00000000 00000000 00000001 00000001 00000001 0000000
 
 
 class Wire(RelayTest):
-    def test_a_session(self):
+    def test_a_whole_session_has_these_octets(self):
         frames = self.capture("two.pcap", [(TRANSMITTED, b"\x00\x01\x7f"), (RECEIVED, b"\x00\x01\x73")])
         relay = Relay(self, ("--frames", frames, "--rate", "max"))
         peer = self.peer(relay)

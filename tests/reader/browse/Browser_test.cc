@@ -87,7 +87,7 @@ TEST(Browser, AClickMovesTheCursorAndTwoOpen) {
     EXPECT_TRUE(stage.line(1).starts_with("Frame "));
 }
 
-TEST(Browser, AClickBelowTheListDoesNothingWorse) {
+TEST(Browser, AClickBelowTheListDoesNoHarm) {
     Stage stage(net5);
     for (const char* const keys : {"1", "2", "3", "2 Enter", "Enter", "Esc Esc Space Space c"}) {
         stage.press(keys);
@@ -175,7 +175,7 @@ TEST(Browser, EveryScreenCanBeDrawnOnATerminalOfAnySize) {
     }
 }
 
-TEST(Browser, NoKeysAtAnyMomentDoHarm) {
+TEST(Browser, SurvivesAnyKeysAtAnyMoment) {
     constexpr std::string_view letters = "jkgG123/sSpacwuvlnpa?q !x4";
     constexpr int codes = static_cast<int>(Key::Code::wheelDown) + 1;
     for (const char* const file :

@@ -20,7 +20,7 @@ TEST_F(CanvasTest, TextEndsAtTheBorder) {
     EXPECT_EQ(canvas_.line(1), "");
 }
 
-TEST_F(CanvasTest, NothingStandsOutside) {
+TEST_F(CanvasTest, TextOutsideItsBordersIsDropped) {
     EXPECT_EQ(canvas_.put(-2, 0, "abcd"), 2);
     EXPECT_EQ(canvas_.line(0), "cd");
     canvas_.put(0, 2, "below");
