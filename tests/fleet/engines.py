@@ -118,29 +118,16 @@ class Process:
         return self.log.read_text(errors="replace") if self.log.exists() else ""
 
 
-class Engines:
-    """`sites`: their names; each gets a server that is a leaf of the centre's three, behind a cable that can be cut.
-    `site_folder(name)`: where a site's stream is kept, below the folder unless told."""
+class Assembled:
+    """What consists of parts: `_assemble` begins them and puts each on `_down`. They are taken down in the opposite order,
+    when the block ends or if one of them fails to begin."""
 
-    def __init__(self, folder, sites=("london",), site_folder=None):
-        self.folder, self.sites, self.address = pathlib.Path(folder), tuple(sites), own_address()
-        self.certificates = self.folder / "certificates"
-        self._site_folder = site_folder or (lambda site: self.folder / site)
-        self.nats, self.cables, self.database, self.prometheus = {}, {}, None, None
+    def __init__(self):
         self._down = contextlib.ExitStack()
 
     def __enter__(self):
         try:
-            os.chmod(self.folder, 0o755)
-            self._make_certificates()
-            self._start_database()
-            for number, name in enumerate(SERVERS, 1):
-                self._start_nats(name, number, self.folder / name, self._centre(number))
-            for number, site in enumerate(self.sites, len(SERVERS) + 1):
-                self.cables[site] = self._down.enter_context(
-                    Cable([((self.address, CABLE_PORT + 10 * number + i), (self.address, LEAF_PORT + i)) for i in (1, 2, 3)]))
-                self._start_nats(site, number, self._site_folder(site), self._leaf(site, number))
-            self.await_ready()
+            self._assemble()
             return self
         except BaseException:
             self._down.close()
@@ -148,6 +135,30 @@ class Engines:
 
     def __exit__(self, *_):
         self._down.close()
+
+
+class Engines(Assembled):
+    """`sites`: their names; each gets a server that is a leaf of the centre's three, behind a cable that can be cut.
+    `site_folder(name)`: where a site's stream is kept, below the folder unless told."""
+
+    def __init__(self, folder, sites=("london",), site_folder=None):
+        super().__init__()
+        self.folder, self.sites, self.address = pathlib.Path(folder), tuple(sites), own_address()
+        self.certificates = self.folder / "certificates"
+        self._site_folder = site_folder or (lambda site: self.folder / site)
+        self.nats, self.cables, self.database, self.prometheus = {}, {}, None, None
+
+    def _assemble(self):
+        os.chmod(self.folder, 0o755)
+        self._make_certificates()
+        self._start_database()
+        for number, name in enumerate(SERVERS, 1):
+            self._start_nats(name, number, self.folder / name, self._centre(number))
+        for number, site in enumerate(self.sites, len(SERVERS) + 1):
+            self.cables[site] = self._down.enter_context(
+                Cable([((self.address, CABLE_PORT + 10 * number + i), (self.address, LEAF_PORT + i)) for i in (1, 2, 3)]))
+            self._start_nats(site, number, self._site_folder(site), self._leaf(site, number))
+        self.await_ready()
 
     # What programs are told.
 

@@ -8,7 +8,7 @@ import os
 import pathlib
 import subprocess
 
-from engines import LIMIT, Engines, Process, awaited, fail_if_ended
+from engines import LIMIT, Assembled, Engines, Process, awaited, fail_if_ended
 from traffic import Trunk as Traffic
 
 BINARIES = pathlib.Path(os.environ.get("FLEET_BINARIES", pathlib.Path(__file__).resolve().parents[2] / "build/release/bin"))
@@ -62,33 +62,25 @@ class Trunk:
         return json.loads(state.read_text())["next"] - 1 if state.exists() else 0
 
 
-class Fleet:
+class Fleet(Assembled):
     """`traffic(number)`: the capture that trunk `number` plays, from 1. Trunks are shared out among the sites."""
 
     def __init__(self, folder, trunks, traffic, sites=("london", "leeds"), stores=2, site_folder=None,
                  megabytes=200, resend_window=120):
+        super().__init__()
         self.folder = pathlib.Path(folder)
         self.engines = Engines(self.folder, sites, site_folder)
         self.shippers, self.stores, self.trunks = {}, [], []
         self._plan = (trunks, traffic, stores)
         self._megabytes, self._resend_window = megabytes, resend_window  # of a site's stream; of a shipper, in seconds
         self._state_folder = site_folder or (lambda site: self.folder / site)
-        self._down = contextlib.ExitStack()
 
-    def __enter__(self):
-        try:
-            self._down.enter_context(self.engines)
-            self._make_streams()
-            self._make_tables()
-            self._make_trunks()
-            self._start()
-            return self
-        except BaseException:
-            self._down.close()
-            raise
-
-    def __exit__(self, *_):
-        self._down.close()
+    def _assemble(self):
+        self._down.enter_context(self.engines)
+        self._make_streams()
+        self._make_tables()
+        self._make_trunks()
+        self._start()
 
     def url(self, user="reads"):
         return self.engines.database_url(user)
