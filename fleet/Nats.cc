@@ -34,8 +34,8 @@ Reason reasonOf(natsStatus status, int jetStreamError) {
     return jetStreamError == JSInsufficientResourcesErr ? Reason::full : Reason::other;
 }
 
-// The library would write errors that no call returns to the standard error stream. They come back as answers
-// that fail to come.
+// Without this function the library writes errors that no call returns to the standard error stream. The
+// program notices such errors anyway, by answers that do not come.
 void ignoreError(natsConnection*, natsSubscription*, natsStatus, void*) {}
 
 void useTls(natsOptions* to, const NatsOptions& options) {

@@ -21,7 +21,7 @@ void Doubt::connectedTo(const std::string& process, Clock::time_point now) {
         raise(now);
 }
 
-// If the file cannot be written, the next shipper has a doubt too many, which costs some frames sent twice.
+// If the file cannot be written, the next shipper doubts without need, and sends some frames twice.
 void Doubt::end() {
     raised_.reset();
     if (std::exchange(trusted_, connected_) != connected_)

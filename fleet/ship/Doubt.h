@@ -8,19 +8,20 @@
 
 namespace fleet {
 
-// A server that is killed, or whose disk is full, may lose what it has confirmed just before. So there is
-// doubt when a server's process answers that did not answer before, when a server refuses parcels because it
-// is in trouble, and when it numbers parcels as it has numbered others before. When all has been well for a
-// while, whoever ships begins at an older place, and the doubt is over.
+// A server that is killed, or whose disk is full, may lose what it has confirmed just before. So a doubt
+// begins when another process of a server answers than the one before, when a server refuses parcels because
+// it is in trouble, and when it gives a number to a parcel that it had given to another one. When nothing has
+// gone wrong for a while, the shipper goes back to an older place and ends the doubt.
 class Doubt {
   public:
     using Clock = std::chrono::steady_clock;
 
-    // `path`: the file in which the server's process is noted about which there is no doubt.
+    // `path`: the file that names the server's process about which there is no doubt. `calm`: how long
+    // nothing may go wrong before isCalm() is true.
     Doubt(std::string path, std::chrono::milliseconds calm);
 
-    // There is a connection to this process of a server; an empty name says nothing. The first process ever
-    // is not doubted.
+    // Call it when there is a connection to this process of a server; an empty name changes nothing. The
+    // first process ever is not doubted.
     void connectedTo(const std::string& process, Clock::time_point now);
     // The server has shown that something is wrong.
     void raise(Clock::time_point now) { raised_ = now; }
@@ -28,7 +29,8 @@ class Doubt {
     bool exists() const { return raised_.has_value(); }
     // Whether nothing went wrong for long enough.
     bool isCalm(Clock::time_point now) const { return raised_ && now - *raised_ >= calm_; }
-    // Everything that was confirmed lately is shipped again.
+    // Ends the doubt and notes the connected process in the file. Call it when the places are back, so that
+    // everything that was confirmed lately is shipped again.
     void end();
 
   private:

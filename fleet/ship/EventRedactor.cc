@@ -39,7 +39,7 @@ void EventRedactor::take(const InputEvent& event) {
     release();
 }
 
-// Of an input's own words, nothing stays.
+// Drops all texts of the input.
 void EventRedactor::redact(Waiting& waiting) {
     capture::Item& item = waiting.event.item;
     waiting.interface = *item.frame.interface;

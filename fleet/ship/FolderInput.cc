@@ -86,7 +86,7 @@ void FolderInput::refresh() {
     stateTime_ = status.st_mtim;
 }
 
-// Its index in the state, or the number of files if there is none as yet.
+// The index of the file to read next in the state, or the number of files if there is none yet.
 std::size_t FolderInput::nextFile() {
     if (done_.empty())
         return firstFile();
@@ -119,7 +119,7 @@ std::size_t FolderInput::fileBehindPlace() const {
     return static_cast<std::size_t>(found - state_.files.begin());
 }
 
-// False if it is not there any more. While it is opened it may get its finished name.
+// Returns false if the file is not there any more. The recorder may give it its finished name meanwhile.
 bool FolderInput::openFile(const recording::RecordedFile& file) {
     const std::string finished = folder_ + "/" + file.name;
     const std::string unfinished = finished + std::string(recording::unfinishedEnding);
@@ -165,7 +165,8 @@ FolderInput::Step FolderInput::read(InputEvent& event) {
     return Step::again;
 }
 
-// A frame counts, and so does what stands behind the last frame that was given.
+// Gives the item with its number. An item is old if it was given before: a frame by its number, any other
+// item by its count after the last frame.
 void FolderInput::give(InputEvent& event) {
     event.kind = InputEvent::Kind::item;
     event.run = run_;
@@ -192,8 +193,8 @@ bool FolderInput::isComplete() const {
            std::filesystem::exists(folder_ + "/" + file_.name);
 }
 
-// What a recorder that was killed has left of an item shows only when the file is read to its end. So a file
-// that was followed is read once more if octets are left.
+// A recorder that was killed may have left the beginning of an item, which only a reader that does not follow
+// reports. So a file that was followed is read once more if octets are left.
 void FolderInput::finishFile() {
     const capture::Reader::Progress read = reader_->progress();
     reader_.reset();

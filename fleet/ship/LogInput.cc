@@ -38,7 +38,7 @@ LogInput::~LogInput() {
         close(ownWriter_);
 }
 
-// False if there is no such log as yet.
+// Returns false if there is no such log yet.
 bool LogInput::open() {
     struct stat status {};
     if (stat(path_.c_str(), &status) != 0)
@@ -82,7 +82,7 @@ bool LogInput::readFirst() {
     while (!hasFirst_ && reader_->next(item) == capture::Reader::Next::item) {
         hasFirst_ = isNumbered(item);
         if (item.kind == capture::Item::Kind::replaced)
-            first_.clear();  // a head that no frame came behind
+            first_.clear();  // these items were before the replacement, and no frame followed them
         else if (hasFirst_ || first_.items().size() < mostBefore)
             first_.add(item);
     }

@@ -6,7 +6,7 @@ namespace fleet {
 
 namespace {
 
-// A stream whose numbers are so much lower is another one, made anew.
+// A stream whose numbers are lower by this much is another one, which was made anew.
 constexpr std::uint64_t mostForgotten = 100'000;
 
 }  // namespace
@@ -79,7 +79,7 @@ void Outbox::take(const Carrier::Answer& answer) {
         countRefusal(answer);
     const auto found = answer.token ? parcels_.find(*answer.token) : parcels_.end();
     if (found == parcels_.end() || found->second.isKept)
-        return;  // the answer to a parcel that was sent twice
+        return;  // a second answer to a parcel that was sent twice
     Sent& sent = found->second;
     if (!answer.isKept) {
         sent.isOut = false;
@@ -119,7 +119,7 @@ void Outbox::countKept(const Carrier::Answer& answer) {
         highest_ = answer.sequence;
 }
 
-// A parcel behind one that is not safe does not count yet: whoever starts anew begins with that one.
+// A parcel after one that is not safe does not count yet, because a new start begins at the one that is not.
 void Outbox::settle(std::size_t dChannel) {
     std::deque<std::uint64_t>& tokens = ofDChannel_[dChannel];
     SafeUpTo safe;

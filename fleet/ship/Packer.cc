@@ -11,7 +11,7 @@ namespace {
 
 using Kind = capture::Item::Kind;
 
-constexpr std::int64_t latest = 7'258'118'399'000'000'000;  // as parcels have them
+constexpr std::int64_t latest = 7'258'118'399'000'000'000;  // the latest time that a parcel may hold
 constexpr std::uint64_t latestRun = 7'258'118'399'000'000;
 
 std::int64_t timeOf(const capture::Frame& frame, std::uint64_t run, std::uint64_t number) {
@@ -84,7 +84,7 @@ void Packer::takeItem(const InputEvent& event) {
         close();
         open(event.run, event.number, variant);
     }
-    // Digits, and keys; in text a character may have six.
+    // An estimate of the JSON: keys, two digits for an octet, and up to six octets for a character of text.
     size_ += 200 + 2 * item.octets.size() + 150 * notes_.size() + 6 * noteText_;
     open_.frames.push_back({std::move(item), std::exchange(notes_, {})});
     noteText_ = 0;

@@ -15,7 +15,7 @@ namespace {
 
 constexpr unsigned longestWindow = 3600;  // seconds
 
-// A table of the file, whose keys are taken one by one.
+// Reads a table of the file, key by key. end() refuses keys that were not read.
 class Table {
   public:
     Table(const std::string& path, const toml::table& table) : path_(path), table_(table) {}
@@ -70,7 +70,7 @@ class Table {
         return static_cast<unsigned>(*value);
     }
 
-    // An empty one if there is none.
+    // The table of this name; an empty one if there is none.
     Table table(std::string_view key) {
         static const toml::table none;
         const toml::node* const node = take(key);
@@ -89,7 +89,7 @@ class Table {
         return all;
     }
 
-    // A key that nobody has taken is one that is spelt wrong.
+    // Refuses keys that were not read, because they are spelt wrong.
     void end() const {
         for (const auto& [key, node] : table_) {
             if (taken_.find(std::string(key.str())) == taken_.end())

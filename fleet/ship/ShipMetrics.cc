@@ -17,7 +17,7 @@ constexpr double nanosecondsPerSecond = 1e9;
 
 double secondsOf(std::int64_t nanoseconds) { return static_cast<double>(nanoseconds) / nanosecondsPerSecond; }
 
-// Of all parcels together.
+// Writes the figures of all parcels together.
 void parcels(Exposition& to, const OutboxFigures& figures) {
     to.single("lapdship_parcels_sent_total", Type::counter, "Parcels sent, each time they were sent.",
               figures.sent);
@@ -33,7 +33,7 @@ void parcels(Exposition& to, const OutboxFigures& figures) {
               std::uint64_t{figures.isFull});
 }
 
-// A sample for each D channel.
+// Writes a sample for each D channel.
 template <class ValueOf>
 void eachTrunk(Exposition& to, const Shipper& shipper, const char* name, Type type, const char* help,
                ValueOf valueOf) {

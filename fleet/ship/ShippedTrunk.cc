@@ -12,9 +12,9 @@ namespace fleet {
 
 namespace {
 
-constexpr int mostAtOnce = 1000;  // events; then the other D channels have their turn
+constexpr int mostAtOnce = 1000;  // events that are taken before the other D channels have their turn
 
-// Two of its names cannot give one path: an address's text has no "." but that between them.
+// Two D channels cannot get one path, because the names in an address's text contain no ".".
 std::string placePathOf(const Address& address, const std::string& folder) {
     const std::string text = toText(address);
     std::string name = text.substr(text.find('/', text.find('/') + 1) + 1);
@@ -97,9 +97,9 @@ bool ShippedTrunk::readNext() {
     return true;
 }
 
-// A run that the shipper has made must be on the disk before any frame of it is sent: otherwise a shipper
-// that is started anew would make another one of the same frames. The end of the run before must be safe, or
-// it would be forgotten.
+// Notes a new run on the disk before any frame of it is sent. Otherwise a shipper that is started again would
+// make another run of the same frames. Returns false, and must be called again, while the end of the run
+// before is not safe (the place names only one run), and while the place cannot be written.
 bool ShippedTrunk::beginRun(Outbox& outbox) {
     if (outbox.waiting(number_) != 0)
         return false;

@@ -20,11 +20,11 @@ namespace {
 
 using namespace std::chrono_literals;
 
-constexpr auto glance = 20ms;  // how often inputs are looked at that had nothing to give
+constexpr auto glance = 20ms;  // how often inputs are asked again that had nothing to give
 constexpr auto betweenAttempts = 1s;
 constexpr auto betweenFigures = 1s;
 
-// A signal ends it early.
+// Waits for this time. A signal ends the wait early.
 void pauseFor(std::chrono::milliseconds time) {
     static_cast<void>(poll(nullptr, 0, static_cast<int>(time.count())));
 }
@@ -90,7 +90,7 @@ void Shipper::drain(const std::atomic<bool>& stop) {
     savePlaces();
 }
 
-// False if there was nothing to read.
+// Reads, sends and takes answers once. Returns false if there was nothing to read.
 bool Shipper::turn() {
     const bool hasRead = readSome();
     try {
@@ -138,7 +138,8 @@ void Shipper::connect() {
     hasConnected_ = true;
 }
 
-// While the library looks for a server, it would keep what is sent: so nothing is.
+// Says when the connection is made or lost. Nothing is sent without one, because the library would keep it.
+// After a new one all parcels that are not confirmed are sent again.
 void Shipper::sayConnection() {
     const bool isNow = isConnected();
     if (std::exchange(wasConnected_, isNow) == isNow)

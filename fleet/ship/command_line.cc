@@ -87,7 +87,8 @@ std::vector<StreamRules> streamsOf(const Given& given) {
         return {site};
     }
     StreamRules centre = rulesOf(given, centreStream);
-    // Sites that are fetched from publish to streams of their own; without them shippers publish here.
+    // If sites are named, the centre fetches their streams. Otherwise shippers publish to the centre
+    // directly.
     if (given.sites.empty())
         centre.subjects = {everySubject};
     centre.sites = given.sites;

@@ -19,7 +19,7 @@ std::atomic<bool> shallStop{false};
 
 void stop(int) { shallStop = true; }
 
-// No SA_RESTART: whatever waits, waits no longer.
+// Without SA_RESTART, so that a signal ends every wait.
 void watchSignals() {
     struct sigaction action {};
     action.sa_handler = stop;

@@ -14,7 +14,7 @@ namespace {
 using calls::Call;
 
 Field textOf(std::string_view text) { return std::string(text); }
-// What a column of text holds instead of what the database would not take.
+// The text in characters that the database takes.
 Field safeText(std::string_view text) { return printable(text, text.size()); }
 
 template <class Number>

@@ -6,7 +6,7 @@ namespace fleet {
 
 namespace {
 
-// Two numbers name a lock. The first tells ours from those of other programs.
+// Two numbers name a lock. The first one distinguishes our locks from those of other programs.
 std::string lockOf(unsigned partition) {
     return "(hashtext('lapdstore'), " + std::to_string(partition) + ")";
 }

@@ -42,7 +42,8 @@ void NatsInbox::bury(const DeadLetter& dead) {
                         "dead/" + std::to_string(dead.letter.sequence), reason);
 }
 
-// The server confirms the last one, and so has taken all of them: the connection keeps their order.
+// Waits only until the server confirms the last acknowledgement. The connection keeps their order, so the
+// server has taken all of them by then.
 void NatsInbox::acknowledge() {
     for (std::size_t i = 0; i < held_.size(); ++i) {
         if (i + 1 < held_.size())

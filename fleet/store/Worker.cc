@@ -30,7 +30,7 @@ constexpr auto afterNoAnswer = 5min;
 constexpr std::chrono::milliseconds round = 200ms;
 constexpr std::chrono::milliseconds shortest = 5ms;
 
-// What is open as long as the two connections are.
+// The two connections, and the leases that live as long as they do.
 class Shift {
   public:
     Shift(const WorkerOptions& options, const Say& say)
@@ -75,8 +75,8 @@ class Shift {
         return std::max(shortest, round / static_cast<int>(held_.size()));
     }
 
-    // What the stream refuses to one partition leaves the others alone: it is given back, and leased anew.
-    // Without a connection everything is begun anew.
+    // If the stream refuses a request of one partition, only that partition is given back, and leased again
+    // later. If a connection is lost, all partitions are given back.
     std::size_t move(std::map<unsigned, std::unique_ptr<Held>>::iterator at) {
         const unsigned number = at->first;
         try {
@@ -97,7 +97,8 @@ class Shift {
         }
     }
 
-    // Whoever asks for figures gets those of the last second. Only the servers know what waits.
+    // Hands out the figures of the partition once a second. Asks the server more rarely how many parcels
+    // wait.
     void tell(unsigned number, Held& held) {
         const auto now = SteadyClock::now();
         if (options_.figures == nullptr || now < held.nextFigures)
@@ -126,8 +127,8 @@ class Shift {
         });
     }
 
-    // What only watchers want to know must not hold up the work: a server that does not answer such a
-    // question is left alone for a while.
+    // Asks a server something that only the figures need. If it does not answer, it is not asked again for a
+    // while, so that the work is not held up.
     template <class Question>
     void ask(Question question) {
         try {
@@ -139,8 +140,8 @@ class Shift {
         }
     }
 
-    // A try that fails may have taken as long as a request may take. So the next one waits for its turn, and
-    // those that are held have theirs.
+    // Tries to lease partitions. A try that fails may take as long as a request may take, so the next one is
+    // made later, and the partitions that are held have their turn first.
     void leaseMore() {
         if (SteadyClock::now() < nextTry_)
             return;
@@ -184,7 +185,7 @@ class Shift {
     pqxx::connection database_;
     NatsConnection nats_;
     std::map<unsigned, std::unique_ptr<Held>> held_;
-    std::map<unsigned, std::string> saidOf_;  // partitions
+    std::map<unsigned, std::string> saidOf_;  // by partition: what was said of it last
     SteadyClock::time_point nextTry_{};
     std::size_t firstToTry_ = 0;  // index in the options
     SteadyClock::time_point nextEngines_{};
