@@ -13,10 +13,21 @@ constexpr std::uint64_t framesAtOnce = 5000;
 constexpr std::size_t callsRemembered = 65'536;
 constexpr std::size_t ordinalsRemembered = 65'536;
 
+calls::Options optionsOf(const std::string& name, bool isGrouped) {
+    calls::Options options;
+    if (isGrouped)
+        options.groups = {{name}};
+    return options;
+}
+
 }  // namespace
 
-Assembly::Assembly(const RunKey& key, std::string trunkName, std::string place)
-    : key_(key), name_(trunkName), rows_(std::move(trunkName), std::move(place)), analysis_({}, *this) {}
+Assembly::Assembly(const RunKey& key, std::string trunkName, std::string place, bool isGrouped)
+    : key_(key),
+      name_(trunkName),
+      isGrouped_(isGrouped),
+      rows_(std::move(trunkName), std::move(place)),
+      analysis_(optionsOf(name_, isGrouped), *this) {}
 
 void Assembly::expect(const std::string& day) {
     if (!isAnyDay_ && (!since_ || day < *since_))
@@ -123,6 +134,8 @@ void Assembly::heard(const calls::Message& /*message*/, const calls::Call* call)
 
 void Assembly::ended(const calls::Call& call) {
     put(call);
+    if (isGrouped_ && call.endedBy == calls::EndedBy::link)
+        return;
     ++outcomes_.calls;
     if (hasFailed(call))
         ++outcomes_.failed[call.cause ? std::optional<int>(call.cause->value) : std::nullopt];

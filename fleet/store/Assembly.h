@@ -32,7 +32,9 @@ struct Results {
 // used is not committed, destroy the Assembly and make a new one. Used by one thread at a time.
 class Assembly : private calls::Listener {
   public:
-    Assembly(const RunKey& key, std::string trunkName, std::string place);
+    // `isGrouped`: the D channel is one of an NFAS group, so it may be the standby, and its calls may go on
+    // over another one. Those that end with its link are not counted in the outcomes.
+    Assembly(const RunKey& key, std::string trunkName, std::string place, bool isGrouped);
 
     // Says that a frame of this day ("2026-11-21") was stored since the last advance(). The first advance()
     // reads frames of all days, later ones only frames of the days that were named here, or later days.
@@ -65,6 +67,7 @@ class Assembly : private calls::Listener {
 
     RunKey key_;
     std::string name_;
+    bool isGrouped_;
     FrameRows rows_;
     calls::Analysis analysis_;
     std::uint64_t next_ = 1;            // the frame that is analysed next

@@ -15,7 +15,8 @@ namespace fleet {
 
 // Counts of the calls and findings of a D channel, and the state of its link.
 struct Outcomes {
-    std::uint64_t calls = 0;  // that have ended
+    std::uint64_t calls =
+        0;  // that have ended; of a D channel of a group, not those that ended with its link
     // Of these, calls that failed, by cause. The key is empty for calls without a cause.
     std::map<std::optional<int>, std::uint64_t> failed;
     std::map<std::string_view, std::uint64_t> findings;  // by kind

@@ -196,7 +196,7 @@ void Partition::takeParcel(Work& work, const Parcel& parcel) {
 
 const Partition::Known& Partition::trunkOf(pqxx::transaction_base& work, const Parcel& parcel) {
     if (const auto known = trunks_.find(parcel.address);
-        known != trunks_.end() && known->second.name == parcel.trunk)
+        known != trunks_.end() && known->second.name == parcel.trunk && known->second.group == parcel.group)
         return known->second;
     const Address& at = parcel.address;
     pqxx::result found = work.exec_params(
@@ -211,7 +211,7 @@ const Partition::Known& Partition::trunkOf(pqxx::transaction_base& work, const P
             "redacted = EXCLUDED.redacted RETURNING trunk",
             at.site, at.host, at.board, at.dChannel, parcel.trunk, parcel.group, partition_,
             parcel.isRedacted);
-    return trunks_[at] = {found[0][0].as<int>(), parcel.trunk, toText(at)};
+    return trunks_[at] = {found[0][0].as<int>(), parcel.trunk, toText(at), parcel.group};
 }
 
 void Partition::beginRun(pqxx::transaction_base& work, const RunKey& key, const Known& trunk) {
@@ -220,7 +220,7 @@ void Partition::beginRun(pqxx::transaction_base& work, const RunKey& key, const 
         return;
     work.exec_params0("INSERT INTO lapd.runs (trunk, run) VALUES ($1, $2) ON CONFLICT DO NOTHING", key.trunk,
                       key.run);
-    run = std::make_unique<Assembly>(key, trunk.name, trunk.address);
+    run = std::make_unique<Assembly>(key, trunk.name, trunk.address, !trunk.group.empty());
 }
 
 void Partition::writeFrames(Work& work) {

@@ -47,6 +47,7 @@ class Partition {
         int id = 0;
         std::string name;
         std::string address;
+        std::string group;  // NFAS, or empty
     };
     // What one transaction has read and has to write.
     struct Work;

@@ -45,7 +45,7 @@ QUESTIONS = (
     ("What passed in the first call that failed on pri3?",
      "lapdread ladder --store $STORE --trunk pri3 --failed --first 6"),
     ("Where does cause 34 rise?",
-     psql("SELECT site, name AS trunk, date_trunc('minute', began) AS minute, count(*) AS calls FROM lapd.calls "
+     psql("SELECT site, name AS trunk, date_trunc('minute', began) AS minute, count(*) AS calls FROM lapd.joined_calls "
           "JOIN lapd.trunks USING (trunk) WHERE cause = 34 GROUP BY 1, 2, 3 ORDER BY 4 DESC, 3")),
     ("Which links flapped?",
      psql("SELECT site, name AS trunk, date_trunc('second', at) AS at, left(sentence, 70) AS finding FROM lapd.findings "
@@ -53,11 +53,11 @@ QUESTIONS = (
     ("What else is wrong at leeds, and what is to be looked at?",
      "lapdread check --store $STORE --site leeds --level warning"),
     ("Which calls are up just now?",
-     psql("SELECT site, name AS trunk, callref, calling, called, channel, began FROM lapd.calls JOIN lapd.trunks USING (trunk) "
+     psql("SELECT site, name AS trunk, callref, calling, called, channel, began FROM lapd.joined_calls JOIN lapd.trunks USING (trunk) "
           "WHERE ended IS NULL ORDER BY began")),
     ("How well are calls answered, site by site?",
      psql("SELECT site, count(*) AS calls, count(*) FILTER (WHERE outcome = 'answered') AS answered, round(100.0 * count(*) FILTER "
-          "(WHERE outcome = 'answered') / count(*)) AS percent, round(avg(alerting_ms)) AS ms_to_ring FROM lapd.calls "
+          "(WHERE outcome = 'answered') / count(*)) AS percent, round(avg(alerting_ms)) AS ms_to_ring FROM lapd.joined_calls "
           "JOIN lapd.trunks USING (trunk) WHERE ended IS NOT NULL GROUP BY 1 ORDER BY 1")),
     ("Which alerts does Prometheus raise just now?",
      """promtool query instant $PROMETHEUS 'ALERTS{alertstate="firing"}'"""),

@@ -58,9 +58,9 @@ TEST_F(Store_, MigratesAnEmptyDatabaseAndThenHasNothingToDo) {
     EXPECT_EQ(migrate(connection).size(), migrations().size());
     EXPECT_TRUE(migrate(connection).empty());
     EXPECT_EQ(rows("SELECT version, name FROM lapd.migrations ORDER BY version"),
-              "1|001_tables\n2|002_days\n3|003_roles\n");
+              "1|001_tables\n2|002_days\n3|003_roles\n4|004_groups\n5|005_keeper\n");
     pqxx::work work(connection);
-    EXPECT_EQ(schemaVersion(work), 3);
+    EXPECT_EQ(schemaVersion(work), 5);
 }
 
 TEST(SqlText, WritesTimesInUtc) {
@@ -391,6 +391,8 @@ TEST_F(Store_, LetsWritersAddAndReadersReadAndNothingElse) {
     pqxx::connection reader(url("reads"));
     EXPECT_NO_THROW(
         pqxx::nontransaction(reader).exec("SELECT * FROM lapd.frames, lapd.calls, lapd.findings"));
+    EXPECT_NO_THROW(
+        pqxx::nontransaction(reader).exec("SELECT * FROM lapd.joined_calls, lapd.joined_findings"));
     const auto refuses = [](pqxx::connection& connection, const std::string& sql) {
         EXPECT_THROW(pqxx::nontransaction(connection).exec(sql), pqxx::insufficient_privilege) << sql;
     };
@@ -405,6 +407,17 @@ TEST_F(Store_, LetsWritersAddAndReadersReadAndNothingElse) {
           "UPDATE lapd.runs SET finished = false", "SELECT lapd.make_day(current_date)",
           "INSERT INTO lapd.dead_letters VALUES (1, '', '')"})
         refuses(reader, sql);
+
+    execute(
+        "DO $$ BEGIN CREATE ROLE keeps LOGIN IN ROLE lapd_keeper; EXCEPTION WHEN duplicate_object THEN NULL; "
+        "END $$");
+    pqxx::connection keeper(url("keeps"));
+    for (const char* const sql : {"SELECT * FROM lapd.calls", "DELETE FROM lapd.calls",
+                                  "DROP TABLE lapd.frames_other", "SELECT lapd.make_day(current_date)"})
+        refuses(keeper, sql);
+    EXPECT_NE(count("frames"), "0\n");
+    EXPECT_NO_THROW(pqxx::nontransaction(keeper).exec("SELECT lapd.forget_before(current_date)"));
+    EXPECT_EQ(count("frames"), "0\n");
 }
 
 // A letter that is acknowledged must survive a server that is killed.
