@@ -2,7 +2,7 @@
 file(READ systemd/hardening.conf HARDENING)
 string(STRIP "${HARDENING}" HARDENING)
 set(lapdmon_units lapdmon@.service lapdmon@.socket lapdmon-record@.service kv9relayd.service)
-set(fleet_units lapdship.service lapdstore.service)
+set(fleet_units lapdship.service lapdstore.service lapdstore-forget.service lapdstore-forget.timer)
 foreach(unit ${lapdmon_units} ${fleet_units})
     file(READ systemd/${unit} text)
     string(REPLACE "@HARDENING@" "${HARDENING}" text "${text}")
@@ -15,7 +15,7 @@ endforeach()
 install(PROGRAMS systemd/lapdmon-trace DESTINATION lib/lapdmon COMPONENT lapdmon)
 
 # What whoever runs a fleet begins with.
-install(FILES fleet/lapdship.toml fleet/lapdstore.default prometheus/alerts.yml prometheus/prometheus.yml
-    prometheus/alertmanager.yml DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/lapdmon-fleet/examples COMPONENT fleet)
+install(FILES fleet/lapdship.toml fleet/lapdstore.default fleet/lapdstore-forget.default prometheus/alerts.yml
+    prometheus/prometheus.yml prometheus/alertmanager.yml DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/lapdmon-fleet/examples COMPONENT fleet)
 install(PROGRAMS ${PROJECT_SOURCE_DIR}/scripts/fleet-certificates
     DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/lapdmon-fleet/examples COMPONENT fleet)

@@ -69,7 +69,8 @@ done
 step 'completion in bash and zsh'
 
 getent passwd lapdmon >/dev/null || fail 'there is no user lapdmon'
-for unit in lapdmon@.service lapdmon@.socket lapdmon-record@.service kv9relayd.service lapdship.service lapdstore.service; do
+for unit in lapdmon@.service lapdmon@.socket lapdmon-record@.service kv9relayd.service lapdship.service lapdstore.service \
+            lapdstore-forget.service lapdstore-forget.timer; do
     told=$(systemd-analyze verify --man=no "/lib/systemd/system/$unit" 2>&1) && [ -z "$told" ] || fail "$unit: $told"
 done
 # Each unit's ExecStart as its user, with the FIFO as the socket unit makes it and holds it open.
@@ -113,7 +114,7 @@ for program in lapdship lapdstore; do
     [ "$($program --version)" = "$program ${version%-*}" ] || fail "$program --version: $($program --version)"
 done
 examples=/usr/share/doc/lapdmon-fleet/examples
-for file in lapdship.toml lapdstore.default alerts.yml prometheus.yml alertmanager.yml fleet-certificates; do
+for file in lapdship.toml lapdstore.default lapdstore-forget.default alerts.yml prometheus.yml alertmanager.yml fleet-certificates; do
     [ -s $examples/$file ] || fail "there is no example $file"
 done
 # The example as it stands: it names servers and certificates that are not here.
@@ -127,6 +128,10 @@ status=0
 STORE_OPTIONS='--database postgresql://nobody@/lapd?host=/nowhere' \
     setpriv --reuid lapdstore --regid lapdstore --init-groups bash -c "exec $(command_of lapdstore.service) migrate" >store 2>&1 || status=$?
 [ "$status" -eq 2 ] && grep -q '^lapdstore: ' store || fail "lapdstore ends with $status: $(cat store)"
+status=0
+FORGET_OPTIONS='--database postgresql://nobody@/lapd?host=/nowhere --days 90' \
+    setpriv --reuid lapdstore --regid lapdstore --init-groups bash -c "exec $(command_of lapdstore-forget.service)" >store 2>&1 || status=$?
+[ "$status" -eq 2 ] && grep -q '^lapdstore: ' store || fail "lapdstore forget ends with $status: $(cat store)"
 step 'the fleet: programs, users, examples'
 
 quietly apt-get purge -y "${ours[@]}"

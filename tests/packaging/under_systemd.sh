@@ -119,7 +119,16 @@ done
 shipped() { exec 8<>/dev/tcp/127.0.0.1/9470; printf 'GET /metrics HTTP/1.0\r\n\r\n' >&8; cat <&8; }
 ships() { shipped | grep '^lapdship_frames_total' | grep -qv ' 0$'; }
 until_it 'the shipper reads what is recorded' ships
+# What is old is forgotten every day while the store runs, once somebody has said how old.
+systemctl is-active --quiet lapdstore-forget.timer || fail 'the timer does not run'
+systemctl start lapdstore-forget
+[ "$(systemctl show -p ConditionResult --value lapdstore-forget)" = no ] || fail 'it forgets without a configuration'
+echo 'FORGET_OPTIONS="--database postgresql://nobody@/lapd?host=/nowhere --days 90"' >/etc/default/lapdstore-forget
+! systemctl start lapdstore-forget 2>/dev/null || fail 'it forgets without a database'
+[ "$(says lapdstore-forget '/nowhere')" -ge 1 ] || fail 'it does not say which database is missing'
 systemctl stop lapdship lapdstore
+! systemctl is-active --quiet lapdstore-forget.timer || fail 'the timer outlives the store'
+systemctl stop lapdstore-forget
 [ "$(systemctl show -p Result --value lapdship lapdstore | sort -u | tr -d '\n')" = success ] || fail 'the end of the fleet programs'
 step 'the fleet, which needs a configuration and ends in order'
 
