@@ -47,7 +47,8 @@ BUILD_PACKAGES=(cmake g++ ninja-build libcli11-dev libjs-chart.js libnats-dev li
                 libtomlplusplus-dev nlohmann-json3-dev pkg-config)
 CHECK_PACKAGES=(clang-format clang-tidy cppcheck)
 TEST_PACKAGES=(bash-completion chromium-headless-shell groff-base libgtest-dev libgmock-dev libbenchmark-dev man-db mandoc
-               nats-server openssl postgresql prometheus python3 python3-jsonschema tmux tshark zsh)
+               nats-server openssl postgresql prometheus prometheus-alertmanager python3 python3-jsonschema tmux tshark
+               zsh)
 FLEET_PACKAGES=(nats-server openssl postgresql prometheus python3 util-linux)
 PACKAGE_PACKAGES=(dpkg-dev gzip lintian)
 

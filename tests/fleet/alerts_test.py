@@ -42,10 +42,29 @@ class Names(unittest.TestCase):
         self.assertLessEqual(named, set(re.findall(r"alert: (\w+)", RULES.read_text())))
 
 
+def run(*words):
+    return subprocess.run([*map(str, words)], capture_output=True, text=True, timeout=120, check=False)
+
+
+@unittest.skipUnless(shutil.which("amtool"), "there is no amtool")
+class Amtool(unittest.TestCase):
+    CONFIGURATION = FOLDER / "alertmanager.yml"
+
+    def test_takes_the_configuration(self):
+        done = run("amtool", "check-config", self.CONFIGURATION)
+        self.assertEqual(done.returncode, 0, done.stdout + done.stderr)
+
+    def test_wakes_somebody_for_what_is_critical_and_nobody_else(self):
+        for severity, receiver in (("critical", "on-call"), ("warning", "office")):
+            done = run("amtool", "config", "routes", "test", f"--config.file={self.CONFIGURATION}", f"severity={severity}",
+                       "alertname=LapdRecorderSilent", "site=london")
+            self.assertEqual((done.returncode, done.stdout.strip()), (0, receiver), done.stderr)
+
+
 @unittest.skipUnless(shutil.which("promtool"), "there is no promtool")
 class Promtool(unittest.TestCase):
     def expect_good(self, *words):
-        done = subprocess.run(["promtool", *map(str, words)], capture_output=True, text=True, timeout=120, check=False)
+        done = run("promtool", *words)
         self.assertEqual(done.returncode, 0, done.stdout + done.stderr)
 
     def test_takes_the_rules(self):
