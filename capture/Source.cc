@@ -178,7 +178,7 @@ bool Source::isAnotherContent() const {
     return size != static_cast<ssize_t>(last_.size()) || std::string_view(now.data(), last_.size()) != last_;
 }
 
-// They are read again: the window may no longer hold them.
+// Reads the last octets again from the file, because the window may no longer hold them.
 void Source::keepLastOctets() {
     std::array<char, lastSize> octets{};
     const std::size_t size = std::min<std::uint64_t>(lastSize, read_);

@@ -110,9 +110,9 @@ class DumpParser final : public Parser {
     }
 
   private:
-    static constexpr int mostLines = 64;  // that a dump goes on for
+    static constexpr int mostLines = 64;  // the most lines of a dump
 
-    // How a dump has ended, if one has.
+    // Takes a line. Returns how the dump has ended; nothing while it goes on, or while there is none.
     std::optional<Octets> goOn(std::string_view line) {
         if (!isOpen_) {
             auto opening = openingIn(line);

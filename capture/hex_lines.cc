@@ -53,7 +53,7 @@ std::optional<std::uint32_t> ticksIn(std::string_view word, std::string_view res
 
 std::string_view withoutComment(std::string_view line) { return line.substr(0, line.find('#')); }
 
-// False for what is no such line. The octets are put into `octets`.
+// Reads a line of a frame, and its octets into `octets`. Returns false for any other line.
 bool parse(std::string_view rest, HexLine& line, std::vector<std::uint8_t>& octets) {
     octets.clear();
     const std::optional<bool> direction = directionIn(takeWord(rest));

@@ -10,7 +10,7 @@ namespace {
 
 using Kind = Item::Kind;
 
-// How the note of an item begins, and what goes on behind it.
+// How the note of an item begins, and what follows these words.
 struct Wording {
     Kind kind;
     std::string_view words;

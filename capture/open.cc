@@ -67,7 +67,7 @@ class AnyReader final : public Reader {
     Progress progress() const override { return source_.progress(); }
 
   private:
-    // Item when the form is known.
+    // Returns Next::item once the form is known, Next::pause while that needs more octets. Throws BadInput.
     Next recognise() {
         while (true) {
             const std::size_t held = source_.held().size();

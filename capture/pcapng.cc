@@ -21,7 +21,7 @@ using namespace pcapng;
 constexpr std::size_t mostInterfaces = 4096;  // of one section
 
 struct Packet {
-    std::string_view octets;  // those in the block
+    std::string_view octets;  // the octets of the packet that are in the block
     std::uint32_t original;   // how many it had
     std::optional<std::uint64_t> units;
     std::uint64_t drops;  // packets lost before it
@@ -48,13 +48,13 @@ class PcapngParser final : public Parser {
     }
 
   private:
-    // A block's fields as numbers.
+    // The field of the block that begins at this octet, as a number.
     template <typename Number>
     Number field(std::size_t at) const {
         return numberAt<Number>(body_, at, order_);
     }
 
-    // Item when it was read, which may have brought items or not.
+    // Returns Next::item when a block was read. The block may have brought several items, or none.
     Reader::Next readBlock();
     void readBody(std::uint32_t type);
     void describeInterface();

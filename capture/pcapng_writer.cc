@@ -51,10 +51,10 @@ void putBlock(std::string& record, std::uint32_t type, Body body) {
     replace(record, begin + sizeof type, size);
 }
 
-// What waits for the next packet of a D channel.
+// A D channel, and what will be written with its next packet.
 struct Channel {
     std::string name;
-    std::uint64_t dropped = 0;  // in all
+    std::uint64_t dropped = 0;  // frames that were lost in the whole capture
     std::uint64_t waitingDrops = 0;
     std::vector<std::string> waiting;
     std::size_t waitingSize = 0;
@@ -96,7 +96,7 @@ class PcapngWriter final : public Writer {
     std::size_t last_ = 0;
 };
 
-// A frame that is not known well enough to have a time was still written down at one.
+// The clock of the frame. A frame without a time has the second in which the recorder wrote it.
 Clock clockOf(const Frame& frame) {
     return frame.clock == Clock::none && frame.written ? Clock::absolute : frame.clock;
 }
@@ -115,7 +115,7 @@ bool isPacket(const Item& item) {
            (item.kind == Item::Kind::cut && !item.frame.octets.empty());
 }
 
-// As long as it was on the line, as far as that is known.
+// The length of the frame on the line, or the least length that it can have had.
 std::size_t originalSize(const Item& item) {
     constexpr std::size_t leastOversized = 258;
     const std::size_t held = item.frame.octets.size();
@@ -234,12 +234,12 @@ void PcapngWriter::wait(const Item& item, Channel& channel) {
     channel.dropped += drops;
     channel.waitingDrops += drops;
     if (item.kind == Item::Kind::dropped)
-        return;  // the count says it all
+        return;  // such an item has nothing besides the count
     channel.waiting.push_back(noteOf(item));
     channel.waitingSize += channel.waiting.back().size();
 }
 
-// Takes what waits along.
+// Writes the statistics of an interface, with the comments and counts that still wait.
 void PcapngWriter::writeStatistics(std::size_t index) {
     const Described& on = interfaces_[index];
     Channel& channel = channels_[on.channel];

@@ -83,8 +83,8 @@ class Engine {
                (when.presence != When::Presence::extended || open_);
     }
 
-    // Octets by which a later standard has extended a group: those up to the next with bit 8 set. If there is
-    // none near, the clear bit was a mistake of the sender, and what follows is what would follow anyway.
+    // Skips octets by which a later standard has extended a group: those up to the next one with bit 8 set.
+    // If there is none near, the sender has cleared the bit by mistake, and the group has no further octets.
     void skipExtensions() {
         constexpr std::size_t most = 4;
         if (!open_)

@@ -11,7 +11,8 @@ namespace isdn {
 
 namespace {
 
-// A field of `count` octets, counted from the first of the contents; its label is counted on likewise.
+// A field of `count` octets, beginning at octet `from` of the contents. Its label is that of the first octet
+// of the contents plus `from`.
 Field fieldAt(const Contents& contents, std::size_t from, std::size_t count, Fields& fields) {
     Field field;
     field.octet = contents.octet;
@@ -220,7 +221,7 @@ Problem readSubaddress(const Contents& contents, Fields& fields) {
     return Problem::none;
 }
 
-// A field for each octet; its meaning are the channels whose bits are set: "1 2 3".
+// Appends a field for each octet. Its meaning lists the channels whose bits are set: "1 2 3".
 Problem readSlotMap(const Contents& contents, Fields& fields) {
     for (std::size_t i = 0; i < contents.octets.size(); ++i) {
         Field field = fieldAt(contents, i, 1, fields);

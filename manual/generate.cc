@@ -46,7 +46,7 @@ Program softboard() {
     return program;
 }
 
-// Works without a command, and has commands besides.
+// Describes a program that works without a command and also has commands.
 template <class Show>
 Program alone(Show show) {
     Program program;
@@ -99,7 +99,7 @@ const Program& programNamed(const std::string& name, const std::vector<Program>&
         if (program.name == name)
             return program;
     }
-    return programs.front();  // a page that is not about a program takes nothing of one
+    return programs.front();  // the page is not about a program and uses no part of a description
 }
 
 void generate(const fs::path& pages, const fs::path& out, const Edition& edition) {
@@ -118,7 +118,7 @@ void generate(const fs::path& pages, const fs::path& out, const Edition& edition
         write(out / "bash" / program.name, bashCompletion(program));
         write(out / "zsh" / ("_" + program.name), zshCompletion(program));
         if (program.commands.front().name.empty())
-            continue;  // all of it stands on one page
+            continue;  // a program without commands has one page
         for (const Command& command : program.commands)
             write(out / "man" / (program.name + "-" + command.name + ".1"),
                   commandPage(program, command, edition));

@@ -39,7 +39,7 @@ std::vector<std::string> titlesOf(const std::vector<Option>& options) {
         if (std::find(titles.begin(), titles.end(), option.group) == titles.end())
             titles.push_back(option.group);
     }
-    // What all programs have comes last.
+    // The options that all programs have come last.
     std::stable_partition(titles.begin(), titles.end(),
                           [](const std::string& title) { return title != otherTitle; });
     return titles;
@@ -51,8 +51,8 @@ std::string replaced(std::string text, const std::string& from, const std::strin
     return text;
 }
 
-// Lines of at most 80 octets, as roff sources have them. Macros, and what stands between .EX and .EE, stay as
-// they are.
+// Breaks lines so that they have at most 80 octets, as is usual in roff sources. Keeps macros, and lines
+// between .EX and .EE, as they are.
 std::string folded(const std::string& page) {
     constexpr std::size_t width = 80;
     std::string roff;

@@ -28,9 +28,9 @@ std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOp
 // a store come in the order of time. Throws FileError or capture::BadInput, before anything is read, if one
 // cannot be opened or its form is not known.
 //
-// If `pipes` is given, inputs that can be read only once are all opened now, and `pipes` gets a pointer to
-// each, which the stream owns. The caller may wait there for the first item of each before it reads the
-// stream. An input that is named twice is there once.
+// If `pipes` is given, opens all inputs that can be read only once now, and adds a pointer to each to
+// `pipes`. The returned stream owns them. The caller may wait for the first item of each before it reads the
+// stream. An input that is named twice is opened, and added, once.
 std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& chatter,
                                             std::vector<Primed*>* pipes = nullptr);
 

@@ -25,7 +25,7 @@ bool useColors(const OutputOptions& options, const Output& out);
 // Owns the inputs and the output that the options name. There is one in the process.
 class Session {
   public:
-    // When inputs are opened that can be read only once.
+    // When to open the inputs that can be read only once.
     enum class Pipes : std::uint8_t { inTurn, atOnce };
 
     // Opens the inputs. Throws UsageError or FileError. From now on SIGINT and SIGTERM end the work in order.
@@ -64,7 +64,7 @@ class Session {
     Filter filter_;
     CallFilter callFilter_;
     Tracker tracker_;
-    std::vector<Primed*> pipes_;  // that were opened at once; reader_ owns them
+    std::vector<Primed*> pipes_;  // the inputs that were opened at once; reader_ owns them
     Primed reader_;
     std::unique_ptr<Output> output_;
 };

@@ -47,8 +47,8 @@ void Network::startPlaying() {
 }
 
 // Whether the component's next frame may be sent: at least one subscribed queue exists, and none of them has
-// mostWaiting unread messages. Frames are not sent to nobody, because then nothing would slow the player
-// down.
+// mostWaiting unread messages. A frame waits while nobody subscribes, because otherwise nothing would slow
+// the player down.
 bool Network::heard(const Component& component) const {
     bool any = false;
     const bool waits = !misbehaviour_.bursting() && !misbehaviour_.has(FaultKind::neverWaits);

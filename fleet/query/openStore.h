@@ -9,10 +9,10 @@
 namespace fleet {
 
 // Loads the module store.so, which stays loaded, and has it connect to the store. The libraries of the
-// database and what they load in turn take as long to start as all the rest of lapdread, so only those wait
-// for them who read a store. The module is found from the program's own path: ../lib/lapdread/store.so beside
-// its folder. Throws capture::BadInput if it cannot be loaded, and what connectStore() throws. The module
-// holds the functions of what is returned.
+// database and what they load in turn take as long to start as all the rest of lapdread, so only readers of a
+// store wait for them. The module is found from the program's own path: ../lib/lapdread/store.so beside its
+// folder. Throws capture::BadInput if it cannot be loaded, and what connectStore() throws. The returned
+// object's functions are in the module.
 std::unique_ptr<Store> openStore(StoreQuery query);
 
 }  // namespace fleet

@@ -33,7 +33,7 @@ struct ShipConfig {
     std::string stream = siteStream;    // the stream whose filling is watched
     std::string state;                  // the folder of places
     std::optional<std::string> redact;  // key file; pseudonyms are sent in place of numbers
-    // A server may lose what it has confirmed for so long at most. 0: it loses nothing.
+    // A server that fails may lose what it confirmed so long before, and nothing older. 0: it loses nothing.
     std::chrono::seconds resendWindow{120};
     unsigned leastFree = 10;  // per cent of a disk or a stream; a line says when less is free
     std::string metrics;      // the address at which figures are offered; empty: nowhere

@@ -28,7 +28,7 @@ struct ShipperRules {
     std::chrono::milliseconds betweenPlaces{200};  // how often places are written to their files
     std::chrono::milliseconds toFinish{5000};      // how long the end waits for answers
     std::chrono::seconds betweenWatches{30};       // how often disks and the stream are looked at
-    std::chrono::milliseconds calm{30'000};  // how long all is well before an older place is gone back to
+    std::chrono::milliseconds calm{30'000};  // how long nothing may go wrong before the shipper goes back
 };
 
 // Runs on the caller's thread. Another thread hands out the figures (HttpAnswerer).
@@ -85,7 +85,7 @@ class Shipper {
     std::deque<ShippedTrunk> trunks_;
     Outbox outbox_;
     Doubt doubt_;
-    std::uint64_t troubles_ = 0;  // that the outbox has counted, and that were seen
+    std::uint64_t troubles_ = 0;  // how many of the troubles that the outbox counts have been considered
     std::uint64_t returns_ = 0;
     DiskWatch disks_;
     StreamFilling stream_;
