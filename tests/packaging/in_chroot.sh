@@ -132,6 +132,9 @@ status=0
 FORGET_OPTIONS='--database postgresql://nobody@/lapd?host=/nowhere --days 90' \
     setpriv --reuid lapdstore --regid lapdstore --init-groups bash -c "exec $(command_of lapdstore-forget.service)" >store 2>&1 || status=$?
 [ "$status" -eq 2 ] && grep -q '^lapdstore: ' store || fail "lapdstore forget ends with $status: $(cat store)"
+# No database runs here, but the module is found, and what it links with is installed.
+said=$(lapdread --store postgresql://127.0.0.1:1/lapd 2>&1 || true)
+grep -q 'the store: connection' <<<"$said" || fail "lapdread --store: $said"
 step 'the fleet: programs, users, examples'
 
 quietly apt-get purge -y "${ours[@]}"
