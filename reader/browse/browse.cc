@@ -2,7 +2,6 @@
 
 #include <langinfo.h>
 #include <poll.h>
-#include <pthread.h>
 
 #include <atomic>
 #include <chrono>
@@ -10,12 +9,12 @@
 #include <csignal>
 #include <cstring>
 #include <future>
-#include <thread>
 #include <utility>
 
 #include "reader/Locale.h"
 #include "reader/browse/Browser.h"
 #include "reader/browse/Collector.h"
+#include "reader/browse/ReadingThread.h"
 #include "reader/browse/Terminal.h"
 #include "reader/browse/Wake.h"
 #include "reader/browse/saving.h"
@@ -67,46 +66,6 @@ class Signals {
     ~Signals() { wakeOfSignals = nullptr; }
     Signals(const Signals&) = delete;
     Signals& operator=(const Signals&) = delete;
-};
-
-// Reads the input on a thread of its own, until the input or the object ends.
-class ReadingThread {
-  public:
-    ReadingThread(Session& session, Collector& collector, UpdateQueue& queue) : queue_(queue) {
-        // The reading thread gets no other signals: the thread that has the terminal gets them.
-        sigset_t all, before;
-        sigfillset(&all);
-        sigdelset(&all, SIGUSR1);
-        pthread_sigmask(SIG_SETMASK, &all, &before);
-        thread_ = std::thread([&session, &collector] { read(session, collector); });
-        pthread_sigmask(SIG_SETMASK, &before, nullptr);
-    }
-    ~ReadingThread() {
-        queue_.close();
-        pthread_kill(thread_.native_handle(), SIGUSR1);
-        thread_.join();
-    }
-    ReadingThread(const ReadingThread&) = delete;
-    ReadingThread& operator=(const ReadingThread&) = delete;
-
-  private:
-    static void read(Session& session, Collector& collector) {
-        Chatter quiet(Loudness::quiet);  // the screen belongs to the other thread
-        std::string error;
-        try {
-            try {
-                collector.run(session, quiet);
-            } catch (const std::exception& thrown) {
-                error = thrown.what();
-            }
-            collector.finish(error);
-        } catch (const UpdateQueue::Closed&) {
-            return;
-        }
-    }
-
-    UpdateQueue& queue_;
-    std::thread thread_;
 };
 
 // Writes a file on a thread of its own, one at a time.
