@@ -26,6 +26,7 @@ constexpr auto betweenFigures = 1s;
 constexpr auto betweenQuestions = 10s;
 constexpr auto betweenEngines = 60s;
 constexpr auto afterNoAnswer = 5min;
+constexpr auto moreToBeSure = 10s;
 // All partitions of a thread are asked within this time, so nothing waits for longer.
 constexpr std::chrono::milliseconds round = 200ms;
 constexpr std::chrono::milliseconds shortest = 5ms;
@@ -33,8 +34,9 @@ constexpr std::chrono::milliseconds shortest = 5ms;
 // The two connections, and the leases that live as long as they do.
 class Shift {
   public:
-    Shift(const WorkerOptions& options, const Say& say)
-        : options_(options), say_(say), database_(options.database), nats_(options.nats) {}
+    // `trouble` is what was said of the shift before, or empty. It is emptied when this one has got further.
+    Shift(const WorkerOptions& options, const Say& say, std::string& trouble)
+        : options_(options), say_(say), trouble_(trouble), database_(options.database), nats_(options.nats) {}
     ~Shift() {
         for (const auto& [number, held] : held_) {
             if (options_.figures != nullptr)
@@ -54,6 +56,7 @@ class Shift {
                 letters += move(at);
             }
             tellEngines();
+            sayLeased(letters);
             if (letters == 0)
                 std::this_thread::sleep_until(begun + (held_.empty() ? round : shortest));
         }
@@ -145,13 +148,12 @@ class Shift {
     void leaseMore() {
         if (SteadyClock::now() < nextTry_)
             return;
-        std::string taken;
         for (std::size_t i = 0; i < options_.partitions.size(); ++i) {
             const unsigned number = options_.partitions[firstToTry_];
             firstToTry_ = (firstToTry_ + 1) % options_.partitions.size();
             try {
                 if (!held_.contains(number) && lease(number))
-                    taken += (taken.empty() ? "" : ", ") + std::to_string(number);
+                    leased_ += (leased_.empty() ? "" : ", ") + std::to_string(number);
             } catch (const NatsError& error) {
                 if (!nats_.isConnected())
                     throw;
@@ -160,8 +162,17 @@ class Shift {
             }
         }
         nextTry_ = SteadyClock::now() + betweenTries;
-        if (!taken.empty())
-            say_("partitions leased: " + taken);
+    }
+
+    // What a shift has failed at comes to the next one again, at the latest when letters that were not
+    // acknowledged do. Until then nobody knows whether the trouble is over, and nothing is said.
+    void sayLeased(std::size_t letters) {
+        if (!trouble_.empty() && letters == 0 &&
+            SteadyClock::now() < begun_ + options_.againAfter + moreToBeSure)
+            return;
+        trouble_.clear();
+        if (!leased_.empty())
+            say_("partitions leased: " + std::exchange(leased_, {}));
     }
 
     bool lease(unsigned number) {
@@ -182,6 +193,9 @@ class Shift {
 
     const WorkerOptions& options_;
     const Say& say_;
+    std::string& trouble_;
+    const SteadyClock::time_point begun_ = SteadyClock::now();
+    std::string leased_;  // numbers of partitions, not said yet
     pqxx::connection database_;
     NatsConnection nats_;
     std::map<unsigned, std::unique_ptr<Held>> held_;
@@ -193,20 +207,25 @@ class Shift {
     std::string saidNoAnswer_;
 };
 
+// What an error is known by. A server's texts name files and rows, which are others each time.
+std::string kindOf(const std::exception& error) {
+    const auto* const refused = dynamic_cast<const pqxx::sql_error*>(&error);
+    return refused != nullptr && !refused->sqlstate().empty() ? refused->sqlstate() : error.what();
+}
+
 }  // namespace
 
 void work(const WorkerOptions& options, const std::atomic<bool>& stopped, const Say& say) {
-    std::string saidLast;
+    std::string trouble;
     while (!stopped) {
         try {
-            Shift(options, say).run(stopped);
-            saidLast.clear();
+            Shift(options, say, trouble).run(stopped);
         } catch (const std::exception& error) {
             std::string why = error.what();
             std::replace(why.begin(), why.end(), '\n', ' ');
-            if (why != saidLast)
+            const std::string before = std::exchange(trouble, kindOf(error));
+            if (before != trouble)
                 say(why);
-            saidLast = why;
             if (options.figures != nullptr)
                 options.figures->turned(options.number, false);
             std::this_thread::sleep_for(beforeBeginningAnew);

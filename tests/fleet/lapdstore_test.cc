@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <csignal>
+#include <mutex>
 #include <thread>
 
 #include "NatsServer.h"
@@ -242,6 +243,44 @@ TEST_F(Lapdstore, TellsItsFigures) {
     stopped = true;
     worker.join();
     EXPECT_FALSE(isThere("lapdstore_partition_leased")) << "whoever has ended leases nothing";
+}
+
+// A server that only reads, a right that is missing, a full disk: each attempt fails, and all are one
+// trouble.
+TEST_F(Lapdstore, SaysOnceThatTheDatabaseRefusesRows) {
+    const std::vector<Parcel> parcels = parcelsOf(source + "/examples/net5.pcap", 1000, true);
+    // The text of the error is another one each time, as those of a server that names files are.
+    execute(
+        "CREATE SEQUENCE lapd.refused; CREATE FUNCTION lapd.refuse() RETURNS trigger LANGUAGE plpgsql AS $$ "
+        "BEGIN "
+        "RAISE 'could not extend file \"base/%\"', nextval('lapd.refused') USING ERRCODE = 'disk_full'; END "
+        "$$; "
+        "CREATE TRIGGER full_disk BEFORE INSERT ON lapd.runs EXECUTE FUNCTION lapd.refuse()");
+    std::vector<std::string> said;
+    std::mutex saying;
+    std::atomic<bool> stopped{false};
+    WorkerOptions options{url(), server.options(), {parcels[0].subject().partition}, 1s};
+    std::thread worker([&] {
+        work(options, stopped, [&](const std::string& line) {
+            const std::lock_guard guard(saying);
+            said.push_back(line);
+        });
+    });
+    publish(parcels);
+    await("SELECT last_value >= 3 FROM lapd.refused", "t\n");
+    execute("DROP TRIGGER full_disk ON lapd.runs");
+    await("SELECT finished FROM lapd.runs", "t\n");
+    stopped = true;
+    worker.join();
+    const std::string leased = "partitions leased: " + std::to_string(options.partitions[0]);
+    const auto count = [&](const std::string& part) {
+        return std::count_if(said.begin(), said.end(),
+                             [&](const std::string& line) { return line.find(part) != std::string::npos; });
+    };
+    EXPECT_EQ(count("could not extend file"), 1) << testing::PrintToString(said);
+    // Once at the beginning, unless the first attempt came first, and once when rows are taken again.
+    EXPECT_LE(count(leased), 2) << testing::PrintToString(said);
+    EXPECT_LE(said.size(), 3U) << testing::PrintToString(said);
 }
 
 TEST_F(Lapdstore, SaysWhyAnEngineRefusesIt) {
