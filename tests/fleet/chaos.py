@@ -5,8 +5,14 @@
 
 Faults come one after another, first one of each kind and then at random, and may overlap: kill -9 of a recorder, of
 a shipper, of a server of NATS, of a lapdstore, of PostgreSQL, each started again a while later; the line between a site
-and its centre cut; the disk full on which a site's server keeps its stream and the shipper its places. That disk is a
-small tmpfs, which only root can make; otherwise this fault is left out, and that is said.
+and its centre cut; a site's server started with an empty disk; the disk full on which a site's server keeps its stream and
+the shipper its places, that of PostgreSQL, or that of some trunks' recordings. These disks are small tmpfs, which only root
+can make; otherwise these faults are left out, and that is said. What could not be recorded is not expected in the store.
+At last the lines to all sites are cut until each trunk has a day's frames waiting (--behind), and the time is taken
+in which the store catches up.
+
+The trunks of one site are redacted by its shipper, and two of the other site are the D channels of an NFAS group, which
+change over in the middle.
 
 Exit status 1 if the store has another frame, call or finding than lapdread finds in the logs, a gap or a dead letter,
 or if a part has ended that nobody killed.
@@ -24,63 +30,68 @@ import sys
 import tempfile
 import time
 
+from catch_up import catch_up
 from engines import SERVERS, missing
 from fleet import Fleet
 from traffic import Trunk as Traffic
 
 SITES = ("london", "leeds")
+GROUP = (2, 4)  # numbers of the trunks that are the D channels of an NFAS group
 CLONE_NEWNS = 0x00020000
 SKIPPED = 77
 
 
-class Disk:
-    """A small tmpfs for each site, in a mount namespace of this process, so that it is gone when the process ends."""
+class Disks:
+    """A small tmpfs each, in a mount namespace of this process, so that it is gone when the process ends. `sizes`: megabytes,
+    by name."""
 
-    def __init__(self, folder, megabytes):
-        self._folder, self.is_real = pathlib.Path(folder), False
-        for site in SITES:
-            self.of(site).mkdir()
+    def __init__(self, folder, sizes):
+        self._folder, self._names, self.is_real = pathlib.Path(folder), tuple(sizes), False
+        for name in sizes:
+            self.of(name).mkdir()
         if os.geteuid() != 0 or ctypes.CDLL(None, use_errno=True).unshare(CLONE_NEWNS) != 0:
             return
-        words = [["mount", "--make-rprivate", "/"], *(["mount", "-t", "tmpfs", "-o", f"size={megabytes}m,mode=755", "fleet",
-                                                       self.of(site)] for site in SITES)]
+        words = [["mount", "--make-rprivate", "/"], *(["mount", "-t", "tmpfs", "-o", f"size={size}m,mode=755", "fleet",
+                                                       self.of(name)] for name, size in sizes.items())]
         self.is_real = all(subprocess.run(each, check=False, capture_output=True).returncode == 0 for each in words)
 
     def __enter__(self):
         return self
 
     def __exit__(self, *_):
-        for site in SITES if self.is_real else ():
-            subprocess.run(["umount", "--lazy", self.of(site)], check=False)
+        for name in self._names if self.is_real else ():
+            subprocess.run(["umount", "--lazy", self.of(name)], check=False)
 
-    def of(self, site):
-        return self._folder / f"disk.{site}"
+    def of(self, name):
+        return self._folder / f"disk.{name}"
 
-    def fill(self, site):
-        """Fills the site's disk to the last octet."""
-        with open(self.of(site) / "ballast", "wb", buffering=0) as file:
+    def fill(self, name):
+        """Fills the disk to the last octet."""
+        with open(self.of(name) / "ballast", "wb", buffering=0) as file:
             for size in (1 << 20, 1 << 12, 1):
                 with contextlib.suppress(OSError):
                     while True:
                         file.write(bytes(size))
 
-    def clear(self, site):
-        (self.of(site) / "ballast").unlink()
+    def clear(self, name):
+        (self.of(name) / "ballast").unlink()
 
 
 class Chaos:
     """Makes faults in a running fleet. Each fault is a function that makes it and returns a function that undoes it."""
 
-    def __init__(self, fleet, disk, seed, spare=()):
-        self.fleet, self._random, self._disk = fleet, random.Random(seed), disk
+    def __init__(self, fleet, disks, seed, spare=()):
+        self.fleet, self._random, self._disks = fleet, random.Random(seed), disks
         self.faults = {"recorder": self._kill(lambda: self._random.choice(fleet.trunks).recorder, 3),
                        "shipper": self._kill(lambda: self._random.choice(list(fleet.shippers.values())), 3),
                        "centre's server": self._kill(lambda: fleet.engines.nats[self._random.choice(SERVERS)], 8),
                        "site's server": self._kill(lambda: fleet.engines.nats[self._random.choice(SITES)], 8),
                        "lapdstore": self._kill(lambda: self._random.choice(fleet.stores), 5),
                        "PostgreSQL": self._database, "line to a site": self._line}
-        if disk.is_real:
-            self.faults["disk of a site"] = self._fill
+        self.faults["site's server, emptied"] = self._empty
+        if disks.is_real:
+            self.faults |= {"disk of a site": self._fill, "disk of PostgreSQL": self._fill_database,
+                            "disk of recordings": self._fill_recordings}
         for name in spare:
             self.faults.pop(name, None)
         self.count = dict.fromkeys(self.faults, 0)
@@ -161,29 +172,73 @@ class Chaos:
         server = self.fleet.engines.nats[site]
         if server.name in self._busy:
             return None
-        self._disk.fill(site)
+        self._disks.fill(site)
 
         def undo():
-            self._disk.clear(site)
+            self._disks.clear(site)
             self.look(server)
             server.kill()
             server.start()
         return server.name, self._random.uniform(2, 8), undo
+
+    def _empty(self):
+        """A site's server comes back on a new disk, and somebody makes its stream anew."""
+        site = self._random.choice(SITES)
+        server = self.fleet.engines.nats[site]
+        if server.name in self._busy or self.fleet.engines.cables[site] in self._busy:
+            return None
+        self.look(server)
+        server.kill()
+        self.fleet.engines.empty(site)
+
+        def undo():
+            server.start()
+            self.fleet.make_site_stream(site)
+        return server.name, self._random.uniform(0, 8), undo
+
+    def _fill_database(self):
+        """PostgreSQL may end when it cannot write its log, and cannot start before there is room."""
+        database = self.fleet.engines.database
+        if database.name in self._busy:
+            return None
+        self._disks.fill("database")
+
+        def undo():
+            self._disks.clear("database")
+            database.kill()
+            self.fleet.engines.start_database()
+        return database.name, self._random.uniform(2, 8), undo
+
+    def _fill_recordings(self):
+        if "recordings" in self._busy:
+            return None
+        self._disks.fill("recordings")
+        return "recordings", self._random.uniform(10, 30), lambda: self._disks.clear("recordings")
 
 
 def run(options):
     seconds = options.minutes * 60
     began = time.monotonic()
     megabytes = 64 + int(options.trunks * options.minutes * options.rate)
+    sizes = {**dict.fromkeys(SITES, 2 * megabytes), "database": 1024 + 2 * megabytes, "recordings": megabytes}
+    group = Traffic(f"{options.seed} group", seconds, options.rate).captures_of_group(seconds / 2)
+
+    def recordings(number):
+        return disks.of("recordings") if number % 10 == 3 and "disk of recordings" not in options.spare else None
 
     def traffic(number):
-        return Traffic(f"{options.seed} {number}", seconds, options.rate).capture()
-    with tempfile.TemporaryDirectory(prefix="fleet-chaos.") as folder, Disk(folder, 2 * megabytes) as disk:
-        with Fleet(folder, options.trunks, traffic, SITES, site_folder=disk.of, megabytes=megabytes,
-                   resend_window=options.window) as fleet:
+        if number in GROUP:
+            return group[GROUP.index(number)]
+        # A trunk with more traffic fills what its recording has left of a page on a full disk.
+        rate = options.rate * (4 if recordings(number) else 1)
+        return Traffic(f"{options.seed} {number}", seconds, rate, flaps=(seconds / 3,)).capture()
+    with tempfile.TemporaryDirectory(prefix="fleet-chaos.") as folder, Disks(folder, sizes) as disks:
+        with Fleet(folder, options.trunks, traffic, SITES, site_folder=disks.of, megabytes=megabytes, recordings=recordings,
+                   database_folder=disks.of("database") if disks.is_real else None,
+                   resend_window=options.window, groups=dict.fromkeys(GROUP, "nfas-a"), redacted=("leeds",)) as fleet:
             print(f"seed {options.seed}: {options.trunks} trunks at {len(SITES)} sites, {options.minutes:g} minutes; up after "
                   f"{time.monotonic() - began:.0f} seconds", flush=True)
-            chaos = Chaos(fleet, disk, options.seed, options.spare)
+            chaos = Chaos(fleet, disks, options.seed, options.spare)
             chaos.run(seconds)
             calm = time.monotonic()
             chaos.look_at_all()
@@ -193,20 +248,26 @@ def run(options):
             stored = time.monotonic()
             result = fleet.compare()
             chaos.look_at_all()
-            if not disk.is_real:
+            if not disks.is_real:
                 print("no disk was filled: only root can mount a tmpfs")
             print("faults: " + ", ".join(f"{name} {count}" for name, count in chaos.count.items()))
-            print(f"{result.frames} frames and {result.calls} calls in the logs; gaps {result.gaps}, dead letters "
-                  f"{result.dead_letters}; all stored {stored - calm:.1f} s after the last fault, {stored - played:.1f} s after "
+            print(f"{result.frames} frames, {result.calls} calls and {result.findings} findings in the logs; gaps {result.gaps}, dead letters "
+                  f"{result.dead_letters}; {result.lost} frames of {result.lossy} trunks could not be recorded; all stored {stored - calm:.1f} s after the last fault, {stored - played:.1f} s after "
                   f"the last frame; {time.monotonic() - began:.0f} s in all")
             wrong = [*result.differences, *chaos.unwanted]
-            if not result.calls:
-                wrong.append("there were no calls to compare")
+            wrong += [f"there were no {what} to compare" for what, count in (("calls", result.calls), ("findings", result.findings))
+                      if not count]
             wrong += [f"{count} {what}" for count, what in ((result.gaps, "gaps"), (result.dead_letters, "dead letters")) if count]
             print("\n".join(wrong) if wrong else "nothing is lost, nothing is there twice", flush=True)
             if wrong and options.keep:
                 subprocess.run(["cp", "-a", folder, options.keep], check=False)
-            return 1 if wrong else 0
+            return bool(wrong)
+
+
+def run_behind(options):
+    said, wrong = catch_up(options.behind)
+    print("\n".join([said, *(wrong or ["nothing is lost, nothing is there twice"])]), flush=True)
+    return bool(wrong)
 
 
 def main(words=None):
@@ -216,8 +277,10 @@ def main(words=None):
     parser.add_argument("--minutes", type=float, default=30, metavar="M")
     parser.add_argument("--rate", type=float, default=0.25, help="calls a second on each trunk (default: 0.25)")
     parser.add_argument("--seed", type=int, default=random.randrange(1 << 32), help="repeats traffic and order of the faults")
-    parser.add_argument("--spare", action="append", default=[], metavar="FAULT", help="leave this fault out: 'disk of a site'")
+    parser.add_argument("--spare", action="append", default=[], metavar="FAULT", help="leave this fault out, by the name that the end tells")
     parser.add_argument("--window", type=int, default=120, help="seconds; the shippers' resend_window (default: 120)")
+    parser.add_argument("--behind", type=int, default=53000, metavar="FRAMES",
+                        help="a day of a trunk: frames of each trunk that wait when a cut line is mended, at the end (0: no such cut)")
     parser.add_argument("--patience", type=float, default=600, help="seconds for the store to have all, at the end")
     parser.add_argument("--keep", metavar="FOLDER", help="where everything is copied to if something is wrong")
     options = parser.parse_args(words)
@@ -226,7 +289,8 @@ def main(words=None):
         return SKIPPED
     os.environ["TZ"] = "UTC"
     signal.signal(signal.SIGTERM, lambda *_: sys.exit(1))  # takes everything down
-    return run(options)
+    is_wrong = run(options)
+    return int(bool(options.behind) and run_behind(options) or is_wrong)
 
 
 if __name__ == "__main__":

@@ -15,7 +15,9 @@ class Chaos(unittest.TestCase):
     @unittest.skipIf(engines.missing(), "the engines are not installed")
     def test_nothing_is_lost_or_there_twice_while_the_parts_of_a_fleet_are_killed(self):
         self.assertEqual(chaos.main(["--trunks", os.environ.get("CHAOS_TRUNKS", "20"), "--minutes",
-                                     os.environ.get("CHAOS_MINUTES", "2"), "--seed", "1", "--window", "20"]), 0)
+                                     os.environ.get("CHAOS_MINUTES", "2"), "--seed", "1", "--window", "20", "--behind", "0",
+                                     "--spare", "site's server, emptied", "--spare", "disk of PostgreSQL",
+                                     "--spare", "disk of recordings"]), 0)
 
     def test_a_row_that_is_lost_changed_more_or_there_twice_is_told(self):
         logged = ["one", "two", "three"]
@@ -36,24 +38,28 @@ class Chaos(unittest.TestCase):
     def test_a_store_that_is_not_as_its_logs_is_told(self):
         os.environ["TZ"] = "UTC"
         with tempfile.TemporaryDirectory(prefix="fleet-chaos.") as folder, \
-                fleet.Fleet(folder, 2, lambda number: traffic.Trunk(number, 2, 3).capture(), ("london",), 1) as small:
+                fleet.Fleet(folder, 2, lambda number: traffic.Trunk(number, 2, 3, flaps=(1,)).capture(), ("london",), 1) as small:
             small.play_to_the_end()
             small.await_stored(engines.LIMIT)
             result = small.compare()
             self.assertEqual(result.differences, [])
             self.assertGreater(result.calls, 4)
             self.assertEqual(result.frames, sum(trunk.frames for trunk in small.trunks))
+            self.assertGreater(result.findings, 0)
             small.engines.sql("DELETE FROM lapd.frames WHERE number = 9 AND trunk = (SELECT trunk FROM lapd.trunks "
                               "WHERE name = 'pri1')")
             small.engines.sql("UPDATE lapd.calls SET called = '0' WHERE trunk = (SELECT trunk FROM lapd.trunks "
                               "WHERE name = 'pri2') AND first_frame = (SELECT max(first_frame) FROM lapd.calls c "
                               "WHERE c.trunk = calls.trunk)")
+            small.engines.sql("DELETE FROM lapd.findings WHERE trunk = (SELECT trunk FROM lapd.trunks WHERE name = 'pri2')")
             told = "\n".join(small.compare().differences)
             self.assertIn("pri1, frames: ", told)
             self.assertIn("pri1, findings: ", told)  # a frame is missing
             self.assertNotIn("pri1, table of calls", told)
             self.assertIn("pri2, table of calls: ", told)
             self.assertNotIn("pri2, frames", told)
+            self.assertIn("pri2, table of findings: ", told)
+            self.assertNotIn("pri1, table of findings", told)
 
 
 if __name__ == "__main__":

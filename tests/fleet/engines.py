@@ -139,13 +139,15 @@ class Assembled:
 
 class Engines(Assembled):
     """`sites`: their names; each gets a server that is a leaf of the centre's three, behind a cable that can be cut.
-    `site_folder(name)`: where a site's stream is kept, below the folder unless told."""
+    `site_folder(name)`: where a site's stream is kept, and `database_folder`: where the database is; below the folder unless
+    told."""
 
-    def __init__(self, folder, sites=("london",), site_folder=None):
+    def __init__(self, folder, sites=("london",), site_folder=None, database_folder=None):
         super().__init__()
         self.folder, self.sites, self.address = pathlib.Path(folder), tuple(sites), own_address()
         self.certificates = self.folder / "certificates"
         self._site_folder = site_folder or (lambda site: self.folder / site)
+        self._database_folder = database_folder or self.folder / "database"
         self.nats, self.cables, self.database, self.prometheus = {}, {}, None, None
 
     def _assemble(self):
@@ -248,12 +250,14 @@ class Engines(Assembled):
 
     def _start_database(self):
         programs, folder = pathlib.Path(database_programs()), self.folder / "database"
+        data = self._database_folder / "data"
         self._own(folder, "postgres")
-        initdb = Process("initdb", [programs / "initdb", "-D", folder / "data", "-U", "owner", "-A", "trust", "-E", "UTF8",
+        self._own(self._database_folder, "postgres")
+        initdb = Process("initdb", [programs / "initdb", "-D", data, "-U", "owner", "-A", "trust", "-E", "UTF8",
                                     "--locale", "C.UTF-8", "--no-sync", "--no-instructions"], self.folder, "postgres", cwd="/")
         if initdb.start().wait() != 0:
             raise RuntimeError(initdb.said())
-        (folder / "data/pg_hba.conf").write_text(f"local all owner trust\nhostssl lapd all 127.0.0.0/8 cert\n")
+        (data / "pg_hba.conf").write_text(f"local all owner trust\nhostssl lapd all 127.0.0.0/8 cert\n")
         settings = {"listen_addresses": self.address, "port": DATABASE_PORT, "unix_socket_directories": folder, "ssl": "on",
                     "ssl_cert_file": self.certificates / "postgres.server.pem",
                     "ssl_key_file": self.certificates / "postgres.server.key",
@@ -261,11 +265,16 @@ class Engines(Assembled):
                     # What a killed process has written is not lost; only a machine that fails needs the disk for it.
                     "fsync": "off", "full_page_writes": "off"}
         words = [word for key, value in settings.items() for word in ("-c", f"{key}={value}")]
-        self.database = Process("postgres", [programs / "postgres", "-D", folder / "data", *words], self.folder, "postgres",
+        self.database = Process("postgres", [programs / "postgres", "-D", data, *words], self.folder, "postgres",
                                 cwd="/")
         self._down.callback(self.database.take_down)
         self.start_database()
         self.sql("CREATE DATABASE lapd", "postgres")
+
+    def empty(self, site):
+        """Removes what the killed server of a site has stored."""
+        for path in self._site_folder(site).glob("jetstream"):
+            shutil.rmtree(path)
 
     def start_database(self):
         """Starts PostgreSQL, as often as it takes: it refuses while children of a killed server still run."""

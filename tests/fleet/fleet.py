@@ -40,9 +40,9 @@ def frames_in(capture):
 class Trunk:
     """A trace on the software board, whose log is kept, and the recorder that follows the log."""
 
-    def __init__(self, name, site, number, folder, capture):
-        self.name, self.site, self.number = name, site, number
-        self.log, self.recordings = folder / f"{name}.lapdmon.log", folder / "recordings"
+    def __init__(self, name, site, number, folder, capture, group, recordings):
+        self.name, self.site, self.number, self.group = name, site, number, group
+        self.log, self.recordings = folder / f"{name}.lapdmon.log", recordings
         self.recordings.mkdir(exist_ok=True)
         frames = folder / f"{name}.pcap"
         frames.write_bytes(capture)
@@ -57,21 +57,32 @@ class Trunk:
         return self.log.read_bytes().count(b"Hex Dump: \n") if self.log.exists() else 0
 
     def recorded(self):
-        """How many frames the recorder says that it has."""
+        """How many frames the recorder says that it has read."""
         state = self.recordings / f"{self.name}.state.json"
         return json.loads(state.read_text())["next"] - 1 if state.exists() else 0
 
+    def files(self):
+        """The recordings, the last one perhaps unfinished."""
+        listed = json.loads((self.recordings / f"{self.name}.state.json").read_text())["files"]
+        named = [self.recordings / each["name"] for each in listed]
+        return [path if path.exists() else path.with_name(f"{path.name}.part") for path in named]
+
 
 class Fleet(Assembled):
-    """`traffic(number)`: the capture that trunk `number` plays, from 1. Trunks are shared out among the sites."""
+    """`traffic(number)`: the capture that trunk `number` plays, from 1. Trunks are shared out among the sites.
+    `groups`: names of NFAS groups, by the numbers of trunks. `redacted`: sites whose shippers send pseudonyms.
+    `recordings(number)`: the folder of a trunk's recordings, unless it is None."""
 
     def __init__(self, folder, trunks, traffic, sites=("london", "leeds"), stores=2, site_folder=None,
-                 megabytes=200, resend_window=120):
+                 megabytes=200, resend_window=120, groups=None, redacted=(), recordings=None,
+                 database_folder=None):
         super().__init__()
         self.folder = pathlib.Path(folder)
-        self.engines = Engines(self.folder, sites, site_folder)
+        self.engines = Engines(self.folder, sites, site_folder, database_folder)
         self.shippers, self.stores, self.trunks = {}, [], []
         self._plan = (trunks, traffic, stores)
+        self._recordings = recordings or (lambda number: None)
+        self._groups, self._redacted, self.key = groups or {}, redacted, self.folder / "redaction.key"
         self._megabytes, self._resend_window = megabytes, resend_window  # of a site's stream; of a shipper, in seconds
         self._state_folder = site_folder or (lambda site: self.folder / site)
 
@@ -105,25 +116,31 @@ class Fleet(Assembled):
         text = (f'site = "{site or "centre"}"\nhost = "h1"\nservers = [ {servers} ]\nstate = "{state}"\n'
                 f'metrics = "{self.metrics(site)}"\nresend_window = {self._resend_window}\n'
                 f'[tls]\nauthority = "{authority}"\ncertificate = "{certificate}"\nkey = "{key}"\n')
+        if site in self._redacted:
+            text = f'redact = "{self.key}"\n{text}'
         for trunk in trunks:
             text += (f'[[dchannel]]\nboard = "{trunk.number}"\ndchannel = "1"\ntrunk = "{trunk.name}"\n'
-                     f'folder = "{trunk.recordings}"\n')
+                     f'folder = "{trunk.recordings}"\n' + (f'group = "{trunk.group}"\n' if trunk.group else ""))
         if not trunks:  # only streams are made, but the file names a D channel
             text += '[[dchannel]]\nboard = "0"\ndchannel = "1"\ntrunk = "none"\nlog = "/dev/null"\n'
         path = self.folder / f"{site or 'centre'}.{user}.toml"
         path.write_text(text)
         return path
 
+    def _has_made(self, *words, site=None):
+        ran = subprocess.run([program("lapdship"), "streams", *words, "-c", self._toml(site, "admin")], capture_output=True,
+                             text=True, timeout=LIMIT)
+        return ran.returncode == 0
+
+    def make_site_stream(self, site):
+        awaited(lambda: self._has_made("site", "--size", str(self._megabytes), site=site), f"the stream of {site}")
+
     def _make_streams(self):
-        def made(*words, site=None):
-            ran = subprocess.run([program("lapdship"), "streams", *words, "-c", self._toml(site, "admin")], capture_output=True,
-                                 text=True, timeout=LIMIT)
-            return ran.returncode == 0
         for site in self.engines.sites:
-            awaited(lambda: made("site", "--size", str(self._megabytes), site=site), f"the stream of {site}")  # noqa: B023
+            self.make_site_stream(site)
         sites = [word for site in self.engines.sites for word in ("--from", site)]
         # The three servers choose a leader before they make streams.
-        awaited(lambda: made("centre", "--replicas", "3", *sites), "the streams of the centre")
+        awaited(lambda: self._has_made("centre", "--replicas", "3", *sites), "the streams of the centre")
 
     def _make_tables(self):
         subprocess.run([program("lapdstore"), "--database", self.engines.owner_url, "migrate"], check=True, capture_output=True,
@@ -137,7 +154,10 @@ class Fleet(Assembled):
         folder.mkdir()
         for number in range(1, trunks + 1):
             site = self.engines.sites[number % len(self.engines.sites)]
-            self.trunks.append(Trunk(f"pri{number}", site, number, folder, traffic(number)))
+            self.trunks.append(Trunk(f"pri{number}", site, number, folder, traffic(number), self._groups.get(number),
+                                     self._recordings(number) or folder / "recordings"))
+        if self._redacted:
+            lapdread("redact", "--key", self.key, "-o", self.folder / "nothing.pcap", self.folder / "trunks/pri1.pcap")
 
     def _add(self, process):
         self._down.callback(process.take_down)
@@ -189,17 +209,43 @@ class Fleet(Assembled):
         return {name: int(count) for name, count in rows}
 
     def await_stored(self, limit):
-        """Waits until the store has as many frames as the logs, or the time is over."""
-        wanted = {trunk.name: trunk.logged() for trunk in self.trunks}
+        """Waits until the store has as many frames as the logs, or as the recordings if less could be recorded, or the time is
+        over."""
+        for trunk in self.trunks:
+            awaited(lambda: trunk.recorded() >= trunk.logged(), f"the recordings of {trunk.name}")  # noqa: B023
+        wanted = {trunk.name: trunk.logged() - self.lost(trunk) for trunk in self.trunks}
         with contextlib.suppress(TimeoutError):
             awaited(lambda: self.stored() == wanted, "the frames of all trunks", limit)
+
+    def lost(self, trunk):
+        """How many frames of the log could not be recorded. The recorder has read all of it."""
+        if self._recordings(trunk.number) is None:
+            return 0
+        recorded = lapdread("convert", "--to", "hex", "-o", "-", *trunk.files()).splitlines()
+        return trunk.logged() - sum(not line.startswith("#") for line in recorded)
+
+    def evidence(self, trunk):
+        """The trunk's log, or its recordings if they lack frames; with pseudonyms if its site sends them."""
+        files = trunk.files() if self.lost(trunk) else [trunk.log]
+        if trunk.site not in self._redacted:
+            return files
+        redacted = trunk.log.with_suffix(".redacted.pcapng")
+        if not redacted.exists():
+            lapdread("redact", "--key", self.key, "-o", redacted, *files)
+        return [redacted]
 
     def compare(self):
         """Reads the logs and the store, and returns the Comparison."""
         result = Comparison()
         for trunk in self.trunks:
             result.of(trunk, self)
-        result.gaps = len(self.engines.sql("SELECT 1 FROM lapd.gaps"))
+        for group in sorted(set(self._groups.values())):
+            result.of_group([trunk for trunk in self.trunks if trunk.group == group], self)
+            lost = self.lost(trunk)
+            result.lost += lost
+            result.lossy += 1 if lost else 0
+            result.gaps += 0 if lost else len(self.engines.sql("SELECT 1 FROM lapd.gaps JOIN lapd.trunks USING (trunk) "
+                                                               f"WHERE name = '{trunk.name}'"))
         result.dead_letters = len(self.engines.sql("SELECT 1 FROM lapd.dead_letters"))
         return result
 
@@ -214,24 +260,54 @@ class Comparison:
     """The logs and the store, read by lapdread, and the table of calls. `differences` are lines for people."""
 
     def __init__(self):
-        self.frames = self.calls = self.gaps = self.dead_letters = 0
+        self.frames = self.calls = self.findings = self.lost = self.lossy = self.gaps = self.dead_letters = 0
         self.differences = []
 
     def of(self, trunk, fleet):
         """The same trunk, on both sides."""
         def both(*words):
-            return [lapdread(*words, "--trunk", trunk.name, *where) for where in ([trunk.log], ["--store", fleet.url()])]
-        frames, stored = (text.splitlines() for text in both("convert", "--to", "hex"))
+            return [lapdread(*words, "--trunk", trunk.name, *where)
+                    for where in (evidence, ["--store", fleet.url()])]
+        # In what is read a frame's number is its place; in the tables it is the number in the run, with those that are lost.
+        evidence, without = fleet.evidence(trunk), ("first_frame", "last_frame") if fleet.lost(trunk) else ()
+        frames, stored = ([line for line in text.splitlines() if not line.startswith("# lapdread: redacted with")]
+                          for text in both("convert", "--to", "hex", "-o", "-"))
         self.compare(f"{trunk.name}, frames", frames, stored)
         self.frames += sum(not line.startswith("#") for line in frames)
         calls, stored = (list(csv.DictReader(io.StringIO(text))) for text in both("calls", "--csv"))
         self.compare(f"{trunk.name}, calls", [row_of(call) for call in calls], [row_of(call) for call in stored])
         self.calls += len(calls)
         self.compare(f"{trunk.name}, findings", *(text.splitlines() for text in both("check")))
-        table = fleet.engines.sql(f"SELECT {', '.join(COLUMNS)} FROM lapd.calls JOIN lapd.trunks USING (trunk) "
+        if trunk.group:
+            return  # its calls may begin on one D channel and end on another
+        self.compare(f"{trunk.name}, table of findings", *self._findings(trunk, fleet, bool(without)))
+        columns = [column for column in COLUMNS if column not in without]
+        table = fleet.engines.sql(f"SELECT {', '.join(columns)} FROM lapd.calls JOIN lapd.trunks USING (trunk) "
                                   f"WHERE name = '{trunk.name}' ORDER BY last_frame, first_frame")
         calls.sort(key=lambda call: (int(call["last_frame"]), int(call["first_frame"])))
-        self.compare(f"{trunk.name}, table of calls", [[call[column] for column in COLUMNS] for call in calls], table)
+        self.compare(f"{trunk.name}, table of calls", [[call[column] for column in columns] for call in calls], table)
+
+    def _findings(self, trunk, fleet, is_lossy):
+        """Those of lapdread check on the log, and the rows of the table."""
+        found = [json.loads(line) for line in
+                 lapdread("check", "--jsonl", "--trunk", trunk.name, *fleet.evidence(trunk)).splitlines()]
+        self.findings += len(found)
+        severities = ("note", "warning", "error")
+        rows = fleet.engines.sql(f"SELECT frame, kind, severity, count, sentence FROM lapd.findings JOIN lapd.trunks USING (trunk) "
+                                 f"WHERE name = '{trunk.name}'")
+        logged = [[str(each["frame"]), each["finding"], str(severities.index(each["severity"])), str(each["count"]),
+                   each["sentence"]] for each in found]
+        return tuple(sorted(row[1:] if is_lossy else row for row in each) for each in (logged, rows))
+
+    def of_group(self, trunks, fleet):
+        """The D channels of an NFAS group, which share their calls."""
+        names = ",".join(trunk.name for trunk in trunks)
+        logs = [log for trunk in trunks for log in fleet.evidence(trunk)]
+        rows = [csv.DictReader(io.StringIO(lapdread("calls", "--csv", *where))) for where in
+                (["--nfas", ",".join(log.stem for log in logs), "--merge", *logs], ["--trunk", names, "--store", fleet.url()])]
+        # Frames of two D channels that have the same time have no order.
+        self.compare(f"{names}, calls of the group", *(sorted(row_of(call, "call", "dchannel", "first_frame", "last_frame")
+                                                              for call in each) for each in rows))
 
     def compare(self, what, expected, got):
         if expected == got:
@@ -244,6 +320,6 @@ class Comparison:
             self.differences += [f"    only in the {where}: {row}" for row in rows[:3]]
 
 
-def row_of(call):
-    """A call without the column that says where it was read."""
-    return [value for key, value in call.items() if key != "file"]
+def row_of(call, *without):
+    """A call without the column that says where it was read, and without these."""
+    return [value for key, value in call.items() if key not in ("file", *without)]

@@ -12,6 +12,18 @@ import make_captures  # noqa: E402
 FAR, NEAR = 0x8000, 0.012  # the flag of a call reference; an answer of layer 2 or 3 that takes no thinking
 
 
+def text_of(lines):
+    """Lines of a capture's text, in the order of their times in ticks of 4 ms."""
+    return "".join(f"{at * 4 / 1000:.3f} {what}\n" for at, what in sorted(lines, key=lambda line: line[0]))
+
+
+def capture_of(text):
+    with tempfile.NamedTemporaryFile("w", suffix=".frames") as file:
+        file.write(text)
+        file.flush()
+        return make_captures.pcap(make_captures.read(pathlib.Path(file.name)))
+
+
 class Trunk:
     """The same seed gives the same traffic. `rate`: about so many calls a second; `seconds`: new calls begin for so long;
     `fails`: the share of calls that the other side refuses with one of `causes`; `flaps`: when the link is lost and set up
@@ -36,13 +48,18 @@ class Trunk:
             self._say(each + NEAR, "rx final")
 
     def text(self):
-        return "".join(f"{at * 4 / 1000:.3f} {what}\n" for at, what in sorted(self._lines, key=lambda line: line[0]))
+        return text_of(self._lines)
 
     def capture(self):
-        with tempfile.NamedTemporaryFile("w", suffix=".frames") as file:
-            file.write(self.text())
-            file.flush()
-            return make_captures.pcap(make_captures.read(pathlib.Path(file.name)))
+        return capture_of(self.text())
+
+    def captures_of_group(self, switch):
+        """The captures of two D channels of one NFAS group. The first one carries the calls until the second `switch`, then the
+        other does. Both links are polled all the time."""
+        def is_polling(what):
+            return what.endswith(("sabme", "ua", "poll", "final"))
+        return [capture_of(text_of(line for line in self._lines if is_polling(line[1]) or (line[0] < switch * 250) == is_first))
+                for is_first in (True, False)]
 
     def _say(self, at, what):
         self._lines.append((round(at * 250), what))
