@@ -1,5 +1,6 @@
 #include "fleet/query/FrameRows.h"
 
+#include <algorithm>
 #include <utility>
 
 #include "capture/hex_digits.h"
@@ -40,6 +41,12 @@ ParcelItem frameIn(const pqxx::row& row) {
     return item;
 }
 
+// Whether the recorder itself has said that so many frames are lost, or more.
+bool tellsOf(const std::vector<ParcelItem>& notes, std::uint64_t missing) {
+    return std::ranges::any_of(
+        notes, [&](const ParcelItem& note) { return note.kind == Kind::lost && note.count >= missing; });
+}
+
 }  // namespace
 
 FrameRows::FrameRows(std::string name, std::string place)
@@ -63,15 +70,15 @@ void FrameRows::take(const pqxx::row& row) {
     if (run_ != 0 && itsRun != run_)
         add(Kind::replaced);
     const std::uint64_t expected = itsRun == run_ ? number_ + 1 : run_ == 0 ? itsNumber : 1;
-    if (itsNumber > expected)
+    std::vector<ParcelItem> notes;
+    if (!row[before].is_null())
+        notes = notesInText(row[before].c_str());
+    if (itsNumber > expected && !tellsOf(notes, itsNumber - expected))
         add(Kind::lost, itsNumber - expected);
     run_ = itsRun;
     number_ = itsNumber;
     interface_ = interfaces_.of({name_, capture::variantNamed(row[variant].c_str())});
-    if (!row[before].is_null()) {
-        std::vector<ParcelItem> notes = notesInText(row[before].c_str());
-        items_.insert(items_.end(), std::move_iterator(notes.begin()), std::move_iterator(notes.end()));
-    }
+    items_.insert(items_.end(), std::move_iterator(notes.begin()), std::move_iterator(notes.end()));
     items_.push_back(frameIn(row));
 }
 

@@ -28,8 +28,9 @@ class FrameRows {
     FrameRows& operator=(const FrameRows&) = delete;
 
     // Takes a row and drops items of the row before that next() has not given. A row whose frame was taken
-    // already, with another day, gives nothing. If numbers are missing before the frame, an item of kind
-    // `lost` with their count comes first; a new run begins with an item of kind `replaced`.
+    // already, with another day, gives nothing. If numbers are missing before the frame, and the recorder has
+    // not said so itself, an item of kind `lost` with their count comes first; a new run begins with an item
+    // of kind `replaced`.
     void take(const pqxx::row& row);
     // Takes what the recorder said after a run's last frame, as the column `behind` of lapd.runs has it.
     // Drops items as take() does.

@@ -220,7 +220,7 @@ def run(options):
     seconds = options.minutes * 60
     began = time.monotonic()
     megabytes = 64 + int(options.trunks * options.minutes * options.rate)
-    sizes = {**dict.fromkeys(SITES, 2 * megabytes), "database": 1024 + 2 * megabytes, "recordings": megabytes}
+    sizes = {**dict.fromkeys(SITES, 2 * megabytes), "database": 768, "recordings": megabytes}
     group = Traffic(f"{options.seed} group", seconds, options.rate).captures_of_group(seconds / 2)
 
     def recordings(number):

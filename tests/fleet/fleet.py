@@ -239,13 +239,13 @@ class Fleet(Assembled):
         result = Comparison()
         for trunk in self.trunks:
             result.of(trunk, self)
-        for group in sorted(set(self._groups.values())):
-            result.of_group([trunk for trunk in self.trunks if trunk.group == group], self)
             lost = self.lost(trunk)
             result.lost += lost
             result.lossy += 1 if lost else 0
             result.gaps += 0 if lost else len(self.engines.sql("SELECT 1 FROM lapd.gaps JOIN lapd.trunks USING (trunk) "
                                                                f"WHERE name = '{trunk.name}'"))
+        for group in sorted(set(self._groups.values())):
+            result.of_group([trunk for trunk in self.trunks if trunk.group == group], self)
         result.dead_letters = len(self.engines.sql("SELECT 1 FROM lapd.dead_letters"))
         return result
 
@@ -280,14 +280,18 @@ class Comparison:
         self.compare(f"{trunk.name}, findings", *(text.splitlines() for text in both("check")))
         if trunk.group:
             return  # its calls may begin on one D channel and end on another
-        self.compare(f"{trunk.name}, table of findings", *self._findings(trunk, fleet, bool(without)))
+        if not without:  # sentences name frames
+            self.compare(f"{trunk.name}, table of findings", *self._findings(trunk, fleet))
         columns = [column for column in COLUMNS if column not in without]
         table = fleet.engines.sql(f"SELECT {', '.join(columns)} FROM lapd.calls JOIN lapd.trunks USING (trunk) "
                                   f"WHERE name = '{trunk.name}' ORDER BY last_frame, first_frame")
         calls.sort(key=lambda call: (int(call["last_frame"]), int(call["first_frame"])))
+        for call in calls:  # the end of a log ends its calls; the store waits for more
+            if call["ended_by"] == "open":
+                call["outcome"] = "open"
         self.compare(f"{trunk.name}, table of calls", [[call[column] for column in columns] for call in calls], table)
 
-    def _findings(self, trunk, fleet, is_lossy):
+    def _findings(self, trunk, fleet):
         """Those of lapdread check on the log, and the rows of the table."""
         found = [json.loads(line) for line in
                  lapdread("check", "--jsonl", "--trunk", trunk.name, *fleet.evidence(trunk)).splitlines()]
@@ -297,7 +301,7 @@ class Comparison:
                                  f"WHERE name = '{trunk.name}'")
         logged = [[str(each["frame"]), each["finding"], str(severities.index(each["severity"])), str(each["count"]),
                    each["sentence"]] for each in found]
-        return tuple(sorted(row[1:] if is_lossy else row for row in each) for each in (logged, rows))
+        return sorted(logged), sorted(rows)
 
     def of_group(self, trunks, fleet):
         """The D channels of an NFAS group, which share their calls."""

@@ -256,6 +256,21 @@ TEST_F(StoreAsInput, SaysWhatIsMissingAsALoss) {
     EXPECT_NE(ofStore("list").find("frames lost by the recorder: 4"), std::string::npos) << ofStore("list");
 }
 
+TEST_F(StoreAsInput, SaysOnceWhatTheRecorderHasSaidToBeLost) {
+    std::vector<Parcel> parcels = parcelsOf(source + "/examples/net5.pcap", 4, true);
+    parcels.erase(parcels.begin() + 1);
+    fleet::ParcelItem lost;
+    lost.kind = capture::Item::Kind::lost;
+    lost.count = 4;
+    parcels[1].frames.front().before.push_back(lost);
+    store(parcels);
+    const std::string listed = ofStore("list");
+    const std::string told = "frames lost by the recorder: ";
+    const std::size_t first = listed.find(told + "4\n");
+    EXPECT_NE(first, std::string::npos) << listed;
+    EXPECT_EQ(listed.find(told, first + 1), std::string::npos) << listed;
+}
+
 TEST_F(StoreAsInput, ComparesCallsAndDChannelsAsItComparesFiles) {
     const std::string pri = source + "/examples/net5.pcap";
     const std::string other = source + "/examples/ni2.pcap";
