@@ -9,7 +9,8 @@ namespace fleet {
 namespace {
 
 constexpr std::uint64_t framesAtOnce = 5000;
-// A finding may name a call that went a while ago, and a frame that it waited for an answer to.
+// How many of the newest calls and frames are remembered, because a finding may name a call that ended a
+// while ago, or a frame whose answer it waited for.
 constexpr std::size_t callsRemembered = 65'536;
 constexpr std::size_t ordinalsRemembered = 65'536;
 
@@ -65,7 +66,7 @@ void Assembly::readState(pqxx::transaction_base& work) {
     isFinished_ = row[1].as<bool>();
 }
 
-// Returns how many rows there were.
+// Reads the next frames. Returns how many rows there were.
 std::size_t Assembly::readFrames(pqxx::transaction_base& work) {
     const std::string days = since_ ? " AND day >= '" + *since_ + "'" : "";
     const pqxx::result rows =
@@ -88,8 +89,8 @@ std::size_t Assembly::readFrames(pqxx::transaction_base& work) {
     return rows.size();
 }
 
-// Whether all frames from the next one up to this one are known to be missing for good: a gap was told, or
-// they were assembled once, and forgotten since.
+// Whether the frames between the next one and this one are missing for good: the shipper has reported them as
+// a gap, or they were assembled before and have been deleted since (`lapdstore forget`).
 bool Assembly::mayPass(pqxx::transaction_base& work, std::uint64_t number) {
     std::uint64_t missing = std::max(next_, assembled_);
     for (const pqxx::row& gap : work.exec_params(
@@ -101,7 +102,8 @@ bool Assembly::mayPass(pqxx::transaction_base& work, std::uint64_t number) {
     return missing >= number;
 }
 
-// While frames are read for the second time, what comes of them is in the tables already.
+// Hands the frames to the analysis. Drops the results of frames that were assembled before, because these are
+// in the tables already.
 void Assembly::feedItems() {
     capture::Item item;
     while (rows_.next(item))
@@ -157,7 +159,7 @@ void Assembly::put(const calls::Call& call) {
     changed_[call.begin.frame] = rowOf(key_, call);
 }
 
-// Calls that are alive are rows as well, so that the store knows what is going on. Most have not changed.
+// Adds the rows of calls that are alive and have changed, so that the store shows what is going on.
 void Assembly::putOpen() {
     for (const calls::Call* const call : analysis_.open()) {
         CallRow row = rowOf(key_, *call);
@@ -177,7 +179,7 @@ void Assembly::found(const calls::Finding& finding) {
     ++outcomes_.findings[finding.kind->id];
 }
 
-// A finding may come before its call is heard of, so the call is looked up only now.
+// A finding may come before the first row of its call, so the calls of findings are looked up here.
 void Assembly::collect(Results& results) {
     for (auto& [frame, row] : changed_)
         results.calls.push_back(std::move(row));
@@ -194,7 +196,7 @@ void Assembly::collect(Results& results) {
     outcomes_ = {};
 }
 
-// Of the link that a primary rate has. Nothing tells whether a link that was never spoken of is up.
+// Whether the link with TEI 0 is up, as on a primary rate. Nothing if no frame has shown it.
 std::optional<bool> Assembly::isLinkUp() const {
     const calls::DChannel* const channel = analysis_.dChannel(name_);
     const calls::Link* const link = channel == nullptr ? nullptr : channel->find(isdn::callControlSapi, 0);

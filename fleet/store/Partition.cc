@@ -48,13 +48,14 @@ FrameRow rowOf(const RunKey& key, std::uint64_t number, const ParcelFrame& frame
             frame.before.empty() ? std::nullopt : Field(toText(frame.before))};
 }
 
-// The values are at fault, not the connection or the server: SQLSTATE classes 22 (data) and 23 (constraints).
+// Whether the values have caused the error, and not the connection or the server: SQLSTATE classes 22 (data)
+// and 23 (constraints).
 bool isAboutData(const pqxx::sql_error& error) {
     return error.sqlstate().starts_with("22") || error.sqlstate().starts_with("23");
 }
 
-// A server may be set up to say "committed" before the transaction is in its log. If it is killed then, what
-// was acknowledged to the stream is gone.
+// Sees to it that the server says "committed" only once the transaction is in its log. Otherwise a server
+// that is killed could lose letters that were acknowledged to the stream.
 void commitForGood(pqxx::connection_base& connection) {
     pqxx::nontransaction work(connection);
     work.exec(
@@ -80,7 +81,7 @@ struct Partition::Work {
     pqxx::work transaction;
     std::vector<FrameRow> frames;
     std::set<RunKey> touched;
-    std::map<std::string, std::set<RunKey>> days;  // that frames are of, with their runs
+    std::map<std::string, std::set<RunKey>> days;  // the days of the frames, each with the runs of its frames
     PartitionFigures figures;                      // what the transaction adds to them
     Results results;
 };
@@ -109,7 +110,7 @@ std::vector<DeadLetter> Partition::take(std::span<const Letter> letters) {
         forget();
         throw;
     }
-    // One of them is at fault; alone it is found.
+    // One of the letters has caused the error. Store each alone, so that only that one becomes a dead letter.
     dead.clear();
     for (const Letter& letter : letters) {
         std::vector<DeadLetter> one = take({&letter, 1});
@@ -118,7 +119,7 @@ std::vector<DeadLetter> Partition::take(std::span<const Letter> letters) {
     return dead;
 }
 
-// What is in memory belongs to a transaction that has failed. The next one reads the tables.
+// Forgets what a transaction that has failed has left in memory. The next one reads the tables again.
 void Partition::forget() {
     days_.clear();
     trunks_.clear();
@@ -244,7 +245,7 @@ void Partition::assemble(Work& work) {
     std::erase_if(runs_, [](const auto& run) { return run.second->isFinished(); });
 }
 
-// The transaction is committed.
+// Adds up the figures. Called when the transaction is committed.
 void Partition::count(Work& work, std::span<const Letter> letters) {
     figures_.frames += work.figures.frames;
     figures_.doubles += work.figures.doubles;

@@ -164,8 +164,9 @@ class Shift {
         nextTry_ = SteadyClock::now() + betweenTries;
     }
 
-    // What a shift has failed at comes to the next one again, at the latest when letters that were not
-    // acknowledged do. Until then nobody knows whether the trouble is over, and nothing is said.
+    // Says which partitions were leased. After a trouble it waits until letters were stored, or until the
+    // letters that were not acknowledged must have come again: only then is it known whether the trouble is
+    // over.
     void sayLeased(std::size_t letters) {
         if (!trouble_.empty() && letters == 0 &&
             SteadyClock::now() < begun_ + options_.againAfter + moreToBeSure)
@@ -207,7 +208,7 @@ class Shift {
     std::string saidNoAnswer_;
 };
 
-// What an error is known by. A server's texts name files and rows, which are others each time.
+// By what two errors count as the same. A server's texts name files and rows, which differ each time.
 std::string kindOf(const std::exception& error) {
     const auto* const refused = dynamic_cast<const pqxx::sql_error*>(&error);
     return refused != nullptr && !refused->sqlstate().empty() ? refused->sqlstate() : error.what();
