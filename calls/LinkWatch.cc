@@ -136,9 +136,6 @@ void LinkWatch::windows(const Sample& sample, const Link& link, const Circumstan
         window = std::max(window, outstanding);
         const unsigned least = around.access == Access::basic ? 1 : 7;
         Since& full = full_[indexOf(sender)];
-        std::uint8_t& acknowledged = acknowledged_[indexOf(sender)];
-        if (std::exchange(acknowledged, link.sentBy(sender).acknowledged()) != acknowledged)
-            full = {};
         if (outstanding < std::max(window, least))
             full = {};
         else

@@ -119,10 +119,9 @@ class LinkWatch {
     std::array<Repeated, 2> repeated_{};
     std::array<Idle, 2> idle_{};
     std::array<bool, 2> silent_{};  // it was reported that this side sends nothing, and it has not since
-    std::array<std::uint8_t, 2> acknowledged_{};  // the last N(R) about a side's frames
-    std::vector<std::int64_t> setUpTimes_;        // the last set-ups without a release before them
-    bool released_ = false;                       // DISC came since the link was set up
-    bool lost_ = false;                           // DM came while the link was up
+    std::vector<std::int64_t> setUpTimes_;  // the last set-ups without a release before them
+    bool released_ = false;                 // DISC came since the link was set up
+    bool lost_ = false;                     // DM came while the link was up
     bool sentInformation_ = false;
     bool up_ = false;
     bool keepAliveReported_ = false;

@@ -338,6 +338,16 @@ TEST_F(CallTableTest, KeepsTheCauseOfTheFirstClearingMessageAndTheOthersBesideIt
     EXPECT_EQ(madeBy(call.laterCauses[1]), Made::here);
 }
 
+TEST_F(CallTableTest, TakesACauseOfAnotherCodingStandardForNoneThatItKnows) {
+    constexpr std::uint8_t national = 2 << 5, invalidReference = 81;
+    CallScript script;
+    script.at(0).us(m::setup, 9, false);
+    script.at(50).peer(m::releaseComplete, 9, true, {cause(invalidReference, national | 2)});
+    EXPECT_EQ(play(script), "1 us 9 other release peer 81\n");
+    EXPECT_EQ(seen.calls.at(0).cause->codingStandard, 2);
+    EXPECT_EQ(madeBy(*seen.calls.at(0).cause), Made::thisExchange);
+}
+
 TEST_F(CallTableTest, MessagesOfTheGlobalOrTheDummyReferenceBelongToNoCall) {
     CallScript script;
     script.at(0)

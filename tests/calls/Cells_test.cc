@@ -118,5 +118,38 @@ TEST_F(Cells, ARestartIsSeenUntilItIsAnswered) {
     EXPECT_EQ(used(), "");
 }
 
+TEST_F(Cells, ARestartOfAChannelIsSeenOnItsInterfaceAlone) {
+    const auto on = [](std::uint8_t interface) {
+        return test::Bytes{0x18, 0x04, 0xE9, static_cast<std::uint8_t>(0x80 | interface), 0x83, 0x83};
+    };
+    for (const std::uint8_t interface : {0, 1}) {
+        const auto reference = static_cast<std::uint16_t>(interface + 1);
+        script_.message(Side::us, type::setup, reference, false, {test::bearerSpeech(), on(interface)});
+        script_.message(Side::peer, type::callProceeding, reference, true, {on(interface)});
+        connect(reference);
+        release(reference);
+    }
+    const auto restarting = [&] {
+        used();
+        std::vector<std::string> channels;
+        for (const CellRow& row : rows_) {
+            for (const ChannelCell& cell : row.cells)
+                if (cell.use == Use::restarting && cell.channel.number == 3)
+                    channels.push_back(toString(cell.channel));
+        }
+        return channels;
+    };
+    constexpr std::uint8_t namedChannels = 0, oneInterface = 6;
+    const test::Bytes wholeInterface{0x18, 0x02, 0xE8, 0x81};  // 1, and no channel
+    script_.message(Side::peer, type::restart, 0, false, {on(1), test::restartIndicator(namedChannels)});
+    EXPECT_EQ(restarting(), std::vector<std::string>{"1/3"});
+    script_.message(Side::us, type::restartAcknowledge, 0, true,
+                    {on(1), test::restartIndicator(namedChannels)});
+    EXPECT_EQ(restarting(), std::vector<std::string>());
+    script_.message(Side::peer, type::restart, 0, false,
+                    {wholeInterface, test::restartIndicator(oneInterface)});
+    EXPECT_EQ(restarting(), std::vector<std::string>{"1/3"});
+}
+
 }  // namespace
 }  // namespace calls

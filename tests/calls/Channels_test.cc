@@ -239,6 +239,60 @@ TEST(Channels, ThatStayBehindWithALinkStandInItsFinding) {
     }
 }
 
+TEST(Channels, ThatStayBehindWithALinkShareAFindingOfTheirOwnIfTheCallsAreFew) {
+    CallScript script;
+    script.at(0).linkUp();
+    for (std::uint8_t i = 1; i <= 2; ++i)
+        talk(script.at(i * 1000), i, i);
+    script.at(9000).raw(Side::peer, true, {0x53}).raw(Side::us, false, {0x73});  // DISC, UA
+    script.at(200000).linkUp();
+    Collected collected;
+    Analysis analysis({}, collected);
+    std::uint64_t number = 0;
+    for (const Sent& sent : script.frames())
+        analysis.take(sent.frame, ++number);
+    analysis.advance(300 * second);
+    analysis.finish();
+    ASSERT_EQ(collected.findings.size(), 1U) << collected.lines;
+    EXPECT_EQ(collected.findings[0].kind, &findings::stuckChannel);
+    EXPECT_EQ(collected.findings[0].channels, (std::vector<std::string>{"1", "2"}));
+    EXPECT_EQ(collected.findings[0].sentence,
+              "channels 1, 2 of calls 1, 2 were neither cleared nor restarted after the link was lost");
+}
+
+TEST(Channels, OfOneInterfaceAreFreeAfterARestartOfThatInterface) {
+    const auto on = [](std::uint8_t interface, std::uint8_t number) {
+        return Bytes{0x18, 0x04,
+                     0xE9, static_cast<std::uint8_t>(0x80 | interface),
+                     0x83, static_cast<std::uint8_t>(0x80 | number)};
+    };
+    const Bytes wholeInterface{0x18, 0x02, 0xE8, 0x81};  // 1, and no channel
+    CallScript script;
+    script.at(0).linkUp();
+    for (const std::uint8_t interface : {0, 1}) {
+        const auto reference = static_cast<std::uint16_t>(interface + 1);
+        script.at(1000 + interface * 2000).us(m::setup, reference, false, {bearerSpeech(), on(interface, 5)});
+        script.peer(m::connect, reference, true, {on(interface, 5)});
+        script.at(2000 + interface * 2000)
+            .us(m::setup, reference, false, {bearerSpeech()});  // takes the reference of a live call
+        script.peer(m::releaseComplete, reference, true, {cause(17)});
+    }
+    script.at(9000).us(m::restart, 0, false, {wholeInterface, restartIndicator(6)});
+    script.peer(m::restartAcknowledge, 0, true, {wholeInterface, restartIndicator(6)});
+    Collected collected;
+    Analysis analysis({}, collected);
+    std::uint64_t number = 0;
+    for (const Sent& sent : script.frames())
+        analysis.take(sent.frame, ++number);
+    analysis.finish();
+    std::vector<std::string> stuck;
+    for (const Finding& finding : collected.findings) {
+        if (finding.kind == &findings::stuckChannel)
+            stuck.insert(stuck.end(), finding.channels.begin(), finding.channels.end());
+    }
+    EXPECT_EQ(stuck, std::vector<std::string>{"0/5"}) << collected.lines;
+}
+
 TEST(Channels, ThatStayBehindAreAnErrorThoughTheLinkHasOneOfItsOwn) {
     for (const bool restarted : {false, true}) {
         CallScript script;

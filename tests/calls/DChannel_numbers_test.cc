@@ -88,6 +88,13 @@ TEST_F(DChannelTest, TakesWhatTheRecorderSaysForTheReasonOfAHole) {
               "3 user command accepted unknown\n");
 }
 
+TEST_F(DChannelTest, KnowsFromAnAcknowledgementAloneWhatTheRecorderHasMissed) {
+    told("1 > RR 3\n");
+    channel.mayMiss("Frames Lost");
+    const std::string said = told("3 < I 5 0\n");
+    EXPECT_NE(said.find("[hole at 2: 2 from 3 by recorder]"), std::string::npos) << said;
+}
+
 TEST_F(DChannelTest, CountsAFrameWithoutOctetsForOneNumber) {
     EXPECT_EQ(told("1 < I 0 0\n"), "1 user command accepted unknown\n");
     channel.mayLack(Side::peer);

@@ -148,6 +148,14 @@ TEST(WindowStalled, IsFoundWhenAFullWindowIsNotAcknowledgedInTime) {
     EXPECT_EQ(found(story + "1.5 < RNR 0\n3 < RR 7\n"), "");
 }
 
+TEST(WindowStalled, IsFoundThoughOtherFramesPassMeanwhile) {
+    std::string story(up);
+    for (int i = 0; i < 7; ++i)
+        story += "1.0" + std::to_string(i) + " > I " + std::to_string(i) + " 0\n";
+    EXPECT_EQ(found(story + "1.5 < RR 0 P\n1.51 > RR 0 F\n2 < RR 0 P\n2.01 > RR 0 F\n2.5 < RR 7\n"),
+              "warning window-stalled 9\n");
+}
+
 TEST(WindowStalled, IsNotFoundWhileAcknowledgementsComeOneByOne) {
     std::string story(up);
     for (int i = 0; i < 7; ++i)

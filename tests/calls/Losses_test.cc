@@ -1,6 +1,7 @@
 // What the recorder has missed: an answer that may be among it is not called missing.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <functional>
 
 #include "tests/calls/analysed.h"
@@ -189,6 +190,36 @@ TEST(Losses, InAMessageOfSegmentsAreNoFaultOfItsSender) {
         EXPECT_EQ(told(s, asked + 4100), lost ? "cannot-be-told\n" : "segments-unfinished\n");
         EXPECT_EQ(told(s, asked + 3900), "");
     }
+}
+
+TEST(Losses, OfTheAnswerThatShowBehindATimerWhileAnEarlierFrameIsNotAcknowledgedYet) {
+    CallScript s = begun();
+    s.at(asked).us(m::setup, 2, false, {bearerSpeech()});
+    s.at(asked + 50).acknowledge(Side::peer);
+    s.at(asked + 200).peer(m::status, 9, true, {cause(30), callState(0)});
+    s.peer(m::callProceeding, 2, true).unrecorded();
+    s.at(asked + 8100).raw(Side::us, false, {0x01, 0x02});  // RR, N(R) = 1: acknowledges neither
+    s.at(asked + 8200).peer(m::status, 9, true, {cause(30), callState(0)});
+    EXPECT_EQ(told(s, asked + 30000), "cannot-be-told\n");
+}
+
+TEST(Losses, LeaveOneNoteForQuestionsThatBelongToNoCall) {
+    CallScript s = begun();
+    for (const std::uint8_t number : {5, 6})
+        s.at(asked).us(m::restart, 0, false, {channel(number), restartIndicator(0)});
+    s.acknowledge(Side::peer);
+    s.at(asked + 500).raw(Side::peer, true, {0x7F}).raw(Side::us, false, {0x73});  // SABME, UA
+    Collected collected;
+    Analysis analysis({}, collected);
+    std::uint64_t number = 0;
+    for (const Sent& sent : s.frames())
+        analysis.take(sent.frame, ++number);
+    analysis.advance(300 * second);
+    analysis.finish();
+    const auto note = std::find_if(collected.findings.begin(), collected.findings.end(),
+                                   [](const Finding& each) { return each.kind->id == "cannot-be-told"; });
+    ASSERT_NE(note, collected.findings.end()) << collected.lines;
+    EXPECT_EQ(note->sentence, "2 questions got no answer, but the link was down meanwhile");
 }
 
 TEST(Losses, OfALinkLeaveOneNoteForAllQuestionsThatWereOpen) {

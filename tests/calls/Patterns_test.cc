@@ -47,6 +47,13 @@ TEST(Patterns, NoteCallsThatAllEndAfterTheSameTime) {
     EXPECT_EQ(patternsIn(script), "same-duration\n");
 }
 
+TEST(Patterns, NoteOneLengthOnceHoweverManyCallsHaveIt) {
+    CallScript script;
+    for (std::uint16_t i = 0; i < 9; ++i)
+        call(script, i * 200000, i + 1, 60000);
+    EXPECT_EQ(patternsIn(script), "same-duration\n");
+}
+
 TEST(Patterns, AreSilentOnCallsOfVariousLengths) {
     CallScript script;
     std::int64_t begin = 0;
@@ -86,6 +93,25 @@ TEST(Patterns, FindCallsThatEndTogetherWithTheLink) {
     script.at(200010).raw(Side::peer, false, {0x73});  // UA, F = 1
     script.at(300000).us(m::setup, 9, false, {bearerSpeech()});
     EXPECT_NE(patternsIn(script).find("mass-clear\n"), std::string::npos) << patternsIn(script);
+}
+
+TEST(Patterns, BlameNoLinkForCallsThatEndLaterThanASecondOrBeforeAnyEventOfIt) {
+    const auto threeCallsEnd = [](CallScript& script, std::int64_t begin, std::int64_t end) {
+        for (std::uint16_t i = 1; i <= 3; ++i)
+            script.at(begin).us(m::setup, i, false, {bearerSpeech()});
+        for (std::uint16_t i = 1; i <= 3; ++i)
+            script.at(end).peer(m::releaseComplete, i, true, {cause(41)});
+    };
+    CallScript without;
+    threeCallsEnd(without, 100, 200);
+    EXPECT_EQ(patternsIn(without), "");
+    for (const auto& [end, findings] :
+         {std::pair(10000, "link-flap\nmass-clear\n"), {10004, "link-flap\n"}}) {
+        CallScript script;
+        script.at(0).linkUp().at(9000).linkUp();
+        threeCallsEnd(script, 9100, end);
+        EXPECT_EQ(patternsIn(script), findings) << end;
+    }
 }
 
 TEST(Patterns, ReferToTheFaultOfTheLinkThatCallsEndedWith) {
