@@ -1,6 +1,7 @@
 #include "calls/Verdicts.h"
 
 #include <algorithm>
+#include <utility>
 
 #include "calls/CommandBits.h"
 #include "calls/FindingKinds.h"
@@ -96,9 +97,12 @@ void Verdicts::reconsider(std::int64_t at, bool isOver) {
     held_ = std::move(open);
 }
 
+// The clock comes to a frame's time before the frame is heard, and that frame may be the one that decides. So
+// T203 runs out with the clock of the step before.
 void Verdicts::advance(std::int64_t at, std::int64_t oldest) {
+    const std::int64_t heardUntil = std::exchange(now_, at);
     if (!held_.empty())
-        reconsider(at, false);
+        reconsider(heardUntil, false);
     for (auto entry = doubtful_.begin(); entry != doubtful_.end();) {
         if (oldest <= entry->second.since) {
             ++entry;

@@ -73,6 +73,7 @@ class Verdicts {
     const Timers& timers_;
     const LinkWitnesses& links_;
     FindingSink& sink_;
+    std::int64_t now_ = 0;
     std::deque<Unanswered> held_;
     std::map<std::pair<std::uint8_t, std::string_view>, Doubtful> doubtful_;  // by TEI and reason
 };

@@ -192,6 +192,23 @@ TEST(Losses, InAMessageOfSegmentsAreNoFaultOfItsSender) {
     }
 }
 
+TEST(Losses, OfTheAnswerThatShowOnlyAfterALongSilence) {
+    constexpr std::int64_t silence = 60000;
+    for (const Question& question : questions) {
+        CallScript s = begun();
+        question.ask(s.at(asked));
+        s.at(asked + 50).acknowledge(Side::peer);
+        CallScript whole = s;
+        question.answer(s.at(asked + 60));
+        s.unrecorded();
+        const std::int64_t next = asked + question.timer + silence;
+        s.at(next).peer(m::status, 9, true, {cause(30), callState(0)});  // of another call
+        EXPECT_EQ(told(s, next + silence), "cannot-be-told\n") << question.finding;
+        whole.at(next).peer(m::status, 9, true, {cause(30), callState(0)});
+        EXPECT_EQ(told(whole, next + silence), std::string(question.finding) + "\n");
+    }
+}
+
 TEST(Losses, OfTheAnswerThatShowBehindATimerWhileAnEarlierFrameIsNotAcknowledgedYet) {
     CallScript s = begun();
     s.at(asked).us(m::setup, 2, false, {bearerSpeech()});
