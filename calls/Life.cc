@@ -204,14 +204,12 @@ void learnPhase(Life& life, const Message& message) {
         case type::connect:
             if (!life.connectAt)
                 life.connectAt = message.at;
-            call.phase = Phase::talking;
-            break;
+            [[fallthrough]];
         case type::connectAcknowledge:
         case type::retrieveAcknowledge:
         case type::resumeAcknowledge:
             call.phase = Phase::talking;
-            if (!life.connectAt)
-                life.connectAt = message.at;
+            life.answeredByUser = true;
             break;
         case type::holdAcknowledge:
             call.phase = Phase::held;
@@ -259,14 +257,14 @@ void conclude(Life& life, EndedBy by, const Moment& end) {
     call.phase = Phase::ended;
     call.endedBy = by;
     call.end = end;
-    if (call.kind == Kind::call && isWithoutChannel(call) && life.connectAt)
+    if (call.kind == Kind::call && isWithoutChannel(call) && life.answeredByUser)
         call.kind = Kind::signalling;
     if (!call.clearingSeen && by != EndedBy::open)
         call.clearedBy = ClearedBy::nobody;
     if (life.connectAt && !call.duration && by != EndedBy::open)
         call.duration = end.at - *life.connectAt;
     const bool byOrigin = life.clearedFirst == call.origin && call.clearedBy != ClearedBy::both;
-    if (life.connectAt)
+    if (life.answeredByUser)
         call.outcome = Outcome::answered;
     else if (by == EndedBy::open)
         call.outcome = Outcome::open;

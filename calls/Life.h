@@ -28,6 +28,7 @@ struct Life {
     bool clearingNumbered = false;
     bool crossingDecided = false;  // whether the other side cleared on its own
     std::optional<std::int64_t> connectAt;
+    bool answeredByUser = false;         // CONNECT, or a later message that shows the same
     std::vector<std::uint8_t> identity;  // of SUSPEND or RESUME
     // For a broadcast SETUP, by TEI: the terminals that answered, and those that have left the call.
     std::bitset<128> joined;

@@ -338,6 +338,22 @@ TEST_F(CallTableTest, KeepsTheCauseOfTheFirstClearingMessageAndTheOthersBesideIt
     EXPECT_EQ(madeBy(call.laterCauses[1]), Made::here);
 }
 
+TEST_F(CallTableTest, GivesNoDurationToAnAnsweredCallWhoseConnectIsNotInTheTrace) {
+    for (const std::uint8_t shows : {m::connectAcknowledge, m::retrieveAcknowledge, m::resumeAcknowledge}) {
+        Seen without;
+        CallNumbers number;
+        CallTable calls{timers, number, without};
+        CallScript script;
+        script.at(0).peer(shows, 9, true);
+        script.at(30000).us(m::releaseComplete, 9, false, {cause(16)});
+        for (const Sent& sent : script.frames())
+            calls.take(script.toMessage(sent));
+        calls.finish();
+        EXPECT_EQ(without.lines, "1 us 9 answered release us 16 before-trace\n");
+        EXPECT_FALSE(without.calls.at(0).duration) << int{shows};
+    }
+}
+
 TEST_F(CallTableTest, TakesACauseOfAnotherCodingStandardForNoneThatItKnows) {
     constexpr std::uint8_t national = 2 << 5, invalidReference = 81;
     CallScript script;

@@ -247,12 +247,7 @@ TEST(Channels, ThatStayBehindWithALinkShareAFindingOfTheirOwnIfTheCallsAreFew) {
     script.at(9000).raw(Side::peer, true, {0x53}).raw(Side::us, false, {0x73});  // DISC, UA
     script.at(200000).linkUp();
     Collected collected;
-    Analysis analysis({}, collected);
-    std::uint64_t number = 0;
-    for (const Sent& sent : script.frames())
-        analysis.take(sent.frame, ++number);
-    analysis.advance(300 * second);
-    analysis.finish();
+    analyse(script, collected, 300000);
     ASSERT_EQ(collected.findings.size(), 1U) << collected.lines;
     EXPECT_EQ(collected.findings[0].kind, &findings::stuckChannel);
     EXPECT_EQ(collected.findings[0].channels, (std::vector<std::string>{"1", "2"}));
@@ -280,11 +275,7 @@ TEST(Channels, OfOneInterfaceAreFreeAfterARestartOfThatInterface) {
     script.at(9000).us(m::restart, 0, false, {wholeInterface, restartIndicator(6)});
     script.peer(m::restartAcknowledge, 0, true, {wholeInterface, restartIndicator(6)});
     Collected collected;
-    Analysis analysis({}, collected);
-    std::uint64_t number = 0;
-    for (const Sent& sent : script.frames())
-        analysis.take(sent.frame, ++number);
-    analysis.finish();
+    analyse(script, collected);
     std::vector<std::string> stuck;
     for (const Finding& finding : collected.findings) {
         if (finding.kind == &findings::stuckChannel)

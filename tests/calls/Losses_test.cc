@@ -227,12 +227,7 @@ TEST(Losses, LeaveOneNoteForQuestionsThatBelongToNoCall) {
     s.acknowledge(Side::peer);
     s.at(asked + 500).raw(Side::peer, true, {0x7F}).raw(Side::us, false, {0x73});  // SABME, UA
     Collected collected;
-    Analysis analysis({}, collected);
-    std::uint64_t number = 0;
-    for (const Sent& sent : s.frames())
-        analysis.take(sent.frame, ++number);
-    analysis.advance(300 * second);
-    analysis.finish();
+    analyse(s, collected, 300000);
     const auto note = std::find_if(collected.findings.begin(), collected.findings.end(),
                                    [](const Finding& each) { return each.kind->id == "cannot-be-told"; });
     ASSERT_NE(note, collected.findings.end()) << collected.lines;
