@@ -86,15 +86,18 @@ TEST_F(Nats, AMessageIsAnsweredWhenTheStreamHasIt) {
 
 TEST_F(Nats, AMessageThatIsSentTwiceIsKeptOnce) {
     EXPECT_FALSE(sent("lapd.7.s.h.b.d", "one", "id1").isDuplicate);
+    EXPECT_EQ(sent("lapd.7.s.h.b.d", "two", "id2").sequence, 2U);
     const NatsPublisher::Answer again = sent("lapd.7.s.h.b.d", "one", "id1");
+    EXPECT_EQ(again.sequence, 1U);
     EXPECT_TRUE(again.isKept);
     EXPECT_TRUE(again.isDuplicate);
-    EXPECT_EQ(fleet::fillingOf(connection, fleet::centreStream).messages, 1U);
+    EXPECT_EQ(fleet::fillingOf(connection, fleet::centreStream).messages, 2U);
 }
 
 TEST_F(Nats, ASubjectThatNoStreamTakesIsAnsweredAtOnce) {
     const NatsPublisher::Answer answer = sent("elsewhere", "one", "id1");
     EXPECT_FALSE(answer.isKept);
+    EXPECT_FALSE(answer.isAtLimit);
     EXPECT_NE(answer.error, "");
 }
 
@@ -106,6 +109,7 @@ TEST_F(Nats, AFullStreamRefusesAndKeepsWhatItHas) {
     const NatsPublisher::Answer refused = sent("lapd.7.s.h.b.d", std::string(600, 'y'), "id2");
     EXPECT_FALSE(refused.isKept);
     EXPECT_TRUE(refused.isFull) << refused.error;
+    EXPECT_TRUE(refused.isAtLimit) << refused.error;
     EXPECT_EQ(fleet::fillingOf(connection, fleet::centreStream).messages, 1U);
     EXPECT_EQ(fleet::fillingOf(connection, fleet::centreStream).mostOctets, 1000U);
 }
@@ -162,6 +166,18 @@ TEST_F(Nats, WhatAStreamHasTakenSurvivesAServerThatIsKilled) {
     EXPECT_EQ(connection.server(), server.options().servers[0]);
     NatsConsumer consumer(connection, allFrames());
     EXPECT_EQ(textsOf(consumer.fetch(10, longEnough)), "one;two;");
+}
+
+TEST_F(Nats, AServerThatIsStartedAnewIsAnotherProcess) {
+    const std::string first = connection.serverProcess();
+    EXPECT_NE(first, "");
+    const NatsConnection second(server.options());
+    EXPECT_EQ(second.serverProcess(), first);
+    server.kill();
+    server.start();
+    const NatsConnection third(server.options());
+    EXPECT_NE(third.serverProcess(), "");
+    EXPECT_NE(third.serverProcess(), first);
 }
 
 TEST_F(Nats, AServerThatSaysNothingIsNoAnswer) {

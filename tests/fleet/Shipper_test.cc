@@ -360,12 +360,39 @@ TEST_F(ShipperTest, WhatAServerHasLostIsShippedAgain) {
     const std::string returns = "\nlapdship_returns_total " + std::to_string(shipper->returns()) + "\n";
     EXPECT_NE(metricsOf(*shipper).find(returns), std::string::npos);
     shipper.reset();
+    std::ifstream trusted(folder_.file("state/server"));
+    std::string process;
+    std::getline(trusted, process);
+    EXPECT_EQ(process, connection_.serverProcess());
     // The next shipper begins where it is sure, and stays to the end of what is there.
     stop_ = false;
     ship();
     receive();
     expectFrames(610);
     EXPECT_EQ(fleet::readPlace(folder_.file("state/0.1.place.json"))->next, 611U);
+}
+
+TEST_F(ShipperTest, ThePlaceFollowsOnceTheStreamHasTakenMoreAfterTheWindow) {
+    writeConfig("folder = \"" + folder_.path() + "\"\n", "resend_window = 1\n");
+    recorder_.begin(run, 1);
+    recorder_.frames(100);
+    std::uint64_t count = 100;
+    {
+        fleet::Shipper shipper(fleet::readShipConfig(folder_.file("ship.toml")), {},
+                               [](const std::string&) {});
+        std::thread thread([&] { shipper.run(stop_); });
+        for (; !std::filesystem::exists(folder_.file("state/0.1.place.json")); ++count) {
+            recorder_.frames(1);
+            usleep(10'000);
+        }
+        stop_ = true;
+        thread.join();
+    }
+    EXPECT_GT(fleet::readPlace(folder_.file("state/0.1.place.json"))->next, 1U);
+    stop_ = false;
+    ship();
+    receive();
+    expectFrames(count);
 }
 
 TEST_F(ShipperTest, ASignalEndsItWithItsPlaceWrittenDown) {
