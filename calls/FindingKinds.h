@@ -96,7 +96,7 @@ inline constexpr FindingKind proceedingUnanswered{"proceeding-unanswered", Sever
     "the network beyond the other end"};
 inline constexpr FindingKind alertingUnanswered{"alerting-unanswered", Severity::note, "Q.931 5.1.8, T301",
     "ALERTING was followed by nothing for longer than T301",
-    "whether somebody is meant to answer: a queue may let a call ring as long"};
+    "whether somebody is meant to answer: a waiting queue may let a call ring that long"};
 inline constexpr FindingKind connectNotAcknowledged{"connect-not-acknowledged", Severity::warning, "Q.931 5.2.8, T313",
     "the network did not acknowledge the user's CONNECT",
     "the network side: the call may be cleared, or stay one-way"};
