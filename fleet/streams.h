@@ -24,7 +24,7 @@ struct StreamRules {
     std::uint32_t replicas = 1;
     std::uint64_t mostOctets = 0;  // on each server's disk; 0: as much as the server allows
     std::chrono::hours age{7 * 24};
-    std::chrono::seconds duplicates{120};  // how long the server remembers the ids of messages
+    std::chrono::milliseconds duplicates{120'000};  // how long the server remembers the ids of messages
     // The JetStream domains of sites. The stream LAPD_SITE of each is copied into this stream.
     std::vector<std::string> sites;
 };

@@ -147,6 +147,8 @@ TEST(ShipCommandLine, DescribesStreams) {
     ASSERT_EQ(centre.streams.size(), 2U);
     EXPECT_EQ(centre.streams[0].name, "LAPD");
     EXPECT_EQ(centre.streams[0].replicas, 3U);
+    for (const fleet::StreamRules& rules : centre.streams)
+        EXPECT_EQ(rules.duplicates, std::chrono::milliseconds(100)) << "copies would differ";
     EXPECT_TRUE(centre.streams[0].subjects.empty());
     EXPECT_EQ(centre.streams[0].sites, (std::vector<std::string>{"a", "b"}));
     EXPECT_EQ(centre.streams[1].name, "LAPD_DEAD");
