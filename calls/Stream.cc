@@ -1,6 +1,7 @@
 #include "calls/Stream.h"
 
 #include <algorithm>
+#include <functional>
 
 namespace calls {
 
@@ -8,6 +9,15 @@ namespace {
 
 // More frames than the window of any sender allows without an acknowledgement.
 constexpr std::size_t mostWaiting = 16;
+// The line cannot lose more frames in a row than a window, and no D channel has one as wide as this.
+constexpr unsigned mostLostOnLine = 32;
+
+// The hash of a frame's information, never 0.
+std::uint32_t textOf(const isdn::Layer2& frame) {
+    const std::string_view octets(reinterpret_cast<const char*>(frame.information.data()),
+                                  frame.information.size());
+    return static_cast<std::uint32_t>(std::hash<std::string_view>()(octets)) | 1U;
+}
 
 }  // namespace
 
@@ -27,12 +37,14 @@ void Stream::reset() {
     recovering_ = false;
     known_ = firm_ = true;
     next_ = expected_ = acknowledged_ = 0;
+    texts_.fill(0);
 }
 
 void Stream::loosen() {
     hole_.reset();
     waiting_.clear();
     recovering_ = firm_ = false;
+    texts_.fill(0);
 }
 
 std::optional<Hole> Stream::giveUp() {
@@ -51,6 +63,7 @@ void Stream::keep(const Sample& sample) {
 
 Stream::Taken Stream::take(const Sample& sample, std::string_view recorded) {
     const std::uint8_t ns = sample.layer2.ns;
+    const std::uint32_t text = textOf(sample.layer2);
     Taken taken;
     if (!firm_) {
         if (known_ && !recorded.empty() && isAhead(ns, next_)) {
@@ -63,6 +76,8 @@ Stream::Taken Stream::take(const Sample& sample, std::string_view recorded) {
         expected_ = next_ = ns;
     }
     taken.again = ns != next_ && !isAhead(ns, next_);
+    if (taken.again && !mayRepeat(ns, text))
+        goOnAt(sample, recorded, taken);
     if (isAhead(ns, expected_))
         takeAhead(sample, recorded, taken);
     else if (ns != expected_)
@@ -76,9 +91,25 @@ Stream::Taken Stream::take(const Sample& sample, std::string_view recorded) {
         expected_ = after(ns);
         recovering_ = false;
     }
+    for (; !taken.again && next_ != ns; next_ = after(next_))
+        texts_[next_] = 0;  // it is missing, and may come as a repetition
     if (!taken.again)
         next_ = after(ns);
+    texts_[ns] = text;
     return taken;
+}
+
+// So many frames are missing in the trace that numbers have come round to this one. The line cannot have lost
+// them, because no sender sends more than a window without an acknowledgement.
+void Stream::goOnAt(const Sample& sample, std::string_view recorded, Taken& taken) {
+    const std::uint8_t ns = sample.layer2.ns;
+    taken.found = Hole{expected_, ahead(ns, expected_), sample.number, sample.at, recorded};
+    taken.by = LostBy::recorder;
+    taken.again = false;
+    giveUp();
+    recovering_ = false;
+    texts_.fill(0);
+    expected_ = next_ = acknowledged_ = ns;
 }
 
 void Stream::takeAhead(const Sample& sample, std::string_view recorded, Taken& taken) {
@@ -89,7 +120,8 @@ void Stream::takeAhead(const Sample& sample, std::string_view recorded, Taken& t
     }
     if (!hole_) {
         taken.found = Hole{expected_, ahead(ns, expected_), sample.number, sample.at, recorded};
-        if (sample.from() == Side::peer && recorded.empty())
+        const bool mayBeLine = sample.from() == Side::peer && taken.found->count <= mostLostOnLine;
+        if (mayBeLine && recorded.empty())
             hole_ = taken.found;
         else
             taken.by = LostBy::recorder;

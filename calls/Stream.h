@@ -2,6 +2,7 @@
 #ifndef CALLS_STREAM_H
 #define CALLS_STREAM_H
 
+#include <array>
 #include <cstdint>
 #include <optional>
 #include <string_view>
@@ -98,7 +99,6 @@ class Stream {
     // Whether N(R) is behind what was acknowledged, by more than a window, so that it is no repetition of an
     // older N(R). Never for 0, which may follow a SABME that the trace lacks.
     bool isLongAcknowledged(std::uint8_t nr) const {
-        constexpr unsigned widestWindow = 7;
         const unsigned behind = ahead(acknowledged_, nr);
         return firm_ && nr != 0 && ahead(nr, acknowledged_) > ahead(next_, acknowledged_) &&
                !isAhead(nr, next_) && behind > widestWindow;
@@ -107,15 +107,25 @@ class Stream {
     std::uint8_t next() const { return next_; }
 
   private:
+    static constexpr unsigned widestWindow = 7;
+
+    // Whether a frame whose number is not ahead can be a repetition: its sender may still hold it, and no
+    // frame with another text had this number. The sender holds frames whose acknowledgement it has not
+    // received, and an acknowledgement may be lost on the line.
+    bool mayRepeat(std::uint8_t ns, std::uint32_t text) const {
+        return ahead(next_, ns) <= outstanding() + widestWindow && (texts_[ns] == 0 || texts_[ns] == text);
+    }
+    void goOnAt(const Sample& sample, std::string_view recorded, Taken& taken);
     void takeAhead(const Sample& sample, std::string_view recorded, Taken& taken);
     void keep(const Sample& sample);
 
-    bool known_ = false;             // some number was seen
-    bool firm_ = false;              // the next number is known for sure
-    std::uint8_t next_ = 0;          // V(S): the number after the highest that was sent
-    std::uint8_t expected_ = 0;      // V(R) of the receiver
-    std::uint8_t acknowledged_ = 0;  // the last N(R) of the receiver
-    bool recovering_ = false;        // the receiver waits for `expected_` to be sent again
+    bool known_ = false;                      // some number was seen
+    bool firm_ = false;                       // the next number is known for sure
+    std::uint8_t next_ = 0;                   // V(S): the number after the highest that was sent
+    std::uint8_t expected_ = 0;               // V(R) of the receiver
+    std::uint8_t acknowledged_ = 0;           // the last N(R) of the receiver
+    bool recovering_ = false;                 // the receiver waits for `expected_` to be sent again
+    std::array<std::uint32_t, 128> texts_{};  // hashes of the newest frame of each number; 0: not known
     std::optional<Hole> hole_;
     std::vector<KeptFrame> waiting_;  // behind the hole; at most `mostWaiting`
 };

@@ -184,4 +184,55 @@ TEST_F(DChannelTest, TakesNumbersAsTheyComeOnALinkThatCameUpUnseen) {
               "6 user response up\n");
 }
 
+TEST_F(DChannelTest, BlamesTheRecorderForMoreThanTheLineCanLose) {
+    EXPECT_EQ(told("1 < I 100 0\n1.1 > RR 101\n9 < I 10 0\n9.1 > RR 11\n"),
+              "1 user command accepted unknown\n"
+              "2 user response up\n"
+              "3 user command accepted early up [hole at 3: 37 from 101 by recorder]\n"
+              "4 user response up\n");
+    EXPECT_EQ(told.atEnd(), "");
+}
+
+TEST_F(DChannelTest, GoesOnAfterMoreThanHalfOfAllNumbersAreMissing) {
+    EXPECT_EQ(told("1 < I 100 0\n1.1 > RR 101\n9 < I 40 0\n9.1 > RR 41\n10 < I 41 0\n"),
+              "1 user command accepted unknown\n"
+              "2 user response up\n"
+              "3 user command accepted early up [hole at 3: 67 from 101 by recorder]\n"
+              "4 user response up\n"
+              "5 user command accepted up\n");
+    EXPECT_EQ(told.atEnd(), "");
+}
+
+TEST_F(DChannelTest, GoesOnWhenANumberComesAgainWithAnotherText) {
+    EXPECT_EQ(told("1 < I 4 0 = 08 01 01 05\n1.1 < I 5 0\n1.2 > RR 6\n"
+                   "9 < I 4 0 = 08 01 02 05\n9.1 > RR 5\n10 < I 4 0 = 08 01 02 05\n"),
+              "1 user command accepted unknown\n"
+              "2 user command accepted unknown\n"
+              "3 user response up\n"
+              "4 user command accepted early up [hole at 4: 126 from 6 by recorder]\n"
+              "5 user response up\n"
+              "6 user command refused again up\n");
+    EXPECT_EQ(told.atEnd(), "");
+}
+
+TEST_F(DChannelTest, ComparesARepetitionWithItsOwnRoundOfNumbersAlone) {
+    std::string story;
+    const auto add = [&](int frame, double at) {
+        std::ostringstream line;
+        line << at << " > I " << frame % 128 << " 0 = 08 01 0" << frame / 128 << " 05\n"
+             << at + 0.01 << " < RR " << (frame + 1) % 128 << "\n";
+        story += line.str();
+    };
+    for (int frame = 0; frame < 131; ++frame)
+        add(frame, frame);
+    add(133, 133);  // 131 and 132 are missing
+    add(132, 134);  // and then 132 is repeated
+    const std::string text = told(story);
+    EXPECT_EQ(text.substr(text.find('[')),
+              "[hole at 263: 2 from 3 by recorder]\n"
+              "264 user response up\n"
+              "265 user command refused again up\n"
+              "266 user response up\n");
+}
+
 }  // namespace
