@@ -37,7 +37,7 @@ void WitnessKeeper::judgeNumbers(const Sample& sample, const Marks& marks, const
         witness_.holeOpen[index] = link.mayLackFramesOf(side);
         const bool isNext = side == sample.from() && sample.layer2.hasNs() && !marks.retransmitted;
         if (side == sample.from() || !sample.layer2.hasNr()) {
-            if (isNext && !witness_.holeOpen[index])
+            if (isNext && !witness_.holeOpen[index] && witness_.lastHole[index] != sample.at)
                 witness_.wholeUntil[index] = sample.at;
             continue;
         }

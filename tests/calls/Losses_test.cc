@@ -209,6 +209,33 @@ TEST(Losses, OfTheAnswerThatShowOnlyAfterALongSilence) {
     }
 }
 
+TEST(Losses, OfOurOwnAnswerThatShowOnlyInTheNextNumber) {
+    for (const bool lost : {true, false}) {
+        CallScript s = begun();
+        s.at(asked).peer(m::setup, 2, false, {bearerSpeech(), channel(5)});
+        s.at(asked + 50).acknowledge(Side::us);
+        if (lost)
+            s.at(asked + 60).us(m::callProceeding, 2, true, {channel(5)}).unrecorded();
+        s.at(asked + 30000).us(m::status, 9, true, {cause(30), callState(0)});
+        EXPECT_EQ(told(s, asked + 90000), lost ? "cannot-be-told\n" : "setup-unanswered\n");
+    }
+}
+
+TEST(Losses, OfTheAnswerAmongMoreFramesThanTheLineCanLose) {
+    for (const Question& question : questions) {
+        CallScript s = begun();
+        question.ask(s.at(asked));
+        s.at(asked + 50).acknowledge(Side::peer);
+        question.answer(s.at(asked + 60));
+        s.unrecorded();
+        for (int frame = 0; frame < 100; ++frame)
+            s.peer(m::status, 9, true, {cause(30), callState(0)}).unrecorded();
+        const std::int64_t next = asked + question.timer + 500;
+        s.at(next).peer(m::status, 9, true, {cause(30), callState(0)});
+        EXPECT_EQ(told(s, next + 60000), "cannot-be-told\n") << question.finding;
+    }
+}
+
 TEST(Losses, OfTheAnswerThatShowBehindATimerWhileAnEarlierFrameIsNotAcknowledgedYet) {
     CallScript s = begun();
     s.at(asked).us(m::setup, 2, false, {bearerSpeech()});
