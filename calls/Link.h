@@ -98,8 +98,7 @@ class Link {
     const Stream& sentBy(Side side) const { return streams_[indexOf(side)]; }
     // The numbers suggest that I frames of this side are missing in the trace; what comes next decides.
     bool mayLackFramesOf(Side side) const {
-        const std::optional<PendingNr>& nr = beyond_[indexOf(other(side))];
-        return sentBy(side).hasOpenHole() || (nr && !nr->behind);
+        return sentBy(side).hasOpenHole() || beyond_[indexOf(other(side))];
     }
 
   private:
