@@ -35,7 +35,8 @@ class WaiterTest : public EventTest {
     std::optional<SleeplessSystem> system_{std::in_place};
 };
 
-constexpr unsigned int longWait = 100000;  // ms, in no time
+// Milliseconds: ten million naps, each of which takes no time but lets other threads run.
+constexpr unsigned int longWait = 100'000'000;
 
 TEST_F(WaiterTest, Waiting25MillisecondsTriesThreeTimesAndGivesUp) {
     const auto waiter = ccs_->getNewMsgWait(replyType);
