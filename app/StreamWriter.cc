@@ -179,6 +179,12 @@ Stream* StreamWriter::State::awaitRoom(std::unique_lock<std::mutex>& held) {
     const int timeout = timeoutUntil(limit_);
     held.unlock();
     const bool some = poll(polled_.data(), polled_.size(), timeout) > 0;
+    // poll looks at one descriptor after the other. If two lead to one pipe, its reader may have made room
+    // between the two looks, and a later text would overtake. Once there is room, a second look sees it at
+    // both.
+    const auto hasNoRoom = [](const pollfd& each) { return each.fd >= 0 && each.revents == 0; };
+    if (some && std::any_of(polled_.begin() + 1, polled_.end(), hasNoRoom))
+        static_cast<void>(poll(polled_.data(), polled_.size(), 0));
     std::uint64_t wakes = 0;
     if (some && polled_[0].revents != 0)
         static_cast<void>(!read(wakeUp_, &wakes, sizeof wakes));

@@ -97,6 +97,17 @@ TEST_F(StreamWriterTest, KeepsTheOrderOfStreamsThatLeadToOnePlace) {
     EXPECT_EQ(out_.read(expected.size()), expected);
 }
 
+// Each text fills the pipe, and the reader makes room for the next one just when the writer looks.
+TEST_F(StreamWriterTest, KeepsTheOrderOfStreamsThatLeadToOneFullPipe) {
+    constexpr std::size_t texts = 8000, size = 4096;
+    StreamWriter writer({out_.writer(), out_.writer()}, texts * size);
+    const auto letterOf = [](std::size_t i) { return static_cast<char>('a' + i % 26); };
+    for (std::size_t i = 0; i < texts; ++i)
+        writer.write(i % 2, textOf(letterOf(i), size));
+    for (std::size_t i = 0; i < texts; ++i)
+        ASSERT_EQ(out_.read(size), textOf(letterOf(i), size)) << i;
+}
+
 TEST_F(StreamWriterTest, WritesAllTextsForWhichThereIsRoom) {
     StreamWriter writer({out_.writer()}, 30000);
     stall(writer, 0, out_, textOf('a', 10000));
