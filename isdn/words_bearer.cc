@@ -99,12 +99,14 @@ void highLayerWords(std::string& line, const Element& element, const Context&) {
 // "1-5,7": channels in ranges.
 void addChannels(std::string& line, const std::bitset<128>& channels) {
     const char* separator = "";
-    for (unsigned first = 0; first < channels.size(); ++first) {
+    std::size_t left = channels.count();
+    for (unsigned first = 0; left > 0; ++first) {
         if (!channels[first])
             continue;
         unsigned last = first;
         while (last + 1 < channels.size() && channels[last + 1])
             ++last;
+        left -= last + 1 - first;
         line.append(separator);
         separator = ",";
         add(line, first);
