@@ -48,6 +48,7 @@ struct Analysis::Channel {
         message.group = groupNumber;
         message.role = links.marks().role;
         message.variant = variant;
+        message.numbering = links.link()->numbering();
         message.layer2 = layer2;
         message.layer3 = isdn::parseLayer3(layer2.information);
         return message;
@@ -185,7 +186,7 @@ const Marks& Analysis::take(const capture::Frame& frame, std::uint64_t number) {
     WitnessKeeper& keeper = channel.keepers[layer2.tei];
     keeper.take(channel.links);
     if (marks.unseenSetUp || keeper.witness().isShortAt(at))
-        channel.group.table().framesLost(layer2.tei);
+        channel.group.framesLost(layer2.tei);
     if (marks.linkUp || marks.linkDown)
         channel.group.linkChanged(layer2.tei, {number, channel.group.now(), frame.clock, frame.time},
                                   channel.name, marks.linkUp, mayCallsGoOn(channel, layer2.tei));

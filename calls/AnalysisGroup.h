@@ -32,7 +32,7 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
         : listener_(listener),
           table_(timers, numbers, *this),
           waits_(timers, *this, *this),
-          findings_(timers, *this),
+          findings_(timers, *this, *this),
           maintenance_(timers, *this, *this),
           stuck_(timers, *this),
           channels_(timers, maintenance_, stuck_, *this),
@@ -62,6 +62,7 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
     void advance(std::int64_t at) {
         now_ = std::max(now_, at);
         waits_.advance(now_);
+        findings_.advance();
         maintenance_.advance(now_);
         patterns_.advance(now_);
         channels_.advance(now_);
@@ -85,13 +86,20 @@ class Analysis::Group : public CallObserver, public LinkWitnesses, public Findin
         stuck_.finish();
         table_.finish();
     }
+    // Messages of the link of a TEI are missing in the trace.
+    void framesLost(std::uint8_t tei) {
+        table_.framesLost(tei);
+        channels_.framesLost();
+        stuck_.forget();
+    }
     // The board of one of its D channels restarted.
     void boardRestarted() {
         table_.boardRestarted();
         waits_.boardRestarted();
+        findings_.boardRestarted();
         maintenance_.boardRestarted();
         channels_.boardRestarted();
-        stuck_.boardRestarted();
+        stuck_.forget();
     }
     CallTable& table() { return table_; }
     const CallTable& table() const { return table_; }

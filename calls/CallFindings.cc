@@ -77,8 +77,12 @@ void CallFindings::heardWithoutCall(const Message& message) {
 }
 
 void CallFindings::checkElements(const Call* call, const Message& message, bool clearsFirst) {
-    for (BrokenRule& broken : brokenElementRules(message, clearsFirst))
-        report(*broken.kind, call, message, std::move(broken.sentence));
+    for (BrokenRule& broken : brokenElementRules(message, clearsFirst)) {
+        if (broken.ifFirst)
+            reportUnlessLost(*broken.kind, *call, message, std::move(broken.sentence));
+        else
+            report(*broken.kind, call, message, std::move(broken.sentence));
+    }
 }
 
 // STATUS of the global or the dummy reference is about RESTART or another message without a call; there is no
@@ -117,9 +121,9 @@ void CallFindings::checkStatus(const Call& call, Notes& notes, const Message& me
         return;
     }
     const auto cause = isdn::cause(message.layer3.elements.find(element::cause));
-    if (!asked && !call.incomplete && cause && cause->codingStandard == 0 &&
-        cause->value == statusEnquiryAnswer)
-        report(findings::statusUnasked, &call, message, "STATUS answers an enquiry that is not in the trace");
+    if (!asked && cause && cause->codingStandard == 0 && cause->value == statusEnquiryAnswer)
+        reportUnlessLost(findings::statusUnasked, call, message,
+                         "STATUS answers an enquiry that is not in the trace");
 }
 
 void CallFindings::checkDigits(const Call& call, Notes& notes, const Message& message) {
@@ -143,8 +147,9 @@ void CallFindings::checkDigits(const Call& call, Notes& notes, const Message& me
                         messageType == type::progress || messageType == type::connect;
     if (goesOn && inTime && !notes.sendingComplete && !call.beforeTrace && !notes.cleared &&
         (notes.acknowledged || call.firstResponse == message.at - call.begin.at))
-        report(findings::waitsForDigits, &call, message,
-               nameOf(message) + " came " + std::to_string(waited / second) + " s after the last digit");
+        reportUnlessLost(
+            findings::waitsForDigits, call, message,
+            nameOf(message) + " came " + std::to_string(waited / second) + " s after the last digit");
     if (goesOn)
         notes.acknowledged = false;
 }
@@ -160,9 +165,9 @@ void CallFindings::demandChannel(const Call& call, Notes& notes, const Message& 
     using Selection = isdn::ChannelId::Selection;
     const bool leavesChoice = call.asked && !call.asked->exclusive && !call.asked->dChannel &&
                               call.asked->selection != Selection::none;
-    if (leavesChoice && !call.granted && !call.incomplete && call.kind == Kind::call)
-        report(findings::elementAbsent, &call, message,
-               nameOf(message) + " answers SETUP first and has no CHANNEL IDENTIFICATION");
+    if (leavesChoice && !call.granted && call.kind == Kind::call)
+        reportUnlessLost(findings::elementAbsent, call, message,
+                         nameOf(message) + " answers SETUP first and has no CHANNEL IDENTIFICATION");
 }
 
 // Only a SETUP that says "no other channel" is contradicted by another one.
@@ -213,6 +218,12 @@ void CallFindings::stray(const Message& message) {
 void CallFindings::report(const FindingKind& kind, const Call* call, const Message& message,
                           std::string sentence) {
     sink_.report(findingOf(kind, message, call, std::move(sentence)));
+}
+
+void CallFindings::reportUnlessLost(const FindingKind& kind, const Call& call, const Message& message,
+                                    std::string sentence) {
+    if (!call.incomplete)
+        held_.report(findingOf(kind, message, &call, std::move(sentence)), message);
 }
 
 }  // namespace calls

@@ -9,13 +9,16 @@
 #include "calls/CallTable.h"
 #include "calls/FindingKinds.h"
 #include "calls/FindingSink.h"
+#include "calls/HeldFindings.h"
+#include "calls/LinkWitness.h"
 #include "calls/Timers.h"
 
 namespace calls {
 
 class CallFindings : public CallObserver {
   public:
-    CallFindings(const Timers& timers, FindingSink& sink) : timers_(timers), sink_(sink) {}
+    CallFindings(const Timers& timers, const LinkWitnesses& links, FindingSink& sink)
+        : timers_(timers), sink_(sink), held_(links, sink) {}
 
     void heard(Call& call, const Message& message) override;
     void ended(Call& call, const Message* by) override;
@@ -24,6 +27,10 @@ class CallFindings : public CallObserver {
     void stray(const Message& message) override;
     // Takes a message of the global or the dummy reference, or one that belongs to no call.
     void heardWithoutCall(const Message& message);
+    // Call this before each frame is handed in.
+    void advance() { held_.advance(); }
+    // The board restarted. What depends on earlier messages cannot be told any more.
+    void boardRestarted() { held_.forget(); }
 
   private:
     // What is remembered about a call that is alive.
@@ -44,9 +51,13 @@ class CallFindings : public CallObserver {
     void demandChannel(const Call& call, Notes& notes, const Message& message);
     void checkChannel(const Call& call, Notes& notes, const Message& message);
     void report(const FindingKind& kind, const Call* call, const Message& message, std::string sentence);
+    // For what depends on the messages before this one.
+    void reportUnlessLost(const FindingKind& kind, const Call& call, const Message& message,
+                          std::string sentence);
 
     const Timers& timers_;
     FindingSink& sink_;
+    HeldFindings held_;
     std::map<std::uint64_t, Notes> notes_;  // by number of the call
 };
 

@@ -91,6 +91,8 @@ Life& CallTable::beginOrRepeat(const Message& message, const CallKey& key) {
     if (repeats(*old, message)) {
         old->lastSetup = message.at;
         old->call.setupRepeated = true;
+        if (old->call.broadcast)
+            awaitTerminals(*old);
         return *old;
     }
     if (old->ended) {
@@ -141,7 +143,7 @@ Life& CallTable::begin(const Message& message, const CallKey& key) {
         life->lastSetup = message.at;
         call.broadcast = key.tei == isdn::groupTei;
         if (call.broadcast)
-            schedule(*life, message.at + timers_.t312 + timers_.slack);
+            awaitTerminals(*life);
     }
     if (messageType == type::resume)
         joinSuspended(*life, message);
@@ -201,6 +203,9 @@ void CallTable::hear(Life& life, const Message& message) {
 void CallTable::schedule(Life& life, std::int64_t at) {
     deadlines_.emplace(at, std::pair(life.key, ++life.generation));
 }
+
+// Terminals may join for T312 from the last SETUP on.
+void CallTable::awaitTerminals(Life& life) { schedule(life, life.lastSetup + timers_.t312 + timers_.slack); }
 
 void CallTable::forget(Life& life) {
     const CallKey key = life.key;

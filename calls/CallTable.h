@@ -116,6 +116,7 @@ class CallTable {
     void dropOldest();
     void due(Life& life, std::int64_t at);
     void schedule(Life& life, std::int64_t at);
+    void awaitTerminals(Life& life);
     void endLostLinks(std::int64_t at);
     void noteHeard(Life& life);
     void joinSuspended(Life& life, const Message& message);

@@ -83,8 +83,11 @@ void CallTable::endTerminal(Life& life, const Message& message) {
 void CallTable::endIfAllTerminalsLeft(Life& life, const Moment& moment, const Message* message) {
     if (life.winner || life.left != life.joined)
         return;
-    if (!life.call.clearingSeen && life.call.causeBefore)
-        life.call.cause = std::exchange(life.call.causeBefore, std::nullopt);
+    if (!life.call.clearingSeen && life.refusal) {
+        life.call.cause = std::move(life.refusal);
+        if (life.call.causeBefore && isClearing(life.call.causeBefore->message))
+            life.call.causeBefore.reset();
+    }
     end(life, EndedBy::release, moment, message);
 }
 

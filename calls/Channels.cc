@@ -4,7 +4,6 @@
 #include <utility>
 
 #include "calls/FindingKinds.h"
-#include "calls/Stream.h"
 #include "calls/causes.h"
 #include "calls/findingOf.h"
 
@@ -15,14 +14,8 @@ namespace {
 namespace type = isdn::message;
 
 constexpr std::uint8_t noChannel = 34, requestedNotAvailable = 44, doesNotExist = 82;
-constexpr unsigned setupsToJudgeHunting = 20;  // SETUPs of each side
 
 std::string callName(std::uint64_t number) { return "call " + std::to_string(number); }
-
-bool share(const std::vector<ChannelKey>& a, const std::vector<ChannelKey>& b) {
-    return std::any_of(a.begin(), a.end(),
-                       [&](const ChannelKey& key) { return std::find(b.begin(), b.end(), key) != b.end(); });
-}
 
 bool accepts(std::uint8_t messageType) {
     return messageType == type::callProceeding || messageType == type::setupAcknowledge ||
@@ -66,6 +59,7 @@ void Channels::heard(Call& call, const Message& message) {
 void Channels::setUp(Call& call, Seizure& seizure, const Message& message) {
     seizure.asked = channelsOf(call.asked);
     seizure.numbered = message.layer2.hasNs();
+    seizure.setupAt = message.at;
     seizure.setupNs = message.layer2.ns;
     for (const ChannelKey& key : seizure.asked)
         static_cast<void>(stateOf(key));
@@ -87,45 +81,6 @@ void Channels::checkService(const Call& call, Seizure& seizure, const std::vecto
                                    (asks ? " asks for" : " takes") + " channel " + toString(key) +
                                    ", which is out of service"));
     }
-}
-
-// Two SETUPs cross if neither side had received the other's: the N(R) of this one does not acknowledge the
-// other.
-void Channels::findGlare(Call& call, Seizure& seizure, const Message& message) {
-    if (!seizure.numbered)
-        return;
-    for (auto& [number, opposite] : seizures_) {
-        if (opposite.call->origin == call.origin || opposite.answered || !opposite.numbered ||
-            opposite.glare != 0 || !share(opposite.asked, seizure.asked) ||
-            isAhead(message.layer2.nr, opposite.setupNs))
-            continue;
-        seizure.glare = number;
-        opposite.glare = call.number;
-        return;
-    }
-}
-
-void Channels::hunt(const Call& call, const Seizure& seizure, const Message& message) {
-    if (seizure.asked.size() != 1 || glareProneSaid_)
-        return;
-    Hunting& own = hunting_[static_cast<std::size_t>(call.origin)];
-    const std::uint32_t number = seizure.asked.front().number;
-    if (own.last != 0 && number != own.last)
-        ++(number > own.last ? own.up : own.down);
-    own.last = number;
-    const auto direction = [](const Hunting& side) {
-        const unsigned all = side.up + side.down;
-        if (all < setupsToJudgeHunting)
-            return 0;
-        return side.up * 10 >= all * 8 ? 1 : side.down * 10 >= all * 8 ? -1 : 0;
-    };
-    const int ofUs = direction(hunting_[0]);
-    if (ofUs == 0 || ofUs != direction(hunting_[1]))
-        return;
-    glareProneSaid_ = true;
-    sink_.report(
-        findingOf(findings::glareProne, message, &call,
-                  ofUs > 0 ? "both ends take channels upwards" : "both ends take channels downwards"));
 }
 
 void Channels::hold(Call& call, Seizure& seizure, const Message& message) {
@@ -172,33 +127,6 @@ void Channels::release(std::uint64_t call, Seizure& seizure) {
         state->seenFree = state->seenFree || state->holders.empty();
     }
     seizure.held.clear();
-}
-
-// Glare is settled when one of the two calls is refused or moved to another channel. It persists when both
-// calls have been given the channel.
-void Channels::settleGlare(Call& call, Seizure& seizure, const Message* message) {
-    if (seizure.glare == 0 || seizure.glareSettled)
-        return;
-    const auto found = seizures_.find(seizure.glare);
-    if (found == seizures_.end())
-        return;
-    Seizure& opposite = found->second;
-    const bool moved = message != nullptr && !share(seizure.held, seizure.asked);
-    const bool bothGoOn = message != nullptr && opposite.answered && share(seizure.held, opposite.held);
-    if (!moved && !bothGoOn && message != nullptr)
-        return;  // the messages of the other call decide
-    seizure.glareSettled = opposite.glareSettled = true;
-    const std::string which =
-        "SETUPs of " + callName(call.number) + " and " + callName(seizure.glare) + " crossed";
-    if (bothGoOn)
-        sink_.report(findingOf(findings::glarePersists, *message, &call, which + ", and both calls went on"));
-    else if (message != nullptr)
-        sink_.report(
-            findingOf(findings::glare, *message, &call, which + "; one was moved to another channel"));
-    else {
-        call.gaveWay = !seizure.answered;
-        sink_.report(findingOf(findings::glare, call.end, call, which + "; one gave way"));
-    }
 }
 
 void Channels::ended(Call& call, const Message*) {
@@ -280,6 +208,13 @@ void Channels::boardRestarted() {
         state = {};
     seizures_.clear();
     conflicts_.clear();
+}
+
+void Channels::framesLost() {
+    for (auto& [key, state] : states_) {
+        state.seenFree = false;
+        state.refusals = 0;
+    }
 }
 
 void Channels::advance(std::int64_t at) {

@@ -30,6 +30,8 @@ class Channels : public CallObserver {
     void restarted(const Message& acknowledge);
     // The board restarted. Which call holds which channel is not known any more.
     void boardRestarted();
+    // Messages are missing in the trace: calls that are not in it may have taken channels since.
+    void framesLost();
     // The clock has come to `at`. Call this before handing in what happened at that time.
     void advance(std::int64_t at);
     // The numbers of the calls that hold a channel, by channel. Has an entry, perhaps an empty one, for each
@@ -49,6 +51,7 @@ class Channels : public CallObserver {
         std::vector<ChannelKey> held;
         bool answered = false;  // the other side has answered SETUP
         bool numbered = false;  // SETUP came in an I frame
+        std::int64_t setupAt = 0;
         std::uint8_t setupNs = 0;
         std::uint64_t glare = 0;  // the number of the call that crosses this one, or 0
         bool glareSettled = false;

@@ -83,9 +83,10 @@ std::vector<BrokenRule> brokenElementRules(const Message& message, bool clearsFi
     }
     if (layer3.discriminator != isdn::callControl)
         return broken;
-    const auto demand = [&](std::uint8_t id) {
+    const auto demand = [&](std::uint8_t id, bool ifFirst = false) {
         if (!seen.test(id))
-            broken.push_back({&findings::elementAbsent, name + " has no " + nameOf(id, message.variant)});
+            broken.push_back(
+                {&findings::elementAbsent, name + " has no " + nameOf(id, message.variant), ifFirst});
     };
     for (const Mandatory& each : mandatory) {
         if (each.message == layer3.type)
@@ -95,7 +96,7 @@ std::vector<BrokenRule> brokenElementRules(const Message& message, bool clearsFi
     if (layer3.type == type::setup && message.sender() == isdn::Sender::network)
         demand(element::channelIdentification);
     if (clearsFirst && (layer3.type == type::release || layer3.type == type::releaseComplete))
-        demand(element::cause);
+        demand(element::cause, true);
     if (layer3.type == type::facility && !seen.test(element::facility) &&
         !seen.test(element::extendedFacility))
         broken.push_back(

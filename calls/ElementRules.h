@@ -15,6 +15,7 @@ namespace calls {
 struct BrokenRule {
     const FindingKind* kind;
     std::string sentence;
+    bool ifFirst = false;  // it is broken only if no earlier message has cleared the call
 };
 
 // Returns the rules that the message breaks. It must be a message of call control or maintenance.

@@ -34,6 +34,8 @@ class GatheredFindings : public FindingSink {
     std::optional<std::int64_t> since() const { return first_ ? std::optional(since_) : std::nullopt; }
     // No further finding of this cause will come. Reports the findings that are kept as one.
     void complete();
+    // Reports what was only counted, once ten minutes have passed. Call this behind what is completed.
+    void reportCounted() { repeated_.advance(now_); }
     // The trace has ended. Reports what is kept and what was only counted.
     void finish();
 

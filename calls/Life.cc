@@ -34,6 +34,8 @@ void learnDigits(Life& life, const Message& message) {
     const bool isSetup = layer3.type == type::setup;
     if (message.from() != call.origin || life.proceeding || (!isSetup && layer3.type != type::information))
         return;
+    if (isSetup && call.messages > 1)
+        return;  // a repetition has the digits of the first SETUP
     const auto party = isdn::partyNumber(layer3.elements.find(element::calledNumber));
     const std::string_view keypad = isdn::keypadDigits(layer3.elements.find(element::keypad));
     const std::string_view digits = party ? party->digits : keypad;
@@ -136,18 +138,54 @@ std::optional<CauseGiven> causeOf(const Message& message) {
     return given;
 }
 
-// Whether N(R) of the message acknowledges the frame that began the clearing (modulo 128).
-bool covers(const Message& message, std::uint8_t ns) {
-    const unsigned ahead = (message.layer2.nr - ns - 1U) & 127U;
-    return message.layer2.hasNr() && ahead < 64;
+std::string nameOfDChannel(const Message& message) {
+    const capture::Interface* const interface = message.frame->interface;
+    return interface == nullptr ? std::string() : interface->name;
+}
+
+// Whether the message was sent before the frame that began the clearing had come: its N(R) does not
+// acknowledge that frame. N(R) of another D channel of the group, or after the link was set up again, tells
+// nothing about it.
+bool crossesClearing(const Life& life, const Message& message) {
+    if (!life.clearingNumbered || !message.layer2.hasNs() ||
+        nameOfDChannel(message) != life.clearingChannel || message.numbering != life.clearingNumbering)
+        return false;
+    const unsigned ahead = (message.layer2.nr - life.clearingNs - 1U) & 127U;
+    return ahead >= 64;
 }
 
 // Whether the message is about one terminal of a call that was offered to all: the terminal refuses, or it is
-// released because another one has the call.
-bool concernsOneTerminal(const Life& life, const Message& message) {
+// released because another one has the call. The network may release it before it acknowledges the other
+// one's CONNECT.
+bool concernsOneTerminal(const Life& life, const Message& message, const std::optional<CauseGiven>& cause) {
+    constexpr std::uint8_t anotherUserWasSelected = 26;  // Q.850
     if (!life.call.broadcast)
         return false;
-    return life.winner ? *life.winner != message.layer2.tei : message.from() != life.call.origin;
+    if (life.winner)
+        return *life.winner != message.layer2.tei;
+    return message.from() != life.call.origin ||
+           (cause && cause->codingStandard == 0 && cause->value == anotherUserWasSelected);
+}
+
+// How much a cause of a terminal says about the user. The network passes on the cause that says most (Q.931
+// 5.2.5.4); of those that say as much, the first.
+unsigned weightOf(const CauseGiven& cause) {
+    constexpr std::uint8_t userBusy = 17, callRejected = 21;  // Q.850
+    if (cause.codingStandard != 0)
+        return 0;
+    return cause.value == callRejected ? 2 : cause.value == userBusy ? 1 : 0;
+}
+
+// Takes a clearing message of a call to all that is about a single terminal.
+void learnOfTerminal(Life& life, const Message& message, std::optional<CauseGiven> cause) {
+    if (!life.turnedAwayBy)
+        life.turnedAwayBy = message.from();
+    if (!cause || message.from() == life.call.origin)
+        return;
+    if (!life.call.causeBefore)
+        life.call.causeBefore = cause;
+    if (!life.refusal || weightOf(*cause) > weightOf(*life.refusal))
+        life.refusal = std::move(cause);
 }
 
 void learnClearing(Life& life, const Message& message) {
@@ -159,11 +197,8 @@ void learnClearing(Life& life, const Message& message) {
             call.causeBefore = std::move(cause);
         return;
     }
-    if (concernsOneTerminal(life, message)) {
-        if (cause && !call.causeBefore && message.from() != call.origin)
-            call.causeBefore = std::move(cause);
-        return;
-    }
+    if (concernsOneTerminal(life, message, cause))
+        return learnOfTerminal(life, message, std::move(cause));
     if (!call.clearingSeen) {
         call.clearingSeen = true;
         call.cause = std::move(cause);
@@ -171,6 +206,8 @@ void learnClearing(Life& life, const Message& message) {
         life.clearedFirst = message.from();
         life.clearingNumbered = message.layer2.hasNs();
         life.clearingNs = message.layer2.ns;
+        life.clearingChannel = nameOfDChannel(message);
+        life.clearingNumbering = message.numbering;
         if (life.connectAt)
             call.duration = message.at - *life.connectAt;
         return;
@@ -180,8 +217,7 @@ void learnClearing(Life& life, const Message& message) {
     if (life.crossingDecided || message.from() == life.clearedFirst)
         return;
     life.crossingDecided = true;
-    if (messageType != type::releaseComplete && life.clearingNumbered && message.layer2.hasNs() &&
-        !covers(message, life.clearingNs))
+    if (messageType != type::releaseComplete && crossesClearing(life, message))
         call.clearedBy = ClearedBy::both;
 }
 
@@ -217,6 +253,14 @@ void learnPhase(Life& life, const Message& message) {
         default:
             break;
     }
+}
+
+// Who cleared a call without a message that clears it as a whole. A call to all ends so if each of its
+// terminals has refused it, or was released by the network.
+ClearedBy clearedByTerminals(const Life& life, EndedBy by) {
+    if (by != EndedBy::release || !life.turnedAwayBy)
+        return ClearedBy::nobody;
+    return *life.turnedAwayBy == Side::us ? ClearedBy::us : ClearedBy::peer;
 }
 
 bool isWithoutChannel(const Call& call) {
@@ -260,7 +304,7 @@ void conclude(Life& life, EndedBy by, const Moment& end) {
     if (call.kind == Kind::call && isWithoutChannel(call) && life.answeredByUser)
         call.kind = Kind::signalling;
     if (!call.clearingSeen && by != EndedBy::open)
-        call.clearedBy = ClearedBy::nobody;
+        call.clearedBy = clearedByTerminals(life, by);
     if (life.connectAt && !call.duration && by != EndedBy::open)
         call.duration = end.at - *life.connectAt;
     const bool byOrigin = life.clearedFirst == call.origin && call.clearedBy != ClearedBy::both;

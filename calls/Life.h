@@ -5,6 +5,7 @@
 #include <bitset>
 #include <cstdint>
 #include <optional>
+#include <string>
 #include <vector>
 
 #include "calls/CallTable.h"
@@ -26,13 +27,17 @@ struct Life {
     std::optional<Side> clearedFirst;  // who sent the first clearing message
     std::uint8_t clearingNs = 0;       // its N(S), if it was an I frame
     bool clearingNumbered = false;
-    bool crossingDecided = false;  // whether the other side cleared on its own
+    std::string clearingChannel;          // the name of its D channel
+    std::uint64_t clearingNumbering = 0;  // as in Message
+    bool crossingDecided = false;         // whether the other side cleared on its own
     std::optional<std::int64_t> connectAt;
     bool answeredByUser = false;         // CONNECT, or a later message that shows the same
     std::vector<std::uint8_t> identity;  // of SUSPEND or RESUME
     // For a broadcast SETUP, by TEI: the terminals that answered, and those that have left the call.
     std::bitset<128> joined;
     std::bitset<128> left;
+    std::optional<Side> turnedAwayBy;    // who began the clearing between the network and a single terminal
+    std::optional<CauseGiven> refusal;   // of the causes that terminals gave, the one that says most
     std::optional<std::uint8_t> winner;  // the one that got CONNECT ACKNOWLEDGE
 };
 

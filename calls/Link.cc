@@ -115,9 +115,7 @@ void Link::answer(const Sample& sample, Marks& marks, std::vector<LinkEvent>& ev
         // may have passed since the first UA.
         if (state_ == LinkState::up)
             return;
-        for (Stream& stream : streams_)
-            stream.reset();
-        beyond_ = {};
+        beginNumbers();
         enter(LinkState::up, sample);
         sawSetUp_ = marks.linkUp = true;
     } else if (releasing_[asking]) {
@@ -163,9 +161,11 @@ void Link::isAlive(const Sample& sample) {
     const bool wasUnknown = state_ == LinkState::unknown;
     settingUp_ = releasing_ = {};
     enter(LinkState::up, sample);
-    if (!wasUnknown)
-        for (Stream& stream : streams_)
-            stream.loosen();
+    if (wasUnknown)
+        return;
+    ++numbering_;
+    for (Stream& stream : streams_)
+        stream.loosen();
 }
 
 void Link::poll(const Sample& sample, Marks& marks) {
@@ -202,6 +202,7 @@ void Link::forget() {
     state_ = LinkState::unknown;
     sawSetUp_ = false;
     settingUp_ = releasing_ = heard_ = {};
+    ++numbering_;
     streams_ = {};
     missing_ = {};
     beyond_ = {};
@@ -209,6 +210,22 @@ void Link::forget() {
     endPolls();
 }
 
-void Link::finish(std::vector<LinkEvent>& events) { giveUpHoles(events); }
+// A side that gets an N(R) of frames that it has not sent sets the link up again (Q.921 5.8.5). If it has not
+// done that, it has probably sent them, and nobody can tell who lost them.
+void Link::finish(std::vector<LinkEvent>& events) {
+    for (const Side side : {Side::us, Side::peer}) {
+        const std::optional<PendingNr> pending = std::exchange(beyond_[indexOf(side)], std::nullopt);
+        const Stream& stream = streams_[indexOf(other(side))];
+        if (!pending || stream.hasOpenHole())
+            continue;
+        const Hole hole{stream.next(), ahead(pending->nr, stream.next()), pending->frame, pending->at};
+        events.push_back({.kind = LinkEvent::Kind::hole,
+                          .from = other(side),
+                          .frame = pending->frame,
+                          .at = pending->at,
+                          .hole = hole});
+    }
+    giveUpHoles(events);
+}
 
 }  // namespace calls

@@ -94,11 +94,19 @@ class Link {
     std::uint64_t sinceFrame() const { return sinceFrame_; }
     // Whether the set-up itself was seen. If not, the link may have been up before `since`.
     bool sawSetUp() const { return sawSetUp_; }
+    // Another number whenever N(S) and N(R) begin again, or may have done so unseen.
+    std::uint64_t numbering() const { return numbering_; }
     const CommandBits& commands() const { return commands_; }
     const Stream& sentBy(Side side) const { return streams_[indexOf(side)]; }
     // The numbers suggest that I frames of this side are missing in the trace; what comes next decides.
     bool mayLackFramesOf(Side side) const {
         return sentBy(side).hasOpenHole() || beyond_[indexOf(other(side))];
+    }
+    // The other side acknowledged an I frame of this side that is not in the trace, and so long before `at`
+    // that the recorder cannot have put the two in the wrong order.
+    bool hasAcknowledgedUnseen(Side side, std::int64_t at) const {
+        const std::optional<PendingNr>& pending = beyond_[indexOf(other(side))];
+        return pending && at - pending->at > timers_->slack;
     }
 
   private:
@@ -128,6 +136,7 @@ class Link {
     void polled(const Sample& sample, Marks& marks);
     void isAlive(const Sample& sample);
     bool beginsAgain(const Sample& sample) const;
+    void beginNumbers();
     void settleNr(const Sample& sample, const Stream::Taken& taken, std::vector<LinkEvent>& events);
     void report(const Sample& sample, Side sender, const Stream::Taken& taken,
                 std::vector<LinkEvent>& events);
@@ -141,6 +150,7 @@ class Link {
     std::int64_t since_ = 0;
     std::uint64_t sinceFrame_ = 0;
     bool sawSetUp_ = false;
+    std::uint64_t numbering_ = 0;
     std::array<Stream, 2> streams_;
     std::array<bool, 2> settingUp_{}, releasing_{};  // SABME, DISC of a side waits for its answer
     std::array<bool, 2> heard_{};                    // I or S frames of a side since the state was entered

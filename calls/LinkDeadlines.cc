@@ -28,9 +28,12 @@ void LinkWatch::schedule(const Circumstances& around) {
         by(notReady_[side].holds && !notReady_[side].reported, notReady_[side].at + notReadyTime);
         due_ = std::min(due_, dueOf(idle_[side], around));
     }
+    by(silence_ && !silenceEnd_, lastAt_);
 }
 
 void LinkWatch::expire(std::int64_t at, const Circumstances& around) {
+    if (!silenceEnd_)
+        tellSilence();  // the clock goes on and no frame has come
     for (const Side side : bothSides) {
         expireDemands(side, at, around);
         expireSetUps(side, at, around);
@@ -104,9 +107,12 @@ void LinkWatch::expireKeepAlives(Side side, std::int64_t at, const Circumstances
     if (at <= dueOf(idle, around))
         return;
     keepAliveReported_ = true;
-    observe(findings::keepAliveMissing, lastFrame_, lastAt_,
-            wordsOf(side) + " polled every " + secondsOf(idle.period) + ", and then nothing was sent for " +
-                secondsOf(at - lastAt_));
+    tellSilence();
+    silenceEnd_.reset();
+    silence_ =
+        Observation{&findings::keepAliveMissing, findings::keepAliveMissing.severity, lastFrame_, lastAt_,
+                    linkWords() + ": " + wordsOf(side) + " polled every " + secondsOf(idle.period) +
+                        ", and then nothing was sent for " + secondsOf(at - lastAt_)};
 }
 
 }  // namespace calls

@@ -61,8 +61,13 @@ void LinkFindings::take(const DChannel& channel) {
     clock_ = sample.frame->clock;
     ++heard_[indexOf(sample.from())];
     around_.bothHeard = heard_[0] > 0 && heard_[1] > 0;
-    if (channel.link() == nullptr)
-        return;
+    if (channel.link() != nullptr)
+        takeOfLink(channel);
+    findings_.advance(sample.at);
+}
+
+void LinkFindings::takeOfLink(const DChannel& channel) {
+    const Sample& sample = channel.sample();
     const isdn::Layer2& frame = sample.layer2;
     const bool sameRole = std::ranges::any_of(
         channel.events(), [](const LinkEvent& event) { return event.kind == LinkEvent::Kind::sameRole; });
@@ -87,7 +92,7 @@ void LinkFindings::take(const DChannel& channel) {
 
 // Learns which access it is. A channel identification says so; a TEI that was assigned suggests it.
 void LinkFindings::learn(const Sample& sample) {
-    if (sample.layer2.carriesMessage() && sample.layer2.type == isdn::FrameType::I)
+    if (sample.layer2.carriesMessage())
         learnFromMessage(sample);
     if (around_.access == Access::unknown && sample.layer2.sapi == isdn::callControlSapi &&
         isAutomatic(sample.layer2.tei) && sample.layer2.type == isdn::FrameType::I)
@@ -178,6 +183,7 @@ void LinkFindings::expire(std::int64_t at) {
 void LinkFindings::advance(std::int64_t at) {
     lastAt_ = std::max(lastAt_, at);
     expire(lastAt_);
+    findings_.advance(lastAt_);
 }
 
 void LinkFindings::collect(LinkWatch& watch, std::uint8_t tei) {

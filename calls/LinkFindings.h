@@ -48,6 +48,7 @@ class LinkFindings {
     Access access() const { return around_.access; }
 
   private:
+    void takeOfLink(const DChannel& channel);
     void learn(const Sample& sample);
     void learnFromMessage(const Sample& sample);
     void event(const LinkEvent& event, const Sample& sample);

@@ -39,13 +39,18 @@ bool Link::beginsAgain(const Sample& sample) const {
            stream.next() != 0 && textOf(frame) != firstText_[indexOf(sample.from())];
 }
 
+void Link::beginNumbers() {
+    ++numbering_;
+    for (Stream& stream : streams_)
+        stream.reset();
+    beyond_ = {};
+}
+
 void Link::information(const Sample& sample, Marks& marks, std::vector<LinkEvent>& events) {
     const Side from = sample.from();
     if (beginsAgain(sample)) {
         giveUpHoles(events);
-        for (Stream& stream : streams_)
-            stream.reset();
-        beyond_ = {};
+        beginNumbers();
         marks.unseenSetUp = true;
         events.push_back({LinkEvent::Kind::unseenSetUp, from, sample.number, sample.at});
     }

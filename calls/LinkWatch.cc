@@ -45,6 +45,7 @@ void LinkWatch::take(const DChannel& channel, const Sample& sample, const Circum
     silent_[from] = false;
     for (std::array<Asked, 2>* const asked : {&polls_, &setUps_})
         (*asked)[to].heard = true;
+    endSilence(channel, sample, around);
     keepAlives(sample, marks);
     polls(sample);
     setUps(sample, marks, around);
@@ -177,6 +178,30 @@ void LinkWatch::keepAlives(const Sample& sample, const Marks& marks) {
     idle.busy = false;
 }
 
+// The silence was on the link only if the recorder has not missed frames meanwhile.
+void LinkWatch::endSilence(const DChannel& channel, const Sample& sample, const Circumstances& around) {
+    if (!silence_)
+        return;
+    if (!silenceEnd_)
+        silenceEnd_ = sample.at;
+    const Link* const link = channel.link();
+    const bool lacksFrames =
+        channel.marks().unseenSetUp ||
+        (link != nullptr && (link->mayLackFramesOf(Side::us) || link->mayLackFramesOf(Side::peer))) ||
+        std::ranges::any_of(channel.events(), [](const LinkEvent& event) {
+            return event.kind == LinkEvent::Kind::hole && event.by != LostBy::line;
+        });
+    if (lacksFrames)
+        silence_.reset();
+    else if (channel.marks().state != LinkState::up || sample.at - *silenceEnd_ > around.timers->t203)
+        tellSilence();
+}
+
+void LinkWatch::tellSilence() {
+    if (silence_)
+        observations_.push_back(*std::exchange(silence_, std::nullopt));
+}
+
 void LinkWatch::repetitions(const Sample& sample, const Marks& marks) {
     Repeated& repeated = repeated_[indexOf(sample.from())];
     if (repeated.sent > 0 && sample.at - repeated.since >= hour)
@@ -218,12 +243,14 @@ void LinkWatch::forget() {
         idle = {.last = std::nullopt, .busy = true, .period = idle.period, .seen = idle.seen};
     setUpTimes_.clear();
     silent_ = {};
+    silence_.reset();
     released_ = lost_ = up_ = false;
     lastFrame_ = 0;
     due_ = never;
 }
 
 void LinkWatch::finish() {
+    tellSilence();
     for (const Side side : bothSides)
         endHour(repeated_[indexOf(side)], side);
 }

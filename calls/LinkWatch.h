@@ -99,6 +99,8 @@ class LinkWatch {
     void flaps(const Sample& sample, const Marks& marks, const Circumstances& around);
     void demands(const Sample& sample, const Circumstances& around);
     void keepAlives(const Sample& sample, const Marks& marks);
+    void tellSilence();
+    void endSilence(const DChannel& channel, const Sample& sample, const Circumstances& around);
     void repetitions(const Sample& sample, const Marks& marks);
     void endHour(Repeated& repeated, Side side);
     static std::int64_t dueOf(const Asked& asked, const Circumstances& around);
@@ -125,6 +127,9 @@ class LinkWatch {
     bool sentInformation_ = false;
     bool up_ = false;
     bool keepAliveReported_ = false;
+    // Polls were missing. Once frames come again, their numbers tell whether the recorder had missed some.
+    std::optional<Observation> silence_;
+    std::optional<std::int64_t> silenceEnd_;  // when the first of these frames came
     std::uint64_t lastFrame_ = 0;
     std::int64_t lastAt_ = 0;
     std::int64_t due_ = never;

@@ -23,6 +23,8 @@ struct LinkWitness {
     bool up = true;
     // Some frame of the side is in the trace, of whichever layer.
     std::array<bool, 2> heard{};
+    // When the last frame of either side came.
+    std::int64_t lastHeard = never;
     // The number of its last I frame that the other side's N(R) has acknowledged, 0 for none.
     std::array<std::uint64_t, 2> acknowledged{};
     // The last moment at which one of its I frames was found to be missing in the trace; and whether one is

@@ -256,6 +256,8 @@ void Maintenance::completeTold(std::int64_t at) {
             told.services.complete();
         if (const auto since = told.storms.since(); since && at - *since > stormPasses)
             told.storms.complete();
+        for (GatheredFindings* const gathered : {&told.restarts, &told.services, &told.storms})
+            gathered->reportCounted();
     }
 }
 

@@ -36,6 +36,9 @@ struct Message {
     // number of the D channel, or of the group of D channels that share their calls (NFAS)
     std::uint32_t group = 0;
     capture::Role role = capture::Role::unknown;  // the role of our side, as the link's frames have shown it
+    // Another number whenever N(S) and N(R) of the link begin again, so that numbers of frames before and
+    // after that are not compared.
+    std::uint64_t numbering = 0;
     isdn::Layer2 layer2;
     isdn::Layer3 layer3;
     isdn::Variant variant = isdn::Variant::net5;

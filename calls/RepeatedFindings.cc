@@ -1,5 +1,6 @@
 #include "calls/RepeatedFindings.h"
 
+#include <algorithm>
 #include <utility>
 
 namespace calls {
@@ -16,11 +17,28 @@ void RepeatedFindings::report(Finding finding, std::uint8_t tei, std::int64_t at
     finding.count += repeats.last ? repeats.last->count : 0;
     if (!isFirst && at - repeats.reported < quiet) {
         repeats.last = std::move(finding);
+        due_ = std::min(due_, repeats.reported + quiet);
         return;
     }
     repeats.last.reset();
     repeats.reported = at;
     sink_->report(std::move(finding));
+}
+
+void RepeatedFindings::advance(std::int64_t at) {
+    if (at < due_)
+        return;
+    due_ = never;
+    for (auto& [key, repeats] : repeats_) {
+        if (!repeats.last)
+            continue;
+        if (at - repeats.reported >= quiet) {
+            sink_->report(*std::exchange(repeats.last, std::nullopt));
+            repeats.reported = at;
+        } else {
+            due_ = std::min(due_, repeats.reported + quiet);
+        }
+    }
 }
 
 void RepeatedFindings::finish() {

@@ -3,6 +3,7 @@
 #define CALLS_REPEATEDFINDINGS_H
 
 #include <cstdint>
+#include <limits>
 #include <map>
 #include <optional>
 #include <tuple>
@@ -14,13 +15,17 @@
 namespace calls {
 
 // Reports the first finding of a kind to the sink at once. Counts the findings that come in the next ten
-// minutes; the next one after that time is reported with their number, or the last of them at the end.
+// minutes; the next one after that time is reported with their number, or the last of them when that time is
+// over or the trace ends.
 class RepeatedFindings {
   public:
     explicit RepeatedFindings(FindingSink& sink) : sink_(&sink) {}
 
     // `at` is the finding's moment on the D channel's clock.
     void report(Finding finding, std::uint8_t tei, std::int64_t at);
+    // The D channel's clock has come to `at`. Reports what was only counted for ten minutes. Call this behind
+    // the findings of that moment.
+    void advance(std::int64_t at);
     void finish();
 
   private:
@@ -30,8 +35,11 @@ class RepeatedFindings {
         std::optional<Finding> last{};  // its count is the number of findings that it stands for
     };
 
+    static constexpr std::int64_t never = std::numeric_limits<std::int64_t>::max();
+
     FindingSink* sink_;
     std::map<Key, Repeats> repeats_;
+    std::int64_t due_ = never;  // nothing that was counted is to be reported before
 };
 
 }  // namespace calls

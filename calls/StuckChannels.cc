@@ -92,7 +92,7 @@ void StuckChannels::settleLostLinks() {
     });
 }
 
-void StuckChannels::boardRestarted() {
+void StuckChannels::forget() {
     orphans_.clear();
     settleLostLinks();
 }

@@ -26,8 +26,8 @@ class StuckChannels {
     // Calls ended with their link; `massClear` says so. It is reported as soon as it is known which of their
     // channels stay behind, and names these. If it names some, it has the severity of its kind.
     void lostWithLink(Finding massClear, std::vector<std::uint64_t> calls);
-    // The board restarted: who holds what is not known any more.
-    void boardRestarted();
+    // The board restarted, or messages are missing in the trace: a channel may have been freed unseen.
+    void forget();
     // The clock has come to `at`.
     void advance(std::int64_t at);
     // The end of the trace.

@@ -31,7 +31,8 @@ Verdicts::Verdict Verdicts::judge(Unanswered question) {
         return Verdict::cannotBeTold;
     }
     if (link->wholeUntil[indexOf(question.answering)] < question.until && held_.size() < mostHeld) {
-        held_.push_back(std::move(question));
+        const std::int64_t until = question.until;
+        held_.push_back({std::move(question), until});
         return Verdict::held;
     }
     report(question);
@@ -81,16 +82,26 @@ void Verdicts::report(Doubtful& doubtful, std::string_view reason) {
 // A later frame shows whether one of the answering side was missing. A link that went down since then shows
 // nothing more about it.
 void Verdicts::reconsider(std::int64_t at, bool isOver) {
-    std::deque<Unanswered> open;
-    for (Unanswered& question : held_) {
+    std::deque<Held> open;
+    for (Held& held : held_) {
+        Unanswered& question = held.question;
         const LinkWitness& link = *links_.witness(question.tei);
-        const bool isWhole = link.wholeUntil[indexOf(question.answering)] >= question.until;
-        if (!isWhole && !link.isWholeSince(question.asked, question.answering)) {
+        if (!held.heardAgain && link.lastHeard >= question.until) {
+            held.heardAgain = true;
+            held.since = link.lastHeard;
+        }
+        // After a long silence, the numbers of one side may have come round to where they were. Those of both
+        // sides hardly have.
+        const bool wasSilent = held.since - question.until > timers_.t203;
+        const bool isWhole =
+            link.wholeUntil[indexOf(question.answering)] >= question.until &&
+            (!wasSilent || link.wholeUntil[indexOf(other(question.answering))] >= question.until);
+        const bool lacksFrames = link.lastHole[indexOf(question.answering)] >= question.asked;
+        if (lacksFrames || (!isWhole && !link.isWholeSince(question.asked, question.answering))) {
             const std::string_view reason = doubtAbout(question, &link);
             doubt(std::move(question), reason, &link);
-        } else if (!isOver && !isWhole && link.wasUpSince(question.until) &&
-                   at - question.until <= timers_.t203)
-            open.push_back(std::move(question));
+        } else if (!isOver && !isWhole && link.wasUpSince(question.until) && at - held.since <= timers_.t203)
+            open.push_back(std::move(held));
         else
             report(question);
     }

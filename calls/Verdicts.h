@@ -32,7 +32,8 @@ struct Unanswered {
 
 // A missing answer is a fault only if the link was up, the receiver's link layer acknowledged the question,
 // and no frame of the answering side is missing between `asked` and `until`. The numbers of a later frame may
-// be needed to show that none is missing, so the finding waits for such a frame, up to T203. If one of the
+// be needed to show that none is missing, so the finding waits for such a frame: up to T203, and after a
+// silence up to T203 from the first frame of the link. If one of the
 // conditions does not hold, a note says that it cannot be told whether the answer was sent; questions with
 // the same reason share one note. Nothing is reported if only one direction was heard on the link. Memory is
 // bounded.
@@ -55,6 +56,12 @@ class Verdicts {
     void forget() { held_.clear(); }
 
   private:
+    struct Held {
+        Unanswered question;
+        std::int64_t
+            since;  // the waiting began: when the timer ran out, or the link was heard again after it
+        bool heardAgain = false;
+    };
     struct Doubtful {
         Finding first;
         std::vector<std::string> calls;
@@ -74,7 +81,7 @@ class Verdicts {
     const LinkWitnesses& links_;
     FindingSink& sink_;
     std::int64_t now_ = 0;
-    std::deque<Unanswered> held_;
+    std::deque<Held> held_;
     std::map<std::pair<std::uint8_t, std::string_view>, Doubtful> doubtful_;  // by TEI and reason
 };
 

@@ -31,6 +31,8 @@ class WitnessKeeper {
     // By side: N(S) and frame number of the I frames that the other side has not acknowledged, at most 128.
     std::array<std::deque<std::pair<std::uint8_t, std::uint64_t>>, 2> sent_;
     std::array<std::optional<std::uint8_t>, 2> nrAbout_;  // by side: the last N(R) about its frames
+    std::array<bool, 2>
+        unseen_{};  // by side: an N(R) has shown that frames are missing; the next one decides
 };
 
 }  // namespace calls

@@ -128,6 +128,66 @@ TEST_F(AnalysisTest, KeepsDChannelsApartUnlessTheyShareTheirCalls) {
     }
 }
 
+// The N(R) of a new set-up counts other frames than the one that began the clearing.
+TEST_F(AnalysisTest, FindsNoCrossingOfClearingsBetweenWhichTheLinkWasSetUpAgain) {
+    for (const bool seen : {true, false}) {
+        Told own;
+        CallScript script;
+        script.at(0).linkUp().us(m::setup, 9, false, {bearerSpeech(), channel(1), called("100")});
+        script.at(20).peer(m::callProceeding, 9, true, {channel(1)}).peer(m::connect, 9, true);
+        script.at(30).us(m::connectAcknowledge, 9, false);
+        script.at(5000).us(m::disconnect, 9, false, {cause(16)}).acknowledge(Side::peer);
+        script.at(5100).linkUp();
+        if (!seen)
+            script.unrecorded().unrecorded();
+        script.at(5200).peer(m::release, 9, true);
+        script.at(5210).us(m::releaseComplete, 9, false);
+        Analysis analysis({}, own);
+        play(analysis, script);
+        analysis.finish();
+        ASSERT_EQ(own.calls.size(), 1U);
+        EXPECT_EQ(own.calls[0].clearedBy, ClearedBy::us) << (seen ? "SABME was recorded" : "and not");
+    }
+}
+
+TEST_F(AnalysisTest, TakesAMessageAsTheVariantOfItsDChannelSays) {
+    class Variants : public Listener {
+      public:
+        void heard(const Message& message, const Call*) override { seen.push_back(message.variant); }
+        std::vector<isdn::Variant> seen;
+    };
+    const capture::Interface american{"A", capture::Variant::ni2}, european{"B", capture::Variant::net5};
+    Variants variants;
+    Analysis analysis({}, variants);
+    const CallScript script = shortCall();
+    for (const capture::Interface* const interface : {&american, &european}) {
+        capture::Frame frame = script.frames()[0].frame;
+        frame.interface = interface;
+        analysis.take(frame, ++number);
+    }
+    EXPECT_EQ(variants.seen, (std::vector{isdn::Variant::ni2, isdn::Variant::net5}));
+}
+
+// The frame that the recorder has seen without its octets may have been the DISCONNECT, with its cause.
+TEST_F(AnalysisTest, MissesNoCauseOfACallThatMayLackAMessage) {
+    for (const bool lacks : {false, true}) {
+        Told own;
+        CallScript script;
+        script.at(0).us(m::setup, 9, false, {bearerSpeech(), channel(30), called("100")});
+        script.at(20).peer(m::callProceeding, 9, true, {channel(30)});
+        script.at(5000).peer(m::release, 9, true);
+        Analysis analysis({}, own);
+        std::uint64_t n = 0;
+        for (const Sent& sent : script.frames()) {
+            if (n == 2 && lacks)
+                analysis.mayLack(*sent.frame.interface, Side::us);
+            analysis.take(sent.frame, ++n);
+        }
+        analysis.finish();
+        EXPECT_EQ(own.foundLines, lacks ? "" : "3 element-absent\n");
+    }
+}
+
 TEST_F(AnalysisTest, MakesOpenCallsUncertainWhenTheTicksFall) {
     CallScript script;
     script.at(100000).us(m::setup, 9, false, {bearerSpeech()});

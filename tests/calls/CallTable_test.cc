@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <string>
 
 #include "calls/causes.h"
@@ -108,6 +109,7 @@ TEST_F(CallTableTest, TakesTheSameSetupWithinTwiceT303ForARepetition) {
     script.at(5000).peer(m::releaseComplete, 5, true, {cause(1, 2)});
     EXPECT_EQ(play(script), "1 us 5 number release peer 1 setup-repeated\n");
     EXPECT_TRUE(hasFailed(seen.calls.at(0)));
+    EXPECT_EQ(seen.calls.at(0).called.digits, "1");  // the repetition adds no digits
 }
 
 TEST_F(CallTableTest, TakesAnyOtherSetupForANewCall) {
@@ -153,6 +155,14 @@ TEST_F(CallTableTest, SaysThatBothClearedOnlyIfNeitherHadSeenTheOther) {
         .peer(m::disconnect, 9, true, {cause(16, 2)});
     script.at(5010).us(m::release, 9, false).peer(m::release, 9, true);
     EXPECT_EQ(play(script), "1 us 9 answered release both 16\n");
+}
+
+// N(R) of one D channel of a group says nothing about the frames of another.
+TEST_F(CallTableTest, NamesWhoClearedFirstIfTheClearingPassesToAnotherDChannel) {
+    CallScript script = answeredCall();
+    script.at(5000).us(m::disconnect, 9, false, {cause(16)}).on("other").at(6000);
+    script.peer(m::release, 9, true, {cause(31)}).us(m::releaseComplete, 9, false);
+    EXPECT_EQ(play(script), "1 us 9 answered release us 16\n");
 }
 
 TEST_F(CallTableTest, GivesStragglersToTheOldLife) {
@@ -266,13 +276,105 @@ TEST_F(CallTableTest, JoinsTheAnswersOfSeveralTerminalsToOneCall) {
     EXPECT_EQ(seen.calls.at(0).duration, 6 * second);
 }
 
+TEST_F(CallTableTest, TakesTheReleaseOfATerminalThatLostForItsOwnAlsoBeforeConnectAcknowledge) {
+    CallScript script(capture::Role::network);
+    script.at(0).broadcast(Side::us, m::setup, 4, {bearerSpeech(), called("21")});
+    script.at(100).tei(64).peer(m::alerting, 4, true);
+    script.at(150).tei(65).peer(m::alerting, 4, true);
+    script.at(3000).tei(65).peer(m::connect, 4, true);
+    script.at(3010).tei(64).us(m::release, 4, false, {cause(26, 2)});
+    script.at(3020).tei(65).us(m::connectAcknowledge, 4, false, {channel(1)});
+    script.at(3030).tei(64).peer(m::releaseComplete, 4, true);
+    script.at(9000).tei(65).peer(m::disconnect, 4, true, {cause(16)});
+    script.at(9010).tei(65).us(m::release, 4, false);
+    script.at(9020).tei(65).peer(m::releaseComplete, 4, true);
+    EXPECT_EQ(play(script), "1 us 4 answered release peer 16 broadcast\n");
+    EXPECT_EQ(seen.calls.at(0).duration, 6 * second);
+}
+
+TEST_F(CallTableTest, WaitsForTerminalsFromTheRepetitionOfASetupToAllOn) {
+    CallScript script(capture::Role::network);
+    script.at(0).broadcast(Side::us, m::setup, 4, {called("21")});
+    script.at(4000).broadcast(Side::us, m::setup, 4, {called("21")});
+    script.at(7500).tei(64).peer(m::alerting, 4, true);
+    script.at(9000).tei(64).peer(m::connect, 4, true);
+    script.at(9010).tei(64).us(m::connectAcknowledge, 4, false, {channel(1)});
+    script.at(20000).tei(64).peer(m::disconnect, 4, true, {cause(16)});
+    script.at(20010).tei(64).us(m::release, 4, false);
+    script.at(20020).tei(64).peer(m::releaseComplete, 4, true);
+    EXPECT_EQ(play(script), "1 us 4 answered release peer 16 setup-repeated broadcast\n");
+    EXPECT_EQ(belongs, std::vector<std::uint64_t>(8, 1));
+}
+
 TEST_F(CallTableTest, EndsACallToAllThatNobodyTakesAtT312) {
     CallScript script(capture::Role::network);
     script.at(0).broadcast(Side::us, m::setup, 4);
     script.at(160).tei(66).peer(m::releaseComplete, 4, true, {cause(17)});
     script.at(20000).broadcast(Side::us, m::setup, 6);
     EXPECT_EQ(play(script),
-              "1 us 4 busy release nobody 17 broadcast\n2 us 6 open open unknown - open broadcast\n");
+              "1 us 4 busy release peer 17 broadcast\n2 us 6 open open unknown - open broadcast\n");
+}
+
+// The network passes on the cause that says most about the user (Q.931 5.2.5.4): a telephone that is busy
+// says more than a fax machine that cannot take speech, and a person who rejects the call more than both.
+TEST_F(CallTableTest, TakesTheCauseThatSaysMostWhereAllTerminalsRefuse) {
+    struct {
+        std::array<std::uint8_t, 3> refusals;
+        const char* line;
+    } const cases[] = {{{88, 17, 65}, "1 us 4 busy release peer 17 broadcast\n"},
+                       {{17, 21, 88}, "1 us 4 rejected release peer 21 broadcast\n"},
+                       {{21, 17, 21}, "1 us 4 rejected release peer 21 broadcast\n"},
+                       {{65, 88, 18}, "1 us 4 incompatible release peer 65 broadcast\n"}};
+    for (const auto& each : cases) {
+        Seen own;
+        CallNumbers ownNumbers;
+        CallTable calls(timers, ownNumbers, own);
+        CallScript script(capture::Role::network);
+        script.at(0).broadcast(Side::us, m::setup, 4);
+        for (std::size_t i = 0; i < each.refusals.size(); ++i) {
+            const auto tei = static_cast<std::uint8_t>(64 + i);
+            script.at(100).tei(tei).peer(m::releaseComplete, 4, true, {cause(each.refusals[i])});
+        }
+        for (const Sent& sent : script.frames())
+            calls.take(script.toMessage(sent));
+        calls.advance(20 * second);
+        calls.finish();
+        EXPECT_EQ(own.lines, each.line);
+        EXPECT_FALSE(own.calls.at(0).causeBefore);
+    }
+}
+
+TEST_F(CallTableTest, KeepsTheFirstRefusalBesideTheCauseOfACallToAllThatIsClearedLater) {
+    CallScript script(capture::Role::network);
+    script.at(0).broadcast(Side::us, m::setup, 4);
+    script.at(100).tei(64).peer(m::releaseComplete, 4, true, {cause(88)});
+    script.at(110).tei(65).peer(m::releaseComplete, 4, true, {cause(17)});
+    script.at(150).tei(66).peer(m::alerting, 4, true);
+    script.at(3000).tei(66).us(m::release, 4, false, {cause(16, 2)});
+    script.at(3010).tei(66).peer(m::releaseComplete, 4, true);
+    EXPECT_EQ(play(script), "1 us 4 abandoned release us 16 broadcast\n");
+    EXPECT_EQ(seen.calls.at(0).causeBefore->value, 88);
+}
+
+// Terminals that the network lets go have not refused.
+TEST_F(CallTableTest, SaysThatTheNetworkClearedACallToAllWhoseTerminalsItReleased) {
+    CallScript script(capture::Role::network);
+    script.at(0).broadcast(Side::us, m::setup, 4);
+    script.at(150).tei(64).peer(m::alerting, 4, true);
+    script.at(3000).tei(64).us(m::release, 4, false, {cause(26, 2)});
+    script.at(3010).tei(64).peer(m::releaseComplete, 4, true);
+    script.at(20000).broadcast(Side::us, m::setup, 6);
+    play(script);
+    EXPECT_EQ(seen.calls.at(0).clearedBy, ClearedBy::us);
+}
+
+TEST_F(CallTableTest, SaysThatNobodyClearedACallToAllThatNoTerminalAnswered) {
+    CallScript script(capture::Role::network);
+    script.at(0).broadcast(Side::us, m::setup, 4);
+    script.at(20000).broadcast(Side::us, m::setup, 6);
+    EXPECT_EQ(play(script),
+              "1 us 4 no-answer release nobody - broadcast\n"
+              "2 us 6 open open unknown - open broadcast\n");
 }
 
 TEST_F(CallTableTest, JoinsTheDigitsOfOverlapSending) {

@@ -101,6 +101,29 @@ TEST(Channels, AreNoGlareIfTheSecondSideHadSeenTheFirst) {
     EXPECT_EQ(findingsIn(script), "");
 }
 
+// The numbers of different links say nothing about each other.
+TEST(Channels, AreNoGlareBetweenTwoTerminals) {
+    for (const std::uint8_t tei : {64, 65}) {
+        CallScript script(capture::Role::network);
+        script.at(0).tei(64).crossing().peer(m::setup, 1, false, {bearerSpeech(), channel(1)});
+        script.tei(tei).us(m::setup, 1, false, {bearerSpeech(), channel(1)});
+        script.at(20).tei(64).us(m::releaseComplete, 1, true, {cause(44)});
+        EXPECT_EQ(findingsIn(script), tei == 64 ? "3 glare\n" : "");
+    }
+}
+
+// The answer to our SETUP is missing, and numbers have come so far that N(R) lies behind it.
+TEST(Channels, AreNoGlareLongAfterTheFirstSetup) {
+    for (const bool late : {false, true}) {
+        CallScript script;
+        script.at(0).crossing();
+        script.us(m::setup, 1, false, {bearerSpeech(), channel(5)});
+        script.at(late ? 4004 : 4000).peer(m::setup, 1, false, {bearerSpeech(), channel(5)});
+        script.at(4020).us(m::releaseComplete, 1, true, {cause(44)});
+        EXPECT_EQ(findingsIn(script), late ? "" : "3 glare\n");
+    }
+}
+
 TEST(Channels, RefusedAlthoughIdleAreAWarningAndTheSecondTimeStuck) {
     CallScript script;
     talk(script.at(0), 1, 30);
@@ -110,6 +133,21 @@ TEST(Channels, RefusedAlthoughIdleAreAWarningAndTheSecondTimeStuck) {
     script.at(3000).us(m::setup, 3, false, {bearerSpeech(), channel(30)});
     script.at(3010).peer(m::releaseComplete, 3, true, {cause(44)});
     EXPECT_EQ(findingsIn(script), "9 channel-refused-idle\n11 stuck-channel\n");
+}
+
+TEST(Channels, ThatACallMayHaveTakenUnseenAreNotKnownToBeIdle) {
+    for (const bool lost : {false, true}) {
+        CallScript script;
+        talk(script.at(0), 1, 30);
+        clear(script.at(1000), 1);
+        script.at(1500).peer(m::setup, 1, false, {bearerSpeech(), channel(30)});
+        script.us(m::releaseComplete, 1, true, {cause(17)});
+        if (lost)
+            script.at(1800).us(m::setup, 7, false, {bearerSpeech(), channel(30)}).unrecorded();
+        script.at(2000).us(m::setup, 2, false, {bearerSpeech(), channel(30)});
+        script.at(2010).peer(m::releaseComplete, 2, true, {cause(44)});
+        EXPECT_EQ(findingsIn(script), lost ? "10 ns-gap-recorder\n" : "11 channel-refused-idle\n");
+    }
 }
 
 TEST(Channels, RefusedWhileNothingIsKnownOfThemAreNoFinding) {
@@ -189,6 +227,29 @@ TEST(Channels, TakenInOneOrderByBothSidesAreProneToGlare) {
             script.us(m::releaseComplete, i + 1, true, {cause(17)});
         }
         EXPECT_EQ(findingsIn(script), peerGoesDown ? "" : "83 glare-prone\n");
+    }
+}
+
+// Both sides take channels so many times upwards, and then downwards.
+TEST(Channels, AreProneToGlareFromTwentySetupsOfWhichFourInFiveGoOneWay) {
+    struct {
+        unsigned up, down;
+        bool prone;
+    } const cases[] = {{19, 0, false}, {20, 0, true}, {16, 4, true}, {15, 5, false},
+                       {0, 19, false}, {0, 20, true}, {4, 16, true}, {5, 15, false}};
+    for (const auto& each : cases) {
+        CallScript script;
+        auto number = static_cast<std::uint8_t>(each.up > each.down ? 5 : 25);
+        for (std::uint16_t i = 0; i <= each.up + each.down; ++i) {
+            if (i > 0)
+                number = static_cast<std::uint8_t>(i <= each.up ? number + 1 : number - 1);
+            for (const Side side : {Side::us, Side::peer}) {
+                script.at(i * 1000 + (side == Side::us ? 0 : 500));
+                script.message(side, m::setup, i + 1, false, {bearerSpeech(), channel(number)});
+                script.message(other(side), m::releaseComplete, i + 1, true, {cause(17)});
+            }
+        }
+        EXPECT_EQ(findingsIn(script), each.prone ? "83 glare-prone\n" : "") << each.up << " up";
     }
 }
 

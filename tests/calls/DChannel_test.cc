@@ -47,6 +47,15 @@ TEST_F(DChannelTest, TakesCrossingSetUpsForOne) {
         "7 user response up\n");
 }
 
+// The UA that answers SABME leaves no answer to an earlier DISC due.
+TEST_F(DChannelTest, WaitsForNoAnswerToADiscThatASetUpFollows) {
+    EXPECT_EQ(told("0 > DISC\n0.5 > SABME\n0.51 < UA\n0.52 < UA\n"),
+              "1 user command releasing\n"
+              "2 user command establishing\n"
+              "3 user response link-up up\n"
+              "4 user response up [unsolicited-answer at 4]\n");
+}
+
 TEST_F(DChannelTest, SaysThatASetUpWasRefused) {
     EXPECT_EQ(told("0 > SABME\n0.01 < DM F\n"),
               "1 user command establishing\n2 user response link-down down [refused at 2]\n");

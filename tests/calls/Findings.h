@@ -39,7 +39,7 @@ class HealthyLink : public LinkWitnesses {
 class Watched : public CallObserver {
   public:
     Watched(const Timers& timers, const LinkWitnesses& links, FindingSink& sink)
-        : waits(timers, links, sink), findings(timers, sink) {}
+        : waits(timers, links, sink), findings(timers, links, sink) {}
     void heard(Call& call, const Message& message) override {
         waits.heard(call, message);
         findings.heard(call, message);

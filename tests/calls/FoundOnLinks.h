@@ -74,13 +74,22 @@ inline std::string found(std::string_view story, LinkFindings::Options options =
     return Trunk(std::move(options)).tell(story).found();
 }
 
-// Polls of both sides every ten seconds, from one moment to another.
-inline std::string idle(int from, int to) {
+// Polls of both sides every ten seconds, from one moment to another; with the N(R) of our side and of the
+// other.
+inline std::string idle(int from, int to, int ofUs = 0, int ofPeer = 0) {
+    const std::string us = " > RR " + std::to_string(ofUs), peer = " < RR " + std::to_string(ofPeer);
     std::string story;
     for (int at = from; at <= to; at += 10) {
         const std::string time = std::to_string(at);
-        story +=
-            time + " > RR 0 P\n" + time + ".01 < RR 0 F\n" + time + ".5 < RR 0 P\n" + time + ".51 > RR 0 F\n";
+        story.append(time).append(us).append(" P\n").append(time).append(".01").append(peer).append(" F\n");
+        story.append(time)
+            .append(".5")
+            .append(peer)
+            .append(" P\n")
+            .append(time)
+            .append(".51")
+            .append(us)
+            .append(" F\n");
     }
     return story;
 }

@@ -39,6 +39,24 @@ TEST(LinkFindings, CountRepeatsWithinTenMinutes) {
               "warning link-refused 2\nwarning link-refused 4\nwarning link-refused 6\n");
 }
 
+TEST(LinkFindings, TellWhatWasOnlyCountedWhenTenMinutesHavePassedAndTheTraceGoesOn) {
+    const std::string faults =
+        "0 > SABME\n0.01 < DM F\n200 > SABME\n200.01 < DM F\n300 > SABME\n300.01 < DM F\n";
+    const std::string first = "warning link-refused 2\n", counted = "warning link-refused 6 x2\n";
+    Trunk trunk;
+    trunk.tell(faults).advance(600);
+    EXPECT_EQ(trunk.findings().size(), 1U);
+    trunk.advance(601);
+    EXPECT_EQ(trunk.findings().size(), 2U);
+    EXPECT_EQ(trunk.found(), first + counted);
+    EXPECT_EQ(Trunk().tell(faults).tell("601 > UI\n").found(), first + counted);
+    // The next ten minutes begin when the counted ones are told.
+    EXPECT_EQ(found(faults + "600 > SABME\n602 < DM F\n700 > SABME\n700.01 < DM F\n"),
+              first + "warning link-refused 8 x3\nwarning link-refused 10\n");
+    EXPECT_EQ(Trunk().tell(faults).advance(601).tell("1200 > SABME\n1200.01 < DM F\n").advance(1202).found(),
+              first + counted + "warning link-refused 8\n");
+}
+
 TEST(FrameRejected, IsFoundWithWhatTheFrameSays) {
     Trunk trunk;
     trunk.tell(std::string(up) + "1 > I 0 0\n1.1 < FRMR = 00 00 00 02 08\n");
@@ -82,6 +100,11 @@ TEST(NrInvalid, IsFoundWhenTheSenderGoesOnBelowIt) {
               "error nr-invalid 2\nerror link-flap 3\n");
 }
 
+TEST(NrInvalid, IsNotFoundIfTheTraceEndsBeforeTheSenderGoesOn) {
+    EXPECT_EQ(found("1 > I 0 0\n1.1 < RR 3\n11 > RR 0 P\n11.1 < RR 3 F\n"), "note ns-gap-unknown 2\n");
+    EXPECT_EQ(found("1 > I 0 0\n1.05 < RR 1\n1.1 < I 0 1\n1.2 > RR 2\n"), "note ns-gap-unknown 4\n");
+}
+
 TEST(NrInvalid, IsNotFoundBehindALossOfTheRecorder) {
     EXPECT_EQ(Trunk()
                   .tell("1 > I 0 0\n1.05 < RR 1\n")
@@ -95,6 +118,26 @@ TEST(BoardRestarted, ForgetsWaitsThatWereOpen) {
     EXPECT_EQ(
         Trunk().tell(std::string(up) + "1 > I 0 0\n").restarted().tell("0 > I 40 7\n0.1 < RR 41\n").found(),
         "note board-restarted 3\n");
+}
+
+TEST(LinkFindings, LearnTheAccessFromTheChannelOfASetUp) {
+    const auto accessAfter = [](const std::string& frame) {
+        DChannel channel;
+        Collected collected;
+        LinkFindings findings({}, collected);
+        std::uint64_t number = 0;
+        const std::vector<ScriptFrame> frames = script("0 > SABME\n0.01 < UA\n1 < " + frame + "\n");
+        for (const ScriptFrame& each : frames) {
+            channel.take(frameOf(each), ++number, each.at);
+            findings.take(channel);
+        }
+        return findings.access();
+    };
+    const std::string basic = "18 01 89", primary = "18 03 A9 83 81";
+    EXPECT_EQ(accessAfter("I 0 0 = 08 02 00 01 05 " + primary), Access::primary);
+    EXPECT_EQ(accessAfter("I 0 0 = 08 02 00 01 05 " + basic), Access::basic);
+    EXPECT_EQ(accessAfter("UI = 08 01 01 05 " + basic), Access::basic);
+    EXPECT_EQ(accessAfter("I 0 0 = 08 02 80 01 02 " + primary), Access::unknown);
 }
 
 TEST(DirectionAbsent, IsSaidOnce) {

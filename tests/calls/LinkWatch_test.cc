@@ -4,7 +4,9 @@
 
 #include <gtest/gtest.h>
 
+#include <initializer_list>
 #include <string>
+#include <utility>
 
 #include "tests/calls/FoundOnLinks.h"
 
@@ -84,6 +86,25 @@ TEST(Retransmissions, AreFoundAboveOneInAHundredWithinAnHour) {
     EXPECT_EQ(found(seldom), "");
 }
 
+// Ten repetitions on three occasions are the least that is reported.
+TEST(Retransmissions, AreFoundFromTenOnThreeOccasionsOn) {
+    // The frames from `first` to `last` are sent once more, all together.
+    const auto story = [](std::initializer_list<std::pair<int, int>> again) {
+        std::string text(up);
+        for (int i = 0; i < 60; ++i) {
+            text += std::to_string(10 + i) + " > I " + std::to_string(i) + " 0\n";
+            for (const auto& [first, last] : again) {
+                for (int ns = first; i == last && ns <= last; ++ns)
+                    text += std::to_string(10 + i) + ".2 > I " + std::to_string(ns) + " 0\n";
+            }
+        }
+        return text + "70 < RR 60\n";
+    };
+    EXPECT_NE(found(story({{5, 8}, {20, 23}, {40, 41}})).find("warning retransmissions"), std::string::npos);
+    EXPECT_EQ(found(story({{5, 8}, {20, 23}, {40, 40}})).find("retransmissions"), std::string::npos);
+    EXPECT_EQ(found(story({{5, 10}, {20, 25}})).find("retransmissions"), std::string::npos);
+}
+
 TEST(Retransmissions, AreNotFoundForOneRecovery) {
     std::string story(up);
     for (int i = 0; i < 12; ++i)
@@ -115,6 +136,31 @@ TEST(KeepAliveMissing, IsNotFoundOnBasicAccessNorWhereOneSidePollsSlowly) {
     EXPECT_EQ(found(slow), "");
 }
 
+// The numbers show that the silence is the recorder's: frames of the link were sent meanwhile.
+TEST(KeepAliveMissing, IsNotFoundWhereTheRecorderHasMissedFrames) {
+    const std::string before = std::string(up) + "1 > I 0 0\n1.1 < RR 1\n" + idle(10, 60, 0, 1);
+    EXPECT_EQ(found(before + "200 > RR 4\n201 < I 4 1\n201.1 > RR 5\n"), "warning ns-gap-recorder 30\n");
+    EXPECT_EQ(found(before + "200 > I 9 0\n200.1 < RR 10\n"), "warning ns-gap-recorder 29\n");
+    EXPECT_EQ(found(before + "200 > I 1 0\n200.1 < RR 2\n201 > I 4 0\n"), "warning ns-gap-recorder 31\n");
+    EXPECT_EQ(found(before + "200 > I 0 0 = 08 01 07 05\n"), "note ns-gap-recorder 29\n");
+}
+
+TEST(KeepAliveMissing, IsFoundWhereTheNumbersGoOnAfterTheSilence) {
+    const std::string before = std::string(up) + "1 > I 0 0\n1.1 < RR 1\n" + idle(10, 60, 0, 1);
+    EXPECT_EQ(found(before + "200 > I 1 0\n200.1 < RR 2\n"), "warning keep-alive-missing 28\n");
+    EXPECT_EQ(found(before + "200 > SABME\n200.1 < UA\n201 > I 9 0\n"),
+              "warning keep-alive-missing 28\nerror link-flap 29\nwarning ns-gap-recorder 31\n");
+    EXPECT_EQ(found(before + "200 > I 1 0\n200.1 < RR 2\n205 > RR 0 P\n205.1 < RR 2 F\n"
+                             "211 > I 2 0\n211.1 < RR 3\n212 > I 9 0\n"),
+              "warning keep-alive-missing 28\nwarning ns-gap-recorder 35\n");
+}
+
+TEST(KeepAliveMissing, IsSaidBeforeTheNextFrameComes) {
+    Trunk trunk;
+    trunk.tell(std::string(up) + idle(10, 60)).advance(91);
+    EXPECT_EQ(trunk.advance(92).findings().size(), 1U);
+}
+
 TEST(PollUnanswered, IsFoundAfterTheLastRepetition) {
     EXPECT_EQ(
         found(std::string(up) + "1 > RR 0 P\n2 > RR 0 P\n2.5 < I 0 0\n3 > RR 1 P\n4 > RR 1 P\n5.1 < I 1 0\n"),
@@ -132,6 +178,14 @@ TEST(PollUnanswered, IsNotFoundBeforeTheLastRepetition) {
 TEST(PollUnanswered, IsANoteWhenALaterPollIsAnswered) {
     EXPECT_EQ(found(std::string(up) + "10 > RR 0 P\n11 > RR 0 P\n11.1 < RR 0 F\n"),
               "note poll-unanswered 3\n");
+}
+
+TEST(PollUnanswered, IsANoteWhenTheNextPollIsAnswered) {
+    EXPECT_EQ(found(std::string(up) + "10 > RR 0 P\n11 > RR 0 P\n11.1 < RR 0 F\n"),
+              "note poll-unanswered 3\n");
+    EXPECT_EQ(found(std::string(up) + "10 > RR 0 P\n20 > RR 0 P\n20.1 < RR 0 F\n"),
+              "note poll-unanswered 3\n");
+    EXPECT_EQ(found(std::string(up) + "10 > RR 0 P\n10.1 < RR 0 F\n20 > RR 0 P\n20.1 < RR 0 F\n"), "");
 }
 
 TEST(PollUnanswered, IsNotFoundWhenASetUpOrReleaseEndsTheWait) {

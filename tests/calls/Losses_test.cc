@@ -209,6 +209,131 @@ TEST(Losses, OfTheAnswerThatShowOnlyAfterALongSilence) {
     }
 }
 
+TEST(Losses, OfTheAnswerThatShowOnlyInTheSecondFrameAfterALongSilence) {
+    for (const Question& question : questions) {
+        CallScript s = begun();
+        question.ask(s.at(asked));
+        s.at(asked + 50).acknowledge(Side::peer);
+        question.answer(s.at(asked + 60));
+        s.unrecorded();
+        const std::int64_t next = asked + question.timer + 60000;
+        s.at(next).acknowledge(Side::peer);  // tells nothing about what the peer has sent
+        CallScript whole = s;
+        s.at(next + 5000).peer(m::status, 9, true, {cause(30), callState(0)});  // of another call
+        EXPECT_EQ(told(s, next + 30000), "cannot-be-told\n") << question.finding;
+        // The link stays up, and nothing that decides comes.
+        whole.at(next + 11000).acknowledge(Side::peer).at(next + 12000).acknowledge(Side::peer);
+        EXPECT_EQ(told(whole, next + 13000), std::string(question.finding) + "\n");
+    }
+}
+
+// The recorder misses so many frames of our side that those of the other side may have come round.
+TEST(Losses, OfManyFramesOfOneSideLeaveNothingCertainOfTheOther) {
+    for (const int count : {7, 8}) {
+        CallScript s = begun();
+        s.at(asked).us(m::setup, 2, false, {bearerSpeech()});
+        s.at(asked + 50).acknowledge(Side::peer);
+        for (int frame = 0; frame < count; ++frame)
+            s.us(m::status, 9, true, {cause(30), callState(0)}).unrecorded();
+        s.at(asked + 4000).us(m::status, 9, true, {cause(30), callState(0)});  // of another call
+        s.acknowledge(Side::peer).at(asked + 9000).poll(Side::us);
+        EXPECT_EQ(told(s, asked + 20000), count == 7 ? "setup-unanswered\n" : "cannot-be-told\n");
+    }
+}
+
+// All of the peer's numbers are missing once round, so that its next one fits. That of our side does not.
+TEST(Losses, OfOneHundredAndTwentyEightFramesAreSeenInTheNumbersOfTheOtherSide) {
+    for (const Question& question : questions) {
+        CallScript s = begun();
+        question.ask(s.at(asked));
+        s.at(asked + 50).acknowledge(Side::peer).acknowledge(Side::us);
+        question.answer(s.at(asked + 60));
+        s.unrecorded();
+        for (int frame = 1; frame < 128; ++frame)
+            s.peer(m::status, 9, true, {cause(30), callState(0)}).unrecorded();
+        for (int frame = 0; frame < 20; ++frame)
+            s.us(m::status, 9, true, {cause(30), callState(0)}).unrecorded();
+        const std::int64_t next = asked + question.timer + 60000;
+        s.at(next).acknowledge(Side::us);
+        s.at(next + 500).us(m::status, 9, true, {cause(30), callState(0)});  // of another call
+        EXPECT_EQ(told(s, next + 600), "cannot-be-told\n") << question.finding;
+    }
+}
+
+namespace {
+
+// What a message shows only together with those before it.
+struct Sequel {
+    const char* finding;
+    std::function<void(CallScript&)> before;  // the recorder may miss its last frame
+    std::function<void(CallScript&)> message;
+};
+
+const std::vector<Sequel> sequels{
+    {"element-absent",
+     [](CallScript& s) {
+         talking(s);
+         s.at(asked + 5000).us(m::disconnect, 2, false, {cause(16)});
+     },
+     [](CallScript& s) { s.peer(m::release, 2, true); }},
+    {"status-unasked",
+     [](CallScript& s) {
+         talking(s);
+         s.at(asked + 5000).us(m::statusEnquiry, 2, false);
+     },
+     [](CallScript& s) {
+         s.peer(m::status, 2, true, {cause(30), callState(10)});
+     }},
+    {"waits-for-digits",
+     [](CallScript& s) {
+         s.us(m::setup, 2, false, {bearerSpeech(), called("40")});
+         s.peer(m::setupAcknowledge, 2, true, {channel(1)}).acknowledge(Side::us);
+         s.at(asked + 11000).us(m::information, 2, false, {called("1")});
+     },
+     [](CallScript& s) { s.peer(m::alerting, 2, true); }},
+};
+
+}  // namespace
+
+TEST(Losses, BeforeAMessageMayExplainIt) {
+    for (const Sequel& each : sequels) {
+        for (const bool alone : {false, true}) {  // whether RR or the message acknowledges what is missing
+            CallScript s = begun();
+            each.before(s.at(asked));
+            s.unrecorded();
+            if (alone)
+                s.at(asked + 11500).acknowledge(Side::peer);
+            each.message(s.at(asked + 11600));
+            s.at(asked + 11700).us(m::status, 9, true, {cause(30), callState(0)});  // of another call
+            EXPECT_EQ(told(s, asked + 11800), "") << each.finding;
+        }
+    }
+}
+
+TEST(Losses, AreNotNeededForThatInAWholeTrace) {
+    for (const Sequel& each : sequels) {
+        CallScript s = begun();
+        each.before(s.at(asked));
+        each.message(s.at(asked + 11600));
+        EXPECT_EQ(told(s, asked + 11700), "") << each.finding;
+    }
+}
+
+// Our frame, which the message acknowledges, is recorded behind it. Nothing is missing.
+TEST(Losses, AreNotSuspectedForFramesInTheWrongOrder) {
+    for (const std::int64_t late : {4, 8, 12}) {
+        CallScript s = begun();
+        talking(s.at(asked));
+        s.us(m::status, 9, true, {cause(30), callState(0)}).unrecorded();
+        const std::size_t missed = s.frames().size();
+        s.at(asked + 5000).peer(m::release, 2, true);
+        ASSERT_EQ(s.frames().size(), missed + 1);
+        s.at(asked + 5000 + late);
+        s.raw(Side::us, true, {0x06, 0x04, 0x08, 0x02, 0x80, 0x09, 0x7B});  // N(S) = 3, N(R) = 2
+        EXPECT_EQ(told(s, asked + 6000), "element-absent\n") << late;
+    }
+}
+
 TEST(Losses, OfOurOwnAnswerThatShowOnlyInTheNextNumber) {
     for (const bool lost : {true, false}) {
         CallScript s = begun();

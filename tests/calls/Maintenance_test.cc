@@ -30,6 +30,18 @@ CallScript& restart(CallScript& script, std::uint8_t number, bool acknowledged =
 
 const Bytes outOfService{0x01, 0x01, 0xC2};
 
+// What is found while the trace goes on, so many milliseconds behind the last frame.
+std::string foundSoFar(const CallScript& script, std::int64_t quiet) {
+    Collected collected;
+    Analysis analysis({}, collected);
+    std::uint64_t number = 0;
+    for (const Sent& sent : script.frames())
+        analysis.take(sent.frame, ++number);
+    analysis.advance(quiet * millisecond);
+    analysis.advance(1);
+    return collected.lines;
+}
+
 // "4 restart-unacknowledged x30: RESTARTs of us got no ...", a line for each finding.
 std::string toldIn(const CallScript& script, std::int64_t quiet) {
     Collected collected;
@@ -117,6 +129,26 @@ TEST(Maintenance, TellsServicesThatWaitTogetherAsOneFinding) {
               "8 service-unacknowledged x3: SERVICEs of us got no acknowledge: channels 4, 5, 6\n");
 }
 
+TEST(Maintenance, TellsAtOnceWhenOnlyThoseStillWaitThatBelongToAnotherFinding) {
+    CallScript script = afterACall();
+    script.at(500).maintenance(Side::us, m::service, false, {outOfService, channel(3)});
+    script.at(510).maintenance(Side::peer, m::serviceAcknowledge, true, {outOfService, channel(3)});
+    script.at(900).maintenance(Side::us, m::service, false, {outOfService, channel(7)});  // not repeated
+    script.at(950).maintenance(Side::peer, m::service, false, {outOfService, channel(9)});
+    script.at(960).maintenance(Side::peer, m::service, false, {outOfService, channel(9)});
+    for (const int time : {1000, 61000})
+        script.at(time).maintenance(Side::us, m::service, false, {outOfService, channel(4)});
+    restart(script.at(62000), 6, false).acknowledge(Side::peer);
+    script.at(122000).acknowledge(Side::peer).acknowledge(Side::us);
+    EXPECT_EQ(foundSoFar(script, 100), "9 service-unacknowledged\n");
+    CallScript later = afterACall();
+    restart(later.at(1000), 5, false).acknowledge(Side::peer);
+    later.at(241010).acknowledge(Side::peer).acknowledge(Side::us);
+    restart(later.at(241012), 6, false);  // the first one is overdue already
+    later.at(241020).acknowledge(Side::peer);
+    EXPECT_EQ(foundSoFar(later, 100), "3 restart-unacknowledged\n");
+}
+
 TEST(Maintenance, TakesARestartOfEachChannelForSound) {
     CallScript script = afterACall();
     for (std::uint8_t number = 1; number < 31; ++number)
@@ -163,6 +195,16 @@ TEST(Maintenance, FindsAServiceThatIsNotAcknowledgedOnlyWhereOthersWere) {
         script.at(62000).peer(m::information, 9, true);
         EXPECT_EQ(findingsIn(script, 70000), others ? "6 service-unacknowledged\n" : "");
     }
+}
+
+TEST(Maintenance, TakesNoServiceThatSaysAnotherStatusForARepetition) {
+    CallScript script = afterACall();
+    script.at(500).maintenance(Side::us, m::service, false, {outOfService, channel(3)});
+    script.at(510).maintenance(Side::peer, m::serviceAcknowledge, true, {outOfService, channel(3)});
+    script.at(1000).maintenance(Side::us, m::service, false, {outOfService, channel(4)});
+    script.at(61000).maintenance(Side::us, m::service, false, {Bytes{0x01, 0x01, 0xC0}, channel(4)});
+    script.at(62000).peer(m::information, 9, true);
+    EXPECT_EQ(findingsIn(script, 200000), "");
 }
 
 }  // namespace calls
