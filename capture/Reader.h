@@ -31,6 +31,9 @@ class Reader {
     struct Progress {
         std::uint64_t octets = 0;
         std::uint64_t of = 0;
+        // A file that is followed was emptied, cut back or replaced since it was opened. Frames that were
+        // given stood in it; anything else that is given then may come from the cut.
+        bool isReplaced = false;
     };
 
     Reader() = default;

@@ -96,10 +96,8 @@ void Source::makeRoom(std::size_t octets) {
 Source::State Source::readMore() {
     if (!isRegular_ && !isReadable())
         return State::pause;
-    if (std::exchange(paused_, false) && isRegular_ && isAnotherContent()) {
-        replaced_ = true;
-        return State::end;
-    }
+    if (std::exchange(paused_, false) && isRegular_ && isAnotherContent())
+        return foundReplaced();
     const std::size_t from = end_;
     if (std::exchange(heldReturn_, false))
         buffer_[end_++] = '\r';
@@ -142,13 +140,16 @@ Source::State Source::atEnd() {
         ended_ = !follow_ || ownWriter_ < 0;
         return ended_ ? State::end : State::pause;
     }
-    if (isReplaced()) {
-        replaced_ = true;
-        return State::end;
-    }
+    if (isReplaced())
+        return foundReplaced();
     keepLastOctets();
     paused_ = true;
     return State::pause;
+}
+
+Source::State Source::foundReplaced() {
+    replaced_ = everReplaced_ = true;
+    return State::end;
 }
 
 bool Source::isReadable() const {
@@ -219,9 +220,9 @@ void Source::wait(std::chrono::milliseconds most) {
 Reader::Progress Source::progress() const {
     const std::uint64_t done = read_ - (end_ - begin_);
     if (!isRegular_)
-        return {done, 0};
+        return {done};
     struct stat status {};
-    return {done, fstat(file_, &status) == 0 ? static_cast<std::uint64_t>(status.st_size) : 0};
+    return {done, fstat(file_, &status) == 0 ? static_cast<std::uint64_t>(status.st_size) : 0, everReplaced_};
 }
 
 }  // namespace capture

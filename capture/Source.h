@@ -54,6 +54,7 @@ class Source {
     void joinLineEndsFrom(std::size_t from);
     State readMore();
     State atEnd();
+    State foundReplaced();
     bool isReadable() const;
     bool isReplaced() const;
     bool isAnotherContent() const;
@@ -65,6 +66,7 @@ class Source {
     bool follow_;
     bool isRegular_ = false;
     bool replaced_ = false;
+    bool everReplaced_ = false;  // since it was opened
     bool ended_ = false;
     bool paused_ = false;
     bool joinsLineEnds_ = false;

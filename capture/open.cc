@@ -125,6 +125,17 @@ bool isStart(std::string_view name) {
                                                   [](unsigned char c) { return std::isdigit(c) != 0; });
 }
 
+// "pri1.log" of "pri1.log.2", as programs that rotate logs name the older ones.
+std::string_view withoutRotation(std::string_view name) {
+    const std::size_t dot = name.rfind('.');
+    const std::size_t before = dot == 0 || dot == std::string_view::npos ? dot : name.rfind('.', dot - 1);
+    if (before == 0 || before == std::string_view::npos)
+        return name;
+    const std::string_view number = name.substr(dot + 1);
+    const auto isDigit = [](char c) { return c >= '0' && c <= '9'; };
+    return !number.empty() && std::ranges::all_of(number, isDigit) ? name.substr(0, dot) : name;
+}
+
 }  // namespace
 
 const Interface* Interfaces::of(const Interface& wanted) {
@@ -143,7 +154,7 @@ std::unique_ptr<Reader> openReader(const std::string& path, const ReadOptions& o
 }
 
 std::string trunkOf(std::string_view path) {
-    const std::string_view name = path.substr(path.rfind('/') + 1);
+    const std::string_view name = withoutRotation(path.substr(path.rfind('/') + 1));
     for (std::size_t dot = name.find('.'); dot != std::string_view::npos; dot = name.find('.', dot + 1)) {
         if (dot > 0 && isStart(name.substr(dot + 1)))
             return std::string(name.substr(0, dot));

@@ -22,7 +22,7 @@ std::unique_ptr<Reader> openReader(const std::string& path, const ReadOptions& o
 
 // The name of the D channel that a file name stands for. It is the file name without its folder, up to the
 // time at which the file was begun ("trunk1.20261121T112533.log" gives "trunk1"), or else without its ending
-// ("day.log" gives "day").
+// and the number of a rotated file ("day.log" and "day.log.2" give "day").
 std::string trunkOf(std::string_view path);
 
 }  // namespace capture
