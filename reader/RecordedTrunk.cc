@@ -11,6 +11,7 @@
 #include <utility>
 
 #include "reader/inputs.h"
+#include "recording/files.h"
 
 namespace reader {
 
@@ -24,21 +25,35 @@ constexpr std::size_t mostWaiting = 1000;
 // recording does not contain it.
 bool isNumbered(const capture::Item& item) { return item.isFrame() || item.kind == Kind::oversized; }
 
-std::uint64_t framesIn(const std::string& path) {
+struct Held {
+    std::uint64_t frames = 0;
+    std::uint64_t besides = 0;  // items after the last frame that are no frames
+};
+
+Held heldBy(const std::string& path) {
     const std::unique_ptr<capture::Reader> reader = openFile(path, {});
     capture::Item item;
-    std::uint64_t frames = 0;
-    while (reader->next(item) == capture::Reader::Next::item)
-        frames += isNumbered(item) ? 1 : 0;
-    return frames;
+    Held held;
+    while (reader->next(item) == capture::Reader::Next::item) {
+        if (isNumbered(item))
+            held = {held.frames + 1, 0};
+        else
+            ++held.besides;
+    }
+    return held;
 }
 
-// Whether another recorder is writing the file now.
+// Whether another recorder is writing the file now. If not, gives back the room that its recorder had
+// reserved, if the file is ours to change.
 bool isBeingWritten(const std::string& path) {
-    const int descriptor = open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    int descriptor = open(path.c_str(), O_RDWR | O_CLOEXEC);
+    if (descriptor < 0)
+        descriptor = open(path.c_str(), O_RDONLY | O_CLOEXEC);
     if (descriptor < 0)
         return true;
     const bool isFree = flock(descriptor, LOCK_EX | LOCK_NB) == 0;
+    if (isFree)
+        recording::giveRoomBack(descriptor);
     close(descriptor);
     return !isFree;
 }
@@ -59,6 +74,7 @@ RecordedTrunk::RecordedTrunk(const RecordRules& rules, const std::string& trunk,
         chatter_.error(std::string(error.what()) + "; numbers begin anew");
     }
     state_.trunk = trunk;
+    continueBehindFinished();
     adoptUnfinished();
     recordedNext_ = state_.next;
     recordedBesides_ = state_.besides;
@@ -88,21 +104,39 @@ void RecordedTrunk::adoptUnfinished() {
     }
 }
 
-// If a recorder was killed, its last file shows how far it came, and not the state.
+// If a recorder was killed, its last file shows how far it came, and not the state. A form that leaves out
+// some frames shows only the least that it can have been.
 void RecordedTrunk::continueBehind(const recording::RecordedFile& file, const std::string& path) {
     if (file.run != state_.run)
         return;
+    Held held;
     try {
-        const std::uint64_t next = file.first + framesIn(path);
-        if (next != state_.next)
-            state_.besides = 0;
-        state_.next = next;
+        held = heldBy(path);
     } catch (const std::exception& error) {
         // The file does not even have a head.
         chatter_.detail(error.what());
-        state_.next = file.first;
-        state_.besides = 0;
     }
+    const std::uint64_t next = file.first + held.frames;
+    const Form* const form = formOfFile(file.name);
+    if (next == state_.next)
+        state_.besides = std::min(state_.besides, held.besides);
+    else if (next > state_.next || (form != nullptr && form->holdsOversized))
+        state_.besides = 0;
+    else
+        return;
+    state_.next = next;
+}
+
+// When the disk was full, the last file was finished, and the state may be older than the file, because it
+// could not be written. Or it counts frames that no file holds: now the log is read once more, and they are
+// recorded after all.
+void RecordedTrunk::continueBehindFinished() {
+    if (state_.files.empty())
+        return;
+    const recording::RecordedFile& newest = state_.files.back();
+    const std::string path = rules_.files.folder + "/" + newest.name;
+    if (std::filesystem::exists(path))
+        continueBehind(newest, path);
 }
 
 void RecordedTrunk::take(const capture::Item& item) {
@@ -186,8 +220,6 @@ void RecordedTrunk::enlist() {
     if (std::exchange(enlisted_, file_.begun()) == file_.begun())
         return;
     std::vector<recording::RecordedFile>& files = state_.files;
-    if (!files.empty() && files.back().name == file_.newest())
-        files.pop_back();  // the file was never finished, because the disk was full
     files.push_back({file_.newest(), state_.run, state_.next});
     const auto isGone = [&](const recording::RecordedFile& file) {
         const std::string path = rules_.files.folder + "/" + file.name;
@@ -196,7 +228,14 @@ void RecordedTrunk::enlist() {
     files.erase(std::remove_if(files.begin(), files.end() - 1, isGone), files.end() - 1);
     if (files.size() > recording::RecordState::mostFiles)
         files.erase(files.begin(), files.end() - recording::RecordState::mostFiles);
-    isListed_ = false;
+    saveState();
+}
+
+// Takes a file off the list that is gone again, because the disk was full before anything was in it.
+void RecordedTrunk::unlist() {
+    std::vector<recording::RecordedFile>& files = state_.files;
+    if (file_.isNewestGone() && !files.empty() && files.back().name == file_.newest())
+        files.pop_back();
 }
 
 void RecordedTrunk::logIsGone(const capture::Item& item) {
@@ -242,6 +281,7 @@ void RecordedTrunk::finish() {
 
 // Writes the state. Call this only after the items before it are in the files, or are lost.
 void RecordedTrunk::saveState() {
+    unlist();
     if (const auto wrong = recording::writeState(state_, statePath_)) {
         if (!std::exchange(stateFails_, true))
             chatter_.error(*wrong);

@@ -53,15 +53,19 @@ class RecordedTrunk {
     // The state is written at once when its list of files or its log changes. Changes of its numbers alone,
     // which each frame makes, are written once in this time: a second, unless a test sets another.
     void writeStateEvery(std::chrono::steady_clock::duration time) { betweenStates_ = time; }
+    // As RotatingFile has it.
+    void retryEvery(RotatingFile::HostClock::duration time) { file_.retryEvery(time); }
 
   private:
     void adoptUnfinished();
     void continueBehind(const recording::RecordedFile& file, const std::string& path);
+    void continueBehindFinished();
     void meet(const capture::Item& first);
     void place(const capture::Item& item);
     bool isRecorded(bool isNumbered) const;
     void record(const capture::Item& item, bool isNumbered);
     void enlist();
+    void unlist();
     void saveState();
 
     const RecordRules& rules_;

@@ -11,7 +11,10 @@
 #include <cstring>
 #include <ctime>
 #include <filesystem>
+#include <utility>
 #include <vector>
+
+#include "recording/files.h"
 
 namespace reader {
 
@@ -20,9 +23,11 @@ namespace {
 using Kind = capture::Item::Kind;
 
 constexpr std::uint64_t mostPending = 64UL * 1024;
-constexpr std::uint64_t leastRoom = 64UL * 1024;  // octets that a full disk must have again
-constexpr std::size_t mostEarly = 100;            // items
-constexpr std::int64_t lateness = 2;              // seconds by which frames may come late
+constexpr std::uint64_t leastRoom = 64UL * 1024;   // octets that a full disk must have again
+constexpr std::uint64_t roomAhead = 16UL * 1024;   // octets of room that are asked for ahead, if there are
+constexpr std::uint64_t roomForHead = 4UL * 1024;  // octets that a form puts around items, at most
+constexpr std::size_t mostEarly = 100;             // items
+constexpr std::int64_t lateness = 2;               // seconds by which frames may come late
 
 std::int64_t secondOf(const capture::Item& item) {
     if (item.frame.clock == capture::Clock::absolute)
@@ -93,8 +98,10 @@ bool RotatingFile::begin(const capture::Item& item) {
     flock(descriptor_, LOCK_EX | LOCK_NB);
     newest_ = path_.substr(rules_.folder.size() + 1);
     ++begun_;
+    isNewestGone_ = false;
     period_ = periodOf(second);
     size_ = 0;
+    reserved_ = 0;
     try {
         writer_ = rules_.form->makeWriter(descriptor_, part);
         writeLoss(item);
@@ -108,7 +115,8 @@ bool RotatingFile::begin(const capture::Item& item) {
     return true;
 }
 
-// Begins a new file with the number of frames that are missing before it.
+// Begins a new file with the number of frames that are missing before it. Until the file is flushed, that
+// number may be lost with the file.
 void RotatingFile::writeLoss(const capture::Item& item) {
     if (lost_ == 0)
         return;
@@ -118,9 +126,7 @@ void RotatingFile::writeLoss(const capture::Item& item) {
     loss.count = lost_;
     loss.text = {};
     writer_->write(loss);
-    writer_->flush();
-    size_ = sizeOf(descriptor_);
-    lost_ = 0;
+    telling_ = lost_;
 }
 
 void RotatingFile::sayWritingWorks() {
@@ -162,14 +168,14 @@ void RotatingFile::flush() {
     if (writer_ == nullptr)
         return;
     try {
+        reserve();
         writer_->flush();
     } catch (const capture::WriteError& error) {
         fail(error.what());
         return;
     }
     size_ = sizeOf(descriptor_);
-    pending_ = 0;
-    pendingFrames_ = 0;
+    haveWritten();
     if (size_ > 0)
         sayWritingWorks();
     const bool isFull = rules_.size != 0 && size_ >= rules_.size;
@@ -181,17 +187,46 @@ void RotatingFile::finish() {
     if (writer_ == nullptr)
         return;
     try {
+        reserve();
         writer_->finish();
+        recording::giveRoomBack(descriptor_);
         synchronise();
     } catch (const capture::WriteError& error) {
         fail(error.what());
         return;
     }
-    pending_ = 0;
-    pendingFrames_ = 0;
+    haveWritten();
     closeFile();
     nameFinished();
     sayWritingWorks();
+}
+
+// Sees to it that the disk has room for what waits, or fails before any of it is written. Otherwise a reader
+// that follows the file could read frames which are cut off again.
+void RotatingFile::reserve() {
+    const std::uint64_t needed = pending_ == 0 ? 0 : size_ + 2 * pending_ + roomForHead;
+    if (needed <= reserved_ || isReservedTo(needed + roomAhead) || isReservedTo(needed))
+        return;
+    throw capture::WriteError(path_ + ": " + std::strerror(ENOSPC), ENOSPC);
+}
+
+// Returns false if the disk is full. On a file system that cannot reserve room, the file counts as reserved.
+bool RotatingFile::isReservedTo(std::uint64_t end) {
+    const auto from = static_cast<off_t>(size_);
+    while (fallocate(descriptor_, FALLOC_FL_KEEP_SIZE, from, static_cast<off_t>(end) - from) != 0) {
+        if (errno == ENOSPC || errno == EDQUOT)
+            return false;
+        if (errno != EINTR)
+            break;
+    }
+    reserved_ = end;
+    return true;
+}
+
+void RotatingFile::haveWritten() {
+    pending_ = 0;
+    pendingFrames_ = 0;
+    lost_ -= std::exchange(telling_, 0);
 }
 
 // Makes the system write the file to the disk, so that it survives a power failure.
@@ -207,23 +242,25 @@ void RotatingFile::passTime(std::int64_t second) {
 }
 
 // Cuts the file back to what is safely in it, and counts the rest as lost. Another file is tried after a
-// while.
+// while. The cut comes first, because somebody may be reading what will not stay.
 void RotatingFile::fail(const std::string& why) {
+    const bool isCut = descriptor_ >= 0 && ftruncate(descriptor_, static_cast<off_t>(size_)) == 0;
     lose(pendingFrames_);
     pending_ = 0;
     pendingFrames_ = 0;
+    telling_ = 0;
     if (!failing_)
         chatter_.error(why + "; recording goes on when that works again");
     failing_ = true;
     retryAt_ = HostClock::now() + betweenAttempts_;
     if (descriptor_ < 0)
         return;
-    const bool isCut = ftruncate(descriptor_, static_cast<off_t>(size_)) == 0;
     closeFile();
-    if (size_ > 0 && isCut)
-        nameFinished();
-    else if (size_ == 0)
+    isNewestGone_ = size_ == 0;
+    if (isNewestGone_)
         unlink((path_ + std::string(recording::unfinishedEnding)).c_str());
+    else if (isCut)
+        nameFinished();
 }
 
 void RotatingFile::closeFile() {

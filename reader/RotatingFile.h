@@ -60,6 +60,8 @@ class RotatingFile {
     // the first one.
     const std::string& newest() const { return newest_; }
     std::uint64_t begun() const { return begun_; }
+    // Whether the newest file was removed because nothing could be written to it.
+    bool isNewestGone() const { return isNewestGone_; }
 
     // How long after a failure another file is tried: a second, or as a test sets it.
     void retryEvery(HostClock::duration time) { betweenAttempts_ = time; }
@@ -67,6 +69,9 @@ class RotatingFile {
   private:
     bool begin(const capture::Item& item);
     void writeLoss(const capture::Item& item);
+    void reserve();
+    bool isReservedTo(std::uint64_t end);
+    void haveWritten();
     void fail(const std::string& why);
     void lose(std::uint64_t frames) {
         lost_ += frames;
@@ -89,14 +94,17 @@ class RotatingFile {
     std::string path_;    // the path of the file once it is finished
     std::string newest_;  // its name, kept when the file is closed
     std::uint64_t begun_ = 0;
+    bool isNewestGone_ = false;
     int descriptor_ = -1;
     std::unique_ptr<capture::Writer> writer_;
     std::vector<HeldItem> early_;  // items that wait for the item that begins a file
     std::int64_t period_ = 0;      // the multiple of the period that the file belongs to
     std::uint64_t size_ = 0;       // octets that are safely in the file
+    std::uint64_t reserved_ = 0;   // up to where the disk has room for the file
     std::uint64_t pending_ = 0;    // octets of the items written since
     std::uint64_t pendingFrames_ = 0;
-    std::uint64_t lost_ = 0;  // frames that the next file has to report
+    std::uint64_t lost_ = 0;     // frames that the next file has to report
+    std::uint64_t telling_ = 0;  // of these, frames that the present file reports once it is flushed
     std::uint64_t lostInAll_ = 0;
     std::uint64_t unsaid_ = 0;       // frames lost since the user was told of the failure
     std::int64_t newestSecond_ = 0;  // the second of the newest item

@@ -45,12 +45,12 @@ bool looksLikeCsv(std::string_view beginning) { return beginning.starts_with("n,
 
 // clang-format off
 const Form table[] = {
-    {"pcapng", "a pcapng capture",      true,  looksLikePcapng, "", nullptr, capture::makePcapngWriter, true},
+    {"pcapng", "a pcapng capture",      true,  looksLikePcapng, "", nullptr, capture::makePcapngWriter, true, true},
     {"pcap",   "a pcap capture",        true,  looksLikePcap,   "", nullptr, capture::makePcapWriter, true},
     {"jsonl",  "JSON Lines of lapdread", false, looksLikeJson, "",          make<JsonComposer>, nullptr},
     {"csv",    "a CSV file of lapdread", false, looksLikeCsv,   csvHeader(), make<CsvComposer>, nullptr},
     {"hex",    "lines of hexadecimal digits", false, looksLikeHex, "", nullptr, capture::makeHexWriter},
-    {"log",    "a log of lapdmon",      true,  looksLikeLog,    "", nullptr, makeLogWriter, true},
+    {"log",    "a log of lapdmon",      true,  looksLikeLog,    "", nullptr, makeLogWriter, true, true},
 };
 // clang-format on
 

@@ -25,6 +25,7 @@ struct Form {
     std::unique_ptr<Composer> (*makeComposer)();     // null if the form has a writer
     std::unique_ptr<capture::Writer> (*makeWriter)(int descriptor, const std::string& name);
     bool needsTimeOfDay = false;  // it cannot hold other times
+    bool holdsOversized = false;  // it has a place for frames that are too long for a log
 };
 
 std::span<const Form> forms();

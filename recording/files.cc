@@ -2,6 +2,7 @@
 
 #include <fcntl.h>
 #include <poll.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -31,6 +32,11 @@ int writeAll(int descriptor, std::string_view text) {
             return errno;
     }
     return 0;
+}
+
+bool giveRoomBack(int descriptor) {
+    struct stat status {};
+    return fstat(descriptor, &status) == 0 && ftruncate(descriptor, status.st_size) == 0;
 }
 
 std::optional<std::string> replaceFile(const std::string& path, std::string_view text,

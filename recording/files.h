@@ -12,6 +12,10 @@ namespace recording {
 // error's number.
 int writeAll(int descriptor, std::string_view text);
 
+// Gives back the room on the disk that was reserved behind the end of the file. If that fails, it returns
+// false, and the room stays reserved as long as the file is there.
+bool giveRoomBack(int descriptor);
+
 // replaceFile writes the text to PATH.new and renames that file to PATH, so that a reader sees either the old
 // text or the new one. It returns words that say what went wrong, or nothing. When it returns:
 enum class Durability {

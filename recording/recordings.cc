@@ -4,7 +4,9 @@
 #include <cstring>
 #include <ctime>
 #include <filesystem>
+#include <map>
 #include <regex>
+#include <utility>
 
 namespace recording {
 
@@ -73,6 +75,30 @@ std::vector<Recording> finishedRecordings(const RecordingKind& kind) { return re
 
 std::vector<Recording> unfinishedRecordings(const RecordingKind& kind) {
     return recordings(kind, unfinishedEnding);
+}
+
+void putInOrder(std::vector<std::string>& paths) {
+    static const std::regex rule(R"((.+)\.(\d{8}T\d{6}Z)(?:\.(\d{1,9}))?\..+)");
+    using Begin = std::pair<std::string, int>;  // the start, and the number within its second
+    std::map<std::string, std::vector<std::pair<Begin, std::string>>> recordings;  // by trunk
+    std::vector<std::string> trunks;  // of each path; empty if it is no recording
+    for (const std::string& path : paths) {
+        const std::string name = std::filesystem::path(path).filename();
+        std::smatch part;
+        const bool isRecording = std::regex_match(name, part, rule);
+        trunks.push_back(isRecording ? part[1].str() : "");
+        if (isRecording)
+            recordings[trunks.back()].push_back({{part[2], part[3].matched ? std::stoi(part[3]) : 1}, path});
+    }
+    for (auto& [trunk, ofTrunk] : recordings) {
+        std::stable_sort(ofTrunk.begin(), ofTrunk.end(),
+                         [](const auto& a, const auto& b) { return a.first < b.first; });
+        auto next = ofTrunk.begin();
+        for (std::size_t i = 0; i < paths.size(); ++i) {
+            if (trunks[i] == trunk)
+                paths[i] = (next++)->second;
+        }
+    }
 }
 
 }  // namespace recording

@@ -39,6 +39,10 @@ std::string newRecording(const RecordingKind& kind, std::int64_t start);
 std::vector<Recording> finishedRecordings(const RecordingKind& kind);
 std::vector<Recording> unfinishedRecordings(const RecordingKind& kind);
 
+// Puts the recordings of each trunk among these paths in the order in which they began, in whatever folders
+// they are: a shell lists the second recording of a second before the first. Other paths keep their places.
+void putInOrder(std::vector<std::string>& paths);
+
 }  // namespace recording
 
 #endif

@@ -396,6 +396,29 @@ class FullDisk(Recording):
             found = self.numbers(self.disk / file["name"])
             self.assertEqual(found, [(file["first"] + i) % 65536 for i in range(len(found))])
 
+    def test_one_that_is_killed_on_a_full_disk_has_lost_and_doubled_nothing_once_there_is_room(self):
+        ballast, count = self.disk / "ballast", 4500  # frames for more than the disk has left, and less than the whole disk
+        ballast.write_bytes(bytes(256 * 1024))
+        self.write("t.hex", *[numbered(number) for number in range(1, count + 1)])
+        recorder = self.record("--folder", str(self.disk))
+        until(lambda: "No space left on device" in self.said(), "the disk is full")
+        recorder.kill()
+        recorder.wait(LIMIT)
+        self.assertLess(len(self.numbers(*self.disk.glob("t.2*"))), count)
+        ballast.unlink()
+
+        def state():
+            return json.loads((self.disk / "t.state.json").read_text())
+        run = state()["run"]
+        recorder = self.record("--folder", str(self.disk))
+        self.write("t.hex", numbered(count + 1))
+        until(lambda: state()["next"] == count + 2, "all frames are recorded")
+        self.stop(recorder)
+        listed = [self.disk / file["name"] for file in state()["files"]]
+        self.assertEqual(in_order(self.disk.glob("t.2*")), listed)
+        self.assertEqual(self.numbers(*listed), list(range(1, count + 2)))
+        self.assertEqual({file["run"] for file in state()["files"]}, {run})
+
 
 class Service(Recording):
     def manager(self):
