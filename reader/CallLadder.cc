@@ -66,6 +66,20 @@ void insertDates(std::vector<Rung>& rungs, const calls::Call& call, TimeText& ti
     }
 }
 
+// Sets what the rungs have to name, so that messages of several terminals or D channels can be told apart.
+void tellApart(CallLadder& ladder) {
+    std::set<std::uint8_t> teis;
+    std::set<std::string_view> dChannels;
+    for (const Rung& rung : ladder.rungs) {
+        if (rung.kind != Rung::Kind::message)
+            continue;
+        teis.insert(rung.tei);
+        dChannels.insert(rung.dChannel);
+    }
+    ladder.hasSeveralTeis = teis.size() > 1;
+    ladder.namesDChannels = dChannels.size() > 1;
+}
+
 void putInOrder(std::vector<Rung>& rungs) {
     std::stable_sort(rungs.begin(), rungs.end(), [](const Rung& a, const Rung& b) {
         return std::pair(a.frame, a.kind == Rung::Kind::words) <
@@ -93,8 +107,12 @@ std::string timeOfDay(Instant when, TimeText& times) {
 
 std::vector<std::string> detailsOf(const CallLadder& ladder, const Rung& rung) {
     std::vector<std::string> details = rung.details;
-    if (ladder.hasSeveralTeis && rung.kind != Rung::Kind::words)
+    if (rung.kind == Rung::Kind::words)
+        return details;
+    if (ladder.hasSeveralTeis)
         details.insert(details.begin(), "TEI " + std::to_string(rung.tei));
+    if (ladder.namesDChannels && !rung.dChannel.empty())
+        details.insert(details.begin(), "on " + rung.dChannel);
     return details;
 }
 
@@ -118,6 +136,7 @@ CallLadder together(std::vector<CallLadder> ladders, const std::vector<std::uint
             all.rungs.push_back(std::move(rung));
         }
     }
+    tellApart(all);
     putInOrder(all.rungs);
     return all;
 }
@@ -246,9 +265,9 @@ void Ladders::addLinkRungs(const calls::Call& call, std::vector<Rung>& rungs) co
     }
 }
 
-CallLadder Ladders::take(const calls::Call& call, TimeText& times) {
+CallLadder Ladders::take(const calls::Call& call, TimeText& times, bool severalDChannels) {
     CallLadder ladder;
-    ladder.headline = callWords(call, times);
+    ladder.headline = callWords(call, times, severalDChannels);
     const capture::Role ours = call.origin == Side::us ? call.originRole : calls::opposite(call.originRole);
     ladder.us = labelOf("us", ours);
     ladder.peer = labelOf("peer", calls::opposite(ours));
@@ -261,10 +280,7 @@ CallLadder Ladders::take(const calls::Call& call, TimeText& times) {
         calls_.erase(known);
     }
     ladder.missing = call.messages - std::min(call.messages, shown);
-    std::set<std::uint8_t> teis;
-    for (const Rung& rung : ladder.rungs)
-        teis.insert(rung.tei);
-    ladder.hasSeveralTeis = teis.size() > 1;
+    tellApart(ladder);
     putInOrder(ladder.rungs);
     addLinkRungs(call, ladder.rungs);
     putInOrder(ladder.rungs);

@@ -42,6 +42,7 @@ struct CallLadder {
     std::vector<Rung> rungs;      // in the order of the input
     std::uint64_t missing = 0;    // how many messages were left out because there were too many
     bool hasSeveralTeis = false;  // the call has several terminals, so each rung names its own
+    bool namesDChannels = false;  // each rung names its D channel, since the messages passed on several
 
     // Nanoseconds since the rung before; nothing for the first one.
     std::optional<std::int64_t> sinceBefore(std::size_t rung) const;
@@ -50,7 +51,8 @@ struct CallLadder {
 // "08:00:01.300" of a date, "1.300" of a time that is no date, empty without a time.
 std::string timeOfDay(Instant when, TimeText& times);
 
-// The details of a rung, and its terminal ("TEI 67") if the call has several.
+// The details of a rung, and in front of them its D channel ("on pri1") and its terminal ("TEI 67") where the
+// ladder has several.
 std::vector<std::string> detailsOf(const CallLadder& ladder, const Rung& rung);
 
 // Several calls as one ladder, in the order of their frames; each rung of a message says which call it is of.
@@ -75,8 +77,8 @@ class Ladders {
     // Keeps a RESTART or its answer with the events of links, because it may end calls.
     void restarted(const calls::Message& message);
     // Returns the ladder of a call that has gone, with what happened to its links meanwhile, and forgets the
-    // call.
-    CallLadder take(const calls::Call& call, TimeText& times);
+    // call. The headline names the call's D channel if there are several.
+    CallLadder take(const calls::Call& call, TimeText& times, bool severalDChannels = false);
     void forget(const calls::Call& call);
 
   private:

@@ -55,6 +55,8 @@ constexpr std::array columns{
     LineColumn{
         "start", "", 29, false,
         [](std::string& to, const Call& call, TimeText& times) { appendInstant(to, call.begin, times); }},
+    LineColumn{"D channel", "D channel ", 9, false,
+               [](std::string& to, const Call& call, TimeText&) { appendSafe(to, call.dChannel); }, true},
     LineColumn{"dir", "", 8, false,
                [](std::string& to, const Call& call, TimeText&) {
                    to += call.origin == calls::Side::us ? "TX " : "RX ";
@@ -101,9 +103,11 @@ void trimEnd(std::string& to, std::size_t start) {
 
 std::span<const CallLineColumn> callLineColumns() { return columns; }
 
-std::string callHeading() {
+std::string callHeading(bool severalDChannels) {
     std::string heading;
     for (const LineColumn& column : columns) {
+        if (column.forSeveral && !severalDChannels)
+            continue;
         if (!heading.empty())
             heading += ' ';
         const std::size_t start = heading.size();
@@ -116,21 +120,27 @@ std::string callHeading() {
 std::vector<CallColumn> callColumns() {
     std::vector<CallColumn> named;
     named.reserve(columns.size());
-    for (const LineColumn& column : columns)
-        named.push_back({column.heading, column.right});
+    for (const LineColumn& column : columns) {
+        if (!column.forSeveral)
+            named.push_back({column.heading, column.right});
+    }
     return named;
 }
 
 std::vector<std::string> callCells(const Call& call, TimeText& times) {
     std::vector<std::string> cells;
-    for (const LineColumn& column : columns)
-        column.put(cells.emplace_back(), call, times);
+    for (const LineColumn& column : columns) {
+        if (!column.forSeveral)
+            column.put(cells.emplace_back(), call, times);
+    }
     return cells;
 }
 
-std::vector<std::string> callWords(const Call& call, TimeText& times) {
+std::vector<std::string> callWords(const Call& call, TimeText& times, bool severalDChannels) {
     std::vector<std::string> words;
     for (const LineColumn& column : columns) {
+        if (column.forSeveral && !severalDChannels)
+            continue;
         std::string word;
         column.put(word, call, times);
         if (!word.empty())
@@ -139,10 +149,12 @@ std::vector<std::string> callWords(const Call& call, TimeText& times) {
     return words;
 }
 
-void appendCallLine(std::string& to, const Call& call, TimeText& times) {
+void appendCallLine(std::string& to, const Call& call, TimeText& times, bool severalDChannels) {
     const std::size_t lineStart = to.size();
     bool first = true;
     for (const LineColumn& column : columns) {
+        if (column.forSeveral && !severalDChannels)
+            continue;
         if (!first)
             to += ' ';
         first = false;

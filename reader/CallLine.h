@@ -20,13 +20,14 @@ struct CallLineColumn {
     bool right;               // blanks that fill it up stand in front
     // Appends its text, which commands no terminal.
     void (*put)(std::string& to, const calls::Call& call, TimeText& times);
+    bool forSeveral = false;  // only a line that tells D channels apart has it
 };
 std::span<const CallLineColumn> callLineColumns();
 
 // The heading above the lines.
-std::string callHeading();
+std::string callHeading(bool severalDChannels = false);
 // Appends the line of a call, without line end.
-void appendCallLine(std::string& to, const calls::Call& call, TimeText& times);
+void appendCallLine(std::string& to, const calls::Call& call, TimeText& times, bool severalDChannels = false);
 // The same as the cells of a table. Control characters are made harmless. An empty cell means that there is
 // no value.
 struct CallColumn {
@@ -37,7 +38,7 @@ std::vector<CallColumn> callColumns();
 std::vector<std::string> callCells(const calls::Call& call, TimeText& times);
 // The same for a headline: the fields that have a value, each with a word that names it ("duration 3.100").
 // Control characters are made harmless.
-std::vector<std::string> callWords(const calls::Call& call, TimeText& times);
+std::vector<std::string> callWords(const calls::Call& call, TimeText& times, bool severalDChannels = false);
 
 }  // namespace reader
 

@@ -148,6 +148,8 @@ constexpr Column table[] = {
     {"hex",     "all octets",                                                 0, false, putHex},
 };
 
+static_assert(std::ranges::all_of(table, [](const Column& column) { return column.width <= widestColumn; }));
+
 constexpr struct {
     capture::Item::Kind kind;
     std::string_view words;
@@ -243,11 +245,8 @@ void appendCallReference(std::string& to, const Seen& seen) {
         to += "dummy";
         return;
     }
-    const std::size_t start = to.size();
-    appendNumber(to, reference.value, 16);
-    const std::size_t digits = 2 * std::min<std::size_t>(reference.length, 8);
-    if (to.size() - start < digits)
-        to.insert(start, digits - (to.size() - start), '0');
+    for (unsigned digits = 2 * std::min<unsigned>(reference.length, 8); digits-- > 0;)
+        to += "0123456789abcdef"[reference.value >> 4 * digits & 0xFU];
     to += reference.flag ? 'd' : 'o';
 }
 

@@ -30,6 +30,9 @@ struct Column {
     void (*put)(Cell& cell);
 };
 
+// No column is wider. What follows a text is cut from as many blanks, and one more.
+inline constexpr unsigned widestColumn = 31;
+
 // In the order in which they stand in the widest line.
 std::span<const Column> columns();
 

@@ -4,11 +4,13 @@
 
 namespace reader {
 
-void appendHappening(std::string& to, const calls::Finding& finding, TimeText& times) {
+void appendHappening(std::string& to, const calls::Finding& finding, TimeText& times, bool severalDChannels) {
     if (finding.clock == capture::Clock::none)
         to += '-';
     else
         times.append(to, {finding.clock, finding.time});
+    if (severalDChannels && !finding.dChannel.empty())
+        appendSafe(to += ' ', finding.dChannel);
     to += " frame ";
     appendNumber(to, finding.frame);
     if (finding.call) {

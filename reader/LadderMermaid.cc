@@ -31,6 +31,8 @@ void appendNote(std::string& to, const std::vector<std::string>& items) {
     to += "    Note over us,peer: ";
     bool first = true;
     for (const std::string& item : items) {
+        if (item.empty())
+            continue;  // the time of a line that has none
         to += first ? "" : "<br/>";
         first = false;
         appendPlain(to, item);

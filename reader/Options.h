@@ -35,6 +35,7 @@ struct InputOptions {
     std::string trunk;  // the D channel's name; empty: as the input has it
     std::string store;  // the URL of a fleet's store that is read instead of files; `trunk` chooses there
     std::vector<std::string> sites;  // of the store; empty: all
+    bool storeHasSeveral = false;    // more than one D channel of the store is chosen
     capture::Role role = capture::Role::unknown;
     capture::Variant variant = capture::Variant::unknown;
     std::string zone;
@@ -50,6 +51,7 @@ struct OutputOptions {
 struct ListOptions {
     TimeForm time = TimeForm::absolute;
     bool wide = false;
+    bool trunk = false;                // the usual columns name the D channel as well
     std::vector<std::string> columns;  // empty: those of `wide`, or the usual ones
 };
 
@@ -89,6 +91,7 @@ struct LadderOptions {
     LadderForm form = LadderForm::text;
     unsigned width = 0;  // columns; 0: those of the terminal
     bool ascii = false;
+    bool dChannels = false;  // each arrow names its D channel
 };
 
 struct BrowseOptions {

@@ -166,15 +166,13 @@ class Run {
         const Next next = fill(chunk);
         isPaused_ = next == Next::pause;
         hasEnded_ = next == Next::end;
-        const auto [done, of] = reader_.progress();
-        chatter_.progress(done, of);
+        const capture::Reader::Progress progress = reader_.progress();
+        chatter_.progress(progress.octets, progress.of);
         return next;
     }
 
     Next fill(Chunk& chunk) {
-        if (!heldBack_
-                 .empty())  // otherwise each thread keeps its own memory, which is in its processor's cache
-            std::swap(chunk, heldBack_);
+        takeHeldBack(chunk);
         std::size_t room = work_.eachAtOnce ? 1 : itemsInChunk;
         Next next = Next::item;
         addReleased(chunk);
@@ -198,6 +196,13 @@ class Run {
         return next;
     }
 
+    // Moves what was held back into an empty chunk. If that is nothing, each thread keeps its own memory,
+    // which is in its processor's cache.
+    void takeHeldBack(Chunk& chunk) {
+        if (!heldBack_.empty())
+            std::swap(chunk, heldBack_);
+    }
+
     void lookForPolls(Chunk& chunk, Seen& seen) {
         if (filter_.hidesKeepAlives())
             polls_.take(chunk, seen);
@@ -214,9 +219,7 @@ class Run {
     // other thread is left.
     void handOnRest(Chunk& chunk, Composer& composer) {
         chunk.clear();
-        if (!heldBack_
-                 .empty())  // otherwise each thread keeps its own memory, which is in its processor's cache
-            std::swap(chunk, heldBack_);
+        takeHeldBack(chunk);
         if (work_.gate != nullptr)
             work_.gate->finish();
         addReleased(chunk);
@@ -263,20 +266,27 @@ class Run {
         begun_ = true;
     }
 
+    // The number of pieces up to the one with which `frames` frames are counted, or all. Counts `frames`
+    // down. A line that says something between frames, such as that some were lost, is not counted.
+    static std::size_t piecesOf(Chunk& chunk, std::uint64_t& frames) {
+        std::size_t pieces = 0;
+        while (pieces < chunk.pieces.size() && frames != 0) {
+            if (chunk.seen()[chunk.pieces[pieces++].item].number != 0)
+                --frames;
+        }
+        return pieces;
+    }
+
     // Hands on nothing after the last piece that is wanted, or after a failure.
     void handOn(Chunk& chunk, bool flushes) {
         if (isFull_ || failure_ != nullptr)
             return;
+        passed_ += chunk.pieces.size();
+        if (skipped_ != 0)
+            chunk.dropPieces(piecesOf(chunk, skipped_));
         std::size_t wanted = chunk.pieces.size();
-        passed_ += wanted;
-        if (const std::size_t dropped = std::min<std::uint64_t>(wanted, skipped_); dropped != 0) {
-            chunk.dropPieces(dropped);
-            skipped_ -= dropped;
-            wanted -= dropped;
-        }
         if (first_ != 0) {
-            wanted = std::min<std::uint64_t>(wanted, left_);
-            left_ -= wanted;
+            wanted = piecesOf(chunk, left_);
             isFull_ = left_ == 0;
         }
         if (wanted > 0 || consumer_.wantsAll())

@@ -1,6 +1,7 @@
 #include "reader/TextConsumer.h"
 
 #include <string>
+#include <string_view>
 
 #include "reader/text.h"
 
@@ -20,14 +21,13 @@ void TextConsumer::take(Chunk& chunk, std::size_t count) {
 }
 
 void TextConsumer::fillInTimes(Chunk& chunk, std::size_t count) {
-    std::string delta;
     for (std::size_t i = 0; i < count; ++i) {
         Piece& piece = chunk.pieces[i];
         if (piece.instant.clock == capture::Clock::none)
             continue;
         const bool comparable = before_.clock == piece.instant.clock;
-        delta.clear();
-        appendSeconds(delta, comparable ? piece.instant.time - before_.time : 0);
+        const SecondsText text(comparable ? piece.instant.time - before_.time : 0);
+        const std::string_view delta = text.view();
         before_ = piece.instant;
         if (delta.size() > piece.deltaSize)
             widen(chunk, i, delta.size() - piece.deltaSize);

@@ -53,13 +53,16 @@ void TimeText::lookUp(std::int64_t minute) {
     const std::time_t seconds = minute * 60;
     std::tm local{};
     localtime_r(&seconds, &local);
-    dateLength_ = std::strftime(date_, sizeof date_, "%Y-%m-%dT%H:%M:", &local);
+    secondsAt_ = std::strftime(text_, sizeof text_, "%Y-%m-%dT%H:%M:", &local);
     const long east = local.tm_gmtoff / 60;
-    char* at = offset_;
+    char* at = text_ + secondsAt_ + 2;
+    *at++ = '.';
+    at += 3;
     *at++ = east < 0 ? '-' : '+';
     at = putDigits(at, std::labs(east) / 60, 2);
     *at++ = ':';
-    putDigits(at, std::labs(east) % 60, 2);
+    at = putDigits(at, std::labs(east) % 60, 2);
+    length_ = static_cast<std::size_t>(at - text_);
 }
 
 void TimeText::append(std::string& to, Instant instant) {
@@ -76,13 +79,9 @@ void TimeText::append(std::string& to, Instant instant) {
         lookUp(minute);
     const std::int64_t milliseconds =
         (instant.time - minute * nanosecondsPerMinute) / nanosecondsPerMillisecond;
-    char text[sizeof date_ + 16];
-    char* at = std::copy_n(date_, dateLength_, text);
-    at = putDigits(at, milliseconds / 1000, 2);
-    *at++ = '.';
-    at = putDigits(at, milliseconds % 1000, 3);
-    at = std::copy_n(offset_, 6, at);
-    to.append(text, at);
+    putDigits(text_ + secondsAt_, milliseconds / 1000, 2);
+    putDigits(text_ + secondsAt_ + 3, milliseconds % 1000, 3);
+    to.append(text_, length_);
 }
 
 std::string textOf(Instant instant) {
@@ -92,16 +91,19 @@ std::string textOf(Instant instant) {
     return text;
 }
 
-void appendSeconds(std::string& to, std::int64_t nanoseconds) {
+SecondsText::SecondsText(std::int64_t nanoseconds) {
     const std::int64_t milliseconds = nanoseconds / nanosecondsPerMillisecond;
+    auto rest = static_cast<std::uint64_t>(milliseconds < 0 ? -milliseconds : milliseconds);
+    for (unsigned digits = 0; digits < 4 || rest != 0; ++digits, rest /= 10) {
+        if (digits == 3)
+            text_[--begin_] = '.';
+        text_[--begin_] = static_cast<char>('0' + rest % 10);
+    }
     if (milliseconds < 0)
-        to += '-';
-    const auto size = static_cast<std::uint64_t>(milliseconds < 0 ? -milliseconds : milliseconds);
-    appendNumber(to, size / 1000);
-    char fraction[4] = {'.'};
-    putDigits(fraction + 1, static_cast<std::int64_t>(size % 1000), 3);
-    to.append(fraction, 4);
+        text_[--begin_] = '-';
 }
+
+void appendSeconds(std::string& to, std::int64_t nanoseconds) { to += SecondsText(nanoseconds).view(); }
 
 namespace {
 

@@ -36,17 +36,28 @@ class TimeText {
   private:
     void lookUp(std::int64_t minute);
 
-    std::int64_t minute_ = INT64_MIN;
-    char date_[24] = {};  // "2026-11-21T11:25:"
-    std::size_t dateLength_ = 0;
-    char offset_[8] = {};  // "+01:00"
+    std::int64_t minute_ = INT64_MIN;  // the minute of text_
+    char text_[48] = {};               // "2026-11-21T11:25:SS.MMM+01:00"
+    std::size_t secondsAt_ = 0;        // the index of the seconds
+    std::size_t length_ = 0;
 };
 
 // The instant alone; empty without a clock.
 std::string textOf(Instant instant);
 
-// Appends signed seconds with three digits: "0.040", "-1.000". Parts of a millisecond are cut off towards
-// zero.
+// Signed seconds with three digits after the point: "0.040", "-1.000". Parts of a millisecond are cut off
+// towards zero.
+class SecondsText {
+  public:
+    explicit SecondsText(std::int64_t nanoseconds);
+    std::string_view view() const { return {text_ + begin_, sizeof text_ - begin_}; }
+
+  private:
+    char text_[24] = {};  // filled from its end
+    std::size_t begin_ = sizeof text_;
+};
+
+// Appends the text of SecondsText.
 void appendSeconds(std::string& to, std::int64_t nanoseconds);
 
 // What a user may give as a time: an ISO date with or without time and offset (local time without), a time of

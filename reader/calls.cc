@@ -10,6 +10,7 @@
 #include "reader/CallOrder.h"
 #include "reader/Limit.h"
 #include "reader/errors.h"
+#include "reader/inputs.h"
 #include "reader/session.h"
 #include "reader/text.h"
 
@@ -23,7 +24,7 @@ class CallPrinter : public Analysed {
         if (options.calls.form == CallForm::csv)
             out_.write(callCsvHeader());
         else if (options.calls.form == CallForm::text)
-            out_.write(callHeading() + "\n");
+            out_.write(callHeading(severalDChannels_) + "\n");
     }
 
     bool countsItself() const override { return true; }
@@ -65,7 +66,7 @@ class CallPrinter : public Analysed {
                 appendCallJson(text_, call, times_);
                 break;
             case CallForm::text:
-                appendCallLine(text_, call, times_);
+                appendCallLine(text_, call, times_, severalDChannels_);
                 text_ += '\n';
                 break;
         }
@@ -74,6 +75,7 @@ class CallPrinter : public Analysed {
 
     const Options& options_;
     Output& out_;
+    bool severalDChannels_ = mayHaveSeveralDChannels(options_);
     TimeText times_;
     std::string text_;
     Limit limit_{options_};

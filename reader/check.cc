@@ -7,6 +7,7 @@
 #include "reader/FindingText.h"
 #include "reader/Limit.h"
 #include "reader/errors.h"
+#include "reader/inputs.h"
 #include "reader/json.h"
 #include "reader/session.h"
 #include "reader/text.h"
@@ -75,7 +76,7 @@ class FindingPrinter : public Analysed {
         if (colors_)
             text_ += colorOff;
         text_ += ' ';
-        appendHappening(text_, finding, times_);
+        appendHappening(text_, finding, times_, severalDChannels_);
         text_ += "\n        ";
         appendMeaning(text_, finding);
         text_ += '\n';
@@ -124,6 +125,7 @@ class FindingPrinter : public Analysed {
     const Options& options_;
     Output& out_;
     bool colors_;
+    bool severalDChannels_ = mayHaveSeveralDChannels(options_);
     TimeText times_;
     std::string text_;
     Limit limit_{options_};

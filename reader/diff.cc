@@ -2,8 +2,10 @@
 
 #include <algorithm>
 #include <filesystem>
+#include <map>
 #include <optional>
 #include <set>
+#include <utility>
 
 #include "reader/Analysed.h"
 #include "reader/Comparison.h"
@@ -61,13 +63,20 @@ class MessageTaker : public Analysed {
         : Analysed(operand.options), also_(operand.options.compareAlso), operand_(operand) {}
 
     void flush() override {}
-    // The messages to compare. Called after the end of the trace.
+    // The messages to compare, those of a call together, in the order in which the calls began. How the calls
+    // of a trunk mingle differs from day to day, and says nothing. Called after the end of the trace.
     std::vector<ComparedMessage> messages() {
-        std::vector<ComparedMessage> wanted;
+        std::map<std::uint64_t, std::size_t> begun;  // by call: where its first message stands
+        std::vector<std::pair<std::size_t, std::size_t>> order;
         for (std::size_t i = 0; i < messages_.size(); ++i) {
             if (!unwanted_.contains(calls_[i]))
-                wanted.push_back(std::move(messages_[i]));
+                order.emplace_back(calls_[i] == 0 ? i : begun.try_emplace(calls_[i], i).first->second, i);
         }
+        std::sort(order.begin(), order.end());
+        std::vector<ComparedMessage> wanted;
+        wanted.reserve(order.size());
+        for (const auto& [first, i] : order)
+            wanted.push_back(std::move(messages_[i]));
         return wanted;
     }
 
@@ -210,7 +219,8 @@ std::span<const OptionRow> diffOptions() {
 
 int runDiff(const Options& options, Chatter& chatter) {
     const std::vector<std::string> words = wordsOf(options);
-    if (words.size() != 2 || options.input.follow || words[0] == "-")
+    const bool isPipeTwice = words.size() == 2 && words[0] == "-" && words[1] == "-";
+    if (words.size() != 2 || options.input.follow || isPipeTwice)
         throw UsageError(options.input.store.empty()
                              ? "diff takes two files, or calls of files: lapdread diff A#3 B#7"
                              : "diff takes two D channels of a store, or calls of them: lapdread diff "

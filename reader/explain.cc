@@ -129,12 +129,16 @@ void ExplainComposer::explainElement(std::span<const std::uint8_t> octets, isdn:
 }
 
 void ExplainComposer::compose(const Seen& seen, std::string& text, Piece& /*piece*/) {
-    text += "Frame ";
-    appendNumber(text, seen.number);
-    text += ", ";
+    const bool isCounted = seen.number != 0;  // what the recorder says is no frame and has no direction
+    if (isCounted) {
+        text += "Frame ";
+        appendNumber(text, seen.number);
+        text += ", ";
+    }
     times_.append(text, seen.when);
-    text += seen.frame().transmitted ? ", TX " : ", RX ";
-    (text += direction(seen)) += ", ";
+    if (isCounted)
+        (text += seen.frame().transmitted ? ", TX " : ", RX ") += direction(seen);
+    text += ", ";
     appendSafe(text, capture::toString(seen.frame().place));
     text += '\n';
     if (seen.isFrame()) {

@@ -16,6 +16,7 @@
 #include "reader/Joined.h"
 #include "reader/errors.h"
 #include "reader/text.h"
+#include "recording/recordings.h"
 
 namespace reader {
 
@@ -120,6 +121,18 @@ std::vector<std::string> inputNames(const Options& options) {
     return {name};
 }
 
+bool mayHaveSeveralDChannels(const Options& options) {
+    const InputOptions& input = options.input;
+    if (!input.store.empty())
+        return input.storeHasSeveral;
+    if (!input.trunk.empty())
+        return false;
+    std::set<std::string> names;
+    for (const std::string& file : inputFiles(options))
+        names.insert(capture::trunkOf(file));
+    return names.size() > 1;
+}
+
 bool canBeReadAgain(const std::string& file) {
     std::error_code ignored;
     return file != "-" && std::filesystem::is_regular_file(file, ignored);
@@ -129,11 +142,14 @@ std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*c
                                             std::vector<Primed*>* pipes) {
     if (!options.input.store.empty())
         return openStore(options);
-    const std::vector<std::string> files = inputFiles(options);
+    std::vector<std::string> files = inputFiles(options);
+    recording::putInOrder(files);
     const InputOptions& input = options.input;
     if (!input.sites.empty())
         throw UsageError("--site chooses among the trunks of a store: name it with --store URL");
-    if (input.follow && files.size() > 1 && !input.merge)
+    // A call may go from one D channel of a group to another and back, so files in turn would tear it.
+    const bool isMerged = input.merge || !options.calls.groups.empty();
+    if (input.follow && files.size() > 1 && !isMerged)
         throw UsageError("--follow takes one input, or several with --merge");
     std::vector<Opener> openers;
     std::set<std::string> opened;
@@ -144,15 +160,17 @@ std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*c
         else
             openers.emplace_back([file, &input] { return openFile(file, input); });
     }
-    if (input.merge && files.size() > 1)
+    if (isMerged && files.size() > 1)
         return std::make_unique<Merge>(openers);
     return std::make_unique<Sequence>(std::move(openers));
 }
 
-void joinGroupsOfStore(Options& options) {
+void learnTrunksOfStore(Options& options) {
     if (options.input.store.empty())
         return;
-    for (std::vector<std::string>& group : fleet::openStore(queryOf(options))->groups())
+    const std::unique_ptr<fleet::Store> store = fleet::openStore(queryOf(options));
+    options.input.storeHasSeveral = store->trunks().size() > 1;
+    for (std::vector<std::string>& group : store->groups())
         options.calls.groups.push_back(std::move(group));
 }
 

@@ -21,6 +21,10 @@ std::vector<std::string> inputFiles(const Options& options);
 // chosen there. Its URL may hold a password, and is left out.
 std::vector<std::string> inputNames(const Options& options);
 
+// Whether frames of more than one D channel are to be expected, from a store, or from files whose names say
+// so. A line of text then names its D channel.
+bool mayHaveSeveralDChannels(const Options& options);
+
 // Opens an input. Throws capture::BadInput if it cannot be opened; next() throws that for an unknown form.
 std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOptions& input);
 
@@ -34,9 +38,9 @@ std::unique_ptr<capture::Reader> openFile(const std::string& file, const InputOp
 std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& chatter,
                                             std::vector<Primed*>* pipes = nullptr);
 
-// The D channels of a store that share their calls do so as if --nfas named them. Without a store nothing is
-// done. Throws what openInputs() throws for a store.
-void joinGroupsOfStore(Options& options);
+// Sets the options that the chosen D channels of a store decide: those that share their calls do so as if
+// --nfas named them. Without a store nothing is done. Throws what openInputs() throws for a store.
+void learnTrunksOfStore(Options& options);
 
 // Throws capture::BadInput if one of the inputs is a regular file whose form is not known. Does not look at
 // inputs that are followed, because they may be empty yet, nor at pipes, because they can be read only once.

@@ -13,6 +13,7 @@
 #include "reader/Limit.h"
 #include "reader/Locale.h"
 #include "reader/errors.h"
+#include "reader/inputs.h"
 #include "reader/text.h"
 
 namespace reader {
@@ -76,13 +77,24 @@ class LadderPrinter : public Analysed {
     }
     void gone(const calls::Call& call) override {
         if (isWanted(call) && limit_.takeOne())
-            print(ladders_.take(call, times_));
+            print(ladders_.take(call, times_, severalDChannels_ && !isGrouped(call)));
         else
             ladders_.forget(call);
         Analysed::gone(call);
     }
 
-    void print(const CallLadder& ladder) {
+    // Whether the call may pass on several D channels.
+    bool isGrouped(const calls::Call& call) const {
+        return std::ranges::any_of(options_.calls.groups, [&](const std::vector<std::string>& group) {
+            return std::ranges::find(group, call.dChannel) != group.end();
+        });
+    }
+
+    void print(CallLadder ladder) {
+        if (options_.ladder.dChannels)
+            ladder.namesDChannels = true;
+        else if (options_.ladder.form == LadderForm::text)
+            ladder.namesDChannels = false;
         const std::uint64_t number = limit_.taken();
         std::string text;
         switch (options_.ladder.form) {
@@ -107,6 +119,7 @@ class LadderPrinter : public Analysed {
     const Options& options_;
     Output& out_;
     Chatter& chatter_;
+    bool severalDChannels_ = mayHaveSeveralDChannels(options_);
     LadderTextForm text_;
     LadderSvg svg_;
     TimeText times_;
@@ -127,6 +140,9 @@ std::span<const OptionRow> ladderOptions() {
          [](Options& to, const std::string& value) { to.ladder.width = countIn(value, mostWidth); }},
         {"--ascii", "", "Draw with ASCII characters, also where the locale has UTF-8",
          [](Options& to, const std::string&) { to.ladder.ascii = true; }},
+        {"--dchannels", "",
+         "Name the D channel at each arrow. Without it, --svg and --mermaid do so if a call has several",
+         [](Options& to, const std::string&) { to.ladder.dChannels = true; }},
     };
     return rows;
 }

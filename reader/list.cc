@@ -5,6 +5,7 @@
 
 #include "reader/TextConsumer.h"
 #include "reader/errors.h"
+#include "reader/inputs.h"
 #include "reader/session.h"
 #include "reader/text.h"
 
@@ -19,6 +20,8 @@ constexpr std::string_view wide[] = {"n",      "time", "delta",   "trunk",   "pl
                                      "length", "ref",  "message", "details", "marks", "hex"};
 
 constexpr unsigned secondsWidth = 10;
+constexpr std::string_view blanks = "                                ";
+static_assert(blanks.size() == widestColumn + 1);
 
 // Adapts the time column: seconds are shorter than dates, and are aligned to the right.
 Column placed(std::string_view name, TimeForm time) {
@@ -41,6 +44,8 @@ std::vector<Column> chosenColumns(const ListOptions& options) {
         // If the time that is shown is the time since the line before, its column replaces the time column.
         if (options.time != TimeForm::delta || name != "time")
             chosen.push_back(placed(name, options.time));
+        if (name == deltaColumn && options.trunk && !options.wide)
+            chosen.push_back(columnNamed("trunk"));
     }
     return chosen;
 }
@@ -50,6 +55,17 @@ std::size_t placeOf(std::string_view name, const std::vector<Column>& columns) {
     const auto found = std::find_if(columns.begin(), columns.end(),
                                     [&](const Column& column) { return column.name == name; });
     return static_cast<std::size_t>(found - columns.begin());
+}
+
+// Appends the blanks that follow a column whose text has this length. One blank separates columns, but two
+// follow a message and other texts that contain blanks.
+void appendGap(std::string& text, const Column& column, std::size_t length) {
+    if (column.width == 0)
+        text += blanks.substr(0, length == 0 ? 0 : 2);
+    else if (length >= column.width || column.right)
+        text += ' ';
+    else
+        text += blanks.substr(0, column.width - length + 1);
 }
 
 void trimBlanks(std::string& text, std::size_t start) {
@@ -67,8 +83,8 @@ LineComposer::LineComposer(const ListOptions& options, bool colors)
 
 void LineComposer::compose(const Seen& seen, std::string& text, Piece& piece) {
     const std::size_t lineStart = text.size();
+    std::size_t end = lineStart;  // of the last column that has a text
     Cell cell{seen, text, times_, relative_, colors_};
-    // One blank follows a column, but two follow a message and other texts that contain blanks.
     for (std::size_t i = 0; i < columns_.size(); ++i) {
         const Column& column = columns_[i];
         const std::size_t start = text.size();
@@ -76,17 +92,16 @@ void LineComposer::compose(const Seen& seen, std::string& text, Piece& piece) {
         if (i == delta_) {
             piece.deltaAt = start;
             piece.deltaSize = deltaWidth;
+            text += blanks.substr(0, deltaWidth);
         }
         const std::size_t length = text.size() - start;
-        if (column.width == 0)
-            text.append(length == 0 ? 0 : 2, ' ');
-        else if (length >= column.width)
-            text += ' ';
-        else if (!column.right)
-            text.append(column.width - length + 1, ' ');
-        else
-            text.insert(start, column.width - length, ' ') += ' ';
+        if (length < column.width && column.right)
+            text.insert(start, blanks, 0, column.width - length);
+        if (length != 0)
+            end = text.size();
+        appendGap(text, column, length);
     }
+    text.resize(end);
     trimBlanks(text, std::max(lineStart, piece.deltaAt + piece.deltaSize));
     text += '\n';
 }
@@ -118,7 +133,9 @@ int runList(const Options& options, Chatter& chatter) {
     Output& out = session.output();
     const bool colors = session.useColors();
     TextConsumer consumer(out);
-    session.run(consumer, [&] { return std::make_unique<LineComposer>(options.list, colors); });
+    ListOptions list = options.list;
+    list.trunk = mayHaveSeveralDChannels(options);
+    session.run(consumer, [&] { return std::make_unique<LineComposer>(list, colors); });
     return good;
 }
 

@@ -117,8 +117,13 @@ void Session::tellWhatWasNotFound(const Outcome& outcome, const CallGate* gate) 
         return;  // the groups are the store's, and a standby D channel may have said nothing
     for (const std::vector<std::string>& group : options_.calls.groups) {
         for (const std::string& name : group) {
-            if (!tracker_.knows(name))
-                chatter_.wrongUsage("--nfas: nothing has come from a D channel " + name);
+            if (tracker_.knows(name))
+                continue;
+            const std::vector<std::string> files = inputFiles(options_);
+            const bool isFile = std::find(files.begin(), files.end(), name) != files.end();
+            chatter_.wrongUsage(
+                "--nfas: nothing has come from a D channel " + name +
+                (isFile ? ", which is a file; `calls --csv` shows the name of its D channel" : ""));
         }
     }
 }

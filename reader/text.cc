@@ -11,6 +11,16 @@ constexpr char hexDigits[] = "0123456789abcdef";
 constexpr bool isPrintable(char character) { return character >= ' ' && character <= '~'; }
 constexpr bool isSafe(char character) { return isPrintable(character) && character != '\\'; }
 
+// Looks at every character, so that the compiler can look at many at once: hardly any text is unsafe.
+bool isAllSafe(std::string_view text) {
+    unsigned char unsafe = 0;
+    for (const char character : text) {
+        const auto octet = static_cast<unsigned char>(character);
+        unsafe = static_cast<unsigned char>(unsafe | (octet < ' ') | (octet > '~') | (octet == '\\'));
+    }
+    return unsafe == 0;
+}
+
 void appendEscaped(std::string& to, char character) {
     const auto octet = static_cast<unsigned char>(character);
     const char escape[] = {'\\', 'x', hexDigits[octet >> 4], hexDigits[octet & 15]};
@@ -39,10 +49,9 @@ void appendEscaping(std::string& to, std::string_view text, IsPlain isPlain) {
 void appendSafe(std::string& to, std::string_view text) { appendEscaping(to, text, isSafe); }
 
 void makeSafe(std::string& text, std::size_t start) {
-    const auto from = text.begin() + static_cast<std::ptrdiff_t>(start);
-    if (std::all_of(from, text.end(), isSafe))
+    if (isAllSafe(std::string_view(text).substr(start)))
         return;
-    const std::string unsafe(from, text.end());
+    const std::string unsafe = text.substr(start);
     text.resize(start);
     appendSafe(text, unsafe);
 }

@@ -9,6 +9,7 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 namespace reader {
@@ -35,6 +36,10 @@ void appendHex(std::string& to, std::span<const std::uint8_t> octets);
 
 template <std::integral Number>
 void appendNumber(std::string& to, Number number, int base = 10) {
+    if (std::cmp_greater_equal(number, 0) && std::cmp_less(number, 10)) {
+        to += static_cast<char>('0' + number);
+        return;
+    }
     char digits[24];
     to.append(digits, std::to_chars(digits, digits + sizeof digits, number, base).ptr);
 }

@@ -14,8 +14,8 @@ using calls::test::CallScript;
 // Ladders of all calls of a script.
 class Taken : public calls::Listener {
   public:
-    std::vector<CallLadder> of(const CallScript& script) {
-        calls::Analysis analysis({}, *this);
+    std::vector<CallLadder> of(const CallScript& script, const calls::Options& options = {}) {
+        calls::Analysis analysis(options, *this);
         for (const calls::test::Sent& sent : script.frames()) {
             capture::Item item;
             item.frame = sent.frame;
@@ -115,6 +115,42 @@ TEST(CallLadder, BeginsEachNewDayWithItsDate) {
     ASSERT_EQ(ladder.rungs.size(), 3U);
     EXPECT_EQ(ladder.rungs[1].name, "2001-05-15");
     EXPECT_EQ(ladder.rungs[1].kind, Rung::Kind::words);
+}
+
+// A call whose messages change their D channel in the middle.
+CallScript callOnTwoDChannels() {
+    CallScript script;
+    script.on("b").linkUp().on("a").linkUp();
+    script.at(100).us(type::setup, 1, false);
+    script.at(200).on("b").peer(type::connect, 1, true, {calls::test::channel(2)});
+    return script;
+}
+
+TEST(CallLadder, NamesTheDChannelOfEachArrowOfACallThatHadSeveral) {
+    calls::Options options;
+    options.groups = {{"a", "b"}};
+    const CallLadder ladder = Taken().of(callOnTwoDChannels(), options).at(0);
+    ASSERT_EQ(ladder.rungs.size(), 2U);
+    EXPECT_TRUE(ladder.namesDChannels);
+    EXPECT_EQ(detailsOf(ladder, ladder.rungs[0]), (std::vector<std::string>{"on a"}));
+    EXPECT_EQ(detailsOf(ladder, ladder.rungs[1]), (std::vector<std::string>{"on b", "channel 2!"}));
+}
+
+TEST(CallLadder, NamesNoDChannelWhereThereIsOne) {
+    for (const CallLadder& ladder : Taken().of(callOnTwoDChannels())) {
+        EXPECT_FALSE(ladder.namesDChannels);
+        EXPECT_EQ(ladder.rungs.size(), 1U);
+    }
+}
+
+TEST(CallLadder, OfSeveralCallsNamesTheTerminalsAndDChannelsThatDiffer) {
+    CallScript script;
+    script.on("a").tei(0).us(type::setup, 1, false);
+    script.on("b").tei(5).at(10).us(type::setup, 2, false);
+    const CallLadder ladder = together(Taken().of(script), {1, 2});
+    ASSERT_EQ(ladder.rungs.size(), 2U);
+    EXPECT_EQ(detailsOf(ladder, ladder.rungs[0]), (std::vector<std::string>{"on a", "TEI 0", "call 1"}));
+    EXPECT_EQ(detailsOf(ladder, ladder.rungs[1]), (std::vector<std::string>{"on b", "TEI 5", "call 2"}));
 }
 
 TEST(Wrapped, BreaksLongItemsAtBlanksAndWordsWhereTheyEnd) {

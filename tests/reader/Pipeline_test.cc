@@ -4,6 +4,7 @@
 
 #include <array>
 #include <stdexcept>
+#include <vector>
 
 #include "tests/reader/streams.h"
 
@@ -34,6 +35,36 @@ class Frames : public capture::Reader {
     bool isBad_;
     capture::Interface interface_;
     std::array<std::uint8_t, 4> octets_{0x02, 0x01, 0x01, 0x01};
+};
+
+// Gives frames, and behind each of them a line that says that others were lost.
+class Losses : public Frames {
+  public:
+    using Frames::Frames;
+
+    Next next(capture::Item& item) override {
+        isLoss_ = !isLoss_;
+        if (isLoss_)
+            return Frames::next(item);
+        item.kind = capture::Item::Kind::lost;
+        item.count = 3;
+        item.frame.octets = {};
+        return Next::item;
+    }
+
+  private:
+    bool isLoss_ = false;
+};
+
+// Gathers the numbers of what comes; 0 stands for what is no frame.
+class Numbers : public Consumer {
+  public:
+    void take(Chunk& chunk, std::size_t count) override {
+        for (std::size_t i = 0; i < count; ++i)
+            numbers.push_back(chunk.seen()[chunk.pieces[i].item].number);
+    }
+    void flush() override {}
+    std::vector<std::uint64_t> numbers;
 };
 
 // Checks that frames come in their order, and may fail at one of them.
@@ -114,6 +145,18 @@ TEST_P(PipelineTest, LeavesOutSoManyInFront) {
         run(reader, counting, 1000, 0, skipped);
         EXPECT_EQ(counting.flushed, skipped + 1000);
     }
+}
+
+TEST_P(PipelineTest, CountsFramesAndNotWhatIsSaidBetweenThem) {
+    Losses reader(20'000);
+    Numbers consumer;
+    Work work;
+    work.makeComposer = [] { return std::make_unique<Failing>(~0ULL); };
+    work.jobs = GetParam();
+    work.first = 3;
+    work.skipped = 700;
+    runPipeline(reader, tracker_, filter_, consumer, chatter_, work);
+    EXPECT_EQ(consumer.numbers, (std::vector<std::uint64_t>{0, 701, 0, 702, 0, 703}));
 }
 
 TEST_P(PipelineTest, HandsOnWhatWasReadBeforeTheInputTurnedBad) {

@@ -5,7 +5,7 @@ import collections
 import json
 import unittest
 
-from lapdread_harness import EXAMPLES, RECORDED, SOURCE, output
+from lapdread_harness import EXAMPLES, RECORDED, SOURCE, Folder, output
 
 # A message of segments is heard as a whole, with its last segment.
 TRAPS = [path for path in sorted((SOURCE / "tests/reader/data/traps").glob("*.hex")) if path.stem != "segments"]
@@ -26,6 +26,16 @@ class Calls(unittest.TestCase):
                                                for number in call["frames"])
                 self.assertEqual(sorted(of_calls), messages)
                 self.assertEqual(set(of_calls.values()), {1} if messages else set())
+
+
+class Recordings(Folder):
+    def test_are_read_in_the_order_in_which_they_began_whatever_a_shell_makes_of_their_names(self):
+        lines = output("convert", "--quiet", "--to", "hex", EXAMPLES["net5"]).splitlines(keepends=True)
+        names = ["t.20010514T080000Z.hex", "t.20010514T080000Z.2.hex", "t.20010514T080000Z.10.hex"]
+        for i, name in enumerate(names):
+            (self.folder / name).write_text("".join(lines[40 * i:40 * i + 40]))
+        words = ("--tz", "UTC", "--columns", "n,time,message")
+        self.assertEqual(output(*words, *sorted(names), cwd=self.folder), output(*words, EXAMPLES["net5"]))
 
 
 if __name__ == "__main__":

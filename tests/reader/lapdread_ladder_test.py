@@ -42,6 +42,11 @@ class Ladders(unittest.TestCase):
                     sent = [number for number in listed if frames[number]["dir"] == "tx"]
                     self.assertEqual(len(ours), len(sent), shown)
 
+    def test_leave_no_empty_line_in_a_note_that_has_no_time(self):
+        text = output("ladder", "--quiet", "--mermaid", SOURCE / "tests/reader/data/traps/three-days.hex")
+        self.assertRegex(text, r"\n    Note over us,peer: \d{4}-\d\d-\d\d\n")
+        self.assertNotIn(": <br/>", text)
+
     def test_pictures_are_well_formed(self):
         for path in INPUTS:
             with self.subTest(path.name):

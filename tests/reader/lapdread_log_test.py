@@ -58,6 +58,11 @@ class Log(Folder):
         self.assertEqual(run("decode", EXAMPLES["ni2"])[2],
                          "lapdread: decoded as net5, since the input does not name its variant (--variant does)\n")
 
+    def test_explain_gives_neither_number_nor_direction_to_what_is_no_frame(self):
+        log = self.folder / "t.log"
+        log.write_bytes(run("convert", "--quiet", "--to", "log", EXAMPLES["net5"])[1])
+        self.assertEqual(output("explain", "--quiet", log).splitlines()[:2], [f"-, {log}:1", "-- the recorder started"])
+
 
 if __name__ == "__main__":
     unittest.main()

@@ -29,6 +29,10 @@ class Traps(unittest.TestCase):
         self.assertEqual(output("calls", "--csv", *nfas).count("\n") - 1, 1)
         self.assertEqual(output("calls", "--csv", "--merge", *both).count("\n") - 1, 2)
 
+    def test_d_channels_that_share_their_calls_are_read_in_the_order_of_time(self):
+        late_first = [TRAPS / "changeover-b.hex", TRAPS / "changeover-a.hex"]
+        self.assertEqual(output("calls", "--csv", "--nfas", "changeover-a,changeover-b", *late_first).count("\n") - 1, 1)
+
     def test_have_as_many_calls_as_their_names_say(self):
         calls = {"no-connect-acknowledge": 1, "hold-and-second-call": 2, "suspend-and-resume": 2, "segments": 2,
                  "register": 1, "overlap": 2, "basic-access-goes-idle": 3, "standby": 0, "three-days": 1}
