@@ -34,6 +34,18 @@ Reason reasonOf(natsStatus status, int jetStreamError) {
     return jetStreamError == JSInsufficientResourcesErr ? Reason::full : Reason::other;
 }
 
+// What the library says of the error that it has just returned; may be empty. Its text begins with a place in
+// its source: "(conn.c:2088): ".
+std::string detailOf(natsStatus status) {
+    natsStatus last = NATS_OK;
+    const char* const said = nats_GetLastError(&last);
+    if (last != status || said == nullptr)
+        return "";
+    const std::string_view text = said;
+    const std::size_t place = text.starts_with('(') ? text.find("): ") : text.npos;
+    return std::string(place == text.npos ? text : text.substr(place + 3));
+}
+
 // Without this function the library writes errors that no call returns to the standard error stream. The
 // program notices such errors anyway, by answers that do not come.
 void ignoreError(natsConnection*, natsSubscription*, natsStatus, void*) {}
@@ -75,12 +87,20 @@ OwnedOptions libraryOptions(const NatsOptions& options) {
 void require(natsStatus status, const std::string& wanted, int jetStreamError) {
     if (status == NATS_OK)
         return;
-    natsStatus last = NATS_OK;
-    const char* const detail = nats_GetLastError(&last);
     std::string what = "cannot " + wanted + ": " + natsStatus_GetText(status);
-    if (last == status && detail != nullptr && *detail != '\0')
-        what += std::string(" (") + detail + ")";
+    const std::string detail =
+        jetStreamError == JSStreamNotFoundErr ? "there is no such stream" : detailOf(status);
+    if (!detail.empty() && detail != natsStatus_GetText(status))
+        what += " (" + detail + ")";
     throw NatsError(reasonOf(status, jetStreamError), what);
+}
+
+void requireAnswer(const NatsConnection& connection, natsStatus status, const std::string& wanted,
+                   int jetStreamError) {
+    const std::string refusal = status == NATS_TIMEOUT ? connection.refusal() : std::string();
+    if (!refusal.empty())
+        throw NatsError(Reason::refused, "cannot " + wanted + ": " + refusal);
+    require(status, wanted, jetStreamError);
 }
 
 OwnedMessage makeMessage(const std::string& subject, const std::string& reply, std::string_view text,
@@ -130,12 +150,19 @@ std::string NatsConnection::serverProcess() const {
     return isKnown ? std::string(id.data()) : std::string();
 }
 
+std::string NatsConnection::refusal() const {
+    const char* said = nullptr;
+    const natsStatus last = natsConnection_GetLastError(handles_->connection.get(), &said);
+    return last == NATS_NOT_PERMITTED && said != nullptr ? std::string(said) : std::string();
+}
+
 void NatsConnection::publish(const std::string& subject, std::string_view text, const std::string& id,
                              Headers headers) {
     const OwnedMessage message = makeMessage(subject, "", text, id, headers);
     jsErrCode error{};
-    require(js_PublishMsg(nullptr, handles_->jetStream.get(), message.get(), nullptr, &error),
-            "publish to " + subject, error);
+    const natsStatus status =
+        js_PublishMsg(nullptr, handles_->jetStream.get(), message.get(), nullptr, &error);
+    requireAnswer(*this, status, "publish to " + subject, error);
 }
 
 }  // namespace fleet

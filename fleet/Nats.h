@@ -57,6 +57,10 @@ class NatsConnection {
     // The server's name for its own process, a new one whenever it is started; empty while there is no
     // connection.
     std::string serverProcess() const;
+    // What the server has said most recently when it did not permit something: "Permissions Violation for
+    // Publish to ..."; empty if it has permitted everything on this connection. It does not answer such a
+    // request.
+    std::string refusal() const;
 
     using Headers = std::span<const std::pair<std::string, std::string>>;
     // Sends a message to the stream that takes the subject, and waits until the stream has stored it. Throws

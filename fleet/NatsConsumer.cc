@@ -17,7 +17,7 @@ struct MessageList {
     MessageList& operator=(const MessageList&) = delete;
 };
 
-void makeConsumer(jsCtx* jetStream, const ConsumerRules& rules) {
+void makeConsumer(NatsConnection& connection, const ConsumerRules& rules) {
     jsConsumerConfig wanted;
     jsConsumerConfig_Init(&wanted);
     wanted.Durable = rules.durable.c_str();
@@ -29,10 +29,11 @@ void makeConsumer(jsCtx* jetStream, const ConsumerRules& rules) {
     wanted.MaxDeliver = -1;  // for ever
     jsConsumerInfo* made = nullptr;
     jsErrCode error{};
-    const natsStatus status =
-        js_AddConsumer(&made, jetStream, rules.stream.c_str(), &wanted, nullptr, &error);
+    const natsStatus status = js_AddConsumer(&made, connection.handles().jetStream.get(),
+                                             rules.stream.c_str(), &wanted, nullptr, &error);
     const OwnedConsumerInfo owned(made);
-    require(status, "make the consumer " + rules.durable + " of the stream " + rules.stream, error);
+    requireAnswer(connection, status, "make the consumer " + rules.durable + " of the stream " + rules.stream,
+                  error);
 }
 
 }  // namespace
@@ -100,7 +101,7 @@ NatsConsumer::NatsConsumer(NatsConnection& connection, const ConsumerRules& rule
     jsCtx* const jetStream = connection.handles().jetStream.get();
     handle_->connection = &connection;
     handle_->rules = rules;
-    makeConsumer(jetStream, rules);
+    makeConsumer(connection, rules);
     // A subscription that is bound to an existing consumer does not delete the consumer at its end.
     jsSubOptions bound;
     jsSubOptions_Init(&bound);
@@ -111,7 +112,7 @@ NatsConsumer::NatsConsumer(NatsConnection& connection, const ConsumerRules& rule
     const natsStatus status = js_PullSubscribe(&made, jetStream, rules.filter.c_str(), rules.durable.c_str(),
                                                nullptr, &bound, &error);
     handle_->subscription.reset(made);
-    require(status, "use the consumer " + rules.durable, error);
+    requireAnswer(connection, status, "use the consumer " + rules.durable, error);
 }
 
 NatsConsumer::~NatsConsumer() = default;
@@ -136,15 +137,27 @@ std::vector<NatsMessage> NatsConsumer::fetch(std::size_t most, std::chrono::mill
     return messages;
 }
 
-std::uint64_t NatsConsumer::waiting() {
+std::optional<std::uint64_t> NatsConsumer::waiting() {
     jsConsumerInfo* info = nullptr;
     jsErrCode error{};
     const natsStatus status =
         js_GetConsumerInfo(&info, handle_->connection->handles().jetStream.get(),
                            handle_->rules.stream.c_str(), handle_->rules.durable.c_str(), nullptr, &error);
     const OwnedConsumerInfo owned(info);
-    require(status, "ask about a consumer", error);
+    if (error == JSConsumerNotFoundErr)
+        return std::nullopt;
+    requireAnswer(*handle_->connection, status, "ask about a consumer", error);
     return info->NumPending;
+}
+
+bool deleteConsumer(NatsConnection& connection, const std::string& stream, const std::string& durable) {
+    jsErrCode error{};
+    const natsStatus status = js_DeleteConsumer(connection.handles().jetStream.get(), stream.c_str(),
+                                                durable.c_str(), nullptr, &error);
+    if (error == JSConsumerNotFoundErr)
+        return false;
+    requireAnswer(connection, status, "delete the consumer " + durable + " of the stream " + stream, error);
+    return true;
 }
 
 }  // namespace fleet

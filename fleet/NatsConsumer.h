@@ -5,6 +5,7 @@
 #include <chrono>
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -61,15 +62,21 @@ class NatsConsumer {
     NatsConsumer& operator=(const NatsConsumer&) = delete;
 
     // Waits for messages and returns at least one and at most `most`; returns none if none comes within the
-    // time. Throws NatsError.
+    // time, or if somebody has deleted the consumer: NATS does not tell these apart, but waiting() does.
+    // Throws NatsError.
     std::vector<NatsMessage> fetch(std::size_t most, std::chrono::milliseconds wait);
-    // How many messages of the stream have not been delivered to this consumer yet. Throws NatsError.
-    std::uint64_t waiting();
+    // How many messages of the stream have not been delivered to this consumer yet; nothing if somebody has
+    // deleted it. Throws NatsError.
+    std::optional<std::uint64_t> waiting();
 
   private:
     struct Handle;
     std::unique_ptr<Handle> handle_;
 };
+
+// Deletes a durable consumer, so that the next one of this name gets again all messages that the stream
+// has. Returns false if there was none. Throws NatsError.
+bool deleteConsumer(NatsConnection& connection, const std::string& stream, const std::string& durable);
 
 }  // namespace fleet
 

@@ -38,6 +38,11 @@ struct NatsConnection::Handles {
 // NATS".
 void require(natsStatus status, const std::string& wanted, int jetStreamError = 0);
 
+// The same for a request that the server answers. If no answer has come because the server does not permit
+// the request, the error says so.
+void requireAnswer(const NatsConnection& connection, natsStatus status, const std::string& wanted,
+                   int jetStreamError = 0);
+
 // Makes a message that can be sent. Throws NatsError.
 OwnedMessage makeMessage(const std::string& subject, const std::string& reply, std::string_view text,
                          const std::string& id, NatsConnection::Headers headers);

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <charconv>
 #include <nlohmann/json.hpp>
+#include <utility>
 
 #include "fleet/NatsHandles.h"
 
@@ -82,6 +83,7 @@ void NatsPublisher::send(const std::string& subject, std::string_view text, cons
                          std::uint64_t token) {
     const std::string reply = std::string(inbox_->prefix.name) + "." + std::to_string(token);
     const OwnedMessage message = makeMessage(subject, reply, text, id, {});
+    subjects_.try_emplace(subject, false);
     require(natsConnection_PublishMsg(connection_.handles().connection.get(), message.get()),
             "publish to " + subject);
 }
@@ -90,7 +92,7 @@ std::optional<NatsPublisher::Answer> NatsPublisher::answer(std::chrono::millisec
     natsMsg* got = nullptr;
     const natsStatus status = natsSubscription_NextMsg(&got, inbox_->answers.get(), wait.count());
     if (status == NATS_TIMEOUT)
-        return std::nullopt;
+        return refused();
     Answer answer;
     if (status == NATS_NO_RESPONDERS) {
         answer.error = "no stream takes the subject, or none is reachable";
@@ -100,6 +102,24 @@ std::optional<NatsPublisher::Answer> NatsPublisher::answer(std::chrono::millisec
     const OwnedMessage message(got);
     answer.token = tokenOf(natsMsg_GetSubject(got));
     readAnswer({natsMsg_GetData(got), static_cast<std::size_t>(natsMsg_GetDataLength(got))}, answer);
+    return answer;
+}
+
+// The server answers nothing to a message that it does not permit. The connection knows the newest refusal,
+// which may be about something else: 'Permissions Violation for Publish to "lapd.17.london.h1.0.1"'. The
+// library cuts long texts off.
+std::optional<NatsPublisher::Answer> NatsPublisher::refused() {
+    const std::string refusal = connection_.refusal();
+    const std::size_t quote = refusal.find('"');
+    if (quote == refusal.npos)
+        return std::nullopt;
+    const std::string_view subject =
+        std::string_view(refusal).substr(quote + 1, refusal.find('"', quote + 1) - quote - 1);
+    const auto found = subjects_.lower_bound(subject);
+    if (found == subjects_.end() || !found->first.starts_with(subject) || std::exchange(found->second, true))
+        return std::nullopt;
+    Answer answer;
+    answer.error = refusal;
     return answer;
 }
 

@@ -2,15 +2,18 @@
 #ifndef FLEET_NATSPUBLISHER_H
 #define FLEET_NATSPUBLISHER_H
 
+#include <functional>
+#include <map>
 #include <memory>
+#include <string>
 
 #include "fleet/Carrier.h"
 #include "fleet/Nats.h"
 
 namespace fleet {
 
-// The answers are those of the stream that takes the subject. Used only by the thread that uses the
-// connection.
+// The answers are those of the stream that takes the subject. If the server does not permit a subject, an
+// answer without a token says so, once for each subject. Used only by the thread that uses the connection.
 class NatsPublisher final : public Carrier {
   public:
     // The connection must outlive this object. Throws NatsError.
@@ -22,9 +25,12 @@ class NatsPublisher final : public Carrier {
     std::optional<Answer> answer(std::chrono::milliseconds wait) override;
 
   private:
+    std::optional<Answer> refused();
+
     struct Inbox;
     NatsConnection& connection_;
     std::unique_ptr<Inbox> inbox_;
+    std::map<std::string, bool, std::less<>> subjects_;  // that were sent to; true: was told to be refused
 };
 
 }  // namespace fleet

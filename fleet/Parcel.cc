@@ -17,8 +17,8 @@ using Output = nlohmann::ordered_json;  // people read it, too
 using Kind = capture::Item::Kind;
 
 constexpr unsigned version = 1;
-constexpr std::uint64_t mostNumber = std::numeric_limits<std::int64_t>::max();  // what the store can hold
-constexpr std::int64_t latest = 7'258'118'399'000'000'000;                      // the end of the year 2199
+constexpr std::uint64_t mostNumber = Parcel::mostNumber;
+constexpr std::int64_t latest = Parcel::latest;
 
 bool hasOctets(Kind kind) { return kind == Kind::frame || kind == Kind::cut; }
 bool isNumbered(Kind kind) { return kind == Kind::frame || kind == Kind::oversized; }

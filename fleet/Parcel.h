@@ -58,6 +58,8 @@ struct Parcel {
     static constexpr std::size_t mostOctets = 4096;    // of one frame
     static constexpr std::size_t longestText = 1000;   // octets of a text, or of the D channel's name
     static constexpr std::size_t largest = 1'000'000;  // octets of a parcel's text
+    static constexpr std::int64_t latest = 7'258'118'399'000'000'000;       // time: the end of the year 2199
+    static constexpr std::uint64_t mostNumber = 9'223'372'036'854'775'807;  // what the store can hold
 
     Address address;
     std::string trunk;  // the D channel's name, as commands show it

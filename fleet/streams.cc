@@ -73,7 +73,7 @@ void makeStream(NatsConnection& connection, const StreamRules& rules) {
     if (error == JSStreamNameExistErr)
         status = js_UpdateStream(&made, jetStream, config.get(), nullptr, &error);
     const OwnedStreamInfo owned(made);
-    require(status, "make the stream " + rules.name, error);
+    requireAnswer(connection, status, "make the stream " + rules.name, error);
 }
 
 StreamFilling fillingOf(NatsConnection& connection, const std::string& stream) {
@@ -82,7 +82,7 @@ StreamFilling fillingOf(NatsConnection& connection, const std::string& stream) {
     const natsStatus status =
         js_GetStreamInfo(&info, connection.handles().jetStream.get(), stream.c_str(), nullptr, &error);
     const OwnedStreamInfo owned(info);
-    require(status, "ask about the stream " + stream, error);
+    requireAnswer(connection, status, "ask about the stream " + stream, error);
     const std::int64_t most = info->Config->MaxBytes;
     return {info->State.Msgs, info->State.Bytes, most > 0 ? static_cast<std::uint64_t>(most) : 0};
 }

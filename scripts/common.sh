@@ -49,7 +49,7 @@ CHECK_PACKAGES=(clang-format clang-tidy cppcheck)
 TEST_PACKAGES=(bash-completion chromium-headless-shell groff-base libgtest-dev libgmock-dev libbenchmark-dev man-db mandoc
                nats-server openssl postgresql prometheus prometheus-alertmanager python3 python3-jsonschema tmux tshark
                zsh)
-FLEET_PACKAGES=(nats-server openssl postgresql prometheus python3 util-linux)
+FLEET_PACKAGES=(curl jq nats-server openssl postgresql prometheus python3 util-linux)
 PACKAGE_PACKAGES=(dpkg-dev gzip lintian)
 
 # build_preset PRESET [OPTION...] [--target NAME]: configures a preset, and builds it or the target. Shows the compiler's

@@ -87,9 +87,10 @@ class Snapshot {
         }
         for (const std::string& name : query_.trunks) {
             if (std::none_of(all_.begin(), all_.end(), [&](const auto& each) {
-                    return each.second.name == name || each.second.address == name;
+                    return (query_.sites.empty() || isNamed(query_.sites, each.first)) &&
+                           (each.second.name == name || each.second.address == name);
                 }))
-                refuse("trunk", name);
+                refuse(query_.sites.empty() ? "trunk" : "trunk of these sites:", name);
         }
     }
 

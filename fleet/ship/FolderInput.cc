@@ -123,7 +123,7 @@ std::size_t FolderInput::fileBehindPlace() const {
 bool FolderInput::openFile(const recording::RecordedFile& file) {
     const std::string finished = folder_ + "/" + file.name;
     const std::string unfinished = finished + std::string(recording::unfinishedEnding);
-    const bool isLast = file.name == state_.files.back().name;
+    const bool isLast = !state_.files.empty() && file.name == state_.files.back().name;
     for (const std::string& path : {finished, unfinished, finished}) {
         if (!std::filesystem::exists(path))
             continue;
@@ -148,11 +148,16 @@ bool FolderInput::openFile(const recording::RecordedFile& file) {
 
 FolderInput::Step FolderInput::read(InputEvent& event) {
     try {
-        if (reader_->next(event.item) == capture::Reader::Next::item) {
+        const bool isItem = reader_->next(event.item) == capture::Reader::Next::item;
+        if (!(isItem && event.item.isFrame()) && wasCutBack())
+            return readAnew();
+        if (isItem) {
             give(event);
             return Step::event;
         }
     } catch (const capture::BadInput&) {
+        if (wasCutBack())
+            return readAnew();
         finishFile();
         throw;
     }
@@ -162,6 +167,18 @@ FolderInput::Step FolderInput::read(InputEvent& event) {
         return isComplete_ ? Step::again : Step::pause;
     }
     finishFile();
+    return Step::again;
+}
+
+// When the disk is full, the recorder cuts its file back to the last whole item. A reader that follows the
+// file may have read further. It takes that for damage and for another file, and begins at its first frame.
+bool FolderInput::wasCutBack() const { return isFollowed_ && reader_->progress().isReplaced; }
+
+// Reads the file once more from its beginning, where all that was given before is old.
+FolderInput::Step FolderInput::readAnew() {
+    reader_.reset();
+    if (!openFile(file_))
+        done_ = file_.name;
     return Step::again;
 }
 

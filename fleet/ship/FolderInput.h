@@ -35,6 +35,7 @@ class FolderInput final : public TrunkInput {
 
     Step choose(InputEvent& event);
     Step read(InputEvent& event);
+    Step readAnew();
     Step endRun(InputEvent& event);
     Step skipTo(std::uint64_t first, InputEvent& event);
     void refresh();
@@ -42,6 +43,7 @@ class FolderInput final : public TrunkInput {
     std::size_t firstFile();
     std::size_t fileBehindPlace() const;
     bool openFile(const recording::RecordedFile& file);
+    bool wasCutBack() const;
     void give(InputEvent& event);
     bool isComplete() const;
     void finishFile();

@@ -11,8 +11,8 @@ namespace {
 
 using Kind = capture::Item::Kind;
 
-constexpr std::int64_t latest = 7'258'118'399'000'000'000;  // the latest time that a parcel may hold
-constexpr std::uint64_t latestRun = 7'258'118'399'000'000;
+constexpr std::int64_t latest = Parcel::latest;
+constexpr std::uint64_t latestRun = latest / 1000;
 
 std::int64_t timeOf(const capture::Frame& frame, std::uint64_t run, std::uint64_t number) {
     const auto begun = static_cast<std::int64_t>(std::min(run, latestRun)) * 1000;
@@ -33,7 +33,7 @@ ParcelItem parcelItem(const capture::Item& item, std::uint64_t run, std::uint64_
     if (isNumbered(item) || frame.clock == capture::Clock::absolute)
         to.time = timeOf(frame, run, number);
     to.ticks = frame.ticks;
-    if (frame.written && *frame.written >= 0)
+    if (frame.written && *frame.written >= 0 && *frame.written <= latest)
         to.written = frame.written;
     to.transmitted = frame.transmitted;
     to.role = frame.role;
@@ -45,7 +45,7 @@ ParcelItem parcelItem(const capture::Item& item, std::uint64_t run, std::uint64_
     }
     if (isNumbered(item))
         return to;
-    to.count = item.count;
+    to.count = std::min(item.count, Parcel::mostNumber);
     to.text = cleanUtf8(item.text, Parcel::longestText);
     if (item.kind == Kind::run)
         to.variant = frame.interface->variant;

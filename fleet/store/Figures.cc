@@ -108,7 +108,10 @@ void trunksAsText(Exposition& to, const Partitions& all) {
               "How often frames are missing for good, as the shipper says.",
               [&](const Trunk& trunk) { put(to, trunk, trunk.gaps); });
     eachTrunk(to, all, "lapdstore_newest_frame_timestamp_seconds", Type::gauge,
-              "When the newest frame was recorded; 0 if none has come.", [&](const Trunk& trunk) {
+              "When the newest frame was recorded; 0 if none has come in this direction.",
+              [&](const Trunk& trunk) {
+                  if (trunk.newest == decltype(trunk.newest){})
+                      return;  // nothing has come since the partition was leased
                   put(to, trunk, "direction", "rx", secondsOf(trunk.newest[0]));
                   put(to, trunk, "direction", "tx", secondsOf(trunk.newest[1]));
               });

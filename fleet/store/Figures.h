@@ -51,7 +51,7 @@ struct PartitionFigures {
     std::uint64_t holes = 0;               // runs that wait for a frame now
     std::int64_t lag = 0;                  // how long the newest letters waited in the stream, nanoseconds
     std::optional<std::uint64_t> waiting;  // letters that wait in the stream; empty if it was not asked yet
-    std::map<std::string, TrunkFigures> trunks;  // by address
+    std::map<std::string, TrunkFigures> trunks;  // by address; all that the store knows
 };
 
 // Figures of PostgreSQL and of the stream.

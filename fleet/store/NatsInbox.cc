@@ -11,10 +11,12 @@ namespace fleet {
 
 namespace {
 
+std::string consumerOf(unsigned partition) { return "lapdstore-" + std::to_string(partition); }
+
 ConsumerRules rulesOf(unsigned partition, std::chrono::seconds againAfter) {
     ConsumerRules rules;
     rules.stream = centreStream;
-    rules.durable = "lapdstore-" + std::to_string(partition);
+    rules.durable = consumerOf(partition);
     rules.filter = subjectsOf(partition);
     rules.forAcknowledging = againAfter;
     return rules;
@@ -52,6 +54,10 @@ void NatsInbox::acknowledge() {
             held_[i].acknowledge();
     }
     held_.clear();
+}
+
+bool rewind(NatsConnection& connection, unsigned partition) {
+    return deleteConsumer(connection, centreStream, consumerOf(partition));
 }
 
 }  // namespace fleet

@@ -2,6 +2,7 @@
 #ifndef FLEET_STORE_NATSINBOX_H
 #define FLEET_STORE_NATSINBOX_H
 
+#include <optional>
 #include <vector>
 
 #include "fleet/NatsConsumer.h"
@@ -20,14 +21,18 @@ class NatsInbox : public Inbox {
     void bury(const DeadLetter& dead) override;
     void acknowledge() override;
 
-    // How many letters wait in the stream.
-    std::uint64_t waiting() { return consumer_.waiting(); }
+    // How many letters wait in the stream; nothing if somebody has deleted the consumer. No letter comes any
+    // more then. A new NatsInbox makes the consumer anew, and gets all letters that the stream has.
+    std::optional<std::uint64_t> waiting() { return consumer_.waiting(); }
 
   private:
     NatsConnection& connection_;
     NatsConsumer consumer_;
     std::vector<NatsMessage> held_;
 };
+
+// Deletes the consumer of the partition. Returns false if there was none. Throws NatsError.
+bool rewind(NatsConnection& connection, unsigned partition);
 
 }  // namespace fleet
 

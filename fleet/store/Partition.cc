@@ -92,6 +92,24 @@ Partition::Partition(pqxx::connection_base& connection, unsigned partition, Step
     callsTable().prepare(connection);
     findingsTable().prepare(connection);
     commitForGood(connection);
+    beginFigures();
+}
+
+// A trunk that is known has its figures from now on. If they began with its next frames, a finding in these
+// would be no increase, and raise no alert.
+void Partition::beginFigures() {
+    pqxx::nontransaction work(connection_);
+    for (const pqxx::row& row : work.exec_params(
+             "SELECT trunk, name, nfas, site, host, board, dchannel FROM lapd.trunks WHERE partition = $1",
+             partition_)) {
+        const Address at{row[3].c_str(), row[4].c_str(), row[5].c_str(), row[6].c_str()};
+        TrunkFigures& figures = figures_.trunks[toText(at)];
+        figures.trunk = row[0].as<int>();
+        figures.name = row[1].c_str();
+        figures.group = row[2].c_str();
+        figures.site = at.site;
+        figures.address = toText(at);
+    }
 }
 
 std::vector<DeadLetter> Partition::take(std::span<const Letter> letters) {

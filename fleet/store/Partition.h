@@ -27,7 +27,8 @@ using Steps = std::function<void(std::string_view step)>;
 // can be used again if its connection still works. Used by one thread at a time.
 class Partition {
   public:
-    // Makes the connection ready for writing. The connection must outlive this object. Throws pqxx::failure.
+    // Makes the connection ready for writing, and reads which trunks the partition has, so that their figures
+    // begin at 0. The connection must outlive this object. Throws pqxx::failure.
     Partition(
         pqxx::connection_base& connection, unsigned partition, Steps steps = [](std::string_view) {});
 
@@ -55,6 +56,7 @@ class Partition {
     void store(std::span<const Letter> letters, std::vector<DeadLetter>& dead);
     std::vector<DeadLetter> bury(const Letter& letter, const std::exception& error);
     void forget();
+    void beginFigures();
     void takeParcel(Work& work, const Parcel& parcel);
     const Known& trunkOf(pqxx::transaction_base& work, const Parcel& parcel);
     void beginRun(pqxx::transaction_base& work, const RunKey& key, const Known& trunk);

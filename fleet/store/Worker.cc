@@ -4,6 +4,7 @@
 #include <chrono>
 #include <map>
 #include <memory>
+#include <optional>
 #include <pqxx/pqxx>
 #include <thread>
 #include <utility>
@@ -23,7 +24,6 @@ using SteadyClock = std::chrono::steady_clock;
 constexpr auto betweenTries = 2s;
 constexpr auto beforeBeginningAnew = 1s;
 constexpr auto betweenFigures = 1s;
-constexpr auto betweenQuestions = 10s;
 constexpr auto betweenEngines = 60s;
 constexpr auto afterNoAnswer = 5min;
 constexpr auto moreToBeSure = 10s;
@@ -100,18 +100,30 @@ class Shift {
         }
     }
 
-    // Hands out the figures of the partition once a second. Asks the server more rarely how many parcels
-    // wait.
+    // Hands out the figures of the partition once a second.
     void tell(unsigned number, Held& held) {
         const auto now = SteadyClock::now();
+        if (now >= std::max(held.nextWaiting, mayAskFrom_)) {
+            held.nextWaiting = now + options_.betweenQuestions;
+            askWaiting(held);
+        }
         if (options_.figures == nullptr || now < held.nextFigures)
             return;
         held.nextFigures = now + betweenFigures;
-        if (now >= std::max(held.nextWaiting, mayAskFrom_)) {
-            held.nextWaiting = now + betweenQuestions;
-            ask([&] { held.partition.sawWaiting(held.inbox.waiting()); });
-        }
         options_.figures->set(number, held.partition.figures());
+    }
+
+    // Asks the server how many parcels wait. Only this answer tells that the consumer was deleted; a fetch
+    // then merely gives none.
+    void askWaiting(Held& held) {
+        bool isThere = true;
+        ask([&] {
+            const std::optional<std::uint64_t> waiting = held.inbox.waiting();
+            isThere = waiting.has_value();
+            held.partition.sawWaiting(waiting.value_or(0));
+        });
+        if (!isThere)
+            throw NatsError(NatsError::Reason::other, "its consumer was deleted, and is made anew");
     }
 
     void tellEngines() {
@@ -130,8 +142,8 @@ class Shift {
         });
     }
 
-    // Asks a server something that only the figures need. If it does not answer, it is not asked again for a
-    // while, so that the work is not held up.
+    // Asks a server something that can wait. If it does not answer, it is not asked again for a while, so
+    // that the work is not held up.
     template <class Question>
     void ask(Question question) {
         try {

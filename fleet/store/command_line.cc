@@ -21,15 +21,16 @@ constexpr const char* footer =
 struct Commands {
     CLI::App* migrate = nullptr;
     CLI::App* forget = nullptr;
+    CLI::App* rewind = nullptr;
 };
 
 Commands describe(CLI::App& app, StoreCommand& to) {
     app.footer(footer);
     app.set_help_flag("--help,-h", "Print this and exit");
     app.set_version_flag("--version", "lapdstore " LAPDSTORE_VERSION, "Print the version and exit");
-    app.add_option("--database", to.database, "The database: postgresql://USER@HOST/lapd")
-        ->type_name("URL")
-        ->required();
+    app.add_option("--database", to.database,
+                   "The database: postgresql://USER@HOST/lapd; only rewind needs none")
+        ->type_name("URL");
     app.add_option("--nats", to.nats.servers, "A server of NATS: tls://HOST:4222; may be given several times")
         ->type_name("URL")
         ->allow_extra_args(false);
@@ -62,10 +63,22 @@ Commands describe(CLI::App& app, StoreCommand& to) {
         ->type_name("N")
         ->required()
         ->check(CLI::Range(1, 36'500).description(""));
-    for (CLI::App* const each : {commands.migrate, commands.forget})
+    commands.rewind = app.add_subcommand(
+        "rewind", "Lets the stream deliver again what it still has of the partitions, and ends");
+    for (CLI::App* const each : {commands.migrate, commands.forget, commands.rewind})
         each->fallthrough();
     app.require_subcommand(0, 1);
     return commands;
+}
+
+// What stores needs both engines; the other commands need one each.
+void requireEngines(const StoreCommand& command) {
+    using What = StoreCommand::What;
+    if (command.what != What::rewind && command.database.empty())
+        throw BadStoreCommand("--database is required (--help tells more)");
+    const bool isOnStream = command.what == What::run || command.what == What::rewind;
+    if (isOnStream && command.nats.servers.empty())
+        throw BadStoreCommand("--nats names no server (--help tells more)");
 }
 
 }  // namespace
@@ -89,8 +102,9 @@ StoreCommand parseStoreCommand(int argc, const char* const* argv) {
         command.what = StoreCommand::What::migrate;
     if (commands.forget->parsed())
         command.what = StoreCommand::What::forget;
-    if (command.what == StoreCommand::What::run && command.nats.servers.empty())
-        throw BadStoreCommand("--nats names no server (--help tells more)");
+    if (commands.rewind->parsed())
+        command.what = StoreCommand::What::rewind;
+    requireEngines(command);
     if (!command.metrics.empty() && !isListenAddress(command.metrics))
         throw BadStoreCommand("--metrics " + command.metrics +
                               " is no address to listen on, such as 127.0.0.1:9471");

@@ -24,7 +24,8 @@ struct StoreCommand {
     enum class What : std::uint8_t {
         run,      // stores parcels until a signal ends it
         migrate,  // makes the tables, or brings them up to date
-        forget    // deletes what is older than `days`
+        forget,   // deletes what is older than `days`
+        rewind    // lets the stream deliver the partitions again; has no database
     };
 
     std::string told;  // if not empty: the text of --help or --version, to be printed before the program ends

@@ -9,6 +9,7 @@
 
 #include "fleet/metrics/HttpAnswerer.h"
 #include "fleet/store/Migrations.h"
+#include "fleet/store/NatsInbox.h"
 #include "fleet/store/Worker.h"
 #include "fleet/store/command_line.h"
 #include "service/notify.h"
@@ -55,6 +56,16 @@ void forget(const fleet::StoreCommand& command) {
     std::cout << "days forgotten: " << row[0].c_str() << "\n";
 }
 
+void rewind(const fleet::StoreCommand& command) {
+    fleet::NatsOptions options = command.nats;
+    options.name = "lapdstore rewind";
+    fleet::NatsConnection connection(options);
+    unsigned rewound = 0;
+    for (unsigned partition = command.firstPartition; partition <= command.lastPartition; ++partition)
+        rewound += fleet::rewind(connection, partition) ? 1 : 0;
+    std::cout << "partitions that the stream delivers again: " << rewound << "\n";
+}
+
 void run(const fleet::StoreCommand& command) {
     stopOnSignals();
     fleet::StoreFigures figures;
@@ -91,6 +102,8 @@ void obey(const fleet::StoreCommand& command) {
             return migrate(command);
         case fleet::StoreCommand::What::forget:
             return forget(command);
+        case fleet::StoreCommand::What::rewind:
+            return rewind(command);
     }
 }
 

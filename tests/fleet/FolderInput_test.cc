@@ -172,6 +172,32 @@ TEST_F(FolderInputTest, WhatAKilledRecorderHasLeftOfAFrameIsSaidAndHasNoNumber) 
     EXPECT_EQ(rest.find("7/3"), std::string::npos) << rest;
 }
 
+// The reader looks while the torn frame is in the file, and again while the file is cut back and has its name
+// of an unfinished file, or only when it has the name of a finished one.
+TEST_F(FolderInputTest, AFileThatIsCutBackUnderTheReaderIsNeitherDamageNorAnotherFile) {
+    for (const bool looksBehindTheCut : {true, false}) {
+        fleet_tests::Folder folder;
+        fleet_tests::Recordings recorder{folder.path()};
+        FolderInput input{folder.path(), "pri1", {}, Before::nothing};
+        recorder.begin(7, 1);
+        recorder.frames(2);
+        EXPECT_EQ(restOf(input), "7/1:00010001 7/2:00010002");
+        std::string seen;
+        const auto look = [&] { seen += restOf(input) + ";"; };
+        recorder.runOutOfRoom(look, [&] {
+            if (looksBehindTheCut)
+                look();
+        });
+        look();
+        const std::string old = "(7/1:00010001) (7/2:00010002);";
+        EXPECT_EQ(seen, looksBehindTheCut ? ";" + old + ";" : ";" + old);
+        recorder.begin(7, 4);
+        recorder.lost(1);
+        recorder.frames(1);
+        EXPECT_EQ(restOf(input), "gap=3-3 frames-lost=1 7/4:00010004");
+    }
+}
+
 TEST_F(FolderInputTest, AFileThatIsNoRecordingIsSaidAndItsFramesAreAGap) {
     recorder_.begin(7, 1);
     recorder_.frames(2);

@@ -48,7 +48,8 @@ const Certificates& Certificates::get() {
 
 Certificates::Certificates() : folder_(temporaryFolder()), strangers_(temporaryFolder()) {
     const std::string script = LAPDMON_SOURCE_DIR "/scripts/fleet-certificates ";
-    run(script + folder_.string() + " server:127.0.0.1,localhost client:shipper client:store");
+    run(script + folder_.string() +
+        " server:127.0.0.1,localhost client:admin client:leeds client:shipper client:store");
     run(script + strangers_.string() + " client:store");
 }
 
@@ -73,9 +74,19 @@ void NatsServer::writeConfiguration() const {
     const Certificates& files = Certificates::get();
     to << "tls { cert_file: \"" << files.file("127.0.0.1.pem") << "\", key_file: \""
        << files.file("127.0.0.1.key") << "\", ca_file: \"" << files.file("authority.pem")
-       << "\", verify_and_map: true }\nauthorization { users: [ { user: store }, { user: shipper, "
-          "permissions: "
-          "{ publish: [ \"lapd.>\", \"$JS.API.STREAM.INFO.LAPD_SITE\" ], subscribe: \"_INBOX.>\" } } ] }\n";
+       << "\", verify_and_map: true }\n"
+       << R"(authorization { users: [
+    { user: admin }
+    { user: leeds, permissions: { publish: [ "lapd.*.leeds.>", "$JS.API.STREAM.INFO.LAPD_SITE" ],
+                                  subscribe: "_INBOX.>" } }
+    { user: shipper, permissions: { publish: [ "lapd.>", "$JS.API.STREAM.INFO.LAPD_SITE" ],
+                                    subscribe: "_INBOX.>" } }
+    { user: store, permissions: { publish: [ "$JS.API.CONSUMER.DURABLE.CREATE.LAPD.*",
+                                             "$JS.API.CONSUMER.CREATE.LAPD.>", "$JS.API.CONSUMER.INFO.LAPD.*",
+                                             "$JS.API.CONSUMER.MSG.NEXT.LAPD.*", "$JS.API.STREAM.INFO.LAPD",
+                                             "$JS.ACK.>", "lapd-dead.>" ],
+                                  subscribe: "_INBOX.>" } } ] }
+)";
 }
 
 void NatsServer::start() {

@@ -30,8 +30,9 @@ class NatsServer {
   public:
     enum class Security { none, certificates };
 
-    // With certificates, "shipper" may publish below "lapd." only and "store" may do all. Throws
-    // std::runtime_error if the server does not start.
+    // With certificates, "admin" may do all, "shipper" may publish below "lapd." only, "leeds" may publish
+    // frames of the site leeds only, and "store" may do what lapdstore does. Throws std::runtime_error if the
+    // server does not start.
     explicit NatsServer(Security security = Security::none);
     // Kills it.
     ~NatsServer();
@@ -48,7 +49,7 @@ class NatsServer {
     void freeze();
     void thaw();
 
-    fleet::NatsOptions options(const std::string& user = "store") const;
+    fleet::NatsOptions options(const std::string& user = "admin") const;
 
   private:
     void writeConfiguration() const;

@@ -152,6 +152,21 @@ TEST_F(Nats, WhatIsAcknowledgedDoesNotComeAgainAndWhatIsGivenBackDoes) {
     EXPECT_TRUE(again.fetch(4, 10ms).empty());
 }
 
+TEST_F(Nats, AConsumerThatWasDeletedGivesNothingMoreAndTheNextOneGivesAllAgain) {
+    for (const std::string text : {"one", "two"})
+        connection.publish("lapd.7.s.h.b.d", text, text);
+    NatsConsumer first(connection, allFrames());
+    for (NatsMessage& message : first.fetch(10, longEnough))
+        message.acknowledge();
+    EXPECT_EQ(first.waiting(), 0U);
+    EXPECT_TRUE(deleteConsumer(connection, fleet::centreStream, "store-7"));
+    EXPECT_FALSE(deleteConsumer(connection, fleet::centreStream, "store-7"));
+    EXPECT_TRUE(first.fetch(10, 10ms).empty());
+    EXPECT_EQ(first.waiting(), std::nullopt);
+    NatsConsumer again(connection, allFrames());
+    EXPECT_EQ(textsOf(again.fetch(10, longEnough)), "one;two;");
+}
+
 TEST_F(Nats, WhatAStreamHasTakenSurvivesAServerThatIsKilled) {
     ASSERT_TRUE(sent("lapd.7.s.h.b.d", "one", "id1").isKept);
     server.kill();
@@ -193,6 +208,7 @@ TEST_F(Nats, AFailureSaysWhy) {
     rules.stream = "NONE";
     EXPECT_THROW(NatsConsumer(connection, rules), NatsError);
     EXPECT_THROW(fleet::fillingOf(connection, "NONE"), NatsError);
+    EXPECT_THROW(deleteConsumer(connection, "NONE", "store-7"), NatsError);
     EXPECT_THROW(connection.publish("elsewhere", "x", ""), NatsError);
     StreamRules overlapping = framesStream();
     overlapping.name = "OTHER";
@@ -257,12 +273,76 @@ TEST(NatsSecurity, AShipperMayPublishFramesAndNothingElse) {
     NatsConnection connection(server.options());
     makeStream(connection, framesStream());
     NatsOptions options = server.options("shipper");
-    options.timeout = 300ms;  // nobody answers what is not permitted
+    options.timeout = 2s;  // nobody answers what is not permitted, so each such request takes this long
     NatsConnection shipper(options);
     EXPECT_THROW(shipper.publish("lapd-dead.7.s.h.b.d", "x", ""), NatsError);
     EXPECT_THROW(makeStream(shipper, framesStream()), NatsError);
     EXPECT_THROW(NatsConsumer(shipper, allFrames()), NatsError);
     shipper.publish("lapd.7.s.h.b.d", "one", "id1");
+}
+
+// What the request answers if it is refused, and why; empty if it is permitted.
+template <class Request>
+std::string refusalOf(Request request) {
+    try {
+        request();
+    } catch (const NatsError& error) {
+        return error.reason == Reason::refused ? error.what() : std::string("not refused: ") + error.what();
+    }
+    return "";
+}
+
+TEST(NatsSecurity, AShipperOfASiteMayNotPublishFramesOfAnotherAndIsToldOnceForEachSubject) {
+    const NatsServer server(NatsServer::Security::certificates);
+    NatsConnection admin(server.options());
+    makeStream(admin, framesStream());
+    NatsConnection leeds(server.options("leeds"));
+    NatsPublisher publisher(leeds);
+    for (const std::string subject : {"lapd.7.london.h.b.d", "lapd.7.london.h.b.e"}) {
+        publisher.send(subject, "one", "id1", 1001);
+        std::optional<NatsPublisher::Answer> answer;
+        while (!answer)
+            answer = publisher.answer(10ms);
+        EXPECT_EQ(answer->token, std::nullopt);
+        EXPECT_FALSE(answer->isKept);
+        EXPECT_EQ(answer->error, "Permissions Violation for Publish to \"" + subject + "\"");
+        EXPECT_FALSE(publisher.answer(10ms));
+    }
+    publisher.send("lapd.7.leeds.h.b.d", "one", "id1", 1002);
+    const auto answer = publisher.answer(longEnough);
+    ASSERT_TRUE(answer);
+    EXPECT_TRUE(answer->isKept) << answer->error;
+}
+
+TEST(NatsSecurity, AStoreMayFetchFramesAndBuryThemAndNothingElse) {
+    const NatsServer server(NatsServer::Security::certificates);
+    NatsConnection admin(server.options("admin"));
+    makeStream(admin, framesStream());
+    StreamRules dead;
+    dead.name = fleet::deadStream;
+    dead.subjects = {fleet::everyDeadSubject};
+    makeStream(admin, dead);
+    admin.publish("lapd.7.s.h.b.d", "one", "id1");
+    NatsOptions options = server.options("store");
+    NatsConnection store(options);
+    NatsConsumer consumer(store, allFrames());
+    std::vector<NatsMessage> messages = consumer.fetch(1, longEnough);
+    ASSERT_EQ(textsOf(messages), "one;");
+    messages[0].acknowledge();
+    EXPECT_EQ(consumer.waiting(), 0U);
+    EXPECT_EQ(fleet::fillingOf(store, fleet::centreStream).messages, 1U);
+    store.publish("lapd-dead.7.s.h.b.d", "one", "dead/1");
+    EXPECT_EQ(store.refusal(), "");
+
+    options.timeout = 2s;  // nobody answers what is not permitted, so each such request takes this long
+    NatsConnection bold(options);
+    EXPECT_EQ(refusalOf([&] { deleteConsumer(bold, fleet::centreStream, "store-7"); }),
+              "cannot delete the consumer store-7 of the stream LAPD: Permissions Violation for Publish to "
+              "\"$JS.API.CONSUMER.DELETE.LAPD.store-7\"");
+    EXPECT_NE(refusalOf([&] { makeStream(bold, framesStream()); }), "");
+    EXPECT_NE(refusalOf([&] { bold.publish("lapd.7.s.h.b.d", "two", ""); }), "");
+    EXPECT_EQ(consumer.waiting(), 0U) << "the consumer is still there";
+    EXPECT_TRUE(deleteConsumer(admin, fleet::centreStream, "store-7"));
 }
 
 TEST(NatsSecurity, WithoutAServerThereIsNoConnection) {

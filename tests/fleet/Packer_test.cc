@@ -131,6 +131,16 @@ TEST(Packer, AFrameThatNoParcelCanHoldIsOneWithoutOctets) {
 }
 
 // Otherwise a frame that is sent again could belong to another day.
+// The store refuses the whole parcel for one value that it cannot hold.
+TEST(Packer, AValueThatNoParcelMayHoldIsLeftOutOrReduced) {
+    InputEvent damaged = frame(1, 1);
+    damaged.item.frame.written = Parcel::latest + 1;
+    InputEvent before = note(1, 1, Kind::lost, std::string_view("\0\xff", 2));
+    before.item.frame.written = -1;
+    before.item.count = Parcel::mostNumber + 1;
+    EXPECT_EQ(packed({before, damaged}), "1/1/1/1[1];");
+}
+
 TEST(Packer, AFrameWithoutADateHasATimeThatDependsOnTheRunAndTheFrameAlone) {
     InputEvent event = frame(7, 1);
     const std::uint64_t run = 1'795'260'333'000'001;

@@ -90,6 +90,22 @@ void Recordings::tear() {
     save();
 }
 
+void Recordings::runOutOfRoom(const std::function<void()>& meanwhile,
+                              const std::function<void()>& behindTheCut) {
+    const std::string part = path(names_.back() + ".part");
+    const auto whole = std::filesystem::file_size(part);
+    frames(1);
+    writer_.reset();
+    close(file_);
+    file_ = -1;
+    std::filesystem::resize_file(part, std::filesystem::file_size(part) - 5);
+    meanwhile();
+    std::filesystem::resize_file(part, whole);
+    behindTheCut();
+    std::filesystem::rename(part, path(names_.back()));
+    save();
+}
+
 void Recordings::remove(std::size_t ago) {
     std::filesystem::remove(path(names_.at(names_.size() - 1 - ago)));
 }

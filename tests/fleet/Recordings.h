@@ -3,6 +3,7 @@
 #define TESTS_FLEET_RECORDINGS_H
 
 #include <filesystem>
+#include <functional>
 #include <memory>
 #include <string>
 #include <vector>
@@ -43,6 +44,9 @@ class Recordings {
     void finish();
     // The recorder is killed while it writes a frame; another one gives the file its name.
     void tear();
+    // The disk is full: a frame does not get whole into the file. The recorder cuts the file back and closes
+    // it. A reader may look in between (`meanwhile`), or behind the cut and before the file gets its name.
+    void runOutOfRoom(const std::function<void()>& meanwhile, const std::function<void()>& behindTheCut);
     // Removes the file that was begun so many files ago.
     void remove(std::size_t ago);
 

@@ -429,6 +429,23 @@ TEST_F(SecureShipperTest, AShippersCertificateIsEnough) {
     expectFrames(5);
 }
 
+TEST_F(SecureShipperTest, SaysThatItMayNotShipFramesOfAnotherSite) {
+    const fleet_tests::Certificates& files = fleet_tests::Certificates::get();
+    useCertificate(files.file("leeds.pem"), files.file("leeds.key"));
+    recorder_.begin(run, 1);
+    recorder_.frames(5);
+    fleet::Shipper shipper(fleet::readShipConfig(folder_.file("ship.toml")), {},
+                           [this](const std::string& text) {
+                               said_ += text + ";";
+                               stop_ = stop_ || text.find("the stream takes no frames") != text.npos;
+                           });
+    shipper.drain(stop_);
+    EXPECT_NE(said_.find("the stream takes no frames: Permissions Violation for Publish to \"lapd."),
+              std::string::npos)
+        << said_;
+    EXPECT_EQ(fleet::fillingOf(connection_, fleet::siteStream).messages, 0U);
+}
+
 TEST_F(SecureShipperTest, WrongCredentialsAreRefusedAtTheStart) {
     const fleet_tests::Certificates& files = fleet_tests::Certificates::get();
     useCertificate(files.file("127.0.0.1.pem"), files.file("127.0.0.1.key"));

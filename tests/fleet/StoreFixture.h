@@ -4,6 +4,8 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
+#include <cstdio>
 #include <cstdlib>
 #include <deque>
 #include <memory>
@@ -23,6 +25,16 @@ namespace fleet {
 // The server that tests/fleet/postgres.py has started. libpq takes the last of two values.
 inline std::string urlOf(const std::string& database, const std::string& user = "owner") {
     return std::string(std::getenv("STORE_URL")) + "&dbname=" + database + "&user=" + user;
+}
+
+// What a command of the shell prints.
+inline std::string outputOf(const std::string& command) {
+    const std::unique_ptr<std::FILE, int (*)(std::FILE*)> pipe(popen(command.c_str(), "r"), pclose);
+    std::string text;
+    std::array<char, 4096> part{};
+    while (const std::size_t size = std::fread(part.data(), 1, part.size(), pipe.get()))
+        text.append(part.data(), size);
+    return text;
 }
 
 class StoreTest : public testing::Test {

@@ -1,5 +1,6 @@
 """A short chaos, and that the comparison at its end sees what it looks for."""
 
+import datetime
 import os
 import sys
 import tempfile
@@ -33,6 +34,18 @@ class Chaos(unittest.TestCase):
         comparison = fleet.Comparison()
         comparison.compare("pri1, calls", logged, list(logged))
         self.assertEqual(comparison.differences, [])
+
+    def test_only_repeated_faults_of_links_in_the_last_ten_minutes_may_wait(self):
+        def found(frame, second, kind="link-flap", clause="Q.921 5.5"):
+            at = f"2026-11-22T10:{second // 60:02}:{second % 60:02}.000+00:00"
+            return {"frame": frame, "finding": kind, "severity": "error", "clause": clause, "time": at}
+        newest = datetime.datetime.fromisoformat("2026-11-22T10:20:00+00:00").timestamp()
+        for findings, waiting in (([found(1, 900)], set()),
+                                  ([found(1, 0), found(2, 599)], set()),
+                                  ([found(1, 0), found(2, 601)], {("2", "link-flap")}),
+                                  ([found(1, 900), found(2, 901, "link-refused")], set()),
+                                  ([found(1, 900, "timer-102", "Q.850 102"), found(2, 901, "timer-102", "Q.850 102")], set())):
+            self.assertEqual(fleet.waiting_in(findings, newest), waiting, findings)
 
     @unittest.skipIf(engines.missing(), "the engines are not installed")
     def test_a_store_that_is_not_as_its_logs_is_told(self):

@@ -219,8 +219,13 @@ class Engines(Assembled):
                 f'ca_file: "{self.certificates}/authority.pem", {more} }}')
 
     def _users(self, stream):
-        return ('authorization { users: [ { user: admin }, { user: store }, { user: shipper, permissions: { publish: '
-                f'[ "lapd.>", "$JS.API.STREAM.INFO.{stream}" ], subscribe: "_INBOX.>" }} }} ] }}')
+        consumer = "$JS.API.CONSUMER"
+        return ('authorization { users: [ { user: admin }, '
+                f'{{ user: shipper, permissions: {{ publish: [ "lapd.>", "$JS.API.STREAM.INFO.{stream}" ], '
+                'subscribe: "_INBOX.>" } }, '
+                f'{{ user: store, permissions: {{ publish: [ "{consumer}.DURABLE.CREATE.LAPD.*", "{consumer}.CREATE.LAPD.>", '
+                f'"{consumer}.INFO.LAPD.*", "{consumer}.MSG.NEXT.LAPD.*", "$JS.API.STREAM.INFO.LAPD", "$JS.ACK.>", '
+                '"lapd-dead.>" ], subscribe: "_INBOX.>" } } ] }')
 
     def _centre(self, number):
         routes = ", ".join(f'"nats://{self.address}:{CLUSTER_PORT + i}"' for i in (1, 2, 3) if i != number)

@@ -1,9 +1,6 @@
 // Calls that pass several D channels of a group: what SQL says of them is what lapdread says of the group.
-#include <array>
-#include <cstdio>
 #include <functional>
 #include <map>
-#include <memory>
 #include <nlohmann/json.hpp>
 
 #include "StoreFixture.h"
@@ -23,15 +20,6 @@ namespace m = isdn::message;
 constexpr std::int64_t began = 1'767'600'000'000'000'000;
 
 const Bytes disc{0x53}, ua{0x73}, sabme{0x7F};
-
-std::string outputOf(const std::string& command) {
-    const std::unique_ptr<std::FILE, int (*)(std::FILE*)> pipe(popen(command.c_str(), "r"), pclose);
-    std::string text;
-    std::array<char, 4096> part{};
-    while (const std::size_t size = std::fread(part.data(), 1, part.size(), pipe.get()))
-        text.append(part.data(), size);
-    return text;
-}
 
 void talk(CallScript& script, std::int64_t at, std::uint16_t reference) {
     script.at(at).us(
@@ -148,6 +136,12 @@ constexpr Story stories[] = {
          clear(a, 5000, 1);
          talk(b, 10'000, 1);
          clear(b, 15'000, 1);
+     }},
+    {"the clearing begins on one D channel and ends on the other, whose numbers are lower",
+     [](CallScript& a, CallScript& b) {
+         talk(a, 1000, 1);
+         a.at(20'000).us(m::disconnect, 1, false, {cause(16)});
+         b.at(21'000).peer(m::release, 1, true).us(m::releaseComplete, 1, false);
      }},
 };
 
@@ -358,6 +352,27 @@ TEST_F(JoinedCalls, AreThoseOfRowsFromBeforeTheMigration) {
     store(stories[0]);
     EXPECT_EQ(migrate(*owner_).size(), migrations().size() - 3);
     EXPECT_EQ(rows("SELECT parts, outcome FROM lapd.joined_calls"), "2|answered\n");
+}
+
+// A shipper that is not ours sends what it likes.
+TEST_F(JoinedCalls, AreMadeInFewStepsOfALongChainOfRows) {
+    constexpr int length = 100;
+    store(stories[0]);
+    execute("DELETE FROM lapd.calls WHERE flags LIKE 'before-trace%'");
+    execute("UPDATE lapd.calls SET ended_by = 'open', ended = NULL, flags = 'open'");
+    execute(
+        "INSERT INTO lapd.calls SELECT (jsonb_populate_record(c, jsonb_build_object('first_frame', 1000 + i, "
+        "'flags', "
+        "'before-trace open', 'began', c.began + i * interval '1 second'))).* FROM lapd.calls c, "
+        "generate_series(1, " +
+        std::to_string(length) + ") i");
+    execute("SET track_functions = 'all'");
+    EXPECT_EQ(rows("SELECT parts FROM lapd.joined_calls"), std::to_string(length + 1) + "\n");
+    execute("SELECT pg_stat_force_next_flush()");
+    const int steps =
+        std::stoi(rows("SELECT sum(calls) FROM pg_stat_user_functions WHERE funcname LIKE 'call_%'"));
+    EXPECT_GT(steps, length) << "they are counted";
+    EXPECT_LT(steps, 40 * length);
 }
 
 TEST_F(JoinedCalls, AreForgottenEvenIfTheyNeverEnded) {

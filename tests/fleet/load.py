@@ -2,11 +2,12 @@
 
     scripts/fleet-load [--trunks 8] [--frames 25000] [--rate 5000] [--seconds 20]
 
-First, logs that are there already: once the stores have their leases, recorders and shippers are started, and the time is
-taken until the last frame is a row, with its calls and findings; and how long each kind of program has worked, which is
-the same on a busy machine. Then the logs grow by `--rate` frames a second, all together, and four times a second it is looked
-up when the newest frame that is stored was written. Everything, engines included, runs on this machine, with certificates,
-and three copies of the stream.
+First, logs that are there already: once the stores have their leases, recorders and shippers are started, and the time
+is taken until the last frame is a row, with its calls and findings; and how long each kind of program has worked, which
+is the same on a busy machine. Then the logs grow by `--rate` frames a second, all together, and four times a second it
+is looked up when the newest frame that is stored was written. Both times it is told how long the programs have worked for
+a frame, and how much room a frame, a call and a finding take: a trunk's busy hour is `--trunks 50 --frames 1000 --rate 85 --seconds 120`. Everything, engines included,
+runs on this machine, with certificates, and three copies of the stream.
 """
 
 import argparse
@@ -90,6 +91,33 @@ def from_logs_to_rows(fleet, frames):
     return took, {kind: after[kind] - before[kind] for kind in after}
 
 
+def sizes(fleet):
+    """How many octets the recordings have, a copy of the centre's stream, and the tables of PostgreSQL with their indexes; and how
+    many frames, calls or findings these are."""
+    def table(name):
+        size = ("SELECT sum(pg_total_relation_size(oid)) FROM pg_class WHERE relnamespace = 'lapd'::regnamespace AND relkind = 'r' "
+                f"AND relname ~ '^{name}'")
+        return int(fleet.engines.sql(size)[0][0]), int(fleet.engines.sql(f"SELECT count(*) FROM lapd.{name}")[0][0])
+    frames, calls, findings = table("frames"), table("calls"), table("findings")
+    recorded = sum(path.stat().st_size for trunk in fleet.trunks for path in trunk.files())
+    streamed = sum(path.stat().st_size for path in (fleet.folder / "centre-1").glob("jetstream/**/streams/LAPD/msgs/*.blk"))
+    return {"a frame in a recording": (recorded, frames[1]), "a frame in a copy of the stream": (streamed, frames[1]),
+            "a frame in PostgreSQL": frames, "a call": calls, "a finding": findings}
+
+
+def tell_work(worked, frames):
+    print("processor time for a frame: " + ", ".join(f"{kind} {seconds / frames * 1e6:.0f} us" for kind, seconds in worked.items())
+          + f"; in all {sum(worked.values()) / frames * 1e6:.0f} us", flush=True)
+
+
+def tell_sizes(after, before=None):
+    """Says how large one of each is, on average, of those that have come since `before`."""
+    told = {what: (octets - before[what][0], count - before[what][1]) if before else (octets, count)
+            for what, (octets, count) in after.items()}
+    print("octets: " + ", ".join(f"{what} {octets / count:.0f} ({count} of them)" for what, (octets, count) in told.items() if count),
+          flush=True)
+
+
 def while_logs_grow(fleet, pieces, rate, seconds):
     """How late rows come: a list of seconds, and how many frames a second were written."""
     start, logs, late = fleet.count(), [open(trunk.log, "ab", buffering=0) for trunk in fleet.trunks], []
@@ -135,14 +163,18 @@ def main():
         with WrittenFleet(folder, options.trunks, log) as fleet:
             took, worked = from_logs_to_rows(fleet, frames)
             print(f"from written logs to rows: {took:.1f} s, {frames / took:.0f} frames a second")
-            print("processor time for a frame: " + ", ".join(f"{kind} {seconds / frames * 1e6:.0f} us" for kind, seconds
-                                                             in worked.items())
-                  + f"; in all {sum(worked.values()) / frames * 1e6:.0f} us", flush=True)
-            head, pieces = blocks(log)
+            tell_work(worked, frames)
+            at_once = sizes(fleet)
+            tell_sizes(at_once)
+            _, pieces = blocks(log)
+            before = processor_seconds(fleet)
             late, rate, rest = while_logs_grow(fleet, pieces, options.rate, options.seconds)
+            after = processor_seconds(fleet)
             late.sort()
             print(f"logs growing by {rate:.0f} frames a second: rows {statistics.median(late):.2f} s late, 95 % "
                   f"{late[len(late) * 95 // 100]:.2f} s; all stored {rest:.1f} s after the last was written")
+            tell_work({kind: after[kind] - before[kind] for kind in after}, rate * options.seconds)
+            tell_sizes(sizes(fleet), at_once)
     return 0
 
 

@@ -1,8 +1,6 @@
 // The store as an input of lapdread: what it prints of the store is what it prints of the files.
-#include <array>
-#include <cstdio>
 #include <filesystem>
-#include <memory>
+#include <map>
 
 #include "StoreFixture.h"
 
@@ -13,15 +11,6 @@ namespace {
 using namespace std::chrono_literals;
 
 const std::string source = LAPDMON_SOURCE_DIR;
-
-std::string outputOf(const std::string& command) {
-    const std::unique_ptr<std::FILE, int (*)(std::FILE*)> pipe(popen(command.c_str(), "r"), pclose);
-    std::string text;
-    std::array<char, 4096> part{};
-    while (const std::size_t size = std::fread(part.data(), 1, part.size(), pipe.get()))
-        text.append(part.data(), size);
-    return text;
-}
 
 // What lapdread prints, its messages included.
 std::string lapdread(const std::string& words) {
@@ -199,6 +188,9 @@ TEST_F(StoreAsInput, ChoosesTrunksAndSites) {
     EXPECT_EQ(ofStore("list --site london"), lapdread("list " + pri));
     EXPECT_EQ(ofStore("list --trunk ni2"), lapdread("list " + other));
     EXPECT_EQ(ofStore("list --trunk paris/h1/0/1"), lapdread("list " + other));
+    EXPECT_EQ(ofStore("list --trunk ni2 --site london,paris"), lapdread("list " + other));
+    EXPECT_EQ(ofStore("list --trunk ni2 --site london"),
+              "lapdread: the store: it has no trunk of these sites: ni2\n");
     EXPECT_EQ(ofStore("calls --trunk net5,ni2"), lapdread("calls --merge " + pri + " " + other));
     EXPECT_EQ(ofStore("calls"), lapdread("calls --merge " + pri + " " + other));
 }

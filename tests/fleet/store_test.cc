@@ -57,10 +57,11 @@ TEST_F(Store_, MigratesAnEmptyDatabaseAndThenHasNothingToDo) {
     pqxx::connection connection(url());
     EXPECT_EQ(migrate(connection).size(), migrations().size());
     EXPECT_TRUE(migrate(connection).empty());
-    EXPECT_EQ(rows("SELECT version, name FROM lapd.migrations ORDER BY version"),
-              "1|001_tables\n2|002_days\n3|003_roles\n4|004_groups\n5|005_keeper\n");
+    EXPECT_EQ(
+        rows("SELECT version, name FROM lapd.migrations ORDER BY version"),
+        "1|001_tables\n2|002_days\n3|003_roles\n4|004_groups\n5|005_keeper\n6|006_bounded\n7|007_clearing\n");
     pqxx::work work(connection);
-    EXPECT_EQ(schemaVersion(work), 5);
+    EXPECT_EQ(schemaVersion(work), 7);
 }
 
 TEST(SqlText, WritesTimesInUtc) {
@@ -372,6 +373,33 @@ TEST_F(Store_, TellsItsFigures) {
     EXPECT_NE(all.text().find("\nlapdstore_link_up" + labels + "} 0\n"), std::string::npos);
     all.release(17);
     EXPECT_EQ(all.text().find("partition=\"17\""), std::string::npos);
+}
+
+TEST_F(Store_, GivesTheFiguresOfKnownTrunksFromTheBeginning) {
+    const std::vector<Parcel> parcels = parcelsOf(net5, 1000);
+    const unsigned partition = partitionOf(parcels[0]);
+    pqxx::connection connection(url());
+    StoreFigures all;
+    all.set(partition, Partition(connection, partition).figures());
+    EXPECT_EQ(all.text().find("site=\"london\""), std::string::npos);
+    FakeInbox inbox;
+    inbox.add(parcels[0]);
+    Partition before(connection, partition);
+    moveAll(inbox, before);
+    all.set(partition, Partition(connection, partition).figures());
+    const std::string text = all.text();
+    const std::string labels =
+        "{site=\"london\",trunk=\"london/h1/0/1\",name=\"" + parcels[0].trunk + "\",group=\"\"";
+    for (const std::string& line :
+         {"lapdstore_calls_total" + labels + "} 0\n", "lapdstore_trunk_frames_total" + labels + "} 0\n",
+          "lapdstore_findings_total" + labels + ",kind=\"link-flap\"} 0\n"})
+        EXPECT_NE(text.find("\n" + line), std::string::npos) << line << text;
+    for (const std::string unknown : {"newest_frame_timestamp_seconds", "link_up"})
+        EXPECT_EQ(text.find("\nlapdstore_" + unknown + "{"), std::string::npos) << text;
+    const unsigned other = partition == 0 ? 1 : 0;
+    all.set(other, Partition(connection, other).figures());
+    all.release(partition);
+    EXPECT_EQ(all.text().find("site=\"london\""), std::string::npos);
 }
 
 TEST_F(Store_, LetsWritersAddAndReadersReadAndNothingElse) {

@@ -104,6 +104,7 @@ class InBash(Completion):
         self.assertEqual(self.bash("lapdship", "--config", "tr"), {"trunk.log", "traces"})
         self.assertEqual(self.bash("lapdstore", "mi"), {"migrate"})
         self.assertEqual(self.bash("lapdstore", "forget", "--da"), {"--database", "--days"})
+        self.assertEqual(self.bash("lapdstore", "rewind", "--fi"), {"--first"})
 
 
 @unittest.skipUnless(shutil.which("zsh"), "there is no zsh")

@@ -59,7 +59,7 @@ class Pages(unittest.TestCase):
 
     def test_the_fleets_programs_have_the_options_of_their_help_and_of_their_commands(self):
         for name, commands_and_titles in (("lapdship", {"streams": "STREAMS"}),
-                                          ("lapdstore", {"migrate": None, "forget": "FORGET"})):
+                                          ("lapdstore", {"migrate": None, "forget": "FORGET", "rewind": None})):
             text = page(f"{name}.8")
             shared = options_of_help(name)
             self.assertGreater(len(shared), 4)
