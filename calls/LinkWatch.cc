@@ -95,7 +95,7 @@ void LinkWatch::setUps(const Sample& sample, const Marks& marks, const Circumsta
     if (sample.layer2.type == FrameType::DISC)
         released_ = true;
     if (sample.layer2.type == FrameType::DM)
-        lost_ = up_;
+        lost_ = lost_ || up_;  // several DMs may tell of one loss
     flaps(sample, marks, around);
 }
 

@@ -39,12 +39,46 @@ TEST(LinkFlap, IsFoundWhenALinkIsSetUpAgainWithoutRelease) {
 }
 
 TEST(LinkFlap, IsFoundWhenALinkIsLostThreeTimesInAMinute) {
-    std::string story(up);
+    std::string story;
     for (int at = 10; at <= 30; at += 10) {
         const std::string time = std::to_string(at);
         story += time + " < DM\n" + time + ".1 > SABME\n" + time + ".2 < UA\n";
     }
-    EXPECT_EQ(found(story), "error link-flap 11\n");
+    EXPECT_EQ(found(std::string(up) + story), "error link-flap 11\n");
+    // A release earlier explains none of them.
+    EXPECT_EQ(found(std::string(up) + "1 > DISC\n1.1 < UA\n2 > SABME\n2.1 < UA\n" + story),
+              "error link-flap 15\n");
+}
+
+// Each poll that is on its way gets a DM of its own.
+TEST(LinkFlap, IsFoundHoweverManyDmsTellOfEachLoss) {
+    std::string story(up);
+    for (int at = 10; at <= 30; at += 10) {
+        const std::string time = std::to_string(at);
+        story += time + " < DM\n" + time + ".05 < DM\n" + time + ".1 > SABME\n" + time + ".2 < UA\n";
+    }
+    EXPECT_EQ(found(story), "error link-flap 14\n");
+}
+
+TEST(LinkFlap, IsNotFoundForTwoLossesAndAFirstSetUpThatWasRefused) {
+    std::string story = "1 > SABME\n1.1 < DM F\n2 > SABME\n2.1 < UA\n";
+    for (const std::string time : {"10", "20"})
+        story += time + " < DM\n" + time + ".1 > SABME\n" + time + ".2 < UA\n";
+    EXPECT_EQ(found(story), "warning link-refused 2\n");
+}
+
+TEST(LinkFlap, IsNotFoundWhereALostLinkIsReleasedBeforeItIsSetUp) {
+    std::string story(up);
+    for (const std::string time : {"10", "20", "30"})
+        story += time + " < DM\n" + time + ".1 > DISC\n" + time + ".2 < UA\n" + time + ".3 > SABME\n" + time +
+                 ".4 < UA\n";
+    EXPECT_EQ(found(story), "");
+}
+
+TEST(LinkFlap, IsCountedOnceForEachSetUp) {
+    EXPECT_EQ(found(std::string(up) + "10 < DM\n10.1 > SABME\n10.2 < UA\n20 > SABME\n20.1 < UA\n"
+                                      "30 > SABME\n30.1 < UA\n"),
+              "error link-flap 6\nerror link-flap 8\n");
 }
 
 TEST(LinkFlap, IsNotFoundBehindAReleaseOrOnFirstSetUp) {
