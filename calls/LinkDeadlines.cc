@@ -107,6 +107,8 @@ void LinkWatch::expireKeepAlives(Side side, std::int64_t at, const Circumstances
     if (at <= dueOf(idle, around))
         return;
     keepAliveReported_ = true;
+    for (Idle& each : idle_)
+        each.missed = true;
     tellSilence();
     silenceEnd_.reset();
     silence_ =

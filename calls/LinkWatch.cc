@@ -165,17 +165,25 @@ void LinkWatch::keepAlives(const Sample& sample, const Marks& marks) {
     if (!isPoll(sample))
         return;
     Idle& idle = idle_[indexOf(sample.from())];
-    if (idle.last && !idle.busy) {
-        const std::int64_t period = sample.at - *idle.last;
-        const bool same = std::abs(period - idle.period) <= idle.period / 4;
-        if (same)
-            ++idle.seen;
-        else if (period > idle.period)
-            idle.seen = 1;
-        idle.period = std::max(idle.period, period);
-    }
+    if (idle.last && !idle.busy)
+        learnPeriod(idle, sample.at - *idle.last);
     idle.last = sample.at;
-    idle.busy = false;
+    idle.busy = idle.missed = false;
+}
+
+// A time in which polls were missing is no period, unless it comes twice in a row. Then the side polls less
+// often than before.
+void LinkWatch::learnPeriod(Idle& idle, std::int64_t period) {
+    if (idle.missed && !std::exchange(idle.slower, true))
+        return;
+    const bool same = std::abs(period - idle.period) <= idle.period / 4;
+    if (same) {
+        ++idle.seen;
+        idle.slower = false;
+    } else if (period > idle.period) {
+        idle.seen = 1;
+    }
+    idle.period = std::max(idle.period, period);
 }
 
 // The silence was on the link only if the recorder has not missed frames meanwhile.

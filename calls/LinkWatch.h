@@ -91,6 +91,8 @@ class LinkWatch {
         bool busy = false;
         std::int64_t period = 0;
         unsigned seen = 0;
+        bool missed = false;  // polls were missing since the last one
+        bool slower = false;  // they were, once or more, since the last that kept to the period
     };
 
     void polls(const Sample& sample);
@@ -99,6 +101,7 @@ class LinkWatch {
     void flaps(const Sample& sample, const Marks& marks, const Circumstances& around);
     void demands(const Sample& sample, const Circumstances& around);
     void keepAlives(const Sample& sample, const Marks& marks);
+    static void learnPeriod(Idle& idle, std::int64_t period);
     void tellSilence();
     void endSilence(const DChannel& channel, const Sample& sample, const Circumstances& around);
     void repetitions(const Sample& sample, const Marks& marks);

@@ -189,6 +189,26 @@ TEST(KeepAliveMissing, IsFoundWhereTheNumbersGoOnAfterTheSilence) {
               "warning keep-alive-missing 28\nwarning ns-gap-recorder 35\n");
 }
 
+TEST(KeepAliveMissing, IsFoundEachTimeThatPollsStop) {
+    for (const bool ours : {false, true}) {
+        std::string story(up);
+        for (const int at : {10, 20, 30, 70, 80, 90, 130, 140, 150, 190}) {
+            const std::string time = std::to_string(at);
+            story +=
+                time + (ours ? " >" : " <") + " RR 0 P\n" + time + ".01" + (ours ? " <" : " >") + " RR 0 F\n";
+        }
+        EXPECT_EQ(found(story), "warning keep-alive-missing 8\nwarning keep-alive-missing 20 x2\n") << ours;
+    }
+}
+
+// From the third long interval on, the longer period is the period.
+TEST(KeepAliveMissing, IsNotFoundForEverWhereASideBeginsToPollLessOften) {
+    std::string story = std::string(up) + idle(10, 60);
+    for (int at = 100; at <= 900; at += 40)
+        story += idle(at, at);
+    EXPECT_EQ(found(story), "warning keep-alive-missing 26\nwarning keep-alive-missing 30\n");
+}
+
 TEST(KeepAliveMissing, IsSaidBeforeTheNextFrameComes) {
     Trunk trunk;
     trunk.tell(std::string(up) + idle(10, 60)).advance(91);
