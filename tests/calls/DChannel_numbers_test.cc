@@ -203,6 +203,26 @@ TEST_F(DChannelTest, GoesOnAfterMoreThanHalfOfAllNumbersAreMissing) {
     EXPECT_EQ(told.atEnd(), "");
 }
 
+TEST_F(DChannelTest, CountsAHoleThatIsOpenWithTheManyNumbersMissingBehindIt) {
+    EXPECT_EQ(told("1 < I 100 0\n1.1 > RR 101\n1.2 < I 102 0\n9 < I 40 0\n9.1 > RR 41\n"),
+              "1 user command accepted unknown\n"
+              "2 user response up\n"
+              "3 user command early up\n"
+              "4 user command accepted early up [hole at 4: 67 from 101 by recorder]\n"
+              "5 user response up\n");
+    EXPECT_EQ(told.atEnd(), "");
+}
+
+TEST_F(DChannelTest, ComparesARepetitionWithNothingFromBeforeManyMissingNumbers) {
+    std::string story;
+    for (int i = 30; i <= 100; ++i)
+        story += "1 > I " + std::to_string(i) + " 0 = 08 01 01 05\n1 < RR " + std::to_string(i + 1) + "\n";
+    told(story);
+    EXPECT_EQ(told("9 > I 40 0 = 08 01 02 05\n9.1 > I 39 0 = 08 01 02 05\n"),
+              "143 user command accepted early up [hole at 143: 67 from 101 by recorder]\n"
+              "144 user command refused again up\n");
+}
+
 TEST_F(DChannelTest, GoesOnWhenANumberComesAgainWithAnotherText) {
     EXPECT_EQ(told("1 < I 4 0 = 08 01 01 05\n1.1 < I 5 0\n1.2 > RR 6\n"
                    "9 < I 4 0 = 08 01 02 05\n9.1 > RR 5\n10 < I 4 0 = 08 01 02 05\n"),

@@ -120,6 +120,14 @@ TEST(BoardRestarted, ForgetsWaitsThatWereOpen) {
         "note board-restarted 3\n");
 }
 
+TEST(BoardRestarted, AndFramesLostHaveTheTimeOfTheLastFrameBefore) {
+    Trunk trunk;
+    trunk.tell("5 > SABME\n5.01 < UA\n").missing().tell("7 > RR 0 P\n7.01 < RR 0 F\n").restarted();
+    ASSERT_EQ(trunk.found(), "warning frames-lost 2\nnote board-restarted 4\n");
+    EXPECT_EQ(trunk.findings().front().time, 5010 * millisecond);
+    EXPECT_EQ(trunk.findings().back().time, 7010 * millisecond);
+}
+
 TEST(LinkFindings, LearnTheAccessFromTheChannelOfASetUp) {
     const auto accessAfter = [](const std::string& frame) {
         DChannel channel;
@@ -178,6 +186,18 @@ TEST(LineLooped, IsNotFoundWherePollsAndAnswersAreTheSameOctets) {
     for (int at = 10; at < 100; at += 10)
         story += std::to_string(at) + " > RR 0 P\n" + std::to_string(at) + ".01 < RR 0 F\n";
     EXPECT_EQ(found(story), "");
+}
+
+TEST(LineLooped, IsFoundByFramesThatAreNeitherPollsNorTheirAnswers) {
+    for (const std::string frame : {"RR 0", "I 0 0 P"}) {
+        Trunk trunk;
+        trunk.tell(up);
+        for (int at = 1; at < 4; ++at) {
+            const std::string time = std::to_string(at);
+            trunk.tell(time + " > " + frame + "\n").tell(time + ".02 < " + frame + "\n", true);
+        }
+        EXPECT_NE(trunk.found().find("error line-looped 8\n"), std::string::npos) << frame;
+    }
 }
 
 TEST(LineLooped, IsNotFoundWhenCopiesComeLate) {

@@ -139,6 +139,34 @@ TEST(Retransmissions, AreFoundFromTenOnThreeOccasionsOn) {
     EXPECT_EQ(found(story({{5, 10}, {20, 25}})).find("retransmissions"), std::string::npos);
 }
 
+// Polls and acknowledgements do not count, however many there are.
+TEST(Retransmissions, AreComparedWithTheIFramesOfTheirSideAlone) {
+    std::string story(up);
+    for (int i = 0; i < 100; ++i) {
+        const std::string time = std::to_string(10 + i), number = std::to_string(i);
+        const std::string frame = time + " > I " + number + " 0\n";
+        story += frame + (i % 10 == 0 ? frame : "") + time + ".1 < RR " + std::to_string(i + 1) + "\n";
+        for (int poll = 2; poll < 10; ++poll)
+            story += time + "." + std::to_string(poll) + " > RR 0 P\n" + time + "." + std::to_string(poll) +
+                     "1 < RR " + std::to_string(i + 1) + " F\n";
+    }
+    EXPECT_NE(found(story).find("warning retransmissions"), std::string::npos);
+}
+
+TEST(Retransmissions, AreToldOfTheSideThatRepeatsWhenItsHourIsOver) {
+    std::string story(up);
+    for (int i = 0; i < 40; ++i) {
+        const std::string frame = std::to_string(10 + i) + " < I " + std::to_string(i) + " 0\n";
+        story += frame + (i % 4 == 0 ? frame : "");
+        story += std::to_string(10 + i) + ".1 > RR " + std::to_string(i + 1) + "\n";
+    }
+    Trunk trunk;
+    trunk.tell(story + "3610 < I 40 0\n");
+    ASSERT_EQ(trunk.findings().size(), 1U);
+    EXPECT_EQ(trunk.findings().front().sentence,
+              "TEI 0: 10 of 50 I frames of the other side were sent again within an hour");
+}
+
 TEST(Retransmissions, AreNotFoundForOneRecovery) {
     std::string story(up);
     for (int i = 0; i < 12; ++i)

@@ -63,4 +63,36 @@ TEST(ServicePolls, AreNotAnsweredTooLateAndNotByTheirOwnSide) {
     EXPECT_EQ(polls(script), "3 5 ");
 }
 
+TEST(ServicePolls, AreNoFramesThatTheLinkSendsAgain) {
+    CallScript script;
+    service(script, 0, inService, 5);
+    script.at(1000).again(0);
+    EXPECT_EQ(polls(script), "");
+}
+
+TEST(ServicePolls, AreNoFramesThatWaitBehindAHole) {
+    CallScript script;
+    const auto say = [&] { script.maintenance(Side::peer, m::service, false, {inService, channel(5)}); };
+    say();
+    script.maintenance(Side::peer, m::service, false, {inService, channel(6)}).unrecorded();
+    say();
+    EXPECT_EQ(polls(script), "");
+}
+
+// Maintenance is signalled in I frames. What stands in a UI frame is worth seeing.
+TEST(ServicePolls, AreNoUnnumberedFrames) {
+    CallScript script;
+    for (int i = 0; i < 2; ++i)
+        script.at(i * 60000).raw(Side::us, true, {0x03, 0x03, 0x02, 0, 0, m::service, 0x01, 0x01, 0xC0});
+    EXPECT_EQ(polls(script), "");
+}
+
+TEST(ServicePolls, AreNoMessagesOfCallControlWithTheSameCode) {
+    static_assert(m::connectAcknowledge == m::service);
+    CallScript script;
+    for (int i = 0; i < 2; ++i)
+        script.at(i * 60000).us(m::connectAcknowledge, 7, false);
+    EXPECT_EQ(polls(script), "");
+}
+
 }  // namespace calls
