@@ -43,6 +43,22 @@ TEST(Channels, GivenToTwoCallsAreFound) {
     EXPECT_EQ(findingsIn(script, 1000), "6 double-seizure\n");
 }
 
+TEST(Channels, AreHeldByCallsThatBeganBeforeTheTrace) {
+    CallScript script;
+    script.at(0).peer(m::connect, 1, true, {channel(30)}).us(m::connectAcknowledge, 1, false);
+    talk(script.at(5000), 2, 30);
+    EXPECT_EQ(findingsIn(script, 1000), "4 double-seizure\n");
+}
+
+TEST(Channels, AreNotTakenByAnAnswerThatComesAfterTheEndOfItsCall) {
+    CallScript script;
+    script.at(0).us(m::setup, 1, false, {bearerSpeech(), channel(30)});
+    script.at(10).us(m::release, 1, false, {cause(16)}).peer(m::releaseComplete, 1, true);
+    script.at(14).peer(m::callProceeding, 1, true, {channel(30)});
+    talk(script.at(1000), 2, 30);
+    EXPECT_EQ(findingsIn(script, 1000), "");
+}
+
 TEST(Channels, MayBeGivenAwayJustBeforeTheOldCallIsSeenToEnd) {
     CallScript script;
     talk(script.at(0), 1, 30);
@@ -99,6 +115,16 @@ TEST(Channels, AreNoGlareIfTheSecondSideHadSeenTheFirst) {
     script.at(10).peer(m::setup, 1, false, {bearerSpeech(), channel(5)});
     script.at(20).us(m::releaseComplete, 1, true, {cause(44)});
     EXPECT_EQ(findingsIn(script), "");
+}
+
+// The other side had seen the first SETUP, and answers it late.
+TEST(Channels, AreNoGlareBecauseASetupIsRepeated) {
+    CallScript script;
+    script.at(0).us(m::setup, 1, false, {bearerSpeech(), channel(5)}).acknowledge(Side::peer);
+    script.at(3900).crossing().us(m::setup, 1, false, {bearerSpeech(), channel(5)});
+    script.peer(m::setup, 1, false, {bearerSpeech(), channel(5)});
+    script.at(3920).us(m::releaseComplete, 1, true, {cause(44)});
+    EXPECT_EQ(findingsIn(script), "3 setup-repeated\n");
 }
 
 // The numbers of different links say nothing about each other.

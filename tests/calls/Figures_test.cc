@@ -245,6 +245,39 @@ TEST(Occupancy, PausesWhileACallIsOnHold) {
     EXPECT_EQ(Counted(script).channel(1).used, 3 * second);
 }
 
+TEST(Occupancy, GoesOnWhenASuspendedCallIsResumed) {
+    CallScript script;
+    script.at(0).us(m::setup, 1, false, {bearerSpeech(), channel(1)}).peer(m::connect, 1, true);
+    script.at(1000).us(m::suspend, 1, false, {callIdentity(7)}).peer(m::suspendAcknowledge, 1, true);
+    script.at(5000).us(m::resume, 2, false, {callIdentity(7)});
+    script.peer(m::resumeAcknowledge, 2, true, {channel(1)});
+    script.at(7000).us(m::releaseComplete, 2, false, {cause(16)});
+    EXPECT_EQ(Counted(script).channel(1).used, 3 * second);
+}
+
+TEST(Occupancy, BeginsForACallFromBeforeTheTraceWithTheMessageThatNamesItsChannel) {
+    for (const bool onHold : {false, true}) {
+        CallScript script;
+        script.at(0).peer(m::connect, 1, true, {channel(5)});
+        if (onHold)
+            script.at(1000).us(m::hold, 1, false).peer(m::holdAcknowledge, 1, true);
+        script.at(2000).peer(m::information, 1, true);
+        script.at(4000).us(m::releaseComplete, 1, false, {cause(16)});
+        const Counted counted(script);
+        EXPECT_EQ(counted.channel(5).calls, 1U);
+        EXPECT_EQ(counted.channel(5).used, (onHold ? 1 : 4) * second);
+    }
+}
+
+TEST(Occupancy, BeginsOnlyWhenTheOtherSideTakesTheCall) {
+    CallScript script;
+    script.at(0).us(m::setup, 1, false, {bearerSpeech(), channel(5)});
+    script.at(10).us(m::alerting, 1, false);  // the caller must not send this
+    script.at(20).peer(m::status, 1, true, {cause(101), callState(1)});
+    script.at(1000).peer(m::releaseComplete, 1, true, {cause(34)});
+    EXPECT_EQ(Counted(script).channel(5).calls, 0U);
+}
+
 TEST(Occupancy, IsSpreadOverTheHoursThatItTouches) {
     CallScript script;
     script.at(3590000).us(m::setup, 1, false, {bearerSpeech(), channel(1)});

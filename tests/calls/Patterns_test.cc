@@ -143,6 +143,102 @@ TEST(Patterns, ReferToTheFaultOfTheLinkThatCallsEndedWith) {
     }
 }
 
+namespace {
+
+// The only finding about calls that ended with their link.
+Finding massClearIn(const CallScript& script, const Options& options = {}) {
+    Collected collected;
+    Analysis analysis(options, collected);
+    std::uint64_t number = 0;
+    for (const Sent& sent : script.frames())
+        analysis.take(sent.frame, ++number);
+    analysis.advance(400 * second);
+    analysis.finish();
+    Finding massClear;
+    for (const Finding& finding : collected.findings) {
+        if (finding.kind->id == "mass-clear") {
+            EXPECT_EQ(massClear.kind, nullptr) << collected.lines;
+            massClear = finding;
+        }
+    }
+    EXPECT_NE(massClear.kind, nullptr) << collected.lines;
+    return massClear;
+}
+
+void threeCallsBegin(CallScript& script) {
+    for (std::uint8_t i = 1; i <= 3; ++i)
+        script.us(m::setup, i, false, {bearerSpeech(), channel(i)}).peer(m::connect, i, true);
+}
+
+void threeCallsEnd(CallScript& script) {
+    for (std::uint8_t i = 1; i <= 3; ++i)
+        script.peer(m::releaseComplete, i, true, {cause(41)});
+}
+
+void releaseLink(CallScript& script) {
+    script.raw(Side::peer, true, {0x53}).raw(Side::us, false, {0x73});  // DISC, UA
+}
+
+}  // namespace
+
+TEST(Patterns, ReferToNoFaultThatIsMoreThanAMinuteOlderThanTheEventOfTheLink) {
+    for (const std::int64_t age : {60000, 60004}) {
+        CallScript script;
+        script.at(0).linkUp().at(9000).linkUp();  // a flap
+        threeCallsBegin(script);
+        releaseLink(script.at(9000 + age));
+        threeCallsEnd(script.linkUp());
+        const Finding finding = massClearIn(script);
+        EXPECT_EQ(finding.severity, age == 60000 ? Severity::note : Severity::error) << age;
+        EXPECT_EQ(finding.sentence.find("link-flap") != std::string::npos, age == 60000) << finding.sentence;
+    }
+}
+
+TEST(Patterns, ReferToNoFaultOfAnotherDChannel) {
+    for (const std::string calls : {"A", "B"}) {
+        CallScript script;
+        script.at(0).on("B").linkUp().us(m::setup, 9, false, {bearerSpeech()});
+        script.peer(m::releaseComplete, 9, true, {cause(17)});
+        script.on(calls).linkUp();
+        threeCallsBegin(script);
+        script.at(5000).on("B").linkUp();  // a flap of B
+        releaseLink(script.at(5010).on(calls));
+        threeCallsEnd(script.linkUp());
+        Options options;
+        options.groups = {{"A", "B"}};
+        const Finding finding = massClearIn(script, options);
+        EXPECT_EQ(finding.dChannel, calls);
+        EXPECT_EQ(finding.sentence.find("link-flap") != std::string::npos, calls == "B") << finding.sentence;
+    }
+}
+
+TEST(Patterns, BlameTheEventOfTheLinkBeforeTheCallsEndedAndNotTheNext) {
+    CallScript script;
+    script.at(0).linkUp();
+    threeCallsBegin(script);
+    releaseLink(script.at(9000));
+    threeCallsEnd(script.linkUp());
+    releaseLink(script.at(9100));
+    EXPECT_EQ(massClearIn(script).sentence, "3 calls ended with the link, which was set up here: 1, 2, 3");
+}
+
+TEST(Patterns, BlameNoLinkForCallsThatAreSuspendedOrReplaced) {
+    for (const bool suspended : {false, true}) {
+        CallScript script;
+        script.at(0).linkUp();
+        threeCallsBegin(script);
+        releaseLink(script.at(9000));
+        script.linkUp();
+        for (std::uint8_t i = 1; i <= 3; ++i) {
+            if (suspended)
+                script.us(m::suspend, i, false, {callIdentity(i)}).peer(m::suspendAcknowledge, i, true);
+            else
+                script.us(m::setup, i, false, {bearerSpeech(), channel(static_cast<std::uint8_t>(9 + i))});
+        }
+        EXPECT_EQ(patternsIn(script).find("mass-clear"), std::string::npos) << patternsIn(script);
+    }
+}
+
 TEST(Patterns, ReportLostCallsAsAnErrorIfOnlyAWarningOfTheLinkExplainsThem) {
     CallScript script;
     script.at(0).linkUp();

@@ -142,6 +142,26 @@ TEST(Waits, FindACallThatStopsAfterCallProceeding) {
     EXPECT_EQ(findingsOf(script, 130200), "");
 }
 
+TEST(Waits, EndWithTheConnectOfTheSideThatAlerted) {
+    for (const bool answered : {false, true}) {
+        CallScript script = afterACall();
+        script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+        script.at(11000).peer(m::alerting, 2, true);
+        if (answered)
+            script.at(15000).peer(m::connect, 2, true);
+        EXPECT_EQ(findingsOf(script, 191100), answered ? "" : "4 alerting-unanswered\n");  // T301 is 180 s
+    }
+}
+
+TEST(Waits, LetTheCallerGiveUpAtTheTimerWhenNobodyAnswers) {
+    CallScript script = afterACall();
+    script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
+    script.at(11000).peer(m::alerting, 2, true);
+    script.at(191000).us(m::disconnect, 2, false, {cause(16)}).peer(m::release, 2, true);
+    script.us(m::releaseComplete, 2, false);
+    EXPECT_EQ(findingsOf(script, 400000), "");
+}
+
 TEST(Waits, FindAStatusEnquiryThatIsNotAnswered) {
     CallScript script = afterACall();
     script.at(10000).us(m::setup, 2, false, {bearerSpeech()});
