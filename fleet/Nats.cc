@@ -88,8 +88,9 @@ void require(natsStatus status, const std::string& wanted, int jetStreamError) {
     if (status == NATS_OK)
         return;
     std::string what = "cannot " + wanted + ": " + natsStatus_GetText(status);
-    const std::string detail =
-        jetStreamError == JSStreamNotFoundErr ? "there is no such stream" : detailOf(status);
+    const std::string detail = jetStreamError == JSStreamNotFoundErr
+                                   ? "there is no such stream; lapdship streams makes it"
+                                   : detailOf(status);
     if (!detail.empty() && detail != natsStatus_GetText(status))
         what += " (" + detail + ")";
     throw NatsError(reasonOf(status, jetStreamError), what);
@@ -117,10 +118,33 @@ OwnedMessage makeMessage(const std::string& subject, const std::string& reply, s
     return message;
 }
 
-NatsConnection::NatsConnection(const NatsOptions& options) : handles_(std::make_unique<Handles>()) {
+namespace {
+
+// A server that refuses a certificate closes the connection, in TLS 1.3 after the client has taken it to be
+// made. So the client only sees it end, in one way or another.
+bool mayBeRefusal(natsStatus status) {
+    return status == NATS_PROTOCOL_ERROR || status == NATS_IO_ERROR || status == NATS_SSL_ERROR ||
+           status == NATS_CONNECTION_CLOSED;
+}
+
+void connect(natsConnection*& connection, const NatsOptions& options) {
     const OwnedOptions to = libraryOptions(options);
+    const natsStatus status = natsConnection_Connect(&connection, to.get());
+    try {
+        require(status, "connect to NATS");
+    } catch (const NatsError& error) {
+        if (options.authority.empty() || !mayBeRefusal(status))
+            throw;
+        throw NatsError(error.reason, std::string(error.what()) +
+                                          "; perhaps the server refuses the certificate: its log says why");
+    }
+}
+
+}  // namespace
+
+NatsConnection::NatsConnection(const NatsOptions& options) : handles_(std::make_unique<Handles>()) {
     natsConnection* connection = nullptr;
-    require(natsConnection_Connect(&connection, to.get()), "connect to NATS");
+    connect(connection, options);
     handles_->connection.reset(connection);
     jsOptions rules;
     jsOptions_Init(&rules);

@@ -2,6 +2,7 @@
 
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
@@ -165,13 +166,34 @@ std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& /*c
     return std::make_unique<Sequence>(std::move(openers));
 }
 
-void learnTrunksOfStore(Options& options) {
+namespace {
+
+// With pseudonyms a number is not found, which must not look as if nobody had called it.
+void notePseudonyms(const fleet::Store& store, const Options& options, Chatter& chatter) {
+    const auto isNumber = [](const FilterWord& word) { return word.name == "number"; };
+    std::vector<std::string> names;
+    for (const fleet::Store::Trunk& trunk : store.trunks()) {
+        if (trunk.isRedacted)
+            names.push_back(trunk.name);
+    }
+    if (names.empty() || std::ranges::none_of(options.filters, isNumber))
+        return;
+    const std::size_t others = names.size() - 1;
+    chatter.note("pseudonyms stand in place of the numbers of " + names.front() +
+                 (others == 0 ? "" : " and " + std::to_string(others) + " more") +
+                 "; --number finds only the pseudonym there");
+}
+
+}  // namespace
+
+void learnTrunksOfStore(Options& options, Chatter& chatter) {
     if (options.input.store.empty())
         return;
     const std::unique_ptr<fleet::Store> store = fleet::openStore(queryOf(options));
     options.input.storeHasSeveral = store->trunks().size() > 1;
     for (std::vector<std::string>& group : store->groups())
         options.calls.groups.push_back(std::move(group));
+    notePseudonyms(*store, options, chatter);
 }
 
 void checkForms(const Options& options) {

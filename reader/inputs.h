@@ -39,8 +39,9 @@ std::unique_ptr<capture::Reader> openInputs(const Options& options, Chatter& cha
                                             std::vector<Primed*>* pipes = nullptr);
 
 // Sets the options that the chosen D channels of a store decide: those that share their calls do so as if
-// --nfas named them. Without a store nothing is done. Throws what openInputs() throws for a store.
-void learnTrunksOfStore(Options& options);
+// --nfas named them. Notes which of them cannot be asked for the numbers that --number has. Without a store
+// nothing is done. Throws what openInputs() throws for a store.
+void learnTrunksOfStore(Options& options, Chatter& chatter);
 
 // Throws capture::BadInput if one of the inputs is a regular file whose form is not known. Does not look at
 // inputs that are followed, because they may be empty yet, nor at pipes, because they can be read only once.

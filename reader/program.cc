@@ -25,8 +25,8 @@ int run(const std::vector<std::string>& words) {
         throw UsageError(std::string(line.command->name) + " takes files; --store is for other commands");
     if (!line.options.input.zone.empty())
         useTimeZone(line.options.input.zone);
-    learnTrunksOfStore(line.options);
     Chatter chatter(line.options.loudness);
+    learnTrunksOfStore(line.options, chatter);
     const int status = line.command->run(line.options, chatter);
     return status == good && chatter.hasWrongUsage() ? badUsage : status;
 }

@@ -63,7 +63,9 @@ build_preset() {
         shift
     done
     log=$(mktemp)
-    printf 'Building %s ...\n' "$preset"
+    local first=
+    [ -e "build/$preset" ] || first=' (the first time takes some minutes)'
+    printf 'Building %s%s ...\n' "$preset" "$first"
     if ! { cmake --preset "$preset" "${options[@]}" && cmake --build --preset "$preset" "${targets[@]}"; } >"$log" 2>&1; then
         tail -n 60 "$log" >&2
         fail "the $preset build failed"

@@ -59,10 +59,12 @@ class Snapshot {
 
     void findTrunks() {
         std::map<std::string, int> count;
-        for (const pqxx::row& row : work_.exec("SELECT trunk, site, host, board, dchannel, name, nfas FROM "
-                                               "lapd.trunks ORDER BY 2, 3, 4, 5")) {
+        for (const pqxx::row& row :
+             work_.exec("SELECT trunk, site, host, board, dchannel, name, nfas, redacted FROM "
+                        "lapd.trunks ORDER BY 2, 3, 4, 5")) {
             const Address address{row[1].c_str(), row[2].c_str(), row[3].c_str(), row[4].c_str()};
-            Trunk trunk{row[0].as<int>(), toText(address), row[5].c_str(), address.site, row[6].c_str()};
+            Trunk trunk{row[0].as<int>(), toText(address), row[5].c_str(),
+                        address.site,     row[6].c_str(),  row[7].as<bool>()};
             ++count[trunk.name];
             all_.push_back({address.site, trunk});
             if ((query_.sites.empty() || isNamed(query_.sites, address.site)) &&

@@ -31,7 +31,8 @@ class Store {
         std::string address;  // "london/h1/0/1"
         std::string name;     // that of the D channel; its address if another one has the same name
         std::string site;
-        std::string group;  // NFAS, of this site; empty: none
+        std::string group;        // NFAS, of this site; empty: none
+        bool isRedacted = false;  // its shipper sends pseudonyms in place of numbers
     };
 
     virtual ~Store() = default;

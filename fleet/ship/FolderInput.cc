@@ -20,6 +20,7 @@ constexpr char removed[] = "recordings were removed before it was known that all
 
 FolderInput::FolderInput(std::string folder, const std::string& trunk, const Place& from, Before before)
     : folder_(std::move(folder)),
+      trunk_(trunk),
       statePath_(recording::statePath(folder_, recording::fileNameOf(trunk))),
       before_(before),
       run_(from.run),
@@ -32,6 +33,13 @@ bool FolderInput::next(InputEvent& event) {
         if (step != Step::again)
             return step == Step::event;
     }
+}
+
+std::string FolderInput::lacks() const {
+    if (stateInode_ != 0)
+        return "";
+    return folder_ + (std::filesystem::is_directory(folder_) ? ": no recordings of " + trunk_ + " yet"
+                                                             : ": no such folder");
 }
 
 // Opens the file that is next, or says what has become of the frames before it.

@@ -28,6 +28,7 @@ class FolderInput final : public TrunkInput {
     FolderInput(std::string folder, const std::string& trunk, const Place& from, Before before);
 
     bool next(InputEvent& event) override;
+    std::string lacks() const override;
     const std::optional<recording::RecordedLog>& log() const override { return none_; }
 
   private:
@@ -49,6 +50,7 @@ class FolderInput final : public TrunkInput {
     void finishFile();
 
     std::string folder_;
+    std::string trunk_;
     std::string statePath_;
     Before before_;
     recording::RecordState state_;

@@ -137,9 +137,9 @@ ShippedDChannel readDChannel(Table from, const std::string& site, const std::str
         from.fail("group", "must be 1 to 64 printable ASCII characters");
     to.folder = from.file("folder");
     to.log = from.file("log");
+    from.end();
     if (to.folder.empty() == to.log.empty())
         from.fail("dchannel", "must have either folder or log");
-    from.end();
     return to;
 }
 

@@ -82,8 +82,11 @@ bool ShippedTrunk::step(Outbox& outbox) {
 
 bool ShippedTrunk::readNext() {
     try {
-        if (!input_->next(event_))
+        if (!input_->next(event_)) {
+            if (const std::string lacks = input_->lacks(); !lacks.empty())
+                sayOnce(lacks);
             return false;
+        }
     } catch (const capture::BadInput& error) {
         sayOnce(error.what());
         return false;

@@ -99,7 +99,7 @@ bool Shipper::turn() {
     } catch (const NatsError& error) {
         if (error.reason == NatsError::Reason::refused && !hasConnected_)
             throw;
-        if (std::exchange(said_, error.what()) != error.what())
+        if (said_.insert(error.what()).second)
             say_(error.what());
         publisher_.reset();
         connection_.reset();

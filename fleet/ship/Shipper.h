@@ -7,6 +7,7 @@
 #include <deque>
 #include <memory>
 #include <optional>
+#include <set>
 #include <string>
 
 #include "fleet/Nats.h"
@@ -97,7 +98,7 @@ class Shipper {
     bool wasConnected_ = false;
     bool hasConnected_ = false;  // ever
     bool mayAskStream_ = true;
-    std::string said_;
+    std::set<std::string> said_;  // troubles of the server since there was a connection
     std::string saidRefusal_;
     Clock::time_point nextAttempt_{};
     Clock::time_point nextPlaces_{};

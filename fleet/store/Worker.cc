@@ -6,6 +6,7 @@
 #include <memory>
 #include <optional>
 #include <pqxx/pqxx>
+#include <set>
 #include <thread>
 #include <utility>
 
@@ -34,9 +35,13 @@ constexpr std::chrono::milliseconds shortest = 5ms;
 // The two connections, and the leases that live as long as they do.
 class Shift {
   public:
-    // `trouble` is what was said of the shift before, or empty. It is emptied when this one has got further.
-    Shift(const WorkerOptions& options, const Say& say, std::string& trouble)
-        : options_(options), say_(say), trouble_(trouble), database_(options.database), nats_(options.nats) {}
+    // `troubles` are the kinds of trouble of the shifts before. It is emptied when this one has got further.
+    Shift(const WorkerOptions& options, const Say& say, std::set<std::string>& troubles)
+        : options_(options),
+          say_(say),
+          troubles_(troubles),
+          database_(options.database),
+          nats_(options.nats) {}
     ~Shift() {
         for (const auto& [number, held] : held_) {
             if (options_.figures != nullptr)
@@ -180,10 +185,10 @@ class Shift {
     // letters that were not acknowledged must have come again: only then is it known whether the trouble is
     // over.
     void sayLeased(std::size_t letters) {
-        if (!trouble_.empty() && letters == 0 &&
+        if (!troubles_.empty() && letters == 0 &&
             SteadyClock::now() < begun_ + options_.againAfter + moreToBeSure)
             return;
-        trouble_.clear();
+        troubles_.clear();
         if (!leased_.empty())
             say_("partitions leased: " + std::exchange(leased_, {}));
     }
@@ -206,7 +211,7 @@ class Shift {
 
     const WorkerOptions& options_;
     const Say& say_;
-    std::string& trouble_;
+    std::set<std::string>& troubles_;
     const SteadyClock::time_point begun_ = SteadyClock::now();
     std::string leased_;  // numbers of partitions, not said yet
     pqxx::connection database_;
@@ -226,19 +231,24 @@ std::string kindOf(const std::exception& error) {
     return refused != nullptr && !refused->sqlstate().empty() ? refused->sqlstate() : error.what();
 }
 
+// PostgreSQL's texts end with a line feed.
+std::string inOneLine(std::string text) {
+    while (text.ends_with('\n') || text.ends_with(' '))
+        text.pop_back();
+    std::replace(text.begin(), text.end(), '\n', ' ');
+    return text;
+}
+
 }  // namespace
 
 void work(const WorkerOptions& options, const std::atomic<bool>& stopped, const Say& say) {
-    std::string trouble;
+    std::set<std::string> troubles;
     while (!stopped) {
         try {
-            Shift(options, say, trouble).run(stopped);
+            Shift(options, say, troubles).run(stopped);
         } catch (const std::exception& error) {
-            std::string why = error.what();
-            std::replace(why.begin(), why.end(), '\n', ' ');
-            const std::string before = std::exchange(trouble, kindOf(error));
-            if (before != trouble)
-                say(why);
+            if (troubles.insert(kindOf(error)).second)
+                say(inOneLine(error.what()));
             if (options.figures != nullptr)
                 options.figures->turned(options.number, false);
             std::this_thread::sleep_for(beforeBeginningAnew);

@@ -27,9 +27,17 @@ class FolderInputTest : public testing::Test {
 TEST_F(FolderInputTest, WithoutARecorderThereIsNothingYet) {
     FolderInput input = this->input();
     EXPECT_EQ(restOf(input), "");
+    EXPECT_EQ(input.lacks(), folder_.path() + ": no recordings of pri1 yet");
     recorder_.begin(7, 1);
     recorder_.frames(1);
     EXPECT_EQ(restOf(input), "7/1:00010001");
+    EXPECT_EQ(input.lacks(), "");
+}
+
+TEST_F(FolderInputTest, AFolderThatIsNotThereLacks) {
+    FolderInput input(folder_.file("spelt-wrong"), "pri1", {}, Before::nothing);
+    EXPECT_EQ(restOf(input), "");
+    EXPECT_EQ(input.lacks(), folder_.file("spelt-wrong") + ": no such folder");
 }
 
 TEST_F(FolderInputTest, FramesComeAsTheyAreWrittenAlsoOverTheEndOfAFile) {

@@ -257,6 +257,14 @@ TEST(NatsSecurity, WrongCredentialsAreRefused) {
     strangers.certificate = Certificates::get().strangersFile("store.pem");
     strangers.key = Certificates::get().strangersFile("store.key");
     reasonOfRefusal(strangers);
+    try {
+        NatsConnection{strangers};
+    } catch (const NatsError& error) {
+        EXPECT_NE(
+            std::string(error.what()).find("; perhaps the server refuses the certificate: its log says why"),
+            std::string::npos)
+            << error.what();
+    }
     // A server's certificate is the fleet's, but names no user.
     NatsOptions servers = server.options("127.0.0.1");
     EXPECT_EQ(reasonOfRefusal(servers), Reason::refused);

@@ -164,6 +164,20 @@ TEST_F(ShipperTest, EveryFrameArrivesAndTheNextShipperGoesOn) {
     EXPECT_EQ(gaps_, 0U);
 }
 
+TEST_F(ShipperTest, SaysOnceThatThereAreNoRecordingsYet) {
+    ship();
+    const std::string lacks = "s/h/0/1: " + folder_.path() + ": no recordings of pri1 yet;";
+    EXPECT_EQ(said_.find(lacks), said_.rfind(lacks));
+    EXPECT_NE(said_.find(lacks), std::string::npos) << said_;
+    said_.clear();
+    recorder_.begin(run, 1);
+    recorder_.frames(1);
+    ship();
+    EXPECT_EQ(said_.find("no recordings"), std::string::npos) << said_;
+    receive();
+    expectFrames(1);
+}
+
 TEST_F(ShipperTest, APlaceThatIsLostMeansThatAllIsSentAgainAndIsTheSame) {
     recorder_.begin(run, 1);
     recorder_.frames(700);

@@ -1,6 +1,6 @@
 """Shows what an operator of a fleet asks, and the answers, on this machine.
 
-    scripts/fleet-demo [--trunks N]
+    scripts/fleet-demo [--trunks N] [--stay]
 
 Starts three servers of NATS and three of sites, PostgreSQL, Prometheus, and N trunks on the software board with their
 recorders, shippers and stores; lets calls pass for half a minute; asks ten questions; takes all of it down.
@@ -10,6 +10,7 @@ import argparse
 import contextlib
 import json
 import os
+import shlex
 import signal
 import subprocess
 import sys
@@ -91,14 +92,14 @@ def ask(number, question, command, environment):
     if ran.returncode != 0:
         raise RuntimeError(f"status {ran.returncode}: {ran.stderr}")
     lines = [line.rstrip() for line in ran.stdout.rstrip("\n").splitlines()]
-    print("\n".join(lines[:LINES]))
+    print("\n".join(lines[:LINES]) or "(nothing)")
     if len(lines) > LINES:
         print(f"... and {len(lines) - LINES} more lines")
     sys.stdout.flush()
     return ran.stdout
 
 
-def show(fleet, began):
+def show(fleet, began, stays):
     environment = {**os.environ, "STORE": fleet.url(), "WEEK": time.strftime("%Y-%m-%d", time.gmtime(time.time() - 7 * 86400)),
                    "PATH": f"{BINARIES}:{os.environ['PATH']}", "PAGER": "cat"}
     environment["PROMETHEUS"] = fleet.prometheus
@@ -110,8 +111,10 @@ def show(fleet, began):
           f"          {len(fleet.stores)} x lapdstore -> PostgreSQL\n"
           f"  {GROUP}: {' and '.join(f'pri{number}' for number in GROUPED)} are D channels of one NFAS group; {REDACTED[0]} sends "
           f"pseudonyms in place of numbers\n"
-          f"  STORE={fleet.url()}\n"
-          f"  PROMETHEUS={environment['PROMETHEUS']}\n"
+          f"\nThe questions below can be asked in another shell as well, after this:\n"
+          f"  export PATH={shlex.quote(str(BINARIES))}:$PATH\n"
+          f"  export STORE={shlex.quote(environment['STORE'])}\n"
+          f"  export PROMETHEUS={environment['PROMETHEUS']} WEEK={environment['WEEK']}\n"
           f"\nCalls pass for {SECONDS} seconds. Meanwhile a lapdstore and a server of the centre are killed (kill -9), and the\n"
           f"line to {SITES[0]} is cut for 5 seconds.", flush=True)
     time.sleep(SECONDS / 3)
@@ -134,6 +137,9 @@ def show(fleet, began):
     print(f"\nAll calls are over. The logs have {result.frames} frames and {result.calls} calls; "
           + ("the store has the same." if not result.differences else "\n".join(["the store differs:", *result.differences])))
     tell_sizes({what: size for what, size in sizes(fleet).items() if "PostgreSQL" not in what and "frame" in what})
+    if stays:
+        print("\nEverything stays up until Enter, for more questions.", flush=True)
+        sys.stdin.readline()
     return 1 if result.differences else 0
 
 
@@ -141,6 +147,7 @@ def main():
     parser = argparse.ArgumentParser(prog="scripts/fleet-demo", description=__doc__,
                                      formatter_class=argparse.RawDescriptionHelpFormatter)
     parser.add_argument("--trunks", type=int, default=8, metavar="N", help="8 to 200 (default: 8)")
+    parser.add_argument("--stay", action="store_true", help="keep all of it up at the end, until Enter")
     options = parser.parse_args()
     if not 8 <= options.trunks <= 200:
         parser.error("--trunks must be 8 to 200")
@@ -152,10 +159,13 @@ def main():
     began = time.monotonic()
     with tempfile.TemporaryDirectory(prefix="fleet-demo.") as folder:
         with Fleet(folder, options.trunks, traffic, SITES, groups=dict.fromkeys(GROUPED, GROUP), redacted=REDACTED, watched=True) as fleet:
-            status = show(fleet, began)
+            status = show(fleet, began, options.stay)
     print(f"Everything is taken down again, after {time.monotonic() - began:.0f} seconds.")
     return status
 
 
 if __name__ == "__main__":
-    sys.exit(main())
+    try:
+        sys.exit(main())
+    except KeyboardInterrupt:
+        sys.exit("ended by the keyboard; everything is taken down")

@@ -26,13 +26,14 @@ import subprocess
 import sys
 import tempfile
 import time
+import urllib.request
 
 from cable import Cable
 
 ROOT = pathlib.Path(__file__).resolve().parents[2]
 LIMIT = 120  # seconds for an engine to start; nothing waits so long when all is well
 SERVERS = ("centre-1", "centre-2", "centre-3")
-CLIENTS = ("admin", "shipper", "store", "lapdstore", "reads")
+CLIENTS = ("admin", "shipper", "store", "lapdstore", "keeper", "reads")
 CLIENT_PORT, CLUSTER_PORT, LEAF_PORT, CABLE_PORT = 24222, 26222, 27422, 28422
 DATABASE_PORT, PROMETHEUS_PORT = 25432, 29090
 
@@ -66,10 +67,11 @@ def awaited(condition, what, limit=LIMIT):
 
 
 class Process:
-    """A program that can be killed and started again. Its output is added to NAME.log."""
+    """A program that can be killed and started again. Its output is added to NAME.log. `last`: the signal by which it is
+    taken down, if a killed one would leave something on the machine."""
 
-    def __init__(self, name, words, folder, user=None, **more):
-        self.name, self.log = name, folder / f"{name}.log"
+    def __init__(self, name, words, folder, user=None, last=signal.SIGKILL, **more):
+        self.name, self.log, self._last = name, folder / f"{name}.log", last
         as_user = []
         if user and os.geteuid() == 0:
             as_user = ["--reuid", user, "--regid", str(pwd.getpwnam(user).pw_gid), "--clear-groups"]
@@ -110,9 +112,8 @@ class Process:
 
     def take_down(self):
         if self.is_running():
-            self._process.kill()
-        if self._process is not None:
-            self._process.wait()
+            with contextlib.suppress(TimeoutError):
+                self.end(self._last, 20)
 
     def said(self):
         return self.log.read_text(errors="replace") if self.log.exists() else ""
@@ -151,6 +152,7 @@ class Engines(Assembled):
         self.nats, self.cables, self.database, self.prometheus = {}, {}, None, None
 
     def _assemble(self):
+        os.umask(0o022)  # the engines' users read what is written for them; keys have modes of their own
         os.chmod(self.folder, 0o755)
         self._make_certificates()
         self._start_database()
@@ -270,8 +272,9 @@ class Engines(Assembled):
                     # What a killed process has written is not lost; only a machine that fails needs the disk for it.
                     "fsync": "off", "full_page_writes": "off"}
         words = [word for key, value in settings.items() for word in ("-c", f"{key}={value}")]
+        # Killed, it would leave shared memory behind.
         self.database = Process("postgres", [programs / "postgres", "-D", data, *words], self.folder, "postgres",
-                                cwd="/")
+                                last=signal.SIGQUIT, cwd="/")
         self._down.callback(self.database.take_down)
         self.start_database()
         self.sql("CREATE DATABASE lapd", "postgres")
@@ -293,17 +296,22 @@ class Engines(Assembled):
     def start_prometheus(self, targets):
         """With the alerts of the tree. `targets`: addresses that are asked, by the name of their program."""
         folder, configuration = self._own(self.folder / "prometheus", "prometheus"), self.folder / "prometheus.yml"
+        # Its user may not be able to enter the tree's folder.
+        rules = shutil.copyfile(ROOT / "packaging/prometheus/alerts.yml", self.folder / "alerts.yml")
         jobs = [{"job_name": job, "static_configs": [{"targets": each}]} for job, each in targets.items()]
         configuration.write_text(json.dumps({
             "global": {"scrape_interval": "1s", "evaluation_interval": "1s"},
-            "rule_files": [str(ROOT / "packaging/prometheus/alerts.yml")], "scrape_configs": jobs}))  # JSON is YAML as well
+            "rule_files": [str(rules)], "scrape_configs": jobs}))  # JSON is YAML as well
         self.prometheus = Process("prometheus", ["prometheus", f"--config.file={configuration}",
                                                  f"--storage.tsdb.path={folder}",
                                                  f"--web.listen-address={self.address}:{PROMETHEUS_PORT}"],
                                   self.folder, "prometheus", cwd="/")
         self._down.callback(self.prometheus.take_down)
         self.prometheus.start()
-        return f"http://{self.address}:{PROMETHEUS_PORT}"
+        url = f"http://{self.address}:{PROMETHEUS_PORT}"
+        # It takes rules that it cannot read for none.
+        awaited(lambda: has_rules(url) or fail_if_ended(self.prometheus), "Prometheus with its alerts")
+        return url
 
     def await_ready(self):
         for number, engine in enumerate(self.nats.values(), 1):
@@ -315,6 +323,12 @@ def fail_if_ended(engine):
         raise RuntimeError(f"{engine.name} has ended: {engine.said()}")
 
 
+def has_rules(prometheus):
+    with contextlib.suppress(OSError), urllib.request.urlopen(f"{prometheus}/api/v1/rules", timeout=LIMIT) as answer:
+        return bool(json.load(answer)["data"]["groups"])
+    return False
+
+
 def answers(address, port):
     """Whether a NATS server takes connections there: it speaks first."""
     with contextlib.suppress(OSError), socket.create_connection((address, port), 1) as connection:
@@ -323,21 +337,23 @@ def answers(address, port):
 
 
 def main():
-    parser = argparse.ArgumentParser(prog="scripts/fleet-engines", description=__doc__,
-                                     formatter_class=argparse.RawDescriptionHelpFormatter)
+    parser = argparse.ArgumentParser(
+        prog="scripts/fleet-engines",
+        description="Starts the engines of a fleet on this machine: three servers of NATS as a centre, one for each site, and "
+                    "PostgreSQL. Prints where they are, and takes them down at Enter or a signal.")
     parser.add_argument("sites", nargs="*", metavar="SITE", help="names of sites (default: london)")
     options = parser.parse_args()
     signal.signal(signal.SIGTERM, lambda *_: sys.exit(1))
-    with tempfile.TemporaryDirectory(prefix="fleet-engines.") as folder, \
+    with contextlib.suppress(KeyboardInterrupt), tempfile.TemporaryDirectory(prefix="fleet-engines.") as folder, \
             Engines(folder, options.sites or ["london"]) as engines:
-        print(f"centre:        {' '.join(engines.servers())}")
+        print(f"centre: {' '.join(engines.servers())}")
         for site in engines.sites:
             print(f"site {site}: {' '.join(engines.servers(site))}")
-        print(f"certificates:  {engines.certificates} (clients: {', '.join(CLIENTS)})")
-        print(f"database:      {engines.owner_url} (its owner, here), {engines.database_url('reads')} (as a role that you make)")
+        print(f"certificates: {engines.certificates} (clients: {', '.join(CLIENTS)})")
+        print(f"database, as its owner:            '{engines.owner_url}'")
+        print(f"database, as a role that you make: '{engines.database_url('reads')}'")
         print("Enter, or a signal, takes all of it down.", flush=True)
-        with contextlib.suppress(KeyboardInterrupt):
-            sys.stdin.readline()
+        sys.stdin.readline()
 
 
 if __name__ == "__main__":

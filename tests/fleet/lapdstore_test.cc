@@ -434,7 +434,7 @@ TEST_F(Lapdstore, SaysWhyItDoesNotRewind) {
     const NatsServer empty;
     EXPECT_EQ(rewound("--nats " + empty.options().servers.front()),
               "lapdstore: cannot delete the consumer lapdstore-0 of the stream LAPD: Not Found (there is no "
-              "such stream)\n2\n");
+              "such stream; lapdship streams makes it)\n2\n");
     const NatsServer guarded(NatsServer::Security::certificates);
     const fleet_tests::Certificates& files = fleet_tests::Certificates::get();
     const std::string unnamed = files.file("127.0.0.1");

@@ -105,6 +105,7 @@ TEST_F(ShipFiles, AConfigurationThatCannotBeObeyedIsSaidWithItsLine) {
              Case{with("key = \"/c.key\"\n", ""), "certificate and key together"},
              Case{with("folder = \"rec\"\n", ""), "either folder or log"},
              Case{with("folder = \"rec\"\n", "folder = \"rec\"\nlog = \"x\"\n"), "either folder or log"},
+             Case{with("folder = \"rec\"\n", "foldr = \"rec\"\n"), "foldr is not known"},
              Case{with("dchannel = \"2\"", "dchannel = \"1\""), "london/h1/0/1 stands there twice"},
              Case{with("nfas-a", "caf\xc3\xa9"), "group must be"},
              Case{with("trunk = \"pri1\"\n", ""), "trunk is missing"},

@@ -195,6 +195,22 @@ TEST_F(StoreAsInput, ChoosesTrunksAndSites) {
     EXPECT_EQ(ofStore("calls"), lapdread("calls --merge " + pri + " " + other));
 }
 
+TEST_F(StoreAsInput, SaysWhereANumberIsNotFoundBecausePseudonymsStandInItsPlace) {
+    const std::string pri = source + "/examples/net5.pcap";
+    store(parcelsOf(pri, 100, true, "london"));
+    std::vector<Parcel> redacted = parcelsOf(source + "/examples/ni2.pcap", 100, true, "paris");
+    for (Parcel& parcel : redacted)
+        parcel.isRedacted = true;
+    store(redacted);
+    const std::string note =
+        "lapdread: pseudonyms stand in place of the numbers of ni2; --number finds only the pseudonym "
+        "there\n";
+    EXPECT_NE(ofStore("list --number 0").find(note), std::string::npos);
+    EXPECT_EQ(ofStore("list --site london --number 0").find(note), std::string::npos);
+    EXPECT_EQ(ofStore("list --quiet --number 0").find(note), std::string::npos);
+    EXPECT_EQ(ofStore("list").find(note), std::string::npos);
+}
+
 TEST_F(StoreAsInput, JoinsTheDChannelsOfAGroupAsNfasDoes) {
     const std::string traps = source + "/tests/reader/data/traps/changeover-";
     std::string files;
