@@ -123,8 +123,7 @@ namespace {
 // A server that refuses a certificate closes the connection, in TLS 1.3 after the client has taken it to be
 // made. So the client only sees it end, in one way or another.
 bool mayBeRefusal(natsStatus status) {
-    return status == NATS_PROTOCOL_ERROR || status == NATS_IO_ERROR || status == NATS_SSL_ERROR ||
-           status == NATS_CONNECTION_CLOSED;
+    return status == NATS_PROTOCOL_ERROR || status == NATS_IO_ERROR || status == NATS_CONNECTION_CLOSED;
 }
 
 void connect(natsConnection*& connection, const NatsOptions& options) {

@@ -181,7 +181,7 @@ void notePseudonyms(const fleet::Store& store, const Options& options, Chatter& 
     const std::size_t others = names.size() - 1;
     chatter.note("pseudonyms stand in place of the numbers of " + names.front() +
                  (others == 0 ? "" : " and " + std::to_string(others) + " more") +
-                 "; --number finds only the pseudonym there");
+                 ": a number is compared with the pseudonym there");
 }
 
 }  // namespace

@@ -5,6 +5,7 @@
 #include <pqxx/pqxx>
 #include <utility>
 
+#include "fleet/inOneLine.h"
 #include "fleet/query/FrameRows.h"
 #include "fleet/subjects.h"
 
@@ -15,14 +16,6 @@ namespace {
 constexpr int schemaNeeded = 1;
 constexpr char rowsAtOnce[] = "2000";
 constexpr std::int64_t nanosecondsPerSecond = 1'000'000'000;
-
-// Removes the line ends of an error text of the server or libpq, because our messages have one line.
-std::string inOneLine(std::string text) {
-    std::replace(text.begin(), text.end(), '\n', ' ');
-    while (!text.empty() && text.back() == ' ')
-        text.pop_back();
-    return text;
-}
 
 [[noreturn]] void fail(const std::exception& error) {
     throw capture::BadInput("the store: " + inOneLine(error.what()));

@@ -3,6 +3,8 @@
 #include <sys/stat.h>
 
 #include <algorithm>
+#include <cerrno>
+#include <cstring>
 #include <filesystem>
 #include <utility>
 
@@ -38,8 +40,12 @@ bool FolderInput::next(InputEvent& event) {
 std::string FolderInput::lacks() const {
     if (stateInode_ != 0)
         return "";
-    return folder_ + (std::filesystem::is_directory(folder_) ? ": no recordings of " + trunk_ + " yet"
-                                                             : ": no such folder");
+    struct stat status {};
+    if (stat(folder_.c_str(), &status) != 0)
+        return folder_ + ": " + (errno == ENOENT ? "no such folder" : std::strerror(errno));
+    if (stat(statePath_.c_str(), &status) != 0 && errno != ENOENT)
+        return statePath_ + ": " + std::strerror(errno);
+    return folder_ + ": no recordings of " + trunk_ + " yet";
 }
 
 // Opens the file that is next, or says what has become of the frames before it.

@@ -49,6 +49,8 @@ bool LogInput::open() {
     return true;
 }
 
+std::string LogInput::lacks() const { return reader_ ? "" : path_ + ": no such log yet"; }
+
 bool LogInput::next(InputEvent& event) {
     if (!reader_ && !open())
         return false;

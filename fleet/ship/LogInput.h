@@ -22,6 +22,7 @@ class LogInput final : public TrunkInput {
     ~LogInput() override;
 
     bool next(InputEvent& event) override;
+    std::string lacks() const override;
     const std::optional<recording::RecordedLog>& log() const override { return log_; }
 
   private:

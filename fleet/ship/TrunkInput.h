@@ -42,8 +42,9 @@ class TrunkInput {
     // Gives the next event; returns false if there is none just now. Each frame comes once, in the order of
     // runs and numbers. Throws capture::BadInput if the input cannot be read now; the caller may try again.
     virtual bool next(InputEvent& event) = 0;
-    // What is not there yet that frames will come from; empty if nothing lacks. A name may be spelt wrong.
-    virtual std::string lacks() const { return {}; }
+    // Says what frames will come from and is not there yet, because a name may be spelt wrong. Empty if
+    // everything is there.
+    virtual std::string lacks() const = 0;
     // The log from which the present run is read, if it is a file that can be read a second time.
     virtual const std::optional<recording::RecordedLog>& log() const = 0;
 };

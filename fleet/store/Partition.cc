@@ -215,7 +215,8 @@ void Partition::takeParcel(Work& work, const Parcel& parcel) {
 
 const Partition::Known& Partition::trunkOf(pqxx::transaction_base& work, const Parcel& parcel) {
     if (const auto known = trunks_.find(parcel.address);
-        known != trunks_.end() && known->second.name == parcel.trunk && known->second.group == parcel.group)
+        known != trunks_.end() && known->second.name == parcel.trunk && known->second.group == parcel.group &&
+        known->second.isRedacted == parcel.isRedacted)
         return known->second;
     const Address& at = parcel.address;
     pqxx::result found = work.exec_params(
@@ -230,7 +231,7 @@ const Partition::Known& Partition::trunkOf(pqxx::transaction_base& work, const P
             "redacted = EXCLUDED.redacted RETURNING trunk",
             at.site, at.host, at.board, at.dChannel, parcel.trunk, parcel.group, partition_,
             parcel.isRedacted);
-    return trunks_[at] = {found[0][0].as<int>(), parcel.trunk, toText(at), parcel.group};
+    return trunks_[at] = {found[0][0].as<int>(), parcel.trunk, toText(at), parcel.group, parcel.isRedacted};
 }
 
 void Partition::beginRun(pqxx::transaction_base& work, const RunKey& key, const Known& trunk) {

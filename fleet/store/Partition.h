@@ -49,6 +49,7 @@ class Partition {
         std::string name;
         std::string address;
         std::string group;  // NFAS, or empty
+        bool isRedacted = false;
     };
     // What one transaction has read and has to write.
     struct Work;

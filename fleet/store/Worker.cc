@@ -10,6 +10,7 @@
 #include <thread>
 #include <utility>
 
+#include "fleet/inOneLine.h"
 #include "fleet/store/Lease.h"
 #include "fleet/store/NatsInbox.h"
 #include "fleet/store/Partition.h"
@@ -229,14 +230,6 @@ class Shift {
 std::string kindOf(const std::exception& error) {
     const auto* const refused = dynamic_cast<const pqxx::sql_error*>(&error);
     return refused != nullptr && !refused->sqlstate().empty() ? refused->sqlstate() : error.what();
-}
-
-// PostgreSQL's texts end with a line feed.
-std::string inOneLine(std::string text) {
-    while (text.ends_with('\n') || text.ends_with(' '))
-        text.pop_back();
-    std::replace(text.begin(), text.end(), '\n', ' ');
-    return text;
 }
 
 }  // namespace

@@ -29,9 +29,8 @@ using Say = std::function<void(const std::string& line)>;
 
 // Works until `stopped` is set, with a connection to PostgreSQL and one to NATS. If one of them fails, says
 // so, gives all leases back and connects again a second later. Says each kind of trouble once until all is
-// well.
-// If only the stream refuses one partition, or if the partition's consumer was deleted, gives back that one.
-// Tries every two seconds to lease the partitions that it does not have.
+// well. If only the stream refuses one partition, or if the partition's consumer was deleted, gives back that
+// one. Tries every two seconds to lease the partitions that it does not have.
 void work(const WorkerOptions& options, const std::atomic<bool>& stopped, const Say& say);
 
 }  // namespace fleet

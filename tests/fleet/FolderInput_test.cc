@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
 #include <fstream>
 
 #include "InputText.h"
@@ -34,10 +35,17 @@ TEST_F(FolderInputTest, WithoutARecorderThereIsNothingYet) {
     EXPECT_EQ(input.lacks(), "");
 }
 
-TEST_F(FolderInputTest, AFolderThatIsNotThereLacks) {
+TEST_F(FolderInputTest, SaysThatItsFolderIsNotThere) {
     FolderInput input(folder_.file("spelt-wrong"), "pri1", {}, Before::nothing);
     EXPECT_EQ(restOf(input), "");
     EXPECT_EQ(input.lacks(), folder_.file("spelt-wrong") + ": no such folder");
+}
+
+TEST_F(FolderInputTest, SaysWhyItsFolderCannotBeRead) {
+    std::filesystem::create_symlink("itself", folder_.file("itself"));
+    FolderInput input(folder_.file("itself"), "pri1", {}, Before::nothing);
+    EXPECT_EQ(restOf(input), "");
+    EXPECT_EQ(input.lacks(), folder_.file("itself") + ": Too many levels of symbolic links");
 }
 
 TEST_F(FolderInputTest, FramesComeAsTheyAreWrittenAlsoOverTheEndOfAFile) {

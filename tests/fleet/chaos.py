@@ -24,14 +24,13 @@ import ctypes
 import os
 import pathlib
 import random
-import signal
 import subprocess
 import sys
 import tempfile
 import time
 
 from catch_up import catch_up
-from engines import SERVERS, missing
+from engines import SERVERS, end_in_order, missing
 from fleet import Fleet
 from traffic import Trunk as Traffic
 
@@ -288,7 +287,7 @@ def main(words=None):
         print(f"not installed: {', '.join(missing())}")
         return SKIPPED
     os.environ["TZ"] = "UTC"
-    signal.signal(signal.SIGTERM, lambda *_: sys.exit(1))  # takes everything down
+    end_in_order()
     is_wrong = run(options)
     return int(bool(options.behind) and run_behind(options) or is_wrong)
 

@@ -11,14 +11,13 @@ import contextlib
 import json
 import os
 import shlex
-import signal
 import subprocess
 import sys
 import tempfile
 import time
 import urllib.request
 
-from engines import LIMIT, awaited, missing
+from engines import LIMIT, awaited, end_in_order, missing
 from fleet import BINARIES, Fleet
 from load import sizes, tell_sizes
 from traffic import Trunk as Traffic
@@ -154,7 +153,7 @@ def main():
     needed = missing("prometheus", "curl", "jq")
     if needed:
         raise SystemExit(f"not installed: {', '.join(needed)}")
-    signal.signal(signal.SIGTERM, lambda *_: sys.exit(1))
+    end_in_order()
     os.environ["TZ"] = "UTC"
     began = time.monotonic()
     with tempfile.TemporaryDirectory(prefix="fleet-demo.") as folder:

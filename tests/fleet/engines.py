@@ -75,7 +75,7 @@ class Process:
         as_user = []
         if user and os.geteuid() == 0:
             as_user = ["--reuid", user, "--regid", str(pwd.getpwnam(user).pw_gid), "--clear-groups"]
-        self._words = ["setpriv", *as_user, "--pdeathsig", "KILL", "--", *map(str, words)]
+        self._words = ["setpriv", *as_user, "--pdeathsig", last.name.removeprefix("SIG"), "--", *map(str, words)]
         self._more, self._process, self.starts = more, None, 0
 
     def start(self):
@@ -131,11 +131,19 @@ class Assembled:
             self._assemble()
             return self
         except BaseException:
-            self._down.close()
+            self.take_down()
             raise
 
     def __exit__(self, *_):
-        self._down.close()
+        self.take_down()
+
+    def take_down(self):
+        """Whoever is impatient at the keyboard would leave a part of it behind."""
+        impatience = signal.signal(signal.SIGINT, signal.SIG_IGN)
+        try:
+            self._down.close()
+        finally:
+            signal.signal(signal.SIGINT, impatience)
 
 
 class Engines(Assembled):
@@ -318,6 +326,12 @@ class Engines(Assembled):
             awaited(lambda: answers(self.address, CLIENT_PORT + number) or fail_if_ended(engine), engine.name)  # noqa: B023
 
 
+def end_in_order():
+    """Makes the signals that end a program, or that a terminal sends when it is closed, take everything down."""
+    for number in (signal.SIGTERM, signal.SIGHUP):
+        signal.signal(number, lambda *_: sys.exit(1))
+
+
 def fail_if_ended(engine):
     if not engine.is_running():
         raise RuntimeError(f"{engine.name} has ended: {engine.said()}")
@@ -343,7 +357,7 @@ def main():
                     "PostgreSQL. Prints where they are, and takes them down at Enter or a signal.")
     parser.add_argument("sites", nargs="*", metavar="SITE", help="names of sites (default: london)")
     options = parser.parse_args()
-    signal.signal(signal.SIGTERM, lambda *_: sys.exit(1))
+    end_in_order()
     with contextlib.suppress(KeyboardInterrupt), tempfile.TemporaryDirectory(prefix="fleet-engines.") as folder, \
             Engines(folder, options.sites or ["london"]) as engines:
         print(f"centre: {' '.join(engines.servers())}")

@@ -328,8 +328,11 @@ TEST_F(Lapdstore, SaysOnceThatTheDatabaseRefusesRows) {
     // The text of the error is another one each time, as those of a server that names files are.
     execute(
         "CREATE SEQUENCE lapd.refused; CREATE FUNCTION lapd.refuse() RETURNS trigger LANGUAGE plpgsql AS $$ "
+        "DECLARE time bigint = nextval('lapd.refused'); "
         "BEGIN "
-        "RAISE 'could not extend file \"base/%\"', nextval('lapd.refused') USING ERRCODE = 'disk_full'; END "
+        "IF time % 2 = 0 THEN RAISE 'it is read only, %', time USING ERRCODE = 'read_only_sql_transaction'; "
+        "END IF; "
+        "RAISE 'could not extend file \"base/%\"', time USING ERRCODE = 'disk_full'; END "
         "$$; "
         "CREATE TRIGGER full_disk BEFORE INSERT ON lapd.runs EXECUTE FUNCTION lapd.refuse()");
     std::vector<std::string> said;
@@ -343,7 +346,7 @@ TEST_F(Lapdstore, SaysOnceThatTheDatabaseRefusesRows) {
         });
     });
     publish(parcels);
-    await("SELECT last_value >= 3 FROM lapd.refused", "t\n");
+    await("SELECT last_value >= 4 FROM lapd.refused", "t\n");
     execute("DROP TRIGGER full_disk ON lapd.runs");
     await("SELECT finished FROM lapd.runs", "t\n");
     stopped = true;
@@ -354,9 +357,11 @@ TEST_F(Lapdstore, SaysOnceThatTheDatabaseRefusesRows) {
                              [&](const std::string& line) { return line.find(part) != std::string::npos; });
     };
     EXPECT_EQ(count("could not extend file"), 1) << testing::PrintToString(said);
+    EXPECT_EQ(count("it is read only"), 1) << testing::PrintToString(said);
+    EXPECT_TRUE(std::ranges::none_of(said, [](const std::string& line) { return line.ends_with(' '); }));
     // Once at the beginning, unless the first attempt came first, and once when rows are taken again.
     EXPECT_LE(count(leased), 2) << testing::PrintToString(said);
-    EXPECT_LE(said.size(), 3U) << testing::PrintToString(said);
+    EXPECT_LE(said.size(), 4U) << testing::PrintToString(said);
 }
 
 TEST_F(Lapdstore, SaysWhyAnEngineRefusesIt) {

@@ -16,14 +16,13 @@ import itertools
 import os
 import pathlib
 import re
-import signal
 import statistics
 import subprocess
 import sys
 import tempfile
 import time
 
-from engines import LIMIT, awaited, missing
+from engines import LIMIT, awaited, end_in_order, missing
 from fleet import Fleet, frames_in, program
 from traffic import Trunk as Traffic
 from traffic import make_captures
@@ -152,7 +151,7 @@ def main():
     options = parser.parse_args()
     if missing():
         raise SystemExit(f"not installed: {', '.join(missing())}")
-    signal.signal(signal.SIGTERM, lambda *_: sys.exit(1))
+    end_in_order()
     os.environ["TZ"] = "UTC"
     with tempfile.TemporaryDirectory(prefix="fleet-load.") as name:
         folder = pathlib.Path(name)

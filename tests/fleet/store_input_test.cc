@@ -203,8 +203,8 @@ TEST_F(StoreAsInput, SaysWhereANumberIsNotFoundBecausePseudonymsStandInItsPlace)
         parcel.isRedacted = true;
     store(redacted);
     const std::string note =
-        "lapdread: pseudonyms stand in place of the numbers of ni2; --number finds only the pseudonym "
-        "there\n";
+        "lapdread: pseudonyms stand in place of the numbers of ni2: a number is compared with "
+        "the pseudonym there\n";
     EXPECT_NE(ofStore("list --number 0").find(note), std::string::npos);
     EXPECT_EQ(ofStore("list --site london --number 0").find(note), std::string::npos);
     EXPECT_EQ(ofStore("list --quiet --number 0").find(note), std::string::npos);

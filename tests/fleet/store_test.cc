@@ -103,6 +103,13 @@ TEST_F(Store_, KeepsAFrameAsItWasSent) {
               "london|h1|0|1|pri1||f\n");
 }
 
+TEST_F(Store_, NotesThatATrunkBeginsToSendPseudonyms) {
+    std::vector<Parcel> parcels = parcelsOf(net5, 5, true);
+    parcels.back().isRedacted = true;
+    store(parcels);
+    EXPECT_EQ(rows("SELECT redacted FROM lapd.trunks"), "t\n");
+}
+
 TEST_F(Store_, MakesCallsOfFrames) {
     store(parcelsOf(overlap, 3, true));
     EXPECT_EQ(
